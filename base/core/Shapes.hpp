@@ -1,0 +1,210 @@
+// The shapes of nodes: payload, operands, hash and equality.  The node classes themselves are in Nodes.hpp.
+#pragma once
+
+#include "base/core/Hash.hpp"
+#include "base/core/Node.hpp"
+
+#include <string>
+#include <vector>
+
+namespace VT {
+
+/// One operand.
+class VTSYM_API SymbolicUnaryExpr : public SymbolicExpr {
+public:
+    [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
+    [[nodiscard]] std::uint64_t getHash() const override;
+    [[nodiscard]] std::size_t getNumInputs() const override { return 1; }
+    [[nodiscard]] bool isUnaryExpr() const override { return true; }
+    [[nodiscard]] SymbolicExprId getInput(std::size_t aIdx) const override;
+
+    [[nodiscard]] SymbolicExprId operand() const noexcept { return operand_; }
+
+protected:
+    explicit SymbolicUnaryExpr(SymbolicExprId operand) : operand_(operand) {}
+
+private:
+    SymbolicExprId operand_;
+};
+
+/// Two operands: input 0 is the left one, input 1 the right one.
+class VTSYM_API SymbolicBinaryExpr : public SymbolicExpr {
+public:
+    [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
+    [[nodiscard]] std::uint64_t getHash() const override;
+    [[nodiscard]] std::size_t getNumInputs() const override { return 2; }
+    [[nodiscard]] bool isBinaryExpr() const override { return true; }
+    [[nodiscard]] SymbolicExprId getInput(std::size_t aIdx) const override;
+
+    [[nodiscard]] SymbolicExprId left() const noexcept { return left_; }
+    [[nodiscard]] SymbolicExprId right() const noexcept { return right_; }
+
+protected:
+    SymbolicBinaryExpr(SymbolicExprId left, SymbolicExprId right) : left_(left), right_(right) {}
+
+private:
+    SymbolicExprId left_;
+    SymbolicExprId right_;
+};
+
+/// Three operands.
+class VTSYM_API SymbolicTernaryExpr : public SymbolicExpr {
+public:
+    [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
+    [[nodiscard]] std::uint64_t getHash() const override;
+    [[nodiscard]] std::size_t getNumInputs() const override { return 3; }
+    [[nodiscard]] bool isTernaryExpr() const override { return true; }
+    [[nodiscard]] SymbolicExprId getInput(std::size_t aIdx) const override;
+
+    [[nodiscard]] SymbolicExprId first() const noexcept { return inputs_[0]; }
+    [[nodiscard]] SymbolicExprId second() const noexcept { return inputs_[1]; }
+    [[nodiscard]] SymbolicExprId third() const noexcept { return inputs_[2]; }
+
+protected:
+    SymbolicTernaryExpr(SymbolicExprId a, SymbolicExprId b, SymbolicExprId c) : inputs_{a, b, c} {}
+
+private:
+    SymbolicExprId inputs_[3];
+};
+
+/// Any number of operands, in order.
+class VTSYM_API SymbolicMultiExpr : public SymbolicExpr {
+public:
+    [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
+    [[nodiscard]] std::uint64_t getHash() const override;
+    [[nodiscard]] std::size_t getNumInputs() const override { return inputs_.size(); }
+    [[nodiscard]] bool isMultiExpr() const override { return true; }
+    [[nodiscard]] SymbolicExprId getInput(std::size_t aIdx) const override;
+
+    [[nodiscard]] const std::vector<SymbolicExprId>& inputs() const noexcept { return inputs_; }
+
+protected:
+    explicit SymbolicMultiExpr(std::vector<SymbolicExprId> inputs) : inputs_(std::move(inputs)) {}
+    /// The hash of the operands behind the seed of an operator.
+    [[nodiscard]] std::uint64_t hashAs(SymbolicOp op) const;
+
+private:
+    std::vector<SymbolicExprId> inputs_;
+};
+
+namespace detail {
+
+/// Whether `other` is a dimension list, or a call, with the operands of `node`, whichever class holds them.
+VTSYM_API bool equalDimensions(const SymbolicExpr& node, const SymbolicExpr& other);
+VTSYM_API bool equalCalls(const SymbolicExpr& node, const SymbolicExpr& other);
+
+// Shapes of one or few classes: the operands above with another equality, hash or count.
+
+class VTSYM_API StringShape : public SymbolicExpr {
+public:
+    [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
+    [[nodiscard]] std::uint64_t getHash() const override;
+    [[nodiscard]] bool isTermExpr() const override { return true; }
+    /// The identifier or keyword, as received.
+    [[nodiscard]] const std::string& getName() const noexcept { return name_; }
+
+protected:
+    explicit StringShape(std::string name) : name_(std::move(name)) {}
+
+private:
+    std::string name_;
+};
+
+class VTSYM_API IntShape : public SymbolicExpr {
+public:
+    [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
+    [[nodiscard]] std::uint64_t getHash() const override;
+    [[nodiscard]] bool isTermExpr() const override { return true; }
+    [[nodiscard]] bool isNumValue() const override { return true; }
+    [[nodiscard]] double getNumValue() const override { return value_; }
+    [[nodiscard]] int getValue() const noexcept { return value_; }
+
+protected:
+    explicit IntShape(int value) : value_(value) {}
+
+private:
+    int value_;
+};
+
+class VTSYM_API DoubleShape : public SymbolicExpr {
+public:
+    [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
+    [[nodiscard]] std::uint64_t getHash() const override;
+    [[nodiscard]] bool isTermExpr() const override { return true; }
+    [[nodiscard]] bool isNumValue() const override { return true; }
+    [[nodiscard]] double getNumValue() const override { return value_; }
+    [[nodiscard]] double getValue() const noexcept { return value_; }
+
+protected:
+    explicit DoubleShape(double value) : value_(value) {}
+
+private:
+    double value_;
+};
+
+class VTSYM_API MemberShape : public SymbolicUnaryExpr {
+public:
+    [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
+    [[nodiscard]] std::uint64_t getHash() const override;
+    /// The field behind the dot.
+    [[nodiscard]] const std::string& getMemberName() const noexcept { return name_; }
+
+protected:
+    MemberShape(SymbolicExprId owner, std::string name) : SymbolicUnaryExpr(owner), name_(std::move(name)) {}
+
+private:
+    std::string name_;
+};
+
+/// A dimension list with a fixed number of entries.
+template <class Inputs> class FixedDimsShape : public Inputs {
+public:
+    [[nodiscard]] bool operator==(const SymbolicExpr& other) const override { return equalDimensions(*this, other); }
+    [[nodiscard]] std::size_t getNumDimensions() const override { return this->getNumInputs(); }
+
+protected:
+    using Inputs::Inputs;
+};
+
+class VTSYM_API DimsNShape : public SymbolicMultiExpr {
+public:
+    [[nodiscard]] bool operator==(const SymbolicExpr& other) const override { return equalDimensions(*this, other); }
+    [[nodiscard]] std::uint64_t getHash() const override;
+    [[nodiscard]] std::size_t getNumDimensions() const override { return getNumInputs(); }
+
+protected:
+    using SymbolicMultiExpr::SymbolicMultiExpr;
+};
+
+/// A call with a fixed number of arguments: input 0 is the function's name.
+template <class Inputs> class FixedCallShape : public Inputs {
+public:
+    [[nodiscard]] bool operator==(const SymbolicExpr& other) const override { return equalCalls(*this, other); }
+    [[nodiscard]] bool isFcnCallExpr() const override { return true; }
+    [[nodiscard]] std::size_t getNumArgs() const override { return this->getNumInputs() - 1; }
+
+protected:
+    using Inputs::Inputs;
+};
+
+class VTSYM_API CallNShape : public SymbolicMultiExpr {
+public:
+    [[nodiscard]] bool operator==(const SymbolicExpr& other) const override { return equalCalls(*this, other); }
+    [[nodiscard]] std::uint64_t getHash() const override;
+    [[nodiscard]] std::size_t getNumArgs() const override;
+
+protected:
+    using SymbolicMultiExpr::SymbolicMultiExpr;
+};
+
+/// Input 0 is the head, further operands follow.
+class VTSYM_API CellShape : public SymbolicMultiExpr {
+public:
+    [[nodiscard]] std::size_t getNumArgs() const override;
+
+protected:
+    using SymbolicMultiExpr::SymbolicMultiExpr;
+};
+
+} // namespace detail
+} // namespace VT

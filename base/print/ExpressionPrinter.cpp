@@ -1,0 +1,71 @@
+#include "base/print/ExpressionPrinter.hpp"
+
+#include "base/print/StringifySymbolicExpr.hpp"
+
+#include <boost/unordered_map.hpp>
+
+namespace VT {
+
+namespace {
+
+/// Texts that one print may leave behind; a print that made more gives its memory back, which costs less than it did.
+constexpr std::size_t keptTexts = std::size_t{1} << 16U;
+
+} // namespace
+
+struct SymbolicExprPrinter::State {
+    State(const SymbolicExprTable& expressions, bool quillSyntax, bool spacedLogicalOperators, const PredicateHandle& predicate)
+        : table(expressions), plainNames(predicate.isPlain()),
+          stringify(expressions, quillSyntax, spacedLogicalOperators, predicate) {}
+
+    template <class Expression> std::string print(const Expression& expression) {
+        if (!plainNames)
+            stringify.forget(); // names may have changed since
+        const std::size_t before = stringify.texts().size();
+        std::string text = stringify.print(expression);
+        if (stringify.texts().size() - before > keptTexts)
+            stringify.forget();
+        return text;
+    }
+
+    const SymbolicExprTable& table;
+    bool plainNames;
+    StringifySymbolicExpr stringify;
+    boost::unordered_map<SymbolicExprId, std::string> finished;
+};
+
+SymbolicExprPrinter::SymbolicExprPrinter(const SymbolicExprTable& table, bool quillSyntax, bool spacedLogicalOperators,
+                                         PredicateHandle predicate)
+    : state_(std::make_unique<State>(table, quillSyntax, spacedLogicalOperators, predicate)) {}
+
+SymbolicExprPrinter::SymbolicExprPrinter(SymbolicExprPrinter&&) noexcept = default;
+SymbolicExprPrinter& SymbolicExprPrinter::operator=(SymbolicExprPrinter&&) noexcept = default;
+SymbolicExprPrinter::~SymbolicExprPrinter() = default;
+
+std::string SymbolicExprPrinter::operator()(SymbolicExprId id) const { return state_->print(id); }
+
+std::string SymbolicExprPrinter::operator()(const SymbolicExpr& node) const { return state_->print(node); }
+
+std::string SymbolicExprPrinter::printIdUsingCache(SymbolicExprId id) const {
+    const auto found = state_->finished.find(id);
+    if (found != state_->finished.end())
+        return found->second;
+    return state_->finished.emplace(id, state_->print(id)).first->second;
+}
+
+std::uint64_t SymbolicExprPrinter::textLength(SymbolicExprId id) const {
+    return state_->stringify.texts().length(state_->stringify.printed(id).text);
+}
+
+int SymbolicExprPrinter::compareUsingCache(SymbolicExprId left, SymbolicExprId right) const {
+    const Text leftText = state_->stringify.printed(left).text;
+    const Text rightText = state_->stringify.printed(right).text;
+    if (left == right)
+        return 0;
+    const int order = state_->stringify.texts().compare(leftText, rightText);
+    return order != 0 ? order : compareStructure(state_->table, left, right);
+}
+
+void SymbolicExprPrinter::setTextBound(std::size_t bytes) { state_->stringify.setTextBound(bytes); }
+
+} // namespace VT

@@ -1,0 +1,66 @@
+// A vector of plain data for large, long-lived stores.
+#pragma once
+
+#include <algorithm>
+#include <cstddef>
+#include <cstdlib>
+#include <new>
+#include <type_traits>
+
+namespace VT {
+
+/// Grows in place where the system can, so that a large store does not touch its pages once more at each doubling.  When memory
+/// runs out, the vector is as before and std::bad_alloc passes.
+template <class Value> class PlainVector {
+    static_assert(std::is_trivially_copyable_v<Value>);
+
+public:
+    PlainVector() = default;
+    PlainVector(const PlainVector&) = delete;
+    PlainVector& operator=(const PlainVector&) = delete;
+    ~PlainVector() { clear(); }
+
+    Value& operator[](std::size_t index) noexcept { return data_[index]; }
+    const Value& operator[](std::size_t index) const noexcept { return data_[index]; }
+    [[nodiscard]] std::size_t size() const noexcept { return size_; }
+
+    /// Appends values that are to be written before they are read, and gives the first.  Moves the others.
+    Value* extend(std::size_t count) {
+        if (capacity_ - size_ < count)
+            grow(count);
+        Value* const first = data_ + size_;
+        size_ += count;
+        return first;
+    }
+    void push_back(const Value& value) {
+        const Value copy = value;
+        *extend(1) = copy;
+    }
+    void pop_back() noexcept { --size_; }
+
+    /// Forgets all values and gives their memory back.
+    void clear() noexcept {
+        std::free(data_);
+        data_ = nullptr;
+        size_ = 0;
+        capacity_ = 0;
+    }
+
+private:
+    void grow(std::size_t count) {
+        constexpr std::size_t firstBytes = 1024;
+        const std::size_t capacity =
+            std::max({firstBytes / sizeof(Value), std::size_t{1}, 2 * capacity_, size_ + count});
+        void* const grown = std::realloc(static_cast<void*>(data_), capacity * sizeof(Value));
+        if (grown == nullptr)
+            throw std::bad_alloc();
+        data_ = static_cast<Value*>(grown);
+        capacity_ = capacity;
+    }
+
+    Value* data_ = nullptr;
+    std::size_t size_ = 0;
+    std::size_t capacity_ = 0;
+};
+
+} // namespace VT

@@ -1,0 +1,346 @@
+#include "base/print/StringifySymbolicExpr.hpp"
+
+#include "base/transform/QuillCalls.hpp"
+#include "host/Numbers.hpp"
+
+#include <algorithm>
+#include <array>
+#include <charconv>
+#include <cmath>
+#include <cstring>
+#include <limits>
+#include <stdexcept>
+
+namespace VT {
+
+namespace {
+
+constexpr OperatorSet logicalOps{SymbolicOp::And, SymbolicOp::Or, SymbolicOp::SingleAnd, SymbolicOp::SingleOr};
+constexpr unsigned char leafPrecedence = 0;
+
+/// Room that spares most prints the growth of their stacks.
+constexpr std::size_t firstDepth = 16;
+
+/// Where a sign in front of a literal binds like a prefix operator.
+constexpr unsigned char signPrecedence = operatorInfo(SymbolicOp::UnaryMinus).precedence;
+
+bool isLiteral(const StringifySymbolicExpr::Printed& printed) {
+    return printed.op == SymbolicOp::IntValue || printed.op == SymbolicOp::DoubleValue;
+}
+
+[[noreturn]] void throwNoSuchExpression() { throw std::out_of_range("VT::SymbolicExprTable: no such expression"); }
+
+} // namespace
+
+StringifySymbolicExpr::StringifySymbolicExpr(const SymbolicExprTable& table, bool quillSyntax, bool spacedLogicalOperators,
+                                             SymbolicExprPrinter::PredicateHandle predicate)
+    : table_(table), predicate_(std::move(predicate)), plainNames_(predicate_.isPlain()), quillSyntax_(quillSyntax),
+      spacedLogicalOperators_(spacedLogicalOperators) {
+    stack_.reserve(firstDepth);
+    frames_.reserve(firstDepth);
+}
+
+StringifySymbolicExpr::~StringifySymbolicExpr() = default;
+
+/// Leaves the stack as deep as it was.
+class StringifySymbolicExpr::StackDepth {
+public:
+    explicit StackDepth(std::vector<Printed>& stack) : stack_(stack), depth_(stack.size()) {}
+    StackDepth(const StackDepth&) = delete;
+    StackDepth& operator=(const StackDepth&) = delete;
+    ~StackDepth() { stack_.resize(std::min(stack_.size(), depth_)); }
+
+private:
+    std::vector<Printed>& stack_;
+    std::size_t depth_;
+};
+
+// Results.
+
+std::string StringifySymbolicExpr::get() const {
+    if (stack_.empty())
+        throwNoSuchExpression();
+    return texts_.str(stack_.back().text, textBound_);
+}
+
+/// Pushes an expression that was met before; whether it was.
+bool StringifySymbolicExpr::pushKnown(SymbolicExprId id) {
+    const Known* const met = known_.find(id);
+    if (met == nullptr || met->opAndOne == 0)
+        return false;
+    push({static_cast<SymbolicOp>(met->opAndOne - 1), met->text, met->precedence, met->inCall});
+    return true;
+}
+
+StringifySymbolicExpr::Printed StringifySymbolicExpr::printed(SymbolicExprId id) {
+    const StackDepth depth(stack_);
+    if (pushKnown(id))
+        return stack_.back();
+    walkUnknown(
+        table_, id, frames_, [&](SymbolicExprId operand, const SymbolicExpr*) { return pushKnown(operand); },
+        [&](SymbolicExprId visited, const SymbolicExpr& node, const SymbolicExpr*) {
+            node.invoke(*this);
+            const Printed& whole = stack_.back();
+            known_.at(visited) = {whole.text, whole.inCall, static_cast<std::uint8_t>(static_cast<int>(whole.op) + 1),
+                                   whole.precedence};
+        },
+        [](SymbolicExprId, const SymbolicExpr*) { throwNoSuchExpression(); });
+    return stack_.back();
+}
+
+std::string StringifySymbolicExpr::print(SymbolicExprId id) { return texts_.str(printed(id).text, textBound_); }
+
+std::string StringifySymbolicExpr::print(const SymbolicExpr& node) {
+    const StackDepth depth(stack_);
+    for (std::size_t i = 0; i < node.getNumInputs(); ++i)
+        push(printed(node.getInput(i)));
+    node.invoke(*this);
+    return get();
+}
+
+void StringifySymbolicExpr::forget() {
+    known_.clear();
+    texts_.clear();
+    insideCalls_.clear();
+    stack_.clear();
+}
+
+// The stack.
+
+std::span<const StringifySymbolicExpr::Printed> StringifySymbolicExpr::operands(std::size_t count) const {
+    if (stack_.size() < count)
+        throwNoSuchExpression(); // a walker passes over an operand that the table does not have
+    return std::span<const Printed>(stack_).last(count);
+}
+
+StringifySymbolicExpr::Printed StringifySymbolicExpr::insideCall(const Printed& printed) const {
+    return printed.inCall == 0 ? printed : insideCalls_[printed.inCall - 1];
+}
+
+void StringifySymbolicExpr::setInsideCall(Printed& printed, const Printed& form) {
+    insideCalls_.push_back(form);
+    printed.inCall = static_cast<std::uint32_t>(insideCalls_.size());
+}
+
+/// Replaces the topmost operands by what `build` makes of them, and of their other forms where one of them has another.
+template <class Build> void StringifySymbolicExpr::replaceOperands(std::size_t count, Build build) {
+    const std::span<const Printed> shown = operands(count);
+    Printed whole = build(shown);
+    if (std::ranges::any_of(shown, [](const Printed& operand) { return operand.inCall != 0; })) {
+        boost::container::small_vector<Printed, 4> forms;
+        for (const Printed& operand : shown)
+            forms.push_back(insideCall(operand));
+        setInsideCall(whole, build(std::span<const Printed>(forms.data(), forms.size())));
+    }
+    stack_.resize(stack_.size() - count);
+    push(whole);
+}
+
+// Leaves.
+
+Text StringifySymbolicExpr::integer(int value) {
+    std::array<char, std::numeric_limits<int>::digits10 + 3> digits{};
+    const auto end = std::to_chars(digits.data(), digits.data() + digits.size(), value).ptr;
+    return texts_.bytes({digits.data(), end});
+}
+
+void StringifySymbolicExpr::appendInteger(int value) { push({SymbolicOp::IntValue, integer(value), leafPrecedence}); }
+
+void StringifySymbolicExpr::appendDouble(double value) {
+    std::string text = vtsv_dtoa(value, true);
+    const bool hasPoint = text.find('.') != std::string::npos;
+    const bool needsPoint = quillSyntax_ ? text == "-0" : std::isfinite(value) && !hasPoint;
+    if (needsPoint)
+        text.insert(std::min(text.find('e'), text.size()), ".0");
+    push(SymbolicOp::DoubleValue, text, leafPrecedence);
+}
+
+// Operators.
+
+StringifySymbolicExpr::Delimiters
+StringifySymbolicExpr::isDelimitWithSpacesAndWrapParenthesis(const SymbolicOp& op, unsigned char precedence,
+                                                             OpAssociativity assoc, const Printed& lhs,
+                                                             const Printed& rhs) const {
+    return {.wrapRight = rhs.precedence > precedence || (rhs.precedence == precedence && assoc == OpAssociativity::Left),
+            .wrapLeft = lhs.precedence > precedence || (lhs.precedence == precedence && assoc == OpAssociativity::Right),
+            .spaced = spacedLogicalOperators_ && logicalOps.contains(op)};
+}
+
+StringifySymbolicExpr::Printed StringifySymbolicExpr::createBinaryExpr(const SymbolicOp& op, const char* spelling,
+                                                                       unsigned char precedence, OpAssociativity assoc,
+                                                                       const Printed& lhs, const Printed& rhs) {
+    const Delimiters delimiters = isDelimitWithSpacesAndWrapParenthesis(op, precedence, assoc, lhs, rhs);
+    const std::string_view bare = spelling;
+    // A sign would join the operator in front of it, and take the literal's place as the operand of what binds tighter.
+    const bool signBehindSign = !delimiters.spaced && bare.ends_with('-') && texts_.beginsWith(rhs.text, '-');
+    const bool signedOperand = precedence < signPrecedence && isLiteral(lhs) && texts_.beginsWith(lhs.text, '-');
+    const Text left = delimiters.wrapLeft || signedOperand ? wrapped(lhs.text) : lhs.text;
+    const Text right = delimiters.wrapRight || signBehindSign ? wrapped(rhs.text) : rhs.text;
+    if (!delimiters.spaced)
+        return {op, texts_.infix(left, bare, right), precedence};
+    boost::container::small_vector<char, 8> spaced{' '};
+    spaced.insert(spaced.end(), bare.begin(), bare.end());
+    spaced.push_back(' ');
+    return {op, texts_.infix(left, {spaced.data(), spaced.size()}, right), precedence};
+}
+
+void StringifySymbolicExpr::appendBinary(const SymbolicOp& op, const char* spelling, unsigned char precedence,
+                                         OpAssociativity assoc) {
+    const std::span<const Printed> shown = operands(2);
+    Printed whole = createBinaryExpr(op, spelling, precedence, assoc, shown[0], shown[1]);
+    if (quillSyntax_) {
+        const bool isCall = quillCallOps.contains(op);
+        if (isCall || shown[0].inCall != 0 || shown[1].inCall != 0) {
+            const std::array<Printed, 2> forms{insideCall(shown[0]), insideCall(shown[1])};
+            setInsideCall(whole, isCall ? quillCall(op, forms)
+                                        : createBinaryExpr(op, spelling, precedence, assoc, forms[0], forms[1]));
+        }
+    }
+    stack_.pop_back();
+    stack_.back() = whole;
+}
+
+StringifySymbolicExpr::Printed StringifySymbolicExpr::unary(SymbolicOp op, std::string_view spelling,
+                                                            unsigned char precedence, bool prefix, const Printed& operand) {
+    const bool sign = texts_.beginsWith(operand.text, '-') &&
+                      (prefix ? spelling.ends_with('-') : precedence < signPrecedence && isLiteral(operand));
+    const bool minusZero = op == SymbolicOp::UnaryMinus && operand.op == SymbolicOp::IntValue &&
+                           texts_.length(operand.text) == 1 && texts_.beginsWith(operand.text, '0');
+    if (minusZero)
+        return operand;
+    const bool wrap = operand.precedence >= precedence || sign;
+    if (!prefix)
+        return {op, texts_.enclose(wrap ? "(" : "", operand.text, wrap ? std::string(")").append(spelling) : spelling),
+                precedence};
+    return {op, texts_.enclose(wrap ? std::string(spelling).append("(") : spelling, operand.text, wrap ? ")" : ""), precedence};
+}
+
+void StringifySymbolicExpr::appendUnary(const SymbolicOp& op, const char* spelling, unsigned char precedence,
+                                        OpAssociativity, bool prefix) {
+    replaceOperands(1, [&](std::span<const Printed> operand) {
+        return unary(op, spelling, precedence, prefix, operand[0]);
+    });
+}
+
+// Lists and calls.
+
+Text StringifySymbolicExpr::list(std::span<const Printed> parts, std::string_view open, std::string_view separator,
+                                 std::string_view close) {
+    if (parts.size() == 1)
+        return texts_.enclose(open, parts.front().text, close);
+    boost::container::small_vector<Text, 8> texts;
+    texts.reserve(parts.size());
+    for (const Printed& part : parts)
+        texts.push_back(part.text);
+    return texts_.join(open, {texts.data(), texts.size()}, separator, close);
+}
+
+void StringifySymbolicExpr::appendArraySelection(const SymbolicExpr& node, const char* open, const char* close,
+                                                 const char* separator) {
+    replaceOperands(node.getNumInputs(), [&](std::span<const Printed> inputs) {
+        return Printed{node.op(), list(inputs, open, separator, close), leafPrecedence};
+    });
+}
+
+void StringifySymbolicExpr::appendCellArray(const SymbolicExpr& node) { appendArraySelection(node, "{", "}", ";"); }
+
+StringifySymbolicExpr::Printed StringifySymbolicExpr::call(SymbolicOp op, const Printed& callee,
+                                                           std::span<const Printed> arguments) {
+    const Text name = callee.precedence > leafPrecedence ? wrapped(callee.text) : callee.text;
+    if (arguments.empty())
+        return {op, texts_.enclose("", name, "()"), leafPrecedence};
+    const std::array<Text, 2> parts{name, list(arguments, "", ",", "")};
+    return {op, texts_.join("", parts, "(", ")"), leafPrecedence};
+}
+
+void StringifySymbolicExpr::appendFcnCall(const SymbolicExpr& node) {
+    replaceOperands(node.getNumInputs(), [&](std::span<const Printed> inputs) {
+        if (inputs.empty())
+            return Printed{node.op(), texts_.bytes("()"), leafPrecedence};
+        return call(node.op(), inputs.front(), inputs.subspan(1));
+    });
+}
+
+// C operators in Quill.
+
+StringifySymbolicExpr::Printed StringifySymbolicExpr::quillCall(SymbolicOp op, std::span<const Printed> arguments) {
+    boost::container::small_vector<Printed, 2> kept(arguments.begin(), arguments.end());
+    visit(quillCallName(op));
+    const Printed name = stack_.back();
+    stack_.pop_back();
+    return call(kept.size() == 1 ? SymbolicOp::FcnCall1U : SymbolicOp::FcnCall2U, name, {kept.data(), kept.size()});
+}
+
+/// The printed second argument of the call that stands for a shift.
+StringifySymbolicExpr::Printed StringifySymbolicExpr::shiftAmount(const SymbolicExpr& shift, const Printed& amount) {
+    const ShiftAmount converted = quillShiftAmount(table_, shift.op(), shift.getInput(1));
+    constexpr const OperatorInfo& minus = operatorInfo(SymbolicOp::UnaryMinus);
+    switch (converted.form) {
+    case ShiftAmount::Form::Literal: return {SymbolicOp::IntValue, integer(converted.literal), leafPrecedence};
+    case ShiftAmount::Form::Negated: return unary(minus.op, minus.quill, minus.precedence, true, amount);
+    case ShiftAmount::Form::Expression: break;
+    }
+    return converted.expression == shift.getInput(1) ? amount : insideCall(printed(converted.expression));
+}
+
+void StringifySymbolicExpr::PrintQExprFromCExpr(const SymbolicExpr& node) {
+    const std::span<const Printed> shown = operands(node.getNumInputs());
+    boost::container::small_vector<Printed, 2> arguments;
+    for (const Printed& operand : shown)
+        arguments.push_back(insideCall(operand));
+    if (node.op() == SymbolicOp::ShiftLeft || node.op() == SymbolicOp::ShiftRight)
+        arguments[1] = shiftAmount(node, arguments[1]);
+    stack_.resize(stack_.size() - arguments.size());
+    push(quillCall(node.op(), {arguments.data(), arguments.size()}));
+}
+
+// Visits.
+
+/// What a node's row in the operator table says.
+template <SymbolicOp Op, class Node> void StringifySymbolicExpr::append(const Node& node) {
+    static constexpr const OperatorInfo& row = operatorInfo(Op);
+    [[maybe_unused]] const char* const spelling = quillSyntax_ ? row.quill.data() : row.c.data();
+    if constexpr (Op == SymbolicOp::String) {
+        if (plainNames_)
+            push(Op, node.getName(), row.precedence);
+        else
+            push(Op, identifier(node), row.precedence);
+    } else if constexpr (Op == SymbolicOp::IntValue) {
+        appendInteger(node.getValue());
+    } else if constexpr (Op == SymbolicOp::DoubleValue) {
+        appendDouble(node.getValue());
+    } else if constexpr (row.form == OperatorForm::Infix || row.form == OperatorForm::Prefix ||
+                         row.form == OperatorForm::Postfix) {
+        if (quillSyntax_ && row.quill.empty())
+            PrintQExprFromCExpr(node);
+        else if constexpr (row.form == OperatorForm::Infix)
+            appendBinary(Op, spelling, row.precedence, row.associativity);
+        else
+            appendUnary(Op, spelling, row.precedence, row.associativity, row.form == OperatorForm::Prefix);
+    } else if constexpr (row.form == OperatorForm::Field) {
+        push(SymbolicOp::String, node.getMemberName(), leafPrecedence);
+        appendBinary(Op, spelling, row.precedence, row.associativity);
+    } else if constexpr (row.form == OperatorForm::Range || row.form == OperatorForm::Function) {
+        replaceOperands(node.getNumInputs(), [&](std::span<const Printed> inputs) {
+            return Printed{Op, list(inputs, "", row.form == OperatorForm::Range ? spelling : " ", ""), row.precedence};
+        });
+    } else if constexpr (row.form == OperatorForm::Brackets) {
+        appendArraySelection(node, "[", "]", ",");
+    } else if constexpr (row.form == OperatorForm::Row) {
+        appendArraySelection(node, "", "", ",");
+    } else if constexpr (row.form == OperatorForm::Rows) {
+        appendArraySelection(node, "[", "]", ";");
+    } else if constexpr (row.form == OperatorForm::Cell) {
+        appendCellArray(node);
+    } else {
+        static_assert(row.form == OperatorForm::Call);
+        appendFcnCall(node);
+    }
+}
+
+#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                           \
+    void StringifySymbolicExpr::visit(const Class& node) { append<SymbolicOp::Name>(node); }
+#include "base/core/operators.def"
+#undef VTSYM_OPERATOR
+
+} // namespace VT

@@ -1,0 +1,316 @@
+#include "base/print/TextPool.hpp"
+
+#include "base/core/Limits.hpp"
+
+#include <algorithm>
+#include <bit>
+#include <cstring>
+#include <limits>
+#include <stdexcept>
+#include <vector>
+
+namespace VT {
+
+namespace {
+
+/// The head of a text as a number, its first byte the most significant: heads compare as numbers and append by shifting.
+__extension__ using HeadValue = unsigned __int128;
+
+std::uint64_t bigEndian(std::uint64_t value) {
+    return std::endian::native == std::endian::little ? __builtin_bswap64(value) : value;
+}
+
+HeadValue load(const char* bytes) {
+    std::uint64_t high = 0;
+    std::uint64_t low = 0;
+    std::memcpy(&high, bytes, sizeof high);
+    std::memcpy(&low, bytes + sizeof high, sizeof low);
+    return HeadValue{bigEndian(high)} << 64U | bigEndian(low);
+}
+
+template <class Glue> bool fits(std::string_view text) { return text.size() <= sizeof(Glue::bytes); }
+
+template <class Glue> Glue glueOf(std::string_view text) {
+    Glue glue{};
+    glue.size = static_cast<std::uint8_t>(text.size());
+    for (std::size_t i = 0; i < text.size(); ++i)
+        glue.bytes[i] = text[i];
+    return glue;
+}
+
+template <class Glue> std::string_view view(const Glue& glue) { return {glue.bytes.data(), glue.size}; }
+
+/// Writes all the room of a glue and steps over what it holds: what is written too much is overwritten or in the slack.
+template <class Glue> char* put(char* out, const Glue& glue) {
+    std::memcpy(out, glue.bytes.data(), glue.bytes.size());
+    return out + glue.size;
+}
+
+} // namespace
+
+/// Collects the head and the length of a join.
+class TextPool::HeadBuilder {
+public:
+    template <std::size_t Capacity> void add(const Glue<Capacity>& glue) { append(glue.bytes, glue.size); }
+    void add(const Record& part) { append(part.head, part.length); }
+    void finish(Record& record) const {
+        std::memcpy(record.head.data(), bytes_.data(), headBytes);
+        record.length = size_;
+    }
+
+private:
+    template <std::size_t Size> void append(const std::array<char, Size>& bytes, std::uint64_t size) {
+        std::memcpy(bytes_.data() + std::min<std::uint64_t>(size_, headBytes), bytes.data(), Size);
+        size_ = std::min(size_ + size, unbounded);
+    }
+
+    std::array<char, 2 * headBytes> bytes_{};
+    std::uint64_t size_ = 0;
+};
+
+/// A new record, to be written before it is read.
+TextPool::Record& TextPool::add() {
+    if (records_.size() > std::numeric_limits<std::uint32_t>::max())
+        throw std::length_error("basic_string::append");
+    return *records_.extend(1);
+}
+
+Text TextPool::bytes(std::string_view bytes) {
+    Record record{};
+    record.length = bytes.size();
+    if (bytes.size() <= headBytes) {
+        std::memcpy(record.head.data(), bytes.data(), bytes.size());
+    } else {
+        std::memcpy(record.head.data(), bytes.data(), headBytes);
+        record.kind = Kind::Long;
+        record.first = static_cast<std::uint32_t>(bytes_.size());
+        record.second = static_cast<std::uint32_t>(bytes_.size() >> 32U);
+        std::memcpy(bytes_.extend(bytes.size()), bytes.data(), bytes.size());
+    }
+    record.leading = static_cast<std::uint32_t>(records_.size());
+    add() = record;
+    return last();
+}
+
+Text TextPool::join(std::string_view open, std::span<const Text> parts, std::string_view separator,
+                    std::string_view close) {
+    if (!fits<Bracket>(open) || !fits<Bracket>(close) || !fits<Separator>(separator))
+        return joinBeyondGlue(open, parts, separator, close);
+    if (parts.empty())
+        return bytes(std::string(open).append(close));
+    if (parts.size() == 1 && open.empty() && close.empty())
+        return parts.front();
+    Record record{};
+    record.open = glueOf<Bracket>(open);
+    record.separator = glueOf<Separator>(separator);
+    record.close = glueOf<Bracket>(close);
+    HeadBuilder head;
+    head.add(record.open);
+    const Record& front = this->record(parts.front());
+    head.add(front);
+    for (const Text part : parts.subspan(1)) {
+        head.add(record.separator);
+        head.add(this->record(part));
+    }
+    head.add(record.close);
+    head.finish(record);
+    if (record.length == 0)
+        return parts.front();
+    const bool beginsAlike = open.empty() && front.length >= limits::orderedTextBytes;
+    record.leading = beginsAlike ? front.leading : static_cast<std::uint32_t>(records_.size());
+    if (parts.size() <= 2) {
+        record.kind = Kind::Join;
+        record.parts = static_cast<std::uint8_t>(parts.size());
+        record.first = static_cast<std::uint32_t>(parts.front());
+        record.second = static_cast<std::uint32_t>(parts.back());
+    } else {
+        if (parts_.size() + parts.size() > std::numeric_limits<std::uint32_t>::max())
+            throw std::length_error("basic_string::append");
+        record.kind = Kind::List;
+        record.first = static_cast<std::uint32_t>(parts_.size());
+        record.second = static_cast<std::uint32_t>(parts.size());
+        std::ranges::copy(parts, parts_.extend(parts.size()));
+    }
+    add() = record;
+    return last();
+}
+
+/// Spellings of unusual length become texts of their own.
+Text TextPool::joinBeyondGlue(std::string_view open, std::span<const Text> parts, std::string_view separator,
+                              std::string_view close) {
+    std::vector<Text> all{bytes(open)};
+    for (const Text& part : parts) {
+        if (&part != parts.data())
+            all.push_back(bytes(separator));
+        all.push_back(part);
+    }
+    all.push_back(bytes(close));
+    return join("", all, "", "");
+}
+
+std::string TextPool::str(Text text, std::size_t bound) const {
+    // Short bytes and glue are written in whole words, so there is room behind the end.
+    constexpr std::size_t slack = headBytes;
+    constexpr std::size_t small = 256;
+    const std::uint64_t length = this->length(text);
+    if (length > bound)
+        throw std::length_error("basic_string::append");
+    const auto size = static_cast<std::size_t>(length);
+    if (size <= small) {
+        std::array<char, small + slack> buffer;
+        write(text, buffer.data());
+        return {buffer.data(), size};
+    }
+    std::string result(size + slack, '\0');
+    write(text, result.data());
+    result.resize(size);
+    return result;
+}
+
+/// Writes a text from left to right; what is left to write stands on a stack of joins and the part that comes next in each.
+char* TextPool::write(Text text, char* out) const {
+    auto at = static_cast<std::uint32_t>(text);
+    while (true) {
+        const Record& record = records_[at];
+        if (record.kind >= Kind::Join) {
+            out = put(out, record.open);
+            pending_.push_back({at, 1});
+            at = part(record, 0);
+            continue;
+        }
+        if (record.kind == Kind::Short) {
+            std::memcpy(out, record.head.data(), headBytes);
+        } else {
+            std::memcpy(out, &bytes_[record.position()], static_cast<std::size_t>(record.length));
+        }
+        out += record.length;
+        while (true) {
+            if (pending_.size() == 0)
+                return out;
+            Pending& top = pending_[pending_.size() - 1];
+            const Record& join = records_[top.record];
+            const std::uint32_t count = partCount(join);
+            if (top.next == count) {
+                out = put(out, join.close);
+                pending_.pop_back();
+                continue;
+            }
+            out = put(out, join.separator);
+            at = part(join, top.next);
+            if (++top.next == count && join.close.size == 0)
+                pending_.pop_back();
+            break;
+        }
+    }
+}
+
+void TextPool::clear() noexcept {
+    records_.clear();
+    parts_.clear();
+    bytes_.clear();
+    pending_.clear();
+}
+
+// Order.
+
+/// Runs over a text in pieces: joins that the caller may step over or into, and runs of bytes.
+class TextPool::Cursor {
+public:
+    Cursor(const TextPool& pool, Text text) : pool_(pool) { enter(static_cast<std::uint32_t>(text)); }
+
+    [[nodiscard]] bool atEnd() const noexcept { return !isJoin_ && run_.empty(); }
+    /// Whether the piece is a join; bytes() is the piece otherwise, and never empty.
+    [[nodiscard]] bool isJoin() const noexcept { return isJoin_; }
+    [[nodiscard]] std::uint32_t join() const noexcept { return join_; }
+    [[nodiscard]] std::uint64_t joinLength() const noexcept { return pool_.records_[join_].length; }
+    [[nodiscard]] std::string_view bytes() const noexcept { return run_; }
+
+    void stepOverJoin() { next(); }
+    void stepIntoJoin() {
+        stack_.push_back({join_, 0});
+        isJoin_ = false;
+        run_ = view(pool_.records_[join_].open);
+        if (run_.empty())
+            next();
+    }
+    void consume(std::size_t count) {
+        run_.remove_prefix(count);
+        if (run_.empty())
+            next();
+    }
+
+private:
+    /// Each join counts its steps: part 0, separator, part 1, ..., close.
+    void next() {
+        isJoin_ = false;
+        run_ = {};
+        while (run_.empty() && !isJoin_ && !stack_.empty()) {
+            Pending& top = stack_.back();
+            const Record& join = pool_.records_[top.record];
+            const std::uint64_t step = top.next++;
+            const std::uint64_t last = 2 * std::uint64_t{pool_.partCount(join)} - 1;
+            if (step == last) {
+                stack_.pop_back();
+                run_ = view(join.close);
+            } else if (step % 2 == 1) {
+                run_ = view(join.separator);
+            } else {
+                enter(pool_.part(join, static_cast<std::uint32_t>(step / 2)));
+            }
+        }
+    }
+    void enter(std::uint32_t record) {
+        join_ = pool_.records_[record].leading;
+        const Record& piece = pool_.records_[join_];
+        isJoin_ = piece.kind >= Kind::Join;
+        if (!isJoin_)
+            run_ = pool_.ownBytes(piece);
+    }
+
+    const TextPool& pool_;
+    std::vector<Pending> stack_;
+    std::string_view run_;
+    std::uint32_t join_ = 0;
+    bool isJoin_ = false;
+};
+
+int TextPool::compare(Text left, Text right) const {
+    if (left == right)
+        return 0;
+    const Record& a = record(left);
+    const Record& b = record(right);
+    const HeadValue headA = load(a.head.data());
+    const HeadValue headB = load(b.head.data());
+    if (headA != headB)
+        return headA < headB ? -1 : 1;
+    if (a.length <= headBytes || b.length <= headBytes)
+        return a.length < b.length ? -1 : static_cast<int>(a.length > b.length);
+
+    Cursor one(*this, left);
+    Cursor two(*this, right);
+    std::uint64_t position = 0;
+    while (position < limits::orderedTextBytes) {
+        if (one.atEnd() || two.atEnd())
+            return static_cast<int>(two.atEnd()) - static_cast<int>(one.atEnd());
+        if (one.isJoin() && two.isJoin() && one.join() == two.join()) {
+            position += one.joinLength();
+            one.stepOverJoin();
+            two.stepOverJoin();
+        } else if (one.isJoin() && (!two.isJoin() || one.joinLength() >= two.joinLength())) {
+            one.stepIntoJoin();
+        } else if (two.isJoin()) {
+            two.stepIntoJoin();
+        } else {
+            const std::size_t count = std::min<std::size_t>({one.bytes().size(), two.bytes().size(),
+                                                             static_cast<std::size_t>(limits::orderedTextBytes - position)});
+            if (const int order = std::memcmp(one.bytes().data(), two.bytes().data(), count); order != 0)
+                return order < 0 ? -1 : 1;
+            position += count;
+            one.consume(count);
+            two.consume(count);
+        }
+    }
+    return 0;
+}
+
+} // namespace VT

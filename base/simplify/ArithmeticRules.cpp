@@ -1,0 +1,331 @@
+// Rules for sums, products and quotients.
+//
+// Integer arithmetic wraps at 32 bits.  Adding and multiplying integers modulo 2^32 is associative, commutative and distributive,
+// so terms may be gathered in any order; what a rule writes down is exact in 64 bits and written only where it fits 32.  Reals
+// are rounded at each step, so they are folded pair by pair and never regrouped.  Quotients are moved as if they were exact.
+#include "base/core/IdMap.hpp"
+#include "base/core/Walk.hpp"
+#include "base/simplify/RuleTables.hpp"
+
+#include <algorithm>
+#include <cmath>
+#include <functional>
+#include <limits>
+
+namespace VT {
+
+namespace {
+
+bool fitsInt(std::int64_t value) {
+    return value >= std::numeric_limits<int>::min() && value <= std::numeric_limits<int>::max();
+}
+
+SymbolicExprId integerIfFits(RuleContext& context, std::int64_t value) {
+    return fitsInt(value) ? context.make<SymbolicIntValue>(static_cast<int>(value)) : invalidId;
+}
+
+SymbolicExprId realIfFinite(RuleContext& context, double value) {
+    return std::isfinite(value) ? context.make<SymbolicDoubleValue>(value) : invalidId;
+}
+
+/// Two literals combined: integers exactly, and only where the result fits; others as reals, and only to finite values.
+SymbolicExprId foldNumbers(RuleContext& context, SymbolicOp op, SymbolicExprId a, SymbolicExprId b) {
+    if (!context.isNumber(a) || !context.isNumber(b))
+        return invalidId;
+    const std::optional<int> left = context.integer(a);
+    const std::optional<int> right = context.integer(b);
+    if (left && right) {
+        const std::int64_t x = *left;
+        const std::int64_t y = *right;
+        switch (op) {
+        case SymbolicOp::Plus: return integerIfFits(context, x + y);
+        case SymbolicOp::Minus: return integerIfFits(context, x - y);
+        case SymbolicOp::Multiply: return integerIfFits(context, x * y);
+        default: return y != 0 && x % y == 0 ? integerIfFits(context, x / y) : invalidId;
+        }
+    }
+    const double x = context.node(a).getNumValue();
+    const double y = context.node(b).getNumValue();
+    switch (op) {
+    case SymbolicOp::Plus: return realIfFinite(context, x + y);
+    case SymbolicOp::Minus: return realIfFinite(context, x - y);
+    case SymbolicOp::Multiply: return realIfFinite(context, x * y);
+    default: return y != 0 ? realIfFinite(context, x / y) : invalidId;
+    }
+}
+
+SymbolicExprId foldedNumbers(RuleContext& context, const RuleOperands& x) {
+    return foldNumbers(context, x.op, x.valueA, x.valueB);
+}
+
+/// The operands of a node of a binary operator, or nullptr.
+const SymbolicBinaryExpr* binary(const RuleContext& context, SymbolicExprId id, SymbolicOp op) {
+    const SymbolicExpr& node = context.node(id);
+    return node.op() == op ? static_cast<const SymbolicBinaryExpr*>(&node) : nullptr;
+}
+
+// Products.
+
+SymbolicExprId cancelledQuotient(RuleContext& context, const RuleOperands& x) {
+    if (const auto* quotient = binary(context, x.a, SymbolicOp::Divide); quotient != nullptr && quotient->right() == x.b)
+        return quotient->left();
+    if (const auto* quotient = binary(context, x.b, SymbolicOp::Divide); quotient != nullptr && quotient->right() == x.a)
+        return quotient->left();
+    return invalidId;
+}
+
+/// x*1, 1*x, x*0 and 0*x.
+SymbolicExprId neutralFactor(RuleContext& context, const RuleOperands& x) {
+    const std::optional<int> a = context.integer(x.valueA);
+    const std::optional<int> b = context.integer(x.valueB);
+    if (a == 1 || b == 0)
+        return x.b;
+    if (b == 1 || a == 0)
+        return x.a;
+    return invalidId;
+}
+
+/// c*(r + d) with integers c and d; what r is multiplied with is not distributed again.
+SymbolicExprId distributedFactor(RuleContext& context, const RuleOperands& x) {
+    const bool plus = binary(context, x.b, SymbolicOp::Plus) != nullptr;
+    const auto* sum = plus ? binary(context, x.b, SymbolicOp::Plus) : binary(context, x.b, SymbolicOp::Minus);
+    if (sum == nullptr || !context.integer(x.valueA) || !context.integer(sum->right()))
+        return invalidId;
+    const SymbolicExprId constant = foldNumbers(context, SymbolicOp::Multiply, x.valueA, sum->right());
+    if (constant == invalidId)
+        return invalidId;
+    const SymbolicOp op = plus ? SymbolicOp::Plus : SymbolicOp::Minus;
+    const bool nested = sumOps.contains(context.op(sum->left()));
+    const SymbolicExprId product = nested ? context.makeBinary(SymbolicOp::Multiply, x.a, sum->left())
+                                          : simplifyMultiply(context, x.a, sum->left());
+    const SymbolicExprId result = simplifySum(context, context.makeBinary(op, product, constant));
+    const SymbolicExprId expression = context.makeBinary(SymbolicOp::Multiply, x.a, x.b);
+    return context.confirmRewrite(expression, result) ? result : invalidId;
+}
+
+SymbolicExprId gatheredFactor(RuleContext& context, const RuleOperands& x) {
+    const auto* product = binary(context, x.b, SymbolicOp::Multiply);
+    if (product == nullptr || !context.integer(x.valueA) || !context.integer(product->left()))
+        return invalidId;
+    const SymbolicExprId factor = foldNumbers(context, SymbolicOp::Multiply, x.valueA, product->left());
+    return factor == invalidId ? invalidId : context.makeBinary(SymbolicOp::Multiply, factor, product->right());
+}
+
+SymbolicExprId reducedFraction(RuleContext& context, const RuleOperands& x) {
+    const auto* quotient = binary(context, x.b, SymbolicOp::Divide);
+    if (quotient == nullptr)
+        return invalidId;
+    const std::optional<int> factor = context.integer(x.valueA);
+    const std::optional<int> divisor = context.integer(quotient->right());
+    if (!factor || !divisor || *divisor == 0 || std::int64_t{*factor} % *divisor != 0)
+        return invalidId;
+    const SymbolicExprId rest = integerIfFits(context, std::int64_t{*factor} / *divisor);
+    return rest == invalidId ? invalidId : simplifyMultiply(context, rest, quotient->left());
+}
+
+constexpr OperatorSet multiplyOnly{SymbolicOp::Multiply};
+constexpr NodeRule multiplyRules[] = {
+    {{multiplyOnly, "folded product", "2*3", "6"}, foldedNumbers},
+    {{multiplyOnly, "cancelled quotient", "N/M*M", "N"}, cancelledQuotient},
+    {{multiplyOnly, "neutral factor", "1*N", "N"}, neutralFactor},
+    {{multiplyOnly, "distributed factor", "2*(N + 3)", "2*N + 6"}, distributedFactor},
+    {{multiplyOnly, "gathered factor", "2*(3*N)", "6*N"}, gatheredFactor},
+    {{multiplyOnly, "reduced fraction", "4*(N/2)", "2*N"}, reducedFraction},
+};
+
+// Quotients.
+
+SymbolicExprId neutralDivisor(RuleContext& context, const RuleOperands& x) {
+    return context.integer(x.valueB) == 1 ? x.a : invalidId;
+}
+
+constexpr OperatorSet divideOnly{SymbolicOp::Divide};
+constexpr NodeRule divideRules[] = {
+    {{divideOnly, "folded quotient", "6/3", "2"}, foldedNumbers},
+    {{divideOnly, "neutral divisor", "N/1", "N"}, neutralDivisor},
+};
+
+// Sums.
+
+/// A sum as integer multiples of terms, in the order in which they first occur, and a constant.
+class LinearSum {
+public:
+    /// Reads a chain of +, - and unary minus; false where it holds a real literal or a multiple does not fit.
+    bool read(const RuleContext& context, SymbolicExprId root);
+    /// The sum, constant last; the invalid identifier where a multiple or the constant does not fit.
+    SymbolicExprId write(RuleContext& context) const;
+
+private:
+    struct Term {
+        SymbolicExprId operand;
+        std::int64_t factor;
+        SymbolicExprId asWritten; ///< the one occurrence, or the invalid identifier where there were several
+        int sign;                 ///< of that occurrence
+    };
+    bool add(const RuleContext& context, SymbolicExprId operand, std::int64_t multiple);
+    SymbolicExprId write(RuleContext& context, const Term& term, bool negate) const;
+
+    std::vector<Term> terms_;
+    IdMap<std::size_t> positions_;
+    std::int64_t constant_ = 0;
+};
+
+bool LinearSum::add(const RuleContext& context, SymbolicExprId operand, std::int64_t multiple) {
+    if (const std::optional<int> literal = context.integer(operand)) {
+        std::int64_t value = 0;
+        return !__builtin_mul_overflow(multiple, std::int64_t{*literal}, &value) &&
+               !__builtin_add_overflow(constant_, value, &constant_);
+    }
+    SymbolicExprId base = operand;
+    std::int64_t factor = multiple;
+    if (const auto* product = binary(context, operand, SymbolicOp::Multiply)) {
+        const std::optional<int> left = context.integer(product->left());
+        const std::optional<int> right = context.integer(product->right());
+        base = left ? product->right() : right ? product->left() : operand;
+        if ((left || right) && __builtin_mul_overflow(multiple, std::int64_t{left ? *left : *right}, &factor))
+            return false;
+    }
+    if (const std::size_t* known = positions_.find(base)) {
+        Term& term = terms_[*known];
+        term.asWritten = invalidId;
+        return !__builtin_add_overflow(term.factor, factor, &term.factor);
+    }
+    const bool once = multiple == 1 || multiple == -1;
+    positions_.insert(base, terms_.size());
+    terms_.push_back({base, factor, once ? operand : invalidId, multiple < 0 ? -1 : 1});
+    return true;
+}
+
+bool LinearSum::read(const RuleContext& context, SymbolicExprId root) {
+    // How often each node of the chain occurs is known once everything above it has been counted: identifiers fall downwards.
+    std::vector<SymbolicExprId> order;
+    std::vector<SymbolicExprId> pending{root};
+    IdMap<std::int64_t> multiples;
+    while (!pending.empty()) {
+        const SymbolicExprId id = pending.back();
+        pending.pop_back();
+        if (multiples.find(id) != nullptr)
+            continue;
+        multiples.insert(id, 0);
+        order.push_back(id);
+        const SymbolicExpr& node = context.node(id);
+        if (node.op() == SymbolicOp::DoubleValue)
+            return false;
+        if (sumOps.contains(node.op()))
+            for (std::size_t i = node.getNumInputs(); i-- > 0;)
+                pending.push_back(node.getInput(i));
+    }
+    std::vector<SymbolicExprId> downwards = order;
+    std::ranges::sort(downwards, std::greater<>());
+    multiples.insert(root, 1);
+    for (const SymbolicExprId id : downwards) {
+        const SymbolicExpr& node = context.node(id);
+        if (!sumOps.contains(node.op()))
+            continue;
+        const std::int64_t multiple = *multiples.find(id);
+        for (std::size_t i = 0; i < node.getNumInputs(); ++i) {
+            const bool negated = node.op() == SymbolicOp::UnaryMinus || (node.op() == SymbolicOp::Minus && i == 1);
+            std::int64_t& operand = *multiples.find(node.getInput(i));
+            if (negated ? __builtin_sub_overflow(operand, multiple, &operand)
+                        : __builtin_add_overflow(operand, multiple, &operand))
+                return false;
+        }
+    }
+    for (const SymbolicExprId id : order)
+        if (!sumOps.contains(context.op(id)) && !add(context, id, *multiples.find(id)))
+            return false;
+    return true;
+}
+
+SymbolicExprId LinearSum::write(RuleContext& context, const Term& term, bool negate) const {
+    if (term.asWritten != invalidId && (term.sign < 0) == negate)
+        return term.asWritten;
+    const std::int64_t factor = negate ? -term.factor : term.factor;
+    if (factor == 1)
+        return term.operand;
+    const SymbolicExprId literal = integerIfFits(context, factor);
+    return literal == invalidId ? invalidId : context.makeBinary(SymbolicOp::Multiply, literal, term.operand);
+}
+
+SymbolicExprId LinearSum::write(RuleContext& context) const {
+    SymbolicExprId sum = invalidId;
+    for (const Term& term : terms_) {
+        if (term.factor == 0)
+            continue;
+        const bool negative = term.asWritten != invalidId ? term.sign < 0 : term.factor < 0;
+        const bool leading = sum == invalidId;
+        // A leading multiple carries its sign itself; a leading -N is a negation.
+        const bool negation = leading && negative && (term.asWritten != invalidId || term.factor == -1);
+        const SymbolicExprId operand = write(context, term, leading ? negation : negative);
+        if (operand == invalidId)
+            return invalidId;
+        if (leading)
+            sum = negation ? context.make<SymbolicUnaryMinusExpr>(operand) : operand;
+        else
+            sum = context.makeBinary(negative ? SymbolicOp::Minus : SymbolicOp::Plus, sum, operand);
+    }
+    if (sum == invalidId)
+        return integerIfFits(context, constant_);
+    if (constant_ == 0)
+        return sum;
+    const bool subtract = constant_ < 0 && fitsInt(-constant_);
+    const SymbolicExprId literal = integerIfFits(context, subtract ? -constant_ : constant_);
+    if (literal == invalidId)
+        return invalidId;
+    return context.makeBinary(subtract ? SymbolicOp::Minus : SymbolicOp::Plus, sum, literal);
+}
+
+constexpr RuleInfo foldedSum{sumOps, "folded sum", "1.5 + 2.5", "4"};
+constexpr RuleInfo gatheredSum{sumOps, "gathered sum", "1 + N + N - 3", "2*N - 2"};
+
+void append(std::span<const NodeRule> rules, std::vector<const RuleInfo*>& out) {
+    for (const NodeRule& rule : rules)
+        out.push_back(&rule.info);
+}
+
+} // namespace
+
+SymbolicExprId simplifyMultiply(RuleContext& context, SymbolicExprId a, SymbolicExprId b) {
+    const RuleOperands operands{SymbolicOp::Multiply, a, b, context.resolve(a), context.resolve(b)};
+    const SymbolicExprId result = applyFirst(multiplyRules, context, operands);
+    return result != invalidId ? result : context.makeBinary(SymbolicOp::Multiply, a, b);
+}
+
+SymbolicExprId simplifyDivide(RuleContext& context, SymbolicExprId a, SymbolicExprId b) {
+    const RuleOperands operands{SymbolicOp::Divide, a, b, context.resolve(a), context.resolve(b)};
+    const SymbolicExprId result = applyFirst(divideRules, context, operands);
+    return result != invalidId ? result : context.makeBinary(SymbolicOp::Divide, a, b);
+}
+
+SymbolicExprId foldSum(RuleContext& context, SymbolicExprId root) {
+    if (!context.node(root).isBinaryExpr())
+        return root;
+    const auto& node = static_cast<const SymbolicBinaryExpr&>(context.node(root));
+    const SymbolicExprId folded =
+        foldNumbers(context, node.op(), context.resolve(node.left()), context.resolve(node.right()));
+    if (folded == invalidId)
+        return root;
+    context.fired(foldedSum, root, folded);
+    return folded;
+}
+
+SymbolicExprId simplifySum(RuleContext& context, SymbolicExprId root) {
+    const SymbolicExprId folded = foldSum(context, root);
+    if (!sumOps.contains(context.op(folded)))
+        return folded;
+    LinearSum sum;
+    const SymbolicExprId gathered = sum.read(context, root) ? sum.write(context) : invalidId;
+    if (gathered == invalidId)
+        return root;
+    context.fired(gatheredSum, root, gathered);
+    return gathered;
+}
+
+void appendArithmeticRules(std::vector<const RuleInfo*>& out) {
+    out.push_back(&foldedSum);
+    out.push_back(&gatheredSum);
+    append(multiplyRules, out);
+    append(divideRules, out);
+}
+
+} // namespace VT

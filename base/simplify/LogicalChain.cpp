@@ -1,0 +1,315 @@
+#include "base/simplify/LogicalChain.hpp"
+
+#include "base/simplify/Atoms.hpp"
+#include "base/simplify/RuleTables.hpp"
+
+#include <algorithm>
+#include <iterator>
+#include <map>
+#include <span>
+#include <utility>
+
+namespace VT {
+
+namespace {
+
+constexpr std::size_t searchSteps = 20000;
+
+/// A chain on its way to a sum of products: first its operands, then covers whose product (And) or sum (Or) it is.
+struct Chain {
+    Chain(RuleContext& rules, SymbolicOp chainOp, SymbolicExprId root)
+        : context(rules), op(chainOp), source(root), shown(root), atoms(rules),
+          operands(chainOperands(rules, chainOp, root, repeated)) {}
+
+    [[nodiscard]] bool isAnd() const noexcept { return op == SymbolicOp::And; }
+    /// The constant that decides the chain alone, and the one that it does without.
+    [[nodiscard]] SymbolicExprId dominant() const { return context.truth(!isAnd()); }
+    [[nodiscard]] SymbolicExprId neutral() const { return context.truth(isAnd()); }
+
+    bool decide(SymbolicExprId id) {
+        result = id;
+        return true;
+    }
+    /// Takes operands away; what is left may be one operand or none.
+    template <class Condition> bool drop(Condition condition) {
+        if (std::erase_if(operands, condition) == 0)
+            return false;
+        if (operands.size() < 2)
+            decide(operands.empty() ? neutral() : operands.front());
+        return true;
+    }
+
+    /// Reads the operands in the order of their texts: comparisons into one product, alternatives into covers.
+    void read();
+    /// The chain as it stands now.
+    SymbolicExprId write();
+    /// Gives up beyond the operand limit.
+    bool bounded(std::size_t size) {
+        if (size <= context.operandLimit())
+            return true;
+        context.giveUp();
+        decide(source);
+        return false;
+    }
+
+    RuleContext& context;
+    SymbolicOp op;
+    SymbolicExprId source;
+    SymbolicExprId shown; ///< what an explanation showed last
+    Atoms atoms;
+    bool repeated = false; ///< an operand occurred twice
+    std::vector<SymbolicExprId> operands;
+    bool isRead = false;
+    bool impossible = false;         ///< And: the comparisons contradict each other
+    std::size_t written = 0;         ///< And: operands that are comparisons
+    Cube common;                     ///< And: what they say together
+    std::vector<Cover> alternatives; ///< And: operands that are sums
+    Cover sum;                       ///< Or, and And once it is distributed
+    CoverBudget budget{searchSteps};
+    SymbolicExprId result = invalidId;
+};
+
+void Chain::read() {
+    isRead = true;
+    sortByText(context, operands);
+    std::map<Atom, std::vector<IntegerSet::Interval>> excluded; // by the comparisons of an And
+    for (const SymbolicExprId operand : operands) {
+        if (!isAnd()) {
+            Cube product;
+            if (atoms.readProduct(operand, product))
+                sum.push_back(std::move(product));
+        } else if (context.op(operand) == SymbolicOp::Or) {
+            Cover cover;
+            bool ignored = false;
+            for (const SymbolicExprId alternative : chainOperands(context, SymbolicOp::Or, operand, ignored)) {
+                Cube product;
+                if (atoms.readProduct(alternative, product))
+                    cover.push_back(std::move(product));
+            }
+            alternatives.push_back(std::move(cover));
+        } else {
+            const Constraint constraint = atoms.read(operand);
+            const IntegerSet others = constraint.set.complement();
+            std::ranges::copy(others.intervals(), std::back_inserter(excluded[constraint.atom]));
+            ++written;
+        }
+    }
+    for (auto& [atom, intervals] : excluded)
+        impossible = !common.restrict(atom, IntegerSet::of(std::move(intervals)).complement()) || impossible;
+}
+
+SymbolicExprId Chain::write() {
+    if (result != invalidId)
+        return result;
+    if (!isRead)
+        return foldLeft(context, op, operands);
+    if (!isAnd())
+        return atoms.write(sum);
+    if (impossible)
+        return foldLeft(context, op, operands);
+    std::vector<SymbolicExprId> parts;
+    if (!common.alwaysHolds())
+        parts.push_back(atoms.write({common}));
+    for (const Cover& cover : alternatives)
+        parts.push_back(atoms.write(cover));
+    return parts.empty() ? neutral() : foldLeft(context, op, parts);
+}
+
+// Rules over constants.
+
+bool dominantOperand(Chain& chain) {
+    return std::ranges::find(chain.operands, chain.dominant()) != chain.operands.end() && chain.decide(chain.dominant());
+}
+
+/// A real literal that is not a number counts as true in And and as false in Or.
+bool decides(SymbolicOp op, double number) {
+    return op == SymbolicOp::And ? number <= 0 && number >= 0 : number > 0 || number < 0;
+}
+
+bool numberOperand(Chain& chain) {
+    const auto value = [&](SymbolicExprId id) { return chain.context.resolve(id); };
+    for (const SymbolicExprId operand : chain.operands)
+        if (chain.context.isNumber(value(operand)) && decides(chain.op, chain.context.node(value(operand)).getNumValue()))
+            return chain.decide(chain.dominant());
+    if (std::ranges::all_of(chain.operands, [&](SymbolicExprId id) { return chain.context.isNumber(value(id)); }))
+        return chain.decide(chain.neutral());
+    return chain.drop([&](SymbolicExprId id) { return chain.context.isNumber(value(id)); });
+}
+
+bool neutralOperand(Chain& chain) {
+    return chain.drop([&](SymbolicExprId id) { return id == chain.neutral(); });
+}
+
+bool repeatedOperand(Chain& chain) {
+    if (!std::exchange(chain.repeated, false))
+        return false;
+    if (chain.operands.size() == 1)
+        chain.decide(chain.operands.front());
+    return true;
+}
+
+bool oppositeKeywords(Chain& chain) {
+    const auto has = [&](auto test) {
+        return std::ranges::any_of(chain.operands, [&](SymbolicExprId id) { return (chain.context.*test)(id); });
+    };
+    return has(&RuleContext::isSimKeyword) && has(&RuleContext::isCodegenKeyword) && chain.decide(chain.dominant());
+}
+
+// Rules over what an And says together.
+
+bool contradiction(Chain& chain) {
+    chain.read();
+    return chain.impossible && chain.decide(chain.dominant());
+}
+
+bool commonRange(Chain& chain) { return chain.bounded(chain.common.comparisons()) && chain.common.comparisons() < chain.written; }
+
+bool absorbedAlternative(Chain& chain) {
+    return std::erase_if(chain.alternatives, [&](const Cover& cover) {
+               return std::ranges::any_of(cover, [&](const Cube& cube) { return chain.common.isSubsetOf(cube); });
+           }) > 0;
+}
+
+bool makeSmaller(Cover& cover, CoverBudget& budget) {
+    bool any = false;
+    while (joinCubes(cover) || absorb(cover) || dropComparisons(cover, budget) || dropCubes(cover, budget))
+        any = true;
+    return any;
+}
+
+/// Multiplies covers one after the other and keeps what comes out small.  False where the operand limit is exceeded.
+bool multiplyOut(Chain& chain, std::vector<Cover> factors) {
+    std::ranges::stable_sort(factors, {}, &Cover::size);
+    for (const Cover& factor : factors) {
+        if (!chain.bounded(chain.sum.size() * factor.size()))
+            return false;
+        chain.sum = product(chain.sum, factor);
+        makeSmaller(chain.sum, chain.budget);
+    }
+    return true;
+}
+
+bool distribution(Chain& chain) {
+    const bool any = !chain.alternatives.empty();
+    chain.sum.assign(1, chain.common);
+    if (any && !multiplyOut(chain, std::exchange(chain.alternatives, {})))
+        return false;
+    chain.op = SymbolicOp::Or;
+    return any;
+}
+
+// Rules over sums of products.
+
+bool joinedRange(Chain& chain) {
+    const bool joined = joinCubes(chain.sum);
+    return chain.bounded(chain.sum.size()) && joined;
+}
+
+bool absorbedProduct(Chain& chain) { return absorb(chain.sum); }
+
+bool redundantComparison(Chain& chain) { return dropComparisons(chain.sum, chain.budget); }
+
+bool redundantProduct(Chain& chain) { return dropCubes(chain.sum, chain.budget); }
+
+bool operandOrder(Chain& chain) { return chain.decide(chain.write()); }
+
+struct ChainRule {
+    RuleInfo info;
+    bool (*apply)(Chain& chain);
+};
+
+constexpr OperatorSet andOnly{SymbolicOp::And};
+constexpr OperatorSet orOnly{SymbolicOp::Or};
+constexpr OperatorSet andOr{SymbolicOp::And, SymbolicOp::Or};
+
+// Both families begin with constants; And goes on to what its comparisons say together and is then distributed into a sum of
+// products, which Or's last rules make smaller until none of them applies.
+constexpr ChainRule andRules[] = {
+    {{andOnly, "false operand of And", "A == 1 && false", "false"}, dominantOperand},
+    {{andOnly, "number in And", "2 && A == 1", "A == 1"}, numberOperand},
+    {{andOnly, "true operand of And", "A == 1 && true", "A == 1"}, neutralOperand},
+    {{andOnly, "repeated operand of And", "A && B && A", "A && B"}, repeatedOperand},
+    {{andOnly, "both keywords", "(sim) && (codegen)", "false"}, oppositeKeywords},
+    {{andOnly, "contradiction", "A == 1 && A == 2", "false"}, contradiction},
+    {{andOnly, "common range", "A <= 3 && A >= 3", "A == 3"}, commonRange},
+    {{andOnly, "absorbed alternative", "A && (A || B)", "A"}, absorbedAlternative},
+    {{andOnly, "distribution", "(A == 1 || A == 2) && B == 3", "A == 1 && B == 3 || A == 2 && B == 3"}, distribution},
+};
+
+constexpr ChainRule orRules[] = {
+    {{orOnly, "true operand of Or", "A == 1 || true", "true"}, dominantOperand},
+    {{orOnly, "number in Or", "0 || A == 1", "A == 1"}, numberOperand},
+    {{orOnly, "false operand of Or", "A == 1 || false", "A == 1"}, neutralOperand},
+    {{orOnly, "repeated operand of Or", "A || B || A", "A || B"}, repeatedOperand},
+    {{orOnly, "either keyword", "(sim) || (codegen)", "true"}, oppositeKeywords},
+};
+
+constexpr ChainRule sumRules[] = {
+    {{andOr, "joined range", "A == 3 || A > 3", "A >= 3"}, joinedRange},
+    {{andOr, "absorbed product", "A || A && B", "A"}, absorbedProduct},
+    {{andOr, "redundant comparison", "A == 1 || A ~= 1 && B == 2", "A == 1 || B == 2"}, redundantComparison},
+    {{andOr, "redundant product", "A && B || ~A && C || B && C", "A && B || C && ~A"}, redundantProduct},
+};
+
+constexpr ChainRule orderRule = {{andOr, "operand order", "B == 2 && A == 1", "A == 1 && B == 2"}, operandOrder};
+
+/// Applies one rule and tells of it.
+bool apply(const ChainRule& rule, Chain& chain) {
+    const bool changed = rule.apply(chain);
+    if (changed && chain.context.explaining()) {
+        const SymbolicExprId after = chain.write();
+        chain.context.fired(rule.info, std::exchange(chain.shown, after), after);
+    }
+    return changed;
+}
+
+/// Tries the rules from top to bottom until one decides the chain.
+bool decidedBy(std::span<const ChainRule> rules, Chain& chain) {
+    for (const ChainRule& rule : rules) {
+        apply(rule, chain);
+        if (chain.result != invalidId)
+            return true;
+    }
+    return false;
+}
+
+SymbolicExprId reduceSum(Chain& chain) {
+    if (!chain.isRead)
+        chain.read();
+    bool again = true;
+    while (again && chain.result == invalidId)
+        again = std::ranges::any_of(sumRules, [&](const ChainRule& rule) { return apply(rule, chain); });
+    if (chain.result == invalidId)
+        apply(orderRule, chain);
+    return chain.result;
+}
+
+} // namespace
+
+SymbolicExprId simplifyChain(RuleContext& context, SymbolicExprId root) {
+    Chain chain(context, context.op(root), root);
+    if (decidedBy(chain.isAnd() ? std::span<const ChainRule>(andRules) : std::span<const ChainRule>(orRules), chain))
+        return chain.result;
+    return reduceSum(chain);
+}
+
+SymbolicExprId negateChain(RuleContext& context, SymbolicExprId root) {
+    Chain chain(context, SymbolicOp::Or, root);
+    chain.read();
+    std::vector<Cover> factors;
+    for (const Cube& cube : chain.sum)
+        factors.push_back(complement(cube));
+    chain.sum.assign(1, Cube());
+    if (!multiplyOut(chain, std::move(factors)))
+        return invalidId;
+    return reduceSum(chain);
+}
+
+void appendLogicalRules(std::vector<const RuleInfo*>& out) {
+    for (const std::span<const ChainRule> family : {std::span<const ChainRule>(andRules), std::span<const ChainRule>(orRules),
+                                                    std::span<const ChainRule>(sumRules), std::span(&orderRule, 1)})
+        for (const ChainRule& rule : family)
+            out.push_back(&rule.info);
+}
+
+} // namespace VT

@@ -1,0 +1,65 @@
+#include "base/simplify/RuleContext.hpp"
+
+#include "base/variants/VariantKeywords.hpp"
+
+#include <type_traits>
+
+namespace VT {
+
+RuleListener::~RuleListener() = default;
+
+RuleContext::RuleContext(SymbolicExprTable& table, const SymbolicExprPrinter& printer, bool keywordsOn)
+    : table_(table), printer_(printer), keywordsOn_(keywordsOn) {}
+
+namespace {
+
+template <class Node> SymbolicExprId makeIfBinary(RuleContext& context, SymbolicExprId a, SymbolicExprId b) {
+    if constexpr (std::is_base_of_v<SymbolicBinaryExpr, Node>)
+        return context.make<Node>(a, b);
+    else
+        return invalidId;
+}
+
+} // namespace
+
+SymbolicExprId RuleContext::makeBinary(SymbolicOp op, SymbolicExprId a, SymbolicExprId b) {
+    switch (op) {
+#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                           \
+    case SymbolicOp::Name: return makeIfBinary<Class>(*this, a, b);
+#include "base/core/operators.def"
+#undef VTSYM_OPERATOR
+    case SymbolicOp::None: break;
+    }
+    return invalidId;
+}
+
+SymbolicExprId RuleContext::resolve(SymbolicExprId id) const {
+    if (op(id) != SymbolicOp::MemberValue)
+        return id;
+    const SymbolicExprId value = table_.getValueId(id);
+    return table_.has(value) ? value : id;
+}
+
+std::optional<int> RuleContext::integer(SymbolicExprId id) const {
+    const SymbolicExpr& literal = node(id);
+    if (literal.op() != SymbolicOp::IntValue)
+        return std::nullopt;
+    return static_cast<const SymbolicIntValue&>(literal).getValue();
+}
+
+bool RuleContext::isSimKeyword(SymbolicExprId id) const {
+    return op(id) == SymbolicOp::String &&
+           VariantKeywords::isSimVariantKeyword(static_cast<const SymbolicString&>(node(id)).getName(), keywordsOn_);
+}
+
+bool RuleContext::isCodegenKeyword(SymbolicExprId id) const {
+    return op(id) == SymbolicOp::String &&
+           VariantKeywords::isCodegenVariantKeyword(static_cast<const SymbolicString&>(node(id)).getName(), keywordsOn_);
+}
+
+void RuleContext::fired(const RuleInfo& rule, SymbolicExprId before, SymbolicExprId after) {
+    if (listener_ != nullptr && before != after)
+        listener_->fired({pass_, &rule, before, after});
+}
+
+} // namespace VT

@@ -1,0 +1,71 @@
+// What every rule works with.
+#pragma once
+
+#include "base/core/Nodes.hpp"
+#include "base/print/ExpressionPrinter.hpp"
+#include "base/simplify/Rule.hpp"
+
+#include <cstdint>
+#include <optional>
+#include <utility>
+
+namespace VT {
+
+/// The table, the order of operands and the state of one pass.
+class RuleContext {
+public:
+    RuleContext(SymbolicExprTable& table, const SymbolicExprPrinter& printer, bool keywordsOn);
+    RuleContext(const RuleContext&) = delete;
+    RuleContext& operator=(const RuleContext&) = delete;
+    virtual ~RuleContext() = default;
+
+    /// Asked before some rules replace an expression.
+    virtual bool confirmRewrite(SymbolicExprId expression, SymbolicExprId replacement) = 0;
+    /// Operands of a flattened chain and products of a distribution.
+    [[nodiscard]] virtual std::uint64_t operandLimit() const = 0;
+    /// Tells that a chain or a distribution is beyond the limit: the pass will not be used.
+    virtual void giveUp() = 0;
+
+    [[nodiscard]] const SymbolicExpr& node(SymbolicExprId id) const { return *table_.get(id); }
+    [[nodiscard]] SymbolicOp op(SymbolicExprId id) const { return node(id).op(); }
+    template <class Node, class... Parts> SymbolicExprId make(Parts&&... parts) {
+        return Node(table_, std::forward<Parts>(parts)...).getId(table_);
+    }
+    /// The node of an operator with two operands; the invalid identifier for other operators.
+    SymbolicExprId makeBinary(SymbolicOp op, SymbolicExprId a, SymbolicExprId b);
+    [[nodiscard]] SymbolicExprId truth(bool value) const { return value ? table_.getIdTRUE() : table_.getIdFALSE(); }
+    [[nodiscard]] bool isTrue(SymbolicExprId id) const { return id == table_.getIdTRUE(); }
+    [[nodiscard]] bool isFalse(SymbolicExprId id) const { return id == table_.getIdFALSE(); }
+
+    /// The value bound to a member, where there is one; otherwise the operand itself.
+    [[nodiscard]] SymbolicExprId resolve(SymbolicExprId id) const;
+    [[nodiscard]] bool isNumber(SymbolicExprId id) const { return node(id).isNumValue(); }
+    /// The value of an integer literal.
+    [[nodiscard]] std::optional<int> integer(SymbolicExprId id) const;
+    [[nodiscard]] bool isBoolean(SymbolicExprId id) const { return booleanOps.contains(op(id)); }
+    [[nodiscard]] bool isSimKeyword(SymbolicExprId id) const;
+    [[nodiscard]] bool isCodegenKeyword(SymbolicExprId id) const;
+
+    /// Whether the Quill text of a sorts before that of b; never depends on how nodes are numbered.
+    [[nodiscard]] bool sortsBefore(SymbolicExprId a, SymbolicExprId b) const {
+        return printer_.compareUsingCache(a, b) < 0;
+    }
+
+    /// Applications of rules, told to the listener; free of cost where nobody listens.
+    [[nodiscard]] bool explaining() const noexcept { return listener_ != nullptr; }
+    void fired(const RuleInfo& rule, SymbolicExprId before, SymbolicExprId after);
+    void listen(RuleListener* listener, std::uint64_t pass) noexcept {
+        listener_ = listener;
+        pass_ = pass;
+    }
+    [[nodiscard]] SymbolicExprTable& table() const noexcept { return table_; }
+
+private:
+    SymbolicExprTable& table_;
+    const SymbolicExprPrinter& printer_;
+    bool keywordsOn_;
+    RuleListener* listener_ = nullptr;
+    std::uint64_t pass_ = 0;
+};
+
+} // namespace VT

@@ -1,0 +1,108 @@
+#include "base/simplify/Simplify.hpp"
+
+#include "base/core/IdMap.hpp"
+#include "base/simplify/RuleTables.hpp"
+#include "base/variants/VariantKeywords.hpp"
+
+namespace VT {
+
+std::span<const RuleInfo* const> simplificationRules() {
+    static const std::vector<const RuleInfo*> rules = [] {
+        std::vector<const RuleInfo*> all;
+        appendNotRules(all);
+        appendComparisonRules(all);
+        appendLogicalRules(all);
+        appendArithmeticRules(all);
+        return all;
+    }();
+    return rules;
+}
+
+namespace {
+
+/// Adds the operands of a chain of `op` to a set; false where there are more than the limit allows.  Walks one left spine after
+/// the other.
+bool collectOperands(const SymbolicExprTable& table, SymbolicOp op, SymbolicExprId root, boost::container::flat_set<SymbolicExprId>& out) {
+    std::vector<SymbolicExprId> pending{root};
+    IdMap<bool> walked;
+    while (!pending.empty()) {
+        if (out.size() >= limits::chainOperands)
+            return false;
+        SymbolicExprId id = pending.back();
+        pending.pop_back();
+        while (table.has(id) && table.get(id)->op() == op && walked.find(id) == nullptr) {
+            walked.insert(id, true);
+            pending.push_back(table.get(id)->getInput(1));
+            id = table.get(id)->getInput(0);
+        }
+        if (!table.has(id) || table.get(id)->op() != op)
+            out.insert(id);
+        if (pending.size() >= limits::chainOperands)
+            return false;
+    }
+    return true;
+}
+
+void addOperands(const SymbolicExprTable& table, SymbolicOp op, const SymbolicExpr& node,
+                 boost::container::flat_set<SymbolicExprId>& out) {
+    const SymbolicExprId root = node.getId(table);
+    if (!table.has(root))
+        return;
+    boost::container::flat_set<SymbolicExprId> operands;
+    if (collectOperands(table, op, root, operands))
+        out.insert(operands.begin(), operands.end());
+    else
+        out.insert(root);
+}
+
+} // namespace
+
+SymbolicExprSimplify::SymbolicExprSimplify(SymbolicExprTable& table, std::uint64_t maxIterations)
+    : table_(table), maxIterations_(maxIterations), keywordsFlag_(isVariantKeywordsSimCodegenFeatureOn()),
+      printer_(table, true) {}
+
+bool SymbolicExprSimplify::isVariantKeywordsSimCodegenFeatureOn() const {
+    return VT::isVariantKeywordsSimCodegenFeatureOn();
+}
+
+SymbolicExprId SymbolicExprSimplify::simplify(SymbolicExprId id, std::uint64_t& passes) const {
+    SymbolicExprSimplifyVisitor visitor(table_, keywordsFlag_, printer_);
+    return simplify(id, passes, visitor);
+}
+
+SymbolicExprId SymbolicExprSimplify::simplify(SymbolicExprId id, std::uint64_t& passes,
+                                              SymbolicExprSimplifyVisitor& visitor) const {
+    passes = 0;
+    if (!table_.has(id))
+        return invalidId;
+    visitor.setListener(listener_);
+    IdMap<bool> seen;
+    SymbolicExprId current = id;
+    for (;;) {
+        seen.insert(current, true);
+        const SymbolicExprId result = visitor.pass(current);
+        ++passes;
+        if (result == current || visitor.hasGivenUp())
+            break;
+        current = result;
+        const bool constant = result == table_.getIdTRUE() || result == table_.getIdFALSE();
+        if (constant || seen.find(result) != nullptr || passes >= maxIterations_)
+            break;
+    }
+    // What an earlier pass reached before one gave up may be a half-finished expansion.
+    if (visitor.hasGivenUp() && printer_.textLength(current) > printer_.textLength(id))
+        return id;
+    return current;
+}
+
+void SymbolicExprSimplify::computeUniqueAndOperandsId(const SymbolicExpr& node,
+                                                      boost::container::flat_set<SymbolicExprId>& out) const {
+    addOperands(table_, SymbolicOp::And, node, out);
+}
+
+void SymbolicExprSimplify::computeUniqueOrOperandsId(const SymbolicExpr& node,
+                                                     boost::container::flat_set<SymbolicExprId>& out) const {
+    addOperands(table_, SymbolicOp::Or, node, out);
+}
+
+} // namespace VT

@@ -1,0 +1,42 @@
+# How everything is compiled: warnings, checks, sanitizers, the compiler cache.
+
+set(CMAKE_CXX_STANDARD 20)
+set(CMAKE_CXX_STANDARD_REQUIRED ON)
+set(CMAKE_CXX_EXTENSIONS OFF)
+set(CMAKE_CXX_VISIBILITY_PRESET hidden)
+set(CMAKE_VISIBILITY_INLINES_HIDDEN ON)
+set(CMAKE_EXPORT_COMPILE_COMMANDS ON)
+
+find_program(VTSYM_CCACHE ccache)
+if(VTSYM_CCACHE AND NOT CMAKE_CXX_COMPILER_LAUNCHER)
+  # The slack that precompiled headers need.
+  set(CMAKE_CXX_COMPILER_LAUNCHER ${CMAKE_COMMAND} -E env
+      CCACHE_SLOPPINESS=pch_defines,time_macros,include_file_mtime,include_file_ctime ${VTSYM_CCACHE})
+endif()
+
+add_library(vtsym_options INTERFACE)
+target_compile_options(vtsym_options INTERFACE -fPIC -Wall -Wextra -Wpedantic -Wconversion -Wshadow
+  -fmacro-prefix-map=${PROJECT_SOURCE_DIR}/=)
+if(CMAKE_CXX_COMPILER_ID STREQUAL GNU)
+  target_compile_options(vtsym_options INTERFACE -fpch-preprocess)
+  if(CMAKE_CXX_COMPILER_VERSION VERSION_LESS 13)
+    # False alarms inside std::string and Boost.Container once they are inlined; the sanitizers see the real ones.
+    target_compile_options(vtsym_options INTERFACE -Wno-restrict -Wno-stringop-overflow -Wno-stringop-overread)
+  endif()
+endif()
+if(VTSYM_WERROR)
+  target_compile_options(vtsym_options INTERFACE -Werror)
+endif()
+if(VTSYM_CHECKS)
+  target_compile_definitions(vtsym_options INTERFACE VTSYM_CHECKS=1)
+endif()
+if(VTSYM_SANITIZE)
+  set(flags -fsanitize=address,undefined,float-cast-overflow,float-divide-by-zero,shift -fno-sanitize-recover=all
+      -fno-omit-frame-pointer)
+  target_compile_options(vtsym_options INTERFACE ${flags})
+  target_link_options(vtsym_options INTERFACE ${flags})
+  if(CMAKE_CXX_COMPILER_ID STREQUAL GNU)
+    # Instrumented code misleads the data-flow warnings; the other builds have them.
+    target_compile_options(vtsym_options INTERFACE -Wno-maybe-uninitialized)
+  endif()
+endif()

@@ -1,0 +1,25 @@
+# Installed: the shared library, its headers, the CMake package, the pkg-config file and the program.
+
+include(CMakePackageConfigHelpers)
+
+install(TARGETS vtsym EXPORT vtsymTargets LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR})
+if(TARGET vtsym_program)
+  install(TARGETS vtsym_program RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR})
+endif()
+
+foreach(folder IN ITEMS base parser host)
+  install(DIRECTORY ${folder} DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/vtsym
+    FILES_MATCHING PATTERN "*.hpp" PATTERN "*.def" PATTERN "embedded" EXCLUDE)
+endforeach()
+install(FILES vtsym.hpp DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/vtsym)
+
+set(package_dir ${CMAKE_INSTALL_LIBDIR}/cmake/vtsym)
+install(EXPORT vtsymTargets NAMESPACE vtsym:: DESTINATION ${package_dir})
+configure_package_config_file(cmake/vtsymConfig.cmake.in ${PROJECT_BINARY_DIR}/vtsymConfig.cmake
+  INSTALL_DESTINATION ${package_dir})
+write_basic_package_version_file(${PROJECT_BINARY_DIR}/vtsymConfigVersion.cmake COMPATIBILITY SameMinorVersion)
+install(FILES ${PROJECT_BINARY_DIR}/vtsymConfig.cmake ${PROJECT_BINARY_DIR}/vtsymConfigVersion.cmake
+  DESTINATION ${package_dir})
+
+configure_file(cmake/vtsym.pc.in ${PROJECT_BINARY_DIR}/vtsym.pc @ONLY)
+install(FILES ${PROJECT_BINARY_DIR}/vtsym.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)

@@ -1,0 +1,79 @@
+# One object library per layer, the shared library made of them, and the program.
+
+find_package(Boost 1.74 REQUIRED)
+
+# The sources of a layer; folders are searched on every build, so that a new file needs no edit here.
+function(vtsym_sources layer result)
+  set(patterns ${VTSYM_FOLDER_${layer}}/*.cpp)
+  if(VTSYM_DOOR_${layer})
+    list(APPEND patterns ${VTSYM_DOOR_${layer}}*.cpp)
+  endif()
+  file(GLOB sources CONFIGURE_DEPENDS ${patterns})
+  set(${result} ${sources} PARENT_SCOPE)
+endfunction()
+
+set(VTSYM_BUILT_LAYERS ${VTSYM_LAYERS})
+if(NOT VTSYM_EMBEDDED_HOST)
+  list(REMOVE_ITEM VTSYM_BUILT_LAYERS embedded)
+endif()
+
+set(VTSYM_LAYER_TARGETS) # those that have objects
+foreach(layer IN LISTS VTSYM_BUILT_LAYERS)
+  vtsym_sources(${layer} sources)
+  if(sources)
+    add_library(vtsym_${layer} OBJECT ${sources})
+    set(kind PUBLIC)
+    if(NOT TARGET vtsym_precompiled)
+      add_library(vtsym_precompiled OBJECT cmake/precompiled.cpp)
+      target_link_libraries(vtsym_precompiled PUBLIC vtsym_options)
+      target_precompile_headers(vtsym_precompiled PRIVATE cmake/precompiled.hpp)
+    endif()
+    target_precompile_headers(vtsym_${layer} REUSE_FROM vtsym_precompiled)
+    list(APPEND VTSYM_LAYER_TARGETS vtsym_${layer})
+  else()
+    add_library(vtsym_${layer} INTERFACE)
+    set(kind INTERFACE)
+  endif()
+  target_include_directories(vtsym_${layer} ${kind} ${PROJECT_SOURCE_DIR})
+  target_link_libraries(vtsym_${layer} ${kind} vtsym_options Boost::headers)
+  foreach(used IN LISTS VTSYM_ARROWS_${layer})
+    target_link_libraries(vtsym_${layer} ${kind} vtsym_${used})
+  endforeach()
+endforeach()
+
+if(VTSYM_EMBEDDED_HOST)
+  find_package(fmt REQUIRED)
+  find_package(spdlog REQUIRED)
+  target_link_libraries(vtsym_embedded PUBLIC fmt::fmt spdlog::spdlog)
+endif()
+
+# Links every layer into a target that reaches behind the library's export list: tests and benchmarks.
+function(vtsym_link_layers target)
+  target_link_libraries(${target} PRIVATE ${VTSYM_LAYER_TARGETS})
+endfunction()
+
+add_library(vtsym SHARED)
+add_library(vtsym::vtsym ALIAS vtsym)
+target_link_libraries(vtsym PRIVATE ${VTSYM_LAYER_TARGETS} PUBLIC Boost::headers)
+target_compile_features(vtsym PUBLIC cxx_std_20)
+target_include_directories(vtsym INTERFACE $<BUILD_INTERFACE:${PROJECT_SOURCE_DIR}>
+  $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}/vtsym>)
+set_target_properties(vtsym PROPERTIES VERSION ${PROJECT_VERSION} SOVERSION ${PROJECT_VERSION_MAJOR}
+  LINKER_LANGUAGE CXX LIBRARY_OUTPUT_DIRECTORY ${PROJECT_BINARY_DIR}/lib)
+if(VTSYM_EMBEDDED_HOST AND NOT VTSYM_SANITIZE)
+  target_link_options(vtsym PRIVATE -Wl,--no-undefined)
+endif()
+
+# The program stands on the embedded host.
+file(GLOB program_sources CONFIGURE_DEPENDS tools/vtsym/*.cpp)
+if(program_sources AND VTSYM_EMBEDDED_HOST)
+  find_package(CLI11 REQUIRED)
+  find_package(nlohmann_json REQUIRED)
+  find_library(VTSYM_EDIT_LIBRARY edit REQUIRED)
+  add_executable(vtsym_program ${program_sources})
+  target_compile_definitions(vtsym_program PRIVATE VTSYM_VERSION="${PROJECT_VERSION}")
+  target_link_libraries(vtsym_program PRIVATE vtsym vtsym_options CLI11::CLI11 nlohmann_json::nlohmann_json
+    ${VTSYM_EDIT_LIBRARY})
+  set_target_properties(vtsym_program PROPERTIES OUTPUT_NAME vtsym
+    RUNTIME_OUTPUT_DIRECTORY ${PROJECT_BINARY_DIR}/bin INSTALL_RPATH $ORIGIN/../${CMAKE_INSTALL_LIBDIR})
+endif()

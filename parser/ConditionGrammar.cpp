@@ -1,0 +1,346 @@
+#include "parser/ConditionGrammar.hpp"
+
+#include "base/core/Check.hpp"
+#include "base/core/Limits.hpp"
+#include "base/variants/VariantKeywords.hpp"
+#include "host/Numbers.hpp"
+
+#include <boost/spirit/include/phoenix_core.hpp>
+#include <boost/spirit/include/phoenix_operator.hpp>
+#include <boost/spirit/include/qi.hpp>
+
+#include <array>
+#include <bit>
+
+namespace VT::Parser {
+
+namespace {
+
+namespace ascii = boost::spirit::ascii;
+namespace fusion = boost::fusion;
+namespace qi = boost::spirit::qi;
+
+using Place = const char*;
+using Range = boost::iterator_range<Place>;
+using Blanks = ascii::space_type;
+
+/// What one reading carries.  The grammar itself carries nothing from text to text and may be shared.
+struct Reading {
+    SyntaxArena& arena;
+    Place refused = nullptr; ///< the literal, bracket or prefix operator that ended the reading
+
+    void refuse(Place place) {
+        if (refused == nullptr)
+            refused = place;
+    }
+};
+
+/// An infix operator with its binding strength: a smaller number binds tighter.
+struct Infix {
+    SymbolicOp op = SymbolicOp::None;
+    std::uint8_t precedence = 0;
+};
+
+constexpr Infix infixOf(SymbolicOp op) {
+    return {op, operatorInfo(op).precedence};
+}
+
+/// The infix operators of the grammar.  Their spellings and strengths are those of the operator table.
+constexpr auto infixOperators = std::to_array<SymbolicOp>(
+    {SymbolicOp::Or, SymbolicOp::And, SymbolicOp::BitOr, SymbolicOp::BitXOr, SymbolicOp::BitAnd, SymbolicOp::Equal,
+     SymbolicOp::NotEqual, SymbolicOp::LessThanEqual, SymbolicOp::LessThan, SymbolicOp::GreaterThanEqual,
+     SymbolicOp::GreaterThan, SymbolicOp::ShiftRight, SymbolicOp::ShiftLeft, SymbolicOp::Plus, SymbolicOp::Minus,
+     SymbolicOp::Multiply, SymbolicOp::Divide, SymbolicOp::Modulo});
+
+constexpr std::size_t countPrecedences() {
+    std::uint64_t seen = 0;
+    for (const SymbolicOp op : infixOperators)
+        seen |= std::uint64_t{1} << operatorInfo(op).precedence;
+    return static_cast<std::size_t>(std::popcount(seen));
+}
+
+/// Operands and infix operators of one expression, folded from the left as soon as their strength allows.  Operators
+/// that wait bind tighter and tighter, so never more of them wait than there are strengths.
+class OperatorChain {
+public:
+    void start(const expression_ast& operand) { operands_[0] = operand; }
+
+    void add(SyntaxArena& arena, Infix infix, const expression_ast& operand) {
+        foldUpTo(arena, infix.precedence);
+        VTSYM_CHECK(waiting_ < levels);
+        operators_[waiting_++] = infix;
+        operands_[waiting_] = operand;
+    }
+
+    const expression_ast& finish(SyntaxArena& arena) {
+        foldUpTo(arena, loosest);
+        return operands_[0];
+    }
+
+private:
+    static constexpr std::size_t levels = countPrecedences();
+    static constexpr std::uint8_t loosest = 255;
+
+    /// Folds the waiting operators that bind as tightly as `precedence` or tighter.
+    void foldUpTo(SyntaxArena& arena, std::uint8_t precedence) {
+        for (; waiting_ > 0 && operators_[waiting_ - 1].precedence <= precedence; --waiting_)
+            operands_[waiting_ - 1] =
+                arena.binary(operators_[waiting_ - 1].op, operands_[waiting_ - 1], operands_[waiting_]);
+    }
+
+    std::array<expression_ast, levels + 1> operands_;
+    std::array<Infix, levels> operators_;
+    std::size_t waiting_ = 0;
+};
+
+// Semantic actions.  Every rule inherits the reading and the number of brackets open around it.
+
+template <class Context>
+auto& valueOf(Context& context) {
+    return fusion::at_c<0>(context.attributes);
+}
+
+template <class Context>
+Reading& readingOf(Context& context) {
+    return fusion::at_c<1>(context.attributes);
+}
+
+template <class Context>
+std::size_t bracketsAround(Context& context) {
+    return fusion::at_c<2>(context.attributes);
+}
+
+template <class Context>
+OperatorChain& chainOf(Context& context) {
+    return fusion::at_c<0>(context.locals);
+}
+
+std::string_view textOf(const Range& range) {
+    return {range.begin(), range.size()};
+}
+
+struct start_chain {
+    template <class Context>
+    void operator()(const expression_ast& operand, Context& context, bool&) const {
+        chainOf(context).start(operand);
+    }
+};
+
+struct add_operand {
+    template <class Attribute, class Context>
+    void operator()(const Attribute& pair, Context& context, bool&) const {
+        chainOf(context).add(readingOf(context).arena, fusion::at_c<0>(pair), fusion::at_c<1>(pair));
+    }
+};
+
+struct finish_chain {
+    template <class Context>
+    void operator()(qi::unused_type, Context& context, bool&) const {
+        valueOf(context) = chainOf(context).finish(readingOf(context).arena);
+    }
+};
+
+struct apply_prefixes {
+    template <class Attribute, class Context>
+    void operator()(const Attribute& pair, Context& context, bool&) const {
+        expression_ast value = fusion::at_c<1>(pair);
+        const std::string_view prefixes = textOf(fusion::at_c<0>(pair));
+        for (auto prefix = prefixes.rbegin(); prefix != prefixes.rend(); ++prefix) {
+            const SymbolicOp op = operatorOf(*prefix);
+            if (op != SymbolicOp::None)
+                value = readingOf(context).arena.unary(op, value);
+        }
+        valueOf(context) = value;
+    }
+
+    static SymbolicOp operatorOf(char prefix) {
+        return prefix == '-'   ? SymbolicOp::UnaryMinus
+               : prefix == '!' ? SymbolicOp::Not
+               : prefix == '~' ? SymbolicOp::BitCompl
+                               : SymbolicOp::None; // a plus changes nothing, nor does a blank
+    }
+};
+
+/// Notes the place of an error.  No other alternative could read what stands there, so the whole text fails too.
+struct refuse {
+    template <class Context>
+    void operator()(const Range& here, Context& context, bool& pass) const {
+        readingOf(context).refuse(here.begin());
+        pass = false;
+    }
+};
+
+struct enter_bracket {
+    template <class Context>
+    void operator()(const Range& bracket, Context& context, bool& pass) const {
+        if (bracketsAround(context) >= limits::nesting)
+            refuse()(bracket, context, pass);
+    }
+};
+
+struct store_text {
+    template <class Context>
+    void operator()(const Range& text, Context& context, bool&) const {
+        valueOf(context) = textOf(text);
+    }
+};
+
+struct store_value {
+    template <class Value, class Context>
+    void operator()(const Value& value, Context& context, bool&) const {
+        valueOf(context) = value;
+    }
+};
+
+/// A number beyond the finite values is no real literal.
+struct store_real {
+    template <class Context>
+    void operator()(const Range& digits, Context& context, bool& pass) const {
+        std::string_view text = textOf(digits);
+        if (text.starts_with('+'))
+            text.remove_prefix(1);
+        const ParsedNumber number = vtsv_strtod(text);
+        pass = number.error == NumberError::None;
+        if (pass)
+            valueOf(context) = number.value;
+    }
+};
+
+struct member_val {
+    template <class Context>
+    void operator()(const Range& name, Context& context, bool&) const {
+        expression_ast& value = valueOf(context);
+        value = readingOf(context).arena.binary(SymbolicOp::MemberValue, value, textOf(name));
+    }
+};
+
+struct void_fcn_call_expr {
+    template <class Context>
+    void operator()(qi::unused_type, Context& context, bool&) const {
+        expression_ast& value = valueOf(context);
+        value = readingOf(context).arena.unary(SymbolicOp::FcnCall0U, value);
+    }
+};
+
+struct fcn_call_expr {
+    template <class Context>
+    void operator()(const expression_list* arguments, Context& context, bool&) const {
+        expression_ast& value = valueOf(context);
+        value = readingOf(context).arena.binary(SymbolicOp::FcnCall2U, value, arguments);
+    }
+};
+
+struct append_element {
+    template <class Context>
+    void operator()(const expression_ast& element, Context& context, bool&) const {
+        valueOf(context) = readingOf(context).arena.append(valueOf(context), element);
+    }
+};
+
+/// One grammar for each combination of options.
+///
+/// Operands are led by their first token, so that none is read twice: f(x), f(), a.b and a share the reading of the
+/// name. An infix operator without an operand behind it is given back; reading then stops before it.
+class ConditionGrammar {
+public:
+    explicit ConditionGrammar(const GrammarOptions& options);
+    ConditionGrammar(const ConditionGrammar&) = delete;
+    ConditionGrammar& operator=(const ConditionGrammar&) = delete;
+
+    /// Reads as much of a text as is an expression.
+    bool read(Place& first, Place last, Reading& reading, expression_ast& value) const {
+        return qi::phrase_parse(first, last, expression_(boost::phoenix::ref(reading), std::size_t{0}), Blanks(),
+                                value);
+    }
+
+private:
+    template <class Value, class... Locals>
+    using Rule = qi::rule<Place, Value(Reading&, std::size_t), Blanks, Locals...>;
+
+    qi::symbols<char, Infix> infix_;
+    Rule<expression_ast, qi::locals<OperatorChain>> expression_;
+    Rule<expression_ast> prefixed_;
+    Rule<expression_ast> operand_;
+    Rule<expression_list*> elements_;
+};
+
+ConditionGrammar::ConditionGrammar(const GrammarOptions& options) {
+    using ascii::alnum;
+    using ascii::alpha;
+    using ascii::char_;
+    using ascii::digit;
+    using qi::_r1;
+    using qi::_r2;
+    using qi::eps;
+    using qi::lexeme;
+    using qi::lit;
+    using qi::omit;
+    using qi::raw;
+    using qi::repeat;
+
+    const std::string simKeyword = VariantKeywords::getSimVariantKeyword();
+    const std::string codegenKeyword = VariantKeywords::getCodegenVariantKeyword();
+
+    for (const SymbolicOp op : infixOperators)
+        infix_.add(std::string(operatorInfo(op).c), infixOf(op));
+    if (!options.cOperators)
+        infix_.add(std::string(operatorInfo(SymbolicOp::NotEqual).quill), infixOf(SymbolicOp::NotEqual));
+
+    const auto identifier = qi::copy(raw[lexeme[(alpha | char_('_')) >> *(alnum | char_('_'))]]);
+    const auto sign = qi::copy(char_("+-"));
+    const auto real =
+        qi::copy(raw[lexeme[-sign >> (+digit >> '.' >> *digit | '.' >> +digit) >> -(char_("eE") >> -sign >> +digit)]]);
+    const auto integerOutOfRange = qi::copy(omit[lexeme[-sign >> raw[digit][refuse()]]]);
+    // A sign directly before a number belongs to the number.
+    const auto prefix = qi::copy(lexeme[char_("!~") | sign >> !(-lit('.') >> digit)]);
+    const auto open = [](char bracket) { return qi::copy(omit[raw[lit(bracket)][enter_bracket()]]); };
+    const auto inBrackets = _r2 + std::size_t{1};
+
+    expression_ =
+        prefixed_(_r1, _r2)[start_chain()] >> *(infix_ >> prefixed_(_r1, _r2))[add_operand()] >> eps[finish_chain()];
+
+    prefixed_ =
+        operand_(_r1, _r2)[store_value()] | (raw[repeat(std::size_t{1}, limits::nesting)[prefix]] >>
+                                             !omit[raw[prefix][refuse()]] >> operand_(_r1, _r2))[apply_prefixes()];
+
+    const auto call =
+        qi::copy(open('(') >> (lit(')')[void_fcn_call_expr()] | (elements_(_r1, inBrackets) >> ')')[fcn_call_expr()]));
+    const auto members = qi::copy(+('.' >> identifier[member_val()]));
+    const auto keyword = qi::copy(raw[lit(simKeyword) | lit(codegenKeyword)]);
+
+    operand_ = identifier[store_text()] >> -(call | members)                       //
+               | real[store_real()]                                                //
+               | qi::int_[store_value()]                                           //
+               | integerOutOfRange                                                 //
+               | eps(options.variantKeywords) >> keyword[store_text()]             //
+               | open('(') >> (expression_(_r1, inBrackets) >> ')')[store_value()] //
+               | open('[') >> (elements_(_r1, inBrackets) >> ']')[store_value()];
+
+    elements_ = expression_(_r1, _r2)[append_element()] % ',';
+}
+
+const ConditionGrammar& grammarFor(const GrammarOptions& options) {
+    static const ConditionGrammar grammars[2][2] = {{ConditionGrammar({false, false}), ConditionGrammar({false, true})},
+                                                    {ConditionGrammar({true, false}), ConditionGrammar({true, true})}};
+    return grammars[options.cOperators ? 1 : 0][options.variantKeywords ? 1 : 0];
+}
+
+} // namespace
+
+SyntaxResult readCondition(std::string_view text, const GrammarOptions& options, SyntaxArena& arena) {
+    const Place begin = text.data();
+    const Place end = begin + text.size();
+    Place stop = begin;
+    Reading reading{arena};
+    expression_ast value;
+    const bool read = grammarFor(options).read(stop, end, reading, value);
+    if (reading.refused != nullptr)
+        stop = reading.refused;
+    else if (!read)
+        stop = begin;
+    else if (stop == end)
+        return {value, text.size()};
+    return {std::nullopt, static_cast<std::size_t>(stop - begin)};
+}
+
+} // namespace VT::Parser

@@ -1,0 +1,32 @@
+#include "parser/SymbolicExprParser.hpp"
+
+#include "base/variants/VariantKeywords.hpp"
+#include "host/Diagnostics.hpp"
+#include "parser/ConditionGrammar.hpp"
+#include "parser/SyntaxConverter.hpp"
+
+#include <utility>
+
+namespace VT {
+
+namespace {
+
+[[noreturn]] void throwParseError(const std::string& text, std::size_t offset) {
+    std::string pointer(offset + 1, ' ');
+    pointer += '^';
+    vtsvThrowIExceptionFromDiagnostic(
+        vtsvCreateDiagnostic("Vantor:Variants:ExpressionParseError", {text, std::move(pointer)}, "", offset));
+}
+
+} // namespace
+
+SymbolicExprId SymbolicExprParser::operator()(const std::string& text) {
+    const bool keywords = allowVariantKeywords_ && isVariantKeywordsSimCodegenFeatureOn();
+    Parser::SyntaxArena arena;
+    const Parser::SyntaxResult result = Parser::readCondition(text, {cOperatorMode_, keywords}, arena);
+    if (!result.value)
+        throwParseError(text, result.stop);
+    return Parser::convertSyntax(table_, *result.value, cOperatorMode_);
+}
+
+} // namespace VT

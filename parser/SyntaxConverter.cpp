@@ -1,0 +1,224 @@
+#include "parser/SyntaxConverter.hpp"
+
+#include "base/core/Nodes.hpp"
+
+#include <boost/container/small_vector.hpp>
+
+#include <algorithm>
+#include <string>
+#include <vector>
+
+namespace VT::Parser {
+
+namespace {
+
+/// Alternatives of a syntax value by index.
+enum Alternative : std::size_t { Empty, Integer, Real, Text, Nested, List, Binary, Unary };
+
+/// Converts bottom-up with two stacks: what is still to do, and the identifiers of operands whose operator waits.
+class Converter {
+public:
+    Converter(SymbolicExprTable& table, bool cOperators) : table_(table), cOperators_(cOperators) {}
+
+    SymbolicExprId convert(const expression_ast& root) {
+        plan(root);
+        while (!tasks_.empty()) {
+            const Task task = tasks_.back();
+            tasks_.pop_back();
+            if (task.operandsDone)
+                ids_.push_back(build(*task.value));
+            else
+                visit(*task.value);
+        }
+        return ids_.back();
+    }
+
+private:
+    struct Task {
+        const expression_ast* value;
+        bool operandsDone;
+    };
+
+    /// Plans a conversion; what is planned last is done first.
+    void plan(const expression_ast& value) { tasks_.push_back({&value, false}); }
+
+    void planElements(const expression_list& list) {
+        const std::size_t first = tasks_.size();
+        for (const list_item* item = list.first; item != nullptr; item = item->next)
+            plan(item->value);
+        std::reverse(tasks_.begin() + static_cast<std::ptrdiff_t>(first), tasks_.end());
+    }
+
+    /// Converts a leaf; plans a compound value behind its operands.
+    void visit(const expression_ast& value) {
+        switch (value.index()) {
+        case Integer:
+            return leaf<SymbolicIntValue>(std::get<Integer>(value));
+        case Real:
+            return leaf<SymbolicDoubleValue>(std::get<Real>(value));
+        case Text:
+            return leaf<SymbolicString>(name_.assign(std::get<Text>(value)));
+        case Nested:
+            return plan(*std::get<Nested>(value));
+        case List:
+            tasks_.push_back({&value, true});
+            return planElements(*std::get<List>(value));
+        case Binary:
+            tasks_.push_back({&value, true});
+            return planOperands(*std::get<Binary>(value));
+        case Unary:
+            tasks_.push_back({&value, true});
+            return plan(std::get<Unary>(value)->operand);
+        default:
+            ids_.push_back(invalidId);
+        }
+    }
+
+    void planOperands(const binary_op& node) {
+        switch (node.op) {
+        case SymbolicOp::FcnCall2U:
+            if (const auto* arguments = std::get_if<List>(&node.right); arguments != nullptr)
+                planElements(**arguments);
+            else
+                plan(node.right);
+            return plan(node.left);
+        case SymbolicOp::MemberValue:
+            plan(node.right);
+            return plan(node.left);
+        default:
+            plan(node.left);
+            return plan(node.right);
+        }
+    }
+
+    template <class Node, class Payload>
+    void leaf(const Payload& payload) {
+        ids_.push_back(Node(table_, payload).getId(table_));
+    }
+
+    SymbolicExprId build(const expression_ast& value) {
+        switch (value.index()) {
+        case Binary:
+            return build(*std::get<Binary>(value));
+        case Unary:
+            return build(*std::get<Unary>(value));
+        default:
+            return intern<SymbolicNDExpr>(takeLast(std::get<List>(value)->size));
+        }
+    }
+
+    SymbolicExprId build(const unary_op& node) {
+        const SymbolicExprId operand = takeLast();
+        switch (node.op) {
+        case SymbolicOp::UnaryMinus:
+            return intern<SymbolicUnaryMinusExpr>(operand);
+        case SymbolicOp::Not:
+            return intern<SymbolicNotExpr>(operand);
+        case SymbolicOp::BitCompl:
+            return cOperators_ ? intern<SymbolicBitComplExpr>(operand) : intern<SymbolicNotExpr>(operand);
+        case SymbolicOp::FcnCall0U:
+            return intern<SymbolicFcnCall0UExpr>(operand);
+        default:
+            return invalidId;
+        }
+    }
+
+    SymbolicExprId build(const binary_op& node) {
+        if (node.op == SymbolicOp::FcnCall2U)
+            return buildCall(node);
+        const SymbolicExprId last = takeLast();
+        const SymbolicExprId first = takeLast();
+        if (node.op == SymbolicOp::MemberValue)
+            return buildMember(first, last);
+        return buildInfix(node.op, last, first); // the right operand was converted first
+    }
+
+    SymbolicExprId buildInfix(SymbolicOp op, SymbolicExprId left, SymbolicExprId right) {
+        switch (op) {
+        case SymbolicOp::Plus:
+            return intern<SymbolicPlusExpr>(left, right);
+        case SymbolicOp::Minus:
+            return intern<SymbolicMinusExpr>(left, right);
+        case SymbolicOp::Multiply:
+            return intern<SymbolicMultiplyExpr>(left, right);
+        case SymbolicOp::Divide:
+            return intern<SymbolicDivideExpr>(left, right);
+        case SymbolicOp::Modulo:
+            return intern<SymbolicModuloExpr>(left, right);
+        case SymbolicOp::Equal:
+            return intern<SymbolicEqualExpr>(left, right);
+        case SymbolicOp::NotEqual:
+            return intern<SymbolicNotEqualExpr>(left, right);
+        case SymbolicOp::LessThan:
+            return intern<SymbolicLessThanExpr>(left, right);
+        case SymbolicOp::LessThanEqual:
+            return intern<SymbolicLessThanEqualExpr>(left, right);
+        case SymbolicOp::GreaterThan:
+            return intern<SymbolicGreaterThanExpr>(left, right);
+        case SymbolicOp::GreaterThanEqual:
+            return intern<SymbolicGreaterThanEqualExpr>(left, right);
+        case SymbolicOp::And:
+            return intern<SymbolicAndExpr>(left, right);
+        case SymbolicOp::Or:
+            return intern<SymbolicOrExpr>(left, right);
+        case SymbolicOp::BitAnd:
+            return intern<SymbolicBitAndExpr>(left, right);
+        case SymbolicOp::BitOr:
+            return intern<SymbolicBitOrExpr>(left, right);
+        case SymbolicOp::BitXOr:
+            return intern<SymbolicBitXOrExpr>(left, right);
+        case SymbolicOp::ShiftLeft:
+            return intern<SymbolicShiftLeftExpr>(left, right);
+        case SymbolicOp::ShiftRight:
+            return intern<SymbolicShiftRightExpr>(left, right);
+        default:
+            return invalidId;
+        }
+    }
+
+    SymbolicExprId buildCall(const binary_op& node) {
+        if (const auto* arguments = std::get_if<List>(&node.right); arguments != nullptr)
+            return intern<SymbolicFcnCallExpr>(takeLast((*arguments)->size + 1));
+        const SymbolicExprId argument = takeLast();
+        return intern<SymbolicFcnCall1UExpr>(takeLast(), argument);
+    }
+
+    SymbolicExprId buildMember(SymbolicExprId owner, SymbolicExprId member) {
+        const SymbolicExpr* name = table_.get(member);
+        if (name == nullptr || name->op() != SymbolicOp::String)
+            return invalidId;
+        return intern<SymbolicMemberValue>(owner, static_cast<const SymbolicString&>(*name).getName());
+    }
+
+    template <class Node, class... Payload>
+    SymbolicExprId intern(Payload&&... payload) {
+        return Node(table_, std::forward<Payload>(payload)...).getId(table_);
+    }
+
+    SymbolicExprId takeLast() {
+        const SymbolicExprId id = ids_.back();
+        ids_.pop_back();
+        return id;
+    }
+
+    std::vector<SymbolicExprId> takeLast(std::size_t count) {
+        const auto first = ids_.end() - static_cast<std::ptrdiff_t>(count);
+        std::vector<SymbolicExprId> taken(first, ids_.end());
+        ids_.erase(first, ids_.end());
+        return taken;
+    }
+
+    SymbolicExprTable& table_;
+    bool cOperators_;
+    boost::container::small_vector<Task, 64> tasks_;
+    boost::container::small_vector<SymbolicExprId, 64> ids_;
+    std::string name_;
+};
+
+} // namespace
+
+SymbolicExprId convertSyntax(SymbolicExprTable& table, const expression_ast& value, bool cOperators) {
+    return Converter(table, cOperators).convert(value);
+}
+
+} // namespace VT::Parser

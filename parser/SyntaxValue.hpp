@@ -1,0 +1,92 @@
+// What the condition grammar reads a text as, before it becomes nodes.
+#pragma once
+
+#include "base/core/Arena.hpp"
+#include "base/core/Operators.hpp"
+
+#include <cstddef>
+#include <cstdint>
+#include <string_view>
+#include <type_traits>
+#include <variant>
+
+namespace VT::Parser {
+
+struct expression_ast;
+struct expression_list;
+struct binary_op;
+struct unary_op;
+
+/// A syntax value.  Compound values refer to parts that their SyntaxArena owns and a text is a range of the parsed
+/// text, so a value is copied in constant time and destroyed without a look at what is below it, however deep that is.
+struct expression_ast : std::variant<std::monostate,         // nothing
+                                     std::int32_t,           // integer literal
+                                     double,                 // real literal
+                                     std::string_view,       // identifier or keyword
+                                     const expression_ast*,  // nested value
+                                     const expression_list*, // bracket list, arguments of a call
+                                     const binary_op*, const unary_op*> {
+    using variant::variant;
+};
+
+static_assert(std::is_trivially_copyable_v<expression_ast> && std::is_trivially_destructible_v<expression_ast>);
+
+struct list_item {
+    expression_ast value;
+    list_item* next = nullptr;
+};
+
+/// The elements of a list, in order.
+struct expression_list {
+    list_item* first = nullptr;
+    list_item* last = nullptr;
+    std::size_t size = 0;
+};
+
+/// An infix operator; MemberValue with owner and name; FcnCall2U, whatever their number, with callee and list of
+/// arguments.
+struct binary_op {
+    SymbolicOp op;
+    expression_ast left;
+    expression_ast right;
+};
+
+/// A prefix operator; FcnCall0U with the callee.
+struct unary_op {
+    SymbolicOp op;
+    expression_ast operand;
+};
+
+/// Owns the parts of syntax values and frees them together.
+class SyntaxArena {
+public:
+    // Every operation throws std::bad_alloc when memory runs out.
+
+    expression_ast unary(SymbolicOp op, const expression_ast& operand) { return make<unary_op>(op, operand); }
+
+    expression_ast binary(SymbolicOp op, const expression_ast& left, const expression_ast& right) {
+        return make<binary_op>(op, left, right);
+    }
+
+    /// Appends an element to a list; nullptr stands for the list that has none yet.
+    expression_list* append(expression_list* list, const expression_ast& element) {
+        if (list == nullptr)
+            list = make<expression_list>();
+        auto* item = make<list_item>(element);
+        (list->first == nullptr ? list->first : list->last->next) = item;
+        list->last = item;
+        ++list->size;
+        return list;
+    }
+
+private:
+    template <class Part, class... Fields>
+    Part* make(const Fields&... fields) {
+        static_assert(std::is_trivially_destructible_v<Part> && alignof(Part) <= alignof(void*));
+        return new (arena_.allocate(sizeof(Part))) Part{fields...};
+    }
+
+    Arena arena_;
+};
+
+} // namespace VT::Parser

@@ -1,0 +1,3 @@
+#include "base/VTSymbolicExpr.hpp"
+#include "host/embedded/Log.hpp"
+#include "parser/SymbolicExprParser.hpp"

@@ -1,0 +1,6 @@
+#include "../core/Table.hpp"
+#include "base/VCService.hpp"
+#include "base/VTSymbolicExpr.hpp"
+#include "base/variants/Features.hpp"
+  #  include "parser/SymbolicExprParser.hpp"
+#include <boost/spirit/include/qi.hpp>

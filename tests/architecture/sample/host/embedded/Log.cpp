@@ -1,0 +1,3 @@
+#include "base/core/Table.hpp"
+#include "host/Log.hpp"
+#include <spdlog/spdlog.h>

@@ -1,0 +1,2 @@
+#include "base/service/Caches.hpp"
+#include <boost/spirit/include/qi.hpp>

@@ -1,0 +1,143 @@
+#include "host/Feature.hpp"
+
+#include <gtest/gtest.h>
+#include <rapidcheck.h>
+#include <rapidcheck/gtest.h>
+
+#include <cstdlib>
+#include <filesystem>
+#include <memory>
+
+namespace {
+
+VtFeature::ChangeCallback nothing = nullptr;
+int changes = 0;
+
+void countChange(const VtFeature& feature) {
+    changes += feature.value();
+}
+
+TEST(Feature, IsFoundByNameWhileItLives) {
+    const std::size_t others = VtFeature::all().size();
+    EXPECT_EQ(VtFeature::find("TestFlag"), nullptr);
+    {
+        VtFeature flag("TestFlag", "A description", "tests/host", "A category", 17, -3, &countChange);
+        EXPECT_EQ(VtFeature::find("TestFlag"), &flag);
+        EXPECT_EQ(VtFeature::all().size(), others + 1);
+        EXPECT_EQ(flag.name(), "TestFlag");
+        EXPECT_EQ(flag.description(), "A description");
+        EXPECT_EQ(flag.sourceUnit(), "tests/host");
+        EXPECT_EQ(flag.category(), "A category");
+        EXPECT_EQ(flag.identifier(), 17);
+        EXPECT_EQ(flag.defaultValue(), -3);
+        EXPECT_EQ(flag.value(), -3);
+        EXPECT_FALSE(flag.isOn());
+
+        changes = 0;
+        flag.setValue(5);
+        EXPECT_EQ(flag.value(), 5);
+        EXPECT_TRUE(flag.isOn());
+        EXPECT_EQ(flag.defaultValue(), -3);
+        EXPECT_EQ(changes, 5) << "the callback sees the new value";
+
+        auto second = std::make_unique<VtFeature>("TestFlag", "", "", "", 0, 0, nothing);
+        EXPECT_EQ(VtFeature::find("TestFlag"), &flag) << "the oldest of a name is found";
+        second.reset();
+        EXPECT_EQ(VtFeature::find("TestFlag"), &flag);
+    }
+    EXPECT_EQ(VtFeature::find("TestFlag"), nullptr);
+}
+
+TEST(Feature, AssignmentsAreCarriedOutOrExplained) {
+    VtFeature flag("TestFlag", "", "", "", 0, 1, nothing);
+
+    const struct {
+        const char* assignment;
+        const char* complaint; ///< a part of it
+        std::int32_t value;
+    } cases[] = {
+        {"TestFlag=2", "", 2},
+        {"  TestFlag = -7 ", "", -7},
+        {"TestFlag=-2147483648", "", -2147483647 - 1},
+        {"TestFlag=2147483648", "32 bits", -2147483647 - 1},
+        {"TestFlag=", "32 bits", -2147483647 - 1},
+        {"TestFlag=1x", "\"1x\"", -2147483647 - 1},
+        {"TestFlag", "NAME=VALUE", -2147483647 - 1},
+        {"=1", "NAME=VALUE", -2147483647 - 1},
+        {"", "NAME=VALUE", -2147483647 - 1},
+        {"testflag=1", "no feature flag \"testflag\"", -2147483647 - 1},
+        {"Test\nFlag=1", "Test\\x0aFlag", -2147483647 - 1},
+        {"TestFlag=0", "", 0},
+    };
+
+    for (const auto& [assignment, complaint, value] : cases) {
+        const std::string error = VtFeature::assign(assignment);
+        EXPECT_EQ(error.empty(), *complaint == '\0') << assignment << ": " << error;
+        EXPECT_NE(error.find(complaint), std::string::npos) << assignment << ": " << error;
+        EXPECT_EQ(flag.value(), value) << assignment;
+    }
+    EXPECT_NE(VtFeature::assign("Other=1").find("TestFlag"), std::string::npos) << "the flags there are, are listed";
+}
+
+RC_GTEST_PROP(Feature, AnyTextIsAnswered, (const std::string& text)) {
+    const VT::FeatureAssignment parsed = VT::parseFeatureAssignment(text);
+    RC_ASSERT(parsed.error.size() < 300);
+    if (parsed.error.empty())
+        RC_ASSERT(text.find('=') != std::string::npos);
+}
+
+// The environment is read by the first flag of a process, so that each case needs a process of its own: this program
+// again, with the one test below.
+struct Outcome {
+    std::string output;
+    int status;
+};
+
+Outcome runWith(const std::string& variable) {
+    const std::string self = std::filesystem::read_symlink("/proc/self/exe").string();
+    setenv("VTSYM_FEATURES", variable.c_str(), 1);
+    const std::string command =
+        "'" + self + "' --gtest_filter=FeatureEnvironment.DISABLED_Report --gtest_also_run_disabled_tests 2>&1";
+    Outcome run;
+    FILE* const pipe = popen(command.c_str(), "r");
+    for (int c = fgetc(pipe); c != EOF; c = fgetc(pipe))
+        run.output += static_cast<char>(c);
+    run.status = pclose(pipe);
+    unsetenv("VTSYM_FEATURES");
+    return run;
+}
+
+TEST(FeatureEnvironment, DISABLED_Report) {
+    for (const VtFeature* flag : VtFeature::all())
+        std::printf("[%s=%d]\n", flag->name().c_str(), flag->value());
+}
+
+TEST(FeatureEnvironment, StartsFlagsAndReportsWhatItCannotUse) {
+    const struct {
+        std::string variable;
+        std::vector<std::string> said;
+    } cases[] = {
+        {"", {"[CacheSymExprSimplifyResults=1]", "[VariantKeywordsSimCodegen=2]"}},
+        {"VariantKeywordsSimCodegen=0", {"[CacheSymExprSimplifyResults=1]", "[VariantKeywordsSimCodegen=0]"}},
+        {" VariantKeywordsSimCodegen = -5 ,, CacheSymExprSimplifyResults=0,",
+         {"[CacheSymExprSimplifyResults=0]", "[VariantKeywordsSimCodegen=-5]"}},
+        {"VariantKeywordsSimCodegen=3,VariantKeywordsSimCodegen=4", {"[VariantKeywordsSimCodegen=4]"}},
+        {"NoSuchFlag=1,VariantKeywordsSimCodegen=0",
+         {"warning: VTSYM_FEATURES: there is no feature flag \"NoSuchFlag\"", "[VariantKeywordsSimCodegen=0]"}},
+        {"VariantKeywordsSimCodegen=on",
+         {"warning: VTSYM_FEATURES: the value of VariantKeywordsSimCodegen is an integer",
+          "[VariantKeywordsSimCodegen=2]"}},
+        {"VariantKeywordsSimCodegen=99999999999", {"99999999999", "[VariantKeywordsSimCodegen=2]"}},
+        {"\x1b[31m\xff" + std::string(100000, 'x'), {"\\x1b[31m\\xffxxx", "[VariantKeywordsSimCodegen=2]"}},
+    };
+
+    for (const auto& [variable, said] : cases) {
+        const Outcome run = runWith(variable);
+        EXPECT_EQ(run.status, 0) << variable.substr(0, 80);
+        for (const std::string& words : said)
+            EXPECT_NE(run.output.find(words), std::string::npos) << variable.substr(0, 80) << "\n" << run.output;
+        EXPECT_LT(run.output.size(), 2000U);
+    }
+}
+
+} // namespace

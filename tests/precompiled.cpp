@@ -1,0 +1,1 @@
+// Gives the precompiled header a target to belong to.

@@ -1,0 +1,122 @@
+// Long chains, deep and shared graphs, and the operand limit.
+#include "tests/simplify/Workbench.hpp"
+
+#include "base/core/Limits.hpp"
+
+namespace VT::Testing {
+namespace {
+
+constexpr std::size_t limit = limits::chainOperands;
+
+/// `count` different operands joined by an operator.
+SymbolicExprId chain(SymbolicExprTable& table, SymbolicOp op, std::size_t count, bool leftDeep) {
+    SymbolicExprId sum = SymbolicString(table, "S" + std::to_string(count)).getId(table);
+    for (std::size_t i = 1; i < count; ++i) {
+        const SymbolicString symbol(table, "S" + std::to_string(count - i));
+        const SymbolicExprId left = leftDeep ? sum : symbol.getId(table);
+        const SymbolicExprId right = leftDeep ? symbol.getId(table) : sum;
+        sum = op == SymbolicOp::And ? SymbolicAndExpr(table, left, right).getId(table)
+                                    : SymbolicOrExpr(table, left, right).getId(table);
+    }
+    return sum;
+}
+
+TEST(OperandLimit, HoldsAtTheBoundAndGivesUpOneBeyond) {
+    for (const SymbolicOp op : {SymbolicOp::And, SymbolicOp::Or}) {
+        for (const bool leftDeep : {true, false}) {
+            Workbench bench;
+            const SymbolicExprId within = chain(bench.table, op, limit, leftDeep);
+            const SymbolicExprId beyond = chain(bench.table, op, limit + 1, leftDeep);
+            const SymbolicExprId sorted = bench.simplify(within);
+            EXPECT_NE(sorted, within);
+            EXPECT_EQ(bench.simplify(sorted), sorted);
+            EXPECT_EQ(bench.simplify(beyond), beyond);
+        }
+    }
+}
+
+TEST(OperandLimit, BoundsTheOperandsOfAChain) {
+    Workbench bench;
+    for (const bool leftDeep : {true, false}) {
+        boost::container::flat_set<SymbolicExprId> operands;
+        const SymbolicExprId within = chain(bench.table, SymbolicOp::And, limit, leftDeep);
+        bench.simplifier.computeUniqueAndOperandsId(*bench.table.get(within), operands);
+        EXPECT_EQ(operands.size(), limit);
+        const SymbolicExprId beyond = chain(bench.table, SymbolicOp::And, limit + 1, leftDeep);
+        operands.clear();
+        bench.simplifier.computeUniqueAndOperandsId(*bench.table.get(beyond), operands);
+        EXPECT_EQ(operands, boost::container::flat_set<SymbolicExprId>{beyond});
+        operands.clear();
+        bench.simplifier.computeUniqueOrOperandsId(*bench.table.get(within), operands);
+        EXPECT_EQ(operands, boost::container::flat_set<SymbolicExprId>{within});
+    }
+}
+
+TEST(OperandLimit, BoundsDistribution) {
+    const auto alternatives = [](const std::string& name, std::size_t count) {
+        std::string text = name + "0";
+        for (std::size_t i = 1; i < count; ++i)
+            text += "||" + name + std::to_string(i);
+        return "(" + text + ")";
+    };
+    Workbench bench;
+    const std::string within = alternatives("A", 25) + "&&" + alternatives("B", 40);
+    const std::string beyond = alternatives("A", 25) + "&&" + alternatives("B", 41);
+    EXPECT_EQ(countComparisons(bench.table, bench.simplify(bench.parse(within))), 2000U);
+    EXPECT_EQ(bench.simplified(beyond), beyond);
+}
+
+TEST(LongChains, AreReducedWhateverTheirLength) {
+    Workbench bench;
+    std::string contradiction = "A==0";
+    std::string range = "A>0";
+    for (int i = 1; i < 20000; ++i) {
+        contradiction += "&&A==" + std::to_string(i);
+        range += "&&A>" + std::to_string(i);
+    }
+    EXPECT_EQ(bench.simplified(contradiction), "false");
+    EXPECT_EQ(bench.simplified(range), "A>19999");
+}
+
+// Each graph has few nodes and more paths than could be walked.
+TEST(SharedGraphs, CostTheirNodes) {
+    Workbench bench;
+    const auto doubled = [&](auto join) {
+        SymbolicExprId id = bench.parse("A == 1");
+        for (int level = 0; level < 64; ++level)
+            id = join(id);
+        return bench.simplify(id);
+    };
+    SymbolicExprTable& table = bench.table;
+    EXPECT_EQ(doubled([&](SymbolicExprId x) { return SymbolicAndExpr(table, x, x).getId(table); }), bench.parse("A == 1"));
+    EXPECT_EQ(doubled([&](SymbolicExprId x) { return SymbolicOrExpr(table, x, x).getId(table); }), bench.parse("A == 1"));
+    doubled([&](SymbolicExprId x) { return SymbolicMultiplyExpr(table, x, x).getId(table); });
+    doubled([&](SymbolicExprId x) { return SymbolicPlusExpr(table, x, x).getId(table); });
+    const SymbolicExprId compared = doubled([&](SymbolicExprId x) {
+        return SymbolicLessThanExpr(table, x, SymbolicPowerExpr(table, x, x).getId(table)).getId(table);
+    });
+    EXPECT_TRUE(table.has(compared));
+}
+
+TEST(DeepGraphs, NeedNoDeepStack) {
+    Workbench bench;
+    SymbolicExprTable& table = bench.table;
+    const SymbolicExprId a = bench.parse("A");
+    const auto deep = [&](auto wrap) {
+        SymbolicExprId id = a;
+        for (int level = 0; level < 1000000; ++level)
+            id = wrap(id);
+        return bench.simplify(id);
+    };
+    EXPECT_EQ(deep([&](SymbolicExprId x) { return SymbolicAndExpr(table, a, x).getId(table); }), a);
+    EXPECT_EQ(deep([&](SymbolicExprId x) { return SymbolicMinusExpr(table, x, a).getId(table); }),
+              bench.parse("-999999*A"));
+    EXPECT_EQ(deep([&](SymbolicExprId x) { return SymbolicUnaryMinusExpr(table, x).getId(table); }), a);
+    const SymbolicExprId nots = deep([&](SymbolicExprId x) { return SymbolicNotExpr(table, x).getId(table); });
+    EXPECT_EQ(nots, bench.parse("!!A"));
+    EXPECT_TRUE(table.has(deep([&](SymbolicExprId x) { return SymbolicModuloExpr(table, a, x).getId(table); })));
+    EXPECT_TRUE(table.has(deep([&](SymbolicExprId x) { return SymbolicLessThanExpr(table, x, a).getId(table); })));
+}
+
+} // namespace
+} // namespace VT::Testing

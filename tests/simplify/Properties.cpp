@@ -1,0 +1,103 @@
+// Properties over random and over real conditions.
+#include "tests/simplify/Workbench.hpp"
+#include "tests/support/Corpus.hpp"
+#include "tests/support/RandomCondition.hpp"
+
+namespace VT::Testing {
+namespace {
+
+const std::vector<std::string> symbols{"A", "B", "C"};
+
+/// Shapes of conditions, with what their simplification has to decide.
+const std::vector<ConditionShape> shapes{
+    {},
+    {.symbols = symbols, .lowest = -1, .highest = 2, .symbolPairs = true, .truthValues = true},
+    {.symbols = {"A"}, .lowest = -3, .highest = 4, .symbolPairs = false, .truthValues = true},
+};
+
+std::string condition(std::uint64_t seed, const ConditionShape& shape) {
+    std::mt19937_64 random(seed);
+    const std::size_t comparisons = 3 + seed % 10;
+    return randomCondition(random, comparisons, shape);
+}
+
+RC_GTEST_PROP(Simplify, KeepsTheTruthAndIsAFixedPoint, ()) {
+    const auto seed = *rc::gen::arbitrary<std::uint64_t>();
+    const std::string text = condition(seed, shapes[seed % shapes.size()]);
+    RC_LOG(text);
+    Workbench bench;
+    const SymbolicExprId before = bench.parse(text);
+    const SymbolicExprId after = bench.simplify(before);
+    forEachAssignment(symbols, -4, 5, [&](const Assignment& assignment) {
+        RC_ASSERT(holds(bench.table, before, assignment) == holds(bench.table, after, assignment));
+    });
+    RC_ASSERT(bench.simplify(after) == after);
+}
+
+RC_GTEST_PROP(Simplify, DoesNotDependOnWhatWasInternedBefore, ()) {
+    const auto seed = *rc::gen::arbitrary<std::uint64_t>();
+    const std::string text = condition(seed, shapes[1]);
+    Workbench fresh;
+    Workbench used;
+    for (const char* name : {"C", "B>=2", "B", "A>1&&C<2", "A", "3", "1"})
+        used.parse(name);
+    for (std::uint64_t other = 0; other < 3; ++other)
+        used.simplify(used.parse(condition(seed + other, shapes[0])));
+    RC_ASSERT(fresh.simplified(text) == used.simplified(text));
+}
+
+// What share of conditions over single symbols becomes the constant it is worth, and how long results are, stays as good as it is.
+TEST(Simplify, FindsConstantsAndShortSums) {
+    std::size_t constant = 0;
+    std::size_t found = 0;
+    std::size_t before = 0;
+    std::size_t after = 0;
+    for (std::uint64_t seed = 0; seed < 1500; ++seed) {
+        Workbench bench;
+        const SymbolicExprId id = bench.parse(condition(seed, shapes[0]));
+        const SymbolicExprId result = bench.simplify(id);
+        bool sometimes = false;
+        bool always = true;
+        forEachAssignment(symbols, -4, 5, [&](const Assignment& assignment) {
+            const bool now = holds(bench.table, id, assignment);
+            sometimes = sometimes || now;
+            always = always && now;
+        });
+        before += countComparisons(bench.table, id);
+        after += countComparisons(bench.table, result);
+        if (sometimes && !always)
+            continue;
+        ++constant;
+        found += result == (always ? bench.table.getIdTRUE() : bench.table.getIdFALSE()) ? 1U : 0U;
+    }
+    EXPECT_GT(constant, 100U);
+    EXPECT_EQ(found, constant);
+    EXPECT_LT(static_cast<double>(after), 0.45 * static_cast<double>(before));
+    RecordProperty("comparisons", std::to_string(after) + " of " + std::to_string(before));
+}
+
+/// The value of calls, members and bit operations in real conditions is not known here, so real conditions are judged by what
+/// their simplification must not do: fail, change again, or come out longer where it gave up.
+TEST(Simplify, RealConditionsReachAFixedPoint) {
+    std::size_t read = 0;
+    for (const CorpusFile& file : corpusFiles) {
+        Workbench bench;
+        SymbolicExprParser parser(bench.table, true, true);
+        for (const std::string& line : corpusLines(file.name)) {
+            SymbolicExprId id = invalidId;
+            try {
+                id = parser(line);
+            } catch (const HostDiagnostic&) {
+                continue;
+            }
+            ++read;
+            const SymbolicExprId result = bench.simplify(id);
+            ASSERT_TRUE(bench.table.has(result)) << line;
+            ASSERT_EQ(bench.simplify(result), result) << line;
+        }
+    }
+    EXPECT_GT(read, 16000U);
+}
+
+} // namespace
+} // namespace VT::Testing

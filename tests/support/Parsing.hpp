@@ -1,0 +1,31 @@
+// One call of the condition parser with its answer as a value.
+#pragma once
+
+#include "host/Diagnostics.hpp"
+#include "parser/SymbolicExprParser.hpp"
+
+#include <optional>
+#include <string>
+
+namespace VT::Testing {
+
+struct ParseAnswer {
+    SymbolicExprId id = invalidId;
+    std::optional<HostDiagnostic> error;
+
+    /// Where reading stopped: behind the text, or the place of the error.
+    [[nodiscard]] std::size_t stop(const std::string& text) const {
+        return error ? error->offset().value() : text.size();
+    }
+};
+
+inline ParseAnswer parse(SymbolicExprTable& table, const std::string& text, bool cOperators = true,
+                         bool variantKeywords = true) {
+    try {
+        return {SymbolicExprParser(table, cOperators, variantKeywords)(text), std::nullopt};
+    } catch (const HostDiagnostic& diagnostic) {
+        return {invalidId, diagnostic};
+    }
+}
+
+} // namespace VT::Testing

@@ -1,0 +1,42 @@
+#include "tests/support/TreeText.hpp"
+
+#include "base/core/Nodes.hpp"
+
+#include <cstdio>
+
+namespace VT::Testing {
+
+namespace {
+
+std::string realText(double value) {
+    char digits[40];
+    std::snprintf(digits, sizeof digits, "%.17gr", value);
+    return digits;
+}
+
+} // namespace
+
+std::string treeText(const SymbolicExprTable& table, SymbolicExprId id) {
+    const SymbolicExpr* node = table.get(id);
+    if (node == nullptr)
+        return "invalid";
+    switch (node->op()) {
+    case SymbolicOp::String:
+        return static_cast<const SymbolicString&>(*node).getName();
+    case SymbolicOp::IntValue:
+        return std::to_string(static_cast<const SymbolicIntValue&>(*node).getValue());
+    case SymbolicOp::DoubleValue:
+        return realText(node->getNumValue());
+    default:
+        break;
+    }
+    std::string text(operatorInfo(node->op()).name);
+    text += '(';
+    for (std::size_t i = 0; i < node->getNumInputs(); ++i)
+        text += (i > 0 ? "," : "") + treeText(table, node->getInput(i));
+    if (node->op() == SymbolicOp::MemberValue)
+        text += "," + static_cast<const SymbolicMemberValue&>(*node).getMemberName();
+    return text + ")";
+}
+
+} // namespace VT::Testing
