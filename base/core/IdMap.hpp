@@ -10,7 +10,8 @@
 namespace VT {
 
 /// Open addressing with linear probing; keys are never removed one by one.  The invalid identifier is no key.
-template <class Value> class IdMap {
+template <class Value>
+class IdMap {
 public:
     /// The value of a key, or nullptr.  Valid until the next insertion.
     [[nodiscard]] Value* find(SymbolicExprId key) noexcept {
@@ -19,6 +20,7 @@ public:
         Slot& slot = slots_[position(key)];
         return slot.key == key ? &slot.value : nullptr;
     }
+
     [[nodiscard]] const Value* find(SymbolicExprId key) const noexcept { return const_cast<IdMap*>(this)->find(key); }
 
     /// Adds a key or replaces its value.
@@ -46,6 +48,7 @@ private:
         SymbolicExprId key = invalidId;
         Value value{};
     };
+
     static constexpr std::size_t firstSlots = 32;
 
     /// The slot that holds a key or would.

@@ -16,23 +16,57 @@ namespace VT {
 
 // What a node answers unless its shape knows better.
 
-std::size_t SymbolicExpr::getNumInputs() const { return 0; }
-bool SymbolicExpr::isTermExpr() const { return false; }
-bool SymbolicExpr::isNumValue() const { return false; }
-bool SymbolicExpr::isUnaryExpr() const { return false; }
-bool SymbolicExpr::isBinaryExpr() const { return false; }
-bool SymbolicExpr::isTernaryExpr() const { return false; }
-bool SymbolicExpr::isMultiExpr() const { return false; }
-bool SymbolicExpr::isFcnCallExpr() const { return false; }
-double SymbolicExpr::getNumValue() const { return 18446744073709551616.0; }
-std::size_t SymbolicExpr::getNumDimensions() const { return 0; }
-std::size_t SymbolicExpr::getNumArgs() const { return 0; }
+std::size_t SymbolicExpr::getNumInputs() const {
+    return 0;
+}
+
+bool SymbolicExpr::isTermExpr() const {
+    return false;
+}
+
+bool SymbolicExpr::isNumValue() const {
+    return false;
+}
+
+bool SymbolicExpr::isUnaryExpr() const {
+    return false;
+}
+
+bool SymbolicExpr::isBinaryExpr() const {
+    return false;
+}
+
+bool SymbolicExpr::isTernaryExpr() const {
+    return false;
+}
+
+bool SymbolicExpr::isMultiExpr() const {
+    return false;
+}
+
+bool SymbolicExpr::isFcnCallExpr() const {
+    return false;
+}
+
+double SymbolicExpr::getNumValue() const {
+    return 18446744073709551616.0;
+}
+
+std::size_t SymbolicExpr::getNumDimensions() const {
+    return 0;
+}
+
+std::size_t SymbolicExpr::getNumArgs() const {
+    return 0;
+}
 
 SymbolicExprId SymbolicExpr::getInput(std::size_t) const {
     VTSYM_FATAL("VT::SymbolicExpr::getInput() should not be called");
 }
 
-SymbolicExprId SymbolicExpr::getId(const SymbolicExprTable& table) const { return table.lookup(this); }
+SymbolicExprId SymbolicExpr::getId(const SymbolicExprTable& table) const {
+    return table.lookup(this);
+}
 
 // Operand access.
 
@@ -64,9 +98,13 @@ SymbolicExprId SymbolicMultiExpr::getInput(std::size_t aIdx) const {
 
 // Hashes.
 
-std::uint64_t SymbolicUnaryExpr::getHash() const { return hashStep(hashSeed(op()), operand_); }
+std::uint64_t SymbolicUnaryExpr::getHash() const {
+    return hashStep(hashSeed(op()), operand_);
+}
 
-std::uint64_t SymbolicBinaryExpr::getHash() const { return hashStep(hashStep(hashSeed(op()), left_), right_); }
+std::uint64_t SymbolicBinaryExpr::getHash() const {
+    return hashStep(hashStep(hashSeed(op()), left_), right_);
+}
 
 std::uint64_t SymbolicTernaryExpr::getHash() const {
     return hashStep(hashStep(hashStep(hashSeed(op()), inputs_[0]), inputs_[1]), inputs_[2]);
@@ -79,12 +117,15 @@ std::uint64_t SymbolicMultiExpr::hashAs(SymbolicOp op) const {
     return hash;
 }
 
-std::uint64_t SymbolicMultiExpr::getHash() const { return hashAs(op()); }
+std::uint64_t SymbolicMultiExpr::getHash() const {
+    return hashAs(op());
+}
 
 // Equality.
 
 bool SymbolicUnaryExpr::operator==(const SymbolicExpr& other) const {
-    return op() == other.op() && other.isUnaryExpr() && operand_ == static_cast<const SymbolicUnaryExpr&>(other).operand_;
+    return op() == other.op() && other.isUnaryExpr() &&
+           operand_ == static_cast<const SymbolicUnaryExpr&>(other).operand_;
 }
 
 bool SymbolicBinaryExpr::operator==(const SymbolicExpr& other) const {
@@ -143,7 +184,9 @@ bool IntShape::operator==(const SymbolicExpr& other) const {
     return other.op() == SymbolicOp::IntValue && value_ == static_cast<const IntShape&>(other).value_;
 }
 
-std::uint64_t IntShape::getHash() const { return static_cast<std::uint64_t>(static_cast<std::int64_t>(value_)); }
+std::uint64_t IntShape::getHash() const {
+    return static_cast<std::uint64_t>(static_cast<std::int64_t>(value_));
+}
 
 bool DoubleShape::operator==(const SymbolicExpr& other) const {
     if (other.op() != SymbolicOp::DoubleValue)
@@ -182,23 +225,35 @@ std::uint64_t MemberShape::getHash() const {
 
 std::uint64_t DimsNShape::getHash() const {
     switch (getNumInputs()) {
-    case 2: return hashAs(SymbolicOp::Dims2D);
-    case 3: return hashAs(SymbolicOp::Dims3D);
-    default: return hashAs(SymbolicOp::DimsND);
+    case 2:
+        return hashAs(SymbolicOp::Dims2D);
+    case 3:
+        return hashAs(SymbolicOp::Dims3D);
+    default:
+        return hashAs(SymbolicOp::DimsND);
     }
 }
 
 std::uint64_t CallNShape::getHash() const {
     switch (getNumInputs()) {
-    case 1: return hashAs(SymbolicOp::FcnCall0U);
-    case 2: return hashAs(SymbolicOp::FcnCall1U);
-    case 3: return hashAs(SymbolicOp::FcnCall2U);
-    default: return hashAs(SymbolicOp::FcnCall);
+    case 1:
+        return hashAs(SymbolicOp::FcnCall0U);
+    case 2:
+        return hashAs(SymbolicOp::FcnCall1U);
+    case 3:
+        return hashAs(SymbolicOp::FcnCall2U);
+    default:
+        return hashAs(SymbolicOp::FcnCall);
     }
 }
 
-std::size_t CallNShape::getNumArgs() const { return inputs().empty() ? 0 : inputs().size() - 1; }
-std::size_t CellShape::getNumArgs() const { return inputs().empty() ? 0 : inputs().size() - 1; }
+std::size_t CallNShape::getNumArgs() const {
+    return inputs().empty() ? 0 : inputs().size() - 1;
+}
+
+std::size_t CellShape::getNumArgs() const {
+    return inputs().empty() ? 0 : inputs().size() - 1;
+}
 
 std::vector<SymbolicExprId> headed(SymbolicExprId head, const std::vector<SymbolicExprId>& rest) {
     std::vector<SymbolicExprId> all;
@@ -216,15 +271,19 @@ SymbolicExprId CallName::in(SymbolicExprTable& table) const {
 
 // Dispatch.
 
-#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                           \
-    Class::~Class() = default;                                                                                           \
-    void Class::invoke(SymbolicExprVisitor& visitor) const { visitor.visit(*this); }                                     \
-    void Class::accept(const SymbolicExprTable& table, SymbolicExprVisitor& visitor) const {                             \
-        visitEveryOccurrence(table, *this, visitor);                                                                     \
+#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                         \
+    Class::~Class() = default;                                                                                         \
+    void Class::invoke(SymbolicExprVisitor& visitor) const {                                                           \
+        visitor.visit(*this);                                                                                          \
+    }                                                                                                                  \
+    void Class::accept(const SymbolicExprTable& table, SymbolicExprVisitor& visitor) const {                           \
+        visitEveryOccurrence(table, *this, visitor);                                                                   \
     }
 #include "base/core/operators.def"
 #undef VTSYM_OPERATOR
 
-bool SymbolicExprVisitor::isBottomUpVistor() const { return true; }
+bool SymbolicExprVisitor::isBottomUpVistor() const {
+    return true;
+}
 
 } // namespace VT

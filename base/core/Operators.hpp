@@ -56,10 +56,23 @@ struct OperatorInfo {
 
 namespace detail {
 inline constexpr auto operatorRows = std::to_array<OperatorInfo>({
-#define VTSYM_OPERATOR(Code, Name, Class, Shape, Quill, C, QuillCall, Prec, Assoc, Form, Negated, Mirrored, OnEqual,     \
-                       Boolean, Meaning)                                                                                 \
-    {SymbolicOp::Name, #Name, #Class, #Shape, Quill, C, QuillCall, Prec, OpAssociativity::Assoc, OperatorForm::Form,      \
-     SymbolicOp::Negated, SymbolicOp::Mirrored, OnEqual, Boolean != 0, Meaning},
+#define VTSYM_OPERATOR(Code, Name, Class, Shape, Quill, C, QuillCall, Prec, Assoc, Form, Negated, Mirrored, OnEqual,   \
+                       Boolean, Meaning)                                                                               \
+    {SymbolicOp::Name,                                                                                                 \
+     #Name,                                                                                                            \
+     #Class,                                                                                                           \
+     #Shape,                                                                                                           \
+     Quill,                                                                                                            \
+     C,                                                                                                                \
+     QuillCall,                                                                                                        \
+     Prec,                                                                                                             \
+     OpAssociativity::Assoc,                                                                                           \
+     OperatorForm::Form,                                                                                               \
+     SymbolicOp::Negated,                                                                                              \
+     SymbolicOp::Mirrored,                                                                                             \
+     OnEqual,                                                                                                          \
+     Boolean != 0,                                                                                                     \
+     Meaning},
 #include "base/core/operators.def"
 #undef VTSYM_OPERATOR
 });
@@ -70,31 +83,41 @@ constexpr bool codesAreDense() {
             return false;
     return true;
 }
+
 static_assert(codesAreDense(), "operator codes are dense and in the order of the table");
 } // namespace detail
 
 inline constexpr int operatorCount = static_cast<int>(detail::operatorRows.size());
 
 /// All rows in the order of their codes.
-constexpr const auto& operatorTable() { return detail::operatorRows; }
+constexpr const auto& operatorTable() {
+    return detail::operatorRows;
+}
 
 /// The row of an operator.  `op` is the code of a node, never None.
-constexpr const OperatorInfo& operatorInfo(SymbolicOp op) { return detail::operatorRows[static_cast<std::size_t>(op)]; }
+constexpr const OperatorInfo& operatorInfo(SymbolicOp op) {
+    return detail::operatorRows[static_cast<std::size_t>(op)];
+}
 
 /// A set of operators as a bit mask.
 class OperatorSet {
 public:
     constexpr OperatorSet() = default;
+
     constexpr OperatorSet(std::initializer_list<SymbolicOp> ops) {
         for (const SymbolicOp op : ops)
             add(op);
     }
+
     constexpr void add(SymbolicOp op) { bits_ |= bit(op); }
+
     [[nodiscard]] constexpr bool contains(SymbolicOp op) const { return (bits_ & bit(op)) != 0; }
+
     [[nodiscard]] constexpr int size() const { return std::popcount(bits_); }
 
     /// The operators whose row satisfies a condition.
-    template <class Condition> static constexpr OperatorSet where(Condition condition) {
+    template <class Condition>
+    static constexpr OperatorSet where(Condition condition) {
         OperatorSet set;
         for (const OperatorInfo& row : operatorTable())
             if (condition(row))
@@ -104,7 +127,9 @@ public:
 
 private:
     static_assert(operatorCount <= 64, "one bit per operator");
+
     static constexpr std::uint64_t bit(SymbolicOp op) { return std::uint64_t{1} << static_cast<unsigned>(op); }
+
     std::uint64_t bits_ = 0;
 };
 

@@ -14,8 +14,11 @@ class VTSYM_API SymbolicUnaryExpr : public SymbolicExpr {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
     [[nodiscard]] std::uint64_t getHash() const override;
+
     [[nodiscard]] std::size_t getNumInputs() const override { return 1; }
+
     [[nodiscard]] bool isUnaryExpr() const override { return true; }
+
     [[nodiscard]] SymbolicExprId getInput(std::size_t aIdx) const override;
 
     [[nodiscard]] SymbolicExprId operand() const noexcept { return operand_; }
@@ -32,11 +35,15 @@ class VTSYM_API SymbolicBinaryExpr : public SymbolicExpr {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
     [[nodiscard]] std::uint64_t getHash() const override;
+
     [[nodiscard]] std::size_t getNumInputs() const override { return 2; }
+
     [[nodiscard]] bool isBinaryExpr() const override { return true; }
+
     [[nodiscard]] SymbolicExprId getInput(std::size_t aIdx) const override;
 
     [[nodiscard]] SymbolicExprId left() const noexcept { return left_; }
+
     [[nodiscard]] SymbolicExprId right() const noexcept { return right_; }
 
 protected:
@@ -52,12 +59,17 @@ class VTSYM_API SymbolicTernaryExpr : public SymbolicExpr {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
     [[nodiscard]] std::uint64_t getHash() const override;
+
     [[nodiscard]] std::size_t getNumInputs() const override { return 3; }
+
     [[nodiscard]] bool isTernaryExpr() const override { return true; }
+
     [[nodiscard]] SymbolicExprId getInput(std::size_t aIdx) const override;
 
     [[nodiscard]] SymbolicExprId first() const noexcept { return inputs_[0]; }
+
     [[nodiscard]] SymbolicExprId second() const noexcept { return inputs_[1]; }
+
     [[nodiscard]] SymbolicExprId third() const noexcept { return inputs_[2]; }
 
 protected:
@@ -72,14 +84,18 @@ class VTSYM_API SymbolicMultiExpr : public SymbolicExpr {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
     [[nodiscard]] std::uint64_t getHash() const override;
+
     [[nodiscard]] std::size_t getNumInputs() const override { return inputs_.size(); }
+
     [[nodiscard]] bool isMultiExpr() const override { return true; }
+
     [[nodiscard]] SymbolicExprId getInput(std::size_t aIdx) const override;
 
     [[nodiscard]] const std::vector<SymbolicExprId>& inputs() const noexcept { return inputs_; }
 
 protected:
     explicit SymbolicMultiExpr(std::vector<SymbolicExprId> inputs) : inputs_(std::move(inputs)) {}
+
     /// The hash of the operands behind the seed of an operator.
     [[nodiscard]] std::uint64_t hashAs(SymbolicOp op) const;
 
@@ -99,7 +115,9 @@ class VTSYM_API StringShape : public SymbolicExpr {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
     [[nodiscard]] std::uint64_t getHash() const override;
+
     [[nodiscard]] bool isTermExpr() const override { return true; }
+
     /// The identifier or keyword, as received.
     [[nodiscard]] const std::string& getName() const noexcept { return name_; }
 
@@ -114,9 +132,13 @@ class VTSYM_API IntShape : public SymbolicExpr {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
     [[nodiscard]] std::uint64_t getHash() const override;
+
     [[nodiscard]] bool isTermExpr() const override { return true; }
+
     [[nodiscard]] bool isNumValue() const override { return true; }
+
     [[nodiscard]] double getNumValue() const override { return value_; }
+
     [[nodiscard]] int getValue() const noexcept { return value_; }
 
 protected:
@@ -130,9 +152,13 @@ class VTSYM_API DoubleShape : public SymbolicExpr {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
     [[nodiscard]] std::uint64_t getHash() const override;
+
     [[nodiscard]] bool isTermExpr() const override { return true; }
+
     [[nodiscard]] bool isNumValue() const override { return true; }
+
     [[nodiscard]] double getNumValue() const override { return value_; }
+
     [[nodiscard]] double getValue() const noexcept { return value_; }
 
 protected:
@@ -146,6 +172,7 @@ class VTSYM_API MemberShape : public SymbolicUnaryExpr {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
     [[nodiscard]] std::uint64_t getHash() const override;
+
     /// The field behind the dot.
     [[nodiscard]] const std::string& getMemberName() const noexcept { return name_; }
 
@@ -157,9 +184,11 @@ private:
 };
 
 /// A dimension list with a fixed number of entries.
-template <class Inputs> class FixedDimsShape : public Inputs {
+template <class Inputs>
+class FixedDimsShape : public Inputs {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override { return equalDimensions(*this, other); }
+
     [[nodiscard]] std::size_t getNumDimensions() const override { return this->getNumInputs(); }
 
 protected:
@@ -169,7 +198,9 @@ protected:
 class VTSYM_API DimsNShape : public SymbolicMultiExpr {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override { return equalDimensions(*this, other); }
+
     [[nodiscard]] std::uint64_t getHash() const override;
+
     [[nodiscard]] std::size_t getNumDimensions() const override { return getNumInputs(); }
 
 protected:
@@ -177,10 +208,13 @@ protected:
 };
 
 /// A call with a fixed number of arguments: input 0 is the function's name.
-template <class Inputs> class FixedCallShape : public Inputs {
+template <class Inputs>
+class FixedCallShape : public Inputs {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override { return equalCalls(*this, other); }
+
     [[nodiscard]] bool isFcnCallExpr() const override { return true; }
+
     [[nodiscard]] std::size_t getNumArgs() const override { return this->getNumInputs() - 1; }
 
 protected:
@@ -190,6 +224,7 @@ protected:
 class VTSYM_API CallNShape : public SymbolicMultiExpr {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override { return equalCalls(*this, other); }
+
     [[nodiscard]] std::uint64_t getHash() const override;
     [[nodiscard]] std::size_t getNumArgs() const override;
 

@@ -17,8 +17,10 @@ constexpr std::size_t firstSlots = 16;
 class SymbolicExprTable::Adoption {
 public:
     Adoption(const SymbolicExpr* node, bool pooled) : node_(node), pooled_(pooled) {}
+
     Adoption(const Adoption&) = delete;
     Adoption& operator=(const Adoption&) = delete;
+
     ~Adoption() {
         if (node_ == nullptr)
             return;
@@ -27,6 +29,7 @@ public:
         else
             delete node_;
     }
+
     void done() noexcept { node_ = nullptr; }
 
 private:
@@ -35,6 +38,7 @@ private:
 };
 
 SymbolicExprTable::SymbolicExprTable() : SymbolicExprTable(NodeStorage::Pooled) {}
+
 SymbolicExprTable::SymbolicExprTable(NodeStorage storage) : storage_(storage) {}
 
 SymbolicExprTable::~SymbolicExprTable() {
@@ -63,7 +67,9 @@ std::size_t SymbolicExprTable::freePosition(std::uint64_t hash) const noexcept {
     return at;
 }
 
-SymbolicExprTable::Probe SymbolicExprTable::probe(const SymbolicExpr& node) const { return probe(node, node.getHash()); }
+SymbolicExprTable::Probe SymbolicExprTable::probe(const SymbolicExpr& node) const {
+    return probe(node, node.getHash());
+}
 
 SymbolicExprTable::Probe SymbolicExprTable::probe(const SymbolicExpr& node, std::uint64_t hash) const {
     if (index_.empty())
@@ -127,15 +133,20 @@ bool SymbolicExprTable::contains(const SymbolicExpr* node) const {
 }
 
 SymbolicExprId SymbolicExprTable::lookup(const SymbolicExpr* node) const {
-    // Another node may stand where the remembered one stood, so it is compared, which is cheaper than hashing and probing.
+    // Another node may stand where the remembered one stood, so it is compared, which is cheaper than hashing and
+    // probing.
     if (node == lastAnswer_.node && *nodes_[lastAnswer_.id] == *node)
         return lastAnswer_.id;
     return probe(*node).id;
 }
 
-const SymbolicExpr* SymbolicExprTable::get(SymbolicExprId id) const { return has(id) ? nodes_[id] : nullptr; }
+const SymbolicExpr* SymbolicExprTable::get(SymbolicExprId id) const {
+    return has(id) ? nodes_[id] : nullptr;
+}
 
-SymbolicExprTable* SymbolicExprTable::CreateSymbolicExprTable() const { return new SymbolicExprTable; }
+SymbolicExprTable* SymbolicExprTable::CreateSymbolicExprTable() const {
+    return new SymbolicExprTable;
+}
 
 void SymbolicExprTable::lookup(const SymbolicOp& op, std::vector<SymbolicExprId>& out) const {
     out.clear();
@@ -151,7 +162,9 @@ void SymbolicExprTable::addBoolSymbols() {
     trueId_ = SymbolicString(*this, "true").getId(*this);
 }
 
-void SymbolicExprTable::registerValueId(SymbolicExprId exprId, SymbolicExprId valueId) { values_[exprId] = valueId; }
+void SymbolicExprTable::registerValueId(SymbolicExprId exprId, SymbolicExprId valueId) {
+    values_[exprId] = valueId;
+}
 
 void SymbolicExprTable::registerValueId(const std::string& name, SymbolicExprId valueId) {
     registerValueId(SymbolicString(*this, name).getId(*this), valueId);

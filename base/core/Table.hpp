@@ -14,11 +14,13 @@
 namespace VT {
 
 namespace detail {
-template <class Node, SymbolicOp Op, class Payload> class InternedNode;
+template <class Node, SymbolicOp Op, class Payload>
+class InternedNode;
 }
 
-/// Owns expression nodes and gives one identifier to one structure.  Nodes enter through their constructors and live as long as
-/// the table.  Beside them stand value bindings of expressions, aliases of identifiers and the two truth constants.
+/// Owns expression nodes and gives one identifier to one structure.  Nodes enter through their constructors and live as
+/// long as the table.  Beside them stand value bindings of expressions, aliases of identifiers and the two truth
+/// constants.
 ///
 /// A table is used by one thread at a time; const operations may run concurrently while no thread interns.
 class VTSYM_API SymbolicExprTable {
@@ -28,13 +30,14 @@ public:
     SymbolicExprTable& operator=(const SymbolicExprTable&) = delete;
     virtual ~SymbolicExprTable();
 
-    /// Takes ownership of a node and gives it the next identifier.  A node equal to an interned one is kept, but never found.
-    /// When memory runs out, the node is freed, the table is as before and std::bad_alloc passes.  Amortised O(1).
+    /// Takes ownership of a node and gives it the next identifier.  A node equal to an interned one is kept, but never
+    /// found. When memory runs out, the node is freed, the table is as before and std::bad_alloc passes.  Amortised
+    /// O(1).
     virtual void add(const SymbolicExpr* node);
     /// Whether an equal node is interned.  O(1) on average.
     virtual bool contains(const SymbolicExpr* node) const;
-    /// The identifier of the interned node equal to this one, or the invalid identifier.  A node that is itself in the table is
-    /// found even where it equals nothing (NaN).  O(1) on average.
+    /// The identifier of the interned node equal to this one, or the invalid identifier.  A node that is itself in the
+    /// table is found even where it equals nothing (NaN).  O(1) on average.
     virtual SymbolicExprId lookup(const SymbolicExpr* node) const;
     /// The node of an identifier; nullptr for an identifier that is not of this table.
     virtual const SymbolicExpr* get(SymbolicExprId id) const;
@@ -46,13 +49,16 @@ public:
 
     /// Number of nodes; identifiers are the numbers below it.
     [[nodiscard]] std::size_t size() const noexcept { return nodes_.size(); }
+
     /// Whether an identifier is one of this table.
     [[nodiscard]] bool has(SymbolicExprId id) const noexcept { return id < nodes_.size(); }
 
     /// Interns "false" and then "true" and remembers them as the truth constants.  A second call changes nothing.
     void addBoolSymbols();
+
     /// The identifiers of the truth constants; all bits set before addBoolSymbols().
     [[nodiscard]] SymbolicExprId getIdTRUE() const noexcept { return trueId_; }
+
     [[nodiscard]] SymbolicExprId getIdFALSE() const noexcept { return falseId_; }
 
     /// Binds a value to an expression; a later binding replaces an earlier one.
@@ -61,14 +67,16 @@ public:
     void registerValue(const std::string& name, int value);
     /// The value bound to an expression, or the invalid identifier.
     [[nodiscard]] SymbolicExprId getValueId(SymbolicExprId exprId) const;
+
     /// Whether an identifier is the invalid one.
     [[nodiscard]] bool isUnsetValue(SymbolicExprId id) const noexcept { return id == invalidId_; }
-    /// The integer bound to a name: a real value is truncated toward zero, at most to the bounds of int; a name without a
-    /// binding, or bound to anything but a number, answers 2147483647.  Interns the name.
+
+    /// The integer bound to a name: a real value is truncated toward zero, at most to the bounds of int; a name without
+    /// a binding, or bound to anything but a number, answers 2147483647.  Interns the name.
     int getValue(const std::string& name);
 
-    /// Fills `symbols` with the text of every identifier below `id`, each once, in the order of first occurrence.  Linear in
-    /// the number of distinct nodes.
+    /// Fills `symbols` with the text of every identifier below `id`, each once, in the order of first occurrence.
+    /// Linear in the number of distinct nodes.
     void getSymbolsFromExpression(SymbolicExprId id, std::vector<std::string>& symbols) const;
 
     /// Records an alias of an identifier; the first alias stays.
@@ -82,23 +90,27 @@ protected:
     explicit SymbolicExprTable(NodeStorage storage);
 
 private:
-    template <class Node, SymbolicOp Op, class Payload> friend class detail::InternedNode;
+    template <class Node, SymbolicOp Op, class Payload>
+    friend class detail::InternedNode;
 
     struct Slot {
         std::uint64_t hash;
         SymbolicExprId id; ///< invalidId marks a free slot
     };
+
     /// An interned answer, so that the lookup right behind a construction need not probe again.
     struct LastAnswer {
         const SymbolicExpr* node = nullptr;
         SymbolicExprId id = invalidId;
     };
+
     /// What an unsuccessful probe learned, so that the add right behind it need not hash and probe again.
     struct LastMiss {
         std::uint64_t hash = 0;
         std::size_t position = 0;
         const SymbolicExpr* node = nullptr;
     };
+
     struct Probe {
         std::uint64_t hash;
         std::size_t position;
@@ -106,7 +118,8 @@ private:
     };
     class Adoption;
 
-    template <class Node, class Payload> void intern(const SymbolicExpr& candidate, const Payload& payload);
+    template <class Node, class Payload>
+    void intern(const SymbolicExpr& candidate, const Payload& payload);
     [[nodiscard]] Probe probe(const SymbolicExpr& node) const;
     [[nodiscard]] Probe probe(const SymbolicExpr& node, std::uint64_t hash) const;
     [[nodiscard]] std::size_t home(std::uint64_t hash) const noexcept;
@@ -131,8 +144,8 @@ private:
     mutable LastMiss lastMiss_;
 };
 
-/// Interns `candidate`, a node of class Node under construction, by adding a copy made from its payload unless an equal node is
-/// there.
+/// Interns `candidate`, a node of class Node under construction, by adding a copy made from its payload unless an equal
+/// node is there.
 template <class Node, class Payload>
 void SymbolicExprTable::intern(const SymbolicExpr& candidate, const Payload& payload) {
     if (contains(&candidate)) {

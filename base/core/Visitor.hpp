@@ -21,9 +21,9 @@ public:
 #include "base/core/operators.def"
 #undef VTSYM_OPERATOR
 
-    /// Visits every occurrence of a node below and including `id`, operands from left to right and then their node.  A shared
-    /// operand is visited once for every path to it.  The stack does not grow with depth; an identifier that is not of the
-    /// table is not visited.
+    /// Visits every occurrence of a node below and including `id`, operands from left to right and then their node.  A
+    /// shared operand is visited once for every path to it.  The stack does not grow with depth; an identifier that is
+    /// not of the table is not visited.
     void execute(const SymbolicExprTable& table, SymbolicExprId id);
 
 protected:
@@ -32,13 +32,16 @@ protected:
     SymbolicExprVisitor& operator=(const SymbolicExprVisitor&) = default;
 };
 
-/// Routes the 48 visits to overloads `on(const X&)` of `Derived`, so that a visitor writes one function for a shape and one for
-/// each class that differs.  A class without any fitting overload does not compile.
-template <class Derived, class Base = SymbolicExprVisitor> class RoutedVisitor : public Base {
+/// Routes the 48 visits to overloads `on(const X&)` of `Derived`, so that a visitor writes one function for a shape and
+/// one for each class that differs.  A class without any fitting overload does not compile.
+template <class Derived, class Base = SymbolicExprVisitor>
+class RoutedVisitor : public Base {
 public:
     using Base::Base;
-#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                           \
-    void visit(const Class& node) override { static_cast<Derived&>(*this).on(node); }
+#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                         \
+    void visit(const Class& node) override {                                                                           \
+        static_cast<Derived&>(*this).on(node);                                                                         \
+    }
 #include "base/core/operators.def"
 #undef VTSYM_OPERATOR
 };

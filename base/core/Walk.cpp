@@ -4,7 +4,8 @@ namespace VT {
 
 namespace {
 
-/// Identifiers below this bound may be followed from a node.  A temporary that is no node of the table may name any of them.
+/// Identifiers below this bound may be followed from a node.  A temporary that is no node of the table may name any of
+/// them.
 struct Frame {
     const SymbolicExpr* node;
     SymbolicExprId bound;
@@ -14,8 +15,8 @@ struct Frame {
 };
 
 template <class BottomUp>
-void walkOccurrences(const SymbolicExprTable& table, const SymbolicExpr& root, SymbolicExprId bound, SymbolicExprVisitor& visitor,
-                     BottomUp bottomUp) {
+void walkOccurrences(const SymbolicExprTable& table, const SymbolicExpr& root, SymbolicExprId bound,
+                     SymbolicExprVisitor& visitor, BottomUp bottomUp) {
     std::vector<Frame> stack;
     const auto enter = [&](const SymbolicExpr& node, SymbolicExprId below) {
         const std::size_t count = node.getNumInputs();

@@ -1,7 +1,7 @@
 // The only walkers over expression graphs.  Their stacks are explicit, so depth costs memory, never the thread's stack.
 //
-// A node is interned after its operands, so an operand's identifier is below its node's own.  The walkers follow no other
-// operand: a node built on identifiers that were not there yet cannot lead them in a circle or out of the table.
+// A node is interned after its operands, so an operand's identifier is below its node's own.  The walkers follow no
+// other operand: a node built on identifiers that were not there yet cannot lead them in a circle or out of the table.
 #pragma once
 
 #include "base/core/IdMap.hpp"
@@ -11,8 +11,10 @@
 
 namespace VT {
 
-/// Visits every occurrence of a node below and including `root`, in the order that the visitor's isBottomUpVistor() asks for.
-VTSYM_API void visitEveryOccurrence(const SymbolicExprTable& table, const SymbolicExpr& root, SymbolicExprVisitor& visitor);
+/// Visits every occurrence of a node below and including `root`, in the order that the visitor's isBottomUpVistor()
+/// asks for.
+VTSYM_API void visitEveryOccurrence(const SymbolicExprTable& table, const SymbolicExpr& root,
+                                    SymbolicExprVisitor& visitor);
 
 /// A node whose operands are being walked.
 struct WalkFrame {
@@ -24,10 +26,10 @@ struct WalkFrame {
 
 /// Post-order walk for a caller that remembers the nodes itself, operands from left to right.
 ///
-/// `known(id, parent)` tells whether the node was visited before, in this walk or an earlier one, and takes note of a further
-/// occurrence if so; `visit(id, node, parent)` is called for every other node, and `missing(id, parent)` for an operand that no
-/// node stands for.  `parent` is the node on whose behalf, nullptr for the root.  `stack` is room that a caller of many small
-/// walks may keep.  Linear in the number of edges.
+/// `known(id, parent)` tells whether the node was visited before, in this walk or an earlier one, and takes note of a
+/// further occurrence if so; `visit(id, node, parent)` is called for every other node, and `missing(id, parent)` for an
+/// operand that no node stands for.  `parent` is the node on whose behalf, nullptr for the root.  `stack` is room that
+/// a caller of many small walks may keep.  Linear in the number of edges.
 template <class Known, class Visit, class Missing>
 void walkUnknown(const SymbolicExprTable& table, SymbolicExprId root, std::vector<WalkFrame>& stack, Known&& known,
                  Visit&& visit, Missing&& missing) {
@@ -63,9 +65,9 @@ void walkUnknown(const SymbolicExprTable& table, SymbolicExprId root, std::vecto
 
 /// Post-order walk over the distinct nodes below and including `root`, operands from left to right.
 ///
-/// `visit(id, node, parent)` is called once for each distinct node, `again(id, parent)` for each of its further occurrences as
-/// an operand, and for an operand that no node stands for.  `parent` is the node on whose behalf, nullptr for the root.  Linear
-/// in the number of edges.
+/// `visit(id, node, parent)` is called once for each distinct node, `again(id, parent)` for each of its further
+/// occurrences as an operand, and for an operand that no node stands for.  `parent` is the node on whose behalf,
+/// nullptr for the root.  Linear in the number of edges.
 template <class Visit, class Again>
 void walkDistinctWithParents(const SymbolicExprTable& table, SymbolicExprId root, Visit&& visit, Again&& again) {
     IdMap<bool> seen;

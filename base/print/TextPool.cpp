@@ -13,30 +13,34 @@ namespace VT {
 
 namespace {
 
-/// The head of a text as a number, its first byte the most significant: heads compare as numbers and append by shifting.
-__extension__ using HeadValue = unsigned __int128;
+/// Up to sixteen bytes as a number, the first byte the least significant: in registers, texts append by shifting.
+__extension__ using BytesValue = unsigned __int128;
 
-std::uint64_t bigEndian(std::uint64_t value) {
-    return std::endian::native == std::endian::little ? __builtin_bswap64(value) : value;
+constexpr bool littleEndian = std::endian::native == std::endian::little;
+
+std::uint64_t loadEight(const char* bytes) {
+    std::uint64_t value = 0;
+    std::memcpy(&value, bytes, sizeof value);
+    return littleEndian ? value : __builtin_bswap64(value);
 }
 
-HeadValue load(const char* bytes) {
-    std::uint64_t high = 0;
-    std::uint64_t low = 0;
-    std::memcpy(&high, bytes, sizeof high);
-    std::memcpy(&low, bytes + sizeof high, sizeof low);
-    return HeadValue{bigEndian(high)} << 64U | bigEndian(low);
+/// Eight bytes as a number that orders like them.
+std::uint64_t loadOrdered(const char* bytes) { return __builtin_bswap64(loadEight(bytes)); }
+
+/// Writes the first bytes of a value.
+template <std::size_t Count> void store(std::uint64_t value, char* bytes) {
+    const std::uint64_t ordered = littleEndian ? value : __builtin_bswap64(value);
+    std::memcpy(bytes, &ordered, Count);
+}
+
+std::uint32_t valueOf(std::string_view glue) {
+    std::uint32_t value = 0;
+    for (std::size_t i = 0; i < glue.size(); ++i)
+        value |= std::uint32_t{static_cast<unsigned char>(glue[i])} << 8U * i;
+    return value;
 }
 
 template <class Glue> bool fits(std::string_view text) { return text.size() <= sizeof(Glue::bytes); }
-
-template <class Glue> Glue glueOf(std::string_view text) {
-    Glue glue{};
-    glue.size = static_cast<std::uint8_t>(text.size());
-    for (std::size_t i = 0; i < text.size(); ++i)
-        glue.bytes[i] = text[i];
-    return glue;
-}
 
 template <class Glue> std::string_view view(const Glue& glue) { return {glue.bytes.data(), glue.size}; }
 
@@ -48,23 +52,35 @@ template <class Glue> char* put(char* out, const Glue& glue) {
 
 } // namespace
 
-/// Collects the head and the length of a join.
-class TextPool::HeadBuilder {
+/// Writes glue into a record and collects the head and the length of a join.  Memory that was just written in other pieces is not
+/// read: that would wait for the writes.
+class TextPool::JoinBuilder {
 public:
-    template <std::size_t Capacity> void add(const Glue<Capacity>& glue) { append(glue.bytes, glue.size); }
-    void add(const Record& part) { append(part.head, part.length); }
+    template <class Glue> void add(Glue& place, std::string_view glue) {
+        const std::uint32_t value = valueOf(glue);
+        store<sizeof(Glue::bytes)>(value, place.bytes.data());
+        place.size = static_cast<std::uint8_t>(glue.size());
+        append(value, glue.size());
+    }
+    void add(const Record& part) {
+        const char* const head = part.head.data();
+        append(BytesValue{loadEight(head + 8)} << 64U | loadEight(head), part.length);
+    }
     void finish(Record& record) const {
-        std::memcpy(record.head.data(), bytes_.data(), headBytes);
+        store<8>(static_cast<std::uint64_t>(head_), record.head.data());
+        store<8>(static_cast<std::uint64_t>(head_ >> 64U), record.head.data() + 8);
         record.length = size_;
     }
+    [[nodiscard]] std::uint64_t size() const noexcept { return size_; }
 
 private:
-    template <std::size_t Size> void append(const std::array<char, Size>& bytes, std::uint64_t size) {
-        std::memcpy(bytes_.data() + std::min<std::uint64_t>(size_, headBytes), bytes.data(), Size);
+    void append(BytesValue value, std::uint64_t size) {
+        if (size_ < headBytes)
+            head_ |= value << 8U * size_;
         size_ = std::min(size_ + size, unbounded);
     }
 
-    std::array<char, 2 * headBytes> bytes_{};
+    BytesValue head_ = 0;
     std::uint64_t size_ = 0;
 };
 
@@ -76,19 +92,17 @@ TextPool::Record& TextPool::add() {
 }
 
 Text TextPool::bytes(std::string_view bytes) {
-    Record record{};
-    record.length = bytes.size();
-    if (bytes.size() <= headBytes) {
-        std::memcpy(record.head.data(), bytes.data(), bytes.size());
-    } else {
-        std::memcpy(record.head.data(), bytes.data(), headBytes);
-        record.kind = Kind::Long;
-        record.first = static_cast<std::uint32_t>(bytes_.size());
-        record.second = static_cast<std::uint32_t>(bytes_.size() >> 32U);
+    const std::size_t position = bytes_.size();
+    if (bytes.size() > headBytes)
         std::memcpy(bytes_.extend(bytes.size()), bytes.data(), bytes.size());
-    }
-    record.leading = static_cast<std::uint32_t>(records_.size());
-    add() = record;
+    Record& run = add();
+    run.length = bytes.size();
+    run.head.fill('\0');
+    std::memcpy(run.head.data(), bytes.data(), std::min(bytes.size(), headBytes));
+    run.kind = bytes.size() > headBytes ? Kind::Long : Kind::Short;
+    run.first = static_cast<std::uint32_t>(position);
+    run.second = static_cast<std::uint32_t>(position >> 32U);
+    run.leading = static_cast<std::uint32_t>(last());
     return last();
 }
 
@@ -100,39 +114,30 @@ Text TextPool::join(std::string_view open, std::span<const Text> parts, std::str
         return bytes(std::string(open).append(close));
     if (parts.size() == 1 && open.empty() && close.empty())
         return parts.front();
-    Record record{};
-    record.open = glueOf<Bracket>(open);
-    record.separator = glueOf<Separator>(separator);
-    record.close = glueOf<Bracket>(close);
-    HeadBuilder head;
-    head.add(record.open);
-    const Record& front = this->record(parts.front());
-    head.add(front);
-    for (const Text part : parts.subspan(1)) {
-        head.add(record.separator);
-        head.add(this->record(part));
-    }
-    head.add(record.close);
-    head.finish(record);
-    if (record.length == 0)
-        return parts.front();
-    const bool beginsAlike = open.empty() && front.length >= limits::orderedTextBytes;
-    record.leading = beginsAlike ? front.leading : static_cast<std::uint32_t>(records_.size());
-    if (parts.size() <= 2) {
-        record.kind = Kind::Join;
-        record.parts = static_cast<std::uint8_t>(parts.size());
-        record.first = static_cast<std::uint32_t>(parts.front());
-        record.second = static_cast<std::uint32_t>(parts.back());
-    } else {
-        if (parts_.size() + parts.size() > std::numeric_limits<std::uint32_t>::max())
-            throw std::length_error("basic_string::append");
-        record.kind = Kind::List;
-        record.first = static_cast<std::uint32_t>(parts_.size());
-        record.second = static_cast<std::uint32_t>(parts.size());
+    if (parts_.size() + parts.size() > std::numeric_limits<std::uint32_t>::max())
+        throw std::length_error("basic_string::append");
+    const std::uint32_t firstPart = static_cast<std::uint32_t>(parts_.size());
+    if (parts.size() > 2)
         std::ranges::copy(parts, parts_.extend(parts.size()));
+
+    Record& joined = add();
+    const Record& front = record(parts.front());
+    const bool beginsAlike = open.empty() && front.length >= limits::orderedTextBytes;
+    joined.leading = beginsAlike ? front.leading : static_cast<std::uint32_t>(last());
+    JoinBuilder builder;
+    builder.add(joined.open, open);
+    builder.add(front);
+    for (const Text part : parts.subspan(1)) {
+        builder.add(joined.separator, separator);
+        builder.add(record(part));
     }
-    add() = record;
-    return last();
+    builder.add(joined.close, close);
+    builder.finish(joined);
+    joined.kind = parts.size() > 2 ? Kind::List : Kind::Join;
+    joined.parts = static_cast<std::uint8_t>(std::min<std::size_t>(parts.size(), 2));
+    joined.first = parts.size() > 2 ? firstPart : static_cast<std::uint32_t>(parts.front());
+    joined.second = static_cast<std::uint32_t>(parts.size() > 2 ? static_cast<Text>(parts.size()) : parts.back());
+    return builder.size() == 0 ? parts.front() : last();
 }
 
 /// Spellings of unusual length become texts of their own.
@@ -279,10 +284,12 @@ int TextPool::compare(Text left, Text right) const {
         return 0;
     const Record& a = record(left);
     const Record& b = record(right);
-    const HeadValue headA = load(a.head.data());
-    const HeadValue headB = load(b.head.data());
-    if (headA != headB)
-        return headA < headB ? -1 : 1;
+    for (const std::size_t at : {0, 8}) {
+        const std::uint64_t one = loadOrdered(a.head.data() + at);
+        const std::uint64_t two = loadOrdered(b.head.data() + at);
+        if (one != two)
+            return one < two ? -1 : 1;
+    }
     if (a.length <= headBytes || b.length <= headBytes)
         return a.length < b.length ? -1 : static_cast<int>(a.length > b.length);
 

@@ -90,7 +90,7 @@ private:
         std::uint32_t next;
     };
     class Cursor;
-    class HeadBuilder;
+    class JoinBuilder;
 
     [[nodiscard]] const Record& record(Text text) const { return records_[static_cast<std::uint32_t>(text)]; }
     [[nodiscard]] std::uint32_t partCount(const Record& record) const noexcept {

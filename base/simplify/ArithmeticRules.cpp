@@ -1,8 +1,9 @@
 // Rules for sums, products and quotients.
 //
-// Integer arithmetic wraps at 32 bits.  Adding and multiplying integers modulo 2^32 is associative, commutative and distributive,
-// so terms may be gathered in any order; what a rule writes down is exact in 64 bits and written only where it fits 32.  Reals
-// are rounded at each step, so they are folded pair by pair and never regrouped.  Quotients are moved as if they were exact.
+// Integer arithmetic wraps at 32 bits.  Adding and multiplying integers modulo 2^32 is associative, commutative and
+// distributive, so terms may be gathered in any order; what a rule writes down is exact in 64 bits and written only
+// where it fits 32.  Reals are rounded at each step, so they are folded pair by pair and never regrouped.  Quotients
+// are moved as if they were exact.
 #include "base/core/IdMap.hpp"
 #include "base/core/Walk.hpp"
 #include "base/simplify/RuleTables.hpp"
@@ -38,19 +39,27 @@ SymbolicExprId foldNumbers(RuleContext& context, SymbolicOp op, SymbolicExprId a
         const std::int64_t x = *left;
         const std::int64_t y = *right;
         switch (op) {
-        case SymbolicOp::Plus: return integerIfFits(context, x + y);
-        case SymbolicOp::Minus: return integerIfFits(context, x - y);
-        case SymbolicOp::Multiply: return integerIfFits(context, x * y);
-        default: return y != 0 && x % y == 0 ? integerIfFits(context, x / y) : invalidId;
+        case SymbolicOp::Plus:
+            return integerIfFits(context, x + y);
+        case SymbolicOp::Minus:
+            return integerIfFits(context, x - y);
+        case SymbolicOp::Multiply:
+            return integerIfFits(context, x * y);
+        default:
+            return y != 0 && x % y == 0 ? integerIfFits(context, x / y) : invalidId;
         }
     }
     const double x = context.node(a).getNumValue();
     const double y = context.node(b).getNumValue();
     switch (op) {
-    case SymbolicOp::Plus: return realIfFinite(context, x + y);
-    case SymbolicOp::Minus: return realIfFinite(context, x - y);
-    case SymbolicOp::Multiply: return realIfFinite(context, x * y);
-    default: return y != 0 ? realIfFinite(context, x / y) : invalidId;
+    case SymbolicOp::Plus:
+        return realIfFinite(context, x + y);
+    case SymbolicOp::Minus:
+        return realIfFinite(context, x - y);
+    case SymbolicOp::Multiply:
+        return realIfFinite(context, x * y);
+    default:
+        return y != 0 ? realIfFinite(context, x / y) : invalidId;
     }
 }
 
@@ -67,9 +76,11 @@ const SymbolicBinaryExpr* binary(const RuleContext& context, SymbolicExprId id, 
 // Products.
 
 SymbolicExprId cancelledQuotient(RuleContext& context, const RuleOperands& x) {
-    if (const auto* quotient = binary(context, x.a, SymbolicOp::Divide); quotient != nullptr && quotient->right() == x.b)
+    if (const auto* quotient = binary(context, x.a, SymbolicOp::Divide);
+        quotient != nullptr && quotient->right() == x.b)
         return quotient->left();
-    if (const auto* quotient = binary(context, x.b, SymbolicOp::Divide); quotient != nullptr && quotient->right() == x.a)
+    if (const auto* quotient = binary(context, x.b, SymbolicOp::Divide);
+        quotient != nullptr && quotient->right() == x.a)
         return quotient->left();
     return invalidId;
 }
@@ -162,6 +173,7 @@ private:
         SymbolicExprId asWritten; ///< the one occurrence, or the invalid identifier where there were several
         int sign;                 ///< of that occurrence
     };
+
     bool add(const RuleContext& context, SymbolicExprId operand, std::int64_t multiple);
     SymbolicExprId write(RuleContext& context, const Term& term, bool negate) const;
 
@@ -197,7 +209,8 @@ bool LinearSum::add(const RuleContext& context, SymbolicExprId operand, std::int
 }
 
 bool LinearSum::read(const RuleContext& context, SymbolicExprId root) {
-    // How often each node of the chain occurs is known once everything above it has been counted: identifiers fall downwards.
+    // How often each node of the chain occurs is known once everything above it has been counted: identifiers fall
+    // downwards.
     std::vector<SymbolicExprId> order;
     std::vector<SymbolicExprId> pending{root};
     IdMap<std::int64_t> multiples;

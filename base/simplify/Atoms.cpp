@@ -19,7 +19,8 @@ bool fitsInt(std::int64_t value) {
 
 // From nodes to constraints.
 
-Constraint Atoms::enter(const Key& key, SymbolicExprId left, SymbolicExprId right, IntegerSet set, SymbolicExprId literal) {
+Constraint Atoms::enter(const Key& key, SymbolicExprId left, SymbolicExprId right, IntegerSet set,
+                        SymbolicExprId literal) {
     const auto [at, added] = byKey_.try_emplace(key, static_cast<Atom>(entries_.size()));
     if (added)
         entries_.push_back({key, left, right});
@@ -35,11 +36,11 @@ Constraint Atoms::readComparison(SymbolicExprId literal, const SymbolicBinaryExp
     const SymbolicExprId left = context_.resolve(comparison.left());
     const SymbolicExprId right = context_.resolve(comparison.right());
     if (const std::optional<int> constant = context_.integer(right))
-        return enter({left, invalidId, SymbolicOp::None}, comparison.left(), invalidId, IntegerSet::satisfying(op, *constant),
-                     literal);
+        return enter({left, invalidId, SymbolicOp::None}, comparison.left(), invalidId,
+                     IntegerSet::satisfying(op, *constant), literal);
     if (!context_.isNumber(right) && !context_.isNumber(left))
-        return enter({left, right, SymbolicOp::None}, comparison.left(), comparison.right(), IntegerSet::satisfying(op, 0),
-                     literal);
+        return enter({left, right, SymbolicOp::None}, comparison.left(), comparison.right(),
+                     IntegerSet::satisfying(op, 0), literal);
     const bool negative = op == SymbolicOp::NotEqual || op == SymbolicOp::LessThan || op == SymbolicOp::GreaterThan;
     const SymbolicOp positive = negative ? operatorInfo(op).negated : op;
     return enter({left, right, positive}, comparison.left(), comparison.right(), negative ? zero : nonZero, literal);
@@ -91,7 +92,8 @@ SymbolicExprId Atoms::compare(const Entry& entry, SymbolicOp op, std::int64_t co
     return context_.makeBinary(op, entry.left, value);
 }
 
-/// A ray as one comparison.  Bounds of a difference are written against 0, others as <= and >= where the constant has 32 bits.
+/// A ray as one comparison.  Bounds of a difference are written against 0, others as <= and >= where the constant has
+/// 32 bits.
 SymbolicExprId Atoms::ray(const Entry& entry, const IntegerSet& set) {
     const bool upward = set.high() == IntegerSet::plusInfinity;
     const std::int64_t bound = upward ? set.low() : set.high();
@@ -164,7 +166,8 @@ SymbolicExprId Atoms::write(const Cover& cover) {
 
 // Chains.
 
-std::vector<SymbolicExprId> chainOperands(const RuleContext& context, SymbolicOp op, SymbolicExprId root, bool& repeated) {
+std::vector<SymbolicExprId> chainOperands(const RuleContext& context, SymbolicOp op, SymbolicExprId root,
+                                          bool& repeated) {
     std::vector<SymbolicExprId> operands;
     std::vector<SymbolicExprId> pending{root};
     IdMap<bool> seen;

@@ -14,16 +14,16 @@ namespace VT {
 
 /// The atoms of one condition.
 ///
-/// A comparison with an integer constant restricts its left operand to a set of integers; a comparison of two operands restricts
-/// their difference, compared with 0; any other operand of an And or Or is a value that is zero or not.  A comparison with a
-/// real constant is a truth value of its own, so that only its exact opposite meets it.  Atoms are numbered in the order in which
-/// literals are read, which the caller keeps independent of how nodes are numbered.
+/// A comparison with an integer constant restricts its left operand to a set of integers; a comparison of two operands
+/// restricts their difference, compared with 0; any other operand of an And or Or is a value that is zero or not.  A
+/// comparison with a real constant is a truth value of its own, so that only its exact opposite meets it.  Atoms are
+/// numbered in the order in which literals are read, which the caller keeps independent of how nodes are numbered.
 class Atoms {
 public:
     explicit Atoms(RuleContext& context) : context_(context) {}
 
-    /// What an operand of a chain (no And, no Or, no truth constant, no number) restricts.  The operand is remembered, so that
-    /// a product that says the same is written with it.
+    /// What an operand of a chain (no And, no Or, no truth constant, no number) restricts.  The operand is remembered,
+    /// so that a product that says the same is written with it.
     Constraint read(SymbolicExprId literal);
     /// An operand that is an And chain or a literal; false where the product can never hold.
     bool readProduct(SymbolicExprId product, Cube& cube);
@@ -39,8 +39,8 @@ private:
 
     struct Entry {
         Key key;
-        SymbolicExprId left;          ///< operand as it stands in the condition
-        SymbolicExprId right;         ///< second operand, or the invalid identifier
+        SymbolicExprId left;  ///< operand as it stands in the condition
+        SymbolicExprId right; ///< second operand, or the invalid identifier
     };
 
     Constraint enter(const Key& key, SymbolicExprId left, SymbolicExprId right, IntegerSet set, SymbolicExprId literal);
@@ -57,9 +57,10 @@ private:
     boost::unordered_map<Constraint, SymbolicExprId> forms_; ///< literals that were read
 };
 
-/// The operands of a chain of `op` rooted at a node, each once, in the order of the tree; `repeated` tells whether one was there
-/// twice.  Linear in the number of distinct nodes of the chain.
-std::vector<SymbolicExprId> chainOperands(const RuleContext& context, SymbolicOp op, SymbolicExprId root, bool& repeated);
+/// The operands of a chain of `op` rooted at a node, each once, in the order of the tree; `repeated` tells whether one
+/// was there twice.  Linear in the number of distinct nodes of the chain.
+std::vector<SymbolicExprId> chainOperands(const RuleContext& context, SymbolicOp op, SymbolicExprId root,
+                                          bool& repeated);
 
 /// Operands folded from the left; there is at least one.
 SymbolicExprId foldLeft(RuleContext& context, SymbolicOp op, const std::vector<SymbolicExprId>& operands);

@@ -13,8 +13,9 @@ SymbolicExprId applyFirst(std::span<const NodeRule> rules, RuleContext& context,
         if (after == invalidId)
             continue;
         if (context.explaining()) {
-            const SymbolicExprId before = operands.b == invalidId ? context.make<SymbolicNotExpr>(operands.a)
-                                                                  : context.makeBinary(operands.op, operands.a, operands.b);
+            const SymbolicExprId before = operands.b == invalidId
+                                              ? context.make<SymbolicNotExpr>(operands.a)
+                                              : context.makeBinary(operands.op, operands.a, operands.b);
             context.fired(rule.info, before, after);
         }
         return after;
@@ -87,14 +88,21 @@ SymbolicExprId truthAgainstInteger(RuleContext& context, const RuleOperands& x) 
     return set.contains(1) ? value : simplifyNot(context, value);
 }
 
-template <class Number> bool holds(SymbolicOp op, Number a, Number b) {
+template <class Number>
+bool holds(SymbolicOp op, Number a, Number b) {
     switch (op) {
-    case SymbolicOp::Equal: return a == b;
-    case SymbolicOp::NotEqual: return a != b;
-    case SymbolicOp::LessThan: return !(b <= a); // so that what is not a number is less
-    case SymbolicOp::LessThanEqual: return a <= b;
-    case SymbolicOp::GreaterThan: return a > b;
-    default: return a >= b;
+    case SymbolicOp::Equal:
+        return a == b;
+    case SymbolicOp::NotEqual:
+        return a != b;
+    case SymbolicOp::LessThan:
+        return !(b <= a); // so that what is not a number is less
+    case SymbolicOp::LessThanEqual:
+        return a <= b;
+    case SymbolicOp::GreaterThan:
+        return a > b;
+    default:
+        return a >= b;
     }
 }
 
@@ -121,7 +129,8 @@ SymbolicExprId comparedConstants(RuleContext& context, const RuleOperands& x) {
     return a && b ? context.truth(holds(x.op, *a, *b)) : invalidId;
 }
 
-/// Constants stand on the right, members on the right of what is no constant, other operands in the order of their texts.
+/// Constants stand on the right, members on the right of what is no constant, other operands in the order of their
+/// texts.
 bool isOriented(const RuleContext& context, const RuleOperands& x) {
     if (context.isNumber(x.b) || context.isNumber(x.a))
         return context.isNumber(x.b);
@@ -159,7 +168,12 @@ SymbolicExprId simplifyComparison(RuleContext& context, SymbolicOp op, SymbolicE
     return result != invalidId ? result : context.makeBinary(op, a, b);
 }
 
-void appendNotRules(std::vector<const RuleInfo*>& out) { append(notRules, out); }
-void appendComparisonRules(std::vector<const RuleInfo*>& out) { append(comparisonRules, out); }
+void appendNotRules(std::vector<const RuleInfo*>& out) {
+    append(notRules, out);
+}
+
+void appendComparisonRules(std::vector<const RuleInfo*>& out) {
+    append(comparisonRules, out);
+}
 
 } // namespace VT

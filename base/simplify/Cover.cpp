@@ -98,6 +98,7 @@ using Interval = IntegerSet::Interval;
 struct Piece {
     Interval interval;
     bool points;
+
     [[nodiscard]] std::size_t comparisons() const {
         const IntegerSet set(interval.low, interval.high);
         return points ? static_cast<std::size_t>(interval.high - interval.low) + 1 : set.comparisons();
@@ -199,14 +200,16 @@ public:
             for (const Constraint& c : cover[i].constraints())
                 at(c.atom).push_back(i);
     }
+
     [[nodiscard]] const std::vector<std::size_t>& of(Atom atom) const { return byAtom_[atom]; }
+
     /// The cubes that restrict the rarest atom of a cube; every cube below it is among them.
     [[nodiscard]] const std::vector<std::size_t>& candidatesBelow(const Cube& cube) const {
-        const auto rarest = std::ranges::min_element(cube.constraints(), {}, [this](const Constraint& c) {
-            return of(c.atom).size();
-        });
+        const auto rarest =
+            std::ranges::min_element(cube.constraints(), {}, [this](const Constraint& c) { return of(c.atom).size(); });
         return of(rarest->atom);
     }
+
     [[nodiscard]] std::size_t atoms() const noexcept { return byAtom_.size(); }
 
 private:
@@ -215,6 +218,7 @@ private:
             byAtom_.resize(atom + 1);
         return byAtom_[atom];
     }
+
     std::vector<std::vector<std::size_t>> byAtom_;
 };
 
@@ -257,8 +261,17 @@ bool absorb(Cover& cover) {
 
 namespace {
 
+/// The sum of a cube's hashes, from which the hash of the cube without one constraint is a subtraction.
+std::uint64_t hashOf(const Cube& cube) {
+    std::uint64_t sum = 0;
+    for (const Constraint& constraint : cube.constraints())
+        sum += hash_value(constraint);
+    return sum;
+}
+
 /// Joins the cubes of a group, which are equal but for one atom.  Tells whether they became fewer or shorter.
-bool joinGroup(Cover& cover, const std::vector<std::size_t>& group, Atom atom, std::vector<bool>& gone) {
+bool joinGroup(Cover& cover, const std::vector<std::size_t>& group, Atom atom, std::vector<bool>& gone,
+               std::vector<std::uint64_t>& hashes) {
     std::vector<IntegerSet> sets;
     std::size_t comparisonsBefore = 0;
     for (const std::size_t i : group) {
@@ -278,20 +291,14 @@ bool joinGroup(Cover& cover, const std::vector<std::size_t>& group, Atom atom, s
     if (joined.size() == sets.size() && comparisonsAfter >= comparisonsBefore)
         return false;
     for (std::size_t i = 0; i < group.size(); ++i) {
-        if (i < cubes.size())
+        if (i < cubes.size()) {
             cover[group[i]] = std::move(cubes[i]);
-        else
+            hashes[group[i]] = hashOf(cover[group[i]]);
+        } else {
             gone[group[i]] = true;
+        }
     }
     return true;
-}
-
-/// The sum of a cube's hashes, from which the hash of the cube without one constraint is a subtraction.
-std::uint64_t hashOf(const Cube& cube) {
-    std::uint64_t sum = 0;
-    for (const Constraint& constraint : cube.constraints())
-        sum += hash_value(constraint);
-    return sum;
 }
 
 bool equalButFor(const Cube& a, const Cube& b, Atom atom) {
@@ -301,15 +308,17 @@ bool equalButFor(const Cube& a, const Cube& b, Atom atom) {
 }
 
 /// Of the cubes that restrict an atom, those that say the same but for it, in groups of two and more.
-std::vector<std::vector<std::size_t>> groupsButFor(const Cover& cover, Atom atom, const std::vector<std::size_t>& members,
-                                                   const std::vector<bool>& gone) {
+std::vector<std::vector<std::size_t>> groupsButFor(const Cover& cover, Atom atom,
+                                                   const std::vector<std::size_t>& members,
+                                                   const std::vector<bool>& gone,
+                                                   const std::vector<std::uint64_t>& hashes) {
     std::vector<std::vector<std::size_t>> groups;
     boost::unordered_map<std::uint64_t, std::size_t> byHash;
     for (const std::size_t i : members) {
         const IntegerSet* set = gone[i] ? nullptr : cover[i].find(atom);
         if (set == nullptr)
             continue;
-        const auto [at, added] = byHash.try_emplace(hashOf(cover[i]) - hash_value(Constraint{atom, *set}), groups.size());
+        const auto [at, added] = byHash.try_emplace(hashes[i] - hash_value(Constraint{atom, *set}), groups.size());
         if (added)
             groups.emplace_back();
         std::vector<std::size_t>& group = groups[at->second];
@@ -327,12 +336,15 @@ bool joinCubes(Cover& cover) {
         return false;
     const Occurrences occurrences(cover);
     std::vector<bool> gone(cover.size(), false);
+    std::vector<std::uint64_t> hashes;
+    for (const Cube& cube : cover)
+        hashes.push_back(hashOf(cube));
     bool any = false;
     for (Atom atom = 0; atom < occurrences.atoms(); ++atom) {
         if (occurrences.of(atom).size() < 2)
             continue;
-        for (const std::vector<std::size_t>& group : groupsButFor(cover, atom, occurrences.of(atom), gone))
-            any = joinGroup(cover, group, atom, gone) || any;
+        for (const std::vector<std::size_t>& group : groupsButFor(cover, atom, occurrences.of(atom), gone, hashes))
+            any = joinGroup(cover, group, atom, gone, hashes) || any;
     }
     if (any)
         eraseMarked(cover, gone);
@@ -345,7 +357,10 @@ namespace {
 class CoverSearch {
 public:
     CoverSearch(const Cover& cover, CoverBudget& budget)
-        : cover_(cover), occurrences_(cover), gone_(cover.size(), false), budget_(budget) {
+        : cover_(cover),
+          occurrences_(cover),
+          gone_(cover.size(), false),
+          budget_(budget) {
         for (Atom atom = 0; atom < occurrences_.atoms(); ++atom)
             spanned_.push_back(spans(atom));
         for (std::size_t i = 0; i < cover.size(); ++i)
@@ -375,8 +390,8 @@ private:
         return IntegerSet::of(std::move(intervals)).isAll();
     }
 
-    /// The cubes that may help: a cube that restricts an atom of which some value is out of reach helps only where the atom is
-    /// restricted already.
+    /// The cubes that may help: a cube that restricts an atom of which some value is out of reach helps only where the
+    /// atom is restricted already.
     std::vector<const Cube*> candidates(const Cube& cube, std::size_t skip) const {
         std::vector<std::size_t> indices = everywhere_;
         for (const Constraint& c : cube.constraints())
@@ -419,8 +434,8 @@ private:
         return search(half, touching, depth + 1);
     }
 
-    /// Where some value of an atom is out of reach of all cubes that restrict it, the others must cover that slice and so the
-    /// whole: those cubes do not help.
+    /// Where some value of an atom is out of reach of all cubes that restrict it, the others must cover that slice and
+    /// so the whole: those cubes do not help.
     void dropUnhelpful(const Cube& cube, std::vector<const Cube*>& cubes) {
         for (bool again = true; again && !cubes.empty();) {
             Reach reach;
@@ -435,10 +450,11 @@ private:
                 if (within != nullptr ? within->isSubsetOf(reached) : reached.isAll())
                     continue;
                 const Atom beyond = atom;
-                again = std::erase_if(cubes, [&](const Cube* other) {
-                            const IntegerSet* set = other->find(beyond);
-                            return set != nullptr && restricts(cube, {beyond, *set});
-                        }) > 0 ||
+                again = std::erase_if(cubes,
+                                      [&](const Cube* other) {
+                                          const IntegerSet* set = other->find(beyond);
+                                          return set != nullptr && restricts(cube, {beyond, *set});
+                                      }) > 0 ||
                         again;
             }
         }
@@ -456,7 +472,7 @@ private:
     const Cover& cover_;
     Occurrences occurrences_;
     std::vector<bool> gone_;
-    std::vector<bool> spanned_;            ///< by atom
+    std::vector<bool> spanned_;           ///< by atom
     std::vector<std::size_t> everywhere_; ///< cubes that may help anywhere
     CoverBudget& budget_;
 };

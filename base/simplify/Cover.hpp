@@ -1,8 +1,8 @@
 // Sums of products over integer-valued atoms, and how they are made smaller.
 //
-// An atom is anything whose value a comparison restricts to a set of integers; here it is a number.  A cube is a product: one set
-// for each atom that it restricts.  A cover is a sum: it holds where one of its cubes holds.  All operations are exact over the
-// unbounded integers, and each that makes a cover smaller keeps what the cover means.
+// An atom is anything whose value a comparison restricts to a set of integers; here it is a number.  A cube is a
+// product: one set for each atom that it restricts.  A cover is a sum: it holds where one of its cubes holds.  All
+// operations are exact over the unbounded integers, and each that makes a cover smaller keeps what the cover means.
 #pragma once
 
 #include "base/simplify/IntegerSet.hpp"
@@ -25,12 +25,14 @@ struct Constraint {
 /// A hash by content, for containers.
 std::size_t hash_value(const Constraint& constraint) noexcept;
 
-/// A product of constraints, at most one for each atom, in the order of atoms.  No constraint allows everything or nothing; the
-/// product without constraints always holds.
+/// A product of constraints, at most one for each atom, in the order of atoms.  No constraint allows everything or
+/// nothing; the product without constraints always holds.
 class Cube {
 public:
     [[nodiscard]] const std::vector<Constraint>& constraints() const noexcept { return constraints_; }
+
     [[nodiscard]] bool alwaysHolds() const noexcept { return constraints_.empty(); }
+
     /// The set of an atom, or nullptr where the cube does not restrict it.
     [[nodiscard]] const IntegerSet* find(Atom atom) const noexcept;
     /// Restricts an atom further; false where nothing is left, and the cube is then not to be used.
@@ -54,8 +56,9 @@ using Cover = std::vector<Cube>;
 
 [[nodiscard]] std::size_t comparisons(const Cover& cover) noexcept;
 
-/// A set written as few products: rays, intervals and sets from which single points are missing.  `sets` are the parts it came
-/// from: points among them stay points unless a neighbour takes them in, so that A == 1 || A == 2 stays as it is.
+/// A set written as few products: rays, intervals and sets from which single points are missing.  `sets` are the parts
+/// it came from: points among them stay points unless a neighbour takes them in, so that A == 1 || A == 2 stays as it
+/// is.
 [[nodiscard]] std::vector<IntegerSet> joinSets(const std::vector<IntegerSet>& sets);
 
 /// The cover that holds exactly where the cube does not, one comparison to each cube.

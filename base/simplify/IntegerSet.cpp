@@ -6,13 +6,20 @@ namespace VT {
 
 IntegerSet IntegerSet::satisfying(SymbolicOp op, std::int64_t constant) {
     switch (op) {
-    case SymbolicOp::Equal: return point(constant);
-    case SymbolicOp::NotEqual: return allBut(constant);
-    case SymbolicOp::LessThan: return {minusInfinity, constant - 1};
-    case SymbolicOp::LessThanEqual: return {minusInfinity, constant};
-    case SymbolicOp::GreaterThan: return {constant + 1, plusInfinity};
-    case SymbolicOp::GreaterThanEqual: return {constant, plusInfinity};
-    default: return all();
+    case SymbolicOp::Equal:
+        return point(constant);
+    case SymbolicOp::NotEqual:
+        return allBut(constant);
+    case SymbolicOp::LessThan:
+        return {minusInfinity, constant - 1};
+    case SymbolicOp::LessThanEqual:
+        return {minusInfinity, constant};
+    case SymbolicOp::GreaterThan:
+        return {constant + 1, plusInfinity};
+    case SymbolicOp::GreaterThanEqual:
+        return {constant, plusInfinity};
+    default:
+        return all();
     }
 }
 
@@ -71,8 +78,7 @@ IntegerSet IntegerSet::unite(const IntegerSet& other) const {
 }
 
 bool IntegerSet::contains(std::int64_t value) const noexcept {
-    return std::ranges::any_of(intervals_,
-                               [value](const Interval& i) { return i.low <= value && value <= i.high; });
+    return std::ranges::any_of(intervals_, [value](const Interval& i) { return i.low <= value && value <= i.high; });
 }
 
 bool IntegerSet::isSubsetOf(const IntegerSet& other) const noexcept {

@@ -18,20 +18,28 @@ constexpr std::size_t searchSteps = 20000;
 /// A chain on its way to a sum of products: first its operands, then covers whose product (And) or sum (Or) it is.
 struct Chain {
     Chain(RuleContext& rules, SymbolicOp chainOp, SymbolicExprId root)
-        : context(rules), op(chainOp), source(root), shown(root), atoms(rules),
+        : context(rules),
+          op(chainOp),
+          source(root),
+          shown(root),
+          atoms(rules),
           operands(chainOperands(rules, chainOp, root, repeated)) {}
 
     [[nodiscard]] bool isAnd() const noexcept { return op == SymbolicOp::And; }
+
     /// The constant that decides the chain alone, and the one that it does without.
     [[nodiscard]] SymbolicExprId dominant() const { return context.truth(!isAnd()); }
+
     [[nodiscard]] SymbolicExprId neutral() const { return context.truth(isAnd()); }
 
     bool decide(SymbolicExprId id) {
         result = id;
         return true;
     }
+
     /// Takes operands away; what is left may be one operand or none.
-    template <class Condition> bool drop(Condition condition) {
+    template <class Condition>
+    bool drop(Condition condition) {
         if (std::erase_if(operands, condition) == 0)
             return false;
         if (operands.size() < 2)
@@ -43,6 +51,7 @@ struct Chain {
     void read();
     /// The chain as it stands now.
     SymbolicExprId write();
+
     /// Gives up beyond the operand limit.
     bool bounded(std::size_t size) {
         if (size <= context.operandLimit())
@@ -118,7 +127,8 @@ SymbolicExprId Chain::write() {
 // Rules over constants.
 
 bool dominantOperand(Chain& chain) {
-    return std::ranges::find(chain.operands, chain.dominant()) != chain.operands.end() && chain.decide(chain.dominant());
+    return std::ranges::find(chain.operands, chain.dominant()) != chain.operands.end() &&
+           chain.decide(chain.dominant());
 }
 
 /// A real literal that is not a number counts as true in And and as false in Or.
@@ -129,7 +139,8 @@ bool decides(SymbolicOp op, double number) {
 bool numberOperand(Chain& chain) {
     const auto value = [&](SymbolicExprId id) { return chain.context.resolve(id); };
     for (const SymbolicExprId operand : chain.operands)
-        if (chain.context.isNumber(value(operand)) && decides(chain.op, chain.context.node(value(operand)).getNumValue()))
+        if (chain.context.isNumber(value(operand)) &&
+            decides(chain.op, chain.context.node(value(operand)).getNumValue()))
             return chain.decide(chain.dominant());
     if (std::ranges::all_of(chain.operands, [&](SymbolicExprId id) { return chain.context.isNumber(value(id)); }))
         return chain.decide(chain.neutral());
@@ -162,7 +173,10 @@ bool contradiction(Chain& chain) {
     return chain.impossible && chain.decide(chain.dominant());
 }
 
-bool commonRange(Chain& chain) { return chain.bounded(chain.common.comparisons()) && chain.common.comparisons() < chain.written; }
+bool commonRange(Chain& chain) {
+    const std::size_t comparisons = chain.common.comparisons();
+    return chain.bounded(comparisons + chain.alternatives.size()) && comparisons < chain.written;
+}
 
 bool absorbedAlternative(Chain& chain) {
     return std::erase_if(chain.alternatives, [&](const Cover& cover) {
@@ -205,13 +219,21 @@ bool joinedRange(Chain& chain) {
     return chain.bounded(chain.sum.size()) && joined;
 }
 
-bool absorbedProduct(Chain& chain) { return absorb(chain.sum); }
+bool absorbedProduct(Chain& chain) {
+    return absorb(chain.sum);
+}
 
-bool redundantComparison(Chain& chain) { return dropComparisons(chain.sum, chain.budget); }
+bool redundantComparison(Chain& chain) {
+    return dropComparisons(chain.sum, chain.budget);
+}
 
-bool redundantProduct(Chain& chain) { return dropCubes(chain.sum, chain.budget); }
+bool redundantProduct(Chain& chain) {
+    return dropCubes(chain.sum, chain.budget);
+}
 
-bool operandOrder(Chain& chain) { return chain.decide(chain.write()); }
+bool operandOrder(Chain& chain) {
+    return chain.decide(chain.write());
+}
 
 struct ChainRule {
     RuleInfo info;
@@ -222,8 +244,8 @@ constexpr OperatorSet andOnly{SymbolicOp::And};
 constexpr OperatorSet orOnly{SymbolicOp::Or};
 constexpr OperatorSet andOr{SymbolicOp::And, SymbolicOp::Or};
 
-// Both families begin with constants; And goes on to what its comparisons say together and is then distributed into a sum of
-// products, which Or's last rules make smaller until none of them applies.
+// Both families begin with constants; And goes on to what its comparisons say together and is then distributed into a
+// sum of products, which Or's last rules make smaller until none of them applies.
 constexpr ChainRule andRules[] = {
     {{andOnly, "false operand of And", "A == 1 && false", "false"}, dominantOperand},
     {{andOnly, "number in And", "2 && A == 1", "A == 1"}, numberOperand},
@@ -276,9 +298,9 @@ bool decidedBy(std::span<const ChainRule> rules, Chain& chain) {
 SymbolicExprId reduceSum(Chain& chain) {
     if (!chain.isRead)
         chain.read();
-    bool again = true;
-    while (again && chain.result == invalidId)
-        again = std::ranges::any_of(sumRules, [&](const ChainRule& rule) { return apply(rule, chain); });
+    const auto helped = [&](const ChainRule& rule) { return apply(rule, chain) || chain.result != invalidId; };
+    while (chain.result == invalidId && std::ranges::any_of(sumRules, helped)) {
+    }
     if (chain.result == invalidId)
         apply(orderRule, chain);
     return chain.result;
@@ -306,8 +328,9 @@ SymbolicExprId negateChain(RuleContext& context, SymbolicExprId root) {
 }
 
 void appendLogicalRules(std::vector<const RuleInfo*>& out) {
-    for (const std::span<const ChainRule> family : {std::span<const ChainRule>(andRules), std::span<const ChainRule>(orRules),
-                                                    std::span<const ChainRule>(sumRules), std::span(&orderRule, 1)})
+    for (const std::span<const ChainRule> family :
+         {std::span<const ChainRule>(andRules), std::span<const ChainRule>(orRules),
+          std::span<const ChainRule>(sumRules), std::span(&orderRule, 1)})
         for (const ChainRule& rule : family)
             out.push_back(&rule.info);
 }

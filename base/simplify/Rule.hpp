@@ -1,7 +1,7 @@
 // Simplification rules as rows of tables.
 //
-// A row's example is its documentation, its test case and what an explanation shows.  Rules of one family are tried from top to
-// bottom; the first that applies decides.
+// A row's example is its documentation, its test case and what an explanation shows.  Rules of one family are tried
+// from top to bottom; the first that applies decides.
 #pragma once
 
 #include "base/core/Node.hpp"
@@ -18,7 +18,7 @@ struct RuleInfo {
     OperatorSet operators;   ///< the operators at whose nodes the rule is tried
     std::string_view name;   ///< as an explanation shows it
     std::string_view before; ///< an example in Quill syntax to which the rule applies
-    std::string_view after;  ///< the simplified example; empty text for a condition that always holds never occurs: it is "true"
+    std::string_view after;  ///< the simplified example
 };
 
 /// Every rule of the simplifier, in the order of its families.

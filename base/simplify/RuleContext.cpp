@@ -9,11 +9,14 @@ namespace VT {
 RuleListener::~RuleListener() = default;
 
 RuleContext::RuleContext(SymbolicExprTable& table, const SymbolicExprPrinter& printer, bool keywordsOn)
-    : table_(table), printer_(printer), keywordsOn_(keywordsOn) {}
+    : table_(table),
+      printer_(printer),
+      keywordsOn_(keywordsOn) {}
 
 namespace {
 
-template <class Node> SymbolicExprId makeIfBinary(RuleContext& context, SymbolicExprId a, SymbolicExprId b) {
+template <class Node>
+SymbolicExprId makeIfBinary(RuleContext& context, SymbolicExprId a, SymbolicExprId b) {
     if constexpr (std::is_base_of_v<SymbolicBinaryExpr, Node>)
         return context.make<Node>(a, b);
     else
@@ -24,11 +27,13 @@ template <class Node> SymbolicExprId makeIfBinary(RuleContext& context, Symbolic
 
 SymbolicExprId RuleContext::makeBinary(SymbolicOp op, SymbolicExprId a, SymbolicExprId b) {
     switch (op) {
-#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                           \
-    case SymbolicOp::Name: return makeIfBinary<Class>(*this, a, b);
+#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                         \
+    case SymbolicOp::Name:                                                                                             \
+        return makeIfBinary<Class>(*this, a, b);
 #include "base/core/operators.def"
 #undef VTSYM_OPERATOR
-    case SymbolicOp::None: break;
+    case SymbolicOp::None:
+        break;
     }
     return invalidId;
 }
@@ -53,8 +58,8 @@ bool RuleContext::isSimKeyword(SymbolicExprId id) const {
 }
 
 bool RuleContext::isCodegenKeyword(SymbolicExprId id) const {
-    return op(id) == SymbolicOp::String &&
-           VariantKeywords::isCodegenVariantKeyword(static_cast<const SymbolicString&>(node(id)).getName(), keywordsOn_);
+    return op(id) == SymbolicOp::String && VariantKeywords::isCodegenVariantKeyword(
+                                               static_cast<const SymbolicString&>(node(id)).getName(), keywordsOn_);
 }
 
 void RuleContext::fired(const RuleInfo& rule, SymbolicExprId before, SymbolicExprId after) {

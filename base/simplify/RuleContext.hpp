@@ -27,22 +27,33 @@ public:
     virtual void giveUp() = 0;
 
     [[nodiscard]] const SymbolicExpr& node(SymbolicExprId id) const { return *table_.get(id); }
+
     [[nodiscard]] SymbolicOp op(SymbolicExprId id) const { return node(id).op(); }
-    template <class Node, class... Parts> SymbolicExprId make(Parts&&... parts) {
+
+    template <class Node, class... Parts>
+    SymbolicExprId make(Parts&&... parts) {
         return Node(table_, std::forward<Parts>(parts)...).getId(table_);
     }
+
     /// The node of an operator with two operands; the invalid identifier for other operators.
     SymbolicExprId makeBinary(SymbolicOp op, SymbolicExprId a, SymbolicExprId b);
+
     [[nodiscard]] SymbolicExprId truth(bool value) const { return value ? table_.getIdTRUE() : table_.getIdFALSE(); }
+
     [[nodiscard]] bool isTrue(SymbolicExprId id) const { return id == table_.getIdTRUE(); }
+
     [[nodiscard]] bool isFalse(SymbolicExprId id) const { return id == table_.getIdFALSE(); }
 
     /// The value bound to a member, where there is one; otherwise the operand itself.
     [[nodiscard]] SymbolicExprId resolve(SymbolicExprId id) const;
+
     [[nodiscard]] bool isNumber(SymbolicExprId id) const { return node(id).isNumValue(); }
+
     /// The value of an integer literal.
     [[nodiscard]] std::optional<int> integer(SymbolicExprId id) const;
+
     [[nodiscard]] bool isBoolean(SymbolicExprId id) const { return booleanOps.contains(op(id)); }
+
     [[nodiscard]] bool isSimKeyword(SymbolicExprId id) const;
     [[nodiscard]] bool isCodegenKeyword(SymbolicExprId id) const;
 
@@ -53,11 +64,14 @@ public:
 
     /// Applications of rules, told to the listener; free of cost where nobody listens.
     [[nodiscard]] bool explaining() const noexcept { return listener_ != nullptr; }
+
     void fired(const RuleInfo& rule, SymbolicExprId before, SymbolicExprId after);
+
     void listen(RuleListener* listener, std::uint64_t pass) noexcept {
         listener_ = listener;
         pass_ = pass;
     }
+
     [[nodiscard]] SymbolicExprTable& table() const noexcept { return table_; }
 
 private:

@@ -20,9 +20,10 @@ std::span<const RuleInfo* const> simplificationRules() {
 
 namespace {
 
-/// Adds the operands of a chain of `op` to a set; false where there are more than the limit allows.  Walks one left spine after
-/// the other.
-bool collectOperands(const SymbolicExprTable& table, SymbolicOp op, SymbolicExprId root, boost::container::flat_set<SymbolicExprId>& out) {
+/// Adds the operands of a chain of `op` to a set; false where there are more than the limit allows.  Walks one left
+/// spine after the other.
+bool collectOperands(const SymbolicExprTable& table, SymbolicOp op, SymbolicExprId root,
+                     boost::container::flat_set<SymbolicExprId>& out) {
     std::vector<SymbolicExprId> pending{root};
     IdMap<bool> walked;
     while (!pending.empty()) {
@@ -58,7 +59,9 @@ void addOperands(const SymbolicExprTable& table, SymbolicOp op, const SymbolicEx
 } // namespace
 
 SymbolicExprSimplify::SymbolicExprSimplify(SymbolicExprTable& table, std::uint64_t maxIterations)
-    : table_(table), maxIterations_(maxIterations), keywordsFlag_(isVariantKeywordsSimCodegenFeatureOn()),
+    : table_(table),
+      maxIterations_(maxIterations),
+      keywordsFlag_(isVariantKeywordsSimCodegenFeatureOn()),
       printer_(table, true) {}
 
 bool SymbolicExprSimplify::isVariantKeywordsSimCodegenFeatureOn() const {

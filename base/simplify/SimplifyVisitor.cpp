@@ -24,11 +24,15 @@ bool continues(const SymbolicExpr* parent, SymbolicOp op) {
 class SymbolicExprSimplifyVisitor::Rules final : public RuleContext {
 public:
     Rules(SymbolicExprSimplifyVisitor& visitor, const SymbolicExprPrinter& printer)
-        : RuleContext(visitor.table(), printer, visitor.keywordsOn), visitor_(visitor) {}
+        : RuleContext(visitor.table(), printer, visitor.keywordsOn),
+          visitor_(visitor) {}
+
     bool confirmRewrite(SymbolicExprId expression, SymbolicExprId replacement) override {
         return visitor_.confirmRewrite(expression, replacement);
     }
+
     [[nodiscard]] std::uint64_t operandLimit() const override { return visitor_.operandLimit; }
+
     void giveUp() override { visitor_.gaveUp = true; }
 
 private:
@@ -46,15 +50,19 @@ SymbolicExprSimplifyVisitor::SymbolicExprSimplifyVisitor(SymbolicExprTable& tabl
 
 SymbolicExprSimplifyVisitor::~SymbolicExprSimplifyVisitor() = default;
 
-bool SymbolicExprSimplifyVisitor::confirmRewrite(SymbolicExprId, SymbolicExprId) { return true; }
+bool SymbolicExprSimplifyVisitor::confirmRewrite(SymbolicExprId, SymbolicExprId) {
+    return true;
+}
 
 SymbolicExprId SymbolicExprSimplifyVisitor::pass(SymbolicExprId id) {
     if (!table().has(id))
         return invalidId;
+
     struct Result {
         SymbolicExprId id = invalidId;
         bool inChain = false; ///< rebuilt only, on behalf of a chain above
     };
+
     IdMap<Result> results;
     const std::size_t before = depth();
     rules_->listen(listener_, ++passes_);
@@ -87,13 +95,15 @@ SymbolicExprId SymbolicExprSimplifyVisitor::pass(SymbolicExprId id) {
     return gaveUp ? (pop(), id) : pop();
 }
 
-template <class Node> void SymbolicExprSimplifyVisitor::visitSum(const Node& node) {
+template <class Node>
+void SymbolicExprSimplifyVisitor::visitSum(const Node& node) {
     SymbolicExprXFormVisitor::visit(node);
     if (!gaveUp)
         push(inChain_ ? foldSum(*rules_, pop()) : simplifySum(*rules_, pop()));
 }
 
-template <class Node> void SymbolicExprSimplifyVisitor::visitComparison(const Node& node) {
+template <class Node>
+void SymbolicExprSimplifyVisitor::visitComparison(const Node& node) {
     if (gaveUp)
         return SymbolicExprXFormVisitor::visit(node);
     const SymbolicExprId b = pop();
@@ -101,23 +111,56 @@ template <class Node> void SymbolicExprSimplifyVisitor::visitComparison(const No
     push(simplifyComparison(*rules_, node.op(), a, b));
 }
 
-template <class Node> void SymbolicExprSimplifyVisitor::visitChain(const Node& node) {
+template <class Node>
+void SymbolicExprSimplifyVisitor::visitChain(const Node& node) {
     SymbolicExprXFormVisitor::visit(node);
     if (!inChain_ && !gaveUp)
         push(simplifyChain(*rules_, pop()));
 }
 
-void SymbolicExprSimplifyVisitor::visit(const SymbolicPlusExpr& node) { visitSum(node); }
-void SymbolicExprSimplifyVisitor::visit(const SymbolicMinusExpr& node) { visitSum(node); }
-void SymbolicExprSimplifyVisitor::visit(const SymbolicUnaryMinusExpr& node) { visitSum(node); }
-void SymbolicExprSimplifyVisitor::visit(const SymbolicEqualExpr& node) { visitComparison(node); }
-void SymbolicExprSimplifyVisitor::visit(const SymbolicNotEqualExpr& node) { visitComparison(node); }
-void SymbolicExprSimplifyVisitor::visit(const SymbolicLessThanExpr& node) { visitComparison(node); }
-void SymbolicExprSimplifyVisitor::visit(const SymbolicLessThanEqualExpr& node) { visitComparison(node); }
-void SymbolicExprSimplifyVisitor::visit(const SymbolicGreaterThanExpr& node) { visitComparison(node); }
-void SymbolicExprSimplifyVisitor::visit(const SymbolicGreaterThanEqualExpr& node) { visitComparison(node); }
-void SymbolicExprSimplifyVisitor::visit(const SymbolicAndExpr& node) { visitChain(node); }
-void SymbolicExprSimplifyVisitor::visit(const SymbolicOrExpr& node) { visitChain(node); }
+void SymbolicExprSimplifyVisitor::visit(const SymbolicPlusExpr& node) {
+    visitSum(node);
+}
+
+void SymbolicExprSimplifyVisitor::visit(const SymbolicMinusExpr& node) {
+    visitSum(node);
+}
+
+void SymbolicExprSimplifyVisitor::visit(const SymbolicUnaryMinusExpr& node) {
+    visitSum(node);
+}
+
+void SymbolicExprSimplifyVisitor::visit(const SymbolicEqualExpr& node) {
+    visitComparison(node);
+}
+
+void SymbolicExprSimplifyVisitor::visit(const SymbolicNotEqualExpr& node) {
+    visitComparison(node);
+}
+
+void SymbolicExprSimplifyVisitor::visit(const SymbolicLessThanExpr& node) {
+    visitComparison(node);
+}
+
+void SymbolicExprSimplifyVisitor::visit(const SymbolicLessThanEqualExpr& node) {
+    visitComparison(node);
+}
+
+void SymbolicExprSimplifyVisitor::visit(const SymbolicGreaterThanExpr& node) {
+    visitComparison(node);
+}
+
+void SymbolicExprSimplifyVisitor::visit(const SymbolicGreaterThanEqualExpr& node) {
+    visitComparison(node);
+}
+
+void SymbolicExprSimplifyVisitor::visit(const SymbolicAndExpr& node) {
+    visitChain(node);
+}
+
+void SymbolicExprSimplifyVisitor::visit(const SymbolicOrExpr& node) {
+    visitChain(node);
+}
 
 void SymbolicExprSimplifyVisitor::visit(const SymbolicMultiplyExpr& node) {
     if (gaveUp)

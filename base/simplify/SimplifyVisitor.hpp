@@ -9,13 +9,15 @@
 
 namespace VT {
 
-/// Rebuilds an expression bottom-up and applies the simplification rules at each arithmetic node, comparison, Not, And and Or.
+/// Rebuilds an expression bottom-up and applies the simplification rules at each arithmetic node, comparison, Not, And
+/// and Or.
 ///
-/// A chain of one operator is simplified at its topmost node, once, so that a long chain does not cost its square.  When a chain
-/// or a distribution is beyond the operand limit, gaveUp is set; the result of that pass is not to be used.
+/// A chain of one operator is simplified at its topmost node, once, so that a long chain does not cost its square. When
+/// a chain or a distribution is beyond the operand limit, gaveUp is set; the result of that pass is not to be used.
 class VTSYM_API SymbolicExprSimplifyVisitor : public SymbolicExprXFormVisitor {
 public:
-    /// `keywordsFlag` is and-ed with the feature flag.  `printer` prints Quill text of the table and outlives the visitor.
+    /// `keywordsFlag` is and-ed with the feature flag.  `printer` prints Quill text of the table and outlives the
+    /// visitor.
     SymbolicExprSimplifyVisitor(SymbolicExprTable& table, bool keywordsFlag, const SymbolicExprPrinter& printer);
     ~SymbolicExprSimplifyVisitor() override;
 
@@ -42,16 +44,21 @@ public:
     SymbolicExprId pass(SymbolicExprId id);
 
     [[nodiscard]] bool hasGivenUp() const noexcept { return gaveUp; }
+
     void setOperandLimit(std::uint64_t limit) noexcept { operandLimit = limit; }
+
     /// Receives the rules that fire in further passes; nullptr for none.
     void setListener(RuleListener* listener) noexcept { listener_ = listener; }
 
 private:
     class Rules;
 
-    template <class Node> void visitSum(const Node& node);
-    template <class Node> void visitComparison(const Node& node);
-    template <class Node> void visitChain(const Node& node);
+    template <class Node>
+    void visitSum(const Node& node);
+    template <class Node>
+    void visitComparison(const Node& node);
+    template <class Node>
+    void visitChain(const Node& node);
 
     std::unique_ptr<Rules> rules_;
     RuleListener* listener_ = nullptr;

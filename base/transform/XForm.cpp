@@ -13,7 +13,9 @@ namespace VT {
 SymbolicExprFactory::~SymbolicExprFactory() = default;
 
 SymbolicExprXFormVisitor::SymbolicExprXFormVisitor(SymbolicExprTable& target)
-    : keywordsOn(VT::isVariantKeywordsSimCodegenFeatureOn()), operandLimit(limits::chainOperands), factory_(target),
+    : keywordsOn(VT::isVariantKeywordsSimCodegenFeatureOn()),
+      operandLimit(limits::chainOperands),
+      factory_(target),
       table_(target) {}
 
 SymbolicExprXFormVisitor::~SymbolicExprXFormVisitor() = default;
@@ -82,7 +84,8 @@ SymbolicExprId SymbolicExprXFormVisitor::rebuild(const SymbolicExprTable& source
 }
 
 /// The node rebuilt from the operands on the stack; its own identifier, without a probe, where nothing changed.
-template <class Node> SymbolicExprId SymbolicExprXFormVisitor::identity(const Node& node) {
+template <class Node>
+SymbolicExprId SymbolicExprXFormVisitor::identity(const Node& node) {
     const bool inPlace = current_ != invalidId;
     if constexpr (std::is_base_of_v<SymbolicUnaryExpr, Node>) {
         const SymbolicExprId a = pop();
@@ -115,7 +118,8 @@ template <class Node> SymbolicExprId SymbolicExprXFormVisitor::identity(const No
 }
 
 /// The node that its construction hook makes of the operands on the stack.
-template <class Node> SymbolicExprId SymbolicExprXFormVisitor2::viaHook(const Node& node) {
+template <class Node>
+SymbolicExprId SymbolicExprXFormVisitor2::viaHook(const Node& node) {
     constexpr OpTag<Node::code> tag;
     if constexpr (std::is_base_of_v<SymbolicUnaryExpr, Node>) {
         const SymbolicExprId a = pop();
@@ -142,9 +146,13 @@ template <class Node> SymbolicExprId SymbolicExprXFormVisitor2::viaHook(const No
     }
 }
 
-#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                           \
-    void SymbolicExprXFormVisitor::visit(const Class& node) { push(identity(node)); }                                    \
-    void SymbolicExprXFormVisitor2::visit(const Class& node) { push(viaHook(node)); }
+#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                         \
+    void SymbolicExprXFormVisitor::visit(const Class& node) {                                                          \
+        push(identity(node));                                                                                          \
+    }                                                                                                                  \
+    void SymbolicExprXFormVisitor2::visit(const Class& node) {                                                         \
+        push(viaHook(node));                                                                                           \
+    }
 #include "base/core/operators.def"
 #undef VTSYM_OPERATOR
 

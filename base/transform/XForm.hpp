@@ -12,12 +12,14 @@ namespace VT {
 class VTSYM_API SymbolicExprFactory {
 public:
     explicit SymbolicExprFactory(SymbolicExprTable& table) : table_(table) {}
+
     SymbolicExprFactory(const SymbolicExprFactory&) = delete;
     SymbolicExprFactory& operator=(const SymbolicExprFactory&) = delete;
     virtual ~SymbolicExprFactory();
 
     /// The identifier of the node of class Node with these parts, interned if it was not there.
-    template <class Node, class... Parts> SymbolicExprId make(Parts&&... parts) {
+    template <class Node, class... Parts>
+    SymbolicExprId make(Parts&&... parts) {
         const Node node(table_, std::forward<Parts>(parts)...);
         SymbolicExprId id = node.getId(table_);
         if constexpr (Node::equalWithinTolerance)
@@ -30,8 +32,8 @@ private:
     SymbolicExprTable& table_;
 };
 
-/// Rebuilds every node as it is.  A subclass overrides the visits of the classes that it changes and keeps the discipline of
-/// the stack: a visit pops its node's operands, the last one first, and pushes exactly one identifier.
+/// Rebuilds every node as it is.  A subclass overrides the visits of the classes that it changes and keeps the
+/// discipline of the stack: a visit pops its node's operands, the last one first, and pushes exactly one identifier.
 class VTSYM_API SymbolicExprXFormVisitor : public SymbolicExprVisitor {
 public:
     /// A visitor that builds in `target`.
@@ -44,13 +46,13 @@ public:
 #include "base/core/operators.def"
 #undef VTSYM_OPERATOR
 
-    /// The result of a completed run, taken from the stack; the invalid identifier, and the stack as it was, unless exactly one
-    /// result is there.
+    /// The result of a completed run, taken from the stack; the invalid identifier, and the stack as it was, unless
+    /// exactly one result is there.
     SymbolicExprId get();
 
-    /// Rebuilds the expression `id` of `source`: visits each distinct node once and hands its result to further occurrences, so
-    /// the work is in the number of nodes, not of paths.  An identifier that is not of the source gives the invalid one.  When
-    /// a visit throws, the visitor is as before the call and what was interned stays.
+    /// Rebuilds the expression `id` of `source`: visits each distinct node once and hands its result to further
+    /// occurrences, so the work is in the number of nodes, not of paths.  An identifier that is not of the source gives
+    /// the invalid one.  When a visit throws, the visitor is as before the call and what was interned stays.
     SymbolicExprId rebuild(const SymbolicExprTable& source, SymbolicExprId id);
 
     /// Whether the variant keywords are in force: the feature flag "VariantKeywordsSimCodegen" is greater than 0 now.
@@ -60,26 +62,44 @@ public:
     [[nodiscard]] SymbolicExprId getCodegenVariantKeywordId() const;
 
 protected:
-    void push(SymbolicExprId id) { stack_.push_back(id); }
+    void push(SymbolicExprId id) {
+        stack_.push_back(id);
+    }
+
     SymbolicExprId pop();
-    [[nodiscard]] SymbolicExprTable& table() const noexcept { return table_; }
-    /// Visits one node that stands in the source under an identifier, for drivers of a subclass's own.  `id` is the invalid one
-    /// unless source and target are one table.
+
+    [[nodiscard]] SymbolicExprTable& table() const noexcept {
+        return table_;
+    }
+
+    /// Visits one node that stands in the source under an identifier, for drivers of a subclass's own.  `id` is the
+    /// invalid one unless source and target are one table.
     void visitAs(SymbolicExprId id, const SymbolicExpr& node);
-    [[nodiscard]] SymbolicExprId top() const noexcept { return stack_.back(); }
-    [[nodiscard]] std::size_t depth() const noexcept { return stack_.size(); }
+
+    [[nodiscard]] SymbolicExprId top() const noexcept {
+        return stack_.back();
+    }
+
+    [[nodiscard]] std::size_t depth() const noexcept {
+        return stack_.size();
+    }
+
     /// Takes what a run that threw left on the stack away.
     void unwind(std::size_t depth) noexcept;
-    /// The identifier in the target of the node that is being visited, where that is known to be the source too.
-    [[nodiscard]] SymbolicExprId current() const noexcept { return current_; }
 
-    bool keywordsOn;                                     ///< the keyword feature when the visitor was made
-    std::uint64_t operandLimit;                          ///< operands that a subclass flattens from one chain
-    bool gaveUp = false;                                 ///< set where a chain was longer
+    /// The identifier in the target of the node that is being visited, where that is known to be the source too.
+    [[nodiscard]] SymbolicExprId current() const noexcept {
+        return current_;
+    }
+
+    bool keywordsOn;            ///< the keyword feature when the visitor was made
+    std::uint64_t operandLimit; ///< operands that a subclass flattens from one chain
+    bool gaveUp = false;        ///< set where a chain was longer
     SymbolicExprFactory factory_;
 
 private:
-    template <class Node> SymbolicExprId identity(const Node& node);
+    template <class Node>
+    SymbolicExprId identity(const Node& node);
 
     std::vector<SymbolicExprId> stack_;
     SymbolicExprTable& table_;
@@ -87,11 +107,12 @@ private:
 };
 
 /// Tells the construction hooks of SymbolicExprXFormVisitor2 apart.
-template <SymbolicOp Op> struct OpTag {};
+template <SymbolicOp Op>
+struct OpTag {};
 
-/// Rebuilds every node through a construction hook of its class, so that a subclass changes what is built without repeating how
-/// operands are handled.  A hook takes the payload or the rebuilt operands in input order and returns what was built; the base
-/// hooks build the same class.  The classes with a vector of operands have no hook.
+/// Rebuilds every node through a construction hook of its class, so that a subclass changes what is built without
+/// repeating how operands are handled.  A hook takes the payload or the rebuilt operands in input order and returns
+/// what was built; the base hooks build the same class.  The classes with a vector of operands have no hook.
 class VTSYM_API SymbolicExprXFormVisitor2 : public SymbolicExprXFormVisitor {
 public:
     using SymbolicExprXFormVisitor::SymbolicExprXFormVisitor;
@@ -103,15 +124,34 @@ public:
 protected:
 // The parts of each shape: declared, and handed on.  A shape with a vector of operands has no hook.
 #define VTSYM_HOOK(Class, ...) virtual SymbolicExprId buildExpr(OpTag<Class::code>, __VA_ARGS__)
-#define VTSYM_HOOK_String(Class) VTSYM_HOOK(Class, const std::string& name) { return factory_.make<Class>(name); }
-#define VTSYM_HOOK_Int(Class) VTSYM_HOOK(Class, int value) { return factory_.make<Class>(value); }
-#define VTSYM_HOOK_Double(Class) VTSYM_HOOK(Class, double value) { return factory_.make<Class>(value); }
-#define VTSYM_HOOK_Unary(Class) VTSYM_HOOK(Class, SymbolicExprId a) { return factory_.make<Class>(a); }
-#define VTSYM_HOOK_Binary(Class) VTSYM_HOOK(Class, SymbolicExprId a, SymbolicExprId b) { return factory_.make<Class>(a, b); }
-#define VTSYM_HOOK_Ternary(Class)                                                                                        \
-    VTSYM_HOOK(Class, SymbolicExprId a, SymbolicExprId b, SymbolicExprId c) { return factory_.make<Class>(a, b, c); }
-#define VTSYM_HOOK_Member(Class)                                                                                         \
-    VTSYM_HOOK(Class, SymbolicExprId owner, const std::string& name) { return factory_.make<Class>(owner, name); }
+#define VTSYM_HOOK_String(Class)                                                                                       \
+    VTSYM_HOOK(Class, const std::string& name) {                                                                       \
+        return factory_.make<Class>(name);                                                                             \
+    }
+#define VTSYM_HOOK_Int(Class)                                                                                          \
+    VTSYM_HOOK(Class, int value) {                                                                                     \
+        return factory_.make<Class>(value);                                                                            \
+    }
+#define VTSYM_HOOK_Double(Class)                                                                                       \
+    VTSYM_HOOK(Class, double value) {                                                                                  \
+        return factory_.make<Class>(value);                                                                            \
+    }
+#define VTSYM_HOOK_Unary(Class)                                                                                        \
+    VTSYM_HOOK(Class, SymbolicExprId a) {                                                                              \
+        return factory_.make<Class>(a);                                                                                \
+    }
+#define VTSYM_HOOK_Binary(Class)                                                                                       \
+    VTSYM_HOOK(Class, SymbolicExprId a, SymbolicExprId b) {                                                            \
+        return factory_.make<Class>(a, b);                                                                             \
+    }
+#define VTSYM_HOOK_Ternary(Class)                                                                                      \
+    VTSYM_HOOK(Class, SymbolicExprId a, SymbolicExprId b, SymbolicExprId c) {                                          \
+        return factory_.make<Class>(a, b, c);                                                                          \
+    }
+#define VTSYM_HOOK_Member(Class)                                                                                       \
+    VTSYM_HOOK(Class, SymbolicExprId owner, const std::string& name) {                                                 \
+        return factory_.make<Class>(owner, name);                                                                      \
+    }
 #define VTSYM_HOOK_Dims2(Class) VTSYM_HOOK_Binary(Class)
 #define VTSYM_HOOK_Dims3(Class) VTSYM_HOOK_Ternary(Class)
 #define VTSYM_HOOK_Call0(Class) VTSYM_HOOK_Unary(Class)
@@ -143,7 +183,8 @@ protected:
 #undef VTSYM_HOOK_Cell
 
 private:
-    template <class Node> SymbolicExprId viaHook(const Node& node);
+    template <class Node>
+    SymbolicExprId viaHook(const Node& node);
 };
 
 } // namespace VT

@@ -1,11 +1,11 @@
 #include "host/Feature.hpp"
 
+#include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <rapidcheck.h>
 #include <rapidcheck/gtest.h>
 
 #include <cstdlib>
-#include <filesystem>
 #include <memory>
 
 namespace {
@@ -86,32 +86,13 @@ RC_GTEST_PROP(Feature, AnyTextIsAnswered, (const std::string& text)) {
         RC_ASSERT(text.find('=') != std::string::npos);
 }
 
-// The environment is read by the first flag of a process, so that each case needs a process of its own: this program
-// again, with the one test below.
-struct Outcome {
-    std::string output;
-    int status;
-};
-
-Outcome runWith(const std::string& variable) {
-    const std::string self = std::filesystem::read_symlink("/proc/self/exe").string();
-    setenv("VTSYM_FEATURES", variable.c_str(), 1);
-    const std::string command =
-        "'" + self + "' --gtest_filter=FeatureEnvironment.DISABLED_Report --gtest_also_run_disabled_tests 2>&1";
-    Outcome run;
-    FILE* const pipe = popen(command.c_str(), "r");
-    for (int c = fgetc(pipe); c != EOF; c = fgetc(pipe))
-        run.output += static_cast<char>(c);
-    run.status = pclose(pipe);
-    unsetenv("VTSYM_FEATURES");
-    return run;
-}
-
-TEST(FeatureEnvironment, DISABLED_Report) {
+[[noreturn]] void tellFlags() {
     for (const VtFeature* flag : VtFeature::all())
-        std::printf("[%s=%d]\n", flag->name().c_str(), flag->value());
+        std::fprintf(stderr, "[%s=%d]", flag->name().c_str(), flag->value());
+    std::exit(0);
 }
 
+// The first flag of a process reads the environment, so that each case runs in a process of its own.
 TEST(FeatureEnvironment, StartsFlagsAndReportsWhatItCannotUse) {
     const struct {
         std::string variable;
@@ -131,13 +112,15 @@ TEST(FeatureEnvironment, StartsFlagsAndReportsWhatItCannotUse) {
         {"\x1b[31m\xff" + std::string(100000, 'x'), {"\\x1b[31m\\xffxxx", "[VariantKeywordsSimCodegen=2]"}},
     };
 
+    GTEST_FLAG_SET(death_test_style, "threadsafe");
     for (const auto& [variable, said] : cases) {
-        const Outcome run = runWith(variable);
-        EXPECT_EQ(run.status, 0) << variable.substr(0, 80);
+        setenv("VTSYM_FEATURES", variable.c_str(), 1);
+        testing::Matcher<const std::string&> output = testing::SizeIs(testing::Lt(2000));
         for (const std::string& words : said)
-            EXPECT_NE(run.output.find(words), std::string::npos) << variable.substr(0, 80) << "\n" << run.output;
-        EXPECT_LT(run.output.size(), 2000U);
+            output = testing::AllOf(output, testing::HasSubstr(words));
+        EXPECT_EXIT(tellFlags(), testing::ExitedWithCode(0), output) << variable.substr(0, 80);
     }
+    unsetenv("VTSYM_FEATURES");
 }
 
 } // namespace

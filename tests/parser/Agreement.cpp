@@ -53,6 +53,7 @@ class Writer {
 public:
     Writer(SymbolicExprTable& table, const std::vector<std::uint8_t>& choices) : table_(table), choices_(choices) {}
 
+    // NOLINTBEGIN(misc-no-recursion): at most nine levels
     SymbolicExprId write(int depth = 0) {
         const unsigned kind = depth > 8 ? choose(4) : choose(12);
         switch (kind) {
@@ -190,6 +191,8 @@ private:
         put(close);
         return ids;
     }
+
+    // NOLINTEND(misc-no-recursion)
 
     /// A token, now and then with a blank before it.
     void put(const std::string& token) {

@@ -98,6 +98,7 @@ TEST(Grammar, SignsBelongToTheDigitsBehindThem) {
         {"-(5)", "UnaryMinus(5)"},
         {"-x", "UnaryMinus(x)"},
         {"--5", "UnaryMinus(-5)"},
+        {"--.5", "UnaryMinus(-0.5r)"},
         {"2--3", "Minus(2,-3)"},
         {"2---3", "Minus(2,UnaryMinus(-3))"},
         {"2-3", "Minus(2,3)"},

@@ -29,12 +29,16 @@ std::size_t stopOf(const std::string& text, bool cOperators = true) {
 }
 
 TEST(GrammarLimits, NestingAtTheBoundAndOneBeyond) {
-    const std::pair<std::string, std::string> nests[] = {{"(", ")"},      {"[", "]"},     {"f(", ")"},   {"f(a,", ")"},
-                                                         {"a || (", ")"}, {"[1,(", ")]"}, {"!(", ")"},   {"-f(", ")"},
-                                                         {"1*(b+", ")"},  {"f([", "])"},  {"( ( ", "))"}};
-    for (const auto& [open, close] : nests) {
-        const std::size_t brackets = static_cast<std::size_t>(
-            std::count_if(open.begin(), open.end(), [](char c) { return c == '(' || c == '['; }));
+    struct Nest {
+        std::string open;
+        std::string close;
+        std::size_t brackets = 1;
+    };
+
+    const std::vector<Nest> nests = {{"(", ")"},        {"[", "]"},       {"f(", ")"},      {"f(a,", ")"},
+                                     {"a || (", ")"},   {"!(", ")"},      {"-f(", ")"},     {"1*(b+", ")"},
+                                     {"[1,(", ")]", 2}, {"f([", "])", 2}, {"( ( ", "))", 2}};
+    for (const auto& [open, close, brackets] : nests) {
         const std::size_t deep = bound / brackets;
         const std::string good = times(deep, open) + "x" + times(deep, close);
         EXPECT_EQ(stopOf(good), good.size()) << open;

@@ -48,8 +48,8 @@ RC_GTEST_PROP(IntegerSets, JoinedSetsAreTheirUnionAndNoLonger, ()) {
     for (int i = *rc::gen::inRange(1, 5); i > 0; --i) {
         const std::int64_t from = *rc::gen::inRange<std::int64_t>(-4, 5);
         const std::int64_t to = from + *rc::gen::inRange<std::int64_t>(0, 3);
-        const IntegerSet shapes[] = {{from, to}, {IntegerSet::minusInfinity, to}, {from, IntegerSet::plusInfinity},
-                                     IntegerSet::allBut(from)};
+        const IntegerSet shapes[] = {
+            {from, to}, {IntegerSet::minusInfinity, to}, {from, IntegerSet::plusInfinity}, IntegerSet::allBut(from)};
         sets.push_back(shapes[*rc::gen::inRange(0, 4)]);
         before += sets.back().comparisons();
     }
@@ -102,11 +102,19 @@ std::vector<bool> truth(const Cover& cover) {
 RC_GTEST_PROP(Covers, GetSmallerAndStayTheSame, ()) {
     const Cover before = anyCover();
     const std::vector<bool> expected = truth(before);
-    const std::function<bool(Cover&)> steps[] = {
-        absorb, joinCubes,
-        [](Cover& cover) { CoverBudget budget{1000}; return dropComparisons(cover, budget); },
-        [](Cover& cover) { CoverBudget budget{1000}; return dropCubes(cover, budget); },
-        [](Cover& cover) { CoverBudget none{0}; return dropComparisons(cover, none) || dropCubes(cover, none); }};
+    const std::function<bool(Cover&)> steps[] = {absorb, joinCubes,
+                                                 [](Cover& cover) {
+                                                     CoverBudget budget{1000};
+                                                     return dropComparisons(cover, budget);
+                                                 },
+                                                 [](Cover& cover) {
+                                                     CoverBudget budget{1000};
+                                                     return dropCubes(cover, budget);
+                                                 },
+                                                 [](Cover& cover) {
+                                                     CoverBudget none{0};
+                                                     return dropComparisons(cover, none) || dropCubes(cover, none);
+                                                 }};
     for (const auto& step : steps) {
         Cover cover = before;
         const bool changed = step(cover);

@@ -46,7 +46,8 @@ RC_GTEST_PROP(Simplify, DoesNotDependOnWhatWasInternedBefore, ()) {
     RC_ASSERT(fresh.simplified(text) == used.simplified(text));
 }
 
-// What share of conditions over single symbols becomes the constant it is worth, and how long results are, stays as good as it is.
+// What share of conditions over single symbols becomes the constant it is worth, and how long results are, stays as
+// good as it is.
 TEST(Simplify, FindsConstantsAndShortSums) {
     std::size_t constant = 0;
     std::size_t found = 0;
@@ -76,8 +77,8 @@ TEST(Simplify, FindsConstantsAndShortSums) {
     RecordProperty("comparisons", std::to_string(after) + " of " + std::to_string(before));
 }
 
-/// The value of calls, members and bit operations in real conditions is not known here, so real conditions are judged by what
-/// their simplification must not do: fail, change again, or come out longer where it gave up.
+/// The value of calls, members and bit operations in real conditions is not known here, so real conditions are judged
+/// by what their simplification must not do: fail, change again, or come out longer where it gave up.
 TEST(Simplify, RealConditionsReachAFixedPoint) {
     std::size_t read = 0;
     for (const CorpusFile& file : corpusFiles) {

@@ -1,4 +1,5 @@
-// Every rule is tested by its own example: the rule fires, the example comes out, and brute force finds both sides equal.
+// Every rule is tested by its own example: the rule fires, the example comes out, and brute force finds both sides
+// equal.
 #include "tests/simplify/Workbench.hpp"
 
 #include <set>
@@ -47,8 +48,8 @@ std::string exampleName(const ::testing::TestParamInfo<const RuleInfo*>& paramet
     return name;
 }
 
-INSTANTIATE_TEST_SUITE_P(All, RuleExample, ::testing::ValuesIn(simplificationRules().begin(), simplificationRules().end()),
-                         exampleName);
+INSTANTIATE_TEST_SUITE_P(All, RuleExample,
+                         ::testing::ValuesIn(simplificationRules().begin(), simplificationRules().end()), exampleName);
 
 TEST(Rules, NamesAreUnique) {
     std::set<std::string_view> names;

@@ -15,12 +15,14 @@ namespace VT::Testing {
 class FiredRules final : public RuleListener {
 public:
     void fired(const RuleFiring& firing) override { firings.push_back(firing); }
+
     [[nodiscard]] bool has(std::string_view name) const {
         for (const RuleFiring& firing : firings)
             if (firing.rule->name == name)
                 return true;
         return false;
     }
+
     std::vector<RuleFiring> firings;
 };
 
@@ -28,7 +30,9 @@ struct Workbench {
     Workbench() { table.addBoolSymbols(); }
 
     SymbolicExprId parse(const std::string& text) { return SymbolicExprParser(table, false, true)(text); }
+
     SymbolicExprId simplify(SymbolicExprId id) { return simplifier.simplify(id, passes); }
+
     /// The simplified text in C.
     std::string simplified(const std::string& text) { return SymbolicExprPrinter(table, false)(simplify(parse(text))); }
 

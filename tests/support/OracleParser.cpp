@@ -53,6 +53,7 @@ public:
 
 private:
     // Every reading function leaves the position as it was where it answers false.
+    // NOLINTBEGIN(misc-no-recursion): brackets are at most maxDepth deep
 
     bool expression(int weakest, SymbolicExprId& left) {
         if (!prefixed(left))
@@ -222,6 +223,8 @@ private:
         at_ = read ? at_ + 1 : start;
         return read;
     }
+
+    // NOLINTEND(misc-no-recursion)
 
     bool keyword(std::string_view text, SymbolicExprId& id) {
         if (!options_.variantKeywords || !std::string_view(at_, rest()).starts_with(text))

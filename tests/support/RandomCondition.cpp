@@ -15,14 +15,18 @@ public:
         const std::string text = write(left) + (below(2) != 0 ? " && " : " || ") + write(comparisons - left);
         // Without the parentheses of a group, precedence groups anew, which is as random.
         switch (below(4)) {
-        case 0: return "!(" + text + ")";
-        case 1: return text;
-        default: return "(" + text + ")";
+        case 0:
+            return "!(" + text + ")";
+        case 1:
+            return text;
+        default:
+            return "(" + text + ")";
         }
     }
 
 private:
     std::size_t below(std::size_t bound) { return std::uniform_int_distribution<std::size_t>(0, bound - 1)(random_); }
+
     const std::string& symbol() { return shape_.symbols[below(shape_.symbols.size())]; }
 
     std::string leaf() {

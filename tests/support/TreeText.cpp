@@ -2,6 +2,7 @@
 
 #include "base/core/Nodes.hpp"
 
+#include <array>
 #include <cstdio>
 
 namespace VT::Testing {
@@ -9,14 +10,14 @@ namespace VT::Testing {
 namespace {
 
 std::string realText(double value) {
-    char digits[40];
-    std::snprintf(digits, sizeof digits, "%.17gr", value);
-    return digits;
+    std::array<char, 40> digits{};
+    std::snprintf(digits.data(), digits.size(), "%.17gr", value);
+    return digits.data();
 }
 
 } // namespace
 
-std::string treeText(const SymbolicExprTable& table, SymbolicExprId id) {
+std::string treeText(const SymbolicExprTable& table, SymbolicExprId id) { // NOLINT(misc-no-recursion): small trees only
     const SymbolicExpr* node = table.get(id);
     if (node == nullptr)
         return "invalid";

@@ -38,24 +38,40 @@ std::int64_t valueOf(const SymbolicExprTable& table, SymbolicExprId root, const 
         const auto in = [&](std::size_t i) { return values.at(node.getInput(i)); };
         values[id] = [&]() -> std::int64_t {
             switch (node.op()) {
-            case SymbolicOp::String: return lookUp(static_cast<const SymbolicString&>(node).getName(), assignment);
-            case SymbolicOp::IntValue: return static_cast<const SymbolicIntValue&>(node).getValue();
-            case SymbolicOp::Plus: return in(0) + in(1);
-            case SymbolicOp::Minus: return in(0) - in(1);
-            case SymbolicOp::UnaryMinus: return -in(0);
-            case SymbolicOp::Multiply: return in(0) * in(1);
-            case SymbolicOp::Equal: return in(0) == in(1);
-            case SymbolicOp::NotEqual: return in(0) != in(1);
-            case SymbolicOp::LessThan: return in(0) < in(1);
-            case SymbolicOp::LessThanEqual: return in(0) <= in(1);
-            case SymbolicOp::GreaterThan: return in(0) > in(1);
-            case SymbolicOp::GreaterThanEqual: return in(0) >= in(1);
+            case SymbolicOp::String:
+                return lookUp(static_cast<const SymbolicString&>(node).getName(), assignment);
+            case SymbolicOp::IntValue:
+                return static_cast<const SymbolicIntValue&>(node).getValue();
+            case SymbolicOp::Plus:
+                return in(0) + in(1);
+            case SymbolicOp::Minus:
+                return in(0) - in(1);
+            case SymbolicOp::UnaryMinus:
+                return -in(0);
+            case SymbolicOp::Multiply:
+                return in(0) * in(1);
+            case SymbolicOp::Equal:
+                return in(0) == in(1);
+            case SymbolicOp::NotEqual:
+                return in(0) != in(1);
+            case SymbolicOp::LessThan:
+                return in(0) < in(1);
+            case SymbolicOp::LessThanEqual:
+                return in(0) <= in(1);
+            case SymbolicOp::GreaterThan:
+                return in(0) > in(1);
+            case SymbolicOp::GreaterThanEqual:
+                return in(0) >= in(1);
             case SymbolicOp::And:
-            case SymbolicOp::SingleAnd: return in(0) != 0 && in(1) != 0;
+            case SymbolicOp::SingleAnd:
+                return in(0) != 0 && in(1) != 0;
             case SymbolicOp::Or:
-            case SymbolicOp::SingleOr: return in(0) != 0 || in(1) != 0;
-            case SymbolicOp::Not: return in(0) == 0;
-            default: throw std::logic_error("no brute-force value of " + std::string(operatorInfo(node.op()).className));
+            case SymbolicOp::SingleOr:
+                return in(0) != 0 || in(1) != 0;
+            case SymbolicOp::Not:
+                return in(0) == 0;
+            default:
+                throw std::logic_error("no brute-force value of " + std::string(operatorInfo(node.op()).className));
             }
         }();
     }

@@ -13,8 +13,8 @@ namespace VT::Testing {
 
 using Assignment = std::map<std::string, std::int64_t>;
 
-/// The value of an expression of integers, truth values and + - * over them, computed from the meaning of each operator without
-/// any rule of the library.  Calls and members are worth what the assignment says of their name.
+/// The value of an expression of integers, truth values and + - * over them, computed from the meaning of each operator
+/// without any rule of the library.  Calls and members are worth what the assignment says of their name.
 std::int64_t valueOf(const SymbolicExprTable& table, SymbolicExprId id, const Assignment& assignment);
 
 inline bool holds(const SymbolicExprTable& table, SymbolicExprId id, const Assignment& assignment) {

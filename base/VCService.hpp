@@ -1,0 +1,121 @@
+// Front door of the variant conditions: one service object through which a host reads, combines, simplifies, compares
+// and prints them.
+#pragma once
+
+#include "base/service/VCServiceHandle.hpp"
+#include "base/service/VCSymbolicExprId.hpp"
+
+#include <memory>
+#include <string>
+
+namespace VT {
+
+class SymbolicExprSimplify;
+class SymbolicExprTable;
+class VCCustomizer;
+struct ServiceParts;
+
+/// The conditions of a process.  Conditions are over integers: every symbol stands for an integer, a truth value is an
+/// integer that is not zero.  One structure has one identifier, so that equal conditions have equal identifiers.
+///
+/// TRUE is printed as the empty text: what holds always needs no condition.  The empty text and "true" are TRUE,
+/// "false" is FALSE, exactly so and without a parser; every other text is read by the grammar of its language, whose
+/// diagnostics pass to the caller.
+///
+/// An identifier that is not of the service's table is answered, never followed: combining and simplifying it give the
+/// invalid identifier, it is equal to itself alone, and printing it throws std::out_of_range.
+///
+/// The service belongs to one thread at a time.  An operation that throws leaves it as it was, but for nodes that were
+/// interned on the way.  A customizer that is being asked must neither clean() the service nor install another
+/// customizer.
+class VTSYM_API VCService {
+public:
+    /// The service of the process, made by the first call.
+    static VCService& getInstance();
+    /// Takes one user away; without a user left, the service is destroyed with all that it knows.  Does nothing where
+    /// there is no service.  The next getInstance() makes a new one.
+    static void clean();
+    /// Installs a customizer, which the service owns from now on, and releases the previous one; nullptr for none.  The
+    /// one that is installed already stays.  What was simplified under the previous one stays in the caches.
+    void setVCCustomizer(VCCustomizer* customizer);
+
+    VCService(const VCService&) = delete;
+    VCService& operator=(const VCService&) = delete;
+
+    // Reading.
+
+    /// The condition of a C text.  Throws the host diagnostic "Vantor:Variants:ExpressionParseError" for any text that
+    /// is none.
+    SymbolicExprId parseC(const std::string& text);
+    /// Whether a text is exactly "true" or "false".
+    static bool isTRUEOrFALSEString(const std::string& text);
+
+    // Combining.  With `simplify` the combination is simplified in Quill mode, unless a constant decides it outright.
+
+    VCSymbolicExprId AND(const VCSymbolicExprId& a, const VCSymbolicExprId& b, bool simplify);
+    VCSymbolicExprId OR(const VCSymbolicExprId& a, const VCSymbolicExprId& b, bool simplify);
+    VCSymbolicExprId NOT(const VCSymbolicExprId& a, bool simplify);
+
+    // Simplifying.
+
+    /// The simplified condition.  In Quill mode an installed customizer confirms rewrites.  A customizer may also put
+    /// another condition in the place of this one, which counts only where it turns out TRUE or FALSE.
+    ///
+    /// While the feature "CacheSymExprSimplifyResults" was above 0 when the service was made, results are kept by
+    /// language.
+    VCSymbolicExprId simplify(const VCSymbolicExprId& condition, bool isQuill);
+    /// The simplified condition of a C text.
+    VCSymbolicExprId simplifyFromCCondition(const std::string& text);
+    /// The same, printed.  Quill text is that of the condition in Quill shape: the C text `a/b==1` gives
+    /// `idivide(a,b)==1`.
+    std::string simplifyCExprFromCCondition(const std::string& text);
+    std::string simplifyQExprFromCCondition(const std::string& text);
+    /// Simplifies without caches and customizer.  The input is C: throws std::invalid_argument for `inputIsQuill`.
+    std::string simplifyExpressionWithoutEvalChecks(const std::string& text, bool inputIsQuill, bool outputIsQuill);
+
+    // Printing.
+
+    /// Quill text of the condition as it stands.
+    std::string printQExpr(const VCSymbolicExprId& condition);
+    /// Quill text of the condition in Quill shape: C operators without a Quill spelling, and every division, as calls.
+    std::string printQExprWithConversion(const VCSymbolicExprId& condition);
+    /// C text of the condition in C shape: Quill calls that stand for C operators as operators.
+    std::string printCExpr(const VCSymbolicExprId& condition);
+    /// C text of the condition as it stands.
+    std::string printCExprNoConversion(const VCSymbolicExprId& condition);
+    /// A text in the other language, or in the same one as the printer writes it; not simplified.  The input is C:
+    /// throws std::invalid_argument for `inputIsQuill`.
+    std::string convertExprBetweenQandC(const std::string& text, bool inputIsQuill, bool outputIsQuill);
+
+    // Asking.
+
+    /// Whether a condition is TRUE.
+    [[nodiscard]] bool getBoolean(SymbolicExprId condition) const;
+    /// Whether two conditions are the same: the same structure or, under a customizer, the same simplified structure of
+    /// what it rewrites them to.
+    bool isEqual(const SymbolicExprId& a, const SymbolicExprId& b);
+    /// The alias of a parameter, or the empty text.
+    [[nodiscard]] std::string getParameterAlias(const std::string& parameter) const;
+    /// Records an alias of a parameter; the first alias stays.
+    void addParameterAlias(const std::string& parameter, const std::string& alias);
+
+    // What further operations on conditions are made of.
+
+    [[nodiscard]] SymbolicExprTable& table() noexcept;
+    [[nodiscard]] SymbolicExprSimplify& simplifier() noexcept;
+
+private:
+    friend class VCServiceHandle;
+
+    VCService();
+    ~VCService();
+
+    [[nodiscard]] bool has(const VCSymbolicExprId& condition) const noexcept;
+    VCSymbolicExprId combined(SymbolicExprId condition, bool simplify);
+    SymbolicExprId rewritten(SymbolicExprId condition);
+    SymbolicExprId simplifyNow(SymbolicExprId condition, bool isQuill);
+
+    std::unique_ptr<ServiceParts> parts_;
+};
+
+} // namespace VT

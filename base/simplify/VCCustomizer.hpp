@@ -1,0 +1,31 @@
+// What a host may decide about the conditions of its variants.
+#pragma once
+
+#include "base/core/Table.hpp"
+
+#include <string>
+
+namespace VT {
+
+/// A host's say in simplification.  Exceptions of the operations pass to whoever asked for the simplification, and
+/// nothing of its result is kept.
+class VTSYM_API VCCustomizer {
+public:
+    virtual ~VCCustomizer();
+
+    /// The service has no more use for the customizer.  Called once for each time that it was installed; a customizer
+    /// made for the service alone deletes itself here.
+    virtual void release() noexcept = 0;
+    /// The condition to decide in the place of `condition`: an expression of the same table, or `condition` itself
+    /// where there is nothing to rewrite.  An identifier that is not of the table counts as nothing to rewrite.
+    virtual SymbolicExprId rewrite(SymbolicExprId condition, SymbolicExprTable& table) = 0;
+    /// Whether a simplification may put one expression in the place of another; both as Quill text.
+    virtual bool canReplaceCondition(const std::string& condition, const std::string& replacement) = 0;
+
+protected:
+    VCCustomizer() = default;
+    VCCustomizer(const VCCustomizer&) = default;
+    VCCustomizer& operator=(const VCCustomizer&) = default;
+};
+
+} // namespace VT

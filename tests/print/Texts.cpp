@@ -1,0 +1,199 @@
+// What expressions look like in both languages.
+#include "base/print/Predicates.hpp"
+#include "base/print/StringifySymbolicExpr.hpp"
+#include "tests/print/Reading.hpp"
+#include "tests/support/Parsing.hpp"
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <limits>
+#include <locale>
+
+namespace VT::Testing {
+namespace {
+
+using Op = SymbolicOp;
+
+struct Writing {
+    SymbolicExprId id;
+    std::string quill;
+    std::string c;
+};
+
+class Texts : public testing::Test {
+protected:
+    void expectWritten(const std::vector<Writing>& writings, bool spaced = false) const {
+        const SymbolicExprPrinter quill(table, true, spaced);
+        const SymbolicExprPrinter c(table, false, spaced);
+        for (const Writing& writing : writings) {
+            EXPECT_EQ(quill(writing.id), writing.quill);
+            EXPECT_EQ(c(writing.id), writing.c);
+            StringifySymbolicExpr visitor(table, true, spaced);
+            table.get(writing.id)->accept(table, visitor);
+            EXPECT_EQ(visitor.get(), writing.quill) << "by accept";
+            StringifySymbolicExpr executed(table, false, spaced);
+            executed.execute(table, writing.id);
+            EXPECT_EQ(executed.get(), writing.c) << "by execute";
+            EXPECT_EQ(c(*table.get(writing.id)), writing.c) << "by node";
+            EXPECT_EQ(c.textLength(writing.id), writing.c.size());
+        }
+    }
+
+    SymbolicExprTable table;
+    Trees tree{table};
+    SymbolicExprId a = tree.name("a"), b = tree.name("b"), c = tree.name("c"), x = tree.name("x");
+};
+
+TEST_F(Texts, OperatorsOfBothLanguages) {
+    expectWritten({
+        {tree(Op::NotEqual, a, tree(Op::Not, b)), "a~=~b", "a!=!b"},
+        {tree(Op::Minus, tree(Op::Minus, a, b), c), "a-b-c", "a-b-c"},
+        {tree(Op::Minus, a, tree(Op::Minus, b, c)), "a-(b-c)", "a-(b-c)"},
+        {tree(Op::Power, a, tree(Op::Power, b, c)), "a^(b^c)", "a^(b^c)"},
+        {tree(Op::Power, tree(Op::Power, a, b), c), "a^b^c", "a^b^c"},
+        {tree(Op::Transpose, tree(Op::Transpose, x)), "(x')'", "(x')'"},
+        {tree(Op::DotTranspose, tree(Op::LDiv, a, tree(Op::DotLDiv, b, c))), "(a\\(b.\\c)).'", "(a\\(b.\\c)).'"},
+        {tree(Op::MemberValue, tree(Op::MemberValue, a)), "a.field.field", "a.field.field"},
+        {tree(Op::FcnCall1U, tree(Op::MemberValue, a), x), "(a.field)(x)", "(a.field)(x)"},
+        {tree(Op::FcnCall0U, a), "a()", "a()"},
+        {tree(Op::FcnCall, a, x, tree(Op::Plus, b, c), x), "a(x,b+c,x)", "a(x,b+c,x)"},
+        {tree(Op::QColon, tree(Op::Equal, a, b), c), "a==b:c", "a==b:c"},
+        {tree(Op::QColon3, a, tree.integer(2), c), "a:2:c", "a:2:c"},
+        {tree(Op::Matrix, tree(Op::Row, a, b), tree(Op::Row, c, x)), "[a,b;c,x]", "[a,b;c,x]"},
+        {tree(Op::Dims3D, a, b, c), "[a,b,c]", "[a,b,c]"},
+        {tree(Op::CellArray, a, b, tree(Op::Plus, c, x)), "{a;b;c+x}", "{a;b;c+x}"},
+        {tree(Op::DimsND), "[]", "[]"},
+        {tree(Op::AnonymousFunc, tree(Op::FcnCall1U, tree.name("@"), x), tree(Op::Plus, x, a)), "@(x) x+a", "@(x) x+a"},
+    });
+    const SymbolicExprId mixed = tree(Op::Or, tree(Op::And, tree(Op::Equal, a, b), tree(Op::BitAnd, a, b)), tree(Op::SingleAnd, a, tree(Op::SingleOr, b, c)));
+    expectWritten({{mixed, "a==b&&bitand(a,b)||a&(b|c)", "a==b&&a&b||a&(b|c)"}});
+    expectWritten({{mixed, "a==b && bitand(a,b) || a & (b | c)", "a==b && a&b || a & (b | c)"}}, true);
+}
+
+TEST_F(Texts, SignsThatWouldReadDifferently) {
+    const SymbolicExprId zero = tree.integer(0);
+    const SymbolicExprId minusX = tree(Op::UnaryMinus, x);
+    expectWritten({
+        {tree(Op::UnaryMinus, zero), "0", "0"},
+        {tree(Op::UnaryMinus, tree(Op::UnaryMinus, zero)), "0", "0"},
+        {tree(Op::UnaryMinus, tree.real(0.0)), "-0", "-0.0"},
+        {tree(Op::UnaryMinus, minusX), "-(-x)", "-(-x)"},
+        {tree(Op::UnaryMinus, tree.integer(-5)), "-(-5)", "-(-5)"},
+        {tree(Op::Minus, a, tree.integer(-5)), "a-(-5)", "a-(-5)"},
+        {tree(Op::Minus, a, tree(Op::Multiply, minusX, b)), "a-(-x*b)", "a-(-x*b)"},
+        {tree(Op::Plus, a, tree.integer(-5)), "a+-5", "a+-5"},
+        {tree(Op::Power, tree.integer(-5), b), "(-5)^b", "(-5)^b"},
+        {tree(Op::Power, a, tree.integer(-5)), "a^-5", "a^-5"},
+        {tree(Op::Transpose, tree.real(-2.5)), "(-2.5)'", "(-2.5)'"},
+        {tree(Op::Multiply, tree.integer(-5), minusX), "-5*-x", "-5*-x"},
+    });
+}
+
+TEST_F(Texts, CallsForOperatorsThatQuillLacks) {
+    const int smallest = std::numeric_limits<int>::min();
+    const SymbolicExprId quotient = tree(Op::Divide, a, b);
+    const auto minus = [&](SymbolicExprId id) { return tree(Op::UnaryMinus, id); };
+    expectWritten({
+        {quotient, "a/b", "a/b"},
+        {tree(Op::Modulo, quotient, c), "rem(idivide(a,b),c)", "a/b%c"},
+        {tree(Op::Plus, quotient, tree(Op::BitXOr, tree(Op::Plus, tree(Op::Divide, quotient, c), x), tree(Op::BitCompl, a))),
+         "a/b+bitxor(idivide(idivide(a,b),c)+x,bitcmp(a))", "a/b+(a/b/c+x^~a)"},
+        {tree(Op::BitOr, tree(Op::FcnCall, x, quotient, a, b), tree(Op::DimsND, quotient)), "bitor(x(idivide(a,b),a,b),[idivide(a,b)])", "x(a/b,a,b)|[a/b]"},
+        {tree(Op::Multiply, a, tree(Op::BitCompl, tree(Op::UnaryMinus, quotient))), "a*bitcmp(-idivide(a,b))", "a*~(-(a/b))"},
+        {tree(Op::ShiftLeft, a, tree.integer(-2)), "bitshift(a,-2)", "a<<-2"},
+        {tree(Op::ShiftLeft, a, minus(tree.integer(2))), "bitshift(a,-2)", "a<<-2"},
+        {tree(Op::ShiftRight, a, tree.integer(2)), "bitshift(a,-2)", "a>>2"},
+        {tree(Op::ShiftRight, a, tree.integer(-2)), "bitshift(a,2)", "a>>-2"},
+        {tree(Op::ShiftRight, a, x), "bitshift(a,-x)", "a>>x"},
+        {tree(Op::ShiftRight, a, minus(x)), "bitshift(a,x)", "a>>-x"},
+        {tree(Op::ShiftRight, a, minus(quotient)), "bitshift(a,idivide(a,b))", "a>>-(a/b)"},
+        {tree(Op::ShiftRight, a, quotient), "bitshift(a,-idivide(a,b))", "a>>a/b"},
+        {tree(Op::ShiftRight, a, tree.integer(smallest)), "bitshift(a,-(-2147483648))", "a>>-2147483648"},
+        {tree(Op::ShiftLeft, a, minus(tree.integer(smallest))), "bitshift(a,-(-2147483648))", "a<<-(-2147483648)"},
+    });
+}
+
+TEST_F(Texts, RealLiterals) {
+    const double infinity = std::numeric_limits<double>::infinity();
+    expectWritten({
+        {tree.real(2.0), "2", "2.0"},
+        {tree.real(-0.0), "-0.0", "-0.0"},
+        {tree.real(0.1), "0.1", "0.1"},
+        {tree.real(1e22), "1e+22", "1.0e+22"},
+        {tree.real(-1.5e-7), "-1.5e-07", "-1.5e-07"},
+        {tree.real(infinity), "Inf", "Inf"},
+        {tree(Op::Minus, a, tree.real(-infinity)), "a-(-Inf)", "a-(-Inf)"},
+    });
+    EXPECT_EQ(SymbolicExprPrinter(table, true)(SymbolicDoubleValue(table, std::nan(""))), "NaN");
+}
+
+TEST_F(Texts, NumbersReadBackInEveryLocale) {
+    struct Comma : std::numpunct<char> {
+        char do_decimal_point() const override { return ','; }
+        char do_thousands_sep() const override { return '.'; }
+        std::string do_grouping() const override { return "\3"; }
+    };
+    const std::locale before = std::locale::global(std::locale(std::locale::classic(), new Comma));
+    std::mt19937_64 random(7);
+    for (int i = 0; i < 2000; ++i) {
+        const double value = std::bit_cast<double>(random());
+        const int integer = static_cast<int>(random());
+        if (!std::isfinite(value) || integer == std::numeric_limits<int>::min())
+            continue;
+        const SymbolicExprPrinter printer(table, false);
+        const ParseAnswer real = parse(table, printer(tree.real(value)));
+        EXPECT_EQ(std::bit_cast<std::uint64_t>(table.get(real.id)->getNumValue()), std::bit_cast<std::uint64_t>(value));
+        EXPECT_EQ(parse(table, printer(tree.integer(integer))).id, tree.integer(integer));
+    }
+    std::locale::global(before);
+}
+
+TEST_F(Texts, PredicatesNameIdentifiers) {
+    table.insertAliasInfo("a", "(p+q)");
+    table.insertAliasInfo("b", "");
+    table.insertAliasInfo("rem", "mod");
+    const SymbolicExprId id = tree(Op::Modulo, tree(Op::MemberValue, a), tree(Op::Multiply, b, c));
+    const SymbolicExprAliasPrinterPredicate aliases(table);
+    EXPECT_EQ(SymbolicExprPrinter(table, false, false, aliases)(id), "(p+q).field%(b*c)");
+    EXPECT_EQ(SymbolicExprPrinter(table, true, false, InlineVariantParameterAliasPrinterPredicate(table))(id),
+              "mod((p+q).field,b*c)");
+    EXPECT_EQ(SymbolicExprPrinter(table, false, false, SymbolicExprPrinter::Predicate())(id), "a.field%(b*c)");
+
+    const SymbolicExprPrinter printer(table, false, false, aliases);
+    EXPECT_EQ(printer(c), "c");
+    EXPECT_EQ(printer.printIdUsingCache(x), "x");
+    table.insertAliasInfo("c", "later");
+    table.insertAliasInfo("x", "later");
+    EXPECT_EQ(printer(c), "later") << "an alias made since";
+    EXPECT_EQ(printer.printIdUsingCache(x), "x") << "a finished text stays";
+}
+
+/// A printer for people who want to see every blank and another spelling of access.
+class Airy : public StringifySymbolicExpr {
+public:
+    using StringifySymbolicExpr::StringifySymbolicExpr;
+    using StringifySymbolicExpr::visit;
+    void visit(const SymbolicString& node) override { push(Op::String, "<" + identifier(node) + ">", 0); }
+    void visit(const SymbolicMemberValue& node) override {
+        push(Op::String, node.getMemberName(), 0);
+        appendBinary(Op::MemberValue, " of kind ", 1, OpAssociativity::Left);
+    }
+
+protected:
+    Delimiters isDelimitWithSpacesAndWrapParenthesis(const Op& op, unsigned char, OpAssociativity, const Printed& lhs,
+                                                     const Printed&) const override {
+        return {.wrapRight = false, .wrapLeft = lhs.op == Op::Plus, .spaced = op != Op::MemberValue};
+    }
+};
+
+TEST_F(Texts, DerivedPrintersDecideForThemselves) {
+    const SymbolicExprId id = tree(Op::Minus, tree(Op::Plus, a, tree(Op::MemberValue, b)), tree.integer(-1));
+    Airy once(table, true);
+    once.execute(table, tree(Op::BitAnd, id, c));
+    EXPECT_EQ(once.get(), "<bitand>((<a> + <b> of kind field) - -1,<c>)");
+    EXPECT_EQ(Airy(table, false).print(id), "(<a> + <b> of kind field) - -1");
+}
+
+} // namespace
+} // namespace VT::Testing
