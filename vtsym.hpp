@@ -1,6 +1,7 @@
 // Everything that the library offers.
 #pragma once
 
+#include "base/VCService.hpp"
 #include "base/VTSymbolicExpr.hpp"
 #include "base/variants/Features.hpp"
 #include "base/variants/Loggers.hpp"

@@ -1,3 +1,4 @@
+# shellcheck shell=sh disable=SC2154,SC3013 # `root` is set by the caller, and Debian's sh knows -nt
 # Sourced by ./run and ./test with `root` set to the repository: installs what is missing, configures and builds.  Everything it
 # says goes to standard error, because standard output belongs to the program.
 
@@ -32,24 +33,21 @@ install_packages() {
     installed=" $(dpkg-query -W -f '${db:Status-Status} ${Package}\n' | sed -n 's/^installed //p' | tr '\n' ' ')"
     packages=$(missing_packages)
     [ -n "$packages" ] || return 0
-    say "installing $packages"
-    as_root='env'
-    if [ "$(id -u)" -ne 0 ]; then
-        command -v sudo >/dev/null || {
-            say "neither root nor sudo: install these packages first: $packages"
-            return 1
-        }
+    packages=${packages% }
+    if [ "$(id -u)" -eq 0 ]; then
+        as_root='env'
+    elif command -v sudo >/dev/null; then
         as_root='sudo env'
-    fi
-    apt_log=$(mktemp)
-    # shellcheck disable=SC2086 # words on purpose
-    quietly "$apt_log" $as_root apt-get -o DPkg::Lock::Timeout=300 update &&
-        quietly "$apt_log" $as_root DEBIAN_FRONTEND=noninteractive apt-get -o DPkg::Lock::Timeout=300 install -y \
-            --no-install-recommends $packages || {
-        rm -f "$apt_log"
+    else
+        say "neither root nor sudo: install these packages first: $packages"
         return 1
-    }
-    rm -f "$apt_log"
+    fi
+    say "installing $packages"
+    apt_get="$as_root DEBIAN_FRONTEND=noninteractive apt-get -o DPkg::Lock::Timeout=300"
+    # shellcheck disable=SC2086 # words on purpose
+    quietly "$root/build/packages.log" $apt_get update || return 1
+    # shellcheck disable=SC2086
+    quietly "$root/build/packages.log" $apt_get install -y --no-install-recommends $packages
 }
 
 # build PRESET TARGET...: leaves the targets built in build/PRESET.
@@ -69,6 +67,6 @@ build() {
             return 1
         }
     fi
-    quietly "$directory/build.log" ninja -C "$directory" "$@" || return 1
+    quietly "$directory/build.log" ninja --quiet -C "$directory" "$@" || return 1
     exec 9>&-
 }

@@ -62,7 +62,7 @@ private:
     std::string category_;
     int identifier_;
     std::int32_t defaultValue_;
-    std::int32_t value_;
+    std::int32_t value_ = 0;
     ChangeCallback callback_;
 };
 

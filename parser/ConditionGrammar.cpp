@@ -145,8 +145,8 @@ struct apply_prefixes {
     void operator()(const Attribute& pair, Context& context, bool&) const {
         expression_ast value = fusion::at_c<1>(pair);
         const std::string_view prefixes = textOf(fusion::at_c<0>(pair));
-        for (auto prefix = prefixes.rbegin(); prefix != prefixes.rend(); ++prefix) {
-            const SymbolicOp op = operatorOf(*prefix);
+        for (std::size_t i = prefixes.size(); i-- > 0;) {
+            const SymbolicOp op = operatorOf(prefixes[i]);
             if (op != SymbolicOp::None)
                 value = readingOf(context).arena.unary(op, value);
         }
@@ -320,9 +320,10 @@ ConditionGrammar::ConditionGrammar(const GrammarOptions& options) {
 }
 
 const ConditionGrammar& grammarFor(const GrammarOptions& options) {
-    static const ConditionGrammar grammars[2][2] = {{ConditionGrammar({false, false}), ConditionGrammar({false, true})},
-                                                    {ConditionGrammar({true, false}), ConditionGrammar({true, true})}};
-    return grammars[options.cOperators ? 1 : 0][options.variantKeywords ? 1 : 0];
+    static const std::array<ConditionGrammar, 4> grammars{
+        ConditionGrammar({false, false}), ConditionGrammar({false, true}), //
+        ConditionGrammar({true, false}), ConditionGrammar({true, true})};
+    return grammars[(options.cOperators ? 2U : 0U) + (options.variantKeywords ? 1U : 0U)];
 }
 
 } // namespace

@@ -98,50 +98,29 @@ SymbolicExprId SymbolicMultiExpr::getInput(std::size_t aIdx) const {
 
 // Hashes.
 
-std::uint64_t SymbolicUnaryExpr::getHash() const {
-    return hashStep(hashSeed(op()), operand_);
-}
-
-std::uint64_t SymbolicBinaryExpr::getHash() const {
-    return hashStep(hashStep(hashSeed(op()), left_), right_);
-}
-
-std::uint64_t SymbolicTernaryExpr::getHash() const {
-    return hashStep(hashStep(hashStep(hashSeed(op()), inputs_[0]), inputs_[1]), inputs_[2]);
-}
-
-std::uint64_t SymbolicMultiExpr::hashAs(SymbolicOp op) const {
+std::uint64_t SymbolicMultiExpr::hashOf(SymbolicOp op) const noexcept {
     std::uint64_t hash = hashSeed(op);
     for (const SymbolicExprId input : inputs_)
         hash = hashStep(hash, input);
     return hash;
 }
 
-std::uint64_t SymbolicMultiExpr::getHash() const {
-    return hashAs(op());
-}
-
 // Equality.
 
 bool SymbolicUnaryExpr::operator==(const SymbolicExpr& other) const {
-    return op() == other.op() && other.isUnaryExpr() &&
-           operand_ == static_cast<const SymbolicUnaryExpr&>(other).operand_;
+    return op() == other.op() && other.isUnaryExpr() && hasParts(static_cast<const SymbolicUnaryExpr&>(other));
 }
 
 bool SymbolicBinaryExpr::operator==(const SymbolicExpr& other) const {
-    if (op() != other.op() || !other.isBinaryExpr())
-        return false;
-    const auto& twin = static_cast<const SymbolicBinaryExpr&>(other);
-    return left_ == twin.left_ && right_ == twin.right_;
+    return op() == other.op() && other.isBinaryExpr() && hasParts(static_cast<const SymbolicBinaryExpr&>(other));
 }
 
 bool SymbolicTernaryExpr::operator==(const SymbolicExpr& other) const {
-    return op() == other.op() && other.isTernaryExpr() &&
-           std::ranges::equal(inputs_, static_cast<const SymbolicTernaryExpr&>(other).inputs_);
+    return op() == other.op() && other.isTernaryExpr() && hasParts(static_cast<const SymbolicTernaryExpr&>(other));
 }
 
 bool SymbolicMultiExpr::operator==(const SymbolicExpr& other) const {
-    return op() == other.op() && other.isMultiExpr() && inputs_ == static_cast<const SymbolicMultiExpr&>(other).inputs_;
+    return op() == other.op() && other.isMultiExpr() && hasParts(static_cast<const SymbolicMultiExpr&>(other));
 }
 
 namespace detail {
@@ -169,10 +148,10 @@ bool equalCalls(const SymbolicExpr& node, const SymbolicExpr& other) {
 }
 
 bool StringShape::operator==(const SymbolicExpr& other) const {
-    return other.op() == SymbolicOp::String && name_ == static_cast<const StringShape&>(other).name_;
+    return other.op() == SymbolicOp::String && hasParts(static_cast<const StringShape&>(other));
 }
 
-std::uint64_t StringShape::getHash() const {
+std::uint64_t StringShape::hashOf(SymbolicOp) const noexcept {
     if (name_ == "true")
         return 0xfffffffffffffffeU;
     if (name_ == "false")
@@ -181,25 +160,23 @@ std::uint64_t StringShape::getHash() const {
 }
 
 bool IntShape::operator==(const SymbolicExpr& other) const {
-    return other.op() == SymbolicOp::IntValue && value_ == static_cast<const IntShape&>(other).value_;
-}
-
-std::uint64_t IntShape::getHash() const {
-    return static_cast<std::uint64_t>(static_cast<std::int64_t>(value_));
+    return other.op() == SymbolicOp::IntValue && hasParts(static_cast<const IntShape&>(other));
 }
 
 bool DoubleShape::operator==(const SymbolicExpr& other) const {
-    if (other.op() != SymbolicOp::DoubleValue)
-        return false;
+    return other.op() == SymbolicOp::DoubleValue && hasParts(static_cast<const DoubleShape&>(other));
+}
+
+bool DoubleShape::hasParts(const DoubleShape& other) const noexcept {
     const double a = value_;
-    const double b = static_cast<const DoubleShape&>(other).value_;
+    const double b = other.value_;
     if (!std::isfinite(a) || !std::isfinite(b))
         return a == b;
     // The difference of two large values of unlike sign overflows to infinity, which is beyond every tolerance.
     return std::fabs(a - b) <= std::numeric_limits<double>::epsilon() * std::max(std::fabs(a), std::fabs(b));
 }
 
-std::uint64_t DoubleShape::getHash() const {
+std::uint64_t DoubleShape::hashOf(SymbolicOp) const noexcept {
     if (value_ == 0.0)
         return 0;
     if (std::isnan(value_))
@@ -210,40 +187,36 @@ std::uint64_t DoubleShape::getHash() const {
 }
 
 bool MemberShape::operator==(const SymbolicExpr& other) const {
-    if (other.op() != SymbolicOp::MemberValue)
-        return false;
-    const auto& twin = static_cast<const MemberShape&>(other);
-    return operand() == twin.operand() && name_ == twin.name_;
+    return other.op() == SymbolicOp::MemberValue && hasParts(static_cast<const MemberShape&>(other));
 }
 
-std::uint64_t MemberShape::getHash() const {
-    constexpr auto code = static_cast<std::uint64_t>(SymbolicOp::MemberValue);
-    return hashStep(hashStep(hashBytes(0, name_), code), operand());
+std::uint64_t MemberShape::hashOf(SymbolicOp op) const noexcept {
+    return hashStep(hashStep(hashBytes(0, name_), static_cast<std::uint64_t>(op)), operand());
 }
 
 // The generic classes hash like their twins with a fixed number of operands.
 
-std::uint64_t DimsNShape::getHash() const {
+std::uint64_t DimsNShape::hashOf(SymbolicOp op) const noexcept {
     switch (getNumInputs()) {
     case 2:
-        return hashAs(SymbolicOp::Dims2D);
+        return SymbolicMultiExpr::hashOf(SymbolicOp::Dims2D);
     case 3:
-        return hashAs(SymbolicOp::Dims3D);
+        return SymbolicMultiExpr::hashOf(SymbolicOp::Dims3D);
     default:
-        return hashAs(SymbolicOp::DimsND);
+        return SymbolicMultiExpr::hashOf(op);
     }
 }
 
-std::uint64_t CallNShape::getHash() const {
+std::uint64_t CallNShape::hashOf(SymbolicOp op) const noexcept {
     switch (getNumInputs()) {
     case 1:
-        return hashAs(SymbolicOp::FcnCall0U);
+        return SymbolicMultiExpr::hashOf(SymbolicOp::FcnCall0U);
     case 2:
-        return hashAs(SymbolicOp::FcnCall1U);
+        return SymbolicMultiExpr::hashOf(SymbolicOp::FcnCall1U);
     case 3:
-        return hashAs(SymbolicOp::FcnCall2U);
+        return SymbolicMultiExpr::hashOf(SymbolicOp::FcnCall2U);
     default:
-        return hashAs(SymbolicOp::FcnCall);
+        return SymbolicMultiExpr::hashOf(op);
     }
 }
 

@@ -56,8 +56,17 @@ public:
     static constexpr SymbolicOp code = Op;
     /// Real literals within a tolerance are equal though their hashes differ.
     static constexpr bool equalWithinTolerance = Op == SymbolicOp::DoubleValue;
+    /// Nodes of other classes are equal to some of this one.
+    static constexpr bool hasTwins = dimensionOps.contains(Op) || callOps.contains(Op);
 
     [[nodiscard]] SymbolicOp op() const final { return Op; }
+
+    [[nodiscard]] std::uint64_t getHash() const final { return Payload::hashOf(Op); }
+
+    /// The same answer as the base's, without a probe right behind the construction.
+    [[nodiscard]] SymbolicExprId getId(const SymbolicExprTable& table) const {
+        return table.template idOf<Node>(static_cast<const Payload&>(*this));
+    }
 
 protected:
     using Shape = Payload;
@@ -65,7 +74,7 @@ protected:
     /// The tag keeps it apart from the constructors of the shapes below, which inherit it.
     template <class... Parts>
     InternedNode(std::in_place_t, SymbolicExprTable& table, Parts&&... parts) : Payload(std::forward<Parts>(parts)...) {
-        table.template intern<Node>(*this, static_cast<const Payload&>(*this));
+        table.template intern<Node>(static_cast<const Payload&>(*this));
     }
 
     explicit InternedNode(const Payload& payload) : Payload(payload) {}

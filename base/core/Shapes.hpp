@@ -1,4 +1,7 @@
 // The shapes of nodes: payload, operands, hash and equality.  The node classes themselves are in Nodes.hpp.
+//
+// Beside the virtual operations each shape tells whether another node of its class has the same parts, and the hash of its
+// parts as operands of an operator: interning knows the class and needs no virtual call.
 #pragma once
 
 #include "base/core/Hash.hpp"
@@ -13,7 +16,8 @@ namespace VT {
 class VTSYM_API SymbolicUnaryExpr : public SymbolicExpr {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
-    [[nodiscard]] std::uint64_t getHash() const override;
+
+    [[nodiscard]] std::uint64_t getHash() const override { return hashOf(op()); }
 
     [[nodiscard]] std::size_t getNumInputs() const override { return 1; }
 
@@ -22,6 +26,10 @@ public:
     [[nodiscard]] SymbolicExprId getInput(std::size_t aIdx) const override;
 
     [[nodiscard]] SymbolicExprId operand() const noexcept { return operand_; }
+
+    [[nodiscard]] bool hasParts(const SymbolicUnaryExpr& other) const noexcept { return operand_ == other.operand_; }
+
+    [[nodiscard]] std::uint64_t hashOf(SymbolicOp op) const noexcept { return hashStep(hashSeed(op), operand_); }
 
 protected:
     explicit SymbolicUnaryExpr(SymbolicExprId operand) : operand_(operand) {}
@@ -34,7 +42,8 @@ private:
 class VTSYM_API SymbolicBinaryExpr : public SymbolicExpr {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
-    [[nodiscard]] std::uint64_t getHash() const override;
+
+    [[nodiscard]] std::uint64_t getHash() const override { return hashOf(op()); }
 
     [[nodiscard]] std::size_t getNumInputs() const override { return 2; }
 
@@ -45,6 +54,14 @@ public:
     [[nodiscard]] SymbolicExprId left() const noexcept { return left_; }
 
     [[nodiscard]] SymbolicExprId right() const noexcept { return right_; }
+
+    [[nodiscard]] bool hasParts(const SymbolicBinaryExpr& other) const noexcept {
+        return left_ == other.left_ && right_ == other.right_;
+    }
+
+    [[nodiscard]] std::uint64_t hashOf(SymbolicOp op) const noexcept {
+        return hashStep(hashStep(hashSeed(op), left_), right_);
+    }
 
 protected:
     SymbolicBinaryExpr(SymbolicExprId left, SymbolicExprId right) : left_(left), right_(right) {}
@@ -58,7 +75,8 @@ private:
 class VTSYM_API SymbolicTernaryExpr : public SymbolicExpr {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
-    [[nodiscard]] std::uint64_t getHash() const override;
+
+    [[nodiscard]] std::uint64_t getHash() const override { return hashOf(op()); }
 
     [[nodiscard]] std::size_t getNumInputs() const override { return 3; }
 
@@ -72,6 +90,14 @@ public:
 
     [[nodiscard]] SymbolicExprId third() const noexcept { return inputs_[2]; }
 
+    [[nodiscard]] bool hasParts(const SymbolicTernaryExpr& other) const noexcept {
+        return first() == other.first() && second() == other.second() && third() == other.third();
+    }
+
+    [[nodiscard]] std::uint64_t hashOf(SymbolicOp op) const noexcept {
+        return hashStep(hashStep(hashStep(hashSeed(op), first()), second()), third());
+    }
+
 protected:
     SymbolicTernaryExpr(SymbolicExprId a, SymbolicExprId b, SymbolicExprId c) : inputs_{a, b, c} {}
 
@@ -83,7 +109,8 @@ private:
 class VTSYM_API SymbolicMultiExpr : public SymbolicExpr {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
-    [[nodiscard]] std::uint64_t getHash() const override;
+
+    [[nodiscard]] std::uint64_t getHash() const override { return hashOf(op()); }
 
     [[nodiscard]] std::size_t getNumInputs() const override { return inputs_.size(); }
 
@@ -93,11 +120,12 @@ public:
 
     [[nodiscard]] const std::vector<SymbolicExprId>& inputs() const noexcept { return inputs_; }
 
+    [[nodiscard]] bool hasParts(const SymbolicMultiExpr& other) const noexcept { return inputs_ == other.inputs_; }
+
+    [[nodiscard]] std::uint64_t hashOf(SymbolicOp op) const noexcept;
+
 protected:
     explicit SymbolicMultiExpr(std::vector<SymbolicExprId> inputs) : inputs_(std::move(inputs)) {}
-
-    /// The hash of the operands behind the seed of an operator.
-    [[nodiscard]] std::uint64_t hashAs(SymbolicOp op) const;
 
 private:
     std::vector<SymbolicExprId> inputs_;
@@ -114,12 +142,15 @@ VTSYM_API bool equalCalls(const SymbolicExpr& node, const SymbolicExpr& other);
 class VTSYM_API StringShape : public SymbolicExpr {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
-    [[nodiscard]] std::uint64_t getHash() const override;
 
     [[nodiscard]] bool isTermExpr() const override { return true; }
 
     /// The identifier or keyword, as received.
     [[nodiscard]] const std::string& getName() const noexcept { return name_; }
+
+    [[nodiscard]] bool hasParts(const StringShape& other) const noexcept { return name_ == other.name_; }
+
+    [[nodiscard]] std::uint64_t hashOf(SymbolicOp op) const noexcept;
 
 protected:
     explicit StringShape(std::string name) : name_(std::move(name)) {}
@@ -131,7 +162,6 @@ private:
 class VTSYM_API IntShape : public SymbolicExpr {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
-    [[nodiscard]] std::uint64_t getHash() const override;
 
     [[nodiscard]] bool isTermExpr() const override { return true; }
 
@@ -140,6 +170,12 @@ public:
     [[nodiscard]] double getNumValue() const override { return value_; }
 
     [[nodiscard]] int getValue() const noexcept { return value_; }
+
+    [[nodiscard]] bool hasParts(const IntShape& other) const noexcept { return value_ == other.value_; }
+
+    [[nodiscard]] std::uint64_t hashOf(SymbolicOp) const noexcept {
+        return static_cast<std::uint64_t>(static_cast<std::int64_t>(value_));
+    }
 
 protected:
     explicit IntShape(int value) : value_(value) {}
@@ -151,7 +187,6 @@ private:
 class VTSYM_API DoubleShape : public SymbolicExpr {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
-    [[nodiscard]] std::uint64_t getHash() const override;
 
     [[nodiscard]] bool isTermExpr() const override { return true; }
 
@@ -160,6 +195,11 @@ public:
     [[nodiscard]] double getNumValue() const override { return value_; }
 
     [[nodiscard]] double getValue() const noexcept { return value_; }
+
+    /// Within the tolerance.
+    [[nodiscard]] bool hasParts(const DoubleShape& other) const noexcept;
+
+    [[nodiscard]] std::uint64_t hashOf(SymbolicOp op) const noexcept;
 
 protected:
     explicit DoubleShape(double value) : value_(value) {}
@@ -171,10 +211,15 @@ private:
 class VTSYM_API MemberShape : public SymbolicUnaryExpr {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
-    [[nodiscard]] std::uint64_t getHash() const override;
 
     /// The field behind the dot.
     [[nodiscard]] const std::string& getMemberName() const noexcept { return name_; }
+
+    [[nodiscard]] bool hasParts(const MemberShape& other) const noexcept {
+        return operand() == other.operand() && name_ == other.name_;
+    }
+
+    [[nodiscard]] std::uint64_t hashOf(SymbolicOp op) const noexcept;
 
 protected:
     MemberShape(SymbolicExprId owner, std::string name) : SymbolicUnaryExpr(owner), name_(std::move(name)) {}
@@ -199,7 +244,7 @@ class VTSYM_API DimsNShape : public SymbolicMultiExpr {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override { return equalDimensions(*this, other); }
 
-    [[nodiscard]] std::uint64_t getHash() const override;
+    [[nodiscard]] std::uint64_t hashOf(SymbolicOp op) const noexcept;
 
     [[nodiscard]] std::size_t getNumDimensions() const override { return getNumInputs(); }
 
@@ -225,7 +270,7 @@ class VTSYM_API CallNShape : public SymbolicMultiExpr {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override { return equalCalls(*this, other); }
 
-    [[nodiscard]] std::uint64_t getHash() const override;
+    [[nodiscard]] std::uint64_t hashOf(SymbolicOp op) const noexcept;
     [[nodiscard]] std::size_t getNumArgs() const override;
 
 protected:

@@ -3,141 +3,97 @@
 #include "base/core/Nodes.hpp"
 #include "base/core/Walk.hpp"
 
+#include <algorithm>
 #include <bit>
 #include <limits>
+#include <memory>
 #include <utility>
 
 namespace VT {
 
 namespace {
 constexpr std::size_t firstSlots = 16;
+
+void makeRoom(std::vector<const SymbolicExpr*>& nodes) {
+    if (nodes.size() == nodes.capacity())
+        nodes.reserve(std::max(firstSlots, nodes.size() * 2));
 }
+} // namespace
 
-/// Frees a node that its table could not take over.
-class SymbolicExprTable::Adoption {
-public:
-    Adoption(const SymbolicExpr* node, bool pooled) : node_(node), pooled_(pooled) {}
-
-    Adoption(const Adoption&) = delete;
-    Adoption& operator=(const Adoption&) = delete;
-
-    ~Adoption() {
-        if (node_ == nullptr)
-            return;
-        if (pooled_)
-            node_->~SymbolicExpr();
-        else
-            delete node_;
-    }
-
-    void done() noexcept { node_ = nullptr; }
-
-private:
-    const SymbolicExpr* node_;
-    bool pooled_;
-};
-
-SymbolicExprTable::SymbolicExprTable() : SymbolicExprTable(NodeStorage::Pooled) {}
-
-SymbolicExprTable::SymbolicExprTable(NodeStorage storage) : storage_(storage) {}
+SymbolicExprTable::SymbolicExprTable()
+    : index_(firstSlots), indexShift_(32U - static_cast<unsigned>(std::countr_zero(firstSlots))) {}
 
 SymbolicExprTable::~SymbolicExprTable() {
-    // Both lists are in the order of addition, so one pass tells pooled nodes from heap nodes.
-    auto heap = heapNodes_.begin();
+    // Both lists are in the order of addition, so one pass tells foreign nodes from those in cells.
+    auto foreign = foreignNodes_.begin();
     for (const SymbolicExpr* node : nodes_) {
-        if (heap != heapNodes_.end() && *heap == node) {
+        if (foreign != foreignNodes_.end() && *foreign == node) {
             delete node;
-            ++heap;
+            ++foreign;
         } else {
             node->~SymbolicExpr();
         }
     }
 }
 
-std::size_t SymbolicExprTable::home(std::uint64_t hash) const noexcept {
-    // Hashes of literals are their bits, so they are spread before the topmost bits choose the slot.
-    return static_cast<std::size_t>((hash * 0x9e3779b97f4a7c15U) >> indexShift_);
+bool SymbolicExprTable::equalNodes(const SymbolicExpr& interned, const SymbolicExpr& node, std::uint64_t hash) {
+    return &interned == &node || (interned == node && interned.getHash() == hash);
 }
 
-std::size_t SymbolicExprTable::freePosition(std::uint64_t hash) const noexcept {
-    const std::size_t mask = index_.size() - 1;
-    std::size_t at = home(hash);
-    while (index_[at].id != invalidId)
-        at = (at + 1) & mask;
-    return at;
+std::size_t SymbolicExprTable::probe(const SymbolicExpr& node, std::uint64_t hash) const {
+    return probe(tagOf(hash), [&](const NodeCell& cell) { return equalNodes(*cell.node(), node, hash); });
 }
 
-SymbolicExprTable::Probe SymbolicExprTable::probe(const SymbolicExpr& node) const {
-    return probe(node, node.getHash());
-}
-
-SymbolicExprTable::Probe SymbolicExprTable::probe(const SymbolicExpr& node, std::uint64_t hash) const {
-    if (index_.empty())
-        return {hash, 0, invalidId};
-    const std::size_t mask = index_.size() - 1;
-    for (std::size_t at = home(hash);; at = (at + 1) & mask) {
-        const Slot& slot = index_[at];
-        if (slot.id == invalidId)
-            return {hash, at, invalidId};
-        if (slot.hash == hash) {
-            const SymbolicExpr* const candidate = nodes_[slot.id];
-            if (candidate == &node || *candidate == node)
-                return {hash, at, slot.id};
-        }
-    }
-}
-
-void SymbolicExprTable::growIndex() {
-    std::vector<Slot> old(index_.empty() ? firstSlots : index_.size() * 2, Slot{0, invalidId});
-    old.swap(index_);
-    indexShift_ = static_cast<unsigned>(64 - std::countr_zero(index_.size()));
-    for (const Slot& slot : old)
-        if (slot.id != invalidId)
-            index_[freePosition(slot.hash)] = slot;
-}
-
-/// Makes room for one more node, so that nothing can fail once the index knows it.
+/// Makes room for one more node, so that nothing but its own storage can fail once it is made.
 void SymbolicExprTable::reserveOne() {
-    if (nodes_.size() == nodes_.capacity())
-        nodes_.reserve(nodes_.empty() ? firstSlots : nodes_.size() * 2);
-    if ((nodes_.size() + 1) * 4 > index_.size() * 3) {
-        growIndex();
-        lastMiss_.node = nullptr;
+    makeRoom(nodes_);
+    if ((nodes_.size() + 1) * 4 <= index_.size() * 3)
+        return;
+    if (indexShift_ == 0)
+        throw std::length_error("expression table: no room for another node");
+    // The topmost bits of the tags choose the slots, so the old index is copied nearly in order.
+    std::vector<Slot> larger(index_.size() * 2);
+    const std::size_t mask = larger.size() - 1;
+    for (const Slot& slot : index_) {
+        if (slot.cell == 0)
+            continue;
+        std::size_t at = std::size_t{slot.tag} >> (indexShift_ - 1);
+        while (larger[at].cell != 0)
+            at = (at + 1) & mask;
+        larger[at] = slot;
     }
+    index_.swap(larger);
+    --indexShift_;
 }
 
 void SymbolicExprTable::add(const SymbolicExpr* node) {
-    const bool pooled = node == std::exchange(pooled_, nullptr);
-    Adoption adoption(node, pooled);
-    reserveOne();
-    if (!pooled)
-        heapNodes_.push_back(node);
-    // A copy on its way from its constructor was just looked for and is known to be new.
-    const bool known = lastMiss_.node == node;
-    const Probe place = known ? Probe{lastMiss_.hash, lastMiss_.position, invalidId} : probe(*node);
-    if (place.id == invalidId)
-        index_[place.position] = {place.hash, nodes_.size()};
-    nodes_.push_back(node);
-    lastMiss_.node = nullptr;
-    adoption.done();
+    std::unique_ptr<const SymbolicExpr> owned(node);
+    if (isFull())
+        reserveOne();
+    makeRoom(foreignNodes_);
+    const CellStore::Number number = cells_.allocate(sizeof(node));
+    NodeCell* const fresh = cell(number);
+    fresh->id = static_cast<std::uint32_t>(nodes_.size());
+    fresh->code = NodeCell::foreign;
+    new (fresh + 1) const SymbolicExpr*(node);
+    const std::uint64_t hash = node->getHash();
+    Slot& slot = index_[probe(*node, hash)];
+    if (slot.cell == 0)
+        slot = {tagOf(hash), number};
+    foreignNodes_.push_back(node);
+    nodes_.push_back(owned.release());
 }
 
 bool SymbolicExprTable::contains(const SymbolicExpr* node) const {
-    const Probe found = probe(*node);
-    if (found.id == invalidId) {
-        lastMiss_ = {found.hash, found.position, node};
-        return false;
-    }
-    lastAnswer_ = {nullptr, found.id};
-    return true;
+    return SymbolicExprTable::lookup(node) != invalidId;
 }
 
 SymbolicExprId SymbolicExprTable::lookup(const SymbolicExpr* node) const {
-    // Another node may stand where the remembered one stood, so it is compared, which is cheaper than hashing and
-    // probing.
-    if (node == lastAnswer_.node && *nodes_[lastAnswer_.id] == *node)
-        return lastAnswer_.id;
-    return probe(*node).id;
+    // Another node may stand where the remembered one stood, so it is compared.
+    if (node == lastAnswer_.candidate && *lastAnswer_.cell->node() == *node)
+        return lastAnswer_.cell->id;
+    const CellStore::Number found = index_[probe(*node, node->getHash())].cell;
+    return found == 0 ? invalidId : cell(found)->id;
 }
 
 const SymbolicExpr* SymbolicExprTable::get(SymbolicExprId id) const {
@@ -158,8 +114,10 @@ void SymbolicExprTable::lookup(const SymbolicOp& op, std::vector<SymbolicExprId>
 }
 
 void SymbolicExprTable::addBoolSymbols() {
-    falseId_ = SymbolicString(*this, "false").getId(*this);
-    trueId_ = SymbolicString(*this, "true").getId(*this);
+    const SymbolicExprId falseId = SymbolicString(*this, "false").getId(*this);
+    const SymbolicExprId trueId = SymbolicString(*this, "true").getId(*this);
+    falseId_ = falseId;
+    trueId_ = trueId;
 }
 
 void SymbolicExprTable::registerValueId(SymbolicExprId exprId, SymbolicExprId valueId) {

@@ -1,14 +1,14 @@
 // The interning store of expression nodes.
 #pragma once
 
-#include "base/core/Arena.hpp"
+#include "base/core/Cells.hpp"
 #include "base/core/Node.hpp"
 
 #include <boost/unordered_map.hpp>
 
 #include <new>
 #include <string>
-#include <type_traits>
+#include <typeinfo>
 #include <vector>
 
 namespace VT {
@@ -84,48 +84,52 @@ public:
     /// The alias of an identifier, or the empty text.
     [[nodiscard]] std::string getAliasForSymbolicIdentifier(const std::string& identifier) const;
 
-protected:
-    enum class NodeStorage : unsigned char { Pooled, Heap };
-    /// A derived table that keeps nodes itself asks for heap nodes, so that what reaches add() can be deleted.
-    explicit SymbolicExprTable(NodeStorage storage);
-
 private:
     template <class Node, SymbolicOp Op, class Payload>
     friend class detail::InternedNode;
 
+    /// The part of the hash is what chooses the slot, so that a larger index is filled without hashing anew.
     struct Slot {
-        std::uint64_t hash;
-        SymbolicExprId id; ///< invalidId marks a free slot
+        std::uint32_t tag = 0;
+        CellStore::Number cell = 0; ///< 0 marks a free slot
     };
 
-    /// An interned answer, so that the lookup right behind a construction need not probe again.
+    /// What a constructor found or added, so that the lookup right behind it need not hash and probe again.  Kept for
+    /// classes in which equal nodes have equal hashes.
     struct LastAnswer {
-        const SymbolicExpr* node = nullptr;
-        SymbolicExprId id = invalidId;
+        const SymbolicExpr* candidate = nullptr;
+        const NodeCell* cell = nullptr;
     };
-
-    /// What an unsuccessful probe learned, so that the add right behind it need not hash and probe again.
-    struct LastMiss {
-        std::uint64_t hash = 0;
-        std::size_t position = 0;
-        const SymbolicExpr* node = nullptr;
-    };
-
-    struct Probe {
-        std::uint64_t hash;
-        std::size_t position;
-        SymbolicExprId id;
-    };
-    class Adoption;
 
     template <class Node, class Payload>
-    void intern(const SymbolicExpr& candidate, const Payload& payload);
-    [[nodiscard]] Probe probe(const SymbolicExpr& node) const;
-    [[nodiscard]] Probe probe(const SymbolicExpr& node, std::uint64_t hash) const;
-    [[nodiscard]] std::size_t home(std::uint64_t hash) const noexcept;
-    [[nodiscard]] std::size_t freePosition(std::uint64_t hash) const noexcept;
+    void intern(const Payload& candidate);
+    template <class Node, class Payload>
+    const NodeCell* place(const Payload& candidate, std::uint32_t tag, std::size_t position);
+    template <class Node, class Payload>
+    [[nodiscard]] SymbolicExprId idOf(const Payload& node) const;
+
+    /// Whether the virtual operations are this class's own, so that they need not be called.
+    [[nodiscard]] bool isPlain() const { return typeid(*this) == typeid(SymbolicExprTable); }
+
+    [[nodiscard]] static std::uint32_t tagOf(std::uint64_t hash) noexcept {
+        // Hashes of literals are their bits, so they are spread before the topmost bits choose the slot.
+        return static_cast<std::uint32_t>((hash * 0x9e3779b97f4a7c15U) >> 32U);
+    }
+
+    template <class Equal>
+    [[nodiscard]] std::size_t probe(std::uint32_t tag, Equal equal) const;
+    [[nodiscard]] std::size_t probe(const SymbolicExpr& node, std::uint64_t hash) const;
+    [[nodiscard]] static bool equalNodes(const SymbolicExpr& interned, const SymbolicExpr& node, std::uint64_t hash);
+
+    [[nodiscard]] NodeCell* cell(CellStore::Number number) const noexcept {
+        return static_cast<NodeCell*>(cells_.at(number));
+    }
+
+    [[nodiscard]] bool isFull() const noexcept {
+        return nodes_.size() == nodes_.capacity() || (nodes_.size() + 1) * 4 > index_.size() * 3;
+    }
+
     void reserveOne();
-    void growIndex();
 
     std::vector<Slot> index_; ///< open addressing, linear probing, a power of two of slots
     std::vector<const SymbolicExpr*> nodes_;
@@ -135,42 +139,80 @@ private:
     SymbolicExprId trueId_ = invalidId;
     SymbolicExprId falseId_ = invalidId;
 
-    Arena arena_;
-    std::vector<const SymbolicExpr*> heapNodes_; ///< nodes that came from operator new
-    NodeStorage storage_ = NodeStorage::Pooled;
-    unsigned indexShift_ = 0;
-    const SymbolicExpr* pooled_ = nullptr; ///< the arena node that is on its way into add()
-    mutable LastAnswer lastAnswer_;
-    mutable LastMiss lastMiss_;
+    CellStore cells_;
+    std::vector<const SymbolicExpr*> foreignNodes_; ///< those that came through add(), in the order of addition
+    unsigned indexShift_;
+    LastAnswer lastAnswer_;
 };
 
-/// Interns `candidate`, a node of class Node under construction, by adding a copy made from its payload unless an equal
-/// node is there.
+/// The position of the slot of an equal node, or of the free slot where it would stand.
+template <class Equal>
+std::size_t SymbolicExprTable::probe(std::uint32_t tag, Equal equal) const {
+    const std::size_t mask = index_.size() - 1;
+    for (std::size_t at = std::size_t{tag} >> indexShift_;; at = (at + 1) & mask) {
+        const Slot& slot = index_[at];
+        if (slot.cell == 0 || (slot.tag == tag && equal(*cell(slot.cell))))
+            return at;
+    }
+}
+
+/// Interns `candidate`, a node of class Node under construction, by adding a copy unless an equal node is there.
 template <class Node, class Payload>
-void SymbolicExprTable::intern(const SymbolicExpr& candidate, const Payload& payload) {
-    if (contains(&candidate)) {
-        if (!Node::equalWithinTolerance && storage_ == NodeStorage::Pooled)
-            lastAnswer_.node = &candidate;
+void SymbolicExprTable::intern(const Payload& candidate) {
+    if (!isPlain()) {
+        if (!contains(&candidate))
+            add(new Node(candidate));
         return;
     }
-    if (storage_ == NodeStorage::Heap) {
-        add(new Node(payload));
-        return;
+    const std::uint64_t hash = candidate.hashOf(Node::code);
+    const std::uint32_t tag = tagOf(hash);
+    const std::size_t position = probe(tag, [&](const NodeCell& cell) {
+        // Nodes of one class are compared without a virtual call.
+        if constexpr (!Node::equalWithinTolerance) {
+            if (cell.isOf(Node::code))
+                return static_cast<const Payload*>(cell.node())->hasParts(candidate);
+            if (!Node::hasTwins && cell.code != NodeCell::foreign)
+                return false;
+        }
+        return equalNodes(*cell.node(), candidate, hash);
+    });
+    const CellStore::Number known = index_[position].cell;
+    const NodeCell* const answer = known != 0 ? cell(known) : place<Node>(candidate, tag, position);
+    lastAnswer_ = {Node::equalWithinTolerance ? nullptr : &candidate, answer};
+}
+
+/// Adds a copy of `candidate`, for whose tag `position` is the free slot.
+template <class Node, class Payload>
+const NodeCell* SymbolicExprTable::place(const Payload& candidate, std::uint32_t tag, std::size_t position) {
+    if (isFull()) {
+        reserveOne();
+        position = probe(tag, [](const NodeCell&) { return false; });
     }
-    void* place = arena_.allocate(sizeof(Node));
-    const SymbolicExpr* copy = nullptr;
+    const CellStore::Number number = cells_.allocate(sizeof(Node));
+    NodeCell* const fresh = cell(number);
+    const SymbolicExpr* node = nullptr;
     try {
-        copy = new (place) Node(payload);
+        node = new (fresh + 1) Node(candidate);
     } catch (...) {
-        arena_.release(place, sizeof(Node));
+        cells_.release(number);
         throw;
     }
-    pooled_ = copy;
-    lastMiss_.node = lastMiss_.node == &candidate ? copy : nullptr;
-    const std::size_t id = nodes_.size();
-    add(copy);
-    if (!Node::equalWithinTolerance && nodes_.size() > id)
-        lastAnswer_ = {&candidate, id};
+    fresh->id = static_cast<std::uint32_t>(nodes_.size());
+    fresh->code = static_cast<std::uint32_t>(Node::code);
+    index_[position] = {tag, number};
+    nodes_.push_back(node);
+    return fresh;
+}
+
+/// The identifier of a node of class Node that was made by one of its constructors.
+template <class Node, class Payload>
+SymbolicExprId SymbolicExprTable::idOf(const Payload& node) const {
+    // Another node may stand where the remembered one stood, so it is compared, which is cheaper than hashing.
+    if constexpr (!Node::equalWithinTolerance)
+        if (lastAnswer_.candidate == &node && lastAnswer_.cell->isOf(Node::code) &&
+            static_cast<const Payload*>(lastAnswer_.cell->node())->hasParts(node))
+            return lastAnswer_.cell->id;
+    return lookup(&node);
 }
 
 } // namespace VT

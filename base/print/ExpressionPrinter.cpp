@@ -14,11 +14,14 @@ constexpr std::size_t keptTexts = std::size_t{1} << 16U;
 } // namespace
 
 struct SymbolicExprPrinter::State {
-    State(const SymbolicExprTable& expressions, bool quillSyntax, bool spacedLogicalOperators, const PredicateHandle& predicate)
-        : table(expressions), plainNames(predicate.isPlain()),
+    State(const SymbolicExprTable& expressions, bool quillSyntax, bool spacedLogicalOperators,
+          const PredicateHandle& predicate)
+        : table(expressions),
+          plainNames(predicate.isPlain()),
           stringify(expressions, quillSyntax, spacedLogicalOperators, predicate) {}
 
-    template <class Expression> std::string print(const Expression& expression) {
+    template <class Expression>
+    std::string print(const Expression& expression) {
         if (!plainNames)
             stringify.forget(); // names may have changed since
         const std::size_t before = stringify.texts().size();
@@ -35,16 +38,20 @@ struct SymbolicExprPrinter::State {
 };
 
 SymbolicExprPrinter::SymbolicExprPrinter(const SymbolicExprTable& table, bool quillSyntax, bool spacedLogicalOperators,
-                                         PredicateHandle predicate)
+                                         const PredicateHandle& predicate)
     : state_(std::make_unique<State>(table, quillSyntax, spacedLogicalOperators, predicate)) {}
 
 SymbolicExprPrinter::SymbolicExprPrinter(SymbolicExprPrinter&&) noexcept = default;
 SymbolicExprPrinter& SymbolicExprPrinter::operator=(SymbolicExprPrinter&&) noexcept = default;
 SymbolicExprPrinter::~SymbolicExprPrinter() = default;
 
-std::string SymbolicExprPrinter::operator()(SymbolicExprId id) const { return state_->print(id); }
+std::string SymbolicExprPrinter::operator()(SymbolicExprId id) const {
+    return state_->print(id);
+}
 
-std::string SymbolicExprPrinter::operator()(const SymbolicExpr& node) const { return state_->print(node); }
+std::string SymbolicExprPrinter::operator()(const SymbolicExpr& node) const {
+    return state_->print(node);
+}
 
 std::string SymbolicExprPrinter::printIdUsingCache(SymbolicExprId id) const {
     const auto found = state_->finished.find(id);
@@ -66,6 +73,8 @@ int SymbolicExprPrinter::compareUsingCache(SymbolicExprId left, SymbolicExprId r
     return order != 0 ? order : compareStructure(state_->table, left, right);
 }
 
-void SymbolicExprPrinter::setTextBound(std::size_t bytes) { state_->stringify.setTextBound(bytes); }
+void SymbolicExprPrinter::setTextBound(std::size_t bytes) {
+    state_->stringify.setTextBound(bytes);
+}
 
 } // namespace VT

@@ -10,11 +10,13 @@
 
 namespace VT {
 
-/// Values by identifier, in pages that come into being where an identifier is first stored.  Identifiers are dense and those of
-/// one expression lie close together, so pages fill well and neighbours share cache lines.
-template <class Value> class IdPages {
+/// Values by identifier, in pages that come into being where an identifier is first stored.  Identifiers are dense and
+/// those of one expression lie close together, so pages fill well and neighbours share cache lines.
+template <class Value>
+class IdPages {
 public:
-    /// The place of a value, or nullptr where its page was never written; a page starts with zeros.  Valid until the next at().
+    /// The place of a value, or nullptr where its page was never written; a page starts with zeros.  Valid until the
+    /// next at().
     [[nodiscard]] const Value* find(SymbolicExprId id) const noexcept {
         const SymbolicExprId outer = id / (pageSize * chapterSize);
         if (outer >= root_.size() || root_[outer] == 0)
@@ -47,12 +49,13 @@ private:
     static constexpr std::size_t chapterSize = 64;
 
     /// The number of elements behind the addition: the number of a page or chapter, from 1 on.
-    template <class Element> static std::uint32_t addZeros(PlainVector<Element>& vector, std::size_t count) {
+    template <class Element>
+    static std::uint32_t addZeros(PlainVector<Element>& vector, std::size_t count) {
         std::memset(static_cast<void*>(vector.extend(count)), 0, count * sizeof(Element));
         return static_cast<std::uint32_t>(vector.size());
     }
 
-    PlainVector<std::uint32_t> root_; ///< numbers of chapters; 0 for none
+    PlainVector<std::uint32_t> root_;                              ///< numbers of chapters; 0 for none
     PlainVector<std::array<std::uint32_t, chapterSize>> chapters_; ///< numbers of pages; 0 for none
     PlainVector<std::array<Value, pageSize>> pages_;
 };

@@ -9,19 +9,23 @@
 
 namespace VT {
 
-/// Grows in place where the system can, so that a large store does not touch its pages once more at each doubling.  When memory
-/// runs out, the vector is as before and std::bad_alloc passes.
-template <class Value> class PlainVector {
+/// Grows in place where the system can, so that a large store does not touch its pages once more at each doubling. When
+/// memory runs out, the vector is as before and std::bad_alloc passes.
+template <class Value>
+class PlainVector {
     static_assert(std::is_trivially_copyable_v<Value>);
 
 public:
     PlainVector() = default;
     PlainVector(const PlainVector&) = delete;
     PlainVector& operator=(const PlainVector&) = delete;
+
     ~PlainVector() { clear(); }
 
     Value& operator[](std::size_t index) noexcept { return data_[index]; }
+
     const Value& operator[](std::size_t index) const noexcept { return data_[index]; }
+
     [[nodiscard]] std::size_t size() const noexcept { return size_; }
 
     /// Appends values that are to be written before they are read, and gives the first.  Moves the others.
@@ -32,10 +36,12 @@ public:
         size_ += count;
         return first;
     }
+
     void push_back(const Value& value) {
         const Value copy = value;
         *extend(1) = copy;
     }
+
     void pop_back() noexcept { --size_; }
 
     /// Forgets all values and gives their memory back.

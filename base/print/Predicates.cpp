@@ -13,7 +13,10 @@ std::string aliasOrName(const SymbolicExprTable& aliases, const SymbolicString& 
 
 } // namespace
 
-std::string SymbolicExprPrinter::Predicate::printIdentifier(const SymbolicString& node) const { return node.getName(); }
+std::string SymbolicExprPrinter::Predicate::printIdentifier(const SymbolicString& node) const {
+    return node.getName();
+}
+
 SymbolicExprPrinter::Predicate::~Predicate() = default;
 
 bool SymbolicExprPrinter::PredicateHandle::isPlain() const {

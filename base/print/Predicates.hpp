@@ -5,12 +5,13 @@
 
 namespace VT {
 
-/// Prints an identifier as its alias in a table, or as its name where it has none.  An alias is printed as it is stored, in any
-/// operand's place: an alias that is an expression carries its own parentheses.
+/// Prints an identifier as its alias in a table, or as its name where it has none.  An alias is printed as it is
+/// stored, in any operand's place: an alias that is an expression carries its own parentheses.
 class VTSYM_API SymbolicExprAliasPrinterPredicate : public SymbolicExprPrinter::Predicate {
 public:
     /// `aliases` outlives the predicate.
     explicit SymbolicExprAliasPrinterPredicate(const SymbolicExprTable& aliases) : aliases_(&aliases) {}
+
     [[nodiscard]] std::string printIdentifier(const SymbolicString& node) const override;
 
 private:
@@ -22,6 +23,7 @@ class VTSYM_API InlineVariantParameterAliasPrinterPredicate : public SymbolicExp
 public:
     /// `aliases` outlives the predicate.
     explicit InlineVariantParameterAliasPrinterPredicate(const SymbolicExprTable& aliases) : aliases_(&aliases) {}
+
     [[nodiscard]] std::string printIdentifier(const SymbolicString& node) const override;
 
 private:

@@ -28,13 +28,19 @@ bool isLiteral(const StringifySymbolicExpr::Printed& printed) {
     return printed.op == SymbolicOp::IntValue || printed.op == SymbolicOp::DoubleValue;
 }
 
-[[noreturn]] void throwNoSuchExpression() { throw std::out_of_range("VT::SymbolicExprTable: no such expression"); }
+[[noreturn]] void throwNoSuchExpression() {
+    throw std::out_of_range("VT::SymbolicExprTable: no such expression");
+}
 
 } // namespace
 
-StringifySymbolicExpr::StringifySymbolicExpr(const SymbolicExprTable& table, bool quillSyntax, bool spacedLogicalOperators,
+StringifySymbolicExpr::StringifySymbolicExpr(const SymbolicExprTable& table, bool quillSyntax,
+                                             bool spacedLogicalOperators,
                                              SymbolicExprPrinter::PredicateHandle predicate)
-    : table_(table), predicate_(std::move(predicate)), plainNames_(predicate_.isPlain()), quillSyntax_(quillSyntax),
+    : table_(table),
+      predicate_(std::move(predicate)),
+      plainNames_(predicate_.isPlain()),
+      quillSyntax_(quillSyntax),
       spacedLogicalOperators_(spacedLogicalOperators) {
     stack_.reserve(firstDepth);
     frames_.reserve(firstDepth);
@@ -46,8 +52,10 @@ StringifySymbolicExpr::~StringifySymbolicExpr() = default;
 class StringifySymbolicExpr::StackDepth {
 public:
     explicit StackDepth(std::vector<Printed>& stack) : stack_(stack), depth_(stack.size()) {}
+
     StackDepth(const StackDepth&) = delete;
     StackDepth& operator=(const StackDepth&) = delete;
+
     ~StackDepth() { stack_.resize(std::min(stack_.size(), depth_)); }
 
 private:
@@ -82,13 +90,15 @@ StringifySymbolicExpr::Printed StringifySymbolicExpr::printed(SymbolicExprId id)
             node.invoke(*this);
             const Printed& whole = stack_.back();
             known_.at(visited) = {whole.text, whole.inCall, static_cast<std::uint8_t>(static_cast<int>(whole.op) + 1),
-                                   whole.precedence};
+                                  whole.precedence};
         },
         [](SymbolicExprId, const SymbolicExpr*) { throwNoSuchExpression(); });
     return stack_.back();
 }
 
-std::string StringifySymbolicExpr::print(SymbolicExprId id) { return texts_.str(printed(id).text, textBound_); }
+std::string StringifySymbolicExpr::print(SymbolicExprId id) {
+    return texts_.str(printed(id).text, textBound_);
+}
 
 std::string StringifySymbolicExpr::print(const SymbolicExpr& node) {
     const StackDepth depth(stack_);
@@ -123,7 +133,8 @@ void StringifySymbolicExpr::setInsideCall(Printed& printed, const Printed& form)
 }
 
 /// Replaces the topmost operands by what `build` makes of them, and of their other forms where one of them has another.
-template <class Build> void StringifySymbolicExpr::replaceOperands(std::size_t count, Build build) {
+template <class Build>
+void StringifySymbolicExpr::replaceOperands(std::size_t count, Build build) {
     const std::span<const Printed> shown = operands(count);
     Printed whole = build(shown);
     if (std::ranges::any_of(shown, [](const Printed& operand) { return operand.inCall != 0; })) {
@@ -144,7 +155,9 @@ Text StringifySymbolicExpr::integer(int value) {
     return texts_.bytes({digits.data(), end});
 }
 
-void StringifySymbolicExpr::appendInteger(int value) { push({SymbolicOp::IntValue, integer(value), leafPrecedence}); }
+void StringifySymbolicExpr::appendInteger(int value) {
+    push({SymbolicOp::IntValue, integer(value), leafPrecedence});
+}
 
 void StringifySymbolicExpr::appendDouble(double value) {
     std::string text = vtsv_dtoa(value, true);
@@ -157,13 +170,19 @@ void StringifySymbolicExpr::appendDouble(double value) {
 
 // Operators.
 
+/// Whether what follows a negative literal would bind tighter than its sign.
+bool StringifySymbolicExpr::losesSign(const Printed& operand, unsigned char precedence) const {
+    return precedence < signPrecedence && isLiteral(operand) && texts_.beginsWith(operand.text, '-');
+}
+
 StringifySymbolicExpr::Delimiters
 StringifySymbolicExpr::isDelimitWithSpacesAndWrapParenthesis(const SymbolicOp& op, unsigned char precedence,
                                                              OpAssociativity assoc, const Printed& lhs,
                                                              const Printed& rhs) const {
-    return {.wrapRight = rhs.precedence > precedence || (rhs.precedence == precedence && assoc == OpAssociativity::Left),
-            .wrapLeft = lhs.precedence > precedence || (lhs.precedence == precedence && assoc == OpAssociativity::Right),
-            .spaced = spacedLogicalOperators_ && logicalOps.contains(op)};
+    return {
+        .wrapRight = rhs.precedence > precedence || (rhs.precedence == precedence && assoc == OpAssociativity::Left),
+        .wrapLeft = lhs.precedence > precedence || (lhs.precedence == precedence && assoc == OpAssociativity::Right),
+        .spaced = spacedLogicalOperators_ && logicalOps.contains(op)};
 }
 
 StringifySymbolicExpr::Printed StringifySymbolicExpr::createBinaryExpr(const SymbolicOp& op, const char* spelling,
@@ -171,10 +190,9 @@ StringifySymbolicExpr::Printed StringifySymbolicExpr::createBinaryExpr(const Sym
                                                                        const Printed& lhs, const Printed& rhs) {
     const Delimiters delimiters = isDelimitWithSpacesAndWrapParenthesis(op, precedence, assoc, lhs, rhs);
     const std::string_view bare = spelling;
-    // A sign would join the operator in front of it, and take the literal's place as the operand of what binds tighter.
+    // Two signs would join.
     const bool signBehindSign = !delimiters.spaced && bare.ends_with('-') && texts_.beginsWith(rhs.text, '-');
-    const bool signedOperand = precedence < signPrecedence && isLiteral(lhs) && texts_.beginsWith(lhs.text, '-');
-    const Text left = delimiters.wrapLeft || signedOperand ? wrapped(lhs.text) : lhs.text;
+    const Text left = delimiters.wrapLeft || losesSign(lhs, precedence) ? wrapped(lhs.text) : lhs.text;
     const Text right = delimiters.wrapRight || signBehindSign ? wrapped(rhs.text) : rhs.text;
     if (!delimiters.spaced)
         return {op, texts_.infix(left, bare, right), precedence};
@@ -201,9 +219,10 @@ void StringifySymbolicExpr::appendBinary(const SymbolicOp& op, const char* spell
 }
 
 StringifySymbolicExpr::Printed StringifySymbolicExpr::unary(SymbolicOp op, std::string_view spelling,
-                                                            unsigned char precedence, bool prefix, const Printed& operand) {
-    const bool sign = texts_.beginsWith(operand.text, '-') &&
-                      (prefix ? spelling.ends_with('-') : precedence < signPrecedence && isLiteral(operand));
+                                                            unsigned char precedence, bool prefix,
+                                                            const Printed& operand) {
+    const bool sign =
+        prefix ? spelling.ends_with('-') && texts_.beginsWith(operand.text, '-') : losesSign(operand, precedence);
     const bool minusZero = op == SymbolicOp::UnaryMinus && operand.op == SymbolicOp::IntValue &&
                            texts_.length(operand.text) == 1 && texts_.beginsWith(operand.text, '0');
     if (minusZero)
@@ -212,14 +231,14 @@ StringifySymbolicExpr::Printed StringifySymbolicExpr::unary(SymbolicOp op, std::
     if (!prefix)
         return {op, texts_.enclose(wrap ? "(" : "", operand.text, wrap ? std::string(")").append(spelling) : spelling),
                 precedence};
-    return {op, texts_.enclose(wrap ? std::string(spelling).append("(") : spelling, operand.text, wrap ? ")" : ""), precedence};
+    return {op, texts_.enclose(wrap ? std::string(spelling).append("(") : spelling, operand.text, wrap ? ")" : ""),
+            precedence};
 }
 
 void StringifySymbolicExpr::appendUnary(const SymbolicOp& op, const char* spelling, unsigned char precedence,
                                         OpAssociativity, bool prefix) {
-    replaceOperands(1, [&](std::span<const Printed> operand) {
-        return unary(op, spelling, precedence, prefix, operand[0]);
-    });
+    replaceOperands(
+        1, [&](std::span<const Printed> operand) { return unary(op, spelling, precedence, prefix, operand[0]); });
 }
 
 // Lists and calls.
@@ -242,11 +261,14 @@ void StringifySymbolicExpr::appendArraySelection(const SymbolicExpr& node, const
     });
 }
 
-void StringifySymbolicExpr::appendCellArray(const SymbolicExpr& node) { appendArraySelection(node, "{", "}", ";"); }
+void StringifySymbolicExpr::appendCellArray(const SymbolicExpr& node) {
+    appendArraySelection(node, "{", "}", ";");
+}
 
 StringifySymbolicExpr::Printed StringifySymbolicExpr::call(SymbolicOp op, const Printed& callee,
                                                            std::span<const Printed> arguments) {
-    const Text name = callee.precedence > leafPrecedence ? wrapped(callee.text) : callee.text;
+    const Text name =
+        callee.precedence > leafPrecedence || losesSign(callee, leafPrecedence) ? wrapped(callee.text) : callee.text;
     if (arguments.empty())
         return {op, texts_.enclose("", name, "()"), leafPrecedence};
     const std::array<Text, 2> parts{name, list(arguments, "", ",", "")};
@@ -276,9 +298,12 @@ StringifySymbolicExpr::Printed StringifySymbolicExpr::shiftAmount(const Symbolic
     const ShiftAmount converted = quillShiftAmount(table_, shift.op(), shift.getInput(1));
     constexpr const OperatorInfo& minus = operatorInfo(SymbolicOp::UnaryMinus);
     switch (converted.form) {
-    case ShiftAmount::Form::Literal: return {SymbolicOp::IntValue, integer(converted.literal), leafPrecedence};
-    case ShiftAmount::Form::Negated: return unary(minus.op, minus.quill, minus.precedence, true, amount);
-    case ShiftAmount::Form::Expression: break;
+    case ShiftAmount::Form::Literal:
+        return {SymbolicOp::IntValue, integer(converted.literal), leafPrecedence};
+    case ShiftAmount::Form::Negated:
+        return unary(minus.op, minus.quill, minus.precedence, true, amount);
+    case ShiftAmount::Form::Expression:
+        break;
     }
     return converted.expression == shift.getInput(1) ? amount : insideCall(printed(converted.expression));
 }
@@ -297,7 +322,8 @@ void StringifySymbolicExpr::PrintQExprFromCExpr(const SymbolicExpr& node) {
 // Visits.
 
 /// What a node's row in the operator table says.
-template <SymbolicOp Op, class Node> void StringifySymbolicExpr::append(const Node& node) {
+template <SymbolicOp Op, class Node>
+void StringifySymbolicExpr::append(const Node& node) {
     static constexpr const OperatorInfo& row = operatorInfo(Op);
     [[maybe_unused]] const char* const spelling = quillSyntax_ ? row.quill.data() : row.c.data();
     if constexpr (Op == SymbolicOp::String) {
@@ -338,8 +364,10 @@ template <SymbolicOp Op, class Node> void StringifySymbolicExpr::append(const No
     }
 }
 
-#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                           \
-    void StringifySymbolicExpr::visit(const Class& node) { append<SymbolicOp::Name>(node); }
+#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                         \
+    void StringifySymbolicExpr::visit(const Class& node) {                                                             \
+        append<SymbolicOp::Name>(node);                                                                                \
+    }
 #include "base/core/operators.def"
 #undef VTSYM_OPERATOR
 

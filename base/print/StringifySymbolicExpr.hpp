@@ -16,24 +16,25 @@
 
 namespace VT {
 
-/// Prints an expression bottom-up: each visit takes the printed operands of its node from a stack and leaves the printed node.
-/// Spellings, precedences and forms are those of the operator table.  Parentheses are put where precedence demands them and where
-/// the text would otherwise read differently.
+/// Prints an expression bottom-up: each visit takes the printed operands of its node from a stack and leaves the
+/// printed node. Spellings, precedences and forms are those of the operator table.  Parentheses are put where
+/// precedence demands them and where the text would otherwise read differently.
 ///
-/// A visitor serves one print: node.accept(table, visitor) or visitor.execute(table, id), then get().  Those visit a shared
-/// operand once for every path to it; print() visits each distinct node once.
+/// A visitor serves one print: node.accept(table, visitor) or visitor.execute(table, id), then get().  Those visit a
+/// shared operand once for every path to it; print() visits each distinct node once.
 class VTSYM_API StringifySymbolicExpr : public SymbolicExprVisitor {
 public:
-    /// A printed expression: what the node is, its text, and how strongly the outermost operator binds (0 for what needs no
-    /// parentheses anywhere; a smaller number binds tighter).
+    /// A printed expression: what the node is, its text, and how strongly the outermost operator binds (0 for what
+    /// needs no parentheses anywhere; a smaller number binds tighter).
     struct Printed {
         SymbolicOp op;
         Text text;
         unsigned char precedence;
-        /// Where the node is written differently inside a Quill call that stands for a C operator, the number of that form;
-        /// 0 where it is not.
+        /// Where the node is written differently inside a Quill call that stands for a C operator, the number of that
+        /// form; 0 where it is not.
         std::uint32_t inCall = 0;
     };
+
     /// How a binary operator and its operands are put together.
     struct Delimiters {
         bool wrapRight;
@@ -41,7 +42,8 @@ public:
         bool spaced;
     };
 
-    explicit StringifySymbolicExpr(const SymbolicExprTable& table, bool quillSyntax, bool spacedLogicalOperators = false,
+    explicit StringifySymbolicExpr(const SymbolicExprTable& table, bool quillSyntax,
+                                   bool spacedLogicalOperators = false,
                                    SymbolicExprPrinter::PredicateHandle predicate = {});
     StringifySymbolicExpr(const StringifySymbolicExpr&) = delete;
     StringifySymbolicExpr& operator=(const StringifySymbolicExpr&) = delete;
@@ -51,12 +53,13 @@ public:
 #include "base/core/operators.def"
 #undef VTSYM_OPERATOR
 
-    /// The text of the expression that was visited last.  Throws std::out_of_range where nothing was visited, because the
-    /// identifier was not of the table, and std::length_error for a text beyond the bound, before memory is taken for it.
+    /// The text of the expression that was visited last.  Throws std::out_of_range where nothing was visited, because
+    /// the identifier was not of the table, and std::length_error for a text beyond the bound, before memory is taken
+    /// for it.
     [[nodiscard]] std::string get() const;
 
-    /// Prints an expression of the table; visits each distinct node once, and none that an earlier print() or printed() met.
-    /// Throws like get().
+    /// Prints an expression of the table; visits each distinct node once, and none that an earlier print() or printed()
+    /// met. Throws like get().
     [[nodiscard]] std::string print(SymbolicExprId id);
     /// Prints a node whose operands are of the table.
     [[nodiscard]] std::string print(const SymbolicExpr& node);
@@ -65,9 +68,14 @@ public:
     /// Forgets the nodes met by print() and printed(), and their texts.
     void forget();
 
-    [[nodiscard]] const TextPool& texts() const noexcept { return texts_; }
+    [[nodiscard]] const TextPool& texts() const noexcept {
+        return texts_;
+    }
+
     /// Bytes beyond which get() and print() throw std::length_error.
-    void setTextBound(std::size_t bytes) noexcept { textBound_ = bytes; }
+    void setTextBound(std::size_t bytes) noexcept {
+        textBound_ = bytes;
+    }
 
 protected:
     /// Takes the right operand, then the left one, from the stack and pushes the operation.
@@ -80,30 +88,44 @@ protected:
     void appendCellArray(const SymbolicExpr& node);
     /// Takes the node's inputs, the callee first, and pushes the call.
     void appendFcnCall(const SymbolicExpr& node);
-    /// For Quill: takes the operands of a C operator and pushes the call of the function that stands for it.  Its arguments are
-    /// written the same way, so that each division in them is an integer division.
+    /// For Quill: takes the operands of a C operator and pushes the call of the function that stands for it.  Its
+    /// arguments are written the same way, so that each division in them is an integer division.
     void PrintQExprFromCExpr(const SymbolicExpr& node);
 
     /// Joins two operands by an operator.
     [[nodiscard]] Printed createBinaryExpr(const SymbolicOp& op, const char* spelling, unsigned char precedence,
                                            OpAssociativity assoc, const Printed& lhs, const Printed& rhs);
-    /// Decides on parentheses by precedence and on blanks.  Parentheses without which a sign would read differently are put
-    /// whatever this answers.
-    [[nodiscard]] virtual Delimiters isDelimitWithSpacesAndWrapParenthesis(const SymbolicOp& op, unsigned char precedence,
+    /// Decides on parentheses by precedence and on blanks.  Parentheses without which a sign would read differently are
+    /// put whatever this answers.
+    [[nodiscard]] virtual Delimiters isDelimitWithSpacesAndWrapParenthesis(const SymbolicOp& op,
+                                                                           unsigned char precedence,
                                                                            OpAssociativity assoc, const Printed& lhs,
                                                                            const Printed& rhs) const;
 
-    void push(const Printed& printed) { stack_.push_back(printed); }
+    void push(const Printed& printed) {
+        stack_.push_back(printed);
+    }
+
     void push(const SymbolicOp& op, std::string_view text, unsigned char precedence) {
         push({op, texts_.bytes(text), precedence});
     }
+
     /// The text of an identifier, as the predicate gives it.
-    [[nodiscard]] std::string identifier(const SymbolicString& node) const { return predicate_.printIdentifier(node); }
-    [[nodiscard]] bool isQuillSyntax() const noexcept { return quillSyntax_; }
-    [[nodiscard]] bool hasSpacedLogicalOperators() const noexcept { return spacedLogicalOperators_; }
+    [[nodiscard]] std::string identifier(const SymbolicString& node) const {
+        return predicate_.printIdentifier(node);
+    }
+
+    [[nodiscard]] bool isQuillSyntax() const noexcept {
+        return quillSyntax_;
+    }
+
+    [[nodiscard]] bool hasSpacedLogicalOperators() const noexcept {
+        return spacedLogicalOperators_;
+    }
 
 private:
     class StackDepth;
+
     /// A printed expression, packed; all zero where there is none, so that fresh pages are zeroed memory.
     struct Known {
         Text text;
@@ -112,17 +134,24 @@ private:
         unsigned char precedence;
     };
 
-    template <SymbolicOp Op, class Node> void append(const Node& node);
-    template <class Build> void replaceOperands(std::size_t count, Build build);
+    template <SymbolicOp Op, class Node>
+    void append(const Node& node);
+    template <class Build>
+    void replaceOperands(std::size_t count, Build build);
     [[nodiscard]] bool pushKnown(SymbolicExprId id);
     [[nodiscard]] std::span<const Printed> operands(std::size_t count) const;
     [[nodiscard]] Printed insideCall(const Printed& printed) const;
     void setInsideCall(Printed& printed, const Printed& form);
 
+    [[nodiscard]] bool losesSign(const Printed& operand, unsigned char precedence) const;
     void appendInteger(int value);
     void appendDouble(double value);
     [[nodiscard]] Text integer(int value);
-    [[nodiscard]] Text wrapped(Text text) { return texts_.enclose("(", text, ")"); }
+
+    [[nodiscard]] Text wrapped(Text text) {
+        return texts_.enclose("(", text, ")");
+    }
+
     [[nodiscard]] Text list(std::span<const Printed> parts, std::string_view open, std::string_view separator,
                             std::string_view close);
     [[nodiscard]] Printed call(SymbolicOp op, const Printed& callee, std::span<const Printed> arguments);

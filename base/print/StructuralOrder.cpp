@@ -1,5 +1,6 @@
 #include "base/print/ExpressionPrinter.hpp"
 
+#include <array>
 #include <bit>
 #include <boost/unordered_set.hpp>
 #include <cmath>
@@ -10,20 +11,22 @@ namespace VT {
 
 namespace {
 
-template <class Value> int order(const Value& a, const Value& b) { return a < b ? -1 : static_cast<int>(b < a); }
+template <class Value>
+int order(const Value& a, const Value& b) {
+    return a < b ? -1 : static_cast<int>(b < a);
+}
 
-/// The operator of a node; that of the class with a fixed number of operands for a generic call or dimension list, because it
-/// depends on the table's history which of the two stands for both.
+/// The operator of a node; that of the class with a fixed number of operands for a generic call or dimension list,
+/// because it depends on the table's history which of the two stands for both.
 SymbolicOp canonicalOp(const SymbolicExpr& node) {
     const SymbolicOp op = node.op();
     const std::size_t inputs = node.getNumInputs();
-    if (op == SymbolicOp::DimsND)
-        return inputs == 2 ? SymbolicOp::Dims2D : inputs == 3 ? SymbolicOp::Dims3D : op;
-    if (op == SymbolicOp::FcnCall)
-        return inputs == 1   ? SymbolicOp::FcnCall0U
-               : inputs == 2 ? SymbolicOp::FcnCall1U
-               : inputs == 3 ? SymbolicOp::FcnCall2U
-                             : op;
+    constexpr auto dimensions = std::to_array({SymbolicOp::Dims2D, SymbolicOp::Dims3D});
+    constexpr auto calls = std::to_array({SymbolicOp::FcnCall0U, SymbolicOp::FcnCall1U, SymbolicOp::FcnCall2U});
+    if (op == SymbolicOp::DimsND && inputs >= 2 && inputs < 2 + dimensions.size())
+        return dimensions[inputs - 2];
+    if (op == SymbolicOp::FcnCall && inputs >= 1 && inputs < 1 + calls.size())
+        return calls[inputs - 1];
     return op;
 }
 
@@ -39,14 +42,16 @@ int orderPayloads(const SymbolicExpr& a, const SymbolicExpr& b) {
     case SymbolicOp::String:
         return order(static_cast<const SymbolicString&>(a).getName(), static_cast<const SymbolicString&>(b).getName());
     case SymbolicOp::IntValue:
-        return order(static_cast<const SymbolicIntValue&>(a).getValue(), static_cast<const SymbolicIntValue&>(b).getValue());
+        return order(static_cast<const SymbolicIntValue&>(a).getValue(),
+                     static_cast<const SymbolicIntValue&>(b).getValue());
     case SymbolicOp::DoubleValue:
         return orderDoubles(static_cast<const SymbolicDoubleValue&>(a).getValue(),
                             static_cast<const SymbolicDoubleValue&>(b).getValue());
     case SymbolicOp::MemberValue:
         return order(static_cast<const SymbolicMemberValue&>(a).getMemberName(),
                      static_cast<const SymbolicMemberValue&>(b).getMemberName());
-    default: return 0;
+    default:
+        return 0;
     }
 }
 
@@ -62,8 +67,9 @@ int orderNodes(const SymbolicExpr& a, const SymbolicExpr& b) {
 } // namespace
 
 int compareStructure(const SymbolicExprTable& table, SymbolicExprId left, SymbolicExprId right) {
-    // Nodes of unlike identifiers differ, so the walk goes straight down to the first difference.  Only copies of NaN are equal
-    // under several identifiers; what is built on them is remembered, so that shared operands are compared once.
+    // Nodes of unlike identifiers differ, so the walk goes straight down to the first difference.  Only copies of NaN
+    // are equal under several identifiers; what is built on them is remembered, so that shared operands are compared
+    // once.
     std::vector<std::pair<SymbolicExprId, SymbolicExprId>> stack{{left, right}};
     boost::unordered_set<std::pair<SymbolicExprId, SymbolicExprId>> compared;
     while (!stack.empty()) {

@@ -25,10 +25,13 @@ std::uint64_t loadEight(const char* bytes) {
 }
 
 /// Eight bytes as a number that orders like them.
-std::uint64_t loadOrdered(const char* bytes) { return __builtin_bswap64(loadEight(bytes)); }
+std::uint64_t loadOrdered(const char* bytes) {
+    return __builtin_bswap64(loadEight(bytes));
+}
 
 /// Writes the first bytes of a value.
-template <std::size_t Count> void store(std::uint64_t value, char* bytes) {
+template <std::size_t Count>
+void store(std::uint64_t value, char* bytes) {
     const std::uint64_t ordered = littleEndian ? value : __builtin_bswap64(value);
     std::memcpy(bytes, &ordered, Count);
 }
@@ -40,37 +43,48 @@ std::uint32_t valueOf(std::string_view glue) {
     return value;
 }
 
-template <class Glue> bool fits(std::string_view text) { return text.size() <= sizeof(Glue::bytes); }
+template <class Glue>
+bool fits(std::string_view text) {
+    return text.size() <= sizeof(Glue::bytes);
+}
 
-template <class Glue> std::string_view view(const Glue& glue) { return {glue.bytes.data(), glue.size}; }
+template <class Glue>
+std::string_view view(const Glue& glue) {
+    return {glue.bytes.data(), glue.size};
+}
 
 /// Writes all the room of a glue and steps over what it holds: what is written too much is overwritten or in the slack.
-template <class Glue> char* put(char* out, const Glue& glue) {
+template <class Glue>
+char* put(char* out, const Glue& glue) {
     std::memcpy(out, glue.bytes.data(), glue.bytes.size());
     return out + glue.size;
 }
 
 } // namespace
 
-/// Writes glue into a record and collects the head and the length of a join.  Memory that was just written in other pieces is not
-/// read: that would wait for the writes.
+/// Writes glue into a record and collects the head and the length of a join.  Memory that was just written in other
+/// pieces is not read: that would wait for the writes.
 class TextPool::JoinBuilder {
 public:
-    template <class Glue> void add(Glue& place, std::string_view glue) {
+    template <class Glue>
+    void add(Glue& place, std::string_view glue) {
         const std::uint32_t value = valueOf(glue);
         store<sizeof(Glue::bytes)>(value, place.bytes.data());
         place.size = static_cast<std::uint8_t>(glue.size());
         append(value, glue.size());
     }
+
     void add(const Record& part) {
         const char* const head = part.head.data();
         append(BytesValue{loadEight(head + 8)} << 64U | loadEight(head), part.length);
     }
+
     void finish(Record& record) const {
         store<8>(static_cast<std::uint64_t>(head_), record.head.data());
         store<8>(static_cast<std::uint64_t>(head_ >> 64U), record.head.data() + 8);
         record.length = size_;
     }
+
     [[nodiscard]] std::uint64_t size() const noexcept { return size_; }
 
 private:
@@ -108,15 +122,28 @@ Text TextPool::bytes(std::string_view bytes) {
 
 Text TextPool::join(std::string_view open, std::span<const Text> parts, std::string_view separator,
                     std::string_view close) {
-    if (!fits<Bracket>(open) || !fits<Bracket>(close) || !fits<Separator>(separator))
-        return joinBeyondGlue(open, parts, separator, close);
+    if (fits<Bracket>(open) && fits<Bracket>(close) && fits<Separator>(separator))
+        return joinByGlue(open, parts, separator, close);
+    // Spellings of unusual length become texts of their own.
+    std::vector<Text> all{bytes(open)};
+    for (const Text& part : parts) {
+        if (&part != parts.data())
+            all.push_back(bytes(separator));
+        all.push_back(part);
+    }
+    all.push_back(bytes(close));
+    return joinByGlue("", all, "", "");
+}
+
+Text TextPool::joinByGlue(std::string_view open, std::span<const Text> parts, std::string_view separator,
+                          std::string_view close) {
     if (parts.empty())
         return bytes(std::string(open).append(close));
     if (parts.size() == 1 && open.empty() && close.empty())
         return parts.front();
     if (parts_.size() + parts.size() > std::numeric_limits<std::uint32_t>::max())
         throw std::length_error("basic_string::append");
-    const std::uint32_t firstPart = static_cast<std::uint32_t>(parts_.size());
+    const auto firstPart = static_cast<std::uint32_t>(parts_.size());
     if (parts.size() > 2)
         std::ranges::copy(parts, parts_.extend(parts.size()));
 
@@ -140,19 +167,6 @@ Text TextPool::join(std::string_view open, std::span<const Text> parts, std::str
     return builder.size() == 0 ? parts.front() : last();
 }
 
-/// Spellings of unusual length become texts of their own.
-Text TextPool::joinBeyondGlue(std::string_view open, std::span<const Text> parts, std::string_view separator,
-                              std::string_view close) {
-    std::vector<Text> all{bytes(open)};
-    for (const Text& part : parts) {
-        if (&part != parts.data())
-            all.push_back(bytes(separator));
-        all.push_back(part);
-    }
-    all.push_back(bytes(close));
-    return join("", all, "", "");
-}
-
 std::string TextPool::str(Text text, std::size_t bound) const {
     // Short bytes and glue are written in whole words, so there is room behind the end.
     constexpr std::size_t slack = headBytes;
@@ -172,7 +186,8 @@ std::string TextPool::str(Text text, std::size_t bound) const {
     return result;
 }
 
-/// Writes a text from left to right; what is left to write stands on a stack of joins and the part that comes next in each.
+/// Writes a text from left to right; what is left to write stands on a stack of joins and the part that comes next in
+/// each.
 char* TextPool::write(Text text, char* out) const {
     auto at = static_cast<std::uint32_t>(text);
     while (true) {
@@ -224,13 +239,18 @@ public:
     Cursor(const TextPool& pool, Text text) : pool_(pool) { enter(static_cast<std::uint32_t>(text)); }
 
     [[nodiscard]] bool atEnd() const noexcept { return !isJoin_ && run_.empty(); }
+
     /// Whether the piece is a join; bytes() is the piece otherwise, and never empty.
     [[nodiscard]] bool isJoin() const noexcept { return isJoin_; }
+
     [[nodiscard]] std::uint32_t join() const noexcept { return join_; }
+
     [[nodiscard]] std::uint64_t joinLength() const noexcept { return pool_.records_[join_].length; }
+
     [[nodiscard]] std::string_view bytes() const noexcept { return run_; }
 
     void stepOverJoin() { next(); }
+
     void stepIntoJoin() {
         stack_.push_back({join_, 0});
         isJoin_ = false;
@@ -238,6 +258,7 @@ public:
         if (run_.empty())
             next();
     }
+
     void consume(std::size_t count) {
         run_.remove_prefix(count);
         if (run_.empty())
@@ -264,6 +285,7 @@ private:
             }
         }
     }
+
     void enter(std::uint32_t record) {
         join_ = pool_.records_[record].leading;
         const Record& piece = pool_.records_[join_];
@@ -308,8 +330,8 @@ int TextPool::compare(Text left, Text right) const {
         } else if (two.isJoin()) {
             two.stepIntoJoin();
         } else {
-            const std::size_t count = std::min<std::size_t>({one.bytes().size(), two.bytes().size(),
-                                                             static_cast<std::size_t>(limits::orderedTextBytes - position)});
+            const auto count = std::min<std::size_t>({one.bytes().size(), two.bytes().size(),
+                                                      static_cast<std::size_t>(limits::orderedTextBytes - position)});
             if (const int order = std::memcmp(one.bytes().data(), two.bytes().data(), count); order != 0)
                 return order < 0 ? -1 : 1;
             position += count;

@@ -29,7 +29,9 @@ std::size_t hash_value(const Constraint& constraint) noexcept;
 /// nothing; the product without constraints always holds.
 class Cube {
 public:
-    [[nodiscard]] const std::vector<Constraint>& constraints() const noexcept { return constraints_; }
+    using Constraints = boost::container::small_vector<Constraint, 2>;
+
+    [[nodiscard]] const Constraints& constraints() const noexcept { return constraints_; }
 
     [[nodiscard]] bool alwaysHolds() const noexcept { return constraints_.empty(); }
 
@@ -49,7 +51,7 @@ public:
     bool operator==(const Cube&) const = default;
 
 private:
-    std::vector<Constraint> constraints_;
+    Constraints constraints_;
 };
 
 using Cover = std::vector<Cube>;

@@ -26,9 +26,17 @@ std::optional<SymbolicExprId> operandOfMinus(const SymbolicExprTable& table, Sym
     return node->getInput(0);
 }
 
-ShiftAmount expression(SymbolicExprId id) { return {ShiftAmount::Form::Expression, 0, id}; }
-ShiftAmount literal(int value) { return {ShiftAmount::Form::Literal, value, invalidId}; }
-ShiftAmount minus(SymbolicExprId id) { return {ShiftAmount::Form::Negated, 0, id}; }
+ShiftAmount expression(SymbolicExprId id) {
+    return {ShiftAmount::Form::Expression, 0, id};
+}
+
+ShiftAmount literal(int value) {
+    return {ShiftAmount::Form::Literal, value, invalidId};
+}
+
+ShiftAmount minus(SymbolicExprId id) {
+    return {ShiftAmount::Form::Negated, 0, id};
+}
 
 /// The names live in a table because a node's class has no other way into the world.
 class CallNames {
@@ -37,6 +45,7 @@ public:
         for (const SymbolicOp op : quillCalls)
             SymbolicString(table_, std::string(operatorInfo(op).quillCall));
     }
+
     [[nodiscard]] const SymbolicString& name(SymbolicOp op) const {
         SymbolicExprId id = 0;
         while (quillCalls[id] != quillCallLeader(op))

@@ -1,5 +1,5 @@
-// Quill has no operators for integer division, remainder, bits and shifts: it calls functions.  Which function stands for which
-// C operator, and what becomes of the amount of a shift.
+// Quill has no operators for integer division, remainder, bits and shifts: it calls functions.  Which function stands
+// for which C operator, and what becomes of the amount of a shift.
 #pragma once
 
 #include "base/core/Nodes.hpp"
@@ -11,12 +11,16 @@
 namespace VT {
 
 /// The C operators that are function calls in Quill.
-inline constexpr OperatorSet quillCallOps = OperatorSet::where([](const OperatorInfo& r) { return !r.quillCall.empty(); });
+inline constexpr OperatorSet quillCallOps =
+    OperatorSet::where([](const OperatorInfo& r) { return !r.quillCall.empty(); });
 
 /// Number of arguments of the Quill function that stands for a C operator.
-constexpr std::size_t quillCallArguments(SymbolicOp op) { return operatorInfo(op).form == OperatorForm::Infix ? 2 : 1; }
+constexpr std::size_t quillCallArguments(SymbolicOp op) {
+    return operatorInfo(op).form == OperatorForm::Infix ? 2 : 1;
+}
 
-/// The first of the operators that one Quill function stands for: the operator itself, but for the shifts, which share one.
+/// The first of the operators that one Quill function stands for: the operator itself, but for the shifts, which share
+/// one.
 constexpr SymbolicOp quillCallLeader(SymbolicOp op) {
     for (const OperatorInfo& row : operatorTable())
         if (row.quillCall == operatorInfo(op).quillCall)
@@ -65,8 +69,8 @@ struct CShift {
 /// The C shift that says bitshift(a, amount): to the left by a positive amount, to the right by a negative one.
 VTSYM_API CShift shiftOfQuillCall(const SymbolicExprTable& table, SymbolicExprId amount);
 
-/// The second argument of the bitshift() that says a C shift by `amount`.  A literal stays a literal where its negative fits
-/// 32 bits, and a minus is taken away rather than doubled.
+/// The second argument of the bitshift() that says a C shift by `amount`.  A literal stays a literal where its negative
+/// fits 32 bits, and a minus is taken away rather than doubled.
 VTSYM_API ShiftAmount quillShiftAmount(const SymbolicExprTable& table, SymbolicOp shift, SymbolicExprId amount);
 
 } // namespace VT

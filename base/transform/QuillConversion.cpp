@@ -2,11 +2,12 @@
 
 #include <algorithm>
 #include <boost/container/small_vector.hpp>
+#include <ranges>
 #include <string>
 
 namespace VT {
 
-QuillCallVisitor::QuillCallVisitor(SymbolicExprTable& target) : SymbolicExprXFormVisitor(target), names_{} {
+QuillCallVisitor::QuillCallVisitor(SymbolicExprTable& target) : SymbolicExprXFormVisitor(target) {
     std::ranges::transform(quillCalls, names_.begin(), [&](SymbolicOp op) {
         return factory_.make<SymbolicString>(std::string(operatorInfo(op).quillCall));
     });
@@ -27,24 +28,39 @@ SymbolicOp QuillCallVisitor::operatorOf(SymbolicExprId name, std::size_t argumen
 
 SymbolicExprId QuillCallVisitor::make(const ShiftAmount& amount) {
     switch (amount.form) {
-    case ShiftAmount::Form::Literal: return factory_.make<SymbolicIntValue>(amount.literal);
-    case ShiftAmount::Form::Negated: return factory_.make<SymbolicUnaryMinusExpr>(amount.expression);
-    case ShiftAmount::Form::Expression: break;
+    case ShiftAmount::Form::Literal:
+        return factory_.make<SymbolicIntValue>(amount.literal);
+    case ShiftAmount::Form::Negated:
+        return factory_.make<SymbolicUnaryMinusExpr>(amount.expression);
+    case ShiftAmount::Form::Expression:
+        break;
     }
     return amount.expression;
 }
 
 // Quill to C.
 
-void SymbolicExprQ2CVisitor::visit(const SymbolicFcnCall0UExpr& node) { convert(node); }
-void SymbolicExprQ2CVisitor::visit(const SymbolicFcnCall1UExpr& node) { convert(node); }
-void SymbolicExprQ2CVisitor::visit(const SymbolicFcnCall2UExpr& node) { convert(node); }
-void SymbolicExprQ2CVisitor::visit(const SymbolicFcnCallExpr& node) { convert(node); }
+void SymbolicExprQ2CVisitor::visit(const SymbolicFcnCall0UExpr& node) {
+    convert(node);
+}
 
-template <class Call> void SymbolicExprQ2CVisitor::convert(const Call& node) {
+void SymbolicExprQ2CVisitor::visit(const SymbolicFcnCall1UExpr& node) {
+    convert(node);
+}
+
+void SymbolicExprQ2CVisitor::visit(const SymbolicFcnCall2UExpr& node) {
+    convert(node);
+}
+
+void SymbolicExprQ2CVisitor::visit(const SymbolicFcnCallExpr& node) {
+    convert(node);
+}
+
+template <class Call>
+void SymbolicExprQ2CVisitor::convert(const Call& node) {
     boost::container::small_vector<SymbolicExprId, 4> inputs(node.getNumInputs());
-    for (auto input = inputs.rbegin(); input != inputs.rend(); ++input)
-        *input = pop();
+    for (SymbolicExprId& input : std::views::reverse(inputs))
+        input = pop();
     if (!inputs.empty()) {
         const std::span<const SymbolicExprId> arguments(inputs.data() + 1, inputs.size() - 1);
         const SymbolicOp op = operatorOf(inputs.front(), arguments.size());
@@ -62,32 +78,63 @@ template <class Call> void SymbolicExprQ2CVisitor::convert(const Call& node) {
 /// The C operator on the arguments, or the invalid identifier where the call has to stay.
 SymbolicExprId SymbolicExprQ2CVisitor::build(SymbolicOp op, std::span<const SymbolicExprId> arguments) {
     switch (op) {
-    case SymbolicOp::Divide: return factory_.make<SymbolicDivideExpr>(arguments[0], arguments[1]);
-    case SymbolicOp::Modulo: return factory_.make<SymbolicModuloExpr>(arguments[0], arguments[1]);
-    case SymbolicOp::BitAnd: return factory_.make<SymbolicBitAndExpr>(arguments[0], arguments[1]);
-    case SymbolicOp::BitOr: return factory_.make<SymbolicBitOrExpr>(arguments[0], arguments[1]);
-    case SymbolicOp::BitXOr: return factory_.make<SymbolicBitXOrExpr>(arguments[0], arguments[1]);
-    case SymbolicOp::BitCompl: return factory_.make<SymbolicBitComplExpr>(arguments[0]);
-    case SymbolicOp::ShiftLeft: break;
-    default: return invalidId;
+    case SymbolicOp::Divide:
+        return factory_.make<SymbolicDivideExpr>(arguments[0], arguments[1]);
+    case SymbolicOp::Modulo:
+        return factory_.make<SymbolicModuloExpr>(arguments[0], arguments[1]);
+    case SymbolicOp::BitAnd:
+        return factory_.make<SymbolicBitAndExpr>(arguments[0], arguments[1]);
+    case SymbolicOp::BitOr:
+        return factory_.make<SymbolicBitOrExpr>(arguments[0], arguments[1]);
+    case SymbolicOp::BitXOr:
+        return factory_.make<SymbolicBitXOrExpr>(arguments[0], arguments[1]);
+    case SymbolicOp::BitCompl:
+        return factory_.make<SymbolicBitComplExpr>(arguments[0]);
+    case SymbolicOp::ShiftLeft:
+        break;
+    default:
+        return invalidId;
     }
     const CShift shift = shiftOfQuillCall(table(), arguments[1]);
     switch (shift.op) {
-    case SymbolicOp::ShiftLeft: return factory_.make<SymbolicShiftLeftExpr>(arguments[0], make(shift.amount));
-    case SymbolicOp::ShiftRight: return factory_.make<SymbolicShiftRightExpr>(arguments[0], make(shift.amount));
-    default: return invalidId;
+    case SymbolicOp::ShiftLeft:
+        return factory_.make<SymbolicShiftLeftExpr>(arguments[0], make(shift.amount));
+    case SymbolicOp::ShiftRight:
+        return factory_.make<SymbolicShiftRightExpr>(arguments[0], make(shift.amount));
+    default:
+        return invalidId;
     }
 }
 
 // C to Quill.
 
-void SymbolicExprC2QVisitor::visit(const SymbolicDivideExpr& node) { callOfTwo(node.code); }
-void SymbolicExprC2QVisitor::visit(const SymbolicModuloExpr& node) { callOfTwo(node.code); }
-void SymbolicExprC2QVisitor::visit(const SymbolicBitAndExpr& node) { callOfTwo(node.code); }
-void SymbolicExprC2QVisitor::visit(const SymbolicBitOrExpr& node) { callOfTwo(node.code); }
-void SymbolicExprC2QVisitor::visit(const SymbolicBitXOrExpr& node) { callOfTwo(node.code); }
-void SymbolicExprC2QVisitor::visit(const SymbolicShiftLeftExpr& node) { callOfShift(node.code); }
-void SymbolicExprC2QVisitor::visit(const SymbolicShiftRightExpr& node) { callOfShift(node.code); }
+void SymbolicExprC2QVisitor::visit(const SymbolicDivideExpr& node) {
+    callOfTwo(node.code);
+}
+
+void SymbolicExprC2QVisitor::visit(const SymbolicModuloExpr& node) {
+    callOfTwo(node.code);
+}
+
+void SymbolicExprC2QVisitor::visit(const SymbolicBitAndExpr& node) {
+    callOfTwo(node.code);
+}
+
+void SymbolicExprC2QVisitor::visit(const SymbolicBitOrExpr& node) {
+    callOfTwo(node.code);
+}
+
+void SymbolicExprC2QVisitor::visit(const SymbolicBitXOrExpr& node) {
+    callOfTwo(node.code);
+}
+
+void SymbolicExprC2QVisitor::visit(const SymbolicShiftLeftExpr& node) {
+    callOfShift(node.code);
+}
+
+void SymbolicExprC2QVisitor::visit(const SymbolicShiftRightExpr& node) {
+    callOfShift(node.code);
+}
 
 void SymbolicExprC2QVisitor::visit(const SymbolicBitComplExpr& node) {
     const SymbolicExprId operand = pop();

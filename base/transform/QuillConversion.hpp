@@ -9,7 +9,8 @@
 
 namespace VT {
 
-/// The base of both conversions: holds the identifiers of the function names, so that names are compared as identifiers.
+/// The base of both conversions: holds the identifiers of the function names, so that names are compared as
+/// identifiers.
 class VTSYM_API QuillCallVisitor : public SymbolicExprXFormVisitor {
 protected:
     /// Interns idivide, rem, bitand, bitor, bitxor, bitcmp and bitshift in this order.
@@ -25,11 +26,11 @@ protected:
     using SymbolicExprXFormVisitor::visit;
 
 private:
-    std::array<SymbolicExprId, quillCalls.size()> names_;
+    std::array<SymbolicExprId, quillCalls.size()> names_{};
 };
 
-/// Quill calls become C operators: `idivide(a,b)` becomes a / b, `bitshift(a,-2)` becomes a >> 2.  A call is known by its name
-/// and its number of arguments, whichever call class holds it; every other call stays.
+/// Quill calls become C operators: `idivide(a,b)` becomes a / b, `bitshift(a,-2)` becomes a >> 2.  A call is known by
+/// its name and its number of arguments, whichever call class holds it; every other call stays.
 class VTSYM_API SymbolicExprQ2CVisitor : public QuillCallVisitor {
 public:
     explicit SymbolicExprQ2CVisitor(SymbolicExprTable& target) : QuillCallVisitor(target) {}
@@ -41,12 +42,13 @@ public:
     void visit(const SymbolicFcnCallExpr& node) override;
 
 private:
-    template <class Call> void convert(const Call& node);
+    template <class Call>
+    void convert(const Call& node);
     SymbolicExprId build(SymbolicOp op, std::span<const SymbolicExprId> arguments);
 };
 
-/// C operators become Quill calls: a % b becomes `rem(a,b)`, and every division `idivide(a,b)`, because a C division is one of
-/// integers.
+/// C operators become Quill calls: a % b becomes `rem(a,b)`, and every division `idivide(a,b)`, because a C division is
+/// one of integers.
 class VTSYM_API SymbolicExprC2QVisitor : public QuillCallVisitor {
 public:
     explicit SymbolicExprC2QVisitor(SymbolicExprTable& target) : QuillCallVisitor(target) {}
@@ -70,8 +72,9 @@ private:
 class VTSYM_API SymbolicExprQ2C {
 public:
     explicit SymbolicExprQ2C(SymbolicExprTable& table) : table_(table) {}
-    /// The C shape of an expression: the expression itself where nothing is to convert.  An identifier that is not of the table
-    /// gives the invalid one.  Linear in the number of distinct nodes.
+
+    /// The C shape of an expression: the expression itself where nothing is to convert.  An identifier that is not of
+    /// the table gives the invalid one.  Linear in the number of distinct nodes.
     SymbolicExprId operator()(SymbolicExprId id) const;
 
 private:
@@ -82,8 +85,9 @@ private:
 class VTSYM_API SymbolicExprC2Q {
 public:
     explicit SymbolicExprC2Q(SymbolicExprTable& table) : table_(table) {}
-    /// The Quill shape of an expression: the expression itself where nothing is to convert.  An identifier that is not of the
-    /// table gives the invalid one.  Linear in the number of distinct nodes.
+
+    /// The Quill shape of an expression: the expression itself where nothing is to convert.  An identifier that is not
+    /// of the table gives the invalid one.  Linear in the number of distinct nodes.
     SymbolicExprId operator()(SymbolicExprId id) const;
 
 private:

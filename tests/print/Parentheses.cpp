@@ -27,12 +27,18 @@ SymbolicExprId around(const Trees& tree, SymbolicOp op, SymbolicExprId operand, 
     if (form == OperatorForm::Infix || form == OperatorForm::Range)
         return right ? tree(op, name, operand) : tree(op, operand, name);
     switch (op) {
-    case SymbolicOp::Dims2D: return tree(op, operand, name);
-    case SymbolicOp::Dims3D: return tree(op, name, operand, name);
-    case SymbolicOp::FcnCall0U: return tree(op, operand);
-    case SymbolicOp::FcnCall1U: return right ? tree(op, name, operand) : tree(op, operand, name);
-    case SymbolicOp::FcnCall2U: return right ? tree(op, name, name, operand) : tree(op, name, operand, name);
-    default: return tree(op, std::vector{operand});
+    case SymbolicOp::Dims2D:
+        return tree(op, operand, name);
+    case SymbolicOp::Dims3D:
+        return tree(op, name, operand, name);
+    case SymbolicOp::FcnCall0U:
+        return tree(op, operand);
+    case SymbolicOp::FcnCall1U:
+        return right ? tree(op, name, operand) : tree(op, operand, name);
+    case SymbolicOp::FcnCall2U:
+        return right ? tree(op, name, name, operand) : tree(op, name, operand, name);
+    default:
+        return tree(op, std::vector{operand});
     }
 }
 
@@ -43,7 +49,8 @@ TEST(Parentheses, EveryOperatorUnderEveryOther) {
         for (const OperatorInfo& inner : operatorTable()) {
             std::vector<SymbolicExprId> operands;
             if (inner.form == OperatorForm::Leaf)
-                operands = {tree.name("a"), tree.integer(0), tree.integer(5), tree.integer(-5), tree.real(-0.0), tree.real(-2.5)};
+                operands = {tree.name("a"),   tree.integer(0), tree.integer(5),
+                            tree.integer(-5), tree.real(-0.0), tree.real(-2.5)};
             else if (isWritten(inner.op, language))
                 for (const SymbolicExprId operand : {tree.name("b"), tree.integer(-7), tree.real(1e22)})
                     operands.push_back(around(tree, inner.op, operand, false));

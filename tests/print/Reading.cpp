@@ -16,17 +16,21 @@ using Level = std::vector<std::string_view>;
 
 /// The binary operators of a language from the loosest on, longer spellings first.
 const std::vector<Level>& levels(Language language) {
-    static const std::vector<Level> c{{"||"}, {"&&"}, {"|"}, {"^"}, {"&"}, {"==", "!="}, {"<=", ">=", "<", ">"},
-                                      {"<<", ">>"}, {"+", "-"}, {"*", "/", "%"}};
-    static const std::vector<Level> quill{{"||"}, {"&&"}, {"|"}, {"&"}, {"==", "~="}, {"<=", ">=", "<", ">"},
-                                          {":"}, {"+", "-"}, {".*", "./", ".\\", "*", "/", "\\"}};
+    static const std::vector<Level> c{
+        {"||"},       {"&&"},     {"|"},          {"^"}, {"&"}, {"==", "!="}, {"<=", ">=", "<", ">"},
+        {"<<", ">>"}, {"+", "-"}, {"*", "/", "%"}};
+    static const std::vector<Level> quill{{"||"}, {"&&"},       {"|"},
+                                          {"&"},  {"==", "~="}, {"<=", ">=", "<", ">"},
+                                          {":"},  {"+", "-"},   {".*", "./", ".\\", "*", "/", "\\"}};
     return language == Language::C ? c : quill;
 }
 
 constexpr std::string_view nameBytes = "ABCDEFGHIJKLMNOPQRSTUVWXYZabcdefghijklmnopqrstuvwxyz_0123456789";
 constexpr std::string_view digits = "0123456789";
 
-bool isNumber(std::string_view text) { return !text.empty() && digits.find(text.front()) != std::string_view::npos; }
+bool isNumber(std::string_view text) {
+    return !text.empty() && digits.find(text.front()) != std::string_view::npos;
+}
 
 class Reader {
 public:
@@ -41,20 +45,24 @@ public:
 
 private:
     std::string_view spelling() const {
-        static constexpr std::string_view all[] = {"||", "&&", "==", "!=", "~=", "<=", ">=", "<<", ">>", ".*", "./", ".\\", ".^", ".'"};
+        static constexpr std::string_view all[] = {
+            "||", "&&", "==", "!=", "~=", "<=", ">=", "<<", ">>", ".*", "./", ".\\", ".^", ".'"};
         const auto found = std::ranges::find_if(all, [&](std::string_view op) { return text_.starts_with(op); });
         return found != std::end(all) ? *found : text_.substr(0, 1);
     }
+
     void skipBlank() {
         if (text_.starts_with(' '))
             text_.remove_prefix(1);
     }
+
     bool take(std::string_view token) {
         if (spelling() != token || token.empty())
             return false;
         text_.remove_prefix(token.size());
         return true;
     }
+
     std::string takeAll(std::string_view set) {
         const std::size_t end = std::min(text_.find_first_not_of(set), text_.size());
         std::string taken(text_.substr(0, end));
@@ -79,6 +87,7 @@ private:
             left = "(" + left + std::string(*op) + binary(level + 1) + ")";
         }
     }
+
     std::string prefixed() {
         for (const std::string_view op : {"-", "~", "!"})
             if (take(op)) {
@@ -87,6 +96,7 @@ private:
             }
         return power();
     }
+
     std::string power() {
         std::string left = chain();
         while (language_ == Language::Quill) {
@@ -103,23 +113,27 @@ private:
         }
         return left;
     }
+
     std::string exponent() {
         if (take("-"))
             return "-" + exponent();
         return chain();
     }
+
     std::string chain() {
         std::string left = primary();
         while (true) {
             if (take("("))
                 left += "(" + list(')', ",") + ")";
-            else if (text_.size() > 1 && text_[0] == '.' && nameBytes.find(text_[1]) < nameBytes.size() - digits.size()) {
+            else if (text_.size() > 1 && text_[0] == '.' &&
+                     nameBytes.find(text_[1]) < nameBytes.size() - digits.size()) {
                 text_.remove_prefix(1);
                 left = "(" + left + "." + takeAll(nameBytes) + ")";
             } else
                 return left;
         }
     }
+
     std::string primary() {
         if (take("(")) {
             std::string inner = binary(0);
@@ -139,11 +153,15 @@ private:
                 text_.remove_prefix(1);
                 run += "." + takeAll(nameBytes);
             }
-            if (run.back() == 'e')
-                run += text_.front() + (text_.remove_prefix(1), takeAll(digits));
+            if (run.back() == 'e') {
+                run += text_.front();
+                text_.remove_prefix(1);
+                run += takeAll(digits);
+            }
         }
         return run;
     }
+
     std::string list(char close, std::string_view separators) {
         std::string items;
         while (!text_.starts_with(close)) {
@@ -163,7 +181,8 @@ private:
     const std::vector<Level>& levels_;
 };
 
-std::string joined(SymbolicExprTable& table, const SymbolicExpr& node, std::size_t first, char separator, Language language) {
+std::string joined(SymbolicExprTable& table, const SymbolicExpr& node, std::size_t first, char separator,
+                   Language language) {
     std::string text;
     for (std::size_t i = first; i < node.getNumInputs(); ++i)
         text += (i > first ? std::string(1, separator) : "") + meaningOf(table, node.getInput(i), language);
@@ -181,31 +200,59 @@ std::string realText(double value, Language language) {
 
 } // namespace
 
-std::string readingOf(std::string_view text, Language language) { return Reader(text, language).whole(); }
+std::string readingOf(std::string_view text, Language language) {
+    return Reader(text, language).whole();
+}
 
 bool isWritten(SymbolicOp op, Language language) {
     switch (op) {
-    case SymbolicOp::Row: case SymbolicOp::Matrix: case SymbolicOp::AnonymousFunc: return false;
-    case SymbolicOp::Power: case SymbolicOp::DotPower: case SymbolicOp::DotMul: case SymbolicOp::DotDiv: case SymbolicOp::LDiv:
-    case SymbolicOp::DotLDiv: case SymbolicOp::Transpose: case SymbolicOp::DotTranspose: case SymbolicOp::SingleAnd:
-    case SymbolicOp::SingleOr: case SymbolicOp::QColon: return language == Language::Quill;
-    case SymbolicOp::QColon3: return false; // reads as a range of a range
-    default: return true;
+    case SymbolicOp::Row:
+    case SymbolicOp::Matrix:
+    case SymbolicOp::AnonymousFunc:
+        return false;
+    case SymbolicOp::Power:
+    case SymbolicOp::DotPower:
+    case SymbolicOp::DotMul:
+    case SymbolicOp::DotDiv:
+    case SymbolicOp::LDiv:
+    case SymbolicOp::DotLDiv:
+    case SymbolicOp::Transpose:
+    case SymbolicOp::DotTranspose:
+    case SymbolicOp::SingleAnd:
+    case SymbolicOp::SingleOr:
+    case SymbolicOp::QColon:
+        return language == Language::Quill;
+    case SymbolicOp::QColon3:
+        return false; // reads as a range of a range
+    default:
+        return true;
     }
 }
 
 std::string meaningOf(SymbolicExprTable& table, SymbolicExprId id, Language language) {
     const SymbolicExpr& node = *table.get(id);
     switch (node.op()) {
-    case SymbolicOp::String: return static_cast<const SymbolicString&>(node).getName();
-    case SymbolicOp::IntValue: return std::to_string(static_cast<const SymbolicIntValue&>(node).getValue());
-    case SymbolicOp::DoubleValue: return realText(node.getNumValue(), language);
-    case SymbolicOp::FcnCall0U: case SymbolicOp::FcnCall1U: case SymbolicOp::FcnCall2U: case SymbolicOp::FcnCall:
+    case SymbolicOp::String:
+        return static_cast<const SymbolicString&>(node).getName();
+    case SymbolicOp::IntValue:
+        return std::to_string(static_cast<const SymbolicIntValue&>(node).getValue());
+    case SymbolicOp::DoubleValue:
+        return realText(node.getNumValue(), language);
+    case SymbolicOp::FcnCall0U:
+    case SymbolicOp::FcnCall1U:
+    case SymbolicOp::FcnCall2U:
+    case SymbolicOp::FcnCall:
         return meaningOf(table, node.getInput(0), language) + "(" + joined(table, node, 1, ',', language) + ")";
-    case SymbolicOp::Dims2D: case SymbolicOp::Dims3D: case SymbolicOp::DimsND: return "[" + joined(table, node, 0, ',', language) + "]";
-    case SymbolicOp::CellArray: return "{" + joined(table, node, 0, ';', language) + "}";
-    case SymbolicOp::MemberValue: return "(" + meaningOf(table, node.getInput(0), language) + ".field)";
-    default: break;
+    case SymbolicOp::Dims2D:
+    case SymbolicOp::Dims3D:
+    case SymbolicOp::DimsND:
+        return "[" + joined(table, node, 0, ',', language) + "]";
+    case SymbolicOp::CellArray:
+        return "{" + joined(table, node, 0, ';', language) + "}";
+    case SymbolicOp::MemberValue:
+        return "(" + meaningOf(table, node.getInput(0), language) + ".field)";
+    default:
+        break;
     }
     const OperatorInfo& row = operatorInfo(node.op());
     if (language == Language::Quill && row.quill.empty())
@@ -239,22 +286,28 @@ SymbolicExprId makeNode(SymbolicExprTable& table, SymbolicOp op, std::vector<Sym
 #define MAKE_CallN(Class) MAKE_Multi(Class)
 #define MAKE_Cell(Class) MAKE_Multi(Class)
     switch (op) {
-#define VTSYM_OPERATOR(Code, Name, Class, Shape, ...) case SymbolicOp::Name: MAKE_##Shape(Class);
+#define VTSYM_OPERATOR(Code, Name, Class, Shape, ...)                                                                  \
+    case SymbolicOp::Name:                                                                                             \
+        MAKE_##Shape(Class);
 #include "base/core/operators.def"
 #undef VTSYM_OPERATOR
-    case SymbolicOp::None: break;
+    case SymbolicOp::None:
+        break;
     }
     throw std::logic_error("a leaf has no inputs");
 }
 
 SymbolicExprId randomTree(SymbolicExprTable& table, Language language, std::mt19937& random, int depth) {
     const Trees tree{table};
-    const auto below = [&](std::uint32_t bound) { return random() % bound; };
+    const auto below = [&](unsigned bound) { return static_cast<unsigned>(random()) % bound; };
     if (depth == 0 || below(6) == 0) {
         switch (below(6)) {
-        case 0: return tree.integer(static_cast<int>(below(7)) - 3);
-        case 1: return tree.real((static_cast<int>(below(9)) - 4) * 0.5);
-        default: return tree.name(std::string(1, static_cast<char>('a' + below(4))));
+        case 0:
+            return tree.integer(static_cast<int>(below(7)) - 3);
+        case 1:
+            return tree.real((static_cast<int>(below(9)) - 4) * 0.5);
+        default:
+            return tree.name(std::string(1, static_cast<char>('a' + below(4))));
         }
     }
     while (true) {
@@ -265,7 +318,7 @@ SymbolicExprId randomTree(SymbolicExprTable& table, Language language, std::mt19
             return tree(op, randomTree(table, language, random, 0), randomTree(table, language, random, 0));
         if (callOps.contains(op) || dimensionOps.contains(op) || op == SymbolicOp::CellArray) {
             std::vector<SymbolicExprId> inputs;
-            for (std::uint32_t left = 1 + below(4); left > 0; --left)
+            for (unsigned left = 1 + below(4); left > 0; --left)
                 inputs.push_back(randomTree(table, language, random, depth - 1));
             if (callOps.contains(op))
                 inputs.front() = tree.name("f");
@@ -275,10 +328,12 @@ SymbolicExprId randomTree(SymbolicExprTable& table, Language language, std::mt19
                         inputs);
         }
         const SymbolicExprId first = randomTree(table, language, random, depth - 1);
-        return operatorInfo(op).form == OperatorForm::Infix ? tree(op, first, randomTree(table, language, random, depth - 1))
-                                                            : tree(op, first);
+        return operatorInfo(op).form == OperatorForm::Infix
+                   ? tree(op, first, randomTree(table, language, random, depth - 1))
+                   : tree(op, first);
     }
 }
 
 } // namespace VT::Testing
+
 // NOLINTEND(misc-no-recursion)

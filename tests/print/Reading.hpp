@@ -1,4 +1,5 @@
-// What a printed text says, found without the printer's knowledge: an independent reader, and the same notation for trees.
+// What a printed text says, found without the printer's knowledge: an independent reader, and the same notation for
+// trees.
 #pragma once
 
 #include "base/core/Nodes.hpp"
@@ -14,8 +15,8 @@ namespace VT::Testing {
 
 enum class Language : bool { C, Quill };
 
-/// A text with every operation in parentheses, read by the language's own levels of operators.  A negative literal and a minus
-/// before a literal are the same.  Throws std::runtime_error for a text that is none.
+/// A text with every operation in parentheses, read by the language's own levels of operators.  A negative literal and
+/// a minus before a literal are the same.  Throws std::runtime_error for a text that is none.
 std::string readingOf(std::string_view text, Language language);
 
 /// A tree in the same notation; in Quill, C's own operators as the calls that the conversion makes of them.
@@ -33,13 +34,19 @@ SymbolicExprId randomTree(SymbolicExprTable& table, Language language, std::mt19
 /// Leaves and operators in few words.
 struct Trees {
     SymbolicExprTable& table;
+
     SymbolicExprId name(const std::string& text) const { return SymbolicString(table, text).getId(table); }
+
     SymbolicExprId integer(int value) const { return SymbolicIntValue(table, value).getId(table); }
+
     SymbolicExprId real(double value) const { return SymbolicDoubleValue(table, value).getId(table); }
+
     SymbolicExprId operator()(SymbolicOp op, std::vector<SymbolicExprId> inputs) const {
         return makeNode(table, op, std::move(inputs));
     }
-    template <std::same_as<SymbolicExprId>... Inputs> SymbolicExprId operator()(SymbolicOp op, Inputs... inputs) const {
+
+    template <std::same_as<SymbolicExprId>... Inputs>
+    SymbolicExprId operator()(SymbolicOp op, Inputs... inputs) const {
         return makeNode(table, op, {inputs...});
     }
 };

@@ -6,6 +6,7 @@
 
 #include <gtest/gtest.h>
 
+#include <bit>
 #include <cmath>
 #include <limits>
 #include <locale>
@@ -24,19 +25,19 @@ struct Writing {
 class Texts : public testing::Test {
 protected:
     void expectWritten(const std::vector<Writing>& writings, bool spaced = false) const {
-        const SymbolicExprPrinter quill(table, true, spaced);
-        const SymbolicExprPrinter c(table, false, spaced);
+        const SymbolicExprPrinter inQuill(table, true, spaced);
+        const SymbolicExprPrinter inC(table, false, spaced);
         for (const Writing& writing : writings) {
-            EXPECT_EQ(quill(writing.id), writing.quill);
-            EXPECT_EQ(c(writing.id), writing.c);
+            EXPECT_EQ(inQuill(writing.id), writing.quill);
+            EXPECT_EQ(inC(writing.id), writing.c);
             StringifySymbolicExpr visitor(table, true, spaced);
             table.get(writing.id)->accept(table, visitor);
             EXPECT_EQ(visitor.get(), writing.quill) << "by accept";
             StringifySymbolicExpr executed(table, false, spaced);
             executed.execute(table, writing.id);
             EXPECT_EQ(executed.get(), writing.c) << "by execute";
-            EXPECT_EQ(c(*table.get(writing.id)), writing.c) << "by node";
-            EXPECT_EQ(c.textLength(writing.id), writing.c.size());
+            EXPECT_EQ(inC(*table.get(writing.id)), writing.c) << "by node";
+            EXPECT_EQ(inC.textLength(writing.id), writing.c.size());
         }
     }
 
@@ -66,7 +67,8 @@ TEST_F(Texts, OperatorsOfBothLanguages) {
         {tree(Op::DimsND), "[]", "[]"},
         {tree(Op::AnonymousFunc, tree(Op::FcnCall1U, tree.name("@"), x), tree(Op::Plus, x, a)), "@(x) x+a", "@(x) x+a"},
     });
-    const SymbolicExprId mixed = tree(Op::Or, tree(Op::And, tree(Op::Equal, a, b), tree(Op::BitAnd, a, b)), tree(Op::SingleAnd, a, tree(Op::SingleOr, b, c)));
+    const SymbolicExprId mixed = tree(Op::Or, tree(Op::And, tree(Op::Equal, a, b), tree(Op::BitAnd, a, b)),
+                                      tree(Op::SingleAnd, a, tree(Op::SingleOr, b, c)));
     expectWritten({{mixed, "a==b&&bitand(a,b)||a&(b|c)", "a==b&&a&b||a&(b|c)"}});
     expectWritten({{mixed, "a==b && bitand(a,b) || a & (b | c)", "a==b && a&b || a & (b | c)"}}, true);
 }
@@ -97,10 +99,13 @@ TEST_F(Texts, CallsForOperatorsThatQuillLacks) {
     expectWritten({
         {quotient, "a/b", "a/b"},
         {tree(Op::Modulo, quotient, c), "rem(idivide(a,b),c)", "a/b%c"},
-        {tree(Op::Plus, quotient, tree(Op::BitXOr, tree(Op::Plus, tree(Op::Divide, quotient, c), x), tree(Op::BitCompl, a))),
+        {tree(Op::Plus, quotient,
+              tree(Op::BitXOr, tree(Op::Plus, tree(Op::Divide, quotient, c), x), tree(Op::BitCompl, a))),
          "a/b+bitxor(idivide(idivide(a,b),c)+x,bitcmp(a))", "a/b+(a/b/c+x^~a)"},
-        {tree(Op::BitOr, tree(Op::FcnCall, x, quotient, a, b), tree(Op::DimsND, quotient)), "bitor(x(idivide(a,b),a,b),[idivide(a,b)])", "x(a/b,a,b)|[a/b]"},
-        {tree(Op::Multiply, a, tree(Op::BitCompl, tree(Op::UnaryMinus, quotient))), "a*bitcmp(-idivide(a,b))", "a*~(-(a/b))"},
+        {tree(Op::BitOr, tree(Op::FcnCall, x, quotient, a, b), tree(Op::DimsND, quotient)),
+         "bitor(x(idivide(a,b),a,b),[idivide(a,b)])", "x(a/b,a,b)|[a/b]"},
+        {tree(Op::Multiply, a, tree(Op::BitCompl, tree(Op::UnaryMinus, quotient))), "a*bitcmp(-idivide(a,b))",
+         "a*~(-(a/b))"},
         {tree(Op::ShiftLeft, a, tree.integer(-2)), "bitshift(a,-2)", "a<<-2"},
         {tree(Op::ShiftLeft, a, minus(tree.integer(2))), "bitshift(a,-2)", "a<<-2"},
         {tree(Op::ShiftRight, a, tree.integer(2)), "bitshift(a,-2)", "a>>2"},
@@ -131,9 +136,12 @@ TEST_F(Texts, RealLiterals) {
 TEST_F(Texts, NumbersReadBackInEveryLocale) {
     struct Comma : std::numpunct<char> {
         char do_decimal_point() const override { return ','; }
+
         char do_thousands_sep() const override { return '.'; }
+
         std::string do_grouping() const override { return "\3"; }
     };
+
     const std::locale before = std::locale::global(std::locale(std::locale::classic(), new Comma));
     std::mt19937_64 random(7);
     for (int i = 0; i < 2000; ++i) {
@@ -174,7 +182,9 @@ class Airy : public StringifySymbolicExpr {
 public:
     using StringifySymbolicExpr::StringifySymbolicExpr;
     using StringifySymbolicExpr::visit;
+
     void visit(const SymbolicString& node) override { push(Op::String, "<" + identifier(node) + ">", 0); }
+
     void visit(const SymbolicMemberValue& node) override {
         push(Op::String, node.getMemberName(), 0);
         appendBinary(Op::MemberValue, " of kind ", 1, OpAssociativity::Left);

@@ -1,0 +1,86 @@
+// Storage of a table's nodes, addressed by numbers of 32 bits, so that the slots of its index are small.
+#pragma once
+
+#include "base/core/Node.hpp"
+
+#include <algorithm>
+#include <cstdint>
+#include <memory>
+#include <new>
+#include <stdexcept>
+#include <vector>
+
+namespace VT {
+
+/// What stands before a node: all that a probe wants to know lies in one cache line.
+struct NodeCell {
+    /// The code of a node that was added from outside and may be of any class: a pointer to it stands in its place.
+    static constexpr std::uint32_t foreign = ~std::uint32_t{0};
+
+    std::uint32_t id;   ///< cells run out before these numbers do
+    std::uint32_t code; ///< operator of a node whose class is the library's own
+
+    [[nodiscard]] bool isOf(SymbolicOp op) const noexcept { return code == static_cast<std::uint32_t>(op); }
+
+    [[nodiscard]] const SymbolicExpr* node() const noexcept {
+        const void* behind = this + 1;
+        return code == foreign ? *static_cast<const SymbolicExpr* const*>(behind)
+                               : static_cast<const SymbolicExpr*>(behind);
+    }
+};
+
+/// Hands out cells from chunks that it frees together; what stands in them is its user's to destroy.  Never moves them.
+class CellStore {
+public:
+    /// Names a cell; 0 names none.
+    using Number = std::uint32_t;
+
+    /// Room for a cell and so many bytes behind it, for an object no more aligned than a pointer.  Throws std::bad_alloc,
+    /// or std::length_error when the numbers run out at 128 GiB.
+    Number allocate(std::size_t bytes) {
+        const std::size_t units = (sizeof(NodeCell) + bytes + unit - 1) / unit;
+        if (next_ + units > end_)
+            grow();
+        const auto number = static_cast<Number>(next_);
+        next_ += units;
+        return number;
+    }
+
+    /// Takes back the cell handed out last.
+    void release(Number last) noexcept { next_ = last; }
+
+    [[nodiscard]] void* at(Number number) const noexcept {
+        return chunks_[number >> chunkBits].get() + (number & chunkMask) * unit;
+    }
+
+private:
+    static constexpr std::size_t unit = 32;
+    static constexpr std::align_val_t lineSize{64}; // so that the cell of a binary node lies in one cache line
+    static constexpr unsigned chunkBits = 20;
+    static constexpr std::uint32_t chunkMask = (std::uint32_t{1} << chunkBits) - 1;
+    static constexpr std::size_t mostChunks = std::size_t{1} << (32 - chunkBits);
+    static constexpr std::size_t firstUnits = 128;
+    static constexpr std::size_t doublings = 13; // until a chunk is as large as its numbers allow
+    static constexpr std::size_t reserved = 1;  // keeps number 0 free
+
+    struct Free {
+        void operator()(std::byte* chunk) const noexcept { ::operator delete(chunk, lineSize); }
+    };
+
+    void grow() {
+        if (chunks_.size() == mostChunks)
+            throw std::length_error("expression table: no room for another node");
+        const std::size_t units = firstUnits << std::min(chunks_.size(), doublings);
+        const std::size_t first = chunks_.size() << chunkBits;
+        chunks_.reserve(chunks_.size() + 1);
+        chunks_.emplace_back(static_cast<std::byte*>(::operator new(units * unit, lineSize)));
+        next_ = first + (first == 0 ? reserved : 0);
+        end_ = first + units;
+    }
+
+    std::vector<std::unique_ptr<std::byte, Free>> chunks_;
+    std::size_t next_ = 0; // wider than a number, because the end of the last chunk is none
+    std::size_t end_ = 0;
+};
+
+} // namespace VT

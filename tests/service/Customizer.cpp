@@ -1,0 +1,175 @@
+// What a customizer may decide, and what it may not break.
+#include "base/simplify/Simplify.hpp"
+#include "base/simplify/SimplifyVisitorBlockVariants.hpp"
+#include "tests/service/Customizers.hpp"
+
+#include <stdexcept>
+
+namespace VT::Testing {
+namespace {
+
+/// A customizer's rewrite to the condition of a text, whatever the condition was.
+auto rewriteTo(const std::string& text) {
+    return [text](SymbolicExprId, SymbolicExprTable&) { return VCService::getInstance().parseC(text); };
+}
+
+TEST(Customizer, IsReleasedOnceItsSuccessorIsInPlace) {
+    TestCustomizer first;
+    TestCustomizer second;
+    {
+        const FreshService service;
+        first.onRelease = [&] { service->simplify(service->parseC("A<A"), true); };
+        service->setVCCustomizer(&first);
+        service->setVCCustomizer(&first);
+        EXPECT_EQ(first.releases, 0);
+        service->setVCCustomizer(&second);
+        EXPECT_EQ(first.releases, 1);
+        EXPECT_EQ(first.rewrites, 0);
+        EXPECT_EQ(second.rewrites, 1); // by the call from the release
+        service->setVCCustomizer(nullptr);
+        EXPECT_EQ(second.releases, 1);
+        service->setVCCustomizer(&second);
+    }
+    EXPECT_EQ(first.releases, 1);
+    EXPECT_EQ(second.releases, 2);
+}
+
+TEST(Customizer, MayUseTheServiceWhileOneEnds) {
+    TestCustomizer customizer;
+    std::string answer;
+    customizer.onRelease = [&] { answer = VCService::getInstance().simplifyCExprFromCCondition("A>2 && A>5"); };
+    {
+        const FreshService service;
+        service->setVCCustomizer(&customizer);
+    }
+    EXPECT_EQ(answer, "A>5");
+    VCService::clean(); // the one that the release made
+}
+
+TEST(Customizer, RewriteCountsWhereItDecides) {
+    struct Row {
+        const char* condition;
+        const char* rewritten;
+        const char* result;
+        const char* unasked; // past the customizer
+    };
+
+    constexpr Row rows[] = {
+        {"A==1", "true", "", "A==1"},         {"A==1", "B==1 && B==2", "false", "A==1"},
+        {"A==1", "B==1 || B!=1", "", "A==1"}, {"A==1", "B==1", "A==1", "A==1"},
+        {"A>2 && A>5", "B", "A>5", "A>5"},    {"true", "false", "", ""},
+        {"false", "true", "false", "false"},
+    };
+    for (const Row& row : rows) {
+        for (const bool isQuill : {false, true}) {
+            SCOPED_TRACE(std::string(row.condition) + " rewritten to " + row.rewritten);
+            const FreshService service;
+            TestCustomizer customizer;
+            customizer.onRewrite = rewriteTo(row.rewritten);
+            service->setVCCustomizer(&customizer);
+            EXPECT_EQ(service->printCExpr(service->simplify(service->parseC(row.condition), isQuill)), row.result);
+            EXPECT_EQ(service->simplifyExpressionWithoutEvalChecks(row.condition, false, false), row.unasked);
+        }
+    }
+}
+
+TEST(Customizer, RewriteToNoConditionIsNone) {
+    const FreshService service;
+    TestCustomizer customizer;
+    service->setVCCustomizer(&customizer);
+    for (const SymbolicExprId bad : {invalidId, SymbolicExprId{1} << 40U}) {
+        customizer.onRewrite = [bad](SymbolicExprId, SymbolicExprTable&) { return bad; };
+        EXPECT_EQ(service->printCExpr(service->simplify(service->parseC("A>=3 && A<=3"), bad == invalidId)), "A==3");
+    }
+}
+
+TEST(Customizer, ExceptionsPassAndNothingIsKept) {
+    const FreshService service;
+    TestCustomizer customizer;
+    service->setVCCustomizer(&customizer);
+    customizer.onRewrite = [](SymbolicExprId, SymbolicExprTable&) -> SymbolicExprId { throw std::domain_error("no"); };
+    const VCSymbolicExprId condition = service->parseC("A==1");
+    EXPECT_THROW(service->simplify(condition, true), std::domain_error);
+    EXPECT_THROW(service->simplifyFromCCondition("A==1"), std::domain_error);
+    EXPECT_THROW(service->AND(condition, service->parseC("B"), true), std::domain_error);
+    customizer.onRewrite = rewriteTo("true");
+    EXPECT_TRUE(service->getBoolean(service->simplify(condition, true).id()));
+    EXPECT_TRUE(service->getBoolean(service->simplifyFromCCondition("A==1").id()));
+}
+
+TEST(Customizer, CachesKeepTheirAnswersByLanguage) {
+    for (const bool caching : {true, false}) {
+        const FreshService service(caching);
+        TestCustomizer customizer;
+        service->setVCCustomizer(&customizer);
+        const SymbolicExprId condition = service->parseC("A==1");
+        const auto rewritesOf = [&](auto&& call) {
+            customizer.rewrites = 0;
+            call();
+            return customizer.rewrites;
+        };
+        const int again = caching ? 0 : 1;
+        EXPECT_EQ(rewritesOf([&] { service->simplify(condition, true); }), 1);
+        EXPECT_EQ(rewritesOf([&] { service->simplify(condition, true); }), again);
+        EXPECT_EQ(rewritesOf([&] { service->simplifyFromCCondition("A == 1"); }), 1);
+        EXPECT_EQ(rewritesOf([&] { service->simplify(condition, false); }), again);
+        EXPECT_EQ(rewritesOf([&] { service->simplifyFromCCondition("A == 1"); }), again);
+        // Another customizer does not undo what is known.
+        TestCustomizer other;
+        other.onRewrite = rewriteTo("true");
+        service->setVCCustomizer(&other);
+        EXPECT_EQ(service->getBoolean(service->simplify(condition, true).id()), !caching);
+        service->setVCCustomizer(nullptr);
+    }
+}
+
+TEST(Customizer, ConfirmsSelfComparisonsInQuillMode) {
+    struct Row {
+        const char* text;
+        const char* agreed;
+        const char* refused;
+        const char* asked; // about the replacement by this
+    };
+
+    constexpr Row rows[] = {
+        {"P<P", "false", "", "false"},  {"P==P", "", "false", "true"}, {"P>=P", "", "false", "true"},
+        {"P!=P", "false", "", "false"}, {"P>P", "false", "", "false"}, {"P<=P", "", "false", "true"},
+    };
+    for (const Row& row : rows) {
+        SCOPED_TRACE(row.text);
+        for (const bool agrees : {true, false}) {
+            const FreshService service;
+            const VCSymbolicExprId condition = service->parseC(row.text);
+            TestCustomizer customizer;
+            customizer.agrees = agrees;
+            service->setVCCustomizer(&customizer);
+            EXPECT_EQ(service->printCExpr(service->simplify(condition, false)), row.agreed);
+            EXPECT_TRUE(customizer.questions.empty());
+            EXPECT_EQ(service->printCExpr(service->simplify(condition, true)), agrees ? row.agreed : row.refused);
+            ASSERT_FALSE(customizer.questions.empty());
+            EXPECT_EQ(customizer.questions.front(), std::pair(service->printQExpr(condition), std::string(row.asked)));
+            service->setVCCustomizer(nullptr);
+        }
+        const FreshService alone;
+        EXPECT_EQ(alone->printCExpr(alone->simplify(alone->parseC(row.text), true)), row.agreed);
+    }
+}
+
+TEST(Customizer, VisitorWithNobodyToAskAnswersTheOtherWayRound) {
+    const FreshService service;
+    const SymbolicExprSimplify& simplifier = service->simplifier();
+    const auto simplified = [&](const char* text, bool ask, VCCustomizer* customizer) {
+        SymbolicExprSimplifyVisitorBlockVariants visitor(service->table(), true, simplifier.printer(), ask, customizer);
+        std::uint64_t passes = 0;
+        return service->printCExpr(simplifier.simplify(service->parseC(text), passes, visitor));
+    };
+    TestCustomizer agreeing;
+    EXPECT_EQ(simplified("P==P", true, nullptr), "false");
+    EXPECT_EQ(simplified("P<P", true, nullptr), "");
+    EXPECT_EQ(simplified("P==P", false, nullptr), "");
+    EXPECT_EQ(simplified("P==P", true, &agreeing), "");
+    EXPECT_EQ(simplified("P<P || P>2 && P>3", true, &agreeing), "P>3");
+}
+
+} // namespace
+} // namespace VT::Testing

@@ -1,0 +1,293 @@
+// The program: what it answers, what it says, and its exit status.
+#include "base/core/Operators.hpp"
+#include "tests/support/Corpus.hpp"
+#include "tests/tools/Program.hpp"
+
+#include <nlohmann/json.hpp>
+#include <sstream>
+
+namespace VT::Testing {
+namespace {
+
+using ::testing::AllOf;
+using ::testing::HasSubstr;
+using ::testing::Not;
+using Json = nlohmann::json;
+
+std::vector<std::string> linesOf(const std::string& text) {
+    std::vector<std::string> lines;
+    std::istringstream stream(text);
+    for (std::string line; std::getline(stream, line);)
+        lines.push_back(line);
+    return lines;
+}
+
+struct Row {
+    std::vector<std::string> arguments;
+    std::string input;
+    std::string output;
+    std::vector<std::string> words; ///< parts of standard error; none for silence
+    int status;
+};
+
+void expectRows(const std::vector<Row>& rows) {
+    for (const Row& row : rows) {
+        std::string trace = "vtsym";
+        for (const std::string& argument : row.arguments)
+            trace += " '" + argument + "'";
+        SCOPED_TRACE(trace + " < '" + row.input + "'");
+        const ProgramResult result = runProgram({row.arguments, row.input, {}, {}});
+        EXPECT_EQ(result.output, row.output);
+        EXPECT_EQ(result.status, row.status);
+        EXPECT_EQ(result.words.empty(), row.words.empty()) << result.words;
+        for (const std::string& part : row.words)
+            EXPECT_THAT(result.words, HasSubstr(part));
+    }
+}
+
+TEST(Program, AnswersTexts) {
+    expectRows({
+        {{"simplify", "Mode == 1 && Mode == 2"}, "", "false\n", {}, 0},
+        {{"simplify", "A>2 && A<4", "A==1 || A!=1", "", "true", "false"}, "", "A==3\ntrue\ntrue\ntrue\nfalse\n", {}, 0},
+        {{"simplify", "--to", "quill", "a / b == 1 && x != 2"}, "", "idivide(a,b)==1 && x~=2\n", {}, 0},
+        {{"simplify", "--", "-x", "-5 < A"}, "", "-x\nA>-5\n", {}, 0},
+        {{"simplify", "[1,2] == tree", "{}"}, "", "[1,2]==tree\n\n", {"line 2:"}, 1},
+        {{"convert", "Mode==1&&!(Gear>2)"}, "", "Mode==1 && !(Gear>2)\n", {}, 0},
+        {{"convert", "--to=quill", "(F & 4) != 0 && a % b == 1"}, "", "bitand(F,4)~=0 && rem(a,b)==1\n", {}, 0},
+        {{"convert", "(sim)"}, "", "(sim)\n", {}, 0},
+        {{"convert", "--feature", "VariantKeywordsSimCodegen=0", "(sim)"}, "", "sim\n", {}, 0},
+        {{"--feature", "VariantKeywordsSimCodegen=0", "convert", "(sim)"}, "", "sim\n", {}, 0},
+        {{"simplify", "A==1 || false", "-", "B"}, "C>1&&C>2\nD", "A==1\nC>2\nD\nB\n", {}, 0},
+    });
+}
+
+TEST(Program, AnswersEachLineByOneLine) {
+    expectRows({
+        {{"simplify"}, "", "", {}, 0},
+        {{"simplify"}, "A==1 && A==2\n\nA\r\nlast", "false\ntrue\nA\nlast\n", {}, 0},
+        {{"convert"}, "a b\nc\n(\n", "\nc\n\n", {"line 1: ", "\n  a b\n    ^\n", "line 3: ", "\n  (\n  ^\n"}, 1},
+        {{"convert"}, std::string("a\0b\n\n", 5), "\ntrue\n", {"line 1: ", "\n  a\\x00b\n   ^\n"}, 1},
+        {{"convert"}, "\xc3\xa9\xff\n", "\n", {"\n  \xc3\xa9\\xff\n  ^\n"}, 1},
+        {{"simplify", "--json"},
+         "A == 1 && A == 2\na \xff\n",
+         "{\"line\":1,\"input\":\"A == 1 && A == 2\",\"result\":\"false\",\"passes\":1}\n"
+         "{\"line\":2,\"input\":\"a "
+         "\xef\xbf\xbd\",\"error\":{\"id\":\"Vantor:Variants:ExpressionParseError\",\"message\":"
+         "\"The condition \\\"a \\\\xff\\\" cannot be read at byte 3, before \\\"\\\\xff\\\".\",\"offset\":2}}\n",
+         {},
+         1},
+        {{"convert", "--json", "--to", "quill"},
+         "a!=1",
+         "{\"line\":1,\"input\":\"a!=1\",\"result\":\"a~=1\"}\n",
+         {},
+         0},
+    });
+}
+
+TEST(Program, ExplainsSimplification) {
+    expectRows({
+        {{"simplify", "--explain", "!(A < 3) || A == 2", "A"},
+         "",
+         "!(A<3) || A==2\npass 1\n  negated comparison  !(A<3)  =>  A>=3\n"
+         "  joined range        A>=3 || A==2  =>  A>=2\n= A>=2\n\nA\n  no rule applies\n= A\n",
+         {},
+         0},
+        {{"simplify", "--explain", "--json", "A && true"},
+         "",
+         "{\"line\":1,\"input\":\"A && true\",\"result\":\"A\",\"passes\":2,\"steps\":[{\"pass\":1,\"rule\":"
+         "\"true operand of And\",\"before\":\"A && true\",\"after\":\"A\"}]}\n",
+         {},
+         0},
+    });
+}
+
+TEST(Program, ShowsTrees) {
+    expectRows({
+        {{"tree", "Mode == 1 && s.gear > 2.5", "x"},
+         "",
+         "And &&\n├─ Equal ==\n│  ├─ Mode\n│  └─ 1\n└─ GreaterThan >\n   ├─ MemberValue .gear\n   │  └─ s\n"
+         "   └─ 2.5 (real literal)\n\nx\n",
+         {},
+         0},
+        {{"tree", "(a+b)*(a+b)"}, "", "Multiply *\n├─ #4 Plus +\n│  ├─ a\n│  └─ b\n└─ #4 as above\n", {}, 0},
+        {{"tree", "--json"},
+         "N+1\n(a+b)*(a+b)\ns.x<.5\ntrue\n",
+         R"json({"line":1,"input":"N+1","tree":{"kind":"SymbolicPlusExpr","op":3,"id":4,"inputs":[{"kind":"SymbolicString","op":0,"id":3,"text":"N"},{"kind":"SymbolicIntValue","op":1,"id":2,"value":1}]}}
+{"line":2,"input":"(a+b)*(a+b)","tree":{"kind":"SymbolicMultiplyExpr","op":6,"id":5,"inputs":[{"kind":"SymbolicPlusExpr","op":3,"id":4,"inputs":[{"kind":"SymbolicString","op":0,"id":3,"text":"a"},{"kind":"SymbolicString","op":0,"id":2,"text":"b"}]},{"id":4}]}}
+{"line":3,"input":"s.x<.5","tree":{"kind":"SymbolicLessThanExpr","op":11,"id":6,"inputs":[{"kind":"SymbolicMemberValue","op":31,"id":5,"name":"x","inputs":[{"kind":"SymbolicString","op":0,"id":3,"text":"s"}]},{"kind":"SymbolicDoubleValue","op":2,"id":2,"value":0.5}]}}
+{"line":4,"input":"true","tree":{"kind":"SymbolicString","op":0,"id":1,"text":"true"}}
+)json",
+         {},
+         0},
+        {{"tree", "--dot", "N*2 + N"},
+         "",
+         "digraph expression {\n  node [shape=box, fontname=monospace];\n  n2 [label=\"N\", style=rounded];\n"
+         "  n3 [label=\"2\", style=rounded];\n  n4 [label=\"Multiply *\"];\n  n4 -> n2;\n  n4 -> n3;\n"
+         "  n5 [label=\"Plus +\"];\n  n5 -> n4;\n  n5 -> n2;\n}\n",
+         {},
+         0},
+    });
+}
+
+TEST(Program, DrawsDeepTreesInBoundedColumns) {
+    std::string sum = "x0";
+    for (int i = 1; i < 3000; ++i)
+        sum += "+x" + std::to_string(i);
+    const std::vector<std::string> lines = linesOf(runProgram({{"tree"}, sum, {}, {}}).output);
+    std::size_t operators = 0;
+    std::size_t leaves = 0;
+    std::size_t widest = 0;
+    for (const std::string& line : lines) {
+        widest = std::max(widest, line.size());
+        operators += line.ends_with("Plus +") ? 1U : 0U;
+        leaves += line.find(" x") != std::string::npos ? 1U : 0U;
+    }
+    EXPECT_EQ(operators, 2999U);
+    EXPECT_EQ(leaves, 3000U);
+    EXPECT_LT(widest, 200U);
+}
+
+TEST(Program, ListsOperators) {
+    const std::vector<std::string> lines = linesOf(runProgram({{"operators"}, "", {}, {}}).output);
+    const std::vector<std::string> objects = linesOf(runProgram({{"operators", "--json"}, "", {}, {}}).output);
+    ASSERT_EQ(lines.size(), operatorTable().size() + 1);
+    ASSERT_EQ(objects.size(), operatorTable().size());
+    for (std::size_t i = 0; i < objects.size(); ++i) {
+        const OperatorInfo& row = operatorTable()[i];
+        const Json object = Json::parse(objects[i]);
+        EXPECT_EQ(object["op"], static_cast<int>(row.op));
+        EXPECT_EQ(object["kind"], row.className);
+        EXPECT_EQ(object["c"], row.c);
+        EXPECT_EQ(object["quill"], row.quill);
+        EXPECT_EQ(object["precedence"], row.precedence);
+        EXPECT_THAT(lines[i + 1], AllOf(HasSubstr(std::string(row.name)), HasSubstr(std::string(row.meaning))));
+    }
+}
+
+TEST(Program, RefusesWrongUsageWithAHint) {
+    expectRows({
+        {{}, "", "", {"a command is missing", "Usage: vtsym"}, 2},
+        {{"--feature", "VariantKeywordsSimCodegen=0"}, "", "", {"a command is missing"}, 2},
+        {{"simplfy", "a"}, "", "", {"there is no command 'simplfy'; did you mean simplify?", "Try 'vtsym --help'"}, 2},
+        {{"frobnicate"}, "", "", {"there is no command 'frobnicate'\n"}, 2},
+        {{"simplify", "-x"}, "", "", {"there is no option '-x'", "goes behind --", "Try 'vtsym simplify --help'"}, 2},
+        {{"operators", "x"}, "", "", {"'x' is one argument too many", "Try 'vtsym operators --help'"}, 2},
+        {{"convert", "--to", "basic", "a"}, "", "", {"--to: 'basic' is not offered; c or quill is"}, 2},
+        {{"simplify", "--from", "quill", "a"}, "", "", {"--from: 'quill' is not offered; c is"}, 2},
+        {{"tree", "--json", "--dot", "a"}, "", "", {"--json", "--dot"}, 2},
+        {{"simplify", "--feature", "Nope=1", "a"}, "", "", {"there is no feature flag \"Nope\""}, 2},
+        {{"simplify", "--feature", "VariantKeywordsSimCodegen=x", "a"}, "", "", {"--feature: "}, 2},
+    });
+}
+
+TEST(Program, HelpsOnRequest) {
+    for (const char* command : {"", "simplify", "convert", "tree", "operators"}) {
+        SCOPED_TRACE(command);
+        std::vector<std::string> asked{command, "--help"};
+        std::vector<std::string> helped{"help", command};
+        if (*command == '\0') {
+            asked.erase(asked.begin());
+            helped.pop_back();
+        }
+        const ProgramResult help = runProgram({asked, "", {}, {}});
+        EXPECT_EQ(help.status, 0);
+        EXPECT_EQ(help.words, "");
+        EXPECT_THAT(help.output, AllOf(HasSubstr("Examples:\n  vtsym "), HasSubstr(command)));
+        EXPECT_EQ(runProgram({helped, "", {}, {}}).output, help.output);
+    }
+    EXPECT_THAT(runProgram({{"--version"}, "", {}, {}}).output,
+                ::testing::MatchesRegex("vtsym [0-9]+\\.[0-9]+\\.[0-9]+\n"));
+}
+
+TEST(Program, AnswersTheSameHoweverItIsAsked) {
+    std::string input;
+    for (const CorpusFile& file : corpusFiles) {
+        const std::vector<std::string> lines = corpusLines(file.name);
+        for (std::size_t i = 0; i < lines.size(); i += 7)
+            input += lines[i] + "\n";
+    }
+    const std::size_t count = linesOf(input).size();
+    ASSERT_GT(count, 1000U);
+    const ProgramResult plain = runProgram({{"simplify"}, input, {}, {}});
+    const ProgramResult uncached =
+        runProgram({{"simplify"}, input, {"VTSYM_FEATURES=CacheSymExprSimplifyResults=0"}, {}});
+    const ProgramResult detailed = runProgram({{"simplify", "--json", "--explain"}, input, {}, {}});
+    EXPECT_EQ(uncached.output, plain.output);
+    EXPECT_EQ(uncached.words, plain.words);
+    const std::vector<std::string> answers = linesOf(plain.output);
+    const std::vector<std::string> objects = linesOf(detailed.output);
+    const std::vector<std::string> inputs = linesOf(input);
+    ASSERT_EQ(answers.size(), count);
+    ASSERT_EQ(objects.size(), count);
+    for (std::size_t i = 0; i < count; ++i) {
+        const Json object = Json::parse(objects[i]);
+        EXPECT_EQ(object["line"], i + 1);
+        EXPECT_EQ(object.value("result", std::string()), answers[i]);
+        EXPECT_EQ(object.contains("error"), answers[i].empty());
+        EXPECT_EQ(object["input"], inputs[i]);
+    }
+}
+
+TEST(Program, OutlivesHostileTexts) {
+    std::string everyByte;
+    for (int byte = 0; byte < 256; ++byte)
+        everyByte += byte == '\n' ? ' ' : static_cast<char>(byte);
+    const std::string longText = [] {
+        std::string text;
+        for (int i = 0; i < 100'000; ++i)
+            text += "a == 1 && ";
+        return text + "b c";
+    }();
+    const std::vector<std::string> texts{std::string(200'000, '('),
+                                         std::string(3'000'000, 'x'),
+                                         everyByte,
+                                         "1.e999999999",
+                                         std::string(500'000, '9'),
+                                         longText};
+    std::string input;
+    for (const std::string& text : texts)
+        input += text + "\n";
+    for (const std::vector<std::string>& arguments :
+         std::vector<std::vector<std::string>>{{"simplify"}, {"simplify", "--explain"}, {"convert"}, {"tree"}}) {
+        const ProgramResult result = runProgram({arguments, input, {}, {}});
+        EXPECT_EQ(result.status, 1);
+        EXPECT_THAT(result.output, HasSubstr(texts[1].substr(0, 90)));
+        for (const std::string& line : linesOf(result.words)) // messages and carets stay on a screen
+            EXPECT_LT(line.size(), 400U);
+        EXPECT_THAT(result.words, HasSubstr("== 1 && a == 1 && b c\n"));
+        EXPECT_THAT(result.words, Not(HasSubstr(std::string(1, '\x01'))));
+        std::vector<std::string> withJson = arguments;
+        withJson.emplace_back("--json");
+        const std::vector<std::string> objects = linesOf(runProgram({withJson, input, {}, {}}).output);
+        ASSERT_EQ(objects.size(), texts.size());
+        for (std::size_t i = 0; i < objects.size(); ++i)
+            EXPECT_EQ(Json::parse(objects[i]).contains("error"), i != 1);
+    }
+}
+
+TEST(Program, EndsWhenOutputFails) {
+    for (const std::vector<std::string>& arguments :
+         {std::vector<std::string>{"simplify", "a"}, {"operators"}, {"--help"}}) {
+        const ProgramResult full = runProgram({arguments, "", {}, OutputTo::FullDevice});
+        EXPECT_EQ(full.status, 1);
+        EXPECT_THAT(full.words, HasSubstr("vtsym: standard output cannot be written: "));
+        const ProgramResult unread = runProgram({arguments, "", {}, OutputTo::ClosedPipe});
+        EXPECT_EQ(unread.status, 1);
+        EXPECT_EQ(unread.words, "");
+    }
+}
+
+TEST(Program, ColoursOnlyATerminalThatWantsThem) {
+    const std::vector<std::string> arguments{"simplify", "a b", "A==1 && A==2"};
+    const auto onTerminal = [&](std::vector<std::string> environment) {
+        return runOnTerminal({arguments, "", std::move(environment), {}}).output;
+    };
+    EXPECT_THAT(onTerminal({}), AllOf(HasSubstr("\033["), HasSubstr("false")));
+    EXPECT_THAT(onTerminal({"NO_COLOR="}), HasSubstr("\033["));
+    EXPECT_THAT(onTerminal({"NO_COLOR=1"}), AllOf(Not(HasSubstr("\033")), HasSubstr("false")));
+    EXPECT_THAT(onTerminal({"TERM=dumb"}), Not(HasSubstr("\033")));
+    EXPECT_THAT(runProgram({arguments, "", {}, {}}).words, Not(HasSubstr("\033")));
+}
+
+} // namespace
+} // namespace VT::Testing

@@ -1,0 +1,145 @@
+// The two shapes of one operation: C operators and calls of Quill functions.
+#include "base/transform/QuillConversion.hpp"
+#include "tests/support/Parsing.hpp"
+#include "tests/support/TreeText.hpp"
+
+#include <gtest/gtest.h>
+
+namespace VT::Testing {
+namespace {
+
+struct Conversion {
+    std::string from; ///< as C text
+    std::string to;   ///< as a tree
+};
+
+class QuillConversion : public testing::Test {
+protected:
+    SymbolicExprId read(const std::string& text) {
+        const ParseAnswer answer = parse(table, text);
+        EXPECT_FALSE(answer.error) << text;
+        return answer.id;
+    }
+
+    template <class Driver>
+    void expectConverted(const std::vector<Conversion>& conversions) {
+        for (const auto& [from, to] : conversions)
+            EXPECT_EQ(treeText(table, Driver(table)(read(from))), to) << from;
+    }
+
+    template <class Driver>
+    void expectUnchanged(const std::vector<std::string>& texts) {
+        for (const std::string& text : texts)
+            EXPECT_EQ(Driver(table)(read(text)), read(text)) << text;
+    }
+
+    SymbolicExprTable table;
+};
+
+TEST_F(QuillConversion, NamesAreInternedInOrder) {
+    SymbolicExprQ2CVisitor visitor(table);
+    std::string names;
+    for (SymbolicExprId id = 0; id < table.size(); ++id)
+        names += treeText(table, id) + " ";
+    EXPECT_EQ(names, "idivide rem bitand bitor bitxor bitcmp bitshift ");
+    EXPECT_EQ(visitor.get(), invalidId);
+}
+
+TEST_F(QuillConversion, CallsBecomeOperators) {
+    expectConverted<SymbolicExprQ2C>({
+        {"idivide(a, rem(b, c))", "Divide(a,Modulo(b,c))"},
+        {"bitand(a, b) + bitor(a, b)", "Plus(BitAnd(a,b),BitOr(a,b))"},
+        {"g(bitxor(a, bitcmp(b)))", "FcnCall(g,BitXOr(a,BitCompl(b)))"},
+        {"bitshift(a, 2)", "ShiftLeft(a,2)"},
+        {"bitshift(a, 0)", "ShiftLeft(a,0)"},
+        {"bitshift(a, -2)", "ShiftRight(a,2)"},
+        {"bitshift(a, - 2)", "ShiftRight(a,2)"},
+        {"bitshift(a, - 0)", "ShiftLeft(a,0)"},
+        {"bitshift(a, -(-2))", "ShiftLeft(a,2)"},
+        {"bitshift(a, n)", "ShiftLeft(a,n)"},
+        {"bitshift(a, -n)", "ShiftRight(a,n)"},
+        {"bitshift(a, -rem(b, c))", "ShiftRight(a,Modulo(b,c))"},
+        {"bitshift(a, -2147483648)", "FcnCall(bitshift,a,-2147483648)"},
+        {"bitshift(a, -(-2147483648))", "ShiftLeft(a,UnaryMinus(-2147483648))"},
+        {"bitshift(a, -2147483647)", "ShiftRight(a,2147483647)"},
+    });
+    expectUnchanged<SymbolicExprQ2C>(
+        {"rem(a)", "rem(a, b, c)", "bitcmp(a, b)", "bitcmp()", "idivide + bitand", "a / b % c", "f(a, b)"});
+}
+
+TEST_F(QuillConversion, OperatorsBecomeCalls) {
+    expectConverted<SymbolicExprC2Q>({
+        {"a / b % c", "FcnCall2U(rem,FcnCall2U(idivide,a,b),c)"},
+        {"(a & b | ~c) ^ a", "FcnCall2U(bitxor,FcnCall2U(bitor,FcnCall2U(bitand,a,b),FcnCall1U(bitcmp,c)),a)"},
+        {"a << 2", "FcnCall2U(bitshift,a,2)"},
+        {"a << -2", "FcnCall2U(bitshift,a,-2)"},
+        {"a << - 2", "FcnCall2U(bitshift,a,-2)"},
+        {"a << -n", "FcnCall2U(bitshift,a,UnaryMinus(n))"},
+        {"a << -(-2147483648)", "FcnCall2U(bitshift,a,UnaryMinus(-2147483648))"},
+        {"a >> 2", "FcnCall2U(bitshift,a,-2)"},
+        {"a >> n", "FcnCall2U(bitshift,a,UnaryMinus(n))"},
+        {"a >> -n", "FcnCall2U(bitshift,a,n)"},
+        {"a >> -(b / c)", "FcnCall2U(bitshift,a,FcnCall2U(idivide,b,c))"},
+        {"a >> - 2", "FcnCall2U(bitshift,a,2)"},
+        {"a >> -2147483648", "FcnCall2U(bitshift,a,UnaryMinus(-2147483648))"},
+    });
+    expectUnchanged<SymbolicExprC2Q>({"rem(a, b)", "a + b * c == !d || x.y < -3"});
+}
+
+TEST_F(QuillConversion, ThereAndBackIsTheSame) {
+    for (const char* call : {"idivide", "rem", "bitand", "bitor", "bitxor", "bitshift"})
+        for (const char* left : {"a", "7", "-7", "bitcmp(b)"})
+            for (const char* right : {"b", "0", "3", "-3", "-2147483648", "-b", "rem(a, 2)"}) {
+                const SymbolicExprId id = read(std::string(call) + "(" + left + "," + right + ")");
+                EXPECT_EQ(SymbolicExprC2Q(table)(SymbolicExprQ2C(table)(id)), id) << call << left << right;
+            }
+}
+
+TEST_F(QuillConversion, TheCallClassDoesNotMatter) {
+    const SymbolicExprId a = read("a"), b = read("b");
+    for (const bool genericFirst : {false, true}) {
+        SymbolicExprTable fresh;
+        const SymbolicExprId x = SymbolicString(fresh, "x").getId(fresh);
+        const std::string name = "rem";
+        if (genericFirst)
+            SymbolicFcnCallExpr(fresh, name, std::vector{x, x});
+        const SymbolicExprId call = SymbolicFcnCall2UExpr(fresh, name, x, x).getId(fresh);
+        EXPECT_EQ(treeText(fresh, SymbolicExprQ2C(fresh)(call)), "Modulo(x,x)");
+    }
+    EXPECT_EQ(
+        treeText(table, SymbolicExprQ2C(table)(SymbolicFcnCallExpr(table, std::vector<SymbolicExprId>{}).getId(table))),
+        "FcnCall()");
+    const SymbolicExprId computed = SymbolicFcnCall2UExpr(table, read("rem + 1"), a, b).getId(table);
+    EXPECT_EQ(SymbolicExprQ2C(table)(computed), computed);
+}
+
+TEST_F(QuillConversion, IdentifiersThatAreNotOfTheTable) {
+    read("a");
+    for (const SymbolicExprId id :
+         {invalidId, SymbolicExprId{1}, SymbolicExprId{3}}) { // those of the names that will be interned
+        SymbolicExprTable small;
+        const SymbolicString a(small, "a");
+        EXPECT_EQ(SymbolicExprQ2C(small)(id), invalidId);
+        SymbolicExprTable other;
+        const SymbolicString alike(other, "a");
+        EXPECT_EQ(SymbolicExprC2Q(other)(id), invalidId);
+    }
+}
+
+TEST_F(QuillConversion, SharedAndDeepExpressions) {
+    SymbolicExprId doubled = read("a / b");
+    for (int i = 0; i < 64; ++i)
+        doubled = SymbolicModuloExpr(table, doubled, doubled).getId(table);
+    const SymbolicExprId quill = SymbolicExprC2Q(table)(doubled);
+    EXPECT_EQ(table.get(quill)->op(), SymbolicOp::FcnCall2U);
+    EXPECT_EQ(SymbolicExprQ2C(table)(quill), doubled);
+
+    SymbolicExprId spine = read("a");
+    for (int i = 0; i < 300'000; ++i)
+        spine = i % 2 == 0 ? SymbolicDivideExpr(table, spine, SymbolicExprId{0}).getId(table)
+                           : SymbolicShiftRightExpr(table, SymbolicExprId{0}, spine).getId(table);
+    EXPECT_EQ(SymbolicExprQ2C(table)(SymbolicExprC2Q(table)(spine)), spine);
+}
+
+} // namespace
+} // namespace VT::Testing

@@ -1,0 +1,27 @@
+// The commands of the program.
+#pragma once
+
+#include "tools/vtsym/Console.hpp"
+
+#include <CLI/CLI.hpp>
+
+#include <functional>
+#include <memory>
+
+namespace vtsym {
+
+/// What a command does once the command line has been read; true for success.
+using Run = std::function<bool(Console&)>;
+
+/// A command of the program's command line.
+struct Command {
+    CLI::App* app;
+    Run run;
+};
+
+Command addSimplify(CLI::App& program);
+Command addConvert(CLI::App& program);
+Command addTree(CLI::App& program);
+Command addOperators(CLI::App& program);
+
+} // namespace vtsym

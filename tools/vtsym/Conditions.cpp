@@ -1,0 +1,37 @@
+#include "tools/vtsym/Conditions.hpp"
+
+#include "base/core/Table.hpp"
+
+namespace vtsym {
+
+namespace {
+
+// When the service has collected much.
+constexpr std::size_t fullTable = 100'000;               ///< nodes
+constexpr std::size_t fullTexts = std::size_t{1} << 26U; ///< bytes
+constexpr std::size_t cacheEntryBytes = 64;
+
+std::string visible(std::string text) {
+    return text.empty() ? "true" : text;
+}
+
+} // namespace
+
+void Conditions::makeRoomFor(const std::string& text) {
+    textBytes_ += text.size() + cacheEntryBytes;
+    if (service().table().size() < fullTable && textBytes_ < fullTexts)
+        return;
+    handle_.reset();
+    handle_.emplace();
+    textBytes_ = 0;
+}
+
+std::string Conditions::print(VT::SymbolicExprId condition, bool quill) const {
+    return visible(quill ? service().printQExprWithConversion(condition) : service().printCExpr(condition));
+}
+
+std::string Conditions::printAsItStands(VT::SymbolicExprId condition, bool quill) const {
+    return visible(quill ? service().printQExpr(condition) : service().printCExprNoConversion(condition));
+}
+
+} // namespace vtsym

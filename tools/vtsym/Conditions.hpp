@@ -1,0 +1,34 @@
+// The service as the program uses it.
+#pragma once
+
+#include "base/VCService.hpp"
+
+#include <cstddef>
+#include <optional>
+#include <string>
+
+namespace vtsym {
+
+/// The condition service, renewed when it has collected much, so that input without end takes memory with an end.
+/// Identifiers hold until the next makeRoomFor().
+class Conditions {
+public:
+    Conditions() : handle_(std::in_place) {}
+
+    [[nodiscard]] VT::VCService& service() const { return **handle_; }
+
+    /// To be called before the service is given a text.
+    void makeRoomFor(const std::string& text);
+
+    /// The text of a condition in the shape of a language.  Unlike the service it writes `true` for TRUE, so that no
+    /// answer is invisible.
+    [[nodiscard]] std::string print(VT::SymbolicExprId condition, bool quill) const;
+    /// The same without a change of shape.
+    [[nodiscard]] std::string printAsItStands(VT::SymbolicExprId condition, bool quill) const;
+
+private:
+    std::optional<VT::VCServiceHandle> handle_;
+    std::size_t textBytes_ = 0; ///< of what the service may have kept
+};
+
+} // namespace vtsym

@@ -1,0 +1,40 @@
+// vtsym convert
+#include "tools/vtsym/Commands.hpp"
+#include "tools/vtsym/Conditions.hpp"
+#include "tools/vtsym/Json.hpp"
+#include "tools/vtsym/Texts.hpp"
+
+namespace vtsym {
+
+namespace {
+
+constexpr const char* examples = R"(Operators that a language does not have become calls: a % b is rem(a,b) in Quill.
+
+Examples:
+  vtsym convert --to quill '(F & 4) != 0 && a % b == 1'
+  vtsym convert 'Mode==1&&!(Gear>2)'
+  vtsym convert --to quill < conditions.txt)";
+
+} // namespace
+
+Command addConvert(CLI::App& program) {
+    CLI::App* const command = program.add_subcommand("convert", "Write conditions in another language, or tidily");
+    const auto options = std::make_shared<TextOptions>();
+    addTextOptions(*command, *options);
+    addLanguageOption(*command, *options);
+    command->footer(examples);
+    return {command, [options](Console& console) {
+                Conditions conditions;
+                const auto answer = [&](const std::string& text, std::string& out) {
+                    conditions.makeRoomFor(text);
+                    const std::string result = conditions.print(conditions.service().parseC(text), options->toQuill());
+                    if (options->json)
+                        appendMember(out, "result", jsonString(result));
+                    else
+                        out.append(result);
+                };
+                return answerTexts(*options, console, {answer});
+            }};
+}
+
+} // namespace vtsym

@@ -1,0 +1,170 @@
+// vtsym: symbolic expressions and variant conditions on the command line.
+#include "host/Feature.hpp"
+#include "tools/vtsym/Commands.hpp"
+
+#include <algorithm>
+#include <csignal>
+#include <numeric>
+#include <sstream>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace vtsym {
+
+namespace {
+
+enum ExitStatus : int { Success = 0, Failure = 1, WrongUsage = 2 };
+
+constexpr const char* description = "Symbolic expressions and variant conditions: simplify, convert, look inside.";
+
+constexpr const char* footer =
+    R"(Every line of standard input is answered by one line of standard output; a text without an answer leaves an empty
+line, and standard error says why.  The condition that always holds is written as true.
+
+Exit status: 0 all texts were answered, 1 some were not, 2 the command line is wrong.
+
+Examples:
+  vtsym simplify 'Mode == 1 && Mode == 2'
+  vtsym convert --to quill 'a % b == 1'
+  vtsym tree 'N*2 + 1')";
+
+/// Changes between two words: letters put in, left out or replaced.
+std::size_t distance(std::string_view a, std::string_view b) {
+    std::vector<std::size_t> row(b.size() + 1);
+    std::iota(row.begin(), row.end(), std::size_t{0});
+    for (const char letter : a) {
+        std::size_t diagonal = row[0]++;
+        for (std::size_t j = 0; j < b.size(); ++j) {
+            const std::size_t replaced = diagonal + (letter == b[j] ? 0 : 1);
+            diagonal = row[j + 1];
+            row[j + 1] = std::min({replaced, row[j] + 1, diagonal + 1});
+        }
+    }
+    return row.back();
+}
+
+/// What is wrong with arguments that nothing takes.
+std::string unexpected(const std::vector<std::string>& arguments) {
+    const std::string first = arguments.empty() ? std::string() : arguments.front();
+    if (first.starts_with('-'))
+        return "there is no option '" + first + "'; a text that begins with - goes behind --";
+    return "'" + first + "' is one argument too many";
+}
+
+class Program {
+public:
+    Program();
+    int run(Console& console, std::vector<std::string> arguments);
+
+private:
+    void addFeatures(CLI::App& app);
+    int fail(Console& console, const std::string& problem);
+    [[nodiscard]] std::string unknownCommand(const std::string& word) const;
+
+    CLI::App app_{description, "vtsym"};
+    std::vector<Command> commands_;
+};
+
+Program::Program() {
+    app_.set_version_flag("--version", "vtsym " VTSYM_VERSION, "Print the version and exit");
+    app_.require_subcommand(1);
+    app_.footer(footer);
+    app_.get_formatter()->column_width(34);
+    addFeatures(app_);
+    for (const auto add : {addSimplify, addConvert, addTree, addOperators}) {
+        commands_.push_back(add(app_));
+        addFeatures(*commands_.back().app);
+    }
+}
+
+void Program::addFeatures(CLI::App& app) {
+    std::string flags;
+    for (const VtFeature* feature : VtFeature::all())
+        flags += (flags.empty() ? "" : ", ") + feature->name();
+    app.add_option_function<std::vector<std::string>>(
+           "--feature",
+           [](const std::vector<std::string>& assignments) {
+               for (const std::string& assignment : assignments)
+                   if (const std::string error = VtFeature::assign(assignment); !error.empty())
+                       throw CLI::ValidationError("--feature", error);
+           },
+           "Set a feature flag: " + flags)
+        ->allow_extra_args(false)
+        ->multi_option_policy(CLI::MultiOptionPolicy::TakeAll)
+        ->type_name("NAME=VALUE");
+}
+
+/// What is wrong with a first word that is no command; empty where nothing is.
+std::string Program::unknownCommand(const std::string& word) const {
+    const auto nearer = [&word](const Command& a, const Command& b) {
+        return distance(word, a.app->get_name()) < distance(word, b.app->get_name());
+    };
+    const std::string& nearest = std::ranges::min_element(commands_, nearer)->app->get_name();
+    const std::size_t changes = distance(word, nearest);
+    if (word.starts_with('-') || changes == 0)
+        return {};
+    return "there is no command '" + word + "'" + (changes <= 2 ? "; did you mean " + nearest + "?" : "");
+}
+
+int Program::fail(Console& console, const std::string& problem) {
+    std::string command = "vtsym";
+    for (const CLI::App* const chosen : app_.get_subcommands())
+        command += " " + chosen->get_name();
+    console.words("vtsym: " + problem + "\nTry '" + command + " --help'.\n");
+    return WrongUsage;
+}
+
+int Program::run(Console& console, std::vector<std::string> arguments) {
+    if (arguments.empty()) {
+        console.words("vtsym: a command is missing\n\n" + app_.help());
+        return WrongUsage;
+    }
+    if (arguments.front() == "help") {
+        arguments.erase(arguments.begin());
+        arguments.emplace_back("--help");
+    }
+    if (const std::string problem = unknownCommand(arguments.front()); !problem.empty())
+        return fail(console, problem);
+    try {
+        std::ranges::reverse(arguments); // the order that CLI11 takes
+        app_.parse(std::move(arguments));
+    } catch (const CLI::Success& wish) { // --help or --version
+        std::ostringstream out;
+        app_.exit(wish, out, out);
+        console.data(out.str());
+        console.flush();
+        return Success;
+    } catch (const CLI::ExtrasError&) {
+        return fail(console, unexpected(app_.remaining(true)));
+    } catch (const CLI::RequiredError&) {
+        const std::vector<std::string> rest = app_.remaining(true);
+        return fail(console, rest.empty() ? "a command is missing" : unexpected(rest));
+    } catch (const CLI::ParseError& error) {
+        return fail(console, error.what());
+    }
+    const auto chosen = std::ranges::find_if(commands_, [](const Command& command) { return command.app->parsed(); });
+    return chosen->run(console) ? Success : Failure;
+}
+
+int runOn(Console& console, std::vector<std::string> arguments) {
+    try {
+        return Program().run(console, std::move(arguments));
+    } catch (const OutputError& error) {
+        if (!error.readerIsGone())
+            console.words(std::string("vtsym: ") + error.what() + "\n");
+    } catch (const std::exception& error) {
+        console.words(std::string("vtsym: ") + error.what() + "\n");
+    }
+    return Failure;
+}
+
+} // namespace
+
+} // namespace vtsym
+
+int main(int argc, char** argv) {
+    std::signal(SIGPIPE, SIG_IGN); // a reader that left is an error of writing, not the end of the process
+    vtsym::Console console;
+    return vtsym::runOn(console, std::vector<std::string>(argv + (argc > 0 ? 1 : 0), argv + argc));
+}
