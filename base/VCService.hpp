@@ -79,7 +79,8 @@ public:
     std::string printQExpr(const VCSymbolicExprId& condition);
     /// Quill text of the condition in Quill shape: C operators without a Quill spelling, and every division, as calls.
     std::string printQExprWithConversion(const VCSymbolicExprId& condition);
-    /// C text of the condition in C shape: Quill calls that stand for C operators as operators.
+    /// C text of the condition in C shape: Quill calls that stand for C operators as operators.  Powers, transposes,
+    /// element-wise operators and ranges, which C has not, keep their Quill spelling.
     std::string printCExpr(const VCSymbolicExprId& condition);
     /// C text of the condition as it stands.
     std::string printCExprNoConversion(const VCSymbolicExprId& condition);

@@ -21,5 +21,7 @@ write_basic_package_version_file(${PROJECT_BINARY_DIR}/vtsymConfigVersion.cmake 
 install(FILES ${PROJECT_BINARY_DIR}/vtsymConfig.cmake ${PROJECT_BINARY_DIR}/vtsymConfigVersion.cmake
   DESTINATION ${package_dir})
 
+# Relative to the file itself, so that the installed tree can be moved.
+file(RELATIVE_PATH pkgconfig_to_prefix /prefix/${CMAKE_INSTALL_LIBDIR}/pkgconfig /prefix)
 configure_file(cmake/vtsym.pc.in ${PROJECT_BINARY_DIR}/vtsym.pc @ONLY)
 install(FILES ${PROJECT_BINARY_DIR}/vtsym.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)

@@ -45,7 +45,7 @@ install_packages() {
     say "installing $packages"
     apt_get="$as_root DEBIAN_FRONTEND=noninteractive apt-get -o DPkg::Lock::Timeout=300"
     # shellcheck disable=SC2086 # words on purpose
-    quietly "$root/build/packages.log" $apt_get update || return 1
+    quietly "$root/build/packages.log" $apt_get update || : # the install tells whether the old lists suffice
     # shellcheck disable=SC2086
     quietly "$root/build/packages.log" $apt_get install -y --no-install-recommends $packages
 }

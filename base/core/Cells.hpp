@@ -35,8 +35,8 @@ public:
     /// Names a cell; 0 names none.
     using Number = std::uint32_t;
 
-    /// Room for a cell and so many bytes behind it, for an object no more aligned than a pointer.  Throws std::bad_alloc,
-    /// or std::length_error when the numbers run out at 128 GiB.
+    /// Room for a cell and so many bytes behind it, for an object no more aligned than a pointer.  Throws
+    /// std::bad_alloc, or std::length_error when the numbers run out at 128 GiB.
     Number allocate(std::size_t bytes) {
         const std::size_t units = (sizeof(NodeCell) + bytes + unit - 1) / unit;
         if (next_ + units > end_)
@@ -61,7 +61,7 @@ private:
     static constexpr std::size_t mostChunks = std::size_t{1} << (32 - chunkBits);
     static constexpr std::size_t firstUnits = 128;
     static constexpr std::size_t doublings = 13; // until a chunk is as large as its numbers allow
-    static constexpr std::size_t reserved = 1;  // keeps number 0 free
+    static constexpr std::size_t reserved = 1;   // keeps number 0 free
 
     struct Free {
         void operator()(std::byte* chunk) const noexcept { ::operator delete(chunk, lineSize); }
@@ -73,7 +73,7 @@ private:
         const std::size_t units = firstUnits << std::min(chunks_.size(), doublings);
         const std::size_t first = chunks_.size() << chunkBits;
         chunks_.reserve(chunks_.size() + 1);
-        chunks_.emplace_back(static_cast<std::byte*>(::operator new(units * unit, lineSize)));
+        chunks_.emplace_back(static_cast<std::byte*>(::operator new(units* unit, lineSize)));
         next_ = first + (first == 0 ? reserved : 0);
         end_ = first + units;
     }

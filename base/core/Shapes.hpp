@@ -1,7 +1,7 @@
 // The shapes of nodes: payload, operands, hash and equality.  The node classes themselves are in Nodes.hpp.
 //
-// Beside the virtual operations each shape tells whether another node of its class has the same parts, and the hash of its
-// parts as operands of an operator: interning knows the class and needs no virtual call.
+// Beside the virtual operations each shape tells whether another node of its class has the same parts, and the hash of
+// its parts as operands of an operator: interning knows the class and needs no virtual call.
 #pragma once
 
 #include "base/core/Hash.hpp"

@@ -21,7 +21,8 @@ void makeRoom(std::vector<const SymbolicExpr*>& nodes) {
 } // namespace
 
 SymbolicExprTable::SymbolicExprTable()
-    : index_(firstSlots), indexShift_(32U - static_cast<unsigned>(std::countr_zero(firstSlots))) {}
+    : index_(firstSlots),
+      indexShift_(32U - static_cast<unsigned>(std::countr_zero(firstSlots))) {}
 
 SymbolicExprTable::~SymbolicExprTable() {
     // Both lists are in the order of addition, so one pass tells foreign nodes from those in cells.

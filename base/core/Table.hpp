@@ -22,6 +22,10 @@ class InternedNode;
 /// long as the table.  Beside them stand value bindings of expressions, aliases of identifiers and the two truth
 /// constants.
 ///
+/// A table holds up to 128 GiB of nodes, three thousand million at most, and throws std::length_error for one more.
+/// Nodes reach a derived class through its virtual operations: constructors call contains() and add(), getId() calls
+/// lookup().
+///
 /// A table is used by one thread at a time; const operations may run concurrently while no thread interns.
 class VTSYM_API SymbolicExprTable {
 public:

@@ -54,7 +54,7 @@ public:
 
 private:
     void grow(std::size_t count) {
-        constexpr std::size_t firstBytes = 1024;
+        constexpr std::size_t firstBytes = 960; // what allocators still keep at hand
         const std::size_t capacity =
             std::max({firstBytes / sizeof(Value), std::size_t{1}, 2 * capacity_, size_ + count});
         void* const grown = std::realloc(static_cast<void*>(data_), capacity * sizeof(Value));

@@ -29,7 +29,7 @@ std::size_t hash_value(const Constraint& constraint) noexcept;
 /// nothing; the product without constraints always holds.
 class Cube {
 public:
-    using Constraints = boost::container::small_vector<Constraint, 2>;
+    using Constraints = ShortVector<Constraint, 2>;
 
     [[nodiscard]] const Constraints& constraints() const noexcept { return constraints_; }
 

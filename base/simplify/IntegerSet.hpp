@@ -2,8 +2,7 @@
 #pragma once
 
 #include "base/core/Operators.hpp"
-
-#include <boost/container/small_vector.hpp>
+#include "base/simplify/ShortVector.hpp"
 
 #include <compare>
 #include <cstdint>
@@ -26,7 +25,7 @@ public:
         auto operator<=>(const Interval&) const = default;
     };
 
-    using Intervals = boost::container::small_vector<Interval, 2>;
+    using Intervals = ShortVector<Interval, 2>;
 
     IntegerSet() = default; ///< the empty set
 

@@ -10,11 +10,7 @@ SymbolicExprCopyVisitor::SymbolicExprCopyVisitor(const SymbolicExprTable& source
 
 void SymbolicExprCopyVisitor::visit(const SymbolicString& node) {
     SymbolicExprXFormVisitor::visit(node);
-    const SymbolicExprId name = node.getId(source_);
-    if (!source_.has(name) || named_.find(name) != nullptr)
-        return;
-    named_.insert(name, true);
-    const SymbolicExprId value = source_.getValueId(name);
+    const SymbolicExprId value = source_.getValueId(node.getId(source_));
     if (!source_.has(value))
         return;
     bindings_.push_back({top(), value});
@@ -24,8 +20,9 @@ void SymbolicExprCopyVisitor::visit(const SymbolicString& node) {
 
 /// Copies the values that wait, one after the other: a chain of values is as long as the input makes it.
 void SymbolicExprCopyVisitor::bindValues() {
-    for (std::size_t next = 0; next < bindings_.size(); ++next) {
-        const auto [name, sourceValue] = bindings_[next];
+    std::size_t next = 0;
+    while (next < bindings_.size()) {
+        const auto [name, sourceValue] = bindings_[next++];
         table().registerValueId(name, copy(sourceValue));
     }
     bindings_.clear();

@@ -36,8 +36,7 @@ private:
     void bindValues();
 
     const SymbolicExprTable& source_;
-    IdMap<SymbolicExprId> copies_;
-    IdMap<bool> named_; ///< the symbols of the source whose values were asked for
+    IdMap<SymbolicExprId> copies_; ///< by the source's identifiers
     std::vector<Binding> bindings_;
 };
 

@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <boost/container/small_vector.hpp>
-#include <ranges>
 #include <string>
 
 namespace VT {
@@ -59,8 +58,8 @@ void SymbolicExprQ2CVisitor::visit(const SymbolicFcnCallExpr& node) {
 template <class Call>
 void SymbolicExprQ2CVisitor::convert(const Call& node) {
     boost::container::small_vector<SymbolicExprId, 4> inputs(node.getNumInputs());
-    for (SymbolicExprId& input : std::views::reverse(inputs))
-        input = pop();
+    for (std::size_t i = inputs.size(); i-- > 0;)
+        inputs[i] = pop();
     if (!inputs.empty()) {
         const std::span<const SymbolicExprId> arguments(inputs.data() + 1, inputs.size() - 1);
         const SymbolicOp op = operatorOf(inputs.front(), arguments.size());

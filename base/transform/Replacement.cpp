@@ -50,8 +50,8 @@ SymbolicExprId SymbolicExprReplacementVisitor::replacementOf(SymbolicExprId oper
 template <class Node>
 void SymbolicExprReplacementVisitor::replaceOperands(const Node& node) {
     boost::container::small_vector<SymbolicExprId, 4> operands(node.getNumInputs());
-    for (auto operand = operands.rbegin(); operand != operands.rend(); ++operand)
-        *operand = pop();
+    for (std::size_t i = operands.size(); i-- > 0;)
+        operands[i] = pop();
     for (std::size_t i = 0; i < operands.size(); ++i)
         push(i < firstReplaced(Node::code) ? operands[i] : replacementOf(operands[i]));
 }

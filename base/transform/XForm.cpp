@@ -33,7 +33,9 @@ SymbolicExprId SymbolicExprXFormVisitor::getCodegenVariantKeywordId() const {
 }
 
 SymbolicExprId SymbolicExprXFormVisitor::pop() {
-    VTSYM_CHECK(!stack_.empty());
+    // An operand that no node stands for was not visited, so nothing was pushed for it.
+    if (stack_.empty())
+        return invalidId;
     const SymbolicExprId id = stack_.back();
     stack_.pop_back();
     return id;

@@ -53,7 +53,7 @@ TEST(PrintBounds, DoublingGraphsAreMeasuredByTheirNodes) {
 }
 
 TEST(PrintBounds, DeepSpines) {
-    for (const Op op : {Op::Plus, Op::Modulo})
+    for (const Op op : {Op::Plus, Op::Modulo}) {
         for (const bool right : {false, true}) {
             SymbolicExprTable table;
             const Trees tree{table};
@@ -71,6 +71,7 @@ TEST(PrintBounds, DeepSpines) {
             visitor.execute(table, id);
             EXPECT_EQ(visitor.get(), text);
         }
+    }
     SymbolicExprTable table;
     const Trees tree{table};
     SymbolicExprId id = tree.name("x");

@@ -1,4 +1,4 @@
-// NOLINTBEGIN(misc-no-recursion): small texts and trees only
+// NOLINTBEGIN(misc-no-recursion, performance-inefficient-string-concatenation): small texts and trees only
 #include "tests/print/Reading.hpp"
 
 #include "base/transform/QuillConversion.hpp"
@@ -89,12 +89,12 @@ private:
     }
 
     std::string prefixed() {
-        for (const std::string_view op : {"-", "~", "!"})
-            if (take(op)) {
-                const std::string operand = prefixed();
-                return op == "-" && isNumber(operand) ? "-" + operand : "(" + std::string(op) + operand + ")";
-            }
-        return power();
+        const std::string op(spelling());
+        if (op != "-" && op != "~" && op != "!")
+            return power();
+        take(op);
+        const std::string operand = prefixed();
+        return op == "-" && isNumber(operand) ? "-" + operand : "(" + op + operand + ")";
     }
 
     std::string power() {
@@ -336,4 +336,4 @@ SymbolicExprId randomTree(SymbolicExprTable& table, Language language, std::mt19
 
 } // namespace VT::Testing
 
-// NOLINTEND(misc-no-recursion)
+// NOLINTEND(misc-no-recursion, performance-inefficient-string-concatenation)

@@ -145,8 +145,8 @@ TEST_F(Texts, NumbersReadBackInEveryLocale) {
     const std::locale before = std::locale::global(std::locale(std::locale::classic(), new Comma));
     std::mt19937_64 random(7);
     for (int i = 0; i < 2000; ++i) {
-        const double value = std::bit_cast<double>(random());
-        const int integer = static_cast<int>(random());
+        const auto value = std::bit_cast<double>(random());
+        const auto integer = static_cast<int>(random());
         if (!std::isfinite(value) || integer == std::numeric_limits<int>::min())
             continue;
         const SymbolicExprPrinter printer(table, false);

@@ -63,8 +63,8 @@ TEST(Customizer, RewriteCountsWhereItDecides) {
     for (const Row& row : rows) {
         for (const bool isQuill : {false, true}) {
             SCOPED_TRACE(std::string(row.condition) + " rewritten to " + row.rewritten);
+            TestCustomizer customizer; // outlives the service
             const FreshService service;
-            TestCustomizer customizer;
             customizer.onRewrite = rewriteTo(row.rewritten);
             service->setVCCustomizer(&customizer);
             EXPECT_EQ(service->printCExpr(service->simplify(service->parseC(row.condition), isQuill)), row.result);
@@ -74,8 +74,8 @@ TEST(Customizer, RewriteCountsWhereItDecides) {
 }
 
 TEST(Customizer, RewriteToNoConditionIsNone) {
+    TestCustomizer customizer; // outlives the service
     const FreshService service;
-    TestCustomizer customizer;
     service->setVCCustomizer(&customizer);
     for (const SymbolicExprId bad : {invalidId, SymbolicExprId{1} << 40U}) {
         customizer.onRewrite = [bad](SymbolicExprId, SymbolicExprTable&) { return bad; };
@@ -84,8 +84,8 @@ TEST(Customizer, RewriteToNoConditionIsNone) {
 }
 
 TEST(Customizer, ExceptionsPassAndNothingIsKept) {
+    TestCustomizer customizer; // outlives the service
     const FreshService service;
-    TestCustomizer customizer;
     service->setVCCustomizer(&customizer);
     customizer.onRewrite = [](SymbolicExprId, SymbolicExprTable&) -> SymbolicExprId { throw std::domain_error("no"); };
     const VCSymbolicExprId condition = service->parseC("A==1");
@@ -99,8 +99,8 @@ TEST(Customizer, ExceptionsPassAndNothingIsKept) {
 
 TEST(Customizer, CachesKeepTheirAnswersByLanguage) {
     for (const bool caching : {true, false}) {
+        TestCustomizer customizer; // outlives the service
         const FreshService service(caching);
-        TestCustomizer customizer;
         service->setVCCustomizer(&customizer);
         const SymbolicExprId condition = service->parseC("A==1");
         const auto rewritesOf = [&](auto&& call) {
@@ -138,9 +138,9 @@ TEST(Customizer, ConfirmsSelfComparisonsInQuillMode) {
     for (const Row& row : rows) {
         SCOPED_TRACE(row.text);
         for (const bool agrees : {true, false}) {
+            TestCustomizer customizer; // outlives the service
             const FreshService service;
             const VCSymbolicExprId condition = service->parseC(row.text);
-            TestCustomizer customizer;
             customizer.agrees = agrees;
             service->setVCCustomizer(&customizer);
             EXPECT_EQ(service->printCExpr(service->simplify(condition, false)), row.agreed);

@@ -9,21 +9,34 @@ namespace {
 /// Allocations until one fails; below zero for none.
 thread_local long remaining = -1;
 
-void* allocate(std::size_t bytes) {
+void* allocate(std::size_t bytes) noexcept {
     if (remaining >= 0 && remaining-- == 0)
+        return nullptr;
+    return std::malloc(bytes == 0 ? 1 : bytes);
+}
+
+void* allocateOrThrow(std::size_t bytes) {
+    void* const memory = allocate(bytes);
+    if (memory == nullptr)
         throw std::bad_alloc();
-    if (void* const memory = std::malloc(bytes == 0 ? 1 : bytes))
-        return memory;
-    throw std::bad_alloc();
+    return memory;
 }
 
 } // namespace
 
 void* operator new(std::size_t bytes) {
-    return allocate(bytes);
+    return allocateOrThrow(bytes);
 }
 
 void* operator new[](std::size_t bytes) {
+    return allocateOrThrow(bytes);
+}
+
+void* operator new(std::size_t bytes, const std::nothrow_t&) noexcept {
+    return allocate(bytes);
+}
+
+void* operator new[](std::size_t bytes, const std::nothrow_t&) noexcept {
     return allocate(bytes);
 }
 

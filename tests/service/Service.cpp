@@ -50,9 +50,9 @@ TEST(ServiceLifetime, BeginsWithConstantsAndKeywords) {
 }
 
 TEST(ServiceLifetime, ReadsTheCacheFeatureOnce) {
+    TestCustomizer customizer; // outlives the service
     const FreshService service(false);
     cacheSymExprSimplifyResultsFeature().setValue(1);
-    TestCustomizer customizer;
     service->setVCCustomizer(&customizer);
     for (int i = 0; i < 2; ++i)
         service->simplifyFromCCondition("A==1");
@@ -196,8 +196,8 @@ TEST(ServiceIds, ThatAreNotOfTheTableAreAnswered) {
 }
 
 TEST(ServiceIds, CompareByMeaningOrAsNumbers) {
+    TestCustomizer customizer; // outlives the service
     const FreshService service;
-    TestCustomizer customizer;
     customizer.onRewrite = [](SymbolicExprId condition, SymbolicExprTable& table) { // the parameter N is 1
         return condition == SymbolicString(table, "N").getId(table) ? SymbolicIntValue(table, 1).getId(table)
                                                                     : condition;

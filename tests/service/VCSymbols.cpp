@@ -60,13 +60,14 @@ TEST(VCSymbols, KindsAreFourBits) {
     using enum VCSymbolType;
     EXPECT_EQ((VCSymbolTypes{Identifier, BoundMember}).bits(), 3U);
     EXPECT_EQ((VCSymbolTypes{UnboundMember, FunctionName}).bits(), 12U);
-    for (const int outside : {4, 5, -1})
+    for (const int outside : {4, 5, -1}) {
         try {
             const VCSymbolTypes kinds{static_cast<VCSymbolType>(outside)};
             ADD_FAILURE() << outside;
         } catch (const std::out_of_range& error) {
             EXPECT_THAT(error.what(), testing::StartsWith("bitset::set"));
         }
+    }
     SymbolicExprTable table;
     Names names;
     VCSymbolsOfSymbolicExpr(table, {Identifier, FunctionName}).getSymbols(read(table, "f(x) + a.b"), names);

@@ -7,7 +7,7 @@
 #include <cstdint>
 #include <map>
 #include <string>
-#include <utility>
+#include <tuple>
 #include <vector>
 
 namespace VT::Testing {
@@ -47,7 +47,10 @@ private:
         SymbolicOp op;
         std::string payload;
         std::vector<std::size_t> operands;
-        auto operator<=>(const Structure&) const = default;
+
+        bool operator<(const Structure& other) const {
+            return std::tie(op, payload, operands) < std::tie(other.op, other.payload, other.operands);
+        }
     };
 
     static std::string payload(const SymbolicExpr& node) {

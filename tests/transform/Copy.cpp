@@ -179,11 +179,11 @@ TEST(Copy, SharedAndDeepExpressions) {
 }
 
 TEST(Copy, LongChainsOfValues) {
-    constexpr int count = 100'000;
+    constexpr std::size_t count = 100'000;
     SymbolicExprTable source, target;
-    std::vector<SymbolicExprId> names;
-    for (int i = 0; i < count; ++i)
-        names.push_back(SymbolicString(source, "n" + std::to_string(i)).getId(source));
+    std::vector<SymbolicExprId> names(count);
+    for (std::size_t i = 0; i < names.size(); ++i)
+        names[i] = SymbolicString(source, "n" + std::to_string(i)).getId(source);
     SymbolicExprId sum = names.front(); // of all names
     for (const SymbolicExprId name : names)
         sum = SymbolicPlusExpr(source, sum, name).getId(source);

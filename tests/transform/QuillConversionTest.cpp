@@ -87,12 +87,14 @@ TEST_F(QuillConversion, OperatorsBecomeCalls) {
 }
 
 TEST_F(QuillConversion, ThereAndBackIsTheSame) {
-    for (const char* call : {"idivide", "rem", "bitand", "bitor", "bitxor", "bitshift"})
-        for (const char* left : {"a", "7", "-7", "bitcmp(b)"})
+    for (const char* call : {"idivide", "rem", "bitand", "bitor", "bitxor", "bitshift"}) {
+        for (const char* left : {"a", "7", "-7", "bitcmp(b)"}) {
             for (const char* right : {"b", "0", "3", "-3", "-2147483648", "-b", "rem(a, 2)"}) {
                 const SymbolicExprId id = read(std::string(call) + "(" + left + "," + right + ")");
                 EXPECT_EQ(SymbolicExprC2Q(table)(SymbolicExprQ2C(table)(id)), id) << call << left << right;
             }
+        }
+    }
 }
 
 TEST_F(QuillConversion, TheCallClassDoesNotMatter) {

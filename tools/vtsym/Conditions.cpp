@@ -12,7 +12,9 @@ constexpr std::size_t fullTexts = std::size_t{1} << 26U; ///< bytes
 constexpr std::size_t cacheEntryBytes = 64;
 
 std::string visible(std::string text) {
-    return text.empty() ? "true" : text;
+    if (text.empty())
+        text = "true";
+    return text;
 }
 
 } // namespace

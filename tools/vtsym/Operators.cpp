@@ -101,11 +101,12 @@ Command addOperators(CLI::App& program) {
     command->add_flag("--json", *json, "Answer with one JSON object per operator");
     command->footer(examples);
     return {command, [json](Console& console) {
-                if (*json)
+                if (*json) {
                     for (const VT::OperatorInfo& row : VT::operatorTable())
                         console.data(jsonOf(row));
-                else
+                } else {
                     console.data(table(console.dataStyle()));
+                }
                 console.flush();
                 return true;
             }};

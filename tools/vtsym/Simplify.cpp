@@ -82,6 +82,8 @@ void Simplifier::answerInDetail(const std::string& text, std::string& out) {
     } else {
         out.append(style_.strong(step(condition))).append("\n");
         explain(out);
+        if (simplified == condition && !firings_.firings.empty())
+            out.append("  what this leads to is longer or beyond a limit, so the condition stays\n");
         out.append("= ").append(style_.good(result));
     }
 }

@@ -1,5 +1,6 @@
 // A host with services of its own, as small as they can be.  Linking it proves that the library asks for nothing but
 // what the headers in host/ declare; running it, that the library uses what it is given.
+#include "base/VCService.hpp"
 #include "base/variants/Features.hpp"
 #include "base/variants/Loggers.hpp"
 #include "base/variants/VariantKeywords.hpp"
@@ -7,6 +8,7 @@
 #include "host/Feature.hpp"
 #include "host/Log.hpp"
 #include "host/Numbers.hpp"
+#include "host/QuillParser.hpp"
 #include "host/Text.hpp"
 
 #include <cstdio>
@@ -119,6 +121,34 @@ std::string cvt_ustring_string(std::u16string_view text) {
     return {text.begin(), text.end()};
 }
 
+namespace {
+
+/// This host reads no Quill.
+class NoQuill final : public PARSER_T<char> {
+public:
+    const Tree* generate_parse_tree(const char* /*text*/, std::size_t /*length*/) override { return nullptr; }
+
+    void delete_parse_tree(const Tree* /*tree*/) noexcept override {}
+
+    VT::QuillFailure failure() const noexcept override { return {0, "this host reads no Quill"}; }
+};
+
+} // namespace
+
+template <>
+std::unique_ptr<PARSER_T<char>> PARSER_T<char>::create(std::size_t /*nesting*/,
+                                                       std::span<const std::string> /*keywords*/) {
+    return std::make_unique<NoQuill>();
+}
+
+const char* vtuQParserTerminalName(std::int32_t /*code*/) noexcept {
+    return "terminal";
+}
+
+const char* vtuQParserNonTerminalName(std::int32_t /*code*/) noexcept {
+    return "non-terminal";
+}
+
 int main() {
     expect(VtFeature::all().size() == 3, "the library has three flags");
     expect(!VT::isVariantKeywordsSimCodegenFeatureOn(), "flags start as this host has them start");
@@ -126,5 +156,15 @@ int main() {
     expect(VT::isVariantKeywordsSimCodegenFeatureOn(), "the library reads the flag of this host");
     vt::variants::vred::getLogger().error("gone");
     expect(lastLine == "vt::variants::reducer: gone", "the library's loggers write to this host");
+
+    const VT::VCServiceHandle service;
+    expect(service->simplifyCExprFromCCondition("A == 1 && A == 2") == "false", "the service works on this host");
+    std::string said;
+    try {
+        service->parseC("A ===");
+    } catch (const VT::HostDiagnostic& diagnostic) {
+        said = diagnostic.what();
+    }
+    expect(said == "own host says Vantor:Variants:ExpressionParseError", "errors are this host's diagnostics");
     return failures == 0 ? EXIT_SUCCESS : EXIT_FAILURE;
 }

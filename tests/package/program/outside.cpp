@@ -11,6 +11,9 @@ int main() {
     const auto sum = VT::SymbolicPlusExpr(table, a, b).getId(table);
     if (VT::SymbolicPlusExpr(table, a, b).getId(table) != sum || table.size() != 5)
         return 1;
+    const VT::VCServiceHandle service;
+    if (service->simplifyCExprFromCCondition("A == 1 && A == 2") != "false")
+        return 1;
     const std::string sim = VT::VariantKeywords::getSimVariantKeyword();
     if (!VT::VariantKeywords::isSimVariantKeyword(sim, VTFEAT_VariantKeywordsSimCodegen->isOn()))
         return 1;

@@ -1,0 +1,75 @@
+// The dimension expressions of blocks under names of their own.
+#pragma once
+
+#include "base/print/ExpressionPrinter.hpp"
+#include "base/simplify/Simplify.hpp"
+
+#include <boost/unordered_map.hpp>
+#include <boost/unordered_set.hpp>
+
+#include <string>
+#include <vector>
+
+/// A block of the host's model.  The library knows its address only.
+class VTBlock;
+
+namespace VT {
+
+/// Gives the dimension expressions of blocks identifiers.
+///
+/// An expression is simplified and printed as C text.  A text that is an identifier is its own; any other one becomes
+/// `dim_` and the text, in which _ is written __ and everything but letters and digits _xx, in hexadecimal: `N*2+1` is
+/// `dim_N_2a2_2b1`.  Where that is longer than 63 characters, which is what C compilers tell apart, it is `dimx_`, the
+/// beginning and a number made of the whole text.  So an identifier is the same in every run, and two texts never share
+/// one.
+///
+/// Used by one thread at a time.
+class VTSYM_API SymbolRegistry {
+public:
+    /// `table` outlives the registry.
+    explicit SymbolRegistry(SymbolicExprTable& table);
+    SymbolRegistry(const SymbolRegistry&) = delete;
+    SymbolRegistry& operator=(const SymbolRegistry&) = delete;
+
+    /// Registers an expression for a block and answers its identifier, which has the expression's text, in parentheses
+    /// where it needs them, as its alias in the table.  The same expression again, or another one with the same
+    /// simplified text, answers the same identifier.  The empty text for an identifier that is not of the table.
+    ///
+    /// Linear in the size of the expression.  When memory runs out or the text is beyond the printer's bound, the
+    /// exception passes and the block has registered what it had.
+    std::string registerExpression(const VTBlock* block, SymbolicExprId expression);
+
+    /// The identifiers that a block has registered, each once, in order.
+    [[nodiscard]] std::vector<std::string> registeredBy(const VTBlock* block) const;
+    /// Forgets what a block has registered; identifiers keep their expressions.  To be called when the block is gone.
+    void forgetBlock(const VTBlock* block);
+
+    /// The simplified expression of an identifier; the invalid identifier for one that is not registered.
+    [[nodiscard]] SymbolicExprId expressionOf(const std::string& identifier) const;
+
+    /// Records an alias of an identifier in the table; the first alias stays.
+    void insertAlias(const std::string& identifier, const std::string& alias);
+    /// The alias of an identifier, or the empty text.
+    [[nodiscard]] std::string aliasOf(const std::string& identifier) const;
+
+private:
+    std::string identifierOf(const std::string& text) const;
+
+    struct Entry {
+        std::string text;
+        SymbolicExprId expression;
+    };
+
+    struct Registered {
+        std::vector<std::string> inOrder;
+        boost::unordered_set<std::string> all;
+    };
+
+    SymbolicExprTable& table_;
+    SymbolicExprSimplify simplifier_;
+    SymbolicExprPrinter printer_;
+    boost::unordered_map<std::string, Entry> entries_; ///< by identifier
+    boost::unordered_map<const VTBlock*, Registered> blocks_;
+};
+
+} // namespace VT

@@ -1,0 +1,257 @@
+// Simplification, conversion and copies beside the least that any of them does: one walk that interns each node again.
+#include "base/core/Nodes.hpp"
+#include "base/simplify/Simplify.hpp"
+#include "base/transform/QuillConversion.hpp"
+#include "base/transform/XForm.hpp"
+#include "benchmarks/Comparison.hpp"
+#include "benchmarks/Corpus.hpp"
+#include "benchmarks/FloorText.hpp"
+
+#include <functional>
+#include <memory>
+#include <random>
+
+namespace VT::Benchmarks {
+namespace {
+
+/// Interns every record up to `root` again.  Operands stand before their operators, so one pass in order will do.
+std::uint64_t internAgain(const RecordTable& source, std::uint64_t root, RecordTable& target) {
+    std::vector<std::uint64_t> copies(root + 1);
+    for (std::uint64_t id = 0; id <= root; ++id) {
+        const Record& record = source[id];
+        const auto copyOf = [&](std::uint64_t operand) { return operand < id ? copies[operand] : operand; };
+        if (record.op == SymbolicOp::String)
+            copies[id] = target.name(source.text(record));
+        else if (record.op == SymbolicOp::IntValue || record.op == SymbolicOp::DoubleValue)
+            copies[id] = target.intern(record.op, record.left, record.right);
+        else
+            copies[id] = target.intern(record.op, copyOf(record.left), copyOf(record.right));
+    }
+    return copies[root];
+}
+
+/// An expression twice: as nodes and as records.
+struct Subject {
+    SymbolicExprTable table;
+    RecordTable records;
+    SymbolicExprId id = invalidId;
+    std::uint64_t record = 0;
+};
+
+using Build = std::unique_ptr<Subject> (*)(std::int64_t size);
+
+/// Builds the same expression both ways.  `Nodes` has intern(op, a, b), name(text) and integer(value).
+struct NodeWriter {
+    SymbolicExprTable& table;
+
+    SymbolicExprId name(const std::string& text) const { return SymbolicString(table, text).getId(table); }
+
+    SymbolicExprId integer(int value) const { return SymbolicIntValue(table, value).getId(table); }
+
+    SymbolicExprId intern(SymbolicOp op, SymbolicExprId a, SymbolicExprId b) const {
+        switch (op) {
+        case SymbolicOp::And:
+            return SymbolicAndExpr(table, a, b).getId(table);
+        case SymbolicOp::Plus:
+            return SymbolicPlusExpr(table, a, b).getId(table);
+        case SymbolicOp::Divide:
+            return SymbolicDivideExpr(table, a, b).getId(table);
+        case SymbolicOp::Equal:
+            return SymbolicEqualExpr(table, a, b).getId(table);
+        case SymbolicOp::NotEqual:
+            return SymbolicNotEqualExpr(table, a, b).getId(table);
+        case SymbolicOp::LessThan:
+            return SymbolicLessThanExpr(table, a, b).getId(table);
+        default:
+            return SymbolicGreaterThanExpr(table, a, b).getId(table);
+        }
+    }
+};
+
+struct RecordWriter {
+    RecordTable& table;
+
+    std::uint64_t name(const std::string& text) const { return table.name(text); }
+
+    std::uint64_t integer(int value) const {
+        return table.intern(SymbolicOp::IntValue, static_cast<std::uint64_t>(value), ~std::uint64_t{0});
+    }
+
+    std::uint64_t intern(SymbolicOp op, std::uint64_t a, std::uint64_t b) const { return table.intern(op, a, b); }
+};
+
+/// A left-deep chain of comparisons in random order: ten symbols, so that many operands meet.
+template <class Writer>
+std::uint64_t conjunction(const Writer& writer, std::int64_t operands) {
+    std::mt19937 random(17);
+    const std::array ops{SymbolicOp::NotEqual, SymbolicOp::LessThan, SymbolicOp::GreaterThan, SymbolicOp::NotEqual};
+    std::uint64_t chain = 0;
+    for (std::int64_t i = 0; i < operands; ++i) {
+        const SymbolicOp op = ops[random() % ops.size()];
+        const int near = static_cast<int>(random() % 1000);
+        const int constant = op == SymbolicOp::LessThan      ? 2000 + near
+                             : op == SymbolicOp::GreaterThan ? near
+                                                             : 1000 + near;
+        const auto term =
+            writer.intern(op, writer.name("Symbol_" + std::to_string(random() % 10)), writer.integer(constant));
+        chain = i == 0 ? term : writer.intern(SymbolicOp::And, chain, term);
+    }
+    return chain;
+}
+
+/// A left-deep sum of symbols, some of them again, and constants.
+template <class Writer>
+std::uint64_t sum(const Writer& writer, std::int64_t terms) {
+    std::mt19937 random(18);
+    std::uint64_t chain = writer.name("first");
+    for (std::int64_t i = 1; i < terms; ++i) {
+        const auto term = random() % 8 == 0 ? writer.integer(static_cast<int>(random() % 100))
+                                            : writer.name("Symbol_" + std::to_string(random() % 5000));
+        chain = writer.intern(SymbolicOp::Plus, chain, term);
+    }
+    return chain;
+}
+
+/// x+x, its double, the double of that: nodes in the number of levels, paths in two to that power.
+template <class Writer>
+std::uint64_t doubling(const Writer& writer, std::int64_t levels) {
+    std::uint64_t node = writer.intern(SymbolicOp::Divide, writer.name("x"), writer.name("y"));
+    for (std::int64_t i = 0; i < levels; ++i)
+        node = writer.intern(SymbolicOp::Plus, node, node);
+    return node;
+}
+
+#define BUILD_BOTH(function, size)                                                                                     \
+    auto subject = std::make_unique<Subject>();                                                                        \
+    subject->table.addBoolSymbols();                                                                                   \
+    subject->id = function(NodeWriter{subject->table}, size);                                                          \
+    subject->record = function(RecordWriter{subject->records}, size);                                                  \
+    return subject
+
+std::unique_ptr<Subject> conjunctionOf(std::int64_t size) {
+    BUILD_BOTH(conjunction, size);
+}
+
+std::unique_ptr<Subject> sumOf(std::int64_t size) {
+    BUILD_BOTH(sum, size);
+}
+
+std::unique_ptr<Subject> doublingOf(std::int64_t size) {
+    BUILD_BOTH(doubling, size);
+}
+
+#undef BUILD_BOTH
+
+template <Build build>
+void simplifyLibrary(benchmark::State& state, std::int64_t size) {
+    measure(
+        state, [&] { return build(size); },
+        [](auto& subject) {
+            std::uint64_t passes = 0;
+            benchmark::DoNotOptimize(SymbolicExprSimplify(subject->table).simplify(subject->id, passes));
+        });
+}
+
+template <Build build>
+void copyLibrary(benchmark::State& state, std::int64_t size) {
+    measure(
+        state, [&] { return build(size); },
+        [](auto& subject) {
+            SymbolicExprTable target;
+            benchmark::DoNotOptimize(SymbolicExprXFormVisitor(target).rebuild(subject->table, subject->id));
+        });
+}
+
+template <Build build>
+void convertLibrary(benchmark::State& state, std::int64_t size) {
+    measure(
+        state, [&] { return build(size); },
+        [](auto& subject) { benchmark::DoNotOptimize(SymbolicExprC2Q(subject->table)(subject->id)); });
+}
+
+template <Build build>
+void copyFloor(benchmark::State& state, std::int64_t size) {
+    measure(
+        state, [&] { return build(size); },
+        [](auto& subject) {
+            RecordTable target;
+            benchmark::DoNotOptimize(internAgain(subject->records, subject->record, target));
+        });
+}
+
+void corpusLibrary(benchmark::State& state, std::int64_t) {
+    struct Parsed {
+        SymbolicExprTable table;
+        std::vector<SymbolicExprId> ids;
+    };
+
+    measure(
+        state,
+        [] {
+            auto parsed = std::make_unique<Parsed>();
+            parsed->table.addBoolSymbols();
+            for (const std::string& line : readableLines())
+                parsed->ids.push_back(SymbolicExprParser(parsed->table, true, false)(line));
+            return parsed;
+        },
+        [](auto& parsed) {
+            const SymbolicExprSimplify simplifier(parsed->table);
+            std::uint64_t passes = 0;
+            for (const SymbolicExprId id : parsed->ids)
+                benchmark::DoNotOptimize(simplifier.simplify(id, passes));
+        });
+}
+
+/// What simplification cannot do without: every line read.
+void corpusFloor(benchmark::State& state, std::int64_t) {
+    measure(
+        state, [] { return std::make_unique<RecordTable>(); },
+        [&](auto& table) {
+            for (const std::string& line : readableLines())
+                benchmark::DoNotOptimize(readRecords(*table, line));
+        });
+}
+
+const bool registered = [] {
+    compare({.name = "simplify the corpus (floor: read it)",
+             .library = corpusLibrary,
+             .floor = corpusFloor,
+             .items = static_cast<double>(readableLines().size()),
+             .unit = "line"});
+    for (const std::int64_t operands : {100, 200, 400, 1000})
+        compare({.name = "simplify And of " + std::to_string(operands),
+                 .library = simplifyLibrary<conjunctionOf>,
+                 .floor = copyFloor<conjunctionOf>,
+                 .size = operands,
+                 .items = static_cast<double>(operands),
+                 .unit = "operand"});
+    for (const std::int64_t terms : {1000, 10000, 100000, 1000000})
+        compare({.name = "simplify a sum of " + std::to_string(terms),
+                 .library = simplifyLibrary<sumOf>,
+                 .floor = copyFloor<sumOf>,
+                 .size = terms,
+                 .items = static_cast<double>(terms),
+                 .unit = "term"});
+    const std::int64_t levels = 60;
+    const std::string graph = std::to_string(levels) + " doublings";
+    compare(
+        {.name = "copy " + graph, .library = copyLibrary<doublingOf>, .floor = copyFloor<doublingOf>, .size = levels});
+    compare({.name = "convert " + graph,
+             .library = convertLibrary<doublingOf>,
+             .floor = copyFloor<doublingOf>,
+             .size = levels});
+    compare({.name = "simplify " + graph,
+             .library = simplifyLibrary<doublingOf>,
+             .floor = copyFloor<doublingOf>,
+             .size = levels});
+    compare({.name = "copy a sum of 1000000",
+             .library = copyLibrary<sumOf>,
+             .floor = copyFloor<sumOf>,
+             .size = 1000000,
+             .items = 1e6,
+             .unit = "term"});
+    return true;
+}();
+
+} // namespace
+} // namespace VT::Benchmarks

@@ -1,0 +1,216 @@
+// Hashes as fixed numbers, and which nodes are one.
+#include "base/core/Nodes.hpp"
+#include "tests/support/AnyNode.hpp"
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <limits>
+
+namespace VT::Testing {
+namespace {
+
+constexpr double infinity = std::numeric_limits<double>::infinity();
+constexpr double nan = std::numeric_limits<double>::quiet_NaN();
+
+/// The mixing step, written once more.
+std::uint64_t step(std::uint64_t hash, std::int64_t key) {
+    const std::uint64_t m = 14313749767032793493U;
+    auto k = static_cast<std::uint64_t>(key) * m;
+    k = (k ^ (k >> 47)) * m;
+    return (hash ^ k) * m + 3864292196U;
+}
+
+std::uint64_t steps(std::uint64_t hash, const std::vector<std::int64_t>& keys) {
+    for (const std::int64_t key : keys)
+        hash = step(hash, key);
+    return hash;
+}
+
+TEST(Hash, Seeds) {
+    const struct {
+        int op;
+        std::uint64_t seed;
+    } seeds[] = {{24, 0x0fdae6de77aaba93}, {25, 0x787a4f407d7cdda1}, {26, 0x88aa289d8bcc8534},
+                 {27, 0xe5c6bd2ac9565810}, {28, 0x330d65c2aad4576c}, {29, 0x3c2c6926fc977bb0},
+                 {30, 0x016a16511cb5a6fd}, {31, 0x7cb93a5f4dd58737}};
+
+    for (const auto& [op, seed] : seeds) {
+        EXPECT_EQ(step(0, op), seed);
+        EXPECT_EQ(hashSeed(static_cast<SymbolicOp>(op)), seed);
+    }
+}
+
+TEST(Hash, Leaves) {
+    SymbolicExprTable table;
+
+    const struct {
+        std::string text;
+        std::uint64_t hash;
+    } strings[] = {{"true", 0xfffffffffffffffe},
+                   {"false", 0xfffffffffffffffd},
+                   {"", 0},
+                   {"True", steps(0, {84, 114, 117, 101})},
+                   {"\xc3\xa4", steps(0, {-61, -92})}, // bytes are signed
+                   {std::string("a\0", 2), steps(0, {97, 0})}};
+
+    for (const auto& [text, hash] : strings)
+        EXPECT_EQ(SymbolicString(table, text).getHash(), hash) << text;
+
+    EXPECT_EQ(SymbolicIntValue(table, 7).getHash(), 7U);
+    EXPECT_EQ(SymbolicIntValue(table, -2).getHash(), 0xfffffffffffffffe);
+    EXPECT_EQ(SymbolicIntValue(table, std::numeric_limits<int>::min()).getHash(), 0xffffffff80000000);
+
+    const struct {
+        double value;
+        std::uint64_t hash;
+    } reals[] = {{0.0, 0},
+                 {-0.0, 0},
+                 {1.0, 0x3ff0000000000000},
+                 {-2.5, 0xc004000000000000},
+                 {nan, 0xfffffffffffffffd},
+                 {-nan, 0xfffffffffffffffd},
+                 {infinity, 0xffffffffffffffff},
+                 {-infinity, 0xfffffffffffffffe},
+                 {5e-324, 1}};
+
+    for (const auto& [value, hash] : reals)
+        EXPECT_EQ(SymbolicDoubleValue(table, value).getHash(), hash) << value;
+}
+
+TEST(Hash, OperatorsMixTheirCodeAndThenTheirOperands) {
+    SymbolicExprTable table;
+    const SymbolicString x(table, "x");
+    const SymbolicString y(table, "y");
+    for (int code = 3; code < operatorCount; ++code) {
+        const auto op = static_cast<SymbolicOp>(code);
+        const auto fixed = operandCount(op);
+        for (std::size_t count = fixed.value_or(0); count <= fixed.value_or(5); ++count) {
+            NodeParts parts{"s\xff", 0, 0, {}};
+            std::vector<std::int64_t> keys{code};
+            if (code == 26)
+                keys[0] = count == 2 ? 24 : count == 3 ? 25 : 26;
+            if (code == 30)
+                keys[0] = count >= 1 && count <= 3 ? 26 + static_cast<int>(count) : 30;
+            if (code == 31)
+                keys = {'s', -1, code};
+            for (std::size_t i = 0; i < count; ++i) {
+                parts.inputs.push_back(1 - i % 2);
+                keys.push_back(static_cast<std::int64_t>(parts.inputs.back()));
+            }
+            EXPECT_EQ(table.get(makeAny(table, op, parts))->getHash(), steps(0, keys)) << code << " of " << count;
+        }
+    }
+    EXPECT_EQ(SymbolicMemberValue(table, y, "").getHash(), step(0x7cb93a5f4dd58737, 1));
+}
+
+TEST(Equality, GenericClassesAndTheirTwinsAreOne) {
+    using Op = SymbolicOp;
+
+    const struct {
+        Op fixed;
+        Op generic;
+    } twins[] = {{Op::Dims2D, Op::DimsND},
+                 {Op::Dims3D, Op::DimsND},
+                 {Op::FcnCall0U, Op::FcnCall},
+                 {Op::FcnCall1U, Op::FcnCall},
+                 {Op::FcnCall2U, Op::FcnCall}};
+
+    for (const auto& [fixed, generic] : twins) {
+        const NodeParts parts{"", 0, 0, std::vector<SymbolicExprId>(*operandCount(fixed), 0)};
+        for (const auto& [first, second] : {std::pair{fixed, generic}, std::pair{generic, fixed}}) {
+            SymbolicExprTable table;
+            const SymbolicExprId name = SymbolicString(table, "f").getId(table);
+            ASSERT_EQ(name, 0U);
+            const SymbolicExprId id = makeAny(table, first, parts);
+            EXPECT_EQ(makeAny(table, second, parts), id);
+            EXPECT_EQ(table.get(id)->op(), first) << "the first one stands for both";
+            EXPECT_EQ(table.size(), 2U);
+
+            SymbolicExprTable other;
+            makeAny(other, Op::String, {"f", 0, 0, {}});
+            const SymbolicExpr& twin = *other.get(makeAny(other, second, parts));
+            EXPECT_TRUE(twin == *table.get(id));
+            EXPECT_TRUE(*table.get(id) == twin);
+            EXPECT_EQ(twin.getHash(), table.get(id)->getHash());
+        }
+    }
+}
+
+TEST(Equality, NothingElseIsOne) {
+    // All classes over the same operands and payload, in one table: one node each, but for the twins.
+    for (const std::size_t count : {1U, 2U, 3U, 4U}) {
+        SymbolicExprTable table;
+        const NodeParts parts{"x", 0, 0, std::vector<SymbolicExprId>(count, 0)};
+        std::size_t classes = 0;
+        SymbolicString(table, "x");
+        for (int code = 3; code < operatorCount; ++code) {
+            const auto op = static_cast<SymbolicOp>(code);
+            const bool twin = (code == 26 && (count == 2 || count == 3)) || (code == 30 && count <= 3);
+            if (operandCount(op).value_or(count) != count)
+                continue;
+            makeAny(table, op, parts);
+            classes += twin ? 0 : 1;
+        }
+        EXPECT_EQ(table.size(), 1 + classes);
+    }
+    // Equal hashes of unlike leaves.
+    SymbolicExprTable table;
+    const std::vector<SymbolicExprId> ids{SymbolicString(table, "true").getId(table),
+                                          SymbolicIntValue(table, -2).getId(table),
+                                          SymbolicDoubleValue(table, -infinity).getId(table),
+                                          SymbolicString(table, "").getId(table),
+                                          SymbolicIntValue(table, 0).getId(table),
+                                          SymbolicDoubleValue(table, 0.0).getId(table)};
+    for (std::size_t i = 0; i < ids.size(); ++i)
+        EXPECT_EQ(ids[i], i);
+}
+
+TEST(Equality, RealsWithinTheTolerance) {
+    const double epsilon = std::numeric_limits<double>::epsilon();
+    const double largest = std::numeric_limits<double>::max();
+
+    const struct {
+        double a, b;
+        bool equal;
+        bool merged; // equal, and of one hash
+    } cases[] = {
+        {1.5, 1.5, true, true},
+        {0.0, -0.0, true, true},
+        {1.0, 1.0 + epsilon, true, false},
+        {1.0, 1.0 + 2 * epsilon, false, false},
+        {1.0, 1.0 - epsilon / 2, true, false},
+        {0.0, 5e-324, false, false},
+        {largest, -largest, false, false},
+        {largest, infinity, false, false},
+        {infinity, infinity, true, true},
+        {infinity, -infinity, false, false},
+        {infinity, 0.0, false, false},
+        {nan, nan, false, false},
+        {nan, infinity, false, false},
+        {nan, 0.0, false, false},
+    };
+
+    for (const auto& [a, b, equal, merged] : cases) {
+        SymbolicExprTable table;
+        const SymbolicDoubleValue first(table, a);
+        const SymbolicDoubleValue second(table, b);
+        EXPECT_EQ(first == second, equal) << a << ' ' << b;
+        EXPECT_EQ(second == first, equal) << a << ' ' << b;
+        EXPECT_EQ(table.size(), merged ? 1U : 2U) << a << ' ' << b;
+    }
+}
+
+TEST(Equality, ANaNThatIsInTheTableIsFoundAndOthersAreNot) {
+    SymbolicExprTable table;
+    const SymbolicDoubleValue temporary(table, nan);
+    SymbolicDoubleValue(table, nan);
+    ASSERT_EQ(table.size(), 2U);
+    EXPECT_EQ(temporary.getId(table), invalidId);
+    EXPECT_EQ(table.get(0)->getId(table), 0U);
+    EXPECT_EQ(table.get(1)->getId(table), 1U);
+    EXPECT_TRUE(table.contains(table.get(1)));
+}
+
+} // namespace
+} // namespace VT::Testing

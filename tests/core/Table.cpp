@@ -1,0 +1,265 @@
+// The table: identifiers, lookups and what it keeps beside its nodes.
+#include "base/core/Nodes.hpp"
+#include "tests/support/AnyNode.hpp"
+#include "tests/support/TreeText.hpp"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <limits>
+#include <memory>
+
+namespace VT::Testing {
+namespace {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+
+constexpr int noValue = 2147483647;
+
+TEST(Table, TruthConstantsComeFirst) {
+    SymbolicExprTable table;
+    EXPECT_EQ(table.getIdTRUE(), 0xffffffffffffffff);
+    EXPECT_EQ(table.getIdFALSE(), 0xffffffffffffffff);
+    table.addBoolSymbols();
+    table.addBoolSymbols();
+    EXPECT_EQ(table.getIdFALSE(), 0U);
+    EXPECT_EQ(table.getIdTRUE(), 1U);
+    EXPECT_EQ(table.size(), 2U);
+
+    const std::unique_ptr<SymbolicExprTable> fresh(table.CreateSymbolicExprTable());
+    EXPECT_EQ(fresh->size(), 0U);
+    EXPECT_EQ(fresh->getIdTRUE(), invalidId);
+}
+
+TEST(Table, OperandsAreIdentifiersOrNodesInEveryCombination) {
+    SymbolicExprTable table;
+    const SymbolicString a(table, "a");
+    const SymbolicIntValue b(table, 1);
+    const SymbolicExprId idA = a.getId(table);
+    const SymbolicExprId idB = b.getId(table);
+    const SymbolicExprId sum = SymbolicPlusExpr(table, idA, idB).getId(table);
+    EXPECT_EQ(SymbolicPlusExpr(table, a, idB).getId(table), sum);
+    EXPECT_EQ(SymbolicPlusExpr(table, idA, b).getId(table), sum);
+    EXPECT_EQ(SymbolicPlusExpr(table, a, b).getId(table), sum);
+    EXPECT_EQ(SymbolicPlusExpr(table, SymbolicString(table, "a"), SymbolicIntValue(table, 1)).getId(table), sum);
+    EXPECT_NE(SymbolicPlusExpr(table, b, a).getId(table), sum);
+    EXPECT_EQ(treeText(table, SymbolicQColon3Expr(table, a, idB, a).getId(table)), "QColon3(a,1,a)");
+    EXPECT_EQ(treeText(table, SymbolicMemberValue(table, a, "m").getId(table)), "MemberValue(a,m)");
+
+    // A name that is given as text is interned.
+    const SymbolicExprId call = SymbolicFcnCallExpr(table, std::string("f"), {idA, idB, idA}).getId(table);
+    EXPECT_EQ(treeText(table, call), "FcnCall(f,a,1,a)");
+    EXPECT_EQ(SymbolicFcnCallExpr(table, SymbolicString(table, "f"), {idA, idB, idA}).getId(table), call);
+    EXPECT_EQ(treeText(table, SymbolicFcnCall0UExpr(table, std::string("g")).getId(table)), "FcnCall0U(g)");
+    EXPECT_EQ(treeText(table, SymbolicFcnCall1UExpr(table, std::string("g"), b).getId(table)), "FcnCall1U(g,1)");
+    EXPECT_EQ(treeText(table, SymbolicFcnCall2UExpr(table, std::string("g"), a, b).getId(table)), "FcnCall2U(g,a,1)");
+    EXPECT_EQ(treeText(table, SymbolicCellArrayExpr(table, idB, {idA, idA}).getId(table)), "CellArray(1,a,a)");
+}
+
+TEST(Table, LookupsOfWhatIsNotThere) {
+    SymbolicExprTable table;
+    SymbolicExprTable other;
+    const SymbolicString node(other, "a");
+    EXPECT_EQ(node.getId(table), invalidId);
+    EXPECT_FALSE(table.contains(&node));
+    EXPECT_TRUE(table.isUnsetValue(node.getId(table)));
+    EXPECT_FALSE(table.isUnsetValue(0));
+    for (const SymbolicExprId id : {SymbolicExprId{0}, SymbolicExprId{1} << 32U, invalidId}) {
+        EXPECT_EQ(table.get(id), nullptr);
+        EXPECT_FALSE(table.has(id));
+        std::vector<std::string> symbols{"left over"};
+        table.getSymbolsFromExpression(id, symbols);
+        EXPECT_THAT(symbols, IsEmpty());
+    }
+}
+
+TEST(Table, AnAnswerIsNotRememberedForAnotherNodeAtTheSamePlace) {
+    // Temporaries take turns in one place of the stack, between two tables and classes.
+    SymbolicExprTable table;
+    SymbolicExprTable other;
+    alignas(SymbolicPlusExpr) std::byte place[sizeof(SymbolicPlusExpr)];
+    const auto inPlace = [&]<class Node>(std::type_identity<Node>, SymbolicExprTable& into, auto... parts) {
+        return std::unique_ptr<Node, void (*)(Node*)>(new (place) Node(into, parts...),
+                                                      [](Node* node) { node->~Node(); });
+    };
+    inPlace(std::type_identity<SymbolicPlusExpr>(), table, 7U, 8U);
+    {
+        const auto sum = inPlace(std::type_identity<SymbolicPlusExpr>(), other, 8U, 7U);
+        EXPECT_EQ(sum->getId(table), invalidId);
+        EXPECT_EQ(sum->getId(other), 0U);
+    }
+    {
+        const auto difference = inPlace(std::type_identity<SymbolicMinusExpr>(), other, 7U, 8U);
+        EXPECT_EQ(difference->getId(table), invalidId);
+    }
+    {
+        const auto sum = inPlace(std::type_identity<SymbolicPlusExpr>(), other, 7U, 8U);
+        EXPECT_EQ(sum->getId(table), 0U);
+        EXPECT_EQ(static_cast<const SymbolicExpr&>(*sum).getId(other), 2U);
+    }
+    {
+        // A miss must not be remembered either.
+        const auto product = inPlace(std::type_identity<SymbolicMultiplyExpr>(), other, 7U, 8U);
+        EXPECT_FALSE(table.contains(product.get()));
+    }
+    inPlace(std::type_identity<SymbolicMinusExpr>(), table, 7U, 8U);
+    EXPECT_EQ(SymbolicMinusExpr(other, 7U, 8U).getId(table), 1U);
+}
+
+TEST(Table, AddKeepsWhatItIsGivenAndFindsTheFirst) {
+    SymbolicExprTable table;
+    SymbolicExprTable source;
+    table.add(new SymbolicIntValue(source, 5));
+    table.add(new SymbolicIntValue(source, 5));
+    EXPECT_EQ(table.size(), 2U);
+    EXPECT_EQ(SymbolicIntValue(table, 5).getId(table), 0U);
+    EXPECT_EQ(table.get(1)->getId(table), 0U);
+    EXPECT_EQ(SymbolicNotExpr(table, 1).getId(table), 2U) << "identifiers go on";
+    // Foreign nodes between the table's own, through several enlargements.
+    for (int i = 0; i < 1000; ++i) {
+        if (i % 3 == 0)
+            table.add(new SymbolicIntValue(source, 100 + i));
+        else
+            SymbolicIntValue(table, 100 + i);
+    }
+    for (int i = 0; i < 1000; ++i)
+        EXPECT_EQ(SymbolicIntValue(table, 100 + i).getId(table), static_cast<SymbolicExprId>(3 + i));
+    EXPECT_EQ(table.size(), 1003U);
+}
+
+/// A host's table that keeps its nodes elsewhere.
+class CountingTable final : public SymbolicExprTable {
+public:
+    void add(const SymbolicExpr* node) override {
+        ++added;
+        SymbolicExprTable::add(node);
+    }
+
+    bool contains(const SymbolicExpr* node) const override {
+        ++asked;
+        return SymbolicExprTable::contains(node);
+    }
+
+    SymbolicExprId lookup(const SymbolicExpr* node) const override {
+        ++lookedUp;
+        return SymbolicExprTable::lookup(node);
+    }
+
+    using SymbolicExprTable::lookup;
+
+    int added = 0;
+    mutable int asked = 0;
+    mutable int lookedUp = 0;
+};
+
+TEST(Table, NodesReachADerivedTableThroughItsVirtualOperations) {
+    CountingTable table;
+    const SymbolicExprId x = SymbolicString(table, "x").getId(table);
+    EXPECT_EQ(table.asked, 1);
+    EXPECT_EQ(table.added, 1);
+    EXPECT_EQ(table.lookedUp, 1);
+    const SymbolicExprId sum = SymbolicPlusExpr(table, x, x).getId(table);
+    EXPECT_EQ(SymbolicPlusExpr(table, x, x).getId(table), sum);
+    EXPECT_EQ(table.asked, 3);
+    EXPECT_EQ(table.added, 2);
+    EXPECT_EQ(table.lookedUp, 3);
+    EXPECT_EQ(treeText(table, sum), "Plus(x,x)");
+}
+
+TEST(Table, LookupByOperator) {
+    SymbolicExprTable table;
+    std::vector<SymbolicExprId> sums;
+    for (int i = 0; i < 3; ++i)
+        sums.push_back(SymbolicPlusExpr(table, SymbolicIntValue(table, i), SymbolicIntValue(table, i)).getId(table));
+    std::vector<SymbolicExprId> found{99, 98};
+    table.lookup(SymbolicOp::Plus, found);
+    EXPECT_EQ(found, sums);
+    table.lookup(SymbolicOp::Minus, found);
+    EXPECT_THAT(found, IsEmpty());
+}
+
+TEST(Table, ValuesOfNames) {
+    constexpr double infinity = std::numeric_limits<double>::infinity();
+
+    const struct {
+        double real;
+        int expected;
+    } reals[] = {{2.7, 2},
+                 {-2.7, -2},
+                 {0.999, 0},
+                 {2147483646.5, 2147483646},
+                 {2147483648.0, noValue},
+                 {1e300, noValue},
+                 {-2147483648.9, std::numeric_limits<int>::min()},
+                 {-1e300, std::numeric_limits<int>::min()},
+                 {infinity, noValue},
+                 {-infinity, std::numeric_limits<int>::min()}};
+
+    SymbolicExprTable table;
+    for (const auto& [real, expected] : reals) {
+        table.registerValueId("R", SymbolicDoubleValue(table, real).getId(table));
+        EXPECT_EQ(table.getValue("R"), expected) << real;
+    }
+    SymbolicDoubleValue(table, std::numeric_limits<double>::quiet_NaN());
+    table.registerValueId("R", table.size() - 1);
+    EXPECT_EQ(table.getValue("R"), noValue);
+
+    table.registerValue("N", 3);
+    EXPECT_EQ(table.getValue("N"), 3);
+    table.registerValue("N", -4);
+    EXPECT_EQ(table.getValue("N"), -4) << "the later binding";
+    table.registerValueId("N", SymbolicString(table, "M").getId(table));
+    EXPECT_EQ(table.getValue("N"), noValue) << "no number";
+    table.registerValueId("N", invalidId - 1);
+    EXPECT_EQ(table.getValue("N"), noValue) << "no node";
+
+    const std::size_t before = table.size();
+    EXPECT_EQ(table.getValue("Unbound"), noValue);
+    EXPECT_EQ(table.size(), before + 1) << "interns the name";
+
+    const SymbolicExprId sum = SymbolicPlusExpr(table, 0, 0).getId(table);
+    EXPECT_TRUE(table.isUnsetValue(table.getValueId(sum)));
+    table.registerValueId(sum, 17);
+    EXPECT_EQ(table.getValueId(sum), 17U);
+    EXPECT_TRUE(table.isUnsetValue(table.getValueId(invalidId)));
+}
+
+TEST(Table, TheFirstAliasStays) {
+    SymbolicExprTable table;
+    table.insertAliasInfo("a", "x");
+    table.insertAliasInfo("a", "y");
+    EXPECT_EQ(table.getAliasForSymbolicIdentifier("a"), "x");
+    EXPECT_EQ(table.getAliasForSymbolicIdentifier("b"), "");
+}
+
+TEST(Table, SymbolsOfAnExpression) {
+    SymbolicExprTable table;
+    const SymbolicString a(table, "a");
+    const SymbolicString b(table, "b");
+    const SymbolicPlusExpr sum(table, b, SymbolicMemberValue(table, a, "field"));
+    const SymbolicMultiplyExpr product(table, sum, sum);
+    const SymbolicExprId call = SymbolicFcnCall1UExpr(table, std::string("f"), product).getId(table);
+    std::vector<std::string> symbols{"left over"};
+    table.getSymbolsFromExpression(call, symbols);
+    EXPECT_THAT(symbols, ElementsAre("f", "b", "a"));
+}
+
+TEST(Table, GrowsAcrossManyChunksWithoutMovingANode) {
+    SymbolicExprTable table;
+    SymbolicExprId last = SymbolicString(table, std::string(100, 's')).getId(table);
+    const SymbolicExpr* const first = table.get(last);
+    std::vector<const SymbolicExpr*> nodes;
+    for (int i = 0; i < 200000; ++i) {
+        last = SymbolicMinusExpr(table, last, 0U).getId(table);
+        nodes.push_back(table.get(last));
+    }
+    EXPECT_EQ(table.get(0), first);
+    for (std::size_t i = 0; i < nodes.size(); ++i) {
+        ASSERT_EQ(table.get(i + 1), nodes[i]);
+        ASSERT_EQ(table.lookup(nodes[i]), i + 1);
+    }
+}
+
+} // namespace
+} // namespace VT::Testing

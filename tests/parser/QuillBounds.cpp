@@ -1,0 +1,197 @@
+// Trees that a host may hand over, texts without bounds, and the debug dump.
+#include "base/core/Limits.hpp"
+#include "parser/ParseTreeDump.hpp"
+#include "tests/parser/QuillReading.hpp"
+
+#include <gtest/gtest.h>
+#include <rapidcheck/gtest.h>
+
+#include <algorithm>
+#include <array>
+#include <random>
+#include <sstream>
+
+namespace VT::Testing {
+namespace {
+
+using Tree = _Q_parse_tree_T<char>;
+
+Tree token(std::int32_t code, const char* text, std::uint32_t start = 0) {
+    Tree node{Tree::terminal, code, start, {}, {}};
+    node.length = static_cast<std::uint32_t>(std::string_view(text).size());
+    node.text = text;
+    return node;
+}
+
+template <std::size_t Size>
+Tree rule(std::int32_t code, const std::array<Tree, Size>& children) {
+    Tree node{Tree::nonTerminal, code, 0, {}, {}};
+    node.childCount = static_cast<std::int32_t>(Size);
+    node.children = children.data();
+    return node;
+}
+
+std::string times(std::size_t count, const std::string& text) {
+    std::string all;
+    all.reserve(count * text.size());
+    for (std::size_t i = 0; i < count; ++i)
+        all += text;
+    return all;
+}
+
+TEST(QuillBounds, DeepAndBroadTrees) {
+    constexpr std::size_t count = 200'000;
+
+    const struct {
+        std::string text;
+        std::size_t nodes; ///< that the table holds then
+    } cases[] = {
+        {times(count, "A+") + "1", count + 2},  {times(count, "A && ") + "B", count + 2},
+        {"A" + times(count, ".b"), count + 2},  {"A" + times(count, ".b(1)"), 2 * count + 3},
+        {"f" + times(count, "(1)"), count + 2}, {"A" + times(count, "'"), count + 1},
+        {"f(" + times(count, "A,") + "B)", 4},  {"[" + times(count, "A ") + "]", 3},
+        {"{" + times(count, "A;") + "}", 4},
+    };
+
+    for (const auto& [text, nodes] : cases) {
+        SymbolicExprTable table;
+        VTSymbolicExprErrorChecker checker;
+        const SymbolicExprId id = SymbolicExprFromQParseTreeBlockVariants(table, checker)(text);
+        EXPECT_TRUE(table.has(id)) << text.substr(0, 20);
+        EXPECT_EQ(table.size(), nodes) << text.substr(0, 20);
+    }
+}
+
+TEST(QuillBounds, Nesting) {
+    for (const std::string open : {"(", "-", "f(", "[", "{", "@(p) "}) {
+        const std::string close = open.ends_with('(') ? ")" : open == "[" ? "]" : open == "{" ? "}" : "";
+        const auto nested = [&](std::size_t depth) { return times(depth, open) + "A" + times(depth, close); };
+        EXPECT_FALSE(readCondition(nested(10)).thrown);
+        SymbolicExprTable table;
+        VTSymbolicExprErrorChecker checker;
+        SymbolicExprFromQParseTreeBlockVariants converter(table, checker);
+        EXPECT_NE(converter(nested(limits::nesting)), invalidId) << open;
+        EXPECT_THROW(converter(nested(limits::nesting + 1)), HostDiagnostic) << open;
+    }
+}
+
+/// Any bytes, and mostly pieces of Quill.
+std::string soup(std::uint64_t seed) {
+    static const std::vector<std::string> pieces{
+        "A", "f", "1",    "2.5", "0x1F", "1e999", "'t'", "(",   ")",       "[",  "]",       "{",  "}",
+        ",", ";", " ",    "+",   "-",    "~",     "==",  "&&",  "|",       ":",  ".",       ".*", "^",
+        "'", "@", "@(p)", "...", "\n",   "%",     "end", "rem", "bitand(", "3i", "\xc3\xa9"};
+    std::mt19937_64 random(seed);
+    std::string text;
+    for (std::size_t i = random() % 30; i > 0; --i) {
+        if (random() % 20 == 0)
+            text += static_cast<char>(random());
+        else
+            text += pieces[random() % pieces.size()];
+    }
+    return text;
+}
+
+RC_GTEST_PROP(QuillBounds, AnyBytesGiveAnExpressionOrOneReport, ()) {
+    const std::string text = soup(*rc::gen::arbitrary<std::uint64_t>());
+    SymbolicExprTable table;
+    VTSymbolicExprErrorChecker checker;
+    const SymbolicExprId dimension = SymbolicExprFromQParseTree(table, checker)(text);
+    RC_ASSERT(table.has(dimension) != (checker.diagnostics().size() == 1));
+    RC_ASSERT(checker.diagnostics().size() <= 1);
+    for (const HostDiagnostic& report : checker.diagnostics())
+        RC_ASSERT(report.offset().value() <= text.size());
+    checker.clear();
+    try {
+        RC_ASSERT(table.has(SymbolicExprFromQParseTreeBlockVariants(table, checker)(text)));
+        RC_ASSERT(checker.diagnostics().empty());
+    } catch (const HostDiagnostic& thrown) {
+        RC_ASSERT(checker.diagnostics().size() == 1);
+        RC_ASSERT(thrown.offset() == checker.diagnostics().front().offset());
+    }
+}
+
+TEST(QuillBounds, TreesOfOtherHosts) {
+    SymbolicExprTable table;
+    VTSymbolicExprErrorChecker checker;
+    SymbolicExprFromQParseTree dimensions(table, checker);
+    SymbolicExprFromQParseTreeBlockVariants conditions(table, checker);
+    const Tree a = token(40, "a");
+    const Tree sign = token(1, "?");
+    const std::array<Tree, 1> alone{a};
+    const std::array<Tree, 2> prefixed{sign, a};
+    const std::array<Tree, 3> enclosed{sign, a, sign};
+    const auto dimension = [&](const Tree& tree) { return treeText(table, dimensions.visitNode(tree, "text")); };
+    const auto condition = [&](const Tree& tree) { return treeText(table, conditions.visitNode(tree, "text")); };
+
+    // The second forms of rules
+    EXPECT_EQ(dimension(rule(67, enclosed)), "a");
+    EXPECT_EQ(condition(rule(67, enclosed)), "a");
+    EXPECT_EQ(condition(rule(25, prefixed)), "UnaryMinus(a)");
+    EXPECT_EQ(condition(rule(26, prefixed)), "Not(a)");
+    EXPECT_TRUE(checker.diagnostics().empty());
+    EXPECT_EQ(dimension(rule(25, prefixed)), "invalid");
+    EXPECT_EQ(dimension(rule(26, prefixed)), "invalid");
+
+    // Numbers that the embedded host does not write
+    EXPECT_EQ(dimension(token(41, "1_000", 4)), "invalid");
+    EXPECT_EQ(reportText(checker.diagnostics().back()), "InvalidLiteralValue(1_000, text, 4)@4");
+    EXPECT_EQ(condition(token(41, "")), "invalid");
+
+    // Codes that nothing is known of, and rules without the children that they need
+    const auto expectOneReport = [&](const auto& answerOf, const Tree& tree, const std::string& report) {
+        checker.clear();
+        EXPECT_EQ(answerOf(tree), "invalid") << tree.code;
+        ASSERT_EQ(checker.diagnostics().size(), 1U) << tree.code;
+        EXPECT_EQ(reportText(checker.diagnostics().front()), report);
+    };
+    for (const std::int32_t code :
+         {-2147483647 - 1, -1, 0, 22, 39, 43, 44, 49, 76, 83, 85, 90, 136, 299, 300, 304, 305, 306, 308, 319, 320,
+          2147483647}) {
+        const std::string name = vtuQParserNonTerminalName(code);
+        for (const bool isDimension : {true, false}) {
+            const auto answerOf = [&](const Tree& tree) { return isDimension ? dimension(tree) : condition(tree); };
+            expectOneReport(answerOf, rule(code, alone), "UnhandledExpression(" + name + ", text, 0)@0");
+            expectOneReport(answerOf, token(code, "?", 2), "UnhandledExpression(?, text, 2)@2");
+        }
+    }
+    // An element where a row should stand
+    expectOneReport(dimension, rule(27, alone), "UnhandledExpression(a, text, 0)@0");
+    expectOneReport(condition, rule(27, alone), "UnhandledExpression(a, text, 0)@0");
+    expectOneReport(condition, rule(301, alone), "UnhandledExpression(a, text, 0)@0");
+}
+
+TEST(QuillBounds, Dump) {
+    SymbolicExprTable table;
+    VTSymbolicExprErrorChecker checker;
+    SymbolicExprFromQParseTreeBlockVariants converter(table, checker);
+    checker.disableDiagnostics();
+    const auto dumpOf = [&](const char* text) {
+        testing::internal::CaptureStdout();
+        converter(text, true);
+        return testing::internal::GetCapturedStdout();
+    };
+    EXPECT_EQ(dumpOf("f(A)+1"), "========Q-Parse tree for expression 'f(A)+1'\n"
+                                "(0: expression) Code = 21, Child_count = 1\n"
+                                "  (1: plus) Code = 49, Child_count = 3\n"
+                                "    (2: call) Code = 85, Child_count = 4\n"
+                                "      (3: identifier) Code = 40, Val = f\n"
+                                "      (3: () Code = 240, Val = (\n"
+                                "      (3: argument list) Code = 303, Child_count = 1\n"
+                                "        (4: identifier) Code = 40, Val = A\n"
+                                "      (3: )) Code = 241, Val = )\n"
+                                "    (2: +) Code = 220, Val = +\n"
+                                "    (2: number) Code = 41, Val = 1\n"
+                                "======================================================\n");
+    EXPECT_EQ(dumpOf("A +"), "======Q-Parse tree not found for expression 'A +'\n");
+    testing::internal::CaptureStdout();
+    converter("A");
+    EXPECT_EQ(testing::internal::GetCapturedStdout(), "");
+
+    // Depth is shown, but does not make the text grow with its square.
+    const std::string deep = times(50'000, "A+") + "1";
+    EXPECT_LT(dumpOf(deep.c_str()).size(), 200 * deep.size());
+}
+
+} // namespace
+} // namespace VT::Testing

@@ -1,0 +1,198 @@
+// Nesting at the bound and one beyond, long texts, and memory that runs out.
+#include "tests/quill/TreeText.hpp"
+
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <cstdlib>
+#include <new>
+
+namespace {
+
+// Allocations of the program, and the one that fails.
+std::atomic<long> living{0};
+std::atomic<long> allowed{-1};
+
+void* allocate(std::size_t size) {
+    if (allowed.load() >= 0 && allowed.fetch_sub(1) == 0)
+        throw std::bad_alloc();
+    void* const memory = std::malloc(size == 0 ? 1 : size);
+    if (memory == nullptr)
+        throw std::bad_alloc();
+    ++living;
+    return memory;
+}
+
+void release(void* memory) noexcept {
+    if (memory == nullptr)
+        return;
+    --living;
+    std::free(memory);
+}
+
+} // namespace
+
+void* operator new(std::size_t size) {
+    return allocate(size);
+}
+
+void* operator new[](std::size_t size) {
+    return allocate(size);
+}
+
+void operator delete(void* memory) noexcept {
+    release(memory);
+}
+
+void operator delete[](void* memory) noexcept {
+    release(memory);
+}
+
+void operator delete(void* memory, std::size_t) noexcept {
+    release(memory);
+}
+
+void operator delete[](void* memory, std::size_t) noexcept {
+    release(memory);
+}
+
+namespace VT::Testing {
+namespace {
+
+constexpr std::size_t bound = 256;
+constexpr std::size_t mebibyte = std::size_t{1} << 20U;
+
+std::string times(std::size_t count, const std::string& text) {
+    std::string all;
+    for (std::size_t i = 0; i < count; ++i)
+        all += text;
+    return all;
+}
+
+TEST(QuillBounds, NestingAtTheBoundAndOneBeyond) {
+    struct Nest {
+        std::string open;
+        std::string close;
+        std::size_t place; ///< of the bracket in `open` that is one too many
+    };
+
+    const std::vector<Nest> nests = {{"(", ")", 0},
+                                     {"[", "]", 0},
+                                     {"{", "}", 0},
+                                     {"f(", ")", 1},
+                                     {"c{", "}", 1},
+                                     {"f(a,", ")", 1},
+                                     {"a || (", ")", 5},
+                                     {"-f(", ")", 2},
+                                     {"[1 ", "]", 0},
+                                     {"a^(b+", ")", 2},
+                                     {"@(x) ", "", 0},
+                                     {"1 + @(x) ", "", 4},
+                                     {"2^-@(x, y) x*", "", 3},
+                                     {"1:(", ")", 2}};
+    for (const std::size_t nesting : {std::size_t{1}, std::size_t{7}, bound}) {
+        QuillReading reading(nesting);
+        for (const auto& [open, close, place] : nests) {
+            const std::string good = times(nesting, open) + "x" + times(nesting, close);
+            EXPECT_NE(reading.read(good), nullptr) << good;
+            const std::string deep = times(nesting + 1, open) + "x" + times(nesting + 1, close);
+            EXPECT_EQ(reading.read(deep), nullptr) << open;
+            EXPECT_EQ(reading.failure().position, nesting * open.size() + place) << open;
+            EXPECT_EQ(reading.failure().reason, "brackets and functions are nested too deeply");
+        }
+        for (const std::string prefix : {"-", "~", "+", "! "}) {
+            const std::string run = times(nesting, prefix);
+            EXPECT_NE(reading.read(run + "x"), nullptr) << prefix;
+            EXPECT_NE(reading.read("a ^ " + run + "x"), nullptr) << prefix;
+            EXPECT_EQ(reading.read(run + "-x"), nullptr) << prefix;
+            EXPECT_EQ(reading.failure().position, run.size()) << prefix;
+            EXPECT_EQ(reading.failure().reason, "too many prefix operators follow each other");
+        }
+    }
+    // Siblings do not add up, nor do the prefix operators of different operands.
+    QuillReading reading(1);
+    for (const std::string piece : {"(x) + ", "-x + ", "f(-1) * ", "[-x] - ", "-(x) : ", "[@f] == ", "f(@f) < "}) {
+        const std::string text = times(500, piece) + "x";
+        EXPECT_NE(reading.read(text), nullptr) << piece;
+    }
+}
+
+TEST(QuillBounds, LongTexts) {
+    struct Shape {
+        std::string front;
+        std::string piece;
+        std::string back;
+        bool read;
+    };
+
+    const std::vector<Shape> shapes = {
+        {"a", "+a", "", true},     {"a", "^-a", "", true},    {"a", "'", "", true},        {"a", ".b", "", true},
+        {"f", "()", "", true},     {"c", "{1}", "", true},    {"1", ":1", "", true},       {"[", "1 ", "]", true},
+        {"[", ";", "]", true},     {"f(", "1,", "1)", true},  {"", "n", "", true},         {"1.", "7", "", true},
+        {"'", "''", "'", true},    {"", " ", "a", true},      {"%", "%", "\na", true},     {"", "...\n", "a", true},
+        {"[", "1 -2 ", "]", true}, {"[", "(1)' ", "]", true}, {"a", "||b&&c|d", "", true}, {"@(", "p,", "p) p", true},
+        {"", "(a)+", "a", true},   {"", "(", "", false},      {"", "-", "", false},        {"", "@(x)", "", false},
+        {"", "a ", "", false},     {"'", "a", "", false},     {"", "f(", "", false},       {"", "''", "' '", true},
+        {"", "...", "", false},    {"[", "a '", "", false},   {"", "[1 -", "", false},     {"a", "= ", "", false},
+        {"", "1e", "", false},     {"a", "+%\n", "", false},  {"", "\xFF", "", false},     {"a...", "a", "+", true}};
+    QuillReading reading;
+    for (const auto& [front, piece, back, isRead] : shapes) {
+        std::string text = front;
+        text += times((mebibyte - front.size() - back.size()) / piece.size(), piece);
+        text += back;
+        const QuillNode* const tree = reading.read(text);
+        EXPECT_EQ(tree != nullptr, isRead) << piece << reading.failure().reason;
+        if (tree == nullptr) {
+            EXPECT_LE(reading.failure().position, text.size()) << piece;
+            continue;
+        }
+        EXPECT_EQ(shapeError(*tree, text), "") << piece;
+        EXPECT_LE(countNodes(*tree), 3 * text.size() + 4) << piece;
+    }
+}
+
+TEST(QuillBounds, MemoryThatRunsOut) {
+    const std::vector<std::string> texts = {"a + b", times(600, "f(1,[2 3;4],@(x)-x){'t'} + ") + "a.b'",
+                                            "[" + times(3000, "1 ") + "]", times(3000, "a^") + "$", times(200, "((")};
+    const long before = living;
+    for (const std::string& text : texts) {
+        const auto parser = PARSER_T<char>::create(bound);
+        bool done = false;
+        for (long n = 0; !done; ++n) {
+            allowed = n;
+            try {
+                parser->delete_parse_tree(parser->generate_parse_tree(text.data(), text.size()));
+                done = true;
+            } catch (const std::bad_alloc&) {
+                EXPECT_LT(n, 1000);
+            }
+            allowed = -1;
+            const QuillNode* const next = parser->generate_parse_tree("1 + x");
+            ASSERT_NE(next, nullptr);
+            EXPECT_EQ(treeText(*next), "(49 1 x)");
+            parser->delete_parse_tree(next);
+        }
+    }
+    EXPECT_EQ(living, before);
+}
+
+/// A parser that has read one long text does not hold on to its memory, and trees live apart from each other.
+TEST(QuillBounds, TreesOfOneParser) {
+    const auto parser = PARSER_T<char>::create(bound);
+    const std::string longText = times(100000, "a+") + "a";
+    const QuillNode* const first = parser->generate_parse_tree("a == 1");
+    const QuillNode* const second = parser->generate_parse_tree(longText.data(), longText.size());
+    EXPECT_EQ(parser->generate_parse_tree("a +"), nullptr);
+    const QuillNode* const third = parser->generate_parse_tree("b'");
+    parser->delete_parse_tree(second);
+    EXPECT_EQ(treeText(*first), "(103 a 1)");
+    parser->delete_parse_tree(first);
+    const QuillNode* const fourth = parser->generate_parse_tree("[c d]");
+    EXPECT_EQ(treeText(*third), "(78 b)");
+    EXPECT_EQ(treeText(*fourth), "(27 (302 c d))");
+    parser->delete_parse_tree(third);
+    parser->delete_parse_tree(fourth);
+}
+
+} // namespace
+} // namespace VT::Testing

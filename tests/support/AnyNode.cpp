@@ -1,0 +1,90 @@
+#include "tests/support/AnyNode.hpp"
+
+#include <array>
+#include <limits>
+#include <type_traits>
+
+namespace VT::Testing {
+
+namespace {
+
+template <class Node>
+constexpr std::optional<std::size_t> countOf() {
+    if constexpr (std::is_base_of_v<SymbolicUnaryExpr, Node>)
+        return 1;
+    else if constexpr (std::is_base_of_v<SymbolicBinaryExpr, Node>)
+        return 2;
+    else if constexpr (std::is_base_of_v<SymbolicTernaryExpr, Node>)
+        return 3;
+    else if constexpr (std::is_base_of_v<SymbolicMultiExpr, Node>)
+        return std::nullopt;
+    else
+        return 0;
+}
+
+template <class Node>
+SymbolicExprId make(SymbolicExprTable& table, const NodeParts& parts) {
+    const auto& in = parts.inputs;
+    if constexpr (std::is_same_v<Node, SymbolicString>)
+        return Node(table, parts.text).getId(table);
+    else if constexpr (std::is_same_v<Node, SymbolicIntValue>)
+        return Node(table, parts.integer).getId(table);
+    else if constexpr (std::is_same_v<Node, SymbolicDoubleValue>)
+        return Node(table, parts.real).getId(table);
+    else if constexpr (std::is_same_v<Node, SymbolicMemberValue>)
+        return Node(table, in.at(0), parts.text).getId(table);
+    else if constexpr (countOf<Node>() == 1)
+        return Node(table, in.at(0)).getId(table);
+    else if constexpr (countOf<Node>() == 2)
+        return Node(table, in.at(0), in.at(1)).getId(table);
+    else if constexpr (countOf<Node>() == 3)
+        return Node(table, in.at(0), in.at(1), in.at(2)).getId(table);
+    else
+        return Node(table, in).getId(table);
+}
+
+} // namespace
+
+std::optional<std::size_t> operandCount(SymbolicOp op) {
+    switch (op) {
+#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                         \
+    case SymbolicOp::Name:                                                                                             \
+        return countOf<Class>();
+#include "base/core/operators.def"
+#undef VTSYM_OPERATOR
+    case SymbolicOp::None:
+        break;
+    }
+    return 0;
+}
+
+SymbolicExprId makeAny(SymbolicExprTable& table, SymbolicOp op, const NodeParts& parts) {
+    switch (op) {
+#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                         \
+    case SymbolicOp::Name:                                                                                             \
+        return make<Class>(table, parts);
+#include "base/core/operators.def"
+#undef VTSYM_OPERATOR
+    case SymbolicOp::None:
+        break;
+    }
+    return invalidId;
+}
+
+SymbolicExprId makeRandom(SymbolicExprTable& table, std::mt19937_64& random) {
+    static const std::array<const char*, 5> texts{"", "a", "b", "true", "\xff"};
+    static const std::array<double, 6> reals{
+        0.0, -0.0, 1.0, 1.0 + std::numeric_limits<double>::epsilon(), 1e300, std::numeric_limits<double>::infinity()};
+    NodeParts parts;
+    parts.text = texts[random() % texts.size()];
+    parts.integer = static_cast<int>(random() % 5) - 2;
+    parts.real = reals[random() % reals.size()];
+    const bool leaf = table.size() == 0 || random() % 4 == 0;
+    const auto op = static_cast<SymbolicOp>(leaf ? random() % 3 : 3 + random() % (operatorCount - 3));
+    const std::size_t count = operandCount(op).value_or(random() % 5);
+    for (std::size_t i = 0; i < count; ++i)
+        parts.inputs.push_back(random() % table.size());
+    return makeAny(table, op, parts);
+}
+
+} // namespace VT::Testing
