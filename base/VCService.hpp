@@ -4,9 +4,12 @@
 
 #include "base/service/VCServiceHandle.hpp"
 #include "base/service/VCSymbolicExprId.hpp"
+#include "base/service/VCSymbols.hpp"
 
 #include <memory>
 #include <string>
+#include <unordered_map>
+#include <vector>
 
 namespace VT {
 
@@ -44,9 +47,10 @@ public:
 
     // Reading.
 
-    /// The condition of a C text.  Throws the host diagnostic "Vantor:Variants:ExpressionParseError" for any text that
-    /// is none.
+    /// The condition of a text in C or in Quill; one condition is the same nodes in both, but for literals with a sign.
+    /// Throws the host diagnostic "Vantor:Variants:ExpressionParseError" for any text that is none.
     SymbolicExprId parseC(const std::string& text);
+    SymbolicExprId parseQ(const std::string& text);
     /// Whether a text is exactly "true" or "false".
     static bool isTRUEOrFALSEString(const std::string& text);
 
@@ -64,13 +68,16 @@ public:
     /// While the feature "CacheSymExprSimplifyResults" was above 0 when the service was made, results are kept by
     /// language.
     VCSymbolicExprId simplify(const VCSymbolicExprId& condition, bool isQuill);
-    /// The simplified condition of a C text.
+    /// The simplified condition of a text.
     VCSymbolicExprId simplifyFromCCondition(const std::string& text);
-    /// The same, printed.  Quill text is that of the condition in Quill shape: the C text `a/b==1` gives
-    /// `idivide(a,b)==1`.
+    VCSymbolicExprId simplifyFromQCondition(const std::string& text);
+    /// The same, printed.  Quill text of a C condition is that of the condition in Quill shape: the C text `a/b==1`
+    /// gives `idivide(a,b)==1`.
     std::string simplifyCExprFromCCondition(const std::string& text);
     std::string simplifyQExprFromCCondition(const std::string& text);
-    /// Simplifies without caches and customizer.  The input is C: throws std::invalid_argument for `inputIsQuill`.
+    std::string simplifyCExprFromQCondition(const std::string& text);
+    std::string simplifyQExprFromQCondition(const std::string& text);
+    /// Simplifies without caches and customizer.
     std::string simplifyExpressionWithoutEvalChecks(const std::string& text, bool inputIsQuill, bool outputIsQuill);
 
     // Printing.
@@ -84,8 +91,7 @@ public:
     std::string printCExpr(const VCSymbolicExprId& condition);
     /// C text of the condition as it stands.
     std::string printCExprNoConversion(const VCSymbolicExprId& condition);
-    /// A text in the other language, or in the same one as the printer writes it; not simplified.  The input is C:
-    /// throws std::invalid_argument for `inputIsQuill`.
+    /// A text in the other language, or in the same one as the printer writes it; not simplified.
     std::string convertExprBetweenQandC(const std::string& text, bool inputIsQuill, bool outputIsQuill);
 
     // Asking.
@@ -100,6 +106,20 @@ public:
     /// Records an alias of a parameter; the first alias stays.
     void addParameterAlias(const std::string& parameter, const std::string& alias);
 
+    /// Appends the symbols of the kinds asked for, as Quill text or as identifiers.  Throws std::out_of_range for a
+    /// kind that is none.
+    void getSymbolsFromExpression(const VCSymbolicExprId& condition, std::vector<std::string>& symbols,
+                                  const VCSymbolTypes& kinds) const;
+    void getSymbolsFromExpression(const VCSymbolicExprId& condition, std::vector<std::string>& symbols,
+                                  const VCSymbolType& kind) const;
+    void getSymbolsFromExpression(const VCSymbolicExprId& condition, std::vector<VCSymbolicExprId>& symbols,
+                                  const VCSymbolTypes& kinds) const;
+    void getSymbolsFromExpression(const VCSymbolicExprId& condition, std::vector<VCSymbolicExprId>& symbols,
+                                  const VCSymbolType& kind) const;
+    /// The condition with each named symbol replaced by the symbol that the map names for it.
+    VCSymbolicExprId replaceSymbolsInExpression(const VCSymbolicExprId& condition,
+                                                const std::unordered_map<std::string, std::string>& names);
+
     // What further operations on conditions are made of.
 
     [[nodiscard]] SymbolicExprTable& table() noexcept;
@@ -112,6 +132,9 @@ private:
     ~VCService();
 
     [[nodiscard]] bool has(const VCSymbolicExprId& condition) const noexcept;
+    SymbolicExprId parse(const std::string& text, bool isQuill);
+    VCSymbolicExprId simplifyFrom(const std::string& text, bool isQuill);
+    std::string printIn(bool quill, SymbolicExprId condition, bool wasQuill);
     VCSymbolicExprId combined(SymbolicExprId condition, bool simplify);
     SymbolicExprId rewritten(SymbolicExprId condition);
     SymbolicExprId simplifyNow(SymbolicExprId condition, bool isQuill);

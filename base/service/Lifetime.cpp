@@ -17,6 +17,7 @@ std::uint64_t generation = 0;  ///< of the latest service
 
 ServiceParts::ServiceParts()
     : cParser(table, true, true),
+      quillParser(table, checker),
       simplifier(table),
       toC(table),
       toQuill(table),

@@ -6,6 +6,8 @@
 #include "base/simplify/Simplify.hpp"
 #include "base/simplify/VCCustomizer.hpp"
 #include "base/transform/QuillConversion.hpp"
+#include "parser/ErrorChecker.hpp"
+#include "parser/QuillConverterBlockVariants.hpp"
 #include "parser/SymbolicExprParser.hpp"
 
 #include <array>
@@ -33,6 +35,8 @@ struct ServiceParts {
     std::int32_t useCount = 0;
     SymbolicExprTable table;
     SymbolicExprParser cParser;
+    VTSymbolicExprErrorCheckerBlockVariants checker;
+    SymbolicExprFromQParseTreeBlockVariants quillParser;
     SymbolicExprSimplify simplifier;
     SymbolicExprQ2C toC;
     SymbolicExprC2Q toQuill;

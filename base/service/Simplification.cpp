@@ -43,14 +43,22 @@ SymbolicExprId VCService::simplifyNow(SymbolicExprId condition, bool isQuill) {
     return simplifier.simplify(condition, passes, visitor);
 }
 
-VCSymbolicExprId VCService::simplifyFromCCondition(const std::string& text) {
-    auto& cache = ServiceParts::of(parts_->simplifiedFromText, false);
+VCSymbolicExprId VCService::simplifyFrom(const std::string& text, bool isQuill) {
+    auto& cache = ServiceParts::of(parts_->simplifiedFromText, isQuill);
     if (const auto known = parts_->caching ? cache.find(text) : std::nullopt)
         return *known;
-    const SymbolicExprId result = simplify(parseC(text), false).id();
+    const SymbolicExprId result = simplify(parse(text, isQuill), isQuill).id();
     if (parts_->caching)
         cache.insert(text, result);
     return result;
+}
+
+VCSymbolicExprId VCService::simplifyFromCCondition(const std::string& text) {
+    return simplifyFrom(text, false);
+}
+
+VCSymbolicExprId VCService::simplifyFromQCondition(const std::string& text) {
+    return simplifyFrom(text, true);
 }
 
 } // namespace VT

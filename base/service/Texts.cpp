@@ -3,8 +3,6 @@
 #include "base/service/ServiceParts.hpp"
 #include "base/service/TruthTexts.hpp"
 
-#include <stdexcept>
-
 namespace VT {
 
 std::optional<SymbolicExprId> truthOfText(const SymbolicExprTable& table, std::string_view text) {
@@ -15,18 +13,18 @@ std::optional<SymbolicExprId> truthOfText(const SymbolicExprTable& table, std::s
     return std::nullopt;
 }
 
-namespace {
-
-void requireC(bool inputIsQuill) {
-    if (inputIsQuill)
-        throw std::invalid_argument("Quill text is not read: give the condition as C text");
+SymbolicExprId VCService::parse(const std::string& text, bool isQuill) {
+    if (const auto truth = truthOfText(parts_->table, text))
+        return *truth;
+    return isQuill ? parts_->quillParser(text) : parts_->cParser(text);
 }
 
-} // namespace
-
 SymbolicExprId VCService::parseC(const std::string& text) {
-    const auto truth = truthOfText(parts_->table, text);
-    return truth ? *truth : parts_->cParser(text);
+    return parse(text, false);
+}
+
+SymbolicExprId VCService::parseQ(const std::string& text) {
+    return parse(text, true);
 }
 
 bool VCService::isTRUEOrFALSEString(const std::string& text) {
@@ -49,10 +47,17 @@ std::string VCService::printCExpr(const VCSymbolicExprId& condition) {
     return printCExprNoConversion(parts_->toC(condition.id()));
 }
 
+/// Text of a condition that was read in one language and is written in one: what was written in Quill has Quill's shape
+/// where it is to be Quill, and what was written in C has that of C.
+std::string VCService::printIn(bool quill, SymbolicExprId condition, bool wasQuill) {
+    if (quill)
+        return wasQuill ? printQExpr(condition) : printQExprWithConversion(condition);
+    return wasQuill ? printCExpr(condition) : printCExprNoConversion(condition);
+}
+
 std::string VCService::convertExprBetweenQandC(const std::string& text, bool inputIsQuill, bool outputIsQuill) {
-    requireC(inputIsQuill);
-    const SymbolicExprId condition = parseC(text);
-    return outputIsQuill ? printQExprWithConversion(condition) : printCExpr(condition);
+    const SymbolicExprId condition = parse(text, inputIsQuill);
+    return outputIsQuill ? printIn(true, condition, inputIsQuill) : printCExpr(condition);
 }
 
 std::string VCService::simplifyCExprFromCCondition(const std::string& text) {
@@ -63,12 +68,19 @@ std::string VCService::simplifyQExprFromCCondition(const std::string& text) {
     return text.empty() ? std::string() : printQExprWithConversion(simplifyFromCCondition(text));
 }
 
+std::string VCService::simplifyCExprFromQCondition(const std::string& text) {
+    return text.empty() ? std::string() : printCExpr(simplifyFromQCondition(text));
+}
+
+std::string VCService::simplifyQExprFromQCondition(const std::string& text) {
+    return text.empty() ? std::string() : printQExpr(simplifyFromQCondition(text));
+}
+
 std::string VCService::simplifyExpressionWithoutEvalChecks(const std::string& text, bool inputIsQuill,
                                                            bool outputIsQuill) {
-    requireC(inputIsQuill);
     std::uint64_t passes = 0;
-    const SymbolicExprId condition = parts_->simplifier.simplify(parseC(text), passes);
-    return outputIsQuill ? printQExprWithConversion(condition) : printCExprNoConversion(condition);
+    const SymbolicExprId condition = parts_->simplifier.simplify(parse(text, inputIsQuill), passes);
+    return printIn(outputIsQuill, condition, inputIsQuill);
 }
 
 } // namespace VT

@@ -28,8 +28,19 @@ void Conditions::makeRoomFor(const std::string& text) {
     textBytes_ = 0;
 }
 
-std::string Conditions::print(VT::SymbolicExprId condition, bool quill) const {
-    return visible(quill ? service().printQExprWithConversion(condition) : service().printCExpr(condition));
+VT::SymbolicExprId Conditions::parse(const TextOptions& options, const std::string& text) const {
+    return options.fromQuill() ? service().parseQ(text) : service().parseC(text);
+}
+
+VT::SymbolicExprId Conditions::simplify(const TextOptions& options, const std::string& text) const {
+    return (options.fromQuill() ? service().simplifyFromQCondition(text) : service().simplifyFromCCondition(text)).id();
+}
+
+std::string Conditions::print(const TextOptions& options, VT::SymbolicExprId condition) const {
+    if (!options.toQuill())
+        return visible(service().printCExpr(condition));
+    return visible(options.fromQuill() ? service().printQExpr(condition)
+                                       : service().printQExprWithConversion(condition));
 }
 
 std::string Conditions::printAsItStands(VT::SymbolicExprId condition, bool quill) const {

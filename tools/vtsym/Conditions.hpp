@@ -2,6 +2,7 @@
 #pragma once
 
 #include "base/VCService.hpp"
+#include "tools/vtsym/Texts.hpp"
 
 #include <cstddef>
 #include <optional>
@@ -20,9 +21,12 @@ public:
     /// To be called before the service is given a text.
     void makeRoomFor(const std::string& text);
 
-    /// The text of a condition in the shape of a language.  Unlike the service it writes `true` for TRUE, so that no
-    /// answer is invisible.
-    [[nodiscard]] std::string print(VT::SymbolicExprId condition, bool quill) const;
+    /// The condition of a text in the language of the options, as it stands or simplified.
+    [[nodiscard]] VT::SymbolicExprId parse(const TextOptions& options, const std::string& text) const;
+    [[nodiscard]] VT::SymbolicExprId simplify(const TextOptions& options, const std::string& text) const;
+    /// The text of a condition in the shape of the language that the options ask for.  Unlike the service it writes
+    /// `true` for TRUE, so that no answer is invisible.
+    [[nodiscard]] std::string print(const TextOptions& options, VT::SymbolicExprId condition) const;
     /// The same without a change of shape.
     [[nodiscard]] std::string printAsItStands(VT::SymbolicExprId condition, bool quill) const;
 

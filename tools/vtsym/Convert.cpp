@@ -27,7 +27,7 @@ Command addConvert(CLI::App& program) {
                 Conditions conditions;
                 const auto answer = [&](const std::string& text, std::string& out) {
                     conditions.makeRoomFor(text);
-                    const std::string result = conditions.print(conditions.service().parseC(text), options->toQuill());
+                    const std::string result = conditions.print(*options, conditions.parse(*options, text));
                     if (options->json)
                         appendMember(out, "result", jsonString(result));
                     else

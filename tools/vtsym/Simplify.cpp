@@ -62,7 +62,7 @@ void Simplifier::answer(const std::string& text, std::string& out) {
     if (options_.json || options_.explain)
         answerInDetail(text, out);
     else
-        out.append(conditions_.print(conditions_.service().simplifyFromCCondition(text).id(), options_.toQuill()));
+        out.append(conditions_.print(options_, conditions_.simplify(options_, text)));
 }
 
 /// Past the service's caches, which know results only.
@@ -71,9 +71,9 @@ void Simplifier::answerInDetail(const std::string& text, std::string& out) {
     VT::SymbolicExprSimplify& simplifier = conditions_.service().simplifier();
     simplifier.setListener(options_.explain ? &firings_ : nullptr);
     std::uint64_t passes = 0;
-    const VT::SymbolicExprId condition = conditions_.service().parseC(text);
+    const VT::SymbolicExprId condition = conditions_.parse(options_, text);
     const VT::SymbolicExprId simplified = simplifier.simplify(condition, passes);
-    const std::string result = conditions_.print(simplified, options_.toQuill());
+    const std::string result = conditions_.print(options_, simplified);
     if (options_.json) {
         appendMember(out, "result", jsonString(result));
         appendMember(out, "passes", std::to_string(passes));

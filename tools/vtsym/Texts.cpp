@@ -121,7 +121,9 @@ CLI::Validator oneOf(std::vector<std::string> words) {
 void addTextOptions(CLI::App& command, TextOptions& options) {
     command.add_option("TEXT", options.texts, "Texts to work on; without any, or with -, every line of standard input")
         ->type_name("");
-    command.add_option("--from", options.from, "Language of the texts: c")->check(oneOf({"c"}))->type_name("LANGUAGE");
+    command.add_option("--from", options.from, "Language of the texts: c or quill")
+        ->check(oneOf({"c", "quill"}))
+        ->type_name("LANGUAGE");
     command.add_flag("--json", options.json, "Answer with one JSON object per text");
 }
 

@@ -18,6 +18,8 @@ struct TextOptions {
     std::string to; ///< empty: as `from`
     bool json = false;
 
+    [[nodiscard]] bool fromQuill() const { return from == "quill"; }
+
     [[nodiscard]] bool toQuill() const { return (to.empty() ? from : to) == "quill"; }
 };
 

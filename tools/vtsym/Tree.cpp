@@ -1,5 +1,6 @@
 // vtsym tree
 #include "base/service/TruthTexts.hpp"
+#include "parser/QuillConverterBlockVariants.hpp"
 #include "parser/SymbolicExprParser.hpp"
 #include "tools/vtsym/Commands.hpp"
 #include "tools/vtsym/Json.hpp"
@@ -22,11 +23,19 @@ struct TreeOptions : TextOptions {
     bool dot = false;
 };
 
+VT::SymbolicExprId read(VT::SymbolicExprTable& table, const TreeOptions& options, const std::string& text) {
+    if (const auto truth = VT::truthOfText(table, text))
+        return *truth;
+    if (!options.fromQuill())
+        return VT::SymbolicExprParser(table, true, true)(text);
+    VT::VTSymbolicExprErrorCheckerBlockVariants checker;
+    return VT::SymbolicExprFromQParseTreeBlockVariants(table, checker)(text);
+}
+
 void answer(const TreeOptions& options, const Style& style, const std::string& text, std::string& out) {
     VT::SymbolicExprTable table;
     table.addBoolSymbols();
-    const auto truth = VT::truthOfText(table, text);
-    const VT::SymbolicExprId root = truth ? *truth : VT::SymbolicExprParser(table, true, true)(text);
+    const VT::SymbolicExprId root = read(table, options, text);
     if (options.json) {
         appendMember(out, "tree", "");
         appendJsonTree(table, root, out);
