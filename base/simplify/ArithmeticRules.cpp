@@ -6,6 +6,7 @@
 // are moved as if they were exact.
 #include "base/core/IdMap.hpp"
 #include "base/core/Walk.hpp"
+#include "base/simplify/IntegerSet.hpp"
 #include "base/simplify/RuleTables.hpp"
 
 #include <algorithm>
@@ -16,10 +17,6 @@
 namespace VT {
 
 namespace {
-
-bool fitsInt(std::int64_t value) {
-    return value >= std::numeric_limits<int>::min() && value <= std::numeric_limits<int>::max();
-}
 
 SymbolicExprId integerIfFits(RuleContext& context, std::int64_t value) {
     return fitsInt(value) ? context.make<SymbolicIntValue>(static_cast<int>(value)) : invalidId;
@@ -291,11 +288,6 @@ SymbolicExprId LinearSum::write(RuleContext& context) const {
 constexpr RuleInfo foldedSum{sumOps, "folded sum", "1.5 + 2.5", "4"};
 constexpr RuleInfo gatheredSum{sumOps, "gathered sum", "1 + N + N - 3", "2*N - 2"};
 
-void append(std::span<const NodeRule> rules, std::vector<const RuleInfo*>& out) {
-    for (const NodeRule& rule : rules)
-        out.push_back(&rule.info);
-}
-
 } // namespace
 
 SymbolicExprId simplifyMultiply(RuleContext& context, SymbolicExprId a, SymbolicExprId b) {
@@ -337,8 +329,8 @@ SymbolicExprId simplifySum(RuleContext& context, SymbolicExprId root) {
 void appendArithmeticRules(std::vector<const RuleInfo*>& out) {
     out.push_back(&foldedSum);
     out.push_back(&gatheredSum);
-    append(multiplyRules, out);
-    append(divideRules, out);
+    appendInfo<NodeRule>(multiplyRules, out);
+    appendInfo<NodeRule>(divideRules, out);
 }
 
 } // namespace VT

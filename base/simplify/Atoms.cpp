@@ -11,10 +11,6 @@ namespace {
 const IntegerSet zero = IntegerSet::point(0);
 const IntegerSet nonZero = IntegerSet::allBut(0);
 
-bool fitsInt(std::int64_t value) {
-    return value >= std::numeric_limits<int>::min() && value <= std::numeric_limits<int>::max();
-}
-
 } // namespace
 
 // From nodes to constraints.

@@ -149,11 +149,6 @@ constexpr NodeRule comparisonRules[] = {
     {{comparisonOps, "orientation", "3 < A", "A > 3"}, orientation},
 };
 
-void append(std::span<const NodeRule> rules, std::vector<const RuleInfo*>& out) {
-    for (const NodeRule& rule : rules)
-        out.push_back(&rule.info);
-}
-
 } // namespace
 
 SymbolicExprId simplifyNot(RuleContext& context, SymbolicExprId operand) {
@@ -169,11 +164,11 @@ SymbolicExprId simplifyComparison(RuleContext& context, SymbolicOp op, SymbolicE
 }
 
 void appendNotRules(std::vector<const RuleInfo*>& out) {
-    append(notRules, out);
+    appendInfo<NodeRule>(notRules, out);
 }
 
 void appendComparisonRules(std::vector<const RuleInfo*>& out) {
-    append(comparisonRules, out);
+    appendInfo<NodeRule>(comparisonRules, out);
 }
 
 } // namespace VT

@@ -328,11 +328,10 @@ SymbolicExprId negateChain(RuleContext& context, SymbolicExprId root) {
 }
 
 void appendLogicalRules(std::vector<const RuleInfo*>& out) {
-    for (const std::span<const ChainRule> family :
-         {std::span<const ChainRule>(andRules), std::span<const ChainRule>(orRules),
-          std::span<const ChainRule>(sumRules), std::span(&orderRule, 1)})
-        for (const ChainRule& rule : family)
-            out.push_back(&rule.info);
+    appendInfo<ChainRule>(andRules, out);
+    appendInfo<ChainRule>(orRules, out);
+    appendInfo<ChainRule>(sumRules, out);
+    out.push_back(&orderRule.info);
 }
 
 } // namespace VT

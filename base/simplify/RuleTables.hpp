@@ -41,6 +41,13 @@ SymbolicExprId foldSum(RuleContext& context, SymbolicExprId root);
 /// The operators of such a chain.
 inline constexpr OperatorSet sumOps{SymbolicOp::Plus, SymbolicOp::Minus, SymbolicOp::UnaryMinus};
 
+/// Appends what the rows of a table tell of themselves.
+template <class Rule>
+void appendInfo(std::span<const Rule> rules, std::vector<const RuleInfo*>& out) {
+    for (const Rule& rule : rules)
+        out.push_back(&rule.info);
+}
+
 void appendNotRules(std::vector<const RuleInfo*>& out);
 void appendComparisonRules(std::vector<const RuleInfo*>& out);
 void appendLogicalRules(std::vector<const RuleInfo*>& out);
