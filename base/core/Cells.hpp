@@ -1,6 +1,7 @@
 // Storage of a table's nodes, addressed by numbers of 32 bits, so that the slots of its index are small.
 #pragma once
 
+#include "base/core/LargePages.hpp"
 #include "base/core/Node.hpp"
 
 #include <algorithm>
@@ -74,6 +75,7 @@ private:
         const std::size_t first = chunks_.size() << chunkBits;
         chunks_.reserve(chunks_.size() + 1);
         chunks_.emplace_back(static_cast<std::byte*>(::operator new(units* unit, lineSize)));
+        preferLargePages(chunks_.back().get(), units * unit);
         next_ = first + (first == 0 ? reserved : 0);
         end_ = first + units;
     }

@@ -1,5 +1,6 @@
 #include "base/core/Table.hpp"
 
+#include "base/core/LargePages.hpp"
 #include "base/core/Nodes.hpp"
 #include "base/core/Walk.hpp"
 
@@ -53,7 +54,10 @@ void SymbolicExprTable::reserveOne() {
     if (indexShift_ == 0)
         throw std::length_error("expression table: no room for another node");
     // The topmost bits of the tags choose the slots, so the old index is copied nearly in order.
-    std::vector<Slot> larger(index_.size() * 2);
+    std::vector<Slot> larger;
+    larger.reserve(index_.size() * 2);
+    preferLargePages(larger.data(), larger.capacity() * sizeof(Slot));
+    larger.resize(index_.size() * 2);
     const std::size_t mask = larger.size() - 1;
     for (const Slot& slot : index_) {
         if (slot.cell == 0)
