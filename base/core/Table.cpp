@@ -16,8 +16,13 @@ namespace {
 constexpr std::size_t firstSlots = 16;
 
 void makeRoom(std::vector<const SymbolicExpr*>& nodes) {
-    if (nodes.size() == nodes.capacity())
-        nodes.reserve(std::max(firstSlots, nodes.size() * 2));
+    if (nodes.size() < nodes.capacity())
+        return;
+    std::vector<const SymbolicExpr*> larger;
+    larger.reserve(std::max(firstSlots, nodes.size() * 2));
+    preferLargePages(larger.data(), larger.capacity() * sizeof(const SymbolicExpr*));
+    larger.assign(nodes.begin(), nodes.end());
+    nodes.swap(larger);
 }
 } // namespace
 
