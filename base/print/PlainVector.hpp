@@ -28,6 +28,12 @@ public:
 
     [[nodiscard]] std::size_t size() const noexcept { return size_; }
 
+    /// Room for so many values in all.
+    void reserve(std::size_t count) {
+        if (capacity_ < count)
+            grow(count - size_);
+    }
+
     /// Appends values that are to be written before they are read, and gives the first.  Moves the others.
     Value* extend(std::size_t count) {
         if (capacity_ - size_ < count)

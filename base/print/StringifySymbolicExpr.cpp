@@ -21,6 +21,10 @@ constexpr unsigned char leafPrecedence = 0;
 /// Room that spares most prints the growth of their stacks.
 constexpr std::size_t firstDepth = 16;
 
+/// Nodes for which a fresh visitor makes room at once, if the table has so many: growing from nothing would cost more
+/// than printing most expressions.
+constexpr std::size_t firstNodes = 2048;
+
 /// Where a sign in front of a literal binds like a prefix operator.
 constexpr unsigned char signPrecedence = operatorInfo(SymbolicOp::UnaryMinus).precedence;
 
@@ -84,6 +88,11 @@ StringifySymbolicExpr::Printed StringifySymbolicExpr::printed(SymbolicExprId id)
     const StackDepth depth(stack_);
     if (pushKnown(id))
         return stack_.back();
+    if (texts_.size() == 0) {
+        const std::size_t nodes = std::min<std::size_t>(id, firstNodes);
+        texts_.reserve(nodes);
+        known_.reserve(nodes);
+    }
     walkUnknown(
         table_, id, frames_, [&](SymbolicExprId operand, const SymbolicExpr*) { return pushKnown(operand); },
         [&](SymbolicExprId visited, const SymbolicExpr& node, const SymbolicExpr*) {

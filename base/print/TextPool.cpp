@@ -53,6 +53,25 @@ std::string_view view(const Glue& glue) {
     return {glue.bytes.data(), glue.size};
 }
 
+/// Up to sixteen bytes, zeros behind them; in whole words where there are enough, because names are short and many.
+BytesValue loadUpTo16(std::string_view text) {
+    const char* const bytes = text.data();
+    const std::size_t size = text.size();
+    if (size >= 8) {
+        const BytesValue tail = loadEight(bytes + (size - 8));
+        return tail << 8U * (size - 8) | loadEight(bytes);
+    }
+    std::uint64_t value = 0;
+    for (std::size_t i = 0; i < size; ++i)
+        value |= std::uint64_t{static_cast<unsigned char>(bytes[i])} << 8U * i;
+    return value;
+}
+
+void storeHead(BytesValue value, char* head) {
+    store<8>(static_cast<std::uint64_t>(value), head);
+    store<8>(static_cast<std::uint64_t>(value >> 64U), head + 8);
+}
+
 /// Writes all the room of a glue and steps over what it holds: what is written too much is overwritten or in the slack.
 template <class Glue>
 char* put(char* out, const Glue& glue) {
@@ -80,8 +99,7 @@ public:
     }
 
     void finish(Record& record) const {
-        store<8>(static_cast<std::uint64_t>(head_), record.head.data());
-        store<8>(static_cast<std::uint64_t>(head_ >> 64U), record.head.data() + 8);
+        storeHead(head_, record.head.data());
         record.length = size_;
     }
 
@@ -98,11 +116,8 @@ private:
     std::uint64_t size_ = 0;
 };
 
-/// A new record, to be written before it is read.
-TextPool::Record& TextPool::add() {
-    if (records_.size() > std::numeric_limits<std::uint32_t>::max())
-        throw std::length_error("basic_string::append");
-    return *records_.extend(1);
+void TextPool::throwTooLong() {
+    throw std::length_error("basic_string::append");
 }
 
 Text TextPool::bytes(std::string_view bytes) {
@@ -111,12 +126,38 @@ Text TextPool::bytes(std::string_view bytes) {
         std::memcpy(bytes_.extend(bytes.size()), bytes.data(), bytes.size());
     Record& run = add();
     run.length = bytes.size();
-    run.head.fill('\0');
-    std::memcpy(run.head.data(), bytes.data(), std::min(bytes.size(), headBytes));
+    storeHead(loadUpTo16(bytes.substr(0, headBytes)), run.head.data());
     run.kind = bytes.size() > headBytes ? Kind::Long : Kind::Short;
     run.first = static_cast<std::uint32_t>(position);
     run.second = static_cast<std::uint32_t>(position >> 32U);
     run.leading = static_cast<std::uint32_t>(last());
+    return last();
+}
+
+void TextPool::setLeading(Record& joined, Text front, std::string_view open) const {
+    const Record& begin = record(front);
+    const bool beginsAlike = open.empty() && begin.length >= limits::orderedTextBytes;
+    joined.leading = beginsAlike ? begin.leading : static_cast<std::uint32_t>(last());
+}
+
+/// The commonest join, without the loops of the general one.
+Text TextPool::infix(Text left, std::string_view separator, Text right) {
+    const std::array<Text, 2> parts{left, right};
+    if (!fits<Separator>(separator) || length(left) == 0 || length(right) == 0)
+        return join("", parts, separator, "");
+    Record& joined = add();
+    setLeading(joined, left, "");
+    JoinBuilder builder;
+    builder.add(record(left));
+    builder.add(joined.separator, separator);
+    builder.add(record(right));
+    builder.finish(joined);
+    joined.kind = Kind::Join;
+    joined.parts = 2;
+    joined.open = {};
+    joined.close = {};
+    joined.first = static_cast<std::uint32_t>(left);
+    joined.second = static_cast<std::uint32_t>(right);
     return last();
 }
 
@@ -142,15 +183,14 @@ Text TextPool::joinByGlue(std::string_view open, std::span<const Text> parts, st
     if (parts.size() == 1 && open.empty() && close.empty())
         return parts.front();
     if (parts_.size() + parts.size() > std::numeric_limits<std::uint32_t>::max())
-        throw std::length_error("basic_string::append");
+        throwTooLong();
     const auto firstPart = static_cast<std::uint32_t>(parts_.size());
     if (parts.size() > 2)
         std::ranges::copy(parts, parts_.extend(parts.size()));
 
     Record& joined = add();
     const Record& front = record(parts.front());
-    const bool beginsAlike = open.empty() && front.length >= limits::orderedTextBytes;
-    joined.leading = beginsAlike ? front.leading : static_cast<std::uint32_t>(last());
+    setLeading(joined, parts.front(), open);
     JoinBuilder builder;
     builder.add(joined.open, open);
     builder.add(front);
@@ -173,7 +213,7 @@ std::string TextPool::str(Text text, std::size_t bound) const {
     constexpr std::size_t small = 256;
     const std::uint64_t length = this->length(text);
     if (length > bound)
-        throw std::length_error("basic_string::append");
+        throwTooLong();
     const auto size = static_cast<std::size_t>(length);
     if (size <= small) {
         std::array<char, small + slack> buffer;

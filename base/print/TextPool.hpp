@@ -6,6 +6,7 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
+#include <limits>
 #include <span>
 #include <string>
 #include <string_view>
@@ -26,10 +27,7 @@ public:
     Text join(std::string_view open, std::span<const Text> parts, std::string_view separator, std::string_view close);
 
     /// left, separator, right.  O(1).
-    Text infix(Text left, std::string_view separator, Text right) {
-        const std::array<Text, 2> parts{left, right};
-        return join("", parts, separator, "");
-    }
+    Text infix(Text left, std::string_view separator, Text right);
 
     /// open, text, close.  O(1).
     Text enclose(std::string_view open, Text text, std::string_view close) {
@@ -58,6 +56,9 @@ public:
 
     /// Number of records, each of 48 bytes.
     [[nodiscard]] std::size_t size() const noexcept { return records_.size(); }
+
+    /// Room for so many records.
+    void reserve(std::size_t records) { records_.reserve(records); }
 
     /// Forgets all texts and gives their memory back.
     void clear() noexcept;
@@ -120,7 +121,15 @@ private:
         return {begin, static_cast<std::size_t>(record.length)};
     }
 
-    Record& add();
+    /// A new record, to be written before it is read.
+    Record& add() {
+        if (records_.size() > std::numeric_limits<std::uint32_t>::max())
+            throwTooLong();
+        return *records_.extend(1);
+    }
+
+    [[noreturn]] static void throwTooLong();
+    void setLeading(Record& joined, Text front, std::string_view open) const;
 
     [[nodiscard]] Text last() const noexcept { return Text{static_cast<std::uint32_t>(records_.size() - 1)}; }
 
