@@ -31,9 +31,13 @@ VCSymbolicExprId VCService::replaceSymbolsInExpression(const VCSymbolicExprId& c
                                                        const std::unordered_map<std::string, std::string>& names) {
     SymbolicExprTable& table = parts_->table;
     SymbolicExprReplacements replacements;
-    for (const auto& [name, other] : names) {
-        const SymbolicExprId symbol = SymbolicString(table, name).getId(table);
-        replacements[symbol] = SymbolicString(table, other).getId(table);
+    // A name that does not occur is not interned.
+    std::vector<SymbolicExprId> identifiers;
+    SymbolsOfSymbolicExpr(table).getSymbolIds(condition.id(), identifiers);
+    for (const SymbolicExprId symbol : identifiers) {
+        const auto other = names.find(static_cast<const SymbolicString*>(table.get(symbol))->getName());
+        if (other != names.end())
+            replacements[symbol] = SymbolicString(table, other->second).getId(table);
     }
     // A condition that is one symbol is nobody's operand.
     const auto whole = replacements.find(condition.id());

@@ -76,6 +76,9 @@ TEST(QuillService, ListsAndReplacesSymbols) {
     const auto swapped = service->replaceSymbolsInExpression(condition, {{"Mode", "Gear"}, {"Gear", "Mode"}});
     EXPECT_EQ(service->printQExpr(swapped), "Gear==1 && f(Mode)>P.x");
     EXPECT_EQ(service->printQExpr(service->replaceSymbolsInExpression(service->parseC("A"), {{"A", "B"}})), "B");
+    const std::size_t nodes = service->table().size();
+    EXPECT_EQ(service->replaceSymbolsInExpression(condition, {{"NotThere", "Nowhere"}}), condition);
+    EXPECT_EQ(service->table().size(), nodes);
 }
 
 RC_GTEST_PROP(QuillService, ReadsWhatCReads, ()) {

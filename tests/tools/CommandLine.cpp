@@ -64,6 +64,46 @@ TEST(Program, AnswersTexts) {
     });
 }
 
+TEST(Program, ListsAndReplacesSymbols) {
+    expectRows({
+        {{"symbols", "B && P.gear > f(A) && true || B"}, "", "B P.gear A\n", {}, 0},
+        {{"symbols", "--kinds", "functions,members", "P.gear > f(A)", "1"}, "", "P.gear f\n\n", {}, 0},
+        {{"symbols", "--json", "--from=quill"},
+         "f(x) ~= y\n",
+         "{\"line\":1,\"input\":\"f(x) ~= y\",\"symbols\":[\"x\",\"y\"]}\n",
+         {},
+         0},
+        {{"symbols", "--kinds", "names", "A"}, "", "", {"'names' is not offered"}, 2},
+        {{"replace", "A=B", "B=A", "A && !B", "--", "-A < C"}, "", "B && !A\n-B<C\n", {}, 0},
+        {{"replace", "A=B", "--to", "quill"}, "A != 1\n", "B~=1\n", {}, 0},
+        {{"replace", "A==B"}, "", "", {"a replacement NAME=NAME is missing"}, 2},
+        {{"replace", "A=B", "A=C", "A"}, "", "", {"'A' is replaced twice"}, 2},
+    });
+}
+
+TEST(Program, KeepsASession) {
+    const std::string dialogue = "A>2 && A<4\nans || A>3\n:let N=A+1\n:let A=2\nN*2==6\n:quill\nB ~= A\n:c\n"
+                                 ":tree A+1\n:explain 1 && B\n:symbols\n  \n";
+    const std::string answers = "A==3\nA>=3\nN = A+1\nA = 2\n(A+1)*2==6\n(A+1)*2==6\nB~=2\nB!=2\n"
+                                "Plus +\n├─ 2\n└─ 1\n1 && B\npass 1\n  number in And  1 && B  =>  B\n= B\nB\n\n";
+    expectRows({
+        {{"repl"}, dialogue, answers, {}, 0},
+        {{"repl", "--from", "quill"}, "A ~= 1\n:quit\nB\n", "A~=1\n\n\n", {}, 0},
+        {{"repl"},
+         ":tree\n:frob\n :let x = 1+*2\n:let 1=2\nx\n",
+         "\n\n\n\nx\n",
+         {"line 1: There is no result yet.", "no command :frob; :help", "  :let x = 1+*2\n             ^\n",
+          "NAME=VALUE"},
+         1},
+    });
+    // The editor echoes what it completes: "Mo", Tab.
+    const ProgramResult typed =
+        runOnTerminal({{"repl"}, "Mode==1 && Gear>2\na b\nMo\t==7\n:quit\n", {"TERM=dumb"}, {}});
+    EXPECT_EQ(typed.status, 0);
+    EXPECT_THAT(typed.output, AllOf(HasSubstr("> "), HasSubstr("Mode==1 && Gear>2\r\n"), HasSubstr("a b\r\n    ^"),
+                                    HasSubstr("Mode==7\r\n")));
+}
+
 TEST(Program, AnswersEachLineByOneLine) {
     expectRows({
         {{"simplify"}, "", "", {}, 0},
@@ -184,7 +224,7 @@ TEST(Program, RefusesWrongUsageWithAHint) {
 }
 
 TEST(Program, HelpsOnRequest) {
-    for (const char* command : {"", "simplify", "convert", "tree", "operators"}) {
+    for (const char* command : {"", "simplify", "convert", "tree", "symbols", "replace", "repl", "operators"}) {
         SCOPED_TRACE(command);
         std::vector<std::string> asked{command, "--help"};
         std::vector<std::string> helped{"help", command};
@@ -250,8 +290,8 @@ TEST(Program, OutlivesHostileTexts) {
     std::string input;
     for (const std::string& text : texts)
         input += text + "\n";
-    for (const std::vector<std::string>& arguments :
-         std::vector<std::vector<std::string>>{{"simplify"}, {"simplify", "--explain"}, {"convert"}, {"tree"}}) {
+    for (const std::vector<std::string>& arguments : std::vector<std::vector<std::string>>{
+             {"simplify"}, {"simplify", "--explain"}, {"convert"}, {"tree"}, {"symbols"}, {"replace", "a=d"}}) {
         const ProgramResult result = runProgram({arguments, input, {}, {}});
         EXPECT_EQ(result.status, 1);
         EXPECT_THAT(result.output, HasSubstr(texts[1].substr(0, 90)));

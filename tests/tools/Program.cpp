@@ -100,17 +100,20 @@ ProgramResult runProgram(const ProgramInput& input) {
 }
 
 ProgramResult runOnTerminal(const ProgramInput& input) {
-    const Scratch in = scratch(input.input);
     const int terminal = posix_openpt(O_RDWR | O_NOCTTY | O_CLOEXEC);
     if (terminal < 0 || grantpt(terminal) != 0 || unlockpt(terminal) != 0)
         throw std::runtime_error("no pseudo terminal");
     const int screen = open(ptsname(terminal), O_RDWR | O_NOCTTY | O_CLOEXEC);
-    const pid_t child = start(input, fileno(in.get()), screen, screen);
+    const pid_t child = start(input, screen, screen, screen);
+    const bool typed =
+        write(terminal, input.input.data(), input.input.size()) == static_cast<ssize_t>(input.input.size());
     close(screen);
     ProgramResult result;
     result.output = readAll(terminal); // until the program closes it
     result.status = statusOf(child);
     close(terminal);
+    if (!typed)
+        throw std::runtime_error("the terminal takes no input");
     return result;
 }
 

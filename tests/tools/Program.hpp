@@ -24,7 +24,7 @@ struct ProgramInput {
 
 ProgramResult runProgram(const ProgramInput& input);
 
-/// Everything that the program writes when a terminal is its standard output and standard error.
+/// What a terminal shows when the program runs on it and the input is typed.
 ProgramResult runOnTerminal(const ProgramInput& input);
 
 } // namespace VT::Testing

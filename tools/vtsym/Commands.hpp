@@ -22,6 +22,9 @@ struct Command {
 Command addSimplify(CLI::App& program);
 Command addConvert(CLI::App& program);
 Command addTree(CLI::App& program);
+Command addSymbols(CLI::App& program);
+Command addReplace(CLI::App& program);
+Command addRepl(CLI::App& program);
 Command addOperators(CLI::App& program);
 
 } // namespace vtsym

@@ -2,6 +2,8 @@
 
 #include "base/core/Table.hpp"
 
+#include <unordered_set>
+
 namespace vtsym {
 
 namespace {
@@ -34,6 +36,17 @@ VT::SymbolicExprId Conditions::parse(const TextOptions& options, const std::stri
 
 VT::SymbolicExprId Conditions::simplify(const TextOptions& options, const std::string& text) const {
     return (options.fromQuill() ? service().simplifyFromQCondition(text) : service().simplifyFromCCondition(text)).id();
+}
+
+std::vector<std::string> Conditions::symbols(VT::SymbolicExprId condition, const VT::VCSymbolTypes& kinds) const {
+    std::vector<std::string> all;
+    service().getSymbolsFromExpression(condition, all, kinds);
+    std::vector<std::string> once;
+    std::unordered_set<std::string> seen{"true", "false"};
+    for (std::string& symbol : all)
+        if (seen.insert(symbol).second)
+            once.push_back(std::move(symbol));
+    return once;
 }
 
 std::string Conditions::print(const TextOptions& options, VT::SymbolicExprId condition) const {

@@ -7,6 +7,7 @@
 #include <cstddef>
 #include <optional>
 #include <string>
+#include <vector>
 
 namespace vtsym {
 
@@ -24,6 +25,8 @@ public:
     /// The condition of a text in the language of the options, as it stands or simplified.
     [[nodiscard]] VT::SymbolicExprId parse(const TextOptions& options, const std::string& text) const;
     [[nodiscard]] VT::SymbolicExprId simplify(const TextOptions& options, const std::string& text) const;
+    /// The symbols of a condition as Quill writes them, each once; the truth constants are none.
+    [[nodiscard]] std::vector<std::string> symbols(VT::SymbolicExprId condition, const VT::VCSymbolTypes& kinds) const;
     /// The text of a condition in the shape of the language that the options ask for.  Unlike the service it writes
     /// `true` for TRUE, so that no answer is invisible.
     [[nodiscard]] std::string print(const TextOptions& options, VT::SymbolicExprId condition) const;

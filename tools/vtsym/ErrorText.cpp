@@ -39,6 +39,8 @@ TextError currentTextError() {
         throw;
     } catch (const VT::HostDiagnostic& diagnostic) {
         return {diagnostic.messageId(), diagnostic.what(), diagnostic.offset()};
+    } catch (const CommandError& error) {
+        return error.error();
     } catch (const std::length_error&) {
         return {"vtsym:TextTooLong", "The answer is longer than a text may be.", std::nullopt};
     } catch (const std::bad_alloc&) {
@@ -61,11 +63,15 @@ std::string withCaret(std::string_view text, std::size_t offset, const Style& st
     return result;
 }
 
-std::string errorLines(std::uint64_t line, std::string_view text, const TextError& error, const Style& style) {
-    std::string lines = style.strong("line " + std::to_string(line) + ":") + " " + error.message + "\n";
+std::string errorText(std::string_view text, const TextError& error, const Style& style) {
+    std::string lines = error.message + "\n";
     if (error.offset)
         lines += withCaret(text, *error.offset, style);
     return lines;
+}
+
+std::string errorLines(std::uint64_t line, std::string_view text, const TextError& error, const Style& style) {
+    return style.strong("line " + std::to_string(line) + ":") + " " + errorText(text, error, style);
 }
 
 std::string jsonOf(const TextError& error) {

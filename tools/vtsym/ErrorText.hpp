@@ -7,6 +7,7 @@
 #include <cstdint>
 #include <exception>
 #include <optional>
+#include <stdexcept>
 #include <string>
 #include <string_view>
 
@@ -19,6 +20,25 @@ struct TextError {
     std::optional<std::size_t> offset; ///< byte of the text that it is about
 };
 
+/// A line that mixes commands and texts cannot be followed.
+class CommandError : public std::runtime_error {
+public:
+    explicit CommandError(const std::string& sentence) : CommandError(TextError{"vtsym:Command", sentence, {}}) {}
+
+    /// An error in a text that begins at a byte of the line.
+    CommandError(TextError error, std::size_t begin) : CommandError(std::move(error)) {
+        if (error_.offset)
+            *error_.offset += begin;
+    }
+
+    [[nodiscard]] const TextError& error() const noexcept { return error_; }
+
+private:
+    explicit CommandError(TextError error) : std::runtime_error(error.message), error_(std::move(error)) {}
+
+    TextError error_;
+};
+
 /// The error that is being handled: to be called in a catch clause.  Rethrows what is no matter of the text.
 TextError currentTextError();
 
@@ -26,7 +46,8 @@ TextError currentTextError();
 /// not show as it is, is shown as \xNN.
 std::string withCaret(std::string_view text, std::size_t offset, const Style& style);
 
-/// The lines for standard error.
+/// The lines for standard error, without and with the number of the text.
+std::string errorText(std::string_view text, const TextError& error, const Style& style);
 std::string errorLines(std::uint64_t line, std::string_view text, const TextError& error, const Style& style);
 
 /// The member of a JSON answer.

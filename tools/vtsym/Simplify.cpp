@@ -1,13 +1,9 @@
 // vtsym simplify
-#include "base/simplify/Simplify.hpp"
-#include "base/core/Table.hpp"
-#include "host/Text.hpp"
 #include "tools/vtsym/Commands.hpp"
 #include "tools/vtsym/Conditions.hpp"
+#include "tools/vtsym/Explanation.hpp"
 #include "tools/vtsym/Json.hpp"
 #include "tools/vtsym/Texts.hpp"
-
-#include <algorithm>
 
 namespace vtsym {
 
@@ -22,108 +18,22 @@ Examples:
   vtsym simplify --to quill 'a / b == 1 && x != 2'
   vtsym simplify --json < conditions.txt)";
 
-// Of the conditions in an explanation: the beginning of a long one is shown, and of a very long one its length alone.
-constexpr std::size_t shownBytes = 200;
-constexpr std::size_t printedBytes = 20'000;
-
 struct SimplifyOptions : TextOptions {
     bool explain = false;
 };
 
-/// Keeps the rules that fire.
-class Firings : public VT::RuleListener {
-public:
-    void fired(const VT::RuleFiring& firing) override { firings.push_back(firing); }
-
-    std::vector<VT::RuleFiring> firings;
-};
-
-class Simplifier {
-public:
-    Simplifier(const SimplifyOptions& options, const Style& style) : options_(options), style_(style) {}
-
-    void answer(const std::string& text, std::string& out);
-
-
-private:
-    void answerInDetail(const std::string& text, std::string& out);
-    [[nodiscard]] std::string step(VT::SymbolicExprId condition) const;
-    void explain(std::string& out) const;
-    void explainJson(std::string& out) const;
-
-    const SimplifyOptions& options_;
-    const Style& style_;
-    Conditions conditions_;
-    Firings firings_;
-};
-
-void Simplifier::answer(const std::string& text, std::string& out) {
-    conditions_.makeRoomFor(text);
-    if (options_.json || options_.explain)
-        answerInDetail(text, out);
-    else
-        out.append(conditions_.print(options_, conditions_.simplify(options_, text)));
-}
-
-/// Past the service's caches, which know results only.
-void Simplifier::answerInDetail(const std::string& text, std::string& out) {
-    firings_.firings.clear();
-    VT::SymbolicExprSimplify& simplifier = conditions_.service().simplifier();
-    simplifier.setListener(options_.explain ? &firings_ : nullptr);
-    std::uint64_t passes = 0;
-    const VT::SymbolicExprId condition = conditions_.parse(options_, text);
-    const VT::SymbolicExprId simplified = simplifier.simplify(condition, passes);
-    const std::string result = conditions_.print(options_, simplified);
-    if (options_.json) {
-        appendMember(out, "result", jsonString(result));
-        appendMember(out, "passes", std::to_string(passes));
-        if (options_.explain)
-            explainJson(out);
-    } else {
-        out.append(style_.strong(step(condition))).append("\n");
-        explain(out);
-        if (simplified == condition && !firings_.firings.empty())
-            out.append("  what this leads to is longer or beyond a limit, so the condition stays\n");
-        out.append("= ").append(style_.good(result));
+/// Simplifies past the service's caches, which know results only.
+void answerInDetail(const SimplifyOptions& options, const Style& style, const Conditions& conditions,
+                    const std::string& text, std::string& out) {
+    const Explanation explanation(conditions, options, conditions.parse(options, text), options.explain);
+    if (!options.json) {
+        explanation.appendText(style, out);
+        return;
     }
-}
-
-/// A condition of an explanation; the beginning of a long one.
-std::string Simplifier::step(VT::SymbolicExprId condition) const {
-    const VT::SymbolicExprPrinter& printer = conditions_.service().simplifier().printer();
-    if (const std::uint64_t bytes = printer.textLength(condition); bytes > printedBytes)
-        return "(" + std::to_string(bytes) + " bytes of text)";
-    return VT::shownText(conditions_.printAsItStands(condition, options_.toQuill()), shownBytes);
-}
-
-void Simplifier::explain(std::string& out) const {
-    std::size_t width = 0;
-    for (const VT::RuleFiring& firing : firings_.firings)
-        width = std::max(width, firing.rule->name.size());
-    std::uint64_t pass = 0;
-    for (const VT::RuleFiring& firing : firings_.firings) {
-        if (firing.pass != pass) {
-            pass = firing.pass;
-            out.append(style_.faint("pass " + std::to_string(pass))).append("\n");
-        }
-        out.append("  ").append(style_.name(firing.rule->name));
-        out.append(width - firing.rule->name.size() + 2, ' ');
-        out.append(step(firing.before)).append(style_.faint("  =>  ")).append(step(firing.after)).append("\n");
-    }
-    if (firings_.firings.empty())
-        out.append("  no rule applies\n");
-}
-
-void Simplifier::explainJson(std::string& out) const {
-    std::string steps;
-    for (const VT::RuleFiring& firing : firings_.firings) {
-        steps.append(steps.empty() ? "{\"pass\":" : ",{\"pass\":").append(std::to_string(firing.pass));
-        appendMember(steps, "rule", jsonString(firing.rule->name));
-        appendMember(steps, "before", jsonString(step(firing.before)));
-        appendMember(steps, "after", jsonString(step(firing.after)));
-        steps.append("}");
-    }
-    appendMember(out, "steps", "[" + steps + "]");
+    appendMember(out, "result", jsonString(conditions.print(options, explanation.result())));
+    appendMember(out, "passes", std::to_string(explanation.passes()));
+    if (options.explain)
+        appendMember(out, "steps", explanation.json());
 }
 
 } // namespace
@@ -136,11 +46,15 @@ Command addSimplify(CLI::App& program) {
     command->add_flag("--explain", options->explain, "Show the rules that fired, pass by pass");
     command->footer(examples);
     return {command, [options](Console& console) {
-                Simplifier simplifier(*options, console.dataStyle());
-                const Answering answering{
-                    [&](const std::string& text, std::string& out) { simplifier.answer(text, out); },
-                    options->explain && !options->json};
-                return answerTexts(*options, console, answering);
+                Conditions conditions;
+                const auto answer = [&](const std::string& text, std::string& out) {
+                    conditions.makeRoomFor(text);
+                    if (options->json || options->explain)
+                        answerInDetail(*options, console.dataStyle(), conditions, text, out);
+                    else
+                        out.append(conditions.print(*options, conditions.simplify(*options, text)));
+                };
+                return answerTexts(*options, console, {answer, options->explain && !options->json});
             }};
 }
 

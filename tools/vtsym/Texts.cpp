@@ -16,6 +16,8 @@ namespace vtsym {
 
 namespace {
 
+constexpr char textMark = '\x01';
+
 /// Answers one text after another.
 class Answerer {
 public:
@@ -103,7 +105,28 @@ int forEachLine(Console& console, Use&& use) {
     return 0;
 }
 
-/// Accepts the words of a list.
+} // namespace
+
+void markTexts(std::vector<std::string>& arguments) {
+    auto text = std::ranges::find(arguments, "--");
+    if (text == arguments.end())
+        return;
+    for (text = arguments.erase(text); text != arguments.end(); ++text)
+        text->insert(text->begin(), textMark);
+}
+
+std::string withoutMark(const std::string& argument) {
+    return argument.starts_with(textMark) ? argument.substr(1) : argument;
+}
+
+bool isName(std::string_view text) {
+    const auto isLetter = [](char c) { return c == '_' || (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z'); };
+    if (text.empty() || !isLetter(text.front()))
+        return false;
+    return text.find_first_not_of("abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ0123456789_") ==
+           std::string_view::npos;
+}
+
 CLI::Validator oneOf(std::vector<std::string> words) {
     return {[words = std::move(words)](const std::string& value) -> std::string {
                 if (std::ranges::find(words, value) != words.end())
@@ -116,15 +139,18 @@ CLI::Validator oneOf(std::vector<std::string> words) {
             ""};
 }
 
-} // namespace
-
 void addTextOptions(CLI::App& command, TextOptions& options) {
     command.add_option("TEXT", options.texts, "Texts to work on; without any, or with -, every line of standard input")
+        ->transform(withoutMark, "")
         ->type_name("");
+    addSourceOption(command, options);
+    command.add_flag("--json", options.json, "Answer with one JSON object per text");
+}
+
+void addSourceOption(CLI::App& command, TextOptions& options) {
     command.add_option("--from", options.from, "Language of the texts: c or quill")
         ->check(oneOf({"c", "quill"}))
         ->type_name("LANGUAGE");
-    command.add_flag("--json", options.json, "Answer with one JSON object per text");
 }
 
 void addLanguageOption(CLI::App& command, TextOptions& options) {

@@ -7,6 +7,7 @@
 
 #include <functional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace vtsym {
@@ -32,10 +33,23 @@ struct Answering {
     bool inBlocks = false;
 };
 
+/// Marks the arguments behind `--` as texts, whatever they begin with; addTextOptions() takes the marks off again.  The
+/// parser of the command line knows that only in front of the first text.
+void markTexts(std::vector<std::string>& arguments);
+std::string withoutMark(const std::string& argument);
+
 /// Gives a command the texts, --json and --from.
 void addTextOptions(CLI::App& command, TextOptions& options);
+/// Gives a command --from alone.
+void addSourceOption(CLI::App& command, TextOptions& options);
 /// Gives a command --to.
 void addLanguageOption(CLI::App& command, TextOptions& options);
+
+/// Whether a text is one name.
+bool isName(std::string_view text);
+
+/// Accepts the words of a list.
+CLI::Validator oneOf(std::vector<std::string> words);
 
 /// Answers all texts in order.  True when every one had an answer and all input could be read.
 bool answerTexts(const TextOptions& options, Console& console, const Answering& answering);

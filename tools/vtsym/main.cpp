@@ -1,6 +1,7 @@
 // vtsym: symbolic expressions and variant conditions on the command line.
 #include "host/Feature.hpp"
 #include "tools/vtsym/Commands.hpp"
+#include "tools/vtsym/Texts.hpp"
 
 #include <algorithm>
 #include <csignal>
@@ -46,7 +47,7 @@ std::size_t distance(std::string_view a, std::string_view b) {
 
 /// What is wrong with arguments that nothing takes.
 std::string unexpected(const std::vector<std::string>& arguments) {
-    const std::string first = arguments.empty() ? std::string() : arguments.front();
+    const std::string first = arguments.empty() ? std::string() : withoutMark(arguments.front());
     if (first.starts_with('-'))
         return "there is no option '" + first + "'; a text that begins with - goes behind --";
     return "'" + first + "' is one argument too many";
@@ -72,7 +73,7 @@ Program::Program() {
     app_.footer(footer);
     app_.get_formatter()->column_width(34);
     addFeatures(app_);
-    for (const auto add : {addSimplify, addConvert, addTree, addOperators}) {
+    for (const auto add : {addSimplify, addConvert, addTree, addSymbols, addReplace, addRepl, addOperators}) {
         commands_.push_back(add(app_));
         addFeatures(*commands_.back().app);
     }
@@ -126,6 +127,7 @@ int Program::run(Console& console, std::vector<std::string> arguments) {
     }
     if (const std::string problem = unknownCommand(arguments.front()); !problem.empty())
         return fail(console, problem);
+    markTexts(arguments);
     try {
         std::ranges::reverse(arguments); // the order that CLI11 takes
         app_.parse(std::move(arguments));
