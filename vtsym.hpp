@@ -14,6 +14,7 @@
 #include "base/simplify/SimplifyVisitorBlockVariants.hpp"
 #include "base/simplify/VCCustomizer.hpp"
 #include "base/transform/Copy.hpp"
+#include "base/transform/FactorDivision.hpp"
 #include "base/transform/QuillConversion.hpp"
 #include "base/transform/Replacement.hpp"
 #include "base/transform/Symbols.hpp"
