@@ -175,7 +175,7 @@ TEST(Program, RefusesWrongUsageWithAHint) {
         {{"frobnicate"}, "", "", {"there is no command 'frobnicate'\n"}, 2},
         {{"simplify", "-x"}, "", "", {"there is no option '-x'", "goes behind --", "Try 'vtsym simplify --help'"}, 2},
         {{"operators", "x"}, "", "", {"'x' is one argument too many", "Try 'vtsym operators --help'"}, 2},
-        {{"convert", "--to", "basic", "a"}, "", "", {"--to: 'basic' is not offered; c or quill is"}, 2},
+        {{"convert", "--to", "basic", "a"}, "", "", {"--to: 'basic' is not offered; c, quill or pp is"}, 2},
         {{"simplify", "--from", "pascal", "a"}, "", "", {"--from: 'pascal' is not offered; c or quill is"}, 2},
         {{"tree", "--json", "--dot", "a"}, "", "", {"--json", "--dot"}, 2},
         {{"simplify", "--feature", "Nope=1", "a"}, "", "", {"there is no feature flag \"Nope\""}, 2},

@@ -7,6 +7,7 @@
 #include <cstddef>
 #include <optional>
 #include <string>
+#include <vector>
 
 namespace vtsym {
 
@@ -25,9 +26,11 @@ public:
     [[nodiscard]] VT::SymbolicExprId parse(const TextOptions& options, const std::string& text) const;
     [[nodiscard]] VT::SymbolicExprId simplify(const TextOptions& options, const std::string& text) const;
     /// The text of a condition in the shape of the language that the options ask for.  Unlike the service it writes
-    /// `true` for TRUE, so that no answer is invisible.
+    /// `true` for TRUE, 1 in a directive, so that no answer is invisible.
     [[nodiscard]] std::string print(const TextOptions& options, VT::SymbolicExprId condition) const;
-    /// The same without a change of shape.
+    /// What C or a preprocessor would decide differently, where the options ask for the one or the other.
+    [[nodiscard]] std::vector<std::string> warnings(const TextOptions& options, VT::SymbolicExprId condition) const;
+    /// The same as print() without a change of shape.
     [[nodiscard]] std::string printAsItStands(VT::SymbolicExprId condition, bool quill) const;
 
 private:

@@ -44,8 +44,10 @@ public:
 
     void answer(const std::string& text, std::string& out);
 
+    [[nodiscard]] const std::vector<std::string>& warnings() const noexcept { return warnings_; }
 
 private:
+    std::string print(VT::SymbolicExprId condition);
     void answerInDetail(const std::string& text, std::string& out);
     [[nodiscard]] std::string step(VT::SymbolicExprId condition) const;
     void explain(std::string& out) const;
@@ -55,6 +57,7 @@ private:
     const Style& style_;
     Conditions conditions_;
     Firings firings_;
+    std::vector<std::string> warnings_;
 };
 
 void Simplifier::answer(const std::string& text, std::string& out) {
@@ -62,7 +65,13 @@ void Simplifier::answer(const std::string& text, std::string& out) {
     if (options_.json || options_.explain)
         answerInDetail(text, out);
     else
-        out.append(conditions_.print(options_, conditions_.simplify(options_, text)));
+        out.append(print(conditions_.simplify(options_, text)));
+}
+
+/// A result, with what there is to say of it.
+std::string Simplifier::print(VT::SymbolicExprId condition) {
+    warnings_ = conditions_.warnings(options_, condition);
+    return conditions_.print(options_, condition);
 }
 
 /// Past the service's caches, which know results only.
@@ -73,7 +82,7 @@ void Simplifier::answerInDetail(const std::string& text, std::string& out) {
     std::uint64_t passes = 0;
     const VT::SymbolicExprId condition = conditions_.parse(options_, text);
     const VT::SymbolicExprId simplified = simplifier.simplify(condition, passes);
-    const std::string result = conditions_.print(options_, simplified);
+    const std::string result = print(simplified);
     if (options_.json) {
         appendMember(out, "result", jsonString(result));
         appendMember(out, "passes", std::to_string(passes));
@@ -139,7 +148,7 @@ Command addSimplify(CLI::App& program) {
                 Simplifier simplifier(*options, console.dataStyle());
                 const Answering answering{
                     [&](const std::string& text, std::string& out) { simplifier.answer(text, out); },
-                    options->explain && !options->json};
+                    options->explain && !options->json, &simplifier.warnings()};
                 return answerTexts(*options, console, answering);
             }};
 }
