@@ -104,6 +104,28 @@ TEST(Program, ExplainsSimplification) {
     });
 }
 
+TEST(Program, WritesConditionsOfDirectives) {
+    expectRows({
+        {{"pp", "true && Mode == 1", "A || B.x && C", "true"}, "", "1 && Mode == 1\nA || (B_x && C)\n1\n", {}, 0},
+        {{"pp", "--given", "A == 1 && B"}, "A == 1 && C\nA != 1 || D\nB\n", "C\nD\n1\n", {}, 0},
+        {{"pp", "--from", "quill", "--given", "rem(A,2)", "--json", "rem(A,2) & B == 1 && ~B"},
+         "",
+         "{\"line\":1,\"input\":\"rem(A,2) & B == 1 && ~B\",\"result\":\"(A % 2 & B == 1) && !B\"}\n",
+         {"line 1: warning: C reads the element-wise logical and"},
+         0},
+        {{"pp", "--given", "A = 1", "A"}, "", "", {"vtsym: --given: ", "  A = 1\n    ^"}, 1},
+        {{"convert", "--to", "pp", "a b", "A.B_C == A_B.C && x > .5"},
+         "",
+         "\nA_B_C == A_B_C && x > 0.5\n",
+         {"line 1: ", "line 2: warning: A_B.C and A.B_C are both written A_B_C",
+          "line 2: warning: a preprocessor has no real constants: 0.5"},
+         1},
+        {{"simplify", "--to", "pp", "A>1||A<=1", "!(A.B<3)&&C||0"}, "", "1\nA_B >= 3 && C\n", {}, 0},
+        {{"convert", "--from", "quill", "--to", "c", "x.^2 > 1"}, "", "x.^2>1\n", {"C has no element-wise power"}, 0},
+        {{"convert", "--from", "quill", "x.^2 > 1"}, "", "x.^2>1\n", {}, 0},
+    });
+}
+
 TEST(Program, ShowsTrees) {
     expectRows({
         {{"tree", "Mode == 1 && s.gear > 2.5", "x"},
@@ -184,7 +206,7 @@ TEST(Program, RefusesWrongUsageWithAHint) {
 }
 
 TEST(Program, HelpsOnRequest) {
-    for (const char* command : {"", "simplify", "convert", "tree", "operators"}) {
+    for (const char* command : {"", "simplify", "convert", "pp", "tree", "operators"}) {
         SCOPED_TRACE(command);
         std::vector<std::string> asked{command, "--help"};
         std::vector<std::string> helped{"help", command};

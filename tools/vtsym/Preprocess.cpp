@@ -56,7 +56,9 @@ void Preprocessor::answer(const std::string& text, std::string& out) {
     conditions_.makeRoomFor(text);
     VT::SymbolicExprTable& table = conditions_.service().table();
     const VT::SymbolicExprQ2C toC(table);
-    const VT::SymbolicExprId given = toC(conditions_.parse(options_, options_.given));
+    const VT::SymbolicExprId given = options_.given.empty() // nothing is known then
+                                         ? VT::invalidId
+                                         : toC(conditions_.parse(options_, options_.given));
     const VT::SymbolicExprId condition = toC(conditions_.parse(options_, text));
     const std::string result = VT::StringifyImpliedCondition(table, false, true, given).print(condition);
     warnings = conditions_.warnings(options_, condition);
