@@ -83,9 +83,10 @@ TEST(Program, ListsAndReplacesSymbols) {
 
 TEST(Program, KeepsASession) {
     const std::string dialogue = "A>2 && A<4\nans || A>3\n:let N=A+1\n:let A=2\nN*2==6\n:quill\nB ~= A\n:c\n"
-                                 ":tree A+1\n:explain 1 && B\n:symbols\n  \n";
+                                 ":tree A+1\n:explain 1 && B\n:symbols\n:pp !A.b || B && 2.5 < C\n";
     const std::string answers = "A==3\nA>=3\nN = A+1\nA = 2\n(A+1)*2==6\n(A+1)*2==6\nB~=2\nB!=2\n"
-                                "Plus +\n├─ 2\n└─ 1\n1 && B\npass 1\n  number in And  1 && B  =>  B\n= B\nB\n\n";
+                                "Plus +\n├─ 2\n└─ 1\n1 && B\npass 1\n  number in And  1 && B  =>  B\n= B\nB\n"
+                                "!A_b || (B && 2.5 < C)\nwarning: a preprocessor has no real constants: 2.5\n";
     expectRows({
         {{"repl"}, dialogue, answers, {}, 0},
         {{"repl", "--from", "quill"}, "A ~= 1\n:quit\nB\n", "A~=1\n\n\n", {}, 0},
@@ -141,6 +142,28 @@ TEST(Program, ExplainsSimplification) {
          "\"true operand of And\",\"before\":\"A && true\",\"after\":\"A\"}]}\n",
          {},
          0},
+    });
+}
+
+TEST(Program, WritesConditionsOfDirectives) {
+    expectRows({
+        {{"pp", "true && Mode == 1", "A || B.x && C", "true"}, "", "1 && Mode == 1\nA || (B_x && C)\n1\n", {}, 0},
+        {{"pp", "--given", "A == 1 && B"}, "A == 1 && C\nA != 1 || D\nB\n", "C\nD\n1\n", {}, 0},
+        {{"pp", "--from", "quill", "--given", "rem(A,2)", "--json", "rem(A,2) & B == 1 && ~B"},
+         "",
+         "{\"line\":1,\"input\":\"rem(A,2) & B == 1 && ~B\",\"result\":\"(A % 2 & B == 1) && !B\"}\n",
+         {"line 1: warning: C reads the element-wise logical and"},
+         0},
+        {{"pp", "--given", "A = 1", "A"}, "", "", {"vtsym: --given: ", "  A = 1\n    ^"}, 1},
+        {{"convert", "--to", "pp", "a b", "A.B_C == A_B.C && x > .5"},
+         "",
+         "\nA_B_C == A_B_C && x > 0.5\n",
+         {"line 1: ", "line 2: warning: A_B.C and A.B_C are both written A_B_C",
+          "line 2: warning: a preprocessor has no real constants: 0.5"},
+         1},
+        {{"simplify", "--to", "pp", "A>1||A<=1", "!(A.B<3)&&C||0"}, "", "1\nA_B >= 3 && C\n", {}, 0},
+        {{"convert", "--from", "quill", "--to", "c", "x.^2 > 1"}, "", "x.^2>1\n", {"C has no element-wise power"}, 0},
+        {{"convert", "--from", "quill", "x.^2 > 1"}, "", "x.^2>1\n", {}, 0},
     });
 }
 
@@ -215,7 +238,7 @@ TEST(Program, RefusesWrongUsageWithAHint) {
         {{"frobnicate"}, "", "", {"there is no command 'frobnicate'\n"}, 2},
         {{"simplify", "-x"}, "", "", {"there is no option '-x'", "goes behind --", "Try 'vtsym simplify --help'"}, 2},
         {{"operators", "x"}, "", "", {"'x' is one argument too many", "Try 'vtsym operators --help'"}, 2},
-        {{"convert", "--to", "basic", "a"}, "", "", {"--to: 'basic' is not offered; c or quill is"}, 2},
+        {{"convert", "--to", "basic", "a"}, "", "", {"--to: 'basic' is not offered; c, quill or pp is"}, 2},
         {{"simplify", "--from", "pascal", "a"}, "", "", {"--from: 'pascal' is not offered; c or quill is"}, 2},
         {{"tree", "--json", "--dot", "a"}, "", "", {"--json", "--dot"}, 2},
         {{"simplify", "--feature", "Nope=1", "a"}, "", "", {"there is no feature flag \"Nope\""}, 2},
@@ -224,7 +247,7 @@ TEST(Program, RefusesWrongUsageWithAHint) {
 }
 
 TEST(Program, HelpsOnRequest) {
-    for (const char* command : {"", "simplify", "convert", "tree", "symbols", "replace", "repl", "operators"}) {
+    for (const char* command : {"", "simplify", "convert", "pp", "tree", "symbols", "replace", "repl", "operators"}) {
         SCOPED_TRACE(command);
         std::vector<std::string> asked{command, "--help"};
         std::vector<std::string> helped{"help", command};

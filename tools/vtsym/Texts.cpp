@@ -32,6 +32,7 @@ public:
 
 private:
     void explain(const std::string& text, const TextError& error);
+    void warn();
 
     bool json_;
     Console& console_;
@@ -53,6 +54,7 @@ void Answerer::answer(const std::string& text) {
     const std::size_t begin = out_.size();
     try {
         answering_.answer(text, out_);
+        warn();
     } catch (...) {
         const TextError error = currentTextError();
         allAnswered_ = false;
@@ -68,6 +70,15 @@ void Answerer::explain(const std::string& text, const TextError& error) {
         appendMember(out_, "error", jsonOf(error));
     else
         console_.words(errorLines(line_, text, error, console_.wordStyle()));
+}
+
+void Answerer::warn() {
+    if (answering_.warnings == nullptr || answering_.warnings->empty())
+        return;
+    std::string lines;
+    for (const std::string& warning : *answering_.warnings)
+        lines += warningLine(line_, warning, console_.wordStyle());
+    console_.words(lines);
 }
 
 /// Calls `use` with every line of standard input; 0, or the error that ended reading.  Before it waits for more input,
@@ -131,9 +142,9 @@ CLI::Validator oneOf(std::vector<std::string> words) {
     return {[words = std::move(words)](const std::string& value) -> std::string {
                 if (std::ranges::find(words, value) != words.end())
                     return {};
-                std::string choice;
-                for (const std::string& word : words)
-                    choice += (choice.empty() ? "" : " or ") + word;
+                std::string choice = words.front();
+                for (std::size_t i = 1; i < words.size(); ++i)
+                    choice += (i + 1 < words.size() ? ", " : " or ") + words[i];
                 return "'" + value + "' is not offered; " + choice + " is";
             },
             ""};
@@ -154,8 +165,11 @@ void addSourceOption(CLI::App& command, TextOptions& options) {
 }
 
 void addLanguageOption(CLI::App& command, TextOptions& options) {
-    command.add_option("--to", options.to, "Language of the answers: c or quill (as --from unless given)")
-        ->check(oneOf({"c", "quill"}))
+    command
+        .add_option("--to", options.to,
+                    "Language of the answers: c, quill or pp, the condition of a preprocessor directive (as --from "
+                    "unless given)")
+        ->check(oneOf({"c", "quill", "pp"}))
         ->type_name("LANGUAGE");
 }
 

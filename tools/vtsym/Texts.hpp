@@ -22,6 +22,9 @@ struct TextOptions {
     [[nodiscard]] bool fromQuill() const { return from == "quill"; }
 
     [[nodiscard]] bool toQuill() const { return (to.empty() ? from : to) == "quill"; }
+
+    /// Whether answers are conditions of preprocessor directives.
+    [[nodiscard]] bool toDirective() const { return to == "pp"; }
 };
 
 /// How a command answers.
@@ -31,6 +34,8 @@ struct Answering {
     std::function<void(const std::string& text, std::string& answer)> answer;
     /// Whether answers have several lines; they are kept apart by empty lines then.
     bool inBlocks = false;
+    /// What is to be told on standard error of the text that was answered last; nullptr for nothing ever.
+    const std::vector<std::string>* warnings = nullptr;
 };
 
 /// Marks the arguments behind `--` as texts, whatever they begin with; addTextOptions() takes the marks off again.  The
