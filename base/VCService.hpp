@@ -5,6 +5,7 @@
 #include "base/service/VCServiceHandle.hpp"
 #include "base/service/VCSymbolicExprId.hpp"
 #include "base/service/VCSymbols.hpp"
+#include "base/simplify/VCCustomizer.hpp"
 
 #include <memory>
 #include <string>
@@ -15,7 +16,6 @@ namespace VT {
 
 class SymbolicExprSimplify;
 class SymbolicExprTable;
-class VCCustomizer;
 struct ServiceParts;
 
 /// The conditions of a process.  Conditions are over integers: every symbol stands for an integer, a truth value is an
@@ -98,8 +98,8 @@ public:
 
     /// Whether a condition is TRUE.
     [[nodiscard]] bool getBoolean(SymbolicExprId condition) const;
-    /// Whether two conditions are the same: the same structure or, under a customizer, the same simplified structure of
-    /// what it rewrites them to.
+    /// Whether two conditions are the same: the same structure or, under a customizer, the same simplified structure
+    /// after its replacement of parameters.
     bool isEqual(const SymbolicExprId& a, const SymbolicExprId& b);
     /// The alias of a parameter, or the empty text.
     [[nodiscard]] std::string getParameterAlias(const std::string& parameter) const;
@@ -136,6 +136,7 @@ private:
     VCSymbolicExprId simplifyFrom(const std::string& text, bool isQuill);
     std::string printIn(bool quill, SymbolicExprId condition, bool wasQuill);
     VCSymbolicExprId combined(SymbolicExprId condition, bool simplify);
+    SymbolicExprId replaceParameters(SymbolicExprId condition, const ParameterReplacements& parameters);
     SymbolicExprId rewritten(SymbolicExprId condition);
     SymbolicExprId simplifyNow(SymbolicExprId condition, bool isQuill);
 

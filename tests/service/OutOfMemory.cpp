@@ -1,4 +1,5 @@
 // Every allocation of a call fails once: the error passes, nothing leaks or breaks, and the next call is right.
+#include "base/service/SymbolRegistry.hpp"
 #include "tests/service/Customizers.hpp"
 
 #include <cstdlib>
@@ -68,7 +69,13 @@ std::string work() {
     VCService& service = VCService::getInstance();
     const VCSymbolicExprId condition = service.simplifyFromCCondition(text);
     const VCSymbolicExprId both = service.AND(condition, service.NOT(service.parseC("B == 4"), true), true);
-    return service.printQExprWithConversion(both).empty() ? "" : service.printCExpr(condition);
+    const VCSymbolicExprId quill = service.parseQ(service.printQExprWithConversion(condition));
+    const SymbolicExprId dimension = service.parseQ("[N*2.5, max(M', 3)]");
+    SymbolRegistry registry(service.table());
+    const std::string name = registry.registerExpression(nullptr, dimension);
+    if (service.printQExprWithConversion(both).empty() || registry.registeredBy(nullptr).front() != name)
+        return "";
+    return service.printCExpr(quill);
 }
 
 TEST(OutOfMemory, PassesAndLeavesTheServiceUsable) {
