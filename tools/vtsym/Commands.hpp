@@ -22,6 +22,7 @@ struct Command {
 Command addSimplify(CLI::App& program);
 Command addConvert(CLI::App& program);
 Command addTree(CLI::App& program);
+Command addEval(CLI::App& program);
 Command addOperators(CLI::App& program);
 
 } // namespace vtsym

@@ -32,6 +32,9 @@ struct Answering {
     bool inBlocks = false;
 };
 
+/// Marks arguments such as `[1,2]`, which CLI11 would take for lists of texts.
+void guardLists(std::vector<std::string>& arguments);
+
 /// Gives a command the texts, --json and --from.
 void addTextOptions(CLI::App& command, TextOptions& options);
 /// Gives a command --to.
