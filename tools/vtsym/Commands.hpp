@@ -23,6 +23,7 @@ Command addSimplify(CLI::App& program);
 Command addConvert(CLI::App& program);
 Command addTree(CLI::App& program);
 Command addPreprocess(CLI::App& program);
+Command addEval(CLI::App& program);
 Command addOperators(CLI::App& program);
 
 } // namespace vtsym

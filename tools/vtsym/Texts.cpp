@@ -16,6 +16,9 @@ namespace vtsym {
 
 namespace {
 
+/// What no argument of a command line holds.
+constexpr char guard = '\0';
+
 /// Answers one text after another.
 class Answerer {
 public:
@@ -129,8 +132,22 @@ CLI::Validator oneOf(std::vector<std::string> words) {
 
 } // namespace
 
+void guardLists(std::vector<std::string>& arguments) {
+    for (std::string& argument : arguments)
+        if (argument.starts_with('[') && argument.ends_with(']'))
+            argument += guard;
+}
+
 void addTextOptions(CLI::App& command, TextOptions& options) {
-    command.add_option("TEXT", options.texts, "Texts to work on; without any, or with -, every line of standard input")
+    command
+        .add_option_function<std::vector<std::string>>(
+            "TEXT",
+            [&options](std::vector<std::string> texts) {
+                for (std::string& text : texts)
+                    std::erase(text, guard);
+                options.texts = std::move(texts);
+            },
+            "Texts to work on; without any, or with -, every line of standard input")
         ->type_name("");
     command.add_option("--from", options.from, "Language of the texts: c or quill")
         ->check(oneOf({"c", "quill"}))

@@ -37,6 +37,9 @@ struct Answering {
     const std::vector<std::string>* warnings = nullptr;
 };
 
+/// Marks arguments such as `[1,2]`, which CLI11 would take for lists of texts.
+void guardLists(std::vector<std::string>& arguments);
+
 /// Gives a command the texts, --json and --from.
 void addTextOptions(CLI::App& command, TextOptions& options);
 /// Gives a command --to.
