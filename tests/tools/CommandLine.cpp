@@ -126,6 +126,29 @@ TEST(Program, WritesConditionsOfDirectives) {
     });
 }
 
+TEST(Program, WorksOnDimensions) {
+    expectRows({
+        {{"dims", "N*2.0 + N/3 + 1.4", "2*3", "s.x"},
+         "",
+         "cast        N*2+N/3+1\nsimplified  N*2+N/3+1\nfactored    (N*2*3+N+1*3)/3\nsymbols     N\n\n"
+         "cast        2*3\nsimplified  6\nfactored    6\nvalue       6\n\n"
+         "cast        s.x\nsimplified  s.x\nfactored    s.x\nsymbols     s.x\n",
+         {},
+         0},
+        {{"dims", "-D", "N=6", "-D", "M=N - 1", "--json"},
+         "[N/2 + M/3, 4]\nN + K\nN +\n",
+         R"json({"line":1,"input":"[N/2 + M/3, 4]","cast":"[N/2+M/3,4]","simplified":"[N/2+M/3,4]","factored":"[(N*3+M*2)/(2*3),4]","symbols":["N","M"],"type":"vector","value":[4,4]}
+{"line":2,"input":"N + K","cast":"N+K","simplified":"N+K","factored":"N+K","symbols":["N","K"]}
+{"line":3,"input":"N +","error":{"id":"Vantor:SymbolicDims:InvalidExpression","message":"The expression \"N +\" cannot be read at its end: correct it there. The text ends where a value must follow.","offset":3}}
+)json",
+         {},
+         1},
+        {{"dims", "N^2"}, "", "\n", {"line 1: ", "power"}, 1},
+        {{"dims", "-D", "N", "N"}, "", "", {"-D: 'N' is not NAME=VALUE"}, 2},
+        {{"dims", "-D", "3=N", "N"}, "", "", {"'3' is no name"}, 2},
+    });
+}
+
 TEST(Program, ShowsTrees) {
     expectRows({
         {{"tree", "Mode == 1 && s.gear > 2.5", "x"},
@@ -206,7 +229,7 @@ TEST(Program, RefusesWrongUsageWithAHint) {
 }
 
 TEST(Program, HelpsOnRequest) {
-    for (const char* command : {"", "simplify", "convert", "pp", "tree", "operators"}) {
+    for (const char* command : {"", "simplify", "convert", "pp", "tree", "eval", "dims", "operators"}) {
         SCOPED_TRACE(command);
         std::vector<std::string> asked{command, "--help"};
         std::vector<std::string> helped{"help", command};

@@ -24,6 +24,7 @@ Command addConvert(CLI::App& program);
 Command addTree(CLI::App& program);
 Command addPreprocess(CLI::App& program);
 Command addEval(CLI::App& program);
+Command addDims(CLI::App& program);
 Command addOperators(CLI::App& program);
 
 } // namespace vtsym

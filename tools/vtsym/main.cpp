@@ -75,7 +75,7 @@ Program::Program() {
     app_.footer(footer);
     app_.get_formatter()->column_width(34);
     addFeatures(app_);
-    for (const auto add : {addSimplify, addConvert, addPreprocess, addTree, addEval, addOperators}) {
+    for (const auto add : {addSimplify, addConvert, addPreprocess, addTree, addEval, addDims, addOperators}) {
         commands_.push_back(add(app_));
         addFeatures(*commands_.back().app);
     }
