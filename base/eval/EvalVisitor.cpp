@@ -18,14 +18,6 @@ const SymbolicValue::Elements open;
 
 } // namespace
 
-SymbolicExprEvalImpl::SymbolicExprEvalImpl(const SymbolicExprTable& table) : table_(table) {
-    constexpr std::size_t usualDepth = 16;
-    constexpr std::size_t usualNodes = 48;
-    stack_.reserve(usualDepth);
-    frames_.reserve(usualDepth);
-    values_.reserve(usualNodes);
-}
-
 SymbolicValue SymbolicExprEvalImpl::evaluate(SymbolicExprId id) {
     evaluateToStack(id);
     return get();
@@ -70,12 +62,14 @@ void SymbolicExprEvalImpl::evaluateToStack(SymbolicExprId id) {
 /// Puts the value of an expression on the stack, or its node on the frames.
 void SymbolicExprEvalImpl::enter(SymbolicExprId id, const Frame* parent) {
     // An operand is older than its node; a value may be any node.
-    if (!table_.has(id) || (parent != nullptr && !parent->isSymbol && id >= parent->id))
+    const SymbolicExpr* const found = table_.get(id);
+    if (found == nullptr || (parent != nullptr && !parent->isSymbol && id >= parent->id))
         detail::throwMissingNode(table_, id, parent != nullptr ? parent->node : nullptr);
-    const SymbolicExpr& node = *table_.get(id);
-    const Evaluation way = detail::evaluationOf(node);
+    const SymbolicExpr& node = *found;
+    const SymbolicOp op = node.op();
+    const Evaluation way = detail::evaluationOf(op);
     if (way == Evaluation::Literal) {
-        push(detail::literalValue(node));
+        push(detail::literalValue(node, op));
         return;
     }
     if (const std::size_t* const known = known_.find(id); known != nullptr) {
@@ -87,13 +81,13 @@ void SymbolicExprEvalImpl::enter(SymbolicExprId id, const Frame* parent) {
     if (way == Evaluation::None)
         detail::throwNotEvaluable(table_, node);
     if (way == Evaluation::Operands)
-        enterOperands(id, node);
+        enterOperands(id, node, op);
     else
         enterSymbol(id, node, way == Evaluation::Member);
 }
 
-void SymbolicExprEvalImpl::enterOperands(SymbolicExprId id, const SymbolicExpr& node) {
-    const ScalarRuleIndex rule = scalarRuleIndex(node.op());
+void SymbolicExprEvalImpl::enterOperands(SymbolicExprId id, const SymbolicExpr& node, SymbolicOp op) {
+    const ScalarRuleIndex rule = scalarRuleIndex(op);
     if (rule == ScalarRuleIndex::None) {
         frames_.emplace_back(&node, id, invalidId, invalidId, 0, node.getNumInputs(), rule, false);
     } else if (scalarRules[static_cast<std::size_t>(rule)].operands == 1) {
@@ -116,8 +110,8 @@ void SymbolicExprEvalImpl::enterSymbol(SymbolicExprId id, const SymbolicExpr& no
             detail::throwNotEvaluable(table_, node);
         detail::throwUnboundSymbol(table_, node);
     }
-    if (const SymbolicExpr& bound = *table_.get(value); detail::evaluationOf(bound) == Evaluation::Literal) {
-        push(detail::literalValue(bound));
+    if (const SymbolicExpr& bound = *table_.get(value); detail::evaluationOf(bound.op()) == Evaluation::Literal) {
+        push(detail::literalValue(bound, bound.op()));
         known_.insert(id, stack_.back());
         return;
     }

@@ -5,9 +5,10 @@
 #include "base/core/Nodes.hpp"
 #include "base/eval/Values.hpp"
 
+#include <boost/container/small_vector.hpp>
+
 #include <cstddef>
 #include <forward_list>
-#include <vector>
 
 namespace VT {
 
@@ -30,7 +31,7 @@ namespace VT {
 class VTSYM_API SymbolicExprEvalImpl : public RoutedVisitor<SymbolicExprEvalImpl> {
 public:
     /// `table` outlives the visitor.
-    explicit SymbolicExprEvalImpl(const SymbolicExprTable& table);
+    explicit SymbolicExprEvalImpl(const SymbolicExprTable& table) : table_(table) {}
 
     SymbolicExprEvalImpl(const SymbolicExprEvalImpl&) = delete;
     SymbolicExprEvalImpl& operator=(const SymbolicExprEvalImpl&) = delete;
@@ -83,7 +84,7 @@ private:
 
     void evaluateToStack(SymbolicExprId id);
     void enter(SymbolicExprId id, const Frame* parent);
-    void enterOperands(SymbolicExprId id, const SymbolicExpr& node);
+    void enterOperands(SymbolicExprId id, const SymbolicExpr& node, SymbolicOp op);
     void enterSymbol(SymbolicExprId id, const SymbolicExpr& node, bool isMember);
     void leave();
 
@@ -104,9 +105,10 @@ private:
     void combineElements(const SymbolicExpr& node, const ScalarRule& rule, const Entry& left, const Entry& right);
 
     const SymbolicExprTable& table_;
-    std::vector<Entry> values_;
-    std::vector<std::size_t> stack_; ///< of values
-    std::vector<Frame> frames_;
+    // With room for usual expressions in place.
+    boost::container::small_vector<Entry, 64> values_;
+    boost::container::small_vector<std::size_t, 16> stack_; ///< of values
+    boost::container::small_vector<Frame, 16> frames_;
     IdMap<std::size_t> known_;            ///< the values of nodes but literals
     std::forward_list<Elements> vectors_; ///< of the entries
     std::size_t elementCount_ = 0;        ///< in them

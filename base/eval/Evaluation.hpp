@@ -29,13 +29,13 @@ inline constexpr auto evaluations = [] {
     return ways;
 }();
 
-inline Evaluation evaluationOf(const SymbolicExpr& node) {
-    return evaluations[static_cast<std::size_t>(node.op())];
+constexpr Evaluation evaluationOf(SymbolicOp op) {
+    return evaluations[static_cast<std::size_t>(op)];
 }
 
-/// The value of a literal.
-inline SymbolicScalar literalValue(const SymbolicExpr& literal) {
-    if (literal.op() == SymbolicOp::IntValue)
+/// The value of a literal with this operator.
+inline SymbolicScalar literalValue(const SymbolicExpr& literal, SymbolicOp op) {
+    if (op == SymbolicOp::IntValue)
         return static_cast<const SymbolicIntValue&>(literal).getValue();
     return static_cast<const SymbolicDoubleValue&>(literal).getValue();
 }

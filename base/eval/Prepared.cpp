@@ -29,7 +29,7 @@ PreparedExpr::PreparedExpr(const SymbolicExprTable& table, SymbolicExprId id) : 
             if (sources.find(visited) != nullptr)
                 return true;
             const SymbolicExpr& node = *table.get(visited);
-            const Evaluation way = detail::evaluationOf(node);
+            const Evaluation way = detail::evaluationOf(node.op());
             if (way == Evaluation::None)
                 detail::throwNotEvaluable(table, node);
             if (way != Evaluation::Operands)
@@ -57,8 +57,8 @@ PreparedExpr::Source PreparedExpr::sourceOf(SymbolicExprId id, const SymbolicExp
         constants_.push_back(value);
         return Source{Source::Kind::Constant, static_cast<std::uint32_t>(constants_.size() - 1)};
     };
-    if (detail::evaluationOf(node) == Evaluation::Literal)
-        return constant(detail::literalValue(node));
+    if (detail::evaluationOf(node.op()) == Evaluation::Literal)
+        return constant(detail::literalValue(node, node.op()));
     if (node.op() == SymbolicOp::String)
         if (const auto truth = detail::truthConstant(node); truth)
             return constant(*truth);
