@@ -26,4 +26,8 @@ inline constexpr std::size_t textBytes = std::size_t{1} << 30U;
 /// ordered by their structure.
 inline constexpr std::size_t orderedTextBytes = std::size_t{1} << 16U;
 
+/// Elements of all vectors that one evaluation makes, and operations of a prepared expression.  Each node of a graph may
+/// make one more vector as long as the longest; beyond the bound evaluation throws std::length_error.
+inline constexpr std::size_t evaluatedElements = std::size_t{1} << 26U;
+
 } // namespace VT::limits

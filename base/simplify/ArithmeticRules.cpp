@@ -18,6 +18,9 @@ namespace VT {
 
 namespace {
 
+/// Evaluation takes a smaller real divisor for zero, so its quotient is no finite number.
+constexpr double leastDivisor = 0x1p-26;
+
 SymbolicExprId integerIfFits(RuleContext& context, std::int64_t value) {
     return fitsInt(value) ? context.make<SymbolicIntValue>(static_cast<int>(value)) : invalidId;
 }
@@ -56,7 +59,7 @@ SymbolicExprId foldNumbers(RuleContext& context, SymbolicOp op, SymbolicExprId a
     case SymbolicOp::Multiply:
         return realIfFinite(context, x * y);
     default:
-        return y != 0 ? realIfFinite(context, x / y) : invalidId;
+        return std::fabs(y) >= leastDivisor ? realIfFinite(context, x / y) : invalidId;
     }
 }
 

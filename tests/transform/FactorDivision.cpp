@@ -1,6 +1,7 @@
 // Divisions pulled outwards, judged in a finite field, where every division is exact.
 #include "base/transform/FactorDivision.hpp"
 #include "base/print/ExpressionPrinter.hpp"
+#include "base/simplify/Simplify.hpp"
 #include "tests/support/Parsing.hpp"
 
 #include <gtest/gtest.h>
@@ -34,6 +35,8 @@ std::int64_t valueOf(const SymbolicExprTable& table, SymbolicExprId id, std::map
             return in(0) + in(1);
         case SymbolicOp::Minus:
             return in(0) - in(1);
+        case SymbolicOp::UnaryMinus:
+            return -in(0);
         case SymbolicOp::Multiply:
             return in(0) * in(1);
         case SymbolicOp::Divide:
@@ -98,13 +101,17 @@ TEST_F(FactorDivision, KeepsTheValueAndLeavesOneQuotient) {
             if (valueOf(table, chosen, values) != 0) // so that no divisor is zero
                 nodes.push_back(chosen);
         }
+        std::uint64_t passes = 0;
+        const SymbolicExprId simplified = SymbolicExprSimplify(table).simplify(nodes.back(), passes);
         const SymbolicExprId after = factored(nodes.back());
         std::map<SymbolicExprId, std::int64_t> values;
         std::map<SymbolicExprId, std::int64_t> below; // the nodes of the result
+        for (const SymbolicExprId rearranged : {simplified, factored(simplified)})
+            EXPECT_EQ(valueOf(table, nodes.back(), values), valueOf(table, rearranged, values));
         EXPECT_EQ(valueOf(table, nodes.back(), values), valueOf(table, after, below));
         below.erase(after);
         for (const auto& [id, value] : below)
-            EXPECT_NE(table.get(id)->op(), SymbolicOp::Divide);
+            EXPECT_NE(table.get(id)->op(), SymbolicOp::Divide) << SymbolicExprPrinter(table, false)(after);
         EXPECT_EQ(factored(after), after);
     }
 }

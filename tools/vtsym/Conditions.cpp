@@ -24,13 +24,14 @@ std::string visible(std::string text) {
 
 } // namespace
 
-void Conditions::makeRoomFor(const std::string& text) {
+bool Conditions::makeRoomFor(const std::string& text) {
     textBytes_ += text.size() + cacheEntryBytes;
     if (service().table().size() < fullTable && textBytes_ < fullTexts)
-        return;
+        return false;
     handle_.reset();
     handle_.emplace();
     textBytes_ = 0;
+    return true;
 }
 
 VT::SymbolicExprId Conditions::parse(const TextOptions& options, const std::string& text) const {

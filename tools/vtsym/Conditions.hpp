@@ -19,8 +19,8 @@ public:
 
     [[nodiscard]] VT::VCService& service() const { return **handle_; }
 
-    /// To be called before the service is given a text.
-    void makeRoomFor(const std::string& text);
+    /// To be called before the service is given a text.  True where the service was renewed.
+    bool makeRoomFor(const std::string& text);
 
     /// The condition of a text in the language of the options, as it stands or simplified.
     [[nodiscard]] VT::SymbolicExprId parse(const TextOptions& options, const std::string& text) const;

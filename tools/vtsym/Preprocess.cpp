@@ -76,6 +76,7 @@ Command addPreprocess(CLI::App& program) {
     options->to = "pp";
     addTextOptions(*command, *options);
     command->add_option("--given", options->given, "A condition that is known to hold; what it decides is left out")
+        ->transform(withoutMark, "")
         ->type_name("CONDITION");
     command->footer(examples);
     return {command, [options](Console& console) {

@@ -16,7 +16,8 @@ namespace vtsym {
 
 namespace {
 
-constexpr char textMark = '\x01';
+/// What no argument of a command line holds.
+constexpr char textMark = '\0';
 
 /// Answers one text after another.
 class Answerer {
@@ -119,11 +120,18 @@ int forEachLine(Console& console, Use&& use) {
 } // namespace
 
 void markTexts(std::vector<std::string>& arguments) {
-    auto text = std::ranges::find(arguments, "--");
-    if (text == arguments.end())
-        return;
-    for (text = arguments.erase(text); text != arguments.end(); ++text)
-        text->insert(text->begin(), textMark);
+    const auto isList = [](const std::string& text) { return text.starts_with('[') && text.ends_with(']'); };
+    bool behind = false;
+    for (auto text = arguments.begin(); text != arguments.end();) {
+        if (!behind && *text == "--") {
+            behind = true;
+            text = arguments.erase(text);
+            continue;
+        }
+        if (behind || isList(*text))
+            text->insert(text->begin(), textMark);
+        ++text;
+    }
 }
 
 std::string withoutMark(const std::string& argument) {

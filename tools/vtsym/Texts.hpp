@@ -38,8 +38,8 @@ struct Answering {
     const std::vector<std::string>* warnings = nullptr;
 };
 
-/// Marks the arguments behind `--` as texts, whatever they begin with; addTextOptions() takes the marks off again.  The
-/// parser of the command line knows that only in front of the first text.
+/// Marks arguments that the parser of the command line would not take for texts: those behind `--`, unless they are the
+/// first texts, and lists such as `[1,2]`.  Options for texts take the mark off by withoutMark().
 void markTexts(std::vector<std::string>& arguments);
 std::string withoutMark(const std::string& argument);
 
