@@ -26,9 +26,9 @@ namespace VT {
 /// the value that its symbol has in the table when run() first needs it.  run() answers what SymbolicExprEval::eval()
 /// would answer with those values bound, bit for bit.
 ///
-/// Types are settled when run() first sees them and then cost nothing: a value of another type than the slot's last one
-/// makes the next run about twice as long, a scalar in the place of a vector, or a vector of another length, lets it
-/// lay out the operations anew.
+/// Types are settled when run() first sees them and then cost nothing.  A value of another type than the slot's last
+/// one lets the next run choose all operations by their types anew; a scalar in the place of a vector, or a vector of
+/// another length, lets it lay them out anew.  Both are linear in the operations, one for each operator and element.
 ///
 /// A copy is independent.  An object is used by one thread at a time; its table outlives it.
 class VTSYM_API PreparedExpr {

@@ -188,6 +188,10 @@ TEST(QuillReports, EveryKeyHasASentenceThatFits) {
         {"NonASCIIText", unnamed},
         {"InvalidExpression", unnamed},
         {"InvalidNumFcnArgs", {name, text, std::int64_t{2}, std::int64_t{1}, std::int64_t{3}}},
+        {"UnboundSymbol", {text}},
+        {"CyclicValue", {text}},
+        {"NotEvaluable", {text}},
+        {"SizeMismatch", {text, std::int64_t{2}, std::int64_t{3}}},
     };
     std::size_t rows = 0;
     for (const MessageInfo& row : messageCatalogue())
