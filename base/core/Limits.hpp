@@ -26,4 +26,20 @@ inline constexpr std::size_t textBytes = std::size_t{1} << 30U;
 /// ordered by their structure.
 inline constexpr std::size_t orderedTextBytes = std::size_t{1} << 16U;
 
+/// Steps that one question about conditions may cost: edges of diagrams joined, bounds looked at, nodes evaluated.  At
+/// most about half a second and 100 MB; real conditions take tens to thousands, ten thousand choices of a set some
+/// hundred thousand.  Beyond the bound the question is undecided.
+inline constexpr std::uint64_t decisionSteps = std::uint64_t{1} << 21U;
+
+/// Edges of diagrams that are kept between questions, 16 bytes each.  When there are more, all are thrown away before
+/// the next question, which builds anew what it needs.
+inline constexpr std::size_t diagramEdges = std::size_t{1} << 22U;
+
+/// Cases of one arithmetic term that truth values take part in.  A term with more is an unknown of its own.
+inline constexpr std::size_t termCases = 64;
+
+/// Assignments tried to confirm a witness where arithmetic is not understood.  Beyond the bound the question is
+/// undecided.
+inline constexpr std::size_t confirmations = 8192;
+
 } // namespace VT::limits
