@@ -42,4 +42,9 @@ inline constexpr std::size_t termCases = 64;
 /// undecided.
 inline constexpr std::size_t confirmations = 8192;
 
+/// Changes tried, each with a proof, and nodes interned on the way, to shorten one condition by what is known.  Beyond
+/// either bound the shortest form found so far stands.
+inline constexpr std::size_t impliedTries = 1000;
+inline constexpr std::size_t impliedNodes = std::size_t{1} << 16U;
+
 } // namespace VT::limits

@@ -194,33 +194,15 @@ Decision Decider::equivalentGiven(SymbolicExprId a, SymbolicExprId b, SymbolicEx
 }
 
 Relation Decider::classify(SymbolicExprId a, SymbolicExprId b) {
-    Relation relation;
     std::uint64_t taken = 0;
-    const auto ask = [&](Decision decision) {
+    const auto counted = [&](Decision decision) {
         taken += state_->taken;
-        if (decision.isUndecided() && relation.bound == DecisionBound::None)
-            relation.bound = decision.bound;
         return decision;
     };
-    relation.onlyA = ask(implies(a, b).opposite());
-    relation.onlyB = ask(implies(b, a).opposite());
-    relation.both = ask(overlaps(a, b));
+    Decision onlyA = counted(implies(a, b).opposite());
+    Decision onlyB = counted(implies(b, a).opposite());
+    Relation relation = Relation::of(std::move(onlyA), std::move(onlyB), counted(overlaps(a, b)));
     state_->taken = taken;
-    const bool open = relation.onlyA.isUndecided() || relation.onlyB.isUndecided();
-    if (relation.onlyA.isNo() && relation.onlyB.isNo())
-        relation.kind = RelationKind::Equivalent;
-    else if (relation.both.isNo() && (relation.onlyA.isYes() || relation.onlyB.isYes()))
-        relation.kind = RelationKind::Disjoint;
-    else if (open || relation.both.isUndecided())
-        relation.kind = RelationKind::Undecided;
-    else if (relation.onlyA.isNo())
-        relation.kind = RelationKind::Implies;
-    else if (relation.onlyB.isNo())
-        relation.kind = RelationKind::ImpliedBy;
-    else
-        relation.kind = RelationKind::Overlaps;
-    if (relation.kind != RelationKind::Undecided)
-        relation.bound = DecisionBound::None;
     return relation;
 }
 

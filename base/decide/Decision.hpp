@@ -67,6 +67,9 @@ struct Relation {
     Decision onlyA; ///< whether the first can hold without the second
     Decision onlyB; ///< whether the second can hold without the first
     Decision both;  ///< whether they can hold together
+
+    /// The relation that the three answers make.
+    [[nodiscard]] VTSYM_API static Relation of(Decision onlyA, Decision onlyB, Decision both);
 };
 
 /// The answer about a set, with two of its members where they prove it.
