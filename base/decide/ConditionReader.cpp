@@ -23,6 +23,12 @@ ConditionReader::ConditionReader(const LeafReader& leaves, Unknowns& unknowns, D
       diagrams_(diagrams),
       steps_(steps) {}
 
+bool comesBefore(const Unknowns& unknowns, const UnknownLeaf& a, const UnknownLeaf& b) {
+    if (a.unknown != b.unknown)
+        return unknowns.before(a.unknown, b.unknown);
+    return a.opposite != b.opposite ? a.opposite : a.node < b.node;
+}
+
 // The walk.
 
 ReadCondition ConditionReader::read(SymbolicExprId condition) {
@@ -51,11 +57,8 @@ ReadCondition ConditionReader::read(SymbolicExprId condition) {
         return result;
     }
     result.truth = truthOf(condition);
-    std::ranges::sort(leaves_, [&](const UnknownLeaf& a, const UnknownLeaf& b) {
-        if (a.unknown != b.unknown)
-            return unknowns_.before(a.unknown, b.unknown);
-        return a.opposite != b.opposite ? a.opposite : a.node < b.node;
-    });
+    std::ranges::sort(leaves_,
+                      [&](const UnknownLeaf& x, const UnknownLeaf& y) { return comesBefore(unknowns_, x, y); });
     const auto repeated = std::ranges::unique(leaves_);
     result.leaves.assign(leaves_.begin(), repeated.begin());
     return result;
@@ -287,7 +290,10 @@ Diagram ConditionReader::compare(SymbolicOp op, const LinearForm& form) {
     const std::int64_t right = -form.constant;
     if (op == SymbolicOp::Equal) {
         const std::int64_t value = (opposed ? -right : right) / factor;
-        return right % factor == 0 ? diagrams_.between(quantity, value, value) : never;
+        const QuantityInfo& info = unknowns_.quantity(quantity);
+        const std::int64_t mask = info.isDifference() ? 0 : unknowns_[info.plus].mask;
+        const bool isPossible = right % factor == 0 && (mask == 0 || (value & ~mask) == 0);
+        return isPossible ? diagrams_.between(quantity, value, value) : never;
     }
     const std::int64_t most = floorDivide(op == SymbolicOp::LessThan ? right - 1 : right, factor);
     return opposed ? diagrams_.between(quantity, -most, plusInfinite)
@@ -395,6 +401,11 @@ ConditionReader::Value ConditionReader::boundedTerm(const Frame& frame) {
                 low = 0;
                 high = std::min(high, *mask);
             }
+        if (low == 0) {
+            Value value = term(frame.id, low, high);
+            unknowns_.setMask(value.cases.front().form.parts.front().unknown, high);
+            return zeroTested(frame, std::move(value));
+        }
     }
     return zeroTested(frame, term(frame.id, low, high));
 }

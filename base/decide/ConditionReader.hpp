@@ -30,6 +30,9 @@ struct UnknownLeaf {
     bool operator==(const UnknownLeaf&) const = default;
 };
 
+/// The order of leaves: that of their texts, but for copies of one keyword.
+[[nodiscard]] bool comesBefore(const Unknowns& unknowns, const UnknownLeaf& a, const UnknownLeaf& b);
+
 struct ReadCondition {
     Diagram truth = never;
     DecisionBound bound = DecisionBound::None; ///< why it could not be read

@@ -11,6 +11,7 @@
 #include <boost/container/small_vector.hpp>
 
 #include <algorithm>
+#include <iterator>
 #include <limits>
 
 namespace VT {
@@ -101,13 +102,15 @@ const Decider::State::Leaves& Decider::State::leavesOf(std::span<const Read* con
     if (conditions.size() == 1)
         return conditions.front()->condition.leaves;
     joined.clear();
-    for (const Read* read : conditions)
-        joined.insert(joined.end(), read->condition.leaves.begin(), read->condition.leaves.end());
-    std::ranges::sort(joined, [&](const UnknownLeaf& a, const UnknownLeaf& b) {
-        if (a.unknown != b.unknown)
-            return unknowns.before(a.unknown, b.unknown);
-        return a.opposite != b.opposite ? a.opposite : a.node < b.node;
-    });
+    const auto before = [&](const UnknownLeaf& a, const UnknownLeaf& b) { return comesBefore(unknowns, a, b); };
+    if (conditions.size() == 2) {
+        std::ranges::merge(conditions[0]->condition.leaves, conditions[1]->condition.leaves, std::back_inserter(joined),
+                           before);
+    } else {
+        for (const Read* read : conditions)
+            joined.insert(joined.end(), read->condition.leaves.begin(), read->condition.leaves.end());
+        std::ranges::sort(joined, before);
+    }
     const auto repeated = std::ranges::unique(joined);
     joined.erase(repeated.begin(), repeated.end());
     return joined;

@@ -133,7 +133,7 @@ std::size_t Diagrams::edgeOf(Diagram diagram, std::int64_t value) const {
 
 Diagrams::Known& Diagrams::slotOf(Diagram a, Diagram b) {
     const std::size_t mask = known_.size() - 1;
-    std::size_t at = (mix(a, b) >> 20U) & mask;
+    std::size_t at = (mix(mix(0, a), b) >> 20U) & mask;
     while (known_[at].question == question_ && (known_[at].a != a || known_[at].b != b))
         at = (at + 1) & mask;
     return known_[at];

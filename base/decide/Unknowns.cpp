@@ -112,20 +112,20 @@ void Unknowns::label(std::set<Unknown, ByText>::const_iterator at) {
 
 Unknown Unknowns::simulation() {
     if (simulation_ == noUnknown)
-        simulation_ = add({UnknownKind::Simulation, invalidId, {}, 0, 1, 0, 0});
+        simulation_ = add({UnknownKind::Simulation, invalidId, {}, 0, 1, 0, 0, 0});
     return simulation_;
 }
 
 Unknown Unknowns::free(SymbolicExprId node) {
     if (const Unknown* known = byNode_.find(node); known != nullptr)
         return *known;
-    return byNode_.insert(node, add({UnknownKind::Free, node, {}, low_, high_, 0, 0}));
+    return byNode_.insert(node, add({UnknownKind::Free, node, {}, low_, high_, 0, 0, 0}));
 }
 
 Unknown Unknowns::term(SymbolicExprId node, std::int64_t low, std::int64_t high) {
     if (const Unknown* known = byNode_.find(node); known != nullptr)
         return *known;
-    return byNode_.insert(node, add({UnknownKind::Term, node, {}, low, high, 0, 0}));
+    return byNode_.insert(node, add({UnknownKind::Term, node, {}, low, high, 0, 0, 0}));
 }
 
 std::pair<Unknown, bool> Unknowns::sum(const LinearParts& parts) {
@@ -139,7 +139,7 @@ std::pair<Unknown, bool> Unknowns::sum(const LinearParts& parts) {
     const auto known = sums_.find(canonical);
     if (known != sums_.end())
         return {known->second, opposite};
-    const Unknown fresh = add({UnknownKind::Sum, invalidId, canonical, minusInfinite, plusInfinite, 0, 0});
+    const Unknown fresh = add({UnknownKind::Sum, invalidId, canonical, minusInfinite, plusInfinite, 0, 0, 0});
     sums_.emplace(std::move(canonical), fresh);
     return {fresh, opposite};
 }

@@ -38,6 +38,7 @@ struct UnknownInfo {
     LinearParts sum;     ///< of a sum: no common divisor, the first part by text positive
     std::int64_t low;    ///< no value of the unknown is below
     std::int64_t high;   ///< or above
+    std::int64_t mask;   ///< every value is made of these bits; 0 where nothing is known
     std::uint64_t label; ///< grows in the order of unknowns
     Quantity quantity;   ///< the unknown as a quantity
 
@@ -63,6 +64,10 @@ public:
     Unknown free(SymbolicExprId node);
     /// @param low,high  bounds that hold for every value of the term
     Unknown term(SymbolicExprId node, std::int64_t low, std::int64_t high);
+
+    /// Tells that every value of a term is made of the bits of a mask.
+    void setMask(Unknown term, std::int64_t mask) { unknowns_[term].mask = mask; }
+
     /// The sum of the parts, which have no common divisor, and whether it is the sum as given or its opposite.
     std::pair<Unknown, bool> sum(const LinearParts& parts);
     /// a - b, or b - a and true: the one that comes later by text minus the other.

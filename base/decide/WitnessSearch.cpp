@@ -416,6 +416,14 @@ bool WitnessSearch::confirmNear(const std::vector<std::int64_t>& solution) {
                 if (confirmWith(std::array{Change(i, value)}))
                     return true;
             }
+    base_ = zeros;
+    for (std::size_t i = movable_.size(); i-- > 1;) // what one sum gains another may have to lose
+        for (std::size_t j = i; j-- > 0;) {
+            for (const std::int64_t value : possible[j])
+                if (confirmWith(std::array{Change(j, value), Change(i, -value)}))
+                    return true;
+            base_ = zeros;
+        }
     for (std::size_t reach = 8; reach < 4 * all.size(); reach *= 4) // near values for all pairs first
         for (const Base& base : {zeros, ones})
             for (std::size_t i = movable_.size(); i-- > 1;)

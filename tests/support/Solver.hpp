@@ -42,12 +42,18 @@ public:
 
     Z3_ast negated(Z3_ast truth) { return Z3_mk_not(context_, truth); }
 
-    /// Whether both can hold together.
+    /// Whether both can hold together.  As elsewhere a "yes" comes with an assignment, which the solver makes on demand
+    /// only, so that asking for it is part of the question.
     bool canHold(Z3_ast a, Z3_ast b) {
         Z3_solver_push(context_, solver_);
         Z3_solver_assert(context_, solver_, a);
         Z3_solver_assert(context_, solver_, b);
         const Z3_lbool answer = Z3_solver_check(context_, solver_);
+        if (answer == Z3_L_TRUE) {
+            const Z3_model model = Z3_solver_get_model(context_, solver_);
+            Z3_model_inc_ref(context_, model);
+            Z3_model_dec_ref(context_, model);
+        }
         Z3_solver_pop(context_, solver_, 1);
         if (answer == Z3_L_UNDEF)
             throw std::logic_error("the solver does not know");
