@@ -27,8 +27,8 @@ inline constexpr std::size_t textBytes = std::size_t{1} << 30U;
 inline constexpr std::size_t orderedTextBytes = std::size_t{1} << 16U;
 
 /// Steps that one question about conditions may cost: edges of diagrams joined, bounds looked at, nodes evaluated.  At
-/// most about half a second and 100 MB; real conditions take tens to thousands, ten thousand choices of a set some
-/// hundred thousand.  Beyond the bound the question is undecided.
+/// most about a quarter of a second and 100 MB; real conditions take tens to thousands, ten thousand choices of a set
+/// some hundred thousand.  Beyond the bound the question is undecided.
 inline constexpr std::uint64_t decisionSteps = std::uint64_t{1} << 21U;
 
 /// Edges of diagrams that are kept between questions, 16 bytes each.  When there are more, all are thrown away before

@@ -16,9 +16,17 @@
 
 namespace VT {
 
+namespace {
+
+/// So many bounds of a path, each within the bound of linear forms, add up within 64 bits.
+constexpr std::uint64_t mostSteps = std::uint64_t{1} << 22U;
+static_assert(limits::decisionSteps <= mostSteps && mostSteps <= std::uint64_t{1} << 62U >> 40U);
+
+} // namespace
+
 struct Decider::State {
     State(const SymbolicExprTable& symbols, const DecisionOptions& asked)
-        : options(asked),
+        : options{asked.keywordsInForce, asked.bits32, std::min(asked.steps, mostSteps)},
           printer(symbols, false),
           leafReader(symbols, asked.keywordsInForce),
           unknowns(symbols, printer, asked.bits32 ? std::numeric_limits<std::int32_t>::min() : minusInfinite,
@@ -94,6 +102,9 @@ bool Decider::State::isReadable(SymbolicExprId id) {
         return read(id).condition.bound == DecisionBound::None;
     } catch (const StepsUsedUp&) {
         return false;
+    } catch (...) {
+        clear();
+        throw;
     }
 }
 
@@ -143,6 +154,9 @@ Decision Decider::State::decide(std::span<const SymbolicExprId> ids, Combine com
         }
     } catch (const StepsUsedUp&) {
         decision = {Answer::Undecided, DecisionBound::Steps, std::nullopt};
+    } catch (...) { // memory ran out somewhere between two structures that go together
+        clear();
+        throw;
     }
     taken = options.steps - steps.left();
     return decision;
@@ -263,7 +277,7 @@ std::optional<bool> Decider::holds(SymbolicExprId condition, const Witness& witn
             continue;
         const LeafMeaning::Kind kind = state_->leafReader(each.unknown).kind;
         if (kind == LeafMeaning::Kind::Simulation || kind == LeafMeaning::Kind::CodeGeneration)
-            simulation = kind == LeafMeaning::Kind::Simulation ? each.value : 1 - each.value;
+            simulation = (kind == LeafMeaning::Kind::Simulation) == (each.value != 0) ? 1 : 0;
     }
     TermPlan plan(state_->leafReader, state_->unknowns, condition);
     const auto value = plan.value([&](Unknown unknown) {

@@ -404,6 +404,8 @@ bool WitnessSearch::confirmNear(const std::vector<std::int64_t>& solution) {
     Base zeros;
     Base ones;
     for (const Number number : movable_) {
+        if (!isWithinBound(solution[number]))
+            return false;
         zeros.emplace_back(number, solution[number]);
         const bool replaced = solution[number] == 0 && system_.low(number) <= 1 && system_.high(number) >= 1;
         ones.emplace_back(number, replaced ? 1 : solution[number]);
