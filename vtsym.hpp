@@ -4,6 +4,8 @@
 #include "base/VCService.hpp"
 #include "base/VTSymbolicExpr.hpp"
 #include "base/core/Limits.hpp"
+#include "base/decide/Decider.hpp"
+#include "base/decide/Decision.hpp"
 #include "base/eval/Eval.hpp"
 #include "base/eval/EvalVisitor.hpp"
 #include "base/eval/Prepared.hpp"
