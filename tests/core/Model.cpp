@@ -1,7 +1,6 @@
 // Interning against an independent model: a map keyed by text.
 #include "base/core/Nodes.hpp"
-#include "tests/support/AnyNode.hpp"
-#include "tests/support/TreeText.hpp"
+#include "tests/support/RandomExpression.hpp"
 
 #include <rapidcheck/gtest.h>
 

@@ -1,6 +1,7 @@
 // The order of visits, shared nodes, depth, and nodes that name what is not there.
 #include "base/core/Nodes.hpp"
 #include "tests/support/AnyNode.hpp"
+#include "tests/support/RandomExpression.hpp"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -130,23 +131,20 @@ TEST(Visiting, WhatIsNotThereIsNotVisited) {
     }
 }
 
-TEST(Visiting, AMillionDeepOnEitherSpine) {
-    constexpr SymbolicExprId depth = 1000000;
-    for (const bool left : {true, false}) {
-        SymbolicExprTable table;
-        const SymbolicExprId x = SymbolicString(table, "x").getId(table);
-        SymbolicExprId id = x;
-        for (SymbolicExprId i = 0; i < depth; ++i)
-            id = left ? SymbolicPlusExpr(table, id, x).getId(table) : SymbolicPlusExpr(table, x, id).getId(table);
-        Counter counter;
-        counter.execute(table, id);
-        EXPECT_EQ(counter.count, 2 * depth + 1);
-        table.get(id)->accept(table, counter);
-        EXPECT_EQ(counter.count, 4 * depth + 2);
-        std::vector<std::string> symbols;
-        table.getSymbolsFromExpression(id, symbols);
-        EXPECT_THAT(symbols, ElementsAre("x"));
-    }
+TEST(Visiting, AMillionDeep) {
+    constexpr int depth = 1'000'000;
+    SymbolicExprTable table;
+    const Trees tree{table};
+    const SymbolicExprId x = tree.name("x");
+    const SymbolicExprId id = tree.zigzag(SymbolicOp::Plus, SymbolicOp::Plus, x, x, depth);
+    Counter counter;
+    counter.execute(table, id);
+    EXPECT_EQ(counter.count, 2 * depth + 1U);
+    table.get(id)->accept(table, counter);
+    EXPECT_EQ(counter.count, 4 * depth + 2U);
+    std::vector<std::string> symbols;
+    table.getSymbolsFromExpression(id, symbols);
+    EXPECT_THAT(symbols, ElementsAre("x"));
 }
 
 } // namespace

@@ -13,16 +13,10 @@ using Op = SymbolicOp;
 
 constexpr int deep = 1'000'000;
 
-SymbolicExprId doubled(const Trees& tree, SymbolicExprId id, int times, Op op = Op::Plus) {
-    for (int i = 0; i < times; ++i)
-        id = tree(op, id, id);
-    return id;
-}
-
 TEST(PrintBounds, TextAtTheBoundAndOneByteBeyond) {
     SymbolicExprTable table;
     const Trees tree{table};
-    const SymbolicExprId id = doubled(tree, tree.name("x"), 10, Op::FcnCall1U);
+    const SymbolicExprId id = tree.doubled(Op::FcnCall1U, tree.name("x"), 10);
     SymbolicExprPrinter printer(table, true);
     const std::string text = printer(id);
     EXPECT_EQ(text.size(), printer.textLength(id));
@@ -42,9 +36,9 @@ TEST(PrintBounds, DoublingGraphsAreMeasuredByTheirNodes) {
     const SymbolicExprId quotient = tree(Op::Divide, tree.name("x"), tree.name("y"));
     const SymbolicExprPrinter printer(table, true);
     // x/y&&x/y is 8 bytes; each further level doubles and adds && and two parentheses.
-    EXPECT_EQ(printer.textLength(doubled(tree, quotient, 55, Op::And)), (std::uint64_t{6} << 55U) - 4);
+    EXPECT_EQ(printer.textLength(tree.doubled(Op::And, quotient, 55)), (std::uint64_t{6} << 55U) - 4);
     for (const Op op : {Op::And, Op::BitAnd, Op::ShiftRight}) {
-        const SymbolicExprId id = doubled(tree, quotient, 200, op);
+        const SymbolicExprId id = tree.doubled(op, quotient, 200);
         const std::size_t nodes = table.size();
         EXPECT_EQ(printer.textLength(id), std::uint64_t{1} << 62U);
         EXPECT_THROW(static_cast<void>(printer(id)), std::length_error);

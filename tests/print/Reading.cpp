@@ -268,35 +268,6 @@ std::string meaningOf(SymbolicExprTable& table, SymbolicExprId id, Language lang
     return "(" + op + first + ")";
 }
 
-SymbolicExprId makeNode(SymbolicExprTable& table, SymbolicOp op, std::vector<SymbolicExprId> inputs) {
-#define MAKE_String(Class) break
-#define MAKE_Int(Class) break
-#define MAKE_Double(Class) break
-#define MAKE_Unary(Class) return Class(table, inputs.at(0)).getId(table)
-#define MAKE_Member(Class) return Class(table, inputs.at(0), "field").getId(table)
-#define MAKE_Binary(Class) return Class(table, inputs.at(0), inputs.at(1)).getId(table)
-#define MAKE_Ternary(Class) return Class(table, inputs.at(0), inputs.at(1), inputs.at(2)).getId(table)
-#define MAKE_Multi(Class) return Class(table, std::move(inputs)).getId(table)
-#define MAKE_Dims2(Class) MAKE_Binary(Class)
-#define MAKE_Dims3(Class) MAKE_Ternary(Class)
-#define MAKE_DimsN(Class) MAKE_Multi(Class)
-#define MAKE_Call0(Class) MAKE_Unary(Class)
-#define MAKE_Call1(Class) MAKE_Binary(Class)
-#define MAKE_Call2(Class) MAKE_Ternary(Class)
-#define MAKE_CallN(Class) MAKE_Multi(Class)
-#define MAKE_Cell(Class) MAKE_Multi(Class)
-    switch (op) {
-#define VTSYM_OPERATOR(Code, Name, Class, Shape, ...)                                                                  \
-    case SymbolicOp::Name:                                                                                             \
-        MAKE_##Shape(Class);
-#include "base/core/operators.def"
-#undef VTSYM_OPERATOR
-    case SymbolicOp::None:
-        break;
-    }
-    throw std::logic_error("a leaf has no inputs");
-}
-
 SymbolicExprId randomTree(SymbolicExprTable& table, Language language, std::mt19937& random, int depth) {
     const Trees tree{table};
     const auto below = [&](unsigned bound) { return static_cast<unsigned>(random()) % bound; };

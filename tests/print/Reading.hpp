@@ -2,14 +2,11 @@
 // trees.
 #pragma once
 
-#include "base/core/Nodes.hpp"
+#include "tests/support/AnyNode.hpp"
 
-#include <concepts>
 #include <random>
 #include <string>
 #include <string_view>
-#include <utility>
-#include <vector>
 
 namespace VT::Testing {
 
@@ -22,33 +19,10 @@ std::string readingOf(std::string_view text, Language language);
 /// A tree in the same notation; in Quill, C's own operators as the calls that the conversion makes of them.
 std::string meaningOf(SymbolicExprTable& table, SymbolicExprId id, Language language);
 
-/// A node of any operator; a member is named "field".
-SymbolicExprId makeNode(SymbolicExprTable& table, SymbolicOp op, std::vector<SymbolicExprId> inputs);
-
 /// Whether trees of an operator can be written in a language so that they read back.
 bool isWritten(SymbolicOp op, Language language);
 
 /// A random tree of the operators that are written in a language.
 SymbolicExprId randomTree(SymbolicExprTable& table, Language language, std::mt19937& random, int depth);
-
-/// Leaves and operators in few words.
-struct Trees {
-    SymbolicExprTable& table;
-
-    SymbolicExprId name(const std::string& text) const { return SymbolicString(table, text).getId(table); }
-
-    SymbolicExprId integer(int value) const { return SymbolicIntValue(table, value).getId(table); }
-
-    SymbolicExprId real(double value) const { return SymbolicDoubleValue(table, value).getId(table); }
-
-    SymbolicExprId operator()(SymbolicOp op, std::vector<SymbolicExprId> inputs) const {
-        return makeNode(table, op, std::move(inputs));
-    }
-
-    template <std::same_as<SymbolicExprId>... Inputs>
-    SymbolicExprId operator()(SymbolicOp op, Inputs... inputs) const {
-        return makeNode(table, op, {inputs...});
-    }
-};
 
 } // namespace VT::Testing

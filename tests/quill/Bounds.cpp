@@ -1,73 +1,14 @@
-// Nesting at the bound and one beyond, long texts, and memory that runs out.
+// Nesting at the bound and one beyond, and long texts.
 #include "tests/quill/TreeText.hpp"
+#include "tests/support/Times.hpp"
 
 #include <gtest/gtest.h>
-
-#include <atomic>
-#include <cstdlib>
-#include <new>
-
-namespace {
-
-// Allocations of the program, and the one that fails.
-std::atomic<long> living{0};
-std::atomic<long> allowed{-1};
-
-void* allocate(std::size_t size) {
-    if (allowed.load() >= 0 && allowed.fetch_sub(1) == 0)
-        throw std::bad_alloc();
-    void* const memory = std::malloc(size == 0 ? 1 : size);
-    if (memory == nullptr)
-        throw std::bad_alloc();
-    ++living;
-    return memory;
-}
-
-void release(void* memory) noexcept {
-    if (memory == nullptr)
-        return;
-    --living;
-    std::free(memory);
-}
-
-} // namespace
-
-void* operator new(std::size_t size) {
-    return allocate(size);
-}
-
-void* operator new[](std::size_t size) {
-    return allocate(size);
-}
-
-void operator delete(void* memory) noexcept {
-    release(memory);
-}
-
-void operator delete[](void* memory) noexcept {
-    release(memory);
-}
-
-void operator delete(void* memory, std::size_t) noexcept {
-    release(memory);
-}
-
-void operator delete[](void* memory, std::size_t) noexcept {
-    release(memory);
-}
 
 namespace VT::Testing {
 namespace {
 
 constexpr std::size_t bound = 256;
 constexpr std::size_t mebibyte = std::size_t{1} << 20U;
-
-std::string times(std::size_t count, const std::string& text) {
-    std::string all;
-    for (std::size_t i = 0; i < count; ++i)
-        all += text;
-    return all;
-}
 
 TEST(QuillBounds, NestingAtTheBoundAndOneBeyond) {
     struct Nest {
@@ -149,31 +90,6 @@ TEST(QuillBounds, LongTexts) {
         EXPECT_EQ(shapeError(*tree, text), "") << piece;
         EXPECT_LE(countNodes(*tree), 3 * text.size() + 4) << piece;
     }
-}
-
-TEST(QuillBounds, MemoryThatRunsOut) {
-    const std::vector<std::string> texts = {"a + b", times(600, "f(1,[2 3;4],@(x)-x){'t'} + ") + "a.b'",
-                                            "[" + times(3000, "1 ") + "]", times(3000, "a^") + "$", times(200, "((")};
-    const long before = living;
-    for (const std::string& text : texts) {
-        const auto parser = PARSER_T<char>::create(bound);
-        bool done = false;
-        for (long n = 0; !done; ++n) {
-            allowed = n;
-            try {
-                parser->delete_parse_tree(parser->generate_parse_tree(text.data(), text.size()));
-                done = true;
-            } catch (const std::bad_alloc&) {
-                EXPECT_LT(n, 1000);
-            }
-            allowed = -1;
-            const QuillNode* const next = parser->generate_parse_tree("1 + x");
-            ASSERT_NE(next, nullptr);
-            EXPECT_EQ(treeText(*next), "(49 1 x)");
-            parser->delete_parse_tree(next);
-        }
-    }
-    EXPECT_EQ(living, before);
 }
 
 /// A parser that has read one long text does not hold on to its memory, and trees live apart from each other.

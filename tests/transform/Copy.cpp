@@ -1,5 +1,6 @@
 // Copies of expressions with the values of their symbols.
 #include "base/transform/Copy.hpp"
+#include "tests/support/AnyNode.hpp"
 #include "tests/support/Parsing.hpp"
 #include "tests/support/RandomExpression.hpp"
 #include "tests/support/StructureNumbers.hpp"
@@ -16,12 +17,6 @@ namespace VT::Testing {
 namespace {
 
 using Values = std::map<std::string, std::string>;
-
-SymbolicExprId read(SymbolicExprTable& table, const std::string& text) {
-    const ParseAnswer answer = parse(table, text);
-    EXPECT_FALSE(answer.error) << text;
-    return answer.id;
-}
 
 void bind(SymbolicExprTable& table, const Values& values) {
     for (const auto& [name, value] : values)
@@ -164,17 +159,12 @@ TEST(Copy, NotANumberIsCopied) {
 
 TEST(Copy, SharedAndDeepExpressions) {
     SymbolicExprTable source, target;
-    SymbolicExprId doubled = read(source, "a");
-    for (int i = 0; i < 64; ++i)
-        doubled = SymbolicPlusExpr(source, doubled, doubled).getId(source);
+    const Trees tree{source};
+    const SymbolicExprId doubled = tree.doubled(SymbolicOp::Plus, read(source, "a"));
     SymbolicExprCopy(source, target)(doubled);
     EXPECT_EQ(target.size(), 65U);
 
-    SymbolicExprId spine = doubled;
-    for (int i = 0; i < 1'000'000; ++i)
-        spine = i % 2 == 0 ? SymbolicPlusExpr(source, spine, SymbolicExprId{0}).getId(source)
-                           : SymbolicMinusExpr(source, SymbolicExprId{0}, spine).getId(source);
-    SymbolicExprCopy(source, target)(spine);
+    SymbolicExprCopy(source, target)(tree.zigzag(SymbolicOp::Plus, SymbolicOp::Minus, doubled, 0, 1'000'000));
     EXPECT_EQ(target.size(), source.size());
 }
 

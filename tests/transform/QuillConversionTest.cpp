@@ -1,5 +1,6 @@
 // The two shapes of one operation: C operators and calls of Quill functions.
 #include "base/transform/QuillConversion.hpp"
+#include "tests/support/AnyNode.hpp"
 #include "tests/support/Parsing.hpp"
 #include "tests/support/TreeText.hpp"
 
@@ -15,11 +16,7 @@ struct Conversion {
 
 class QuillConversion : public testing::Test {
 protected:
-    SymbolicExprId read(const std::string& text) {
-        const ParseAnswer answer = parse(table, text);
-        EXPECT_FALSE(answer.error) << text;
-        return answer.id;
-    }
+    SymbolicExprId read(const std::string& text) { return Testing::read(table, text); }
 
     template <class Driver>
     void expectConverted(const std::vector<Conversion>& conversions) {
@@ -129,18 +126,12 @@ TEST_F(QuillConversion, IdentifiersThatAreNotOfTheTable) {
 }
 
 TEST_F(QuillConversion, SharedAndDeepExpressions) {
-    SymbolicExprId doubled = read("a / b");
-    for (int i = 0; i < 64; ++i)
-        doubled = SymbolicModuloExpr(table, doubled, doubled).getId(table);
-    const SymbolicExprId quill = SymbolicExprC2Q(table)(doubled);
+    const Trees tree{table};
+    const SymbolicExprId doubled = tree.doubled(SymbolicOp::Modulo, read("a / b"));
+    const SymbolicExprId spine = tree.zigzag(SymbolicOp::Divide, SymbolicOp::ShiftRight, doubled, 0, 300'000);
+    const SymbolicExprId quill = SymbolicExprC2Q(table)(spine);
     EXPECT_EQ(table.get(quill)->op(), SymbolicOp::FcnCall2U);
-    EXPECT_EQ(SymbolicExprQ2C(table)(quill), doubled);
-
-    SymbolicExprId spine = read("a");
-    for (int i = 0; i < 300'000; ++i)
-        spine = i % 2 == 0 ? SymbolicDivideExpr(table, spine, SymbolicExprId{0}).getId(table)
-                           : SymbolicShiftRightExpr(table, SymbolicExprId{0}, spine).getId(table);
-    EXPECT_EQ(SymbolicExprQ2C(table)(SymbolicExprC2Q(table)(spine)), spine);
+    EXPECT_EQ(SymbolicExprQ2C(table)(quill), spine);
 }
 
 } // namespace

@@ -1,5 +1,6 @@
 // The symbols that expressions mention.
 #include "base/transform/Symbols.hpp"
+#include "tests/support/AnyNode.hpp"
 #include "tests/support/Parsing.hpp"
 #include "tests/support/RandomExpression.hpp"
 
@@ -89,14 +90,10 @@ TEST(Symbols, AreTheFirstOfAllOccurrences) {
 
 TEST(Symbols, SharedAndDeepExpressions) {
     SymbolicExprTable table;
-    SymbolicExprId id = parse(table, "a+b").id;
-    for (int i = 0; i < 64; ++i)
-        id = SymbolicPlusExpr(table, id, id).getId(table);
-    for (int i = 0; i < 1'000'000; ++i)
-        id = i % 2 == 0 ? SymbolicPlusExpr(table, id, SymbolicExprId{0}).getId(table)
-                        : SymbolicMinusExpr(table, SymbolicExprId{0}, id).getId(table);
+    const Trees tree{table};
+    const SymbolicExprId doubled = tree.doubled(SymbolicOp::Plus, read(table, "a+b"));
     Names names;
-    SymbolicExprSymbols{table}(id, names);
+    SymbolicExprSymbols{table}(tree.zigzag(SymbolicOp::Plus, SymbolicOp::Minus, doubled, 0, 1'000'000), names);
     EXPECT_THAT(names, testing::UnorderedElementsAre("a", "b"));
 }
 
