@@ -1,5 +1,6 @@
 // The grammar against an independent hand-written parser and against a writer that brackets everything.
 #include "base/VTSymbolicExpr.hpp"
+#include "tests/support/AnyNode.hpp"
 #include "tests/support/Corpus.hpp"
 #include "tests/support/OracleParser.hpp"
 #include "tests/support/Parsing.hpp"
@@ -13,6 +14,30 @@
 
 namespace VT::Testing {
 namespace {
+
+struct Infix {
+    const char* text;
+    SymbolicOp op;
+};
+
+constexpr Infix infixes[] = {{"+", SymbolicOp::Plus},
+                             {"-", SymbolicOp::Minus},
+                             {"*", SymbolicOp::Multiply},
+                             {"/", SymbolicOp::Divide},
+                             {"%", SymbolicOp::Modulo},
+                             {"==", SymbolicOp::Equal},
+                             {"!=", SymbolicOp::NotEqual},
+                             {"<", SymbolicOp::LessThan},
+                             {"<=", SymbolicOp::LessThanEqual},
+                             {">", SymbolicOp::GreaterThan},
+                             {">=", SymbolicOp::GreaterThanEqual},
+                             {"&&", SymbolicOp::And},
+                             {"||", SymbolicOp::Or},
+                             {"&", SymbolicOp::BitAnd},
+                             {"|", SymbolicOp::BitOr},
+                             {"^", SymbolicOp::BitXOr},
+                             {"<<", SymbolicOp::ShiftLeft},
+                             {">>", SymbolicOp::ShiftRight}};
 
 /// What is wrong where the two parsers differ on a text; empty where they agree.
 std::string difference(SymbolicExprTable& table, const std::string& text, bool cOperators, bool keywords) {
@@ -129,48 +154,10 @@ private:
 
     SymbolicExprId infix(int depth) {
         const SymbolicExprId left = bracketed(depth);
-        const unsigned op = choose(18);
-        put(std::vector<const char*>{"+", "-", "*", "/", "%", "==", "!=", "<", "<=", ">", ">=", "&&", "||", "&", "|",
-                                     "^", "<<", ">>"}[op]);
+        const unsigned op = choose(std::size(infixes));
+        put(infixes[op].text);
         const SymbolicExprId right = bracketed(depth);
-        switch (op) {
-        case 0:
-            return SymbolicPlusExpr(table_, left, right).getId(table_);
-        case 1:
-            return SymbolicMinusExpr(table_, left, right).getId(table_);
-        case 2:
-            return SymbolicMultiplyExpr(table_, left, right).getId(table_);
-        case 3:
-            return SymbolicDivideExpr(table_, left, right).getId(table_);
-        case 4:
-            return SymbolicModuloExpr(table_, left, right).getId(table_);
-        case 5:
-            return SymbolicEqualExpr(table_, left, right).getId(table_);
-        case 6:
-            return SymbolicNotEqualExpr(table_, left, right).getId(table_);
-        case 7:
-            return SymbolicLessThanExpr(table_, left, right).getId(table_);
-        case 8:
-            return SymbolicLessThanEqualExpr(table_, left, right).getId(table_);
-        case 9:
-            return SymbolicGreaterThanExpr(table_, left, right).getId(table_);
-        case 10:
-            return SymbolicGreaterThanEqualExpr(table_, left, right).getId(table_);
-        case 11:
-            return SymbolicAndExpr(table_, left, right).getId(table_);
-        case 12:
-            return SymbolicOrExpr(table_, left, right).getId(table_);
-        case 13:
-            return SymbolicBitAndExpr(table_, left, right).getId(table_);
-        case 14:
-            return SymbolicBitOrExpr(table_, left, right).getId(table_);
-        case 15:
-            return SymbolicBitXOrExpr(table_, left, right).getId(table_);
-        case 16:
-            return SymbolicShiftLeftExpr(table_, left, right).getId(table_);
-        default:
-            return SymbolicShiftRightExpr(table_, left, right).getId(table_);
-        }
+        return makeNode(table_, infixes[op].op, {left, right});
     }
 
     SymbolicExprId bracketed(int depth) {
@@ -226,6 +213,18 @@ RC_GTEST_PROP(Agreement, OnTokens, ()) {
 RC_GTEST_PROP(Agreement, OnBytes, (const std::vector<std::string>& texts)) {
     for (const std::string& text : texts)
         RC_ASSERT(difference(text) == "");
+}
+
+TEST(Agreement, OnEveryPairOfOperators) {
+    for (const Infix& first : infixes) {
+        for (const Infix& second : infixes) {
+            const std::string pair = std::string("a ") + first.text + " b " + second.text;
+            EXPECT_EQ(difference(pair + "c") + difference(pair + "~=c"), "");
+        }
+        for (const std::string prefix : {"", "-", "- ", "--", "+-", "!-", "-~", "! ~ "})
+            for (const std::string operand : {"x", "3", ".5", "(x)", "f(x)", "x.y"})
+                EXPECT_EQ(difference("2" + (first.text + prefix) + operand + first.text + prefix + operand), "");
+    }
 }
 
 /// Real conditions and, from each of them, one that has lost, doubled or exchanged a few bytes.

@@ -2,6 +2,7 @@
 #include "base/core/Limits.hpp"
 #include "base/VTSymbolicExpr.hpp"
 #include "tests/support/Parsing.hpp"
+#include "tests/support/Times.hpp"
 #include "tests/support/TreeText.hpp"
 
 #include <gtest/gtest.h>
@@ -14,13 +15,6 @@ namespace VT::Testing {
 namespace {
 
 constexpr std::size_t bound = limits::nesting;
-
-std::string times(std::size_t count, const std::string& text) {
-    std::string all;
-    for (std::size_t i = 0; i < count; ++i)
-        all += text;
-    return all;
-}
 
 /// Where reading stops; the size of the text where all of it is read.
 std::size_t stopOf(const std::string& text, bool cOperators = true) {

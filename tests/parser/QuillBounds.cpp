@@ -2,6 +2,7 @@
 #include "base/core/Limits.hpp"
 #include "parser/ParseTreeDump.hpp"
 #include "tests/parser/QuillReading.hpp"
+#include "tests/support/Times.hpp"
 
 #include <gtest/gtest.h>
 #include <rapidcheck/gtest.h>
@@ -29,14 +30,6 @@ Tree rule(std::int32_t code, const std::array<Tree, Size>& children) {
     node.childCount = static_cast<std::int32_t>(Size);
     node.children = children.data();
     return node;
-}
-
-std::string times(std::size_t count, const std::string& text) {
-    std::string all;
-    all.reserve(count * text.size());
-    for (std::size_t i = 0; i < count; ++i)
-        all += text;
-    return all;
 }
 
 TEST(QuillBounds, DeepAndBroadTrees) {

@@ -22,28 +22,15 @@ void expectTrees(const std::vector<Case>& cases, const std::vector<std::string>&
 }
 
 TEST(QuillConstructs, Operands) {
-    expectTrees({{"x", "x"},
-                 {"_x9_Y", "_x9_Y"},
-                 {"endx", "endx"},
-                 {"12", "12"},
-                 {"1.5", "1.5"},
-                 {".5", ".5"},
-                 {"5.", "5."},
-                 {"1e3", "1e3"},
-                 {"1.5E-3", "1.5E-3"},
-                 {"5.e+3", "5.e+3"},
-                 {"0x1F", "0x1F"},
-                 {"0", "0"},
-                 {"2i", "2i"},
-                 {"1.5e3j", "1.5e3j"},
-                 {"'it''s'", "'it''s'"},
-                 {R"("it's ""so""")", R"("it's ""so""")"},
-                 {"''", "''"},
-                 {"''''", "''''"},
-                 {"'% no comment ...'", "'% no comment ...'"},
-                 {"'\xC3\xA4'", "'\xC3\xA4'"},
-                 {"(x)", "(43 x)"},
-                 {"((x))", "(43 (43 x))"}});
+    std::vector<Case> cases = {{"(x)", "(43 x)"}, {"((x))", "(43 (43 x))"}};
+    const auto addLeaves = [&cases](const std::vector<std::string>& texts) {
+        for (const std::string& text : texts)
+            cases.push_back({text, text});
+    };
+    addLeaves({"x", "_x9_Y", "endx"});
+    addLeaves({"12", "1.5", ".5", "5.", "1e3", "1.5E-3", "5.e+3", "0x1F", "0", "2i", "1.5e3j"});
+    addLeaves({"'it''s'", R"("it's ""so""")", "''", "''''", "'% no comment ...'", "'\xC3\xA4'"});
+    expectTrees(cases);
     // What a dot belongs to.
     expectTrees({{"5.^2", "(77 5 2)"},
                  {"5.*2", "(91 5 2)"},
@@ -57,63 +44,15 @@ TEST(QuillConstructs, Operands) {
                  {"5....\n+1", "(49 5 1)"}});
 }
 
+// Infix operators and white space around them are compared with another reading in Precedence.cpp.
 TEST(QuillConstructs, Operators) {
-    expectTrees({{"a + b", "(49 a b)"},
-                 {"a - b", "(50 a b)"},
-                 {"a * b", "(90 a b)"},
-                 {"a / b", "(92 a b)"},
-                 {"a < b", "(99 a b)"},
-                 {"a <= b", "(100 a b)"},
-                 {"a > b", "(101 a b)"},
-                 {"a >= b", "(102 a b)"},
-                 {"a == b", "(103 a b)"},
-                 {"a ~= b", "(104 a b)"},
-                 {"a != b", "(104 a b)"},
-                 {"a || b", "(130 a b)"},
-                 {"a && b", "(136 a b)"},
-                 {"a | b", "(132 a b)"},
-                 {"a & b", "(134 a b)"},
-                 {"a ^ b", "(76 a b)"},
-                 {"a .^ b", "(77 a b)"},
-                 {"a .* b", "(91 a b)"},
-                 {"a ./ b", "(93 a b)"},
-                 {R"(a \ b)", "(94 a b)"},
-                 {R"(a .\ b)", "(95 a b)"},
-                 {"-a", "(44 a)"},
-                 {"~a", "(46 a)"},
-                 {"!a", "(46 a)"},
-                 {"+a", "a"},
-                 {"a'", "(78 a)"},
-                 {"a.'", "(79 a)"},
-                 {"a:b", "(304 a b)"},
-                 {"a:s:b", "(305 a s b)"},
-                 {"- + ~a", "(44 (46 a))"}});
-}
-
-TEST(QuillConstructs, Precedence) {
     expectTrees({{"-a^2", "(44 (76 a 2))"},
-                 {"~a == b", "(103 (46 a) b)"},
-                 {"a | b & c", "(132 a (134 b c))"},
-                 {"a == b < c", "(103 a (99 b c))"},
                  {"a || b && c || d", "(130 (130 a (136 b c)) d)"},
-                 {"a - b - c", "(50 (50 a b) c)"},
-                 {"a ^ b ^ c", "(76 (76 a b) c)"},
-                 {"2^-1", "(76 2 (44 1))"},
-                 {"2^-a^b", "(76 (76 2 (44 a)) b)"},
                  {"2^-~+a'", "(78 (76 2 (44 (46 a))))"},
                  {"-2^-a*b", "(90 (44 (76 2 (44 a))) b)"},
-                 {"a*-b^c", "(90 a (44 (76 b c)))"},
-                 {"a^b'", "(78 (76 a b))"},
-                 {"a'^b", "(76 (78 a) b)"},
-                 {"-a'", "(44 (78 a))"},
-                 {"a''.'", "(79 (78 (78 a)))"},
                  {"a.b'^c.d(1)", "(76 (78 (83 a b)) (85 (83 c d) (303 1)))"},
-                 {"a + 1 : b * 2", "(304 (49 a 1) (90 b 2))"},
-                 {"a : b < c", "(99 (304 a b) c)"},
-                 {"a:b:c:d", "(304 (305 a b c) d)"},
                  {"a:b:c:d:e", "(305 (305 a b c) d e)"},
-                 {"a == 1:2:3 && b", "(136 (103 a (305 1 2 3)) b)"},
-                 {"a & b == c | d", "(132 (134 a (103 b c)) d)"}});
+                 {"a == 1:2:3 && b", "(136 (103 a (305 1 2 3)) b)"}});
 }
 
 TEST(QuillConstructs, CallsIndexesAndFields) {

@@ -31,6 +31,7 @@ TEST_P(QuillAndC, AreOneConditionAndConvertBothWays) {
 INSTANTIATE_TEST_SUITE_P(Texts, QuillAndC,
                          ::testing::Values(Twin{"bitand(F,4)~=0", "(F&4)!=0"}, Twin{"bitshift(a,-3)", "a>>3"},
                                            Twin{"rem(n,2)==1", "n%2==1"}, Twin{"idivide(a,b)", "a/b"},
+                                           Twin{"bitxor(a,bitor(b,c))", "a^(b|c)"},
                                            Twin{"~A || B && C~=1", "!A || B && C!=1"},
                                            Twin{"f(A,2)<=P.x", "f(A,2)<=P.x"}, Twin{"bitcmp(a)", "~a"},
                                            Twin{"(sim) && A", "(sim) && A"}));

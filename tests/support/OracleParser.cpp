@@ -1,6 +1,6 @@
 #include "tests/support/OracleParser.hpp"
 
-#include "base/core/Nodes.hpp"
+#include "tests/support/AnyNode.hpp"
 
 #include <cmath>
 #include <cstdlib>
@@ -71,7 +71,7 @@ private:
                 at_ = givenBack_ = before;
                 return true;
             }
-            left = binary(next.op, left, right);
+            left = makeNode(table_, next.op, {left, right});
         }
     }
 
@@ -283,35 +283,6 @@ private:
         return true;
     }
 
-    SymbolicExprId binary(SymbolicOp op, SymbolicExprId left, SymbolicExprId right) {
-#define VTSYM_ORACLE_CASE(Name)                                                                                        \
-    case SymbolicOp::Name:                                                                                             \
-        return Symbolic##Name##Expr(table_, left, right).getId(table_);
-        switch (op) {
-            VTSYM_ORACLE_CASE(Plus)
-            VTSYM_ORACLE_CASE(Minus)
-            VTSYM_ORACLE_CASE(Multiply)
-            VTSYM_ORACLE_CASE(Divide)
-            VTSYM_ORACLE_CASE(Modulo)
-            VTSYM_ORACLE_CASE(Equal)
-            VTSYM_ORACLE_CASE(NotEqual)
-            VTSYM_ORACLE_CASE(LessThan)
-            VTSYM_ORACLE_CASE(LessThanEqual)
-            VTSYM_ORACLE_CASE(GreaterThan)
-            VTSYM_ORACLE_CASE(GreaterThanEqual)
-            VTSYM_ORACLE_CASE(And)
-            VTSYM_ORACLE_CASE(Or)
-            VTSYM_ORACLE_CASE(BitAnd)
-            VTSYM_ORACLE_CASE(BitOr)
-            VTSYM_ORACLE_CASE(BitXOr)
-            VTSYM_ORACLE_CASE(ShiftLeft)
-            VTSYM_ORACLE_CASE(ShiftRight)
-        default:
-            return invalidId;
-        }
-#undef VTSYM_ORACLE_CASE
-    }
-
     bool refuse(const char* place, const char* start) {
         if (refused_ == nullptr)
             refused_ = place;
@@ -324,17 +295,11 @@ private:
             ++at_;
     }
 
-    char peek(std::ptrdiff_t ahead = 0) const {
-        return end_ - at_ > ahead ? at_[ahead] : '\0';
-    }
+    char peek(std::ptrdiff_t ahead = 0) const { return end_ - at_ > ahead ? at_[ahead] : '\0'; }
 
-    std::size_t rest() const {
-        return static_cast<std::size_t>(end_ - at_);
-    }
+    std::size_t rest() const { return static_cast<std::size_t>(end_ - at_); }
 
-    std::size_t offset(const char* at) const {
-        return static_cast<std::size_t>(at - begin_);
-    }
+    std::size_t offset(const char* at) const { return static_cast<std::size_t>(at - begin_); }
 
     SymbolicExprTable& table_;
     const char* begin_;

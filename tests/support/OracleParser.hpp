@@ -1,5 +1,4 @@
-// A hand-written precedence parser for conditions: the independent reading against which the grammar is tested, and the
-// floor against which its speed is measured.
+// A hand-written precedence parser for conditions: the independent reading against which the grammar is tested.
 #pragma once
 
 #include "base/core/Node.hpp"
