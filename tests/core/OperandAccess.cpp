@@ -3,32 +3,11 @@
 #include "host/Diagnostics.hpp"
 #include "tests/support/AnyNode.hpp"
 
+#include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
 namespace VT::Testing {
 namespace {
-
-class Assertions {
-public:
-    explicit Assertions(bool enabled) { vtsvSetAssertionsEnabled(enabled); }
-
-    Assertions(const Assertions&) = delete;
-    Assertions& operator=(const Assertions&) = delete;
-
-    ~Assertions() { vtsvSetAssertionsEnabled(before_); }
-
-private:
-    bool before_ = vtsvAssertionsEnabled();
-};
-
-/// A regular expression for a text taken literally.
-std::string literally(const std::string& text) {
-    std::string expression;
-    for (const char c : text)
-        expression +=
-            std::string("()[].*+?{}|\\^$").find(c) == std::string::npos ? std::string(1, c) : std::string("\\") + c;
-    return expression;
-}
 
 TEST(OperandAccessDeathTest, OutOfRange) {
     using Op = SymbolicOp;
@@ -64,16 +43,17 @@ TEST(OperandAccessDeathTest, OutOfRange) {
         const SymbolicExpr& node = *table.get(makeAny(table, op, parts));
         for (const std::size_t index : {operands, ~std::size_t{0}}) {
             for (const bool enabled : {true, false}) {
-                const Assertions assertions(enabled);
+                vtsvSetAssertionsEnabled(enabled);
                 if (enabled || !checkedOnly) {
-                    EXPECT_DEATH(static_cast<void>(node.getInput(index)), literally(message));
-                    EXPECT_DEATH(static_cast<void>(node.getInput(index)), literally(function));
+                    EXPECT_DEATH(static_cast<void>(node.getInput(index)),
+                                 testing::AllOf(testing::HasSubstr(message), testing::HasSubstr(function)));
                 } else {
                     EXPECT_EQ(node.getInput(index), answer);
                 }
             }
         }
     }
+    vtsvSetAssertionsEnabled(true);
 }
 
 } // namespace

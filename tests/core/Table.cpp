@@ -12,7 +12,6 @@
 namespace VT::Testing {
 namespace {
 
-using testing::ElementsAre;
 using testing::IsEmpty;
 
 constexpr int noValue = 2147483647;
@@ -231,18 +230,6 @@ TEST(Table, TheFirstAliasStays) {
     table.insertAliasInfo("a", "y");
     EXPECT_EQ(table.getAliasForSymbolicIdentifier("a"), "x");
     EXPECT_EQ(table.getAliasForSymbolicIdentifier("b"), "");
-}
-
-TEST(Table, SymbolsOfAnExpression) {
-    SymbolicExprTable table;
-    const SymbolicString a(table, "a");
-    const SymbolicString b(table, "b");
-    const SymbolicPlusExpr sum(table, b, SymbolicMemberValue(table, a, "field"));
-    const SymbolicMultiplyExpr product(table, sum, sum);
-    const SymbolicExprId call = SymbolicFcnCall1UExpr(table, std::string("f"), product).getId(table);
-    std::vector<std::string> symbols{"left over"};
-    table.getSymbolsFromExpression(call, symbols);
-    EXPECT_THAT(symbols, ElementsAre("f", "b", "a"));
 }
 
 TEST(Table, GrowsAcrossManyChunksWithoutMovingANode) {

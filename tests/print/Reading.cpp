@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <charconv>
 #include <cmath>
+#include <set>
 #include <stdexcept>
 
 namespace VT::Testing {
@@ -205,32 +206,19 @@ std::string readingOf(std::string_view text, Language language) {
 }
 
 bool isWritten(SymbolicOp op, Language language) {
-    switch (op) {
-    case SymbolicOp::Row:
-    case SymbolicOp::Matrix:
-    case SymbolicOp::AnonymousFunc:
-        return false;
-    case SymbolicOp::Power:
-    case SymbolicOp::DotPower:
-    case SymbolicOp::DotMul:
-    case SymbolicOp::DotDiv:
-    case SymbolicOp::LDiv:
-    case SymbolicOp::DotLDiv:
-    case SymbolicOp::Transpose:
-    case SymbolicOp::DotTranspose:
-    case SymbolicOp::SingleAnd:
-    case SymbolicOp::SingleOr:
-    case SymbolicOp::QColon:
-        return language == Language::Quill;
-    case SymbolicOp::QColon3:
-        return false; // reads as a range of a range
-    default:
-        return true;
-    }
+    using enum SymbolicOp;
+    static const std::set<SymbolicOp> never{Row, Matrix, AnonymousFunc, QColon3}; // a:b:c is a range of a range
+    static const std::set<SymbolicOp> inQuill{Power,     DotPower,     DotMul,    DotDiv,   LDiv,  DotLDiv,
+                                              Transpose, DotTranspose, SingleAnd, SingleOr, QColon};
+    return !never.contains(op) && (language == Language::Quill || !inQuill.contains(op));
 }
 
 std::string meaningOf(SymbolicExprTable& table, SymbolicExprId id, Language language) {
     const SymbolicExpr& node = *table.get(id);
+    if (callOps.contains(node.op()))
+        return meaningOf(table, node.getInput(0), language) + "(" + joined(table, node, 1, ',', language) + ")";
+    if (dimensionOps.contains(node.op()))
+        return "[" + joined(table, node, 0, ',', language) + "]";
     switch (node.op()) {
     case SymbolicOp::String:
         return static_cast<const SymbolicString&>(node).getName();
@@ -238,15 +226,6 @@ std::string meaningOf(SymbolicExprTable& table, SymbolicExprId id, Language lang
         return std::to_string(static_cast<const SymbolicIntValue&>(node).getValue());
     case SymbolicOp::DoubleValue:
         return realText(node.getNumValue(), language);
-    case SymbolicOp::FcnCall0U:
-    case SymbolicOp::FcnCall1U:
-    case SymbolicOp::FcnCall2U:
-    case SymbolicOp::FcnCall:
-        return meaningOf(table, node.getInput(0), language) + "(" + joined(table, node, 1, ',', language) + ")";
-    case SymbolicOp::Dims2D:
-    case SymbolicOp::Dims3D:
-    case SymbolicOp::DimsND:
-        return "[" + joined(table, node, 0, ',', language) + "]";
     case SymbolicOp::CellArray:
         return "{" + joined(table, node, 0, ';', language) + "}";
     case SymbolicOp::MemberValue:

@@ -26,10 +26,20 @@ bool isBlank(char c) {
 }
 
 struct Operator {
+    std::string_view text;
     int strength = 0; // 0 stands for no operator; a greater number binds tighter
-    int length = 0;
     SymbolicOp op = SymbolicOp::None;
 };
+
+/// The longer one of two that begin alike comes first.
+constexpr Operator infixes[] = {
+    {"||", 1, SymbolicOp::Or},         {"|", 3, SymbolicOp::BitOr},       {"&&", 2, SymbolicOp::And},
+    {"&", 5, SymbolicOp::BitAnd},      {"^", 4, SymbolicOp::BitXOr},      {"==", 6, SymbolicOp::Equal},
+    {"!=", 6, SymbolicOp::NotEqual},   {"~=", 6, SymbolicOp::NotEqual},   {"<=", 7, SymbolicOp::LessThanEqual},
+    {"<<", 8, SymbolicOp::ShiftLeft},  {"<", 7, SymbolicOp::LessThan},    {">=", 7, SymbolicOp::GreaterThanEqual},
+    {">>", 8, SymbolicOp::ShiftRight}, {">", 7, SymbolicOp::GreaterThan}, {"+", 9, SymbolicOp::Plus},
+    {"-", 9, SymbolicOp::Minus},       {"*", 10, SymbolicOp::Multiply},   {"/", 10, SymbolicOp::Divide},
+    {"%", 10, SymbolicOp::Modulo}};
 
 class Oracle {
 public:
@@ -66,7 +76,7 @@ private:
                 at_ = before;
                 return true;
             }
-            at_ += next.length;
+            at_ += next.text.size();
             if (!expression(next.strength + 1, right)) {
                 at_ = givenBack_ = before;
                 return true;
@@ -77,41 +87,10 @@ private:
 
     Operator infix() {
         skipBlanks();
-        const char next = peek(1);
-        switch (peek()) {
-        case '|':
-            return next == '|' ? Operator{1, 2, SymbolicOp::Or} : Operator{3, 1, SymbolicOp::BitOr};
-        case '&':
-            return next == '&' ? Operator{2, 2, SymbolicOp::And} : Operator{5, 1, SymbolicOp::BitAnd};
-        case '^':
-            return {4, 1, SymbolicOp::BitXOr};
-        case '=':
-            return next == '=' ? Operator{6, 2, SymbolicOp::Equal} : Operator{};
-        case '!':
-            return next == '=' ? Operator{6, 2, SymbolicOp::NotEqual} : Operator{};
-        case '~':
-            return next == '=' && !options_.cOperators ? Operator{6, 2, SymbolicOp::NotEqual} : Operator{};
-        case '<':
-            return next == '='   ? Operator{7, 2, SymbolicOp::LessThanEqual}
-                   : next == '<' ? Operator{8, 2, SymbolicOp::ShiftLeft}
-                                 : Operator{7, 1, SymbolicOp::LessThan};
-        case '>':
-            return next == '='   ? Operator{7, 2, SymbolicOp::GreaterThanEqual}
-                   : next == '>' ? Operator{8, 2, SymbolicOp::ShiftRight}
-                                 : Operator{7, 1, SymbolicOp::GreaterThan};
-        case '+':
-            return {9, 1, SymbolicOp::Plus};
-        case '-':
-            return {9, 1, SymbolicOp::Minus};
-        case '*':
-            return {10, 1, SymbolicOp::Multiply};
-        case '/':
-            return {10, 1, SymbolicOp::Divide};
-        case '%':
-            return {10, 1, SymbolicOp::Modulo};
-        default:
-            return {};
-        }
+        for (const Operator& each : infixes)
+            if (std::string_view(at_, rest()).starts_with(each.text) && (each.text != "~=" || !options_.cOperators))
+                return each;
+        return {};
     }
 
     bool prefixed(SymbolicExprId& id) {

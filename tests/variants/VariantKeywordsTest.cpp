@@ -2,6 +2,7 @@
 
 #include "base/variants/Features.hpp"
 #include "base/variants/Loggers.hpp"
+#include "tests/support/FlagSetting.hpp"
 
 #include <gtest/gtest.h>
 
@@ -100,29 +101,30 @@ TEST(VariantFeatures, FlagsAreDeclaredInOrder) {
     EXPECT_EQ(flags[1], &VT::guardIncludesOfVariantDataFeature());
     EXPECT_EQ(flags[2], VTFEAT_VariantKeywordsSimCodegen);
 
-    EXPECT_EQ(flags[0]->name(), "CacheSymExprSimplifyResults");
+    const struct {
+        const char* name;
+        const char* category;
+        int identifier;
+        std::int32_t value;
+    } expected[] = {{"CacheSymExprSimplifyResults", "Vantor Variants", 1788779, 1},
+                    {"GuardIncludesOfVariantData", "Vantor Variants/Codewright", 1816317, 1},
+                    {"VariantKeywordsSimCodegen", "Vantor Subsystem and Models [Variants]", 1375955, 2}};
+
+    for (std::size_t i = 0; i < flags.size(); ++i) {
+        EXPECT_EQ(flags[i]->name(), expected[i].name);
+        EXPECT_EQ(flags[i]->category(), expected[i].category);
+        EXPECT_EQ(flags[i]->identifier(), expected[i].identifier);
+        EXPECT_EQ(flags[i]->defaultValue(), expected[i].value);
+    }
     EXPECT_EQ(flags[0]->sourceUnit(), "base/VCService");
-    EXPECT_EQ(flags[0]->category(), "Vantor Variants");
-    EXPECT_EQ(flags[0]->identifier(), 1788779);
-    EXPECT_EQ(flags[0]->defaultValue(), 1);
-    EXPECT_EQ(flags[1]->name(), "GuardIncludesOfVariantData");
-    EXPECT_EQ(flags[1]->category(), "Vantor Variants/Codewright");
-    EXPECT_EQ(flags[1]->identifier(), 1816317);
-    EXPECT_EQ(flags[2]->name(), "VariantKeywordsSimCodegen");
     EXPECT_EQ(flags[2]->sourceUnit(), "parser/SymbolicExprParser");
-    EXPECT_EQ(flags[2]->category(), "Vantor Subsystem and Models [Variants]");
-    EXPECT_EQ(flags[2]->identifier(), 1375955);
-    EXPECT_EQ(flags[2]->defaultValue(), 2);
 }
 
 TEST(VariantFeatures, SimCodegenIsOnAboveZero) {
-    VtFeature& flag = *VTFEAT_VariantKeywordsSimCodegen;
-    const std::int32_t before = flag.value();
     for (const std::int32_t value : {-2147483647 - 1, -1, 0, 1, 2, 2147483647}) {
-        flag.setValue(value);
+        const VT::Testing::FlagSetting setting(*VTFEAT_VariantKeywordsSimCodegen, value);
         EXPECT_EQ(VT::isVariantKeywordsSimCodegenFeatureOn(), value > 0) << value;
     }
-    flag.setValue(before);
 }
 
 TEST(VariantLoggers, HaveTheirNamesAndStayTheSame) {
