@@ -1,6 +1,5 @@
 // Conditions in both languages meet in the same nodes.
 #include "base/VCService.hpp"
-#include "host/Diagnostics.hpp"
 #include "tests/support/RandomCondition.hpp"
 
 #include <gtest/gtest.h>
@@ -46,20 +45,6 @@ TEST(QuillService, SimplifiesAndPrintsInEitherLanguage) {
     for (const char* const constant : {"", "true"})
         EXPECT_EQ(service->parseQ(constant), service->table().getIdTRUE());
     EXPECT_EQ(service->parseQ("false"), service->table().getIdFALSE());
-}
-
-TEST(QuillService, TellsWhereATextIsNoCondition) {
-    const VCServiceHandle service;
-    for (const char* const text : {"A == ", "A = 1", "1 +", "c{2}", "'text'"}) {
-        try {
-            service->parseQ(text);
-            ADD_FAILURE() << text;
-        } catch (const HostDiagnostic& diagnostic) {
-            EXPECT_EQ(diagnostic.messageId(), "Vantor:Variants:ExpressionParseError");
-            ASSERT_TRUE(diagnostic.offset().has_value());
-            EXPECT_LE(*diagnostic.offset(), std::string(text).size());
-        }
-    }
 }
 
 TEST(QuillService, ListsAndReplacesSymbols) {

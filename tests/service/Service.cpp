@@ -119,6 +119,8 @@ TEST(ServiceTexts, ThatAreNoConditionAreRefused) {
         EXPECT_THROW(service->simplifyCExprFromCCondition(text), HostDiagnostic);
         EXPECT_THROW(service->convertExprBetweenQandC(text, false, true), HostDiagnostic);
     }
+    for (const char* text : {"A == ", "A = 1", "1 +", "c{2}", "'text'"})
+        EXPECT_THROW(service->parseQ(text), HostDiagnostic) << text;
     EXPECT_EQ(service->table().size(), nodes);
 }
 
