@@ -2,9 +2,11 @@
 // and prints them.
 #pragma once
 
+#include "base/decide/Decision.hpp"
 #include "base/service/VCServiceHandle.hpp"
 #include "base/service/VCSymbolicExprId.hpp"
 #include "base/service/VCSymbols.hpp"
+#include "base/simplify/VCCustomizer.hpp"
 
 #include <memory>
 #include <string>
@@ -15,7 +17,7 @@ namespace VT {
 
 class SymbolicExprSimplify;
 class SymbolicExprTable;
-class VCCustomizer;
+enum class PairQuestion : std::uint8_t;
 struct ServiceParts;
 
 /// The conditions of a process.  Conditions are over integers: every symbol stands for an integer, a truth value is an
@@ -98,8 +100,8 @@ public:
 
     /// Whether a condition is TRUE.
     [[nodiscard]] bool getBoolean(SymbolicExprId condition) const;
-    /// Whether two conditions are the same: the same structure or, under a customizer, the same simplified structure of
-    /// what it rewrites them to.
+    /// Whether two conditions are the same: the same structure or, under a customizer, the same simplified structure
+    /// after its replacement of parameters.
     bool isEqual(const SymbolicExprId& a, const SymbolicExprId& b);
     /// The alias of a parameter, or the empty text.
     [[nodiscard]] std::string getParameterAlias(const std::string& parameter) const;
@@ -120,6 +122,68 @@ public:
     VCSymbolicExprId replaceSymbolsInExpression(const VCSymbolicExprId& condition,
                                                 const std::unordered_map<std::string, std::string>& names);
 
+    // Deciding.  Answers are exact over the unbounded integers, or "undecided" with the bound that was hit, and come
+    // with a witness where one assignment proves them; see Decision.hpp.  Operators that Quill writes as calls are
+    // decided as operators, the variant keywords as opposites while they are in force.  A customizer has no say.
+    // Decisions about pairs are kept like simplified conditions; an identifier that is not of the table stays
+    // undecided.
+
+    /// Whether there is an assignment for which the condition holds; whether it holds for all.
+    Decision canHold(const VCSymbolicExprId& condition);
+    Decision mustHold(const VCSymbolicExprId& condition);
+    /// Whether b holds wherever a does.
+    Decision implies(const VCSymbolicExprId& a, const VCSymbolicExprId& b);
+    /// Whether two conditions hold for the same assignments.
+    Decision isEquivalent(const VCSymbolicExprId& a, const VCSymbolicExprId& b);
+    /// Whether two conditions never hold together.
+    Decision isDisjoint(const VCSymbolicExprId& a, const VCSymbolicExprId& b);
+    /// Whether the outer condition holds wherever the inner one does.
+    Decision contains(const VCSymbolicExprId& outer, const VCSymbolicExprId& inner);
+    /// Whether a implies b and is not equivalent to it.  The witness of "yes" makes b hold alone, that of "no" makes a
+    /// hold alone; there is none where the two are equivalent.
+    Decision isTighterThan(const VCSymbolicExprId& a, const VCSymbolicExprId& b);
+    /// How two conditions stand to each other, in one word and with all witnesses.
+    Relation compare(const VCSymbolicExprId& a, const VCSymbolicExprId& b);
+    /// Whether some condition of a set holds for every assignment.
+    SetDecision covers(const std::vector<VCSymbolicExprId>& conditions);
+    /// Whether no two conditions of a set hold together.
+    SetDecision isDisjoint(const std::vector<VCSymbolicExprId>& conditions);
+
+    /// The simplified condition as a sum of products: the operands of its Or, each once, in the order of their texts.
+    /// FALSE is the empty sum.  What simplification leaves unexpanded stands as one operand.
+    std::vector<VCSymbolicExprId> computeUniqueOrOperandsId(const VCSymbolicExprId& condition);
+    /// A product of such a sum as a set of factors: the operands of its And.  TRUE is the empty product.
+    std::vector<VCSymbolicExprId> computeUniqueAndOperandsId(const VCSymbolicExprId& condition);
+
+    /// The shortest condition found that equals the given one wherever the known one holds; equality is proven.  TRUE
+    /// where the known one implies it, FALSE where they are disjoint; any other result is in print no longer than the
+    /// given condition, which comes back where nothing shorter was found.
+    VCSymbolicExprId getImpliedCondition(const VCSymbolicExprId& condition, const VCSymbolicExprId& known);
+
+    /// A witness as text: "A=3, B=0".
+    std::string printWitness(const Witness& witness);
+
+    // The same about texts, which may be refused as when they are parsed.
+
+    Decision impliesFromCConditions(const std::string& a, const std::string& b);
+    Decision impliesFromQConditions(const std::string& a, const std::string& b);
+    Decision isEquivalentFromCConditions(const std::string& a, const std::string& b);
+    Decision isEquivalentFromQConditions(const std::string& a, const std::string& b);
+    Decision isDisjointFromCConditions(const std::string& a, const std::string& b);
+    Decision isDisjointFromQConditions(const std::string& a, const std::string& b);
+    Decision containsFromCConditions(const std::string& outer, const std::string& inner);
+    Decision containsFromQConditions(const std::string& outer, const std::string& inner);
+    Decision isTighterThanFromCConditions(const std::string& a, const std::string& b);
+    Decision isTighterThanFromQConditions(const std::string& a, const std::string& b);
+    SetDecision coversFromCConditions(const std::vector<std::string>& conditions);
+    SetDecision coversFromQConditions(const std::vector<std::string>& conditions);
+    std::string getImpliedCExprFromCConditions(const std::string& condition, const std::string& known);
+    std::string getImpliedQExprFromQConditions(const std::string& condition, const std::string& known);
+    std::vector<std::string> computeUniqueAndOperandsFromCCondition(const std::string& condition);
+    std::vector<std::string> computeUniqueAndOperandsFromQCondition(const std::string& condition);
+    std::vector<std::string> computeUniqueOrOperandsFromCCondition(const std::string& condition);
+    std::vector<std::string> computeUniqueOrOperandsFromQCondition(const std::string& condition);
+
     // What further operations on conditions are made of.
 
     [[nodiscard]] SymbolicExprTable& table() noexcept;
@@ -136,7 +200,12 @@ private:
     VCSymbolicExprId simplifyFrom(const std::string& text, bool isQuill);
     std::string printIn(bool quill, SymbolicExprId condition, bool wasQuill);
     VCSymbolicExprId combined(SymbolicExprId condition, bool simplify);
+    SymbolicExprId replaceParameters(SymbolicExprId condition, const ParameterReplacements& parameters);
     SymbolicExprId rewritten(SymbolicExprId condition);
+    Decision ask(PairQuestion question, const VCSymbolicExprId& a, const VCSymbolicExprId& b);
+    std::vector<VCSymbolicExprId> uniqueOperands(const VCSymbolicExprId& condition, bool ofAnd);
+    std::vector<VCSymbolicExprId> parseAll(const std::vector<std::string>& texts, bool isQuill);
+    std::vector<std::string> operandTexts(const std::string& condition, bool ofAnd, bool isQuill);
     SymbolicExprId simplifyNow(SymbolicExprId condition, bool isQuill);
 
     std::unique_ptr<ServiceParts> parts_;

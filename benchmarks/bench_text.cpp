@@ -1,9 +1,11 @@
 // Reading and printing: the corpus, and one long text.
+#include "base/VCService.hpp"
 #include "base/core/Nodes.hpp"
 #include "base/print/ExpressionPrinter.hpp"
 #include "benchmarks/Comparison.hpp"
 #include "benchmarks/Corpus.hpp"
 #include "benchmarks/FloorText.hpp"
+#include "parser/QuillConverterBlockVariants.hpp"
 #include "parser/SymbolicExprParser.hpp"
 
 #include <memory>
@@ -48,6 +50,38 @@ void parseFloor(benchmark::State& state, std::int64_t size) {
         state.SkipWithError("the floor does not read what the library reads");
 }
 
+/// The corpus in Quill, and the same conditions in C as the printer writes them.
+std::vector<std::string> printedLines(bool quill) {
+    const VCServiceHandle service;
+    std::vector<std::string> lines;
+    for (const std::string& line : readableLines())
+        lines.push_back(service->convertExprBetweenQandC(line, false, quill));
+    return lines;
+}
+
+void parseQuill(benchmark::State& state, std::int64_t) {
+    const auto lines = printedLines(true);
+    measure(
+        state, [] { return std::make_unique<SymbolicExprTable>(); },
+        [&](auto& table) {
+            VTSymbolicExprErrorCheckerBlockVariants checker;
+            SymbolicExprFromQParseTreeBlockVariants read(*table, checker);
+            for (const std::string& line : lines)
+                benchmark::DoNotOptimize(read(line));
+        });
+}
+
+void parseGrammar(benchmark::State& state, std::int64_t) {
+    const auto lines = printedLines(false);
+    measure(
+        state, [] { return std::make_unique<SymbolicExprTable>(); },
+        [&](auto& table) {
+            SymbolicExprParser parser(*table, true, false);
+            for (const std::string& line : lines)
+                benchmark::DoNotOptimize(parser(line));
+        });
+}
+
 void printLibrary(benchmark::State& state, std::int64_t size) {
     SymbolicExprTable table;
     std::vector<SymbolicExprId> ids;
@@ -85,6 +119,12 @@ const bool registered = [] {
              .items = lines,
              .unit = "line",
              .mark = 4});
+    compare({.name = "parse the corpus in Quill, beside C",
+             .library = parseQuill,
+             .floor = parseGrammar,
+             .items = lines,
+             .unit = "line",
+             .mark = 1.5});
     compare({.name = "print the corpus",
              .library = printLibrary,
              .floor = printFloor,

@@ -1,7 +1,7 @@
 # The layers of the library: their folders, and the arrows between them.  The build links by this table and a test holds every
 # #include against it.  A layer may use what its arrows reach.
 
-set(VTSYM_LAYERS host core variants transform print simplify eval parser service embedded)
+set(VTSYM_LAYERS host core variants transform print simplify decide eval parser service embedded)
 
 set(VTSYM_FOLDER_host host)
 set(VTSYM_FOLDER_core base/core)
@@ -9,6 +9,7 @@ set(VTSYM_FOLDER_variants base/variants)
 set(VTSYM_FOLDER_transform base/transform)
 set(VTSYM_FOLDER_print base/print)
 set(VTSYM_FOLDER_simplify base/simplify)
+set(VTSYM_FOLDER_decide base/decide)
 set(VTSYM_FOLDER_eval base/eval)
 set(VTSYM_FOLDER_parser parser)
 set(VTSYM_FOLDER_service base/service)
@@ -20,9 +21,10 @@ set(VTSYM_ARROWS_variants host)
 set(VTSYM_ARROWS_transform core variants)
 set(VTSYM_ARROWS_print transform)
 set(VTSYM_ARROWS_simplify print)
-set(VTSYM_ARROWS_eval core)
+set(VTSYM_ARROWS_decide print)
+set(VTSYM_ARROWS_eval print)
 set(VTSYM_ARROWS_parser print)
-set(VTSYM_ARROWS_service parser simplify eval)
+set(VTSYM_ARROWS_service parser simplify decide eval)
 set(VTSYM_ARROWS_embedded host)
 
 # The two front doors stand in base/ itself.

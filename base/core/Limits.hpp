@@ -26,4 +26,29 @@ inline constexpr std::size_t textBytes = std::size_t{1} << 30U;
 /// ordered by their structure.
 inline constexpr std::size_t orderedTextBytes = std::size_t{1} << 16U;
 
+/// Elements of all vectors that one evaluation makes, and operations of a prepared expression.  Each node of a graph
+/// may make one more vector as long as the longest; beyond the bound evaluation throws std::length_error.
+inline constexpr std::size_t evaluatedElements = std::size_t{1} << 26U;
+
+/// Steps that one question about conditions may cost: edges of diagrams joined, bounds looked at, nodes evaluated.  At
+/// most about a quarter of a second and 100 MB; real conditions take tens to thousands, ten thousand choices of a set
+/// some hundred thousand.  Beyond the bound the question is undecided.
+inline constexpr std::uint64_t decisionSteps = std::uint64_t{1} << 21U;
+
+/// Edges of diagrams that are kept between questions, 16 bytes each.  When there are more, all are thrown away before
+/// the next question, which builds anew what it needs.
+inline constexpr std::size_t diagramEdges = std::size_t{1} << 22U;
+
+/// Cases of one arithmetic term that truth values take part in.  A term with more is an unknown of its own.
+inline constexpr std::size_t termCases = 64;
+
+/// Assignments tried to confirm a witness where arithmetic is not understood.  Beyond the bound the question is
+/// undecided.
+inline constexpr std::size_t confirmations = 8192;
+
+/// Changes tried, each with a proof, and nodes interned on the way, to shorten one condition by what is known.  Beyond
+/// either bound the shortest form found so far stands.
+inline constexpr std::size_t impliedTries = 1000;
+inline constexpr std::size_t impliedNodes = std::size_t{1} << 16U;
+
 } // namespace VT::limits

@@ -65,7 +65,8 @@ public:
 
     [[nodiscard]] SymbolicExprId getIdFALSE() const noexcept { return falseId_; }
 
-    /// Binds a value to an expression; a later binding replaces an earlier one.
+    /// Binds a value to an expression; a later binding replaces an earlier one.  What was simplified and kept before,
+    /// such as results in the caches of the condition service, does not see it.
     void registerValueId(SymbolicExprId exprId, SymbolicExprId valueId);
     void registerValueId(const std::string& name, SymbolicExprId valueId);
     void registerValue(const std::string& name, int value);

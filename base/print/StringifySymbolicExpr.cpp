@@ -69,10 +69,14 @@ private:
 
 // Results.
 
-std::string StringifySymbolicExpr::get() const {
+const StringifySymbolicExpr::Printed& StringifySymbolicExpr::top() const {
     if (stack_.empty())
         throwNoSuchExpression();
-    return texts_.str(stack_.back().text, textBound_);
+    return stack_.back();
+}
+
+std::string StringifySymbolicExpr::get() const {
+    return textOf(top());
 }
 
 /// Pushes an expression that was met before; whether it was.
@@ -106,7 +110,7 @@ StringifySymbolicExpr::Printed StringifySymbolicExpr::printed(SymbolicExprId id)
 }
 
 std::string StringifySymbolicExpr::print(SymbolicExprId id) {
-    return texts_.str(printed(id).text, textBound_);
+    return textOf(printed(id));
 }
 
 std::string StringifySymbolicExpr::print(const SymbolicExpr& node) {

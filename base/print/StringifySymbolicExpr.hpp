@@ -66,7 +66,7 @@ public:
     /// The printed form of an expression of the table.  Throws std::out_of_range where the table has none.
     Printed printed(SymbolicExprId id);
     /// Forgets the nodes met by print() and printed(), and their texts.
-    void forget();
+    virtual void forget();
 
     [[nodiscard]] const TextPool& texts() const noexcept {
         return texts_;
@@ -108,6 +108,21 @@ protected:
 
     void push(const SymbolicOp& op, std::string_view text, unsigned char precedence) {
         push({op, texts_.bytes(text), precedence});
+    }
+
+    /// The operand that was printed last.  Throws std::out_of_range where there is none.
+    [[nodiscard]] const Printed& top() const;
+
+    /// Takes it from the stack.
+    Printed pop() {
+        const Printed last = top();
+        stack_.pop_back();
+        return last;
+    }
+
+    /// The bytes of a printed expression.  Throws std::length_error for more than the bound.
+    [[nodiscard]] std::string textOf(const Printed& printed) const {
+        return texts_.str(printed.text, textBound_);
     }
 
     /// The text of an identifier, as the predicate gives it.

@@ -62,8 +62,9 @@ bool VCService::isEqual(const SymbolicExprId& a, const SymbolicExprId& b) {
         return true;
     if (parts_->customizer == nullptr || !has(a) || !has(b))
         return false;
-    const SymbolicExprId simplifiedA = simplify(rewritten(a), true).id();
-    return simplifiedA == simplify(rewritten(b), true).id();
+    const ParameterReplacements parameters = parts_->customizer->parameterReplacements();
+    const SymbolicExprId simplifiedA = simplify(replaceParameters(a, parameters), true).id();
+    return simplifiedA == simplify(replaceParameters(b, parameters), true).id();
 }
 
 std::string VCService::getParameterAlias(const std::string& parameter) const {

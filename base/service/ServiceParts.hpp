@@ -1,7 +1,9 @@
 // What a VCService is made of.
 #pragma once
 
+#include "base/decide/Decider.hpp"
 #include "base/print/ExpressionPrinter.hpp"
+#include "base/service/DecisionCache.hpp"
 #include "base/service/SimplifyCache.hpp"
 #include "base/simplify/Simplify.hpp"
 #include "base/simplify/VCCustomizer.hpp"
@@ -31,6 +33,11 @@ struct ServiceParts {
         return caches[isQuill ? 0 : 1];
     }
 
+    /// Whether the variant keywords are in force at this moment.
+    [[nodiscard]] bool keywordsInForce() const;
+    /// The decider for the keywords' present state.
+    Decider& decider();
+
     std::unique_ptr<VCCustomizer, CustomizerRelease> customizer;
     std::int32_t useCount = 0;
     SymbolicExprTable table;
@@ -45,7 +52,9 @@ struct ServiceParts {
     boost::unordered_map<std::string, std::string> parameterAliases;
     std::array<SimplifyCache<SymbolicExprId>, 2> simplified;      ///< by condition
     std::array<SimplifyCache<std::string>, 2> simplifiedFromText; ///< by text
-    bool caching;                                                 ///< the cache feature when the service was made
+    DecisionCache decisions;
+    std::array<std::unique_ptr<Decider>, 2> deciders; ///< by whether the keywords are in force
+    bool caching;                                     ///< the cache feature when the service was made
 };
 
 } // namespace VT

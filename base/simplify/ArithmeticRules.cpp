@@ -18,6 +18,9 @@ namespace VT {
 
 namespace {
 
+/// Evaluation takes a smaller real divisor for zero, so its quotient is no finite number.
+constexpr double leastDivisor = 0x1p-26;
+
 SymbolicExprId integerIfFits(RuleContext& context, std::int64_t value) {
     return fitsInt(value) ? context.make<SymbolicIntValue>(static_cast<int>(value)) : invalidId;
 }
@@ -56,7 +59,7 @@ SymbolicExprId foldNumbers(RuleContext& context, SymbolicOp op, SymbolicExprId a
     case SymbolicOp::Multiply:
         return realIfFinite(context, x * y);
     default:
-        return y != 0 ? realIfFinite(context, x / y) : invalidId;
+        return std::fabs(y) >= leastDivisor ? realIfFinite(context, x / y) : invalidId;
     }
 }
 
@@ -82,15 +85,18 @@ SymbolicExprId cancelledQuotient(RuleContext& context, const RuleOperands& x) {
     return invalidId;
 }
 
-/// x*1, 1*x, x*0 and 0*x.
+/// x*1 and 1*x.
 SymbolicExprId neutralFactor(RuleContext& context, const RuleOperands& x) {
-    const std::optional<int> a = context.integer(x.valueA);
-    const std::optional<int> b = context.integer(x.valueB);
-    if (a == 1 || b == 0)
+    if (context.integer(x.valueA) == 1)
         return x.b;
-    if (b == 1 || a == 0)
+    return context.integer(x.valueB) == 1 ? x.a : invalidId;
+}
+
+/// x*0 and 0*x with an integer zero.
+SymbolicExprId zeroFactor(RuleContext& context, const RuleOperands& x) {
+    if (context.integer(x.valueA) == 0)
         return x.a;
-    return invalidId;
+    return context.integer(x.valueB) == 0 ? x.b : invalidId;
 }
 
 /// c*(r + d) with integers c and d; what r is multiplied with is not distributed again.
@@ -136,6 +142,7 @@ constexpr NodeRule multiplyRules[] = {
     {{multiplyOnly, "folded product", "2*3", "6"}, foldedNumbers},
     {{multiplyOnly, "cancelled quotient", "N/M*M", "N"}, cancelledQuotient},
     {{multiplyOnly, "neutral factor", "1*N", "N"}, neutralFactor},
+    {{multiplyOnly, "zero factor", "N*0", "0"}, zeroFactor},
     {{multiplyOnly, "distributed factor", "2*(N + 3)", "2*N + 6"}, distributedFactor},
     {{multiplyOnly, "gathered factor", "2*(3*N)", "6*N"}, gatheredFactor},
     {{multiplyOnly, "reduced fraction", "4*(N/2)", "2*N"}, reducedFraction},
@@ -155,6 +162,34 @@ constexpr NodeRule divideRules[] = {
 
 // Sums.
 
+/// x+0, 0+x and x-0 with an integer zero.
+SymbolicExprId neutralTerm(RuleContext& context, const RuleOperands& x) {
+    if (context.integer(x.valueB) == 0)
+        return x.a;
+    return x.op == SymbolicOp::Plus && context.integer(x.valueA) == 0 ? x.b : invalidId;
+}
+
+constexpr OperatorSet sumOnly{SymbolicOp::Plus, SymbolicOp::Minus};
+constexpr NodeRule sumRules[] = {
+    {{sumOnly, "folded sum", "1.5 + 2.5", "4"}, foldedNumbers},
+    {{sumOnly, "neutral term", "N + 0", "N"}, neutralTerm},
+};
+
+/// -(-x)
+SymbolicExprId doubleMinus(RuleContext& context, const RuleOperands& x) {
+    const SymbolicExpr& operand = context.node(x.a);
+    return operand.op() == SymbolicOp::UnaryMinus ? static_cast<const SymbolicUnaryExpr&>(operand).operand()
+                                                  : invalidId;
+}
+
+constexpr NodeRule minusRules[] = {
+    {{{SymbolicOp::UnaryMinus}, "double minus", "-(-N)", "N"}, doubleMinus},
+};
+
+constexpr RuleInfo gatheredSum{sumOps, "gathered sum", "1 + N - 3", "N - 2"};
+constexpr RuleInfo collectedTerms{sumOps, "collected terms", "2*N + 3*N", "5*N"};
+constexpr RuleInfo cancelledTerms{sumOps, "cancelled terms", "N + 1 - N", "1"};
+
 /// A sum as integer multiples of terms, in the order in which they first occur, and a constant.
 class LinearSum {
 public:
@@ -162,6 +197,8 @@ public:
     bool read(const RuleContext& context, SymbolicExprId root);
     /// The sum, constant last; the invalid identifier where a multiple or the constant does not fit.
     SymbolicExprId write(RuleContext& context) const;
+    /// What reading the sum achieved, for explanations.
+    [[nodiscard]] const RuleInfo& rule() const;
 
 private:
     struct Term {
@@ -285,8 +322,12 @@ SymbolicExprId LinearSum::write(RuleContext& context) const {
     return context.makeBinary(subtract ? SymbolicOp::Minus : SymbolicOp::Plus, sum, literal);
 }
 
-constexpr RuleInfo foldedSum{sumOps, "folded sum", "1.5 + 2.5", "4"};
-constexpr RuleInfo gatheredSum{sumOps, "gathered sum", "1 + N + N - 3", "2*N - 2"};
+const RuleInfo& LinearSum::rule() const {
+    if (std::ranges::any_of(terms_, [](const Term& term) { return term.factor == 0; }))
+        return cancelledTerms;
+    const bool collected = std::ranges::any_of(terms_, [](const Term& term) { return term.asWritten == invalidId; });
+    return collected ? collectedTerms : gatheredSum;
+}
 
 } // namespace
 
@@ -303,15 +344,14 @@ SymbolicExprId simplifyDivide(RuleContext& context, SymbolicExprId a, SymbolicEx
 }
 
 SymbolicExprId foldSum(RuleContext& context, SymbolicExprId root) {
-    if (!context.node(root).isBinaryExpr())
-        return root;
-    const auto& node = static_cast<const SymbolicBinaryExpr&>(context.node(root));
+    const SymbolicExpr& node = context.node(root);
+    const bool isBinary = node.isBinaryExpr();
+    const SymbolicExprId a = node.getInput(0);
+    const SymbolicExprId b = isBinary ? node.getInput(1) : invalidId;
+    const RuleOperands operands{node.op(), a, b, context.resolve(a), isBinary ? context.resolve(b) : invalidId};
     const SymbolicExprId folded =
-        foldNumbers(context, node.op(), context.resolve(node.left()), context.resolve(node.right()));
-    if (folded == invalidId)
-        return root;
-    context.fired(foldedSum, root, folded);
-    return folded;
+        isBinary ? applyFirst(sumRules, context, operands) : applyFirst(minusRules, context, operands);
+    return folded != invalidId ? folded : root;
 }
 
 SymbolicExprId simplifySum(RuleContext& context, SymbolicExprId root) {
@@ -319,16 +359,18 @@ SymbolicExprId simplifySum(RuleContext& context, SymbolicExprId root) {
     if (!sumOps.contains(context.op(folded)))
         return folded;
     LinearSum sum;
-    const SymbolicExprId gathered = sum.read(context, root) ? sum.write(context) : invalidId;
+    const SymbolicExprId gathered = sum.read(context, folded) ? sum.write(context) : invalidId;
     if (gathered == invalidId)
-        return root;
-    context.fired(gatheredSum, root, gathered);
+        return folded;
+    context.fired(sum.rule(), folded, gathered);
     return gathered;
 }
 
 void appendArithmeticRules(std::vector<const RuleInfo*>& out) {
-    out.push_back(&foldedSum);
-    out.push_back(&gatheredSum);
+    appendInfo<NodeRule>(sumRules, out);
+    appendInfo<NodeRule>(minusRules, out);
+    for (const RuleInfo* rule : {&gatheredSum, &collectedTerms, &cancelledTerms})
+        out.push_back(rule);
     appendInfo<NodeRule>(multiplyRules, out);
     appendInfo<NodeRule>(divideRules, out);
 }

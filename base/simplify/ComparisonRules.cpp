@@ -13,8 +13,9 @@ SymbolicExprId applyFirst(std::span<const NodeRule> rules, RuleContext& context,
         if (after == invalidId)
             continue;
         if (context.explaining()) {
-            const SymbolicExprId before = operands.b == invalidId
-                                              ? context.make<SymbolicNotExpr>(operands.a)
+            const SymbolicExprId before = operands.op == SymbolicOp::Not ? context.make<SymbolicNotExpr>(operands.a)
+                                          : operands.op == SymbolicOp::UnaryMinus
+                                              ? context.make<SymbolicUnaryMinusExpr>(operands.a)
                                               : context.makeBinary(operands.op, operands.a, operands.b);
             context.fired(rule.info, before, after);
         }

@@ -4,8 +4,13 @@
 #include "base/core/Table.hpp"
 
 #include <string>
+#include <unordered_map>
+#include <variant>
 
 namespace VT {
+
+/// What stands for parameters while conditions are compared: another parameter's name or a value.
+using ParameterReplacements = std::unordered_map<std::string, std::variant<std::string, int>>;
 
 /// A host's say in simplification.  Exceptions of the operations pass to whoever asked for the simplification, and
 /// nothing of its result is kept.
@@ -21,6 +26,10 @@ public:
     virtual SymbolicExprId rewrite(SymbolicExprId condition, SymbolicExprTable& table) = 0;
     /// Whether a simplification may put one expression in the place of another; both as Quill text.
     virtual bool canReplaceCondition(const std::string& condition, const std::string& replacement) = 0;
+
+    /// What to put in the place of parameters before two conditions are compared, all at once; nothing unless
+    /// overridden.  Names that the conditions have not are ignored.
+    virtual ParameterReplacements parameterReplacements() { return {}; }
 
 protected:
     VCCustomizer() = default;

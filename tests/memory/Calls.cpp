@@ -1,6 +1,7 @@
 // Memory runs out at every allocation of whole calls: the error passes, nothing leaks or breaks, the next call is
 // right.
 #include "base/print/ExpressionPrinter.hpp"
+#include "base/service/SymbolRegistry.hpp"
 #include "base/simplify/Simplify.hpp"
 #include "base/transform/QuillConversion.hpp"
 #include "host/QuillParser.hpp"
@@ -58,7 +59,13 @@ std::string work() {
     const VCSymbolicExprId condition =
         service.simplifyFromCCondition("(A == 1 || A == 2) && B == 3 && !(C < 4) && f(A, B) / 2 + 3 * x.y != 1");
     const VCSymbolicExprId both = service.AND(condition, service.NOT(service.parseC("B == 4"), true), true);
-    return service.printQExprWithConversion(both).empty() ? "" : service.printCExpr(condition);
+    const VCSymbolicExprId quill = service.parseQ(service.printQExprWithConversion(condition));
+    const SymbolicExprId dimension = service.parseQ("[N*2.5, max(M', 3)]");
+    SymbolRegistry registry(service.table());
+    const std::string name = registry.registerExpression(nullptr, dimension);
+    if (service.printQExprWithConversion(both).empty() || registry.registeredBy(nullptr).front() != name)
+        return "";
+    return service.printCExpr(quill);
 }
 
 TEST(MemoryRunsOut, WhileTheServiceWorks) {

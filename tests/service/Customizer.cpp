@@ -3,6 +3,8 @@
 #include "base/simplify/SimplifyVisitorBlockVariants.hpp"
 #include "tests/service/Customizers.hpp"
 
+#include <tuple>
+
 #include <stdexcept>
 
 namespace VT::Testing {
@@ -169,6 +171,25 @@ TEST(Customizer, VisitorWithNobodyToAskAnswersTheOtherWayRound) {
     EXPECT_EQ(simplified("P==P", false, nullptr), "");
     EXPECT_EQ(simplified("P==P", true, &agreeing), "");
     EXPECT_EQ(simplified("P<P || P>2 && P>3", true, &agreeing), "P>3");
+}
+
+TEST(Customizer, ReplacesParametersToCompare) {
+    TestCustomizer customizer;
+    customizer.parameters = {{"P", "Q"}, {"Q", "P"}, {"N", 3}, {"true", "Q"}};
+    const FreshService service;
+    service->setVCCustomizer(&customizer);
+    const std::vector<std::tuple<const char*, const char*, bool>> cases{
+        {"P==1", "Q==1", false},      {"P", "P && P", true},        {"P==N", "P==3", true},
+        {"P>N", "!(P<=3)", true},     {"f(N)==Q", "f(3)==Q", true}, {"N==3", "true", true},
+        {"N==4", "false", true},      {"true", "Q", false},         {"N", "3", true},
+        {"f(N)==Q", "f(3)==P", false}};
+    for (const auto& [a, b, equal] : cases) {
+        EXPECT_EQ(service->isEqual(service->parseC(a), service->parseC(b)), equal) << a << ", " << b;
+        EXPECT_EQ(VCSymbolicExprId(service->parseC(b)) == VCSymbolicExprId(service->parseC(a)), equal)
+            << a << ", " << b;
+    }
+    service->setVCCustomizer(nullptr);
+    EXPECT_FALSE(service->isEqual(service->parseC("P==N"), service->parseC("P==3")));
 }
 
 } // namespace

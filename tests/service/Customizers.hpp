@@ -55,6 +55,9 @@ public:
         return agrees;
     }
 
+    ParameterReplacements parameterReplacements() override { return parameters; }
+
+    ParameterReplacements parameters;
     std::function<void()> onRelease;
     std::function<SymbolicExprId(SymbolicExprId, SymbolicExprTable&)> onRewrite;
     bool agrees = true;

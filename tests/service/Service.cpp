@@ -198,10 +198,7 @@ TEST(ServiceIds, ThatAreNotOfTheTableAreAnswered) {
 TEST(ServiceIds, CompareByMeaningOrAsNumbers) {
     TestCustomizer customizer; // outlives the service
     const FreshService service;
-    customizer.onRewrite = [](SymbolicExprId condition, SymbolicExprTable& table) { // the parameter N is 1
-        return condition == SymbolicString(table, "N").getId(table) ? SymbolicIntValue(table, 1).getId(table)
-                                                                    : condition;
-    };
+    customizer.parameters = {{"N", 1}};
     const VCSymbolicExprId n = service->parseC("N");
     const VCSymbolicExprId one = service->parseC("1");
     const VCSymbolicExprId alwaysTrue = service->parseC("true");

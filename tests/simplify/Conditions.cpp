@@ -72,7 +72,8 @@ INSTANTIATE_TEST_SUITE_P(Arithmetic, Condition,
                                            Case{"1.5*2", "3.0"}, Case{"1.0/0", "1.0/0"}, Case{"N*0", "0"},
                                            Case{"3*(N-2)", "3*N-6"}, Case{"N+0.5+0.5", "N+0.5+0.5"},
                                            Case{"0.5+0.5+N", "1.0+N"}, Case{"4*(N/3)", "4*(N/3)"},
-                                           Case{"-2*N+M", "-2*N+M"}, Case{"M-2*N", "M-2*N"}));
+                                           Case{"-2*N+M", "-2*N+M"}, Case{"M-2*N", "M-2*N"}, Case{"0+N+0.5-0", "N+0.5"},
+                                           Case{"-(-(N+0.5))", "N+0.5"}, Case{"1.0/1.0e-9", "1.0/1.0e-09"}));
 
 TEST(Keywords, ObeyTheFeatureAndTheOwnersFlag) {
     for (const bool feature : {true, false}) {

@@ -46,6 +46,69 @@ RC_GTEST_PROP(Simplify, DoesNotDependOnWhatWasInternedBefore, ()) {
     RC_ASSERT(fresh.simplified(text) == used.simplified(text));
 }
 
+/// A sum or product worth `value` where each name is worth its first letter's.
+struct Arithmetic {
+    std::string text;
+    std::uint32_t value;
+};
+
+Arithmetic arithmetic(std::mt19937_64& random, int depth, const std::vector<std::uint32_t>& letters) {
+    static const std::vector<std::int64_t> literals{0, 1, 1, 2, -3, 2147483647, -2147483648, 1073741824, 65536};
+    if (depth == 0 || random() % 5 == 0) {
+        const std::size_t pick = random() % 6;
+        if (pick < letters.size())
+            return {std::string(1, static_cast<char>('A' + pick)), letters[pick]};
+        const std::int64_t literal = literals[random() % literals.size()];
+        return {std::to_string(literal), static_cast<std::uint32_t>(literal)};
+    }
+    const Arithmetic a = arithmetic(random, depth - 1, letters);
+    if (random() % 6 == 0)
+        return {"-(" + a.text + ")", 0U - a.value};
+    const Arithmetic b = arithmetic(random, depth - 1, letters);
+    switch (random() % 4) {
+    case 0:
+        return {"(" + a.text + ")*(" + b.text + ")", a.value * b.value};
+    case 1:
+        return {"(" + a.text + ") - (" + b.text + ")", a.value - b.value};
+    default:
+        return {"(" + a.text + ") + (" + b.text + ")", a.value + b.value};
+    }
+}
+
+/// The value of a simplified one, computed modulo 2^32.
+std::uint32_t wrapped(const SymbolicExprTable& table, SymbolicExprId id, const std::vector<std::uint32_t>& letters) {
+    const SymbolicExpr& node = *table.get(id);
+    const auto in = [&](std::size_t i) { return wrapped(table, node.getInput(i), letters); };
+    switch (node.op()) {
+    case SymbolicOp::String:
+        return letters.at(static_cast<std::size_t>(static_cast<const SymbolicString&>(node).getName().at(0) - 'A'));
+    case SymbolicOp::IntValue:
+        return static_cast<std::uint32_t>(static_cast<const SymbolicIntValue&>(node).getValue());
+    case SymbolicOp::Plus:
+        return in(0) + in(1);
+    case SymbolicOp::Minus:
+        return in(0) - in(1);
+    case SymbolicOp::UnaryMinus:
+        return 0U - in(0);
+    default:
+        EXPECT_EQ(node.op(), SymbolicOp::Multiply);
+        return in(0) * in(1);
+    }
+}
+
+TEST(Simplify, SumsAndProductsKeepTheirWrappedValue) {
+    std::mt19937_64 random(17);
+    for (int i = 0; i < 4000; ++i) {
+        const std::vector<std::uint32_t> letters{static_cast<std::uint32_t>(random()), static_cast<std::uint32_t>(i),
+                                                 3};
+        const Arithmetic before = arithmetic(random, 1 + i % 5, letters);
+        Workbench bench;
+        const SymbolicExprId after = bench.simplify(bench.parse(before.text));
+        ASSERT_EQ(wrapped(bench.table, after, letters), before.value) << before.text;
+        ASSERT_EQ(bench.simplify(after), after) << before.text;
+    }
+}
+
 // What share of conditions over single symbols becomes the constant it is worth, and how long results are, stays as
 // good as it is.
 TEST(Simplify, FindsConstantsAndShortSums) {

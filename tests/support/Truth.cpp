@@ -1,11 +1,18 @@
 #include "tests/support/Truth.hpp"
 
+#include "base/print/ExpressionPrinter.hpp"
+
 #include <set>
 #include <stdexcept>
 
 namespace VT::Testing {
 
 namespace {
+
+/// Calls and members have a value of their own, whatever their operands.
+bool standsForItself(const SymbolicExprTable& table, SymbolicExprId id) {
+    return callOps.contains(table.get(id)->op()) || table.get(id)->op() == SymbolicOp::MemberValue;
+}
 
 /// The nodes below and including a root; operands have smaller identifiers than their node.
 std::set<SymbolicExprId> reachable(const SymbolicExprTable& table, SymbolicExprId root) {
@@ -14,7 +21,7 @@ std::set<SymbolicExprId> reachable(const SymbolicExprTable& table, SymbolicExprI
     while (!pending.empty()) {
         const SymbolicExprId id = pending.back();
         pending.pop_back();
-        if (!nodes.insert(id).second)
+        if (!nodes.insert(id).second || standsForItself(table, id))
             continue;
         for (std::size_t i = 0; i < table.get(id)->getNumInputs(); ++i)
             pending.push_back(table.get(id)->getInput(i));
@@ -35,6 +42,10 @@ std::int64_t valueOf(const SymbolicExprTable& table, SymbolicExprId root, const 
     std::map<SymbolicExprId, std::int64_t> values;
     for (const SymbolicExprId id : reachable(table, root)) {
         const SymbolicExpr& node = *table.get(id);
+        if (standsForItself(table, id)) {
+            values[id] = lookUp(SymbolicExprPrinter(table, false)(id), assignment);
+            continue;
+        }
         const auto in = [&](std::size_t i) { return values.at(node.getInput(i)); };
         values[id] = [&]() -> std::int64_t {
             switch (node.op()) {
@@ -70,6 +81,22 @@ std::int64_t valueOf(const SymbolicExprTable& table, SymbolicExprId root, const 
                 return in(0) != 0 || in(1) != 0;
             case SymbolicOp::Not:
                 return in(0) == 0;
+            case SymbolicOp::Divide:
+                return in(1) == 0 ? throw NoValue() : in(0) / in(1);
+            case SymbolicOp::Modulo:
+                return in(1) == 0 ? throw NoValue() : in(0) % in(1);
+            case SymbolicOp::BitAnd:
+                return in(0) & in(1);
+            case SymbolicOp::BitOr:
+                return in(0) | in(1);
+            case SymbolicOp::BitXOr:
+                return in(0) ^ in(1);
+            case SymbolicOp::BitCompl:
+                return ~in(0);
+            case SymbolicOp::ShiftRight:
+                return in(0) >> in(1);
+            case SymbolicOp::ShiftLeft:
+                return in(0) * (std::int64_t{1} << in(1));
             default:
                 throw std::logic_error("no brute-force value of " + std::string(operatorInfo(node.op()).className));
             }

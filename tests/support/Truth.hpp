@@ -4,6 +4,7 @@
 #include "base/VTSymbolicExpr.hpp"
 
 #include <cstdint>
+#include <exception>
 #include <functional>
 #include <map>
 #include <string>
@@ -11,10 +12,13 @@
 
 namespace VT::Testing {
 
+/// A quotient by zero.
+struct NoValue : std::exception {};
+
 using Assignment = std::map<std::string, std::int64_t>;
 
-/// The value of an expression of integers, truth values and + - * over them, computed from the meaning of each operator
-/// without any rule of the library.  Calls and members are worth what the assignment says of their name.
+/// The value of an expression of integers, truth values and C's arithmetic over them, computed from the meaning of each
+/// operator without any rule of the library.  Calls and members are worth what the assignment says of their text.
 std::int64_t valueOf(const SymbolicExprTable& table, SymbolicExprId id, const Assignment& assignment);
 
 inline bool holds(const SymbolicExprTable& table, SymbolicExprId id, const Assignment& assignment) {

@@ -83,9 +83,10 @@ TEST(Program, ListsAndReplacesSymbols) {
 
 TEST(Program, KeepsASession) {
     const std::string dialogue = "A>2 && A<4\nans || A>3\n:let N=A+1\n:let A=2\nN*2==6\n:quill\nB ~= A\n:c\n"
-                                 ":tree A+1\n:explain 1 && B\n:symbols\n  \n";
+                                 ":tree A+1\n:explain 1 && B\n:symbols\n:pp !A.b || B && 2.5 < C\n";
     const std::string answers = "A==3\nA>=3\nN = A+1\nA = 2\n(A+1)*2==6\n(A+1)*2==6\nB~=2\nB!=2\n"
-                                "Plus +\n├─ 2\n└─ 1\n1 && B\npass 1\n  number in And  1 && B  =>  B\n= B\nB\n\n";
+                                "Plus +\n├─ 2\n└─ 1\n1 && B\npass 1\n  number in And  1 && B  =>  B\n= B\nB\n"
+                                "!A_b || (B && 2.5 < C)\nwarning: a preprocessor has no real constants: 2.5\n";
     expectRows({
         {{"repl"}, dialogue, answers, {}, 0},
         {{"repl", "--from", "quill"}, "A ~= 1\n:quit\nB\n", "A~=1\n\n\n", {}, 0},
@@ -127,6 +128,49 @@ TEST(Program, AnswersEachLineByOneLine) {
     });
 }
 
+TEST(Program, Evaluates) {
+    expectRows({
+        {{"eval", "-D", "N=M + 1", "-D", "M=4", "N*2+1", "[N, N*0.5, N > 4]", "[1]", "N / 0.0", "inf"},
+         "",
+         "11\n[5,2.5,true]\n[1]\nInfinity\n\n",
+         {"line 5: \"inf\" has no value"},
+         1},
+        {{"eval", "--from", "quill", "-D", "s.gear=rem(7, 4)", "s.gear ~= 3", "bitshift(s.gear, 2)"},
+         "",
+         "false\n12\n",
+         {},
+         0},
+        {{"eval", "-D", "N=1", "-D", "N=2", "-D", "A=B", "-D", "B=A"},
+         "N\nA + 1\ns.x\n[1,2] + [1,2,3]\n\n",
+         "2\n\n\n\ntrue\n",
+         {"line 2: The value of \"A\" depends on itself", "line 3: \"s.x\" cannot be evaluated",
+          "line 4: \"[1,2]+[1,2,3]\" combines a list of 2 with a list of 3"},
+         1},
+        {{"eval", "--json", "-D", "N=3"},
+         "N\nN == 3\nN * .5\n0/0.0\n-1/0.0\n1/0.0 - 1/0.0\n[N, 1/0.0, !N]\nx\n",
+         R"json({"line":1,"input":"N","type":"int","value":3}
+{"line":2,"input":"N == 3","type":"bool","value":true}
+{"line":3,"input":"N * .5","type":"double","value":1.5}
+{"line":4,"input":"0/0.0","type":"double","value":"Infinity"}
+{"line":5,"input":"-1/0.0","type":"double","value":"-Infinity"}
+{"line":6,"input":"1/0.0 - 1/0.0","type":"double","value":"NaN"}
+{"line":7,"input":"[N, 1/0.0, !N]","type":"vector","value":[3,"Infinity",false]}
+{"line":8,"input":"x","error":{"id":"Vantor:SymbolicDims:UnboundSymbol","message":"\"x\" has no value: give it one."}}
+)json",
+         {},
+         1},
+    });
+    // Definitions outlive what makes the program start anew.
+    std::string input;
+    std::string output;
+    for (int i = 0; i < 60'000; ++i) {
+        input += "N + x" + std::to_string(i) + " * 0 * (" + std::to_string(i) + " - y" + std::to_string(i) + ")\n";
+        output += "\n";
+    }
+    const ProgramResult result = runProgram({{"eval", "-D", "N=3"}, input + "N\n", {}, {}});
+    EXPECT_EQ(result.output, output + "3\n");
+}
+
 TEST(Program, ExplainsSimplification) {
     expectRows({
         {{"simplify", "--explain", "!(A < 3) || A == 2", "A"},
@@ -141,6 +185,51 @@ TEST(Program, ExplainsSimplification) {
          "\"true operand of And\",\"before\":\"A && true\",\"after\":\"A\"}]}\n",
          {},
          0},
+    });
+}
+
+TEST(Program, WritesConditionsOfDirectives) {
+    expectRows({
+        {{"pp", "true && Mode == 1", "A || B.x && C", "true"}, "", "1 && Mode == 1\nA || (B_x && C)\n1\n", {}, 0},
+        {{"pp", "--given", "A == 1 && B"}, "A == 1 && C\nA != 1 || D\nB\n", "C\nD\n1\n", {}, 0},
+        {{"pp", "--from", "quill", "--given", "rem(A,2)", "--json", "rem(A,2) & B == 1 && ~B"},
+         "",
+         "{\"line\":1,\"input\":\"rem(A,2) & B == 1 && ~B\",\"result\":\"(A % 2 & B == 1) && !B\"}\n",
+         {"line 1: warning: C reads the element-wise logical and"},
+         0},
+        {{"pp", "--given", "A = 1", "A"}, "", "", {"vtsym: --given: ", "  A = 1\n    ^"}, 1},
+        {{"convert", "--to", "pp", "a b", "A.B_C == A_B.C && x > .5"},
+         "",
+         "\nA_B_C == A_B_C && x > 0.5\n",
+         {"line 1: ", "line 2: warning: A_B.C and A.B_C are both written A_B_C",
+          "line 2: warning: a preprocessor has no real constants: 0.5"},
+         1},
+        {{"simplify", "--to", "pp", "A>1||A<=1", "!(A.B<3)&&C||0"}, "", "1\nA_B >= 3 && C\n", {}, 0},
+        {{"convert", "--from", "quill", "--to", "c", "x.^2 > 1"}, "", "x.^2>1\n", {"C has no element-wise power"}, 0},
+        {{"convert", "--from", "quill", "x.^2 > 1"}, "", "x.^2>1\n", {}, 0},
+    });
+}
+
+TEST(Program, WorksOnDimensions) {
+    expectRows({
+        {{"dims", "N*2.0 + N/3 + 1.4", "2*3", "s.x"},
+         "",
+         "cast        N*2+N/3+1\nsimplified  N*2+N/3+1\nfactored    (N*2*3+N+1*3)/3\nsymbols     N\n\n"
+         "cast        2*3\nsimplified  6\nfactored    6\nvalue       6\n\n"
+         "cast        s.x\nsimplified  s.x\nfactored    s.x\nsymbols     s.x\n",
+         {},
+         0},
+        {{"dims", "-D", "N=6", "-D", "M=N - 1", "--json"},
+         "[N/2 + M/3, 4]\nN + K\nN +\n",
+         R"json({"line":1,"input":"[N/2 + M/3, 4]","cast":"[N/2+M/3,4]","simplified":"[N/2+M/3,4]","factored":"[(N*3+M*2)/(2*3),4]","symbols":["N","M"],"type":"vector","value":[4,4]}
+{"line":2,"input":"N + K","cast":"N+K","simplified":"N+K","factored":"N+K","symbols":["N","K"]}
+{"line":3,"input":"N +","error":{"id":"Vantor:SymbolicDims:InvalidExpression","message":"The expression \"N +\" cannot be read at its end: correct it there. The text ends where a value must follow.","offset":3}}
+)json",
+         {},
+         1},
+        {{"dims", "N^2"}, "", "\n", {"line 1: ", "power"}, 1},
+        {{"dims", "-D", "N", "N"}, "", "", {"-D: 'N' is not NAME=VALUE"}, 2},
+        {{"dims", "-D", "3=N", "N"}, "", "", {"'3' is no name"}, 2},
     });
 }
 
@@ -215,16 +304,25 @@ TEST(Program, RefusesWrongUsageWithAHint) {
         {{"frobnicate"}, "", "", {"there is no command 'frobnicate'\n"}, 2},
         {{"simplify", "-x"}, "", "", {"there is no option '-x'", "goes behind --", "Try 'vtsym simplify --help'"}, 2},
         {{"operators", "x"}, "", "", {"'x' is one argument too many", "Try 'vtsym operators --help'"}, 2},
-        {{"convert", "--to", "basic", "a"}, "", "", {"--to: 'basic' is not offered; c or quill is"}, 2},
+        {{"convert", "--to", "basic", "a"}, "", "", {"--to: 'basic' is not offered; c, quill or pp is"}, 2},
         {{"simplify", "--from", "pascal", "a"}, "", "", {"--from: 'pascal' is not offered; c or quill is"}, 2},
         {{"tree", "--json", "--dot", "a"}, "", "", {"--json", "--dot"}, 2},
+        {{"eval", "-D", "N"}, "", "", {"'N' is not NAME=VALUE", "Try 'vtsym eval --help'"}, 2},
+        {{"eval", "-D", "=1"}, "", "", {"'=1' is not NAME=VALUE"}, 2},
+        {{"eval", "-D", "N="}, "", "", {"'N=' gives no value"}, 2},
+        {{"eval", "-D", "N=1+"}, "", "", {"the value of N cannot be read: The condition \"1+\""}, 2},
+        {{"eval", "-D", "N+1=2"}, "", "", {"'N+1' is no name that can be given a value"}, 2},
+        {{"eval", "-D", "true=1"}, "", "", {"'true' is no name that can be given a value"}, 2},
+        {{"eval", "-D", "a b=1"}, "", "", {"the name 'a b' cannot be read"}, 2},
+        {{"operators", "[1]"}, "", "", {"'[1]' is one argument too many\n"}, 2},
         {{"simplify", "--feature", "Nope=1", "a"}, "", "", {"there is no feature flag \"Nope\""}, 2},
         {{"simplify", "--feature", "VariantKeywordsSimCodegen=x", "a"}, "", "", {"--feature: "}, 2},
     });
 }
 
 TEST(Program, HelpsOnRequest) {
-    for (const char* command : {"", "simplify", "convert", "tree", "symbols", "replace", "repl", "operators"}) {
+    for (const char* command :
+         {"", "simplify", "convert", "pp", "tree", "eval", "dims", "symbols", "replace", "repl", "operators"}) {
         SCOPED_TRACE(command);
         std::vector<std::string> asked{command, "--help"};
         std::vector<std::string> helped{"help", command};

@@ -25,6 +25,9 @@ Command addTree(CLI::App& program);
 Command addSymbols(CLI::App& program);
 Command addReplace(CLI::App& program);
 Command addRepl(CLI::App& program);
+Command addPreprocess(CLI::App& program);
+Command addEval(CLI::App& program);
+Command addDims(CLI::App& program);
 Command addOperators(CLI::App& program);
 
 } // namespace vtsym

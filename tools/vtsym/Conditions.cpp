@@ -1,6 +1,9 @@
 #include "tools/vtsym/Conditions.hpp"
 
 #include "base/core/Table.hpp"
+#include "base/print/PreprocessorVCExpr.hpp"
+#include "base/transform/QuillConversion.hpp"
+#include "tools/vtsym/Warnings.hpp"
 
 #include <unordered_set>
 
@@ -21,13 +24,14 @@ std::string visible(std::string text) {
 
 } // namespace
 
-void Conditions::makeRoomFor(const std::string& text) {
+bool Conditions::makeRoomFor(const std::string& text) {
     textBytes_ += text.size() + cacheEntryBytes;
     if (service().table().size() < fullTable && textBytes_ < fullTexts)
-        return;
+        return false;
     handle_.reset();
     handle_.emplace();
     textBytes_ = 0;
+    return true;
 }
 
 VT::SymbolicExprId Conditions::parse(const TextOptions& options, const std::string& text) const {
@@ -50,10 +54,22 @@ std::vector<std::string> Conditions::symbols(VT::SymbolicExprId condition, const
 }
 
 std::string Conditions::print(const TextOptions& options, VT::SymbolicExprId condition) const {
+    if (options.toDirective()) {
+        VT::SymbolicExprTable& table = service().table();
+        return VT::PreprocessorVCExpr(table, false, true).print(VT::SymbolicExprQ2C(table)(condition));
+    }
     if (!options.toQuill())
         return visible(service().printCExpr(condition));
     return visible(options.fromQuill() ? service().printQExpr(condition)
                                        : service().printQExprWithConversion(condition));
+}
+
+std::vector<std::string> Conditions::warnings(const TextOptions& options, VT::SymbolicExprId condition) const {
+    if (options.toQuill())
+        return {};
+    VT::SymbolicExprTable& table = service().table();
+    return warningsOf(table, VT::SymbolicExprQ2C(table)(condition),
+                      options.toDirective() ? VT::CTextUse::Directive : VT::CTextUse::Program);
 }
 
 std::string Conditions::printAsItStands(VT::SymbolicExprId condition, bool quill) const {

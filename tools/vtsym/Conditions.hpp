@@ -19,8 +19,8 @@ public:
 
     [[nodiscard]] VT::VCService& service() const { return **handle_; }
 
-    /// To be called before the service is given a text.
-    void makeRoomFor(const std::string& text);
+    /// To be called before the service is given a text.  True where the service was renewed.
+    bool makeRoomFor(const std::string& text);
 
     /// The condition of a text in the language of the options, as it stands or simplified.
     [[nodiscard]] VT::SymbolicExprId parse(const TextOptions& options, const std::string& text) const;
@@ -28,9 +28,11 @@ public:
     /// The symbols of a condition as Quill writes them, each once; the truth constants are none.
     [[nodiscard]] std::vector<std::string> symbols(VT::SymbolicExprId condition, const VT::VCSymbolTypes& kinds) const;
     /// The text of a condition in the shape of the language that the options ask for.  Unlike the service it writes
-    /// `true` for TRUE, so that no answer is invisible.
+    /// `true` for TRUE, 1 in a directive, so that no answer is invisible.
     [[nodiscard]] std::string print(const TextOptions& options, VT::SymbolicExprId condition) const;
-    /// The same without a change of shape.
+    /// What C or a preprocessor would decide differently, where the options ask for the one or the other.
+    [[nodiscard]] std::vector<std::string> warnings(const TextOptions& options, VT::SymbolicExprId condition) const;
+    /// The same as print() without a change of shape.
     [[nodiscard]] std::string printAsItStands(VT::SymbolicExprId condition, bool quill) const;
 
 private:

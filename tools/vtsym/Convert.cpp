@@ -13,6 +13,7 @@ constexpr const char* examples = R"(Operators that a language does not have beco
 Examples:
   vtsym convert --to quill '(F & 4) != 0 && a % b == 1'
   vtsym convert 'Mode==1&&!(Gear>2)'
+  vtsym convert --to pp 'Mode==1 || s.gear>2 && true'
   vtsym convert --to quill < conditions.txt)";
 
 } // namespace
@@ -25,15 +26,18 @@ Command addConvert(CLI::App& program) {
     command->footer(examples);
     return {command, [options](Console& console) {
                 Conditions conditions;
+                std::vector<std::string> warnings;
                 const auto answer = [&](const std::string& text, std::string& out) {
                     conditions.makeRoomFor(text);
-                    const std::string result = conditions.print(*options, conditions.parse(*options, text));
+                    const VT::SymbolicExprId condition = conditions.parse(*options, text);
+                    const std::string result = conditions.print(*options, condition);
+                    warnings = conditions.warnings(*options, condition);
                     if (options->json)
                         appendMember(out, "result", jsonString(result));
                     else
                         out.append(result);
                 };
-                return answerTexts(*options, console, {answer});
+                return answerTexts(*options, console, {answer, false, &warnings});
             }};
 }
 

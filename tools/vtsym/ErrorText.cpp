@@ -74,6 +74,10 @@ std::string errorLines(std::uint64_t line, std::string_view text, const TextErro
     return style.strong("line " + std::to_string(line) + ":") + " " + errorText(text, error, style);
 }
 
+std::string warningLine(std::uint64_t line, std::string_view warning, const Style& style) {
+    return style.strong("line " + std::to_string(line) + ":").append(" warning: ").append(warning).append("\n");
+}
+
 std::string jsonOf(const TextError& error) {
     std::string json = "{\"id\":" + jsonString(error.id);
     appendMember(json, "message", jsonString(error.message));

@@ -50,6 +50,9 @@ std::string withCaret(std::string_view text, std::size_t offset, const Style& st
 std::string errorText(std::string_view text, const TextError& error, const Style& style);
 std::string errorLines(std::uint64_t line, std::string_view text, const TextError& error, const Style& style);
 
+/// The line for standard error that warns of a text.
+std::string warningLine(std::uint64_t line, std::string_view warning, const Style& style);
+
 /// The member of a JSON answer.
 std::string jsonOf(const TextError& error);
 

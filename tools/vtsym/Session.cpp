@@ -36,6 +36,8 @@ const Session::CommandRow Session::commands[] = {
      [](Session& session, std::string_view text, std::string& out) { session.showIn("quill", text, out); }},
     {":c", "[TEXT]", "show as C; without TEXT read and write C from now on",
      [](Session& session, std::string_view text, std::string& out) { session.showIn("c", text, out); }},
+    {":pp", "[TEXT]", "show as the condition of a preprocessor directive",
+     [](Session& session, std::string_view text, std::string& out) { session.showDirective(text, out); }},
     {":tree", "[TEXT]", "draw as a tree",
      [](Session& session, std::string_view text, std::string& out) { session.showTree(text, out); }},
     {":explain", "[TEXT]", "show the rules that simplify it",
@@ -130,6 +132,15 @@ void Session::showIn(const char* language, std::string_view text, std::string& o
     if (result_)
         out.append(style_.good(conditions_.print(options, *result_)));
     options_.from = options_.to = language;
+}
+
+void Session::showDirective(std::string_view text, std::string& out) {
+    TextOptions options = options_;
+    options.to = "pp";
+    const VT::SymbolicExprId condition = subject(text);
+    out.append(style_.good(conditions_.print(options, condition)));
+    for (const std::string& warning : conditions_.warnings(options, condition))
+        out.append("\nwarning: ").append(warning);
 }
 
 void Session::showTree(std::string_view text, std::string& out) {

@@ -42,6 +42,7 @@ private:
     void bind(const std::string& name, VT::SymbolicExprId value);
 
     void showIn(const char* language, std::string_view text, std::string& out);
+    void showDirective(std::string_view text, std::string& out);
     void showTree(std::string_view text, std::string& out);
     void explain(std::string_view text, std::string& out);
     void listSymbols(std::string_view text, std::string& out);

@@ -22,18 +22,47 @@ struct SimplifyOptions : TextOptions {
     bool explain = false;
 };
 
-/// Simplifies past the service's caches, which know results only.
-void answerInDetail(const SimplifyOptions& options, const Style& style, const Conditions& conditions,
-                    const std::string& text, std::string& out) {
-    const Explanation explanation(conditions, options, conditions.parse(options, text), options.explain);
-    if (!options.json) {
-        explanation.appendText(style, out);
-        return;
+class Simplifier {
+public:
+    Simplifier(const SimplifyOptions& options, const Style& style) : options_(options), style_(style) {}
+
+    void answer(const std::string& text, std::string& out);
+
+    [[nodiscard]] const std::vector<std::string>& warnings() const noexcept { return warnings_; }
+
+private:
+    VT::SymbolicExprId answerInDetail(const std::string& text, std::string& out) const;
+
+    const SimplifyOptions& options_;
+    const Style& style_;
+    Conditions conditions_;
+    std::vector<std::string> warnings_;
+};
+
+void Simplifier::answer(const std::string& text, std::string& out) {
+    conditions_.makeRoomFor(text);
+    VT::SymbolicExprId result = 0;
+    if (options_.json || options_.explain) {
+        result = answerInDetail(text, out);
+    } else {
+        result = conditions_.simplify(options_, text);
+        out.append(conditions_.print(options_, result));
     }
-    appendMember(out, "result", jsonString(conditions.print(options, explanation.result())));
+    warnings_ = conditions_.warnings(options_, result);
+}
+
+/// Past the service's caches, which know results only.
+VT::SymbolicExprId Simplifier::answerInDetail(const std::string& text, std::string& out) const {
+    const Explanation explanation(conditions_, options_, conditions_.parse(options_, text), options_.explain);
+    if (!options_.json) {
+        explanation.appendText(style_, out);
+        return explanation.result();
+    }
+    appendMember(out, "result", jsonString(conditions_.print(options_, explanation.result())));
     appendMember(out, "passes", std::to_string(explanation.passes()));
-    if (options.explain)
+    if (options_.explain)
         appendMember(out, "steps", explanation.json());
+    return explanation.result();
 }
 
 } // namespace
@@ -45,17 +74,12 @@ Command addSimplify(CLI::App& program) {
     addLanguageOption(*command, *options);
     command->add_flag("--explain", options->explain, "Show the rules that fired, pass by pass");
     command->footer(examples);
-    return {command, [options](Console& console) {
-                Conditions conditions;
-                const auto answer = [&](const std::string& text, std::string& out) {
-                    conditions.makeRoomFor(text);
-                    if (options->json || options->explain)
-                        answerInDetail(*options, console.dataStyle(), conditions, text, out);
-                    else
-                        out.append(conditions.print(*options, conditions.simplify(*options, text)));
-                };
-                return answerTexts(*options, console, {answer, options->explain && !options->json});
-            }};
+    return {
+        command, [options](Console& console) {
+            Simplifier simplifier(*options, console.dataStyle());
+            const auto answer = [&](const std::string& text, std::string& out) { simplifier.answer(text, out); };
+            return answerTexts(*options, console, {answer, options->explain && !options->json, &simplifier.warnings()});
+        }};
 }
 
 } // namespace vtsym

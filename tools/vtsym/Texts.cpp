@@ -16,7 +16,8 @@ namespace vtsym {
 
 namespace {
 
-constexpr char textMark = '\x01';
+/// What no argument of a command line holds.
+constexpr char textMark = '\0';
 
 /// Answers one text after another.
 class Answerer {
@@ -32,6 +33,7 @@ public:
 
 private:
     void explain(const std::string& text, const TextError& error);
+    void warn();
 
     bool json_;
     Console& console_;
@@ -53,6 +55,7 @@ void Answerer::answer(const std::string& text) {
     const std::size_t begin = out_.size();
     try {
         answering_.answer(text, out_);
+        warn();
     } catch (...) {
         const TextError error = currentTextError();
         allAnswered_ = false;
@@ -68,6 +71,15 @@ void Answerer::explain(const std::string& text, const TextError& error) {
         appendMember(out_, "error", jsonOf(error));
     else
         console_.words(errorLines(line_, text, error, console_.wordStyle()));
+}
+
+void Answerer::warn() {
+    if (answering_.warnings == nullptr || answering_.warnings->empty())
+        return;
+    std::string lines;
+    for (const std::string& warning : *answering_.warnings)
+        lines += warningLine(line_, warning, console_.wordStyle());
+    console_.words(lines);
 }
 
 /// Calls `use` with every line of standard input; 0, or the error that ended reading.  Before it waits for more input,
@@ -108,11 +120,18 @@ int forEachLine(Console& console, Use&& use) {
 } // namespace
 
 void markTexts(std::vector<std::string>& arguments) {
-    auto text = std::ranges::find(arguments, "--");
-    if (text == arguments.end())
-        return;
-    for (text = arguments.erase(text); text != arguments.end(); ++text)
-        text->insert(text->begin(), textMark);
+    const auto isList = [](const std::string& text) { return text.starts_with('[') && text.ends_with(']'); };
+    bool behind = false;
+    for (auto text = arguments.begin(); text != arguments.end();) {
+        if (!behind && *text == "--") {
+            behind = true;
+            text = arguments.erase(text);
+            continue;
+        }
+        if (behind || isList(*text))
+            text->insert(text->begin(), textMark);
+        ++text;
+    }
 }
 
 std::string withoutMark(const std::string& argument) {
@@ -131,9 +150,9 @@ CLI::Validator oneOf(std::vector<std::string> words) {
     return {[words = std::move(words)](const std::string& value) -> std::string {
                 if (std::ranges::find(words, value) != words.end())
                     return {};
-                std::string choice;
-                for (const std::string& word : words)
-                    choice += (choice.empty() ? "" : " or ") + word;
+                std::string choice = words.front();
+                for (std::size_t i = 1; i < words.size(); ++i)
+                    choice += (i + 1 < words.size() ? ", " : " or ") + words[i];
                 return "'" + value + "' is not offered; " + choice + " is";
             },
             ""};
@@ -154,8 +173,11 @@ void addSourceOption(CLI::App& command, TextOptions& options) {
 }
 
 void addLanguageOption(CLI::App& command, TextOptions& options) {
-    command.add_option("--to", options.to, "Language of the answers: c or quill (as --from unless given)")
-        ->check(oneOf({"c", "quill"}))
+    command
+        .add_option("--to", options.to,
+                    "Language of the answers: c, quill or pp, the condition of a preprocessor directive (as --from "
+                    "unless given)")
+        ->check(oneOf({"c", "quill", "pp"}))
         ->type_name("LANGUAGE");
 }
 

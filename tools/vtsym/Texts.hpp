@@ -22,6 +22,9 @@ struct TextOptions {
     [[nodiscard]] bool fromQuill() const { return from == "quill"; }
 
     [[nodiscard]] bool toQuill() const { return (to.empty() ? from : to) == "quill"; }
+
+    /// Whether answers are conditions of preprocessor directives.
+    [[nodiscard]] bool toDirective() const { return to == "pp"; }
 };
 
 /// How a command answers.
@@ -31,10 +34,12 @@ struct Answering {
     std::function<void(const std::string& text, std::string& answer)> answer;
     /// Whether answers have several lines; they are kept apart by empty lines then.
     bool inBlocks = false;
+    /// What is to be told on standard error of the text that was answered last; nullptr for nothing ever.
+    const std::vector<std::string>* warnings = nullptr;
 };
 
-/// Marks the arguments behind `--` as texts, whatever they begin with; addTextOptions() takes the marks off again.  The
-/// parser of the command line knows that only in front of the first text.
+/// Marks arguments that the parser of the command line would not take for texts: those behind `--`, unless they are the
+/// first texts, and lists such as `[1,2]`.  Options for texts take the mark off by withoutMark().
 void markTexts(std::vector<std::string>& arguments);
 std::string withoutMark(const std::string& argument);
 

@@ -17,7 +17,8 @@ namespace {
 
 enum ExitStatus : int { Success = 0, Failure = 1, WrongUsage = 2 };
 
-constexpr const char* description = "Symbolic expressions and variant conditions: simplify, convert, look inside.";
+constexpr const char* description =
+    "Symbolic expressions and variant conditions: simplify, convert, evaluate, look inside.";
 
 constexpr const char* footer =
     R"(Every line of standard input is answered by one line of standard output; a text without an answer leaves an empty
@@ -28,6 +29,7 @@ Exit status: 0 all texts were answered, 1 some were not, 2 the command line is w
 Examples:
   vtsym simplify 'Mode == 1 && Mode == 2'
   vtsym convert --to quill 'a % b == 1'
+  vtsym eval -D N=3 'N*2 + 1'
   vtsym tree 'N*2 + 1')";
 
 /// Changes between two words: letters put in, left out or replaced.
@@ -73,7 +75,8 @@ Program::Program() {
     app_.footer(footer);
     app_.get_formatter()->column_width(34);
     addFeatures(app_);
-    for (const auto add : {addSimplify, addConvert, addTree, addSymbols, addReplace, addRepl, addOperators}) {
+    for (const auto add : {addSimplify, addConvert, addPreprocess, addTree, addEval, addDims, addSymbols, addReplace,
+                           addRepl, addOperators}) {
         commands_.push_back(add(app_));
         addFeatures(*commands_.back().app);
     }
@@ -112,7 +115,9 @@ int Program::fail(Console& console, const std::string& problem) {
     std::string command = "vtsym";
     for (const CLI::App* const chosen : app_.get_subcommands())
         command += " " + chosen->get_name();
-    console.words("vtsym: " + problem + "\nTry '" + command + " --help'.\n");
+    std::string shown = problem;
+    std::erase(shown, '\0'); // a guard of lists
+    console.words("vtsym: " + shown + "\nTry '" + command + " --help'.\n");
     return WrongUsage;
 }
 

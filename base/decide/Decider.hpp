@@ -1,0 +1,83 @@
+// Exact answers to questions about conditions.
+#pragma once
+
+#include "base/core/Limits.hpp"
+#include "base/core/Table.hpp"
+#include "base/decide/Decision.hpp"
+
+#include <memory>
+#include <span>
+#include <string>
+
+namespace VT {
+
+struct DecisionOptions {
+    bool keywordsInForce = true; ///< "(sim)" and "(codegen)" are opposites; plain symbols otherwise
+    bool bits32 = false;         ///< unknowns are signed 32-bit integers; integers without bounds otherwise
+    std::uint64_t steps = limits::decisionSteps; ///< that one question may cost, 2^22 at most
+};
+
+/// Decides questions about conditions of one table.
+///
+/// Conditions are over integers: every symbol stands for an integer, a truth value is an integer that is not zero, a
+/// truth value in arithmetic is 1 or 0.  Comparisons of linear terms with integers, with real literals (exactly:
+/// A < 2.5 is A <= 2) and with a symbol plus a constant are understood, and so is everything that && || ! make of them.
+/// A call is an unknown of its own, whatever its arguments; so is a member, unless a value is bound to it.  Any other
+/// arithmetic is an unknown for each node: equal nodes are equal, and nothing else is known of it but the range of %
+/// and & with a literal.  Quotients are cut toward zero, and bits and shifts are of 32-bit values, where a witness is
+/// confirmed.
+///
+/// An answer is proven or it is "undecided"; it depends on the conditions alone, not on what was interned or asked
+/// before.  Real conditions take microseconds.
+///
+/// What was read of a condition is kept, and nodes never change; a value that is bound to a member later goes unnoticed
+/// until clear().  A decider is used by one thread at a time; its table outlives it.  Interns nothing.
+class VTSYM_API Decider {
+public:
+    explicit Decider(const SymbolicExprTable& table, const DecisionOptions& options = {});
+    Decider(Decider&&) noexcept;
+    Decider& operator=(Decider&&) noexcept;
+    ~Decider();
+
+    // One condition.  The witness of "yes" makes it hold, that of "no" makes it fail.
+
+    Decision canHold(SymbolicExprId condition);
+    Decision mustHold(SymbolicExprId condition);
+
+    // Two.  A witness of "no" breaks what was asked: a holds and b does not, both hold, one alone holds.  The witness
+    // of overlaps() makes both hold.
+
+    Decision implies(SymbolicExprId a, SymbolicExprId b);
+    Decision equivalent(SymbolicExprId a, SymbolicExprId b);
+    Decision disjoint(SymbolicExprId a, SymbolicExprId b);
+    Decision overlaps(SymbolicExprId a, SymbolicExprId b);
+    /// Whether a and b agree wherever `known` holds; the witness of "no" is where they differ.
+    Decision equivalentGiven(SymbolicExprId a, SymbolicExprId b, SymbolicExprId known);
+    /// How a and b stand to each other, with the three witnesses that there may be.
+    Relation classify(SymbolicExprId a, SymbolicExprId b);
+
+    // A set, n log n in the number of similar conditions.
+
+    /// Whether some condition always holds; the witness of "no" is left out by all.
+    SetDecision covers(std::span<const SymbolicExprId> conditions);
+    /// Whether no two hold together; "no" comes with a witness and the first two that hold for it.
+    SetDecision disjoint(std::span<const SymbolicExprId> conditions);
+
+    /// Whether a condition holds under an assignment, by evaluation; unknowns that it does not name are 0.  Nothing
+    /// where some value is none: a division by zero, a number beyond 64 bits.
+    [[nodiscard]] std::optional<bool> holds(SymbolicExprId condition, const Witness& witness);
+    /// The text of an unknown of a witness.
+    [[nodiscard]] std::string nameOf(SymbolicExprId unknown) const;
+
+    [[nodiscard]] const DecisionOptions& options() const noexcept;
+    /// Steps that the latest question took.
+    [[nodiscard]] std::uint64_t stepsTaken() const noexcept;
+    /// Forgets everything that was read.
+    void clear();
+
+private:
+    struct State;
+    std::unique_ptr<State> state_;
+};
+
+} // namespace VT

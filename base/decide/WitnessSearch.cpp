@@ -1,0 +1,444 @@
+#include "base/decide/WitnessSearch.hpp"
+
+#include "base/core/Limits.hpp"
+
+#include <algorithm>
+#include <array>
+#include <cstdlib>
+#include <iterator>
+#include <limits>
+
+namespace VT {
+
+namespace {
+
+/// Whether a is nearer to 0 than b; of two equally near the positive one is.
+bool isSmaller(std::int64_t a, std::int64_t b) {
+    return std::abs(a) != std::abs(b) ? std::abs(a) < std::abs(b) : a > b;
+}
+
+/// The edges of a node from one of them outwards: itself, the one above, the one below, and so on.
+std::size_t outward(std::size_t origin, std::size_t step, std::size_t count) {
+    const std::size_t below = origin;
+    const std::size_t above = count - 1 - origin;
+    const std::size_t pairs = std::min(below, above);
+    if (step > 2 * pairs)
+        return above > below ? origin + (step - pairs) : origin - (step - pairs);
+    return step % 2 == 1 ? origin + (step + 1) / 2 : origin - step / 2;
+}
+
+} // namespace
+
+WitnessSearch::WitnessSearch(const LeafReader& leaves, Unknowns& unknowns, Diagrams& diagrams, Steps& steps)
+    : leafReader_(leaves),
+      unknowns_(unknowns),
+      diagrams_(diagrams),
+      steps_(steps),
+      system_(steps) {}
+
+Decision WitnessSearch::find(Diagram diagram, std::span<const UnknownLeaf> leaves) {
+    if (diagram == never)
+        return {Answer::No, DecisionBound::None, std::nullopt};
+    if (!diagrams_.needsChecking(diagram))
+        return {Answer::Yes, DecisionBound::None, walkDown(diagram, leaves)};
+    DecisionBound bound = DecisionBound::None;
+    best_.reset();
+    unconfirmed_ = false;
+    try {
+        collect(diagram, leaves);
+        walkPaths(diagram);
+    } catch (const StepsUsedUp&) {
+        bound = DecisionBound::Steps;
+    }
+    if (best_)
+        return {Answer::Yes, DecisionBound::None, witness(*best_, leaves)};
+    if (bound == DecisionBound::None && unconfirmed_)
+        bound = DecisionBound::Terms;
+    return {bound == DecisionBound::None ? Answer::No : Answer::Undecided, bound, std::nullopt};
+}
+
+// Unknowns alone.
+
+Witness WitnessSearch::walkDown(Diagram diagram, std::span<const UnknownLeaf> leaves) const {
+    Witness result;
+    result.reserve(leaves.size());
+    for (const UnknownLeaf& leaf : leaves) {
+        std::int64_t value = 0;
+        if (!result.empty() && leaf.unknown == (&leaf)[-1].unknown) {
+            // The second keyword, or another spelling of the first.
+            value = (leaf.opposite != (&leaf)[-1].opposite) ? 1 - result.back().value : result.back().value;
+            result.push_back({leaf.node, value});
+            continue;
+        }
+        const Quantity quantity = unknowns_[leaf.unknown].quantity;
+        if (diagram > never && diagrams_.quantity(diagram) == quantity) {
+            const QuantityInfo& info = unknowns_.quantity(quantity);
+            std::optional<std::int64_t> nearest;
+            Diagram below = never;
+            std::int64_t low = info.low;
+            for (std::size_t i = 0; i < diagrams_.edgeCount(diagram); ++i) {
+                const Diagrams::Edge edge = diagrams_.edge(diagram, i);
+                const std::int64_t candidate = std::clamp(std::int64_t{0}, low, std::min(edge.high, info.high));
+                if (edge.child != never && (!nearest || isSmaller(candidate, *nearest))) {
+                    nearest = candidate;
+                    below = edge.child;
+                }
+                low = edge.high == plusInfinite ? edge.high : edge.high + 1;
+            }
+            value = *nearest;
+            diagram = below;
+        }
+        result.push_back({leaf.node, leaf.opposite ? 1 - value : value});
+    }
+    return result;
+}
+
+Witness WitnessSearch::witness(const std::vector<std::int64_t>& values, std::span<const UnknownLeaf> leaves) const {
+    Witness result;
+    result.reserve(leaves.size());
+    for (const UnknownLeaf& leaf : leaves) {
+        const std::int64_t value = values[numberOf(leaf.unknown)];
+        result.push_back({leaf.node, leaf.opposite ? 1 - value : value});
+    }
+    return result;
+}
+
+// Paths.
+
+/// Numbers the unknowns below a diagram and those of the leaves, in their order.
+void WitnessSearch::collect(Diagram diagram, std::span<const UnknownLeaf> leaves) {
+    root_ = diagram;
+    order_.clear();
+    numbers_.clear();
+    terms_.clear();
+    movable_.clear();
+    triesLeft_ = limits::confirmations;
+    const auto meet = [&](Unknown unknown) {
+        if (numbers_.find(unknown) == nullptr) {
+            numbers_.insert(unknown, 0);
+            order_.push_back(unknown);
+        }
+    };
+    IdMap<bool> seen;
+    std::vector<Diagram> pending{diagram};
+    while (!pending.empty()) {
+        const Diagram next = pending.back();
+        pending.pop_back();
+        if (next <= never || seen.find(next >> 1U) != nullptr)
+            continue;
+        seen.insert(next >> 1U, true);
+        steps_.take(diagrams_.edgeCount(next));
+        const QuantityInfo& info = unknowns_.quantity(diagrams_.quantity(next));
+        meet(info.plus);
+        if (info.isDifference())
+            meet(info.minus);
+        for (std::size_t i = 0; i < diagrams_.edgeCount(next); ++i)
+            pending.push_back(diagrams_.edge(next, i).child);
+    }
+    for (const UnknownLeaf& leaf : leaves)
+        meet(leaf.unknown);
+    std::vector<Unknown> free; // what terms are computed from
+    for (std::size_t i = 0; i < order_.size(); ++i) {
+        const UnknownInfo info = unknowns_[order_[i]]; // a copy: meeting more may move it
+        if (info.kind == UnknownKind::Sum)
+            for (const LinearPart& part : info.sum) {
+                meet(part.unknown);
+                if (!unknowns_[part.unknown].isComputed())
+                    free.push_back(part.unknown);
+            }
+        if (info.kind == UnknownKind::Term) {
+            terms_.push_back({0, std::make_unique<TermPlan>(leafReader_, unknowns_, info.node)});
+            steps_.take(terms_.back().plan->size());
+            for (const Unknown unknown : terms_.back().plan->unknowns()) {
+                meet(unknown);
+                free.push_back(unknown);
+            }
+        }
+        if (info.isComputed() && info.kind == UnknownKind::Sum)
+            terms_.push_back({0, nullptr});
+        if (info.isComputed())
+            terms_.back().number = order_[i]; // for the time being
+    }
+    std::ranges::sort(order_, [&](Unknown a, Unknown b) { return unknowns_.before(a, b); });
+    for (std::size_t i = 0; i < order_.size(); ++i)
+        numbers_.insert(order_[i], static_cast<Number>(i + 1));
+    for (Term& term : terms_)
+        term.number = numberOf(term.number);
+    std::ranges::sort(terms_, {}, &Term::number); // sums come behind the terms that they add up
+    for (const Unknown unknown : free)
+        movable_.push_back(numberOf(unknown));
+    std::ranges::sort(movable_);
+    const auto repeated = std::ranges::unique(movable_);
+    movable_.erase(repeated.begin(), repeated.end());
+    system_.begin(order_.size());
+    for (std::size_t i = 0; i < order_.size(); ++i)
+        system_.restrict(static_cast<Number>(i + 1), 0, unknowns_[order_[i]].low, unknowns_[order_[i]].high);
+}
+
+void WitnessSearch::walkPaths(Diagram diagram) {
+    frames_.clear();
+    solutions_.assign(1, {});
+    if (!system_.solve(solutions_.back()))
+        return;
+    enter(diagram);
+    while (!frames_.empty()) {
+        Frame& frame = frames_.back();
+        system_.shrink(frame.bounds);
+        solutions_.resize(frame.solutions);
+        const std::size_t count = diagrams_.edgeCount(frame.diagram);
+        if (frame.next == count || (!terms_.empty() && best_) || (best_ && !improves(solutions_.back()))) {
+            frames_.pop_back();
+            continue;
+        }
+        const std::size_t edge = outward(frame.origin, frame.next++, count);
+        const Diagram child = diagrams_.edge(frame.diagram, edge).child;
+        steps_.take();
+        if (child == never || !take(frame, edge))
+            continue;
+        if (child == always)
+            reachedTruth();
+        else
+            enter(child);
+    }
+}
+
+void WitnessSearch::enter(Diagram diagram) {
+    const QuantityInfo& info = unknowns_.quantity(diagrams_.quantity(diagram));
+    const std::vector<std::int64_t>& values = solutions_.back();
+    const std::int64_t value = values[numberOf(info.plus)] - (info.isDifference() ? values[numberOf(info.minus)] : 0);
+    frames_.push_back({diagram, diagrams_.edgeOf(diagram, value), 0, system_.size(), solutions_.size()});
+}
+
+/// Adds the bounds of an edge; false where they cannot be met, or only by what is no better than the witness at hand.
+bool WitnessSearch::take(const Frame& frame, std::size_t edge) {
+    const QuantityInfo& info = unknowns_.quantity(diagrams_.quantity(frame.diagram));
+    const std::int64_t low = edge == 0 ? minusInfinite : diagrams_.edge(frame.diagram, edge - 1).high + 1;
+    const bool isOrigin = edge == frame.origin;
+    system_.restrict(numberOf(info.plus), info.isDifference() ? numberOf(info.minus) : 0, low,
+                     diagrams_.edge(frame.diagram, edge).high);
+    if (isOrigin)
+        return true;
+    std::vector<std::int64_t> values;
+    if (!system_.solve(values) || (best_ && !improves(values)))
+        return false;
+    solutions_.push_back(std::move(values));
+    return true;
+}
+
+bool WitnessSearch::improves(const std::vector<std::int64_t>& values) const {
+    for (std::size_t i = 1; i < values.size(); ++i)
+        if (values[i] != (*best_)[i])
+            return isSmaller(values[i], (*best_)[i]);
+    return false;
+}
+
+void WitnessSearch::reachedTruth() {
+    if (terms_.empty()) {
+        best_ = solutions_.back();
+        return;
+    }
+    if (confirm(solutions_.back()))
+        best_ = trial_;
+    else if (!isExcluded() && !confirmNear(solutions_.back()))
+        unconfirmed_ = true;
+}
+
+// Confirmation.
+
+/// Computes the terms from the unknowns that they depend on; false where one has no value.
+bool WitnessSearch::computeTerms(std::vector<std::int64_t>& values) {
+    for (const Term& term : terms_) {
+        std::optional<std::int64_t> value = 0;
+        if (term.plan != nullptr) {
+            steps_.take(term.plan->size());
+            value = term.plan->value([&](Unknown unknown) { return values[numberOf(unknown)]; });
+        } else {
+            for (const LinearPart& part : unknowns_[order_[term.number - 1]].sum) {
+                std::int64_t product = 0;
+                std::int64_t sum = 0;
+                if (__builtin_mul_overflow(part.factor, values[numberOf(part.unknown)], &product) ||
+                    __builtin_add_overflow(*value, product, &sum)) {
+                    value.reset();
+                    break;
+                }
+                value = sum;
+            }
+        }
+        if (!value || !isWithinBound(*value))
+            return false;
+        values[term.number] = *value;
+    }
+    return true;
+}
+
+/// Asks the whole diagram with the terms computed; the values are in trial_.
+bool WitnessSearch::confirm(const std::vector<std::int64_t>& values) {
+    trial_ = values;
+    if (!computeTerms(trial_))
+        return false;
+    Diagram at = root_;
+    while (at > never) {
+        steps_.take();
+        const QuantityInfo& info = unknowns_.quantity(diagrams_.quantity(at));
+        std::int64_t value = trial_[numberOf(info.plus)];
+        if (info.isDifference() && __builtin_sub_overflow(value, trial_[numberOf(info.minus)], &value))
+            return false;
+        at = diagrams_.edge(at, diagrams_.edgeOf(at, value)).child;
+    }
+    return at == always;
+}
+
+/// Whether a sum lies on this path where the ranges of its parts do not reach.
+bool WitnessSearch::isExcluded() {
+    system_.findRanges();
+    for (const Term& term : terms_) {
+        const UnknownInfo& info = unknowns_[order_[term.number - 1]];
+        if (info.kind != UnknownKind::Sum)
+            continue;
+        bool openLow = false;
+        bool openHigh = false;
+        std::int64_t low = 0;
+        std::int64_t high = 0;
+        for (const LinearPart& part : info.sum) {
+            std::int64_t atLow = system_.low(numberOf(part.unknown));
+            std::int64_t atHigh = system_.high(numberOf(part.unknown));
+            if (part.factor < 0)
+                std::swap(atLow, atHigh);
+            const auto add = [&](std::int64_t bound, std::int64_t& sum, bool& open) {
+                std::int64_t product = 0;
+                open = open || bound == minusInfinite || bound == plusInfinite ||
+                       __builtin_mul_overflow(part.factor, bound, &product) ||
+                       __builtin_add_overflow(sum, product, &sum);
+            };
+            add(atLow, low, openLow);
+            add(atHigh, high, openHigh);
+        }
+        if ((!openLow && low > system_.high(term.number)) || (!openHigh && high < system_.low(term.number)))
+            return true;
+    }
+    return false;
+}
+
+/// Values that the literals of the path and of the terms suggest, and small ones; smallest first.
+std::vector<std::int64_t> WitnessSearch::candidates(const std::vector<std::int64_t>& solution) const {
+    constexpr std::int64_t small = 8;
+    constexpr std::size_t fewest = 24; // literals that are combined with each other
+    constexpr std::size_t most = 512;
+    std::vector<std::int64_t> literals(solution);
+    for (const DifferenceSystem::Bound& bound : system_.bounds())
+        literals.push_back(bound.most);
+    for (const Term& term : terms_)
+        if (term.plan != nullptr)
+            literals.insert(literals.end(), term.plan->constants().begin(), term.plan->constants().end());
+    const auto tidy = [](std::vector<std::int64_t>& values) {
+        std::ranges::sort(values, isSmaller);
+        const auto repeated = std::ranges::unique(values);
+        values.erase(repeated.begin(), repeated.end());
+    };
+    tidy(literals);
+    std::vector<std::int64_t> values;
+    for (std::int64_t i = 0; i <= small; ++i)
+        values.insert(values.end(), {i, -i});
+    const auto suggest = [&](std::int64_t value) {
+        if (isWithinBound(value))
+            values.insert(values.end(), {value, value - 1, value + 1, -value, -value - 1, 1 - value});
+    };
+    for (const std::int64_t literal : literals) {
+        suggest(literal);
+        for (std::int64_t divisor = 2; divisor <= 64 && divisor <= std::abs(literal); ++divisor)
+            if (literal % divisor == 0)
+                values.insert(values.end(), {divisor, literal / divisor, -literal / divisor});
+    }
+    for (std::size_t i = 0; i < std::min(literals.size(), fewest); ++i)
+        for (std::size_t j = 0; j < i; ++j) {
+            suggest(literals[i] + literals[j]);
+            suggest(literals[i] - literals[j]);
+            std::int64_t product = 0;
+            if (!__builtin_mul_overflow(literals[i], literals[j], &product))
+                suggest(product);
+        }
+    tidy(values);
+    values.resize(std::min(values.size(), most));
+    return values;
+}
+
+/// Gives the unknowns that terms are computed from their values, with some of them changed; the terms follow, the
+/// others get the smallest values that go with them.  Asks for confirmation.
+bool WitnessSearch::confirmWith(std::span<const Change> changes) {
+    if (triesLeft_ == 0)
+        return false;
+    --triesLeft_;
+    const std::size_t before = system_.size();
+    for (const auto& [at, value] : changes)
+        base_[at].second = value;
+    std::vector<std::int64_t> values(order_.size() + 1);
+    for (const auto& [number, value] : base_) {
+        values[number] = value;
+        system_.restrict(number, 0, value, value);
+    }
+    bool confirmed = computeTerms(values);
+    if (confirmed) {
+        for (const Term& term : terms_)
+            system_.restrict(term.number, 0, values[term.number], values[term.number]);
+        confirmed = system_.solve(values) && confirm(values);
+    }
+    system_.shrink(before);
+    if (confirmed)
+        best_ = trial_;
+    return confirmed;
+}
+
+/// Tries other values for one, then for two of the unknowns that terms are computed from: around the solution, and
+/// around the same with 1 in the place of 0, since nothing can be divided by that.
+bool WitnessSearch::confirmNear(const std::vector<std::int64_t>& solution) {
+    const std::vector<std::int64_t> all = candidates(solution);
+    std::vector<std::vector<std::int64_t>> possible; // for each unknown, within its bounds
+    system_.findRanges();
+    for (const Number number : movable_) {
+        possible.emplace_back();
+        std::ranges::copy_if(all, std::back_inserter(possible.back()), [&](std::int64_t value) {
+            return value >= system_.low(number) && value <= system_.high(number);
+        });
+    }
+    using Base = std::vector<std::pair<Number, std::int64_t>>;
+    Base zeros;
+    Base ones;
+    for (const Number number : movable_) {
+        if (!isWithinBound(solution[number]))
+            return false;
+        zeros.emplace_back(number, solution[number]);
+        const bool replaced = solution[number] == 0 && system_.low(number) <= 1 && system_.high(number) >= 1;
+        ones.emplace_back(number, replaced ? 1 : solution[number]);
+    }
+    // From the last unknown on, so that the first ones stay small.
+    for (const Base& base : {zeros, ones})
+        for (std::size_t i = movable_.size(); i-- > 0;)
+            for (const std::int64_t value : possible[i]) {
+                base_ = base;
+                if (confirmWith(std::array{Change(i, value)}))
+                    return true;
+            }
+    base_ = zeros;
+    for (std::size_t i = movable_.size(); i-- > 1;) // what one sum gains another may have to lose
+        for (std::size_t j = i; j-- > 0;) {
+            for (const std::int64_t value : possible[j])
+                if (confirmWith(std::array{Change(j, value), Change(i, -value)}))
+                    return true;
+            base_ = zeros;
+        }
+    for (std::size_t reach = 8; reach < 4 * all.size(); reach *= 4) // near values for all pairs first
+        for (const Base& base : {zeros, ones})
+            for (std::size_t i = movable_.size(); i-- > 1;)
+                for (std::size_t j = i; j-- > 0;)
+                    for (std::size_t a = 0; a < std::min(reach, possible[j].size()); ++a)
+                        for (std::size_t b = 0; b < std::min(reach, possible[i].size()); ++b) {
+                            if (triesLeft_ == 0)
+                                return false;
+                            base_ = base;
+                            if (confirmWith(std::array{Change(j, possible[j][a]), Change(i, possible[i][b])}))
+                                return true;
+                        }
+    return false;
+}
+
+} // namespace VT

@@ -1,0 +1,15 @@
+#include "base/eval/Eval.hpp"
+
+#include "base/eval/EvalVisitor.hpp"
+
+namespace VT {
+
+SymbolicValue SymbolicExprEval::eval(SymbolicExprId id) const {
+    return SymbolicExprEvalImpl(table_).evaluate(id);
+}
+
+PreparedExpr SymbolicExprEval::prepare(SymbolicExprId id) const {
+    return {table_, id};
+}
+
+} // namespace VT

@@ -1,0 +1,117 @@
+// The visitor that computes values.
+#pragma once
+
+#include "base/core/IdMap.hpp"
+#include "base/core/Nodes.hpp"
+#include "base/eval/Values.hpp"
+
+#include <boost/container/small_vector.hpp>
+
+#include <cstddef>
+#include <forward_list>
+
+namespace VT {
+
+/// Computes the value of an expression bottom-up: each visit takes the values of its node's operands from a stack and
+/// leaves the value of the node.
+///
+/// Evaluable are literals, symbols, the operators of scalarRules and lists of dimensions, whose elements are scalars.
+/// A scalar and a vector combine element by element, and so do two vectors of one length.  "true" and "false" are truth
+/// values; any other symbol has the value that is bound to it in the table, evaluated, and so has a member that a value
+/// is bound to.  Everything else throws a host diagnostic that names the symbol or the sub-expression:
+///
+///     Vantor:SymbolicDims:UnboundSymbol   a symbol without a value
+///     Vantor:SymbolicDims:CyclicValue     a symbol whose value needs itself
+///     Vantor:SymbolicDims:NotEvaluable    a node of another class, a list in a list, an identifier that is no node's
+///     Vantor:SymbolicDims:SizeMismatch    two vectors of different lengths
+///
+/// Either evaluate(), which visits each distinct node once in the visitor's life, or a run by node.accept(table,
+/// visitor) or visitor.execute(table, id), which visit a shared operand once for every path to it, and then get().
+/// What was evaluated is remembered: bindings are not to change during the visitor's life.
+class VTSYM_API SymbolicExprEvalImpl : public RoutedVisitor<SymbolicExprEvalImpl> {
+public:
+    /// `table` outlives the visitor.
+    explicit SymbolicExprEvalImpl(const SymbolicExprTable& table) : table_(table) {}
+
+    SymbolicExprEvalImpl(const SymbolicExprEvalImpl&) = delete;
+    SymbolicExprEvalImpl& operator=(const SymbolicExprEvalImpl&) = delete;
+
+    /// The value of an expression.  Linear in the distinct nodes that the visitor has not met, times the length of the
+    /// vectors.  Throws std::length_error beyond limits::evaluatedElements.  After an exception the visitor can be used
+    /// on.
+    SymbolicValue evaluate(SymbolicExprId id);
+
+    /// The value of the run that was completed last, taken from the stack.  Throws "Vantor:SymbolicDims:NotEvaluable"
+    /// where nothing was visited.
+    SymbolicValue get();
+
+    // One function for each way to a value.
+
+    void on(const SymbolicString& node);
+    void on(const SymbolicIntValue& node);
+    void on(const SymbolicDoubleValue& node);
+    void on(const SymbolicMemberValue& node);
+    void on(const Symbolic2DExpr& node);
+    void on(const Symbolic3DExpr& node);
+    void on(const SymbolicNDExpr& node);
+    /// An operator with a scalar rule.
+    void on(const SymbolicUnaryExpr& node);
+    void on(const SymbolicBinaryExpr& node);
+    /// Nodes without a value.
+    void on(const SymbolicTernaryExpr& node);
+    void on(const SymbolicMultiExpr& node);
+
+private:
+    using Elements = SymbolicValue::Elements;
+
+    /// A scalar, or a vector that the visitor keeps.
+    struct Entry {
+        SymbolicScalar scalar;
+        const Elements* elements = nullptr;
+    };
+
+    /// A node whose operands, or a symbol whose value, is being evaluated.
+    struct Frame {
+        const SymbolicExpr* node;
+        SymbolicExprId id;
+        SymbolicExprId first;  ///< operand of an operator, or the value of a symbol; a list is asked for its elements
+        SymbolicExprId second; ///< operand of an operator
+        std::size_t next;
+        std::size_t count;
+        ScalarRuleIndex rule; ///< of an operator
+        bool isSymbol;
+    };
+
+    void evaluateToStack(SymbolicExprId id);
+    void enter(SymbolicExprId id, const Frame* parent);
+    void enterOperands(SymbolicExprId id, const SymbolicExpr& node, SymbolicOp op);
+    void enterSymbol(SymbolicExprId id, const SymbolicExpr& node, bool isMember);
+    void leave();
+
+    void pushSymbol(const SymbolicExpr& node);
+    void pushList(const SymbolicExpr& node);
+    void pushOperator(const SymbolicExpr& node);
+
+    void push(const SymbolicScalar& scalar) { push(scalar, nullptr); }
+
+    void push(const SymbolicScalar& scalar, const Elements* elements) {
+        stack_.push_back(values_.size());
+        values_.emplace_back(scalar, elements);
+    }
+
+    void push(Elements elements);
+    std::size_t take(const SymbolicExpr& node);
+    void combine(const SymbolicExpr& node, ScalarRuleIndex index);
+    void combineElements(const SymbolicExpr& node, const ScalarRule& rule, const Entry& left, const Entry& right);
+
+    const SymbolicExprTable& table_;
+    // With room for usual expressions in place.
+    boost::container::small_vector<Entry, 64> values_;
+    boost::container::small_vector<std::size_t, 16> stack_; ///< of values
+    boost::container::small_vector<Frame, 16> frames_;
+    IdMap<std::size_t> known_;            ///< the values of nodes but literals
+    std::forward_list<Elements> vectors_; ///< of the entries
+    std::size_t elementCount_ = 0;        ///< in them
+};
+
+} // namespace VT

@@ -1,0 +1,51 @@
+// What the service remembers of decided pairs.
+#pragma once
+
+#include "base/decide/Decision.hpp"
+
+#include <boost/unordered_map.hpp>
+
+#include <tuple>
+
+namespace VT {
+
+/// What may be true of two conditions; every question about a pair is one of these or its opposite.
+enum class PairQuestion : std::uint8_t {
+    FirstAlone, ///< the first can hold without the second
+    Both,       ///< they can hold together
+    Differ,     ///< one can hold without the other
+};
+
+/// Decisions by what was asked.  Only grows, as what is in here stays right.
+class DecisionCache {
+public:
+    struct Key {
+        SymbolicExprId a;
+        SymbolicExprId b;
+        PairQuestion question;
+        bool keywordsInForce;
+        bool operator==(const Key&) const = default;
+
+        friend std::size_t hash_value(const Key& key) noexcept {
+            std::size_t seed = 0;
+            boost::hash_combine(seed, key.a);
+            boost::hash_combine(seed, key.b);
+            boost::hash_combine(seed, static_cast<unsigned>(key.question) * 2 + (key.keywordsInForce ? 1U : 0U));
+            return seed;
+        }
+    };
+
+    /// The decision of a key, or nullptr.  Valid until the next insertion.
+    [[nodiscard]] const Decision* find(const Key& key) const {
+        const auto entry = decisions_.find(key);
+        return entry == decisions_.end() ? nullptr : &entry->second;
+    }
+
+    /// Keeps a decision.  When memory runs out the cache is as before.
+    void insert(const Key& key, const Decision& decision) { decisions_.emplace(key, decision); }
+
+private:
+    boost::unordered_map<Key, Decision> decisions_;
+};
+
+} // namespace VT

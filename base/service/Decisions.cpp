@@ -1,0 +1,176 @@
+// How conditions stand to each other.
+#include "base/VCService.hpp"
+#include "base/service/ImpliedCondition.hpp"
+#include "base/service/ServiceParts.hpp"
+#include "base/variants/VariantKeywords.hpp"
+
+#include <algorithm>
+
+namespace VT {
+
+namespace {
+
+Decision noCondition() {
+    return {Answer::Undecided, DecisionBound::NoCondition, std::nullopt};
+}
+
+} // namespace
+
+bool ServiceParts::keywordsInForce() const {
+    return simplifier.keywordsFlag() && isVariantKeywordsSimCodegenFeatureOn();
+}
+
+Decider& ServiceParts::decider() {
+    const bool inForce = keywordsInForce();
+    std::unique_ptr<Decider>& decider = deciders[inForce ? 1 : 0];
+    if (decider == nullptr)
+        decider = std::make_unique<Decider>(table, DecisionOptions{.keywordsInForce = inForce});
+    return *decider;
+}
+
+/// The decision about a pair, from the cache where it is there.
+Decision VCService::ask(PairQuestion question, const VCSymbolicExprId& a, const VCSymbolicExprId& b) {
+    if (!has(a) || !has(b))
+        return noCondition();
+    const bool ordered = question == PairQuestion::FirstAlone;
+    const DecisionCache::Key key{ordered ? a.id() : std::min(a.id(), b.id()),
+                                 ordered ? b.id() : std::max(a.id(), b.id()), question, parts_->keywordsInForce()};
+    if (const Decision* known = parts_->caching ? parts_->decisions.find(key) : nullptr)
+        return *known;
+    // Operators that Quill writes as calls are decided as operators.
+    const SymbolicExprId first = parts_->toC(key.a);
+    const SymbolicExprId second = parts_->toC(key.b);
+    Decider& decider = parts_->decider();
+    Decision decision = question == PairQuestion::Both         ? decider.overlaps(first, second)
+                        : question == PairQuestion::FirstAlone ? decider.implies(first, second).opposite()
+                                                               : decider.equivalent(first, second).opposite();
+    if (parts_->caching)
+        parts_->decisions.insert(key, decision);
+    return decision;
+}
+
+Decision VCService::canHold(const VCSymbolicExprId& condition) {
+    return ask(PairQuestion::Both, condition, condition);
+}
+
+Decision VCService::mustHold(const VCSymbolicExprId& condition) {
+    return implies(parts_->table.getIdTRUE(), condition);
+}
+
+Decision VCService::implies(const VCSymbolicExprId& a, const VCSymbolicExprId& b) {
+    return ask(PairQuestion::FirstAlone, a, b).opposite();
+}
+
+Decision VCService::isEquivalent(const VCSymbolicExprId& a, const VCSymbolicExprId& b) {
+    return ask(PairQuestion::Differ, a, b).opposite();
+}
+
+Decision VCService::isDisjoint(const VCSymbolicExprId& a, const VCSymbolicExprId& b) {
+    return ask(PairQuestion::Both, a, b).opposite();
+}
+
+Decision VCService::contains(const VCSymbolicExprId& outer, const VCSymbolicExprId& inner) {
+    return implies(inner, outer);
+}
+
+Decision VCService::isTighterThan(const VCSymbolicExprId& a, const VCSymbolicExprId& b) {
+    Decision aImpliesB = implies(a, b);
+    if (aImpliesB.isNo())
+        return aImpliesB;
+    Decision onlyB = ask(PairQuestion::FirstAlone, b, a);
+    return aImpliesB.isUndecided() && !onlyB.isNo() ? aImpliesB : onlyB;
+}
+
+Relation VCService::compare(const VCSymbolicExprId& a, const VCSymbolicExprId& b) {
+    return Relation::of(ask(PairQuestion::FirstAlone, a, b), ask(PairQuestion::FirstAlone, b, a),
+                        ask(PairQuestion::Both, a, b));
+}
+
+SetDecision VCService::covers(const std::vector<VCSymbolicExprId>& conditions) {
+    std::vector<SymbolicExprId> converted;
+    converted.reserve(conditions.size());
+    for (const VCSymbolicExprId& condition : conditions) {
+        if (!has(condition))
+            return {noCondition(), std::nullopt};
+        converted.push_back(parts_->toC(condition.id()));
+    }
+    return parts_->decider().covers(converted);
+}
+
+SetDecision VCService::isDisjoint(const std::vector<VCSymbolicExprId>& conditions) {
+    std::vector<SymbolicExprId> converted;
+    converted.reserve(conditions.size());
+    for (const VCSymbolicExprId& condition : conditions) {
+        if (!has(condition))
+            return {noCondition(), std::nullopt};
+        converted.push_back(parts_->toC(condition.id()));
+    }
+    return parts_->decider().disjoint(converted);
+}
+
+// Sums of products.
+
+std::vector<VCSymbolicExprId> VCService::uniqueOperands(const VCSymbolicExprId& condition, bool ofAnd) {
+    if (!has(condition))
+        return {};
+    const SymbolicExprTable& table = parts_->table;
+    const SymbolicExprId simple = simplify(condition, true).id();
+    if (simple == (ofAnd ? table.getIdTRUE() : table.getIdFALSE()))
+        return {};
+    boost::container::flat_set<SymbolicExprId> operands;
+    if (ofAnd)
+        parts_->simplifier.computeUniqueAndOperandsId(*table.get(simple), operands);
+    else
+        parts_->simplifier.computeUniqueOrOperandsId(*table.get(simple), operands);
+    std::vector<SymbolicExprId> sorted(operands.begin(), operands.end());
+    std::ranges::sort(
+        sorted, [&](SymbolicExprId a, SymbolicExprId b) { return parts_->quillPrinter.compareUsingCache(a, b) < 0; });
+    return {sorted.begin(), sorted.end()};
+}
+
+std::vector<VCSymbolicExprId> VCService::computeUniqueAndOperandsId(const VCSymbolicExprId& condition) {
+    return uniqueOperands(condition, true);
+}
+
+std::vector<VCSymbolicExprId> VCService::computeUniqueOrOperandsId(const VCSymbolicExprId& condition) {
+    return uniqueOperands(condition, false);
+}
+
+// Conditions relative to others.
+
+VCSymbolicExprId VCService::getImpliedCondition(const VCSymbolicExprId& condition, const VCSymbolicExprId& known) {
+    if (!has(condition) || !has(known))
+        return invalidId;
+    SymbolicExprTable& table = parts_->table;
+    if (implies(known, condition).isYes())
+        return table.getIdTRUE();
+    if (isDisjoint(known, condition).isYes())
+        return table.getIdFALSE();
+    const SymbolicExprId given = parts_->toC(condition.id());
+    const SymbolicExprId context = parts_->toC(known.id());
+    const auto isEqual = [&](SymbolicExprId candidate) {
+        return parts_->decider().equivalentGiven(parts_->toC(candidate), given, context).isYes();
+    };
+    const SymbolicExprPrinter& printer = parts_->cPrinter;
+    ImpliedCondition implied(table, printer, known.id(), isEqual);
+    SymbolicExprId best = implied.shorten(condition.id());
+    // Another form may have operands to take away that this one hides.
+    const SymbolicExprId simple = simplify(condition, true).id();
+    for (const SymbolicExprId form : {simple, AND(known, condition, true).id()}) {
+        if (form == condition.id() || !isEqual(form))
+            continue;
+        const SymbolicExprId other = implied.shorten(form);
+        if (printer.textLength(other) < printer.textLength(best))
+            best = other;
+    }
+    return best;
+}
+
+std::string VCService::printWitness(const Witness& witness) {
+    std::string text;
+    for (const UnknownValue& each : witness)
+        text += (text.empty() ? "" : ", ") + parts_->cPrinter(each.unknown) + "=" + std::to_string(each.value);
+    return text;
+}
+
+} // namespace VT

@@ -1,0 +1,237 @@
+// Every operator on every pair of corner values, against arithmetic written down again over wide integers.
+#include "base/eval/Eval.hpp"
+#include "tests/support/AnyNode.hpp"
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <limits>
+
+namespace VT::Testing {
+namespace {
+
+constexpr double infinity = std::numeric_limits<double>::infinity();
+constexpr double threshold = 1.4901161193847656e-08;
+constexpr std::int64_t greatest = 2147483647;
+constexpr std::int64_t least = -2147483648;
+
+const std::vector<SymbolicScalar>& corners() {
+    static const std::vector<SymbolicScalar> all = [] {
+        std::vector<SymbolicScalar> values{false, true};
+        for (const std::int64_t value :
+             {least, least + 1, std::int64_t{-33}, std::int64_t{-32}, std::int64_t{-31}, std::int64_t{-7},
+              std::int64_t{-1}, std::int64_t{0}, std::int64_t{1}, std::int64_t{2}, std::int64_t{31}, std::int64_t{32},
+              std::int64_t{33}, std::int64_t{46341}, greatest - 1, greatest})
+            values.emplace_back(static_cast<std::int32_t>(value));
+        for (const double value : {threshold, std::nextafter(threshold, 0.0), std::nextafter(threshold, 1.0), 0.0, 0.5,
+                                   0.3, 0.1 + 0.2, 1.0, 1.0 + threshold, 31.9, 32.0, 2147483647.5, 2147483648.0,
+                                   2147483648.5, 2147483649.0, 1e300, 5e-324, infinity}) {
+            values.emplace_back(value);
+            values.emplace_back(-value);
+        }
+        values.emplace_back(std::numeric_limits<double>::quiet_NaN());
+        return values;
+    }();
+    return all;
+}
+
+/// A scalar in the oracle's hands: an integer without bounds, or a real.
+struct Wide {
+    bool isReal;
+    bool isBool;
+    std::int64_t integer;
+    double real;
+
+    explicit Wide(const SymbolicScalar& scalar)
+        : isReal(scalar.index() == 2),
+          isBool(scalar.index() == 0),
+          integer(isReal   ? 0
+                  : isBool ? (scalar.getBool() ? 1 : 0)
+                           : scalar.getInt()),
+          real(isReal ? scalar.getDouble() : static_cast<double>(integer)) {}
+
+    /// What bit operators see.
+    [[nodiscard]] std::int64_t bits() const {
+        if (!isReal)
+            return static_cast<std::int64_t>(integer);
+        if (std::isnan(real))
+            return 0;
+        const double cut = std::trunc(real);
+        return cut > 2147483647.0 ? greatest : cut < -2147483648.0 ? least : static_cast<std::int64_t>(cut);
+    }
+
+    [[nodiscard]] bool isTrue() const { return isReal ? !(real == 0.0) : integer != 0; }
+};
+
+/// The integer of 32 bits that is congruent.
+SymbolicScalar wrap(std::int64_t value) {
+    const std::int64_t modulus = std::int64_t{1} << 32;
+    std::int64_t rest = value % modulus;
+    if (rest < 0)
+        rest += modulus;
+    return static_cast<std::int32_t>(static_cast<std::int64_t>(rest > greatest ? rest - modulus : rest));
+}
+
+SymbolicScalar saturate(std::int64_t value) {
+    return static_cast<std::int32_t>(static_cast<std::int64_t>(value > greatest ? greatest
+                                                               : value < least  ? least
+                                                                                : value));
+}
+
+/// By multiplication and division with a power of two, rounded down.
+SymbolicScalar shift(std::int64_t value, std::int64_t amount) {
+    if (amount >= 0)
+        return amount > 31 ? SymbolicScalar(0) : wrap(value << amount);
+    if (amount < -31)
+        return value < 0 ? -1 : 0;
+    const std::int64_t divisor = std::int64_t{1} << -amount;
+    return static_cast<std::int32_t>((value - (((value % divisor) + divisor) % divisor)) / divisor);
+}
+
+SymbolicScalar divide(const Wide& a, const Wide& b) {
+    if (a.isReal || b.isReal) {
+        if (b.real >= threshold || b.real <= -threshold)
+            return a.real / b.real;
+        return std::isnan(a.real) ? a.real : std::signbit(a.real) && a.real != 0 ? -infinity : infinity;
+    }
+    if (b.integer != 0)
+        return saturate(a.integer / b.integer);
+    if (a.integer == 0)
+        return !a.isBool && !b.isBool ? 0 : static_cast<std::int32_t>(greatest);
+    return static_cast<std::int32_t>(a.integer > 0 ? greatest : least);
+}
+
+SymbolicScalar remainder(const Wide& a, const Wide& b) {
+    if (a.isReal || b.isReal)
+        return b.real > -threshold && b.real < threshold ? a.real : std::fmod(a.real, b.real);
+    return saturate(b.integer == 0 ? a.integer : a.integer % b.integer);
+}
+
+bool equal(const Wide& a, const Wide& b) {
+    if (!a.isReal && !b.isReal)
+        return a.integer == b.integer;
+    if (std::isnan(a.real) || std::isnan(b.real))
+        return std::isnan(a.real) && std::isnan(b.real);
+    return a.real == b.real || std::abs(a.real - b.real) < threshold;
+}
+
+bool less(const Wide& a, const Wide& b) {
+    return a.isReal || b.isReal ? a.real < b.real : a.integer < b.integer;
+}
+
+SymbolicScalar expected(SymbolicOp op, const Wide& a, const Wide& b) {
+    const bool real = a.isReal || b.isReal;
+    const auto bitwise = [&](auto combine) { // bit by bit
+        std::int64_t result = 0;
+        for (int bit = 0; bit < 32; ++bit)
+            if (combine((a.bits() >> bit) % 2 != 0, (b.bits() >> bit) % 2 != 0))
+                result += std::int64_t{1} << bit;
+        return wrap(result);
+    };
+    switch (op) {
+    case SymbolicOp::Plus:
+        return real ? SymbolicScalar(a.real + b.real) : wrap(a.integer + b.integer);
+    case SymbolicOp::Minus:
+        return real ? SymbolicScalar(a.real - b.real) : wrap(a.integer - b.integer);
+    case SymbolicOp::Multiply:
+        return real ? SymbolicScalar(a.real * b.real) : wrap(a.integer * b.integer);
+    case SymbolicOp::UnaryMinus:
+        return a.isReal ? SymbolicScalar(-a.real) : wrap(-a.integer);
+    case SymbolicOp::Divide:
+        return divide(a, b);
+    case SymbolicOp::Modulo:
+        return remainder(a, b);
+    case SymbolicOp::Equal:
+        return equal(a, b);
+    case SymbolicOp::NotEqual:
+        return !equal(a, b);
+    case SymbolicOp::LessThan:
+        return less(a, b);
+    case SymbolicOp::GreaterThan:
+        return less(b, a);
+    case SymbolicOp::LessThanEqual:
+        return less(a, b) || equal(a, b);
+    case SymbolicOp::GreaterThanEqual:
+        return less(b, a) || equal(a, b);
+    case SymbolicOp::And:
+        return a.isTrue() && b.isTrue();
+    case SymbolicOp::Or:
+        return a.isTrue() || b.isTrue();
+    case SymbolicOp::Not:
+        return !a.isTrue();
+    case SymbolicOp::BitAnd:
+        return bitwise([](bool x, bool y) { return x && y; });
+    case SymbolicOp::BitOr:
+        return bitwise([](bool x, bool y) { return x || y; });
+    case SymbolicOp::BitXOr:
+        return bitwise([](bool x, bool y) { return x != y; });
+    case SymbolicOp::BitCompl:
+        return wrap(-1 - static_cast<std::int64_t>(a.bits()));
+    case SymbolicOp::ShiftLeft:
+        return shift(a.bits(), b.bits());
+    case SymbolicOp::ShiftRight:
+        return shift(a.bits(), -b.bits());
+    default:
+        ADD_FAILURE() << "the oracle does not know " << operatorInfo(op).name;
+        return false;
+    }
+}
+
+SymbolicExprId literal(SymbolicExprTable& table, const SymbolicScalar& value) {
+    if (value.type() == ScalarType::Double) {
+        if (value == SymbolicScalar(-0.0)) // as a literal it is that of 0
+            return SymbolicUnaryMinusExpr(table, literal(table, 0.0)).getId(table);
+        const SymbolicExprId found = SymbolicDoubleValue(table, value.getDouble()).getId(table);
+        return found != invalidId ? found : table.size() - 1; // NaN is not found
+    }
+    if (value.type() == ScalarType::Int)
+        return SymbolicIntValue(table, value.getInt()).getId(table);
+    return SymbolicString(table, value.getBool() ? "true" : "false").getId(table);
+}
+
+std::string shown(const SymbolicScalar& value) {
+    return std::string(1, "bid"[value.index()]) + ":" + std::to_string(value.toDouble());
+}
+
+TEST(Arithmetic, AgreesWithWideIntegersOnEveryPairOfCornerValues) {
+    SymbolicExprTable table;
+    const SymbolicExprId a = SymbolicString(table, "a").getId(table);
+    const SymbolicExprId b = SymbolicString(table, "b").getId(table);
+    std::vector<SymbolicExprId> literals;
+    for (const SymbolicScalar& value : corners())
+        literals.push_back(literal(table, value));
+    std::size_t operators = 0;
+    for (const OperatorInfo& row : operatorTable()) {
+        if (row.shape != "Unary" && row.shape != "Binary")
+            continue;
+        const std::size_t operands = operandCount(row.op).value();
+        const SymbolicExprId id = makeAny(table, row.op, {"", 0, 0, {a, b}});
+        const SymbolicExprEval evaluator(table);
+        if (scalarRuleIndex(row.op) == ScalarRuleIndex::None) {
+            EXPECT_THROW(static_cast<void>(evaluator.eval(id)), HostDiagnostic) << row.name;
+            EXPECT_THROW(static_cast<void>(evaluator.prepare(id)), HostDiagnostic) << row.name;
+            continue;
+        }
+        ++operators;
+        PreparedExpr prepared = evaluator.prepare(id);
+        for (std::size_t i = 0; i < corners().size(); ++i)
+            for (std::size_t j = 0; j < (operands == 1 ? 1 : corners().size()); ++j) {
+                const SymbolicScalar& left = corners()[i];
+                const SymbolicScalar& right = corners()[j];
+                const SymbolicScalar wanted = visibleScalar(expected(row.op, Wide(left), Wide(right)));
+                table.registerValueId(a, literals[i]);
+                table.registerValueId(b, literals[j]);
+                prepared.set(0, left);
+                if (operands == 2)
+                    prepared.set(1, right);
+                const SymbolicScalar answer = evaluator.eval(id).scalar();
+                ASSERT_EQ(answer, wanted) << shown(left) << " " << row.name << " " << shown(right) << " is "
+                                          << shown(answer) << ", not " << shown(wanted);
+                ASSERT_EQ(prepared.run().scalar(), wanted) << shown(left) << " " << row.name << " " << shown(right);
+            }
+    }
+    EXPECT_EQ(operators, scalarRules.size());
+}
+
+} // namespace
+} // namespace VT::Testing

@@ -1,0 +1,225 @@
+// Printed conditions are decided by a real preprocessor and a real compiler as brute force decides them.
+//
+// Pairs of a condition and values count where C defines what is computed: no division by zero, no shift out of range,
+// nothing outside an int.
+#include "base/print/CTextObstacles.hpp"
+#include "base/print/PreprocessorVCExpr.hpp"
+#include "base/simplify/Simplify.hpp"
+#include "tests/preprocessor/Judges.hpp"
+#include "tests/support/AnyNode.hpp"
+#include "tests/support/CTruth.hpp"
+#include "tests/support/Corpus.hpp"
+#include "tests/support/Parsing.hpp"
+
+#include <gtest/gtest.h>
+#include <set>
+
+namespace VT::Testing {
+namespace {
+
+using Op = SymbolicOp;
+
+const std::vector<std::string> variables{"A", "B", "C", "S.x", "S.y"};
+
+/// Random expressions of all operators that C text may hold, and of some that it may not.
+class Expressions {
+public:
+    Expressions(SymbolicExprTable& table, CTextUse use) : table_(table), use_(use) {}
+
+    SymbolicExprId make(int depth) {
+        static constexpr OperatorSet made = [] {
+            OperatorSet set = OperatorSet::where([](const OperatorInfo& row) {
+                return (row.form == OperatorForm::Infix || row.form == OperatorForm::Prefix) && row.precedence > 2 &&
+                       row.c.find_first_of(".\\") == std::string_view::npos;
+            });
+            set.add(Op::Power);
+            return set;
+        }();
+        if (depth == 0 || below(8) == 0)
+            return leaf();
+        for (;;) {
+            const auto op = static_cast<Op>(below(operatorCount));
+            if (made.contains(op) && (op != Op::Power || below(4) == 0)) {
+                std::vector<SymbolicExprId> inputs;
+                for (std::size_t i = 0; i < *operandCount(op); ++i)
+                    inputs.push_back(make(depth - 1));
+                return makeAny(table_, op, {{}, 0, 0, std::move(inputs)});
+            }
+        }
+    }
+
+    std::int64_t value() {
+        static constexpr std::int64_t corners[] = {2147483647, -2147483647 - 1, 31, 32, -32, 2147483646, 65536};
+        return below(8) == 0 ? corners[below(std::size(corners))] : static_cast<std::int64_t>(below(9)) - 4;
+    }
+
+    std::size_t below(std::size_t bound) { return std::uniform_int_distribution<std::size_t>(0, bound - 1)(random_); }
+
+private:
+    SymbolicExprId name(const std::string& text) { return SymbolicString(table_, text).getId(table_); }
+
+    SymbolicExprId leaf() {
+        const bool directive = use_ == CTextUse::Directive;
+        switch (below(directive ? 12 : 10)) {
+        case 0:
+        case 1:
+        case 2:
+            return SymbolicIntValue(table_, static_cast<int>(value())).getId(table_);
+        case 3:
+            return name(below(2) == 0 ? "true" : "false");
+        case 10:
+            return SymbolicFcnCall1UExpr(table_, name("defined"), name(below(2) == 0 ? "A" : "D")).getId(table_);
+        case 11:
+            return below(3) == 0 ? SymbolicDoubleValue(table_, 0.5).getId(table_) : name("S_z");
+        default:
+            const std::string& variable = variables[below(variables.size())];
+            if (variable.size() == 1)
+                return name(variable);
+            return SymbolicMemberValue(table_, name("S"), variable.substr(2)).getId(table_);
+        }
+    }
+
+    SymbolicExprTable& table_;
+    CTextUse use_;
+    std::mt19937_64 random_{20};
+};
+
+/// Questions to the preprocessor and the answers that are right.
+struct Quiz {
+    Preprocessor preprocessor;
+    std::string right;
+    std::vector<std::string> asked;
+
+    void ask(const std::string& text, bool holds) {
+        preprocessor.ask(text);
+        right += holds ? '1' : '0';
+        asked.push_back(text);
+    }
+
+    void expectDecidedRight() const {
+        const std::string decided = preprocessor.decide();
+        ASSERT_EQ(decided.size(), right.size());
+        std::size_t differences = 0;
+        for (std::size_t i = 0; i < right.size(); ++i)
+            if (decided[i] != right[i] && ++differences <= 5)
+                ADD_FAILURE() << asked[i] << " is decided as " << decided[i];
+        std::cout << "preprocessor: " << asked.size() << " decisions, " << differences << " differences\n";
+        EXPECT_EQ(differences, 0U);
+    }
+};
+
+struct Asked {
+    CTruth truth;
+    std::string text;
+};
+
+TEST(Decisions, RandomConditionsInDirectives) {
+    SymbolicExprTable table;
+    Expressions expressions(table, CTextUse::Directive);
+    std::vector<Asked> conditions;
+    while (conditions.size() < 4500) {
+        const SymbolicExprId id = expressions.make(4);
+        if (findCTextObstacles(table, id, CTextUse::Directive).empty())
+            conditions.push_back({CTruth(table, id), PreprocessorVCExpr(table, false, id % 2 == 0).print(id)});
+    }
+    Quiz quiz;
+    for (int round = 0; round < 40; ++round) {
+        Assignment values;
+        for (const char* const name : {"A", "B", "C", "S.x", "S.y", "S_z"})
+            if (expressions.below(10) != 0)
+                values[name] = expressions.value();
+        quiz.preprocessor.define(values);
+        for (const Asked& condition : conditions)
+            if (const auto value = condition.truth.under(values))
+                quiz.ask(condition.text, *value != 0);
+    }
+    EXPECT_GE(quiz.asked.size(), 100'000U);
+    quiz.expectDecidedRight();
+}
+
+/// Whether names mean to the preprocessor what the definitions say.
+bool areFree(const std::vector<std::string>& names) {
+    return std::ranges::none_of(names, [](const std::string& name) {
+        return name.starts_with("__has_") || name.starts_with("__STDC") || name == "__LINE__" || name == "__COUNTER__";
+    });
+}
+
+TEST(Decisions, RealConditionsAsTheyStandAndSimplified) {
+    SymbolicExprTable table;
+    const SymbolicExprSimplify simplifier(table);
+    std::vector<Asked> conditions;
+    std::set<std::string> names;
+    std::set<std::string> functions;
+    for (const CorpusFile& file : corpusFiles) {
+        for (const std::string& line : corpusLines(file.name)) {
+            const SymbolicExprId id = parse(table, line, true, false).id;
+            if (id == invalidId || !findCTextObstacles(table, id, CTextUse::Directive).empty())
+                continue;
+            const CTruth truth(table, id);
+            if (!areFree(truth.names()))
+                continue;
+            names.insert(truth.names().begin(), truth.names().end());
+            functions.insert(truth.functions().begin(), truth.functions().end());
+            std::uint64_t passes = 0;
+            PreprocessorVCExpr printer(table, false, true);
+            conditions.push_back({truth, printer.print(id)});
+            conditions.push_back({truth, printer.print(simplifier.simplify(id, passes))});
+        }
+    }
+    for (const char* word : {"true", "false", "defined"})
+        names.erase(word);
+    EXPECT_GT(conditions.size(), 30'000U);
+    Quiz quiz;
+    std::mt19937_64 random(4);
+    for (int round = 0; round < 3; ++round) {
+        Assignment values;
+        for (const std::string& name : names)
+            if (functions.contains(name) || random() % 4 != 0)
+                values[name] = static_cast<std::int64_t>(random() % 5) - 1;
+        quiz.preprocessor.define(values, {functions.begin(), functions.end()});
+        for (const Asked& condition : conditions)
+            if (const auto value = condition.truth.under(values))
+                quiz.ask(condition.text, *value != 0);
+    }
+    quiz.expectDecidedRight();
+}
+
+TEST(Decisions, ValuesOfRandomExpressionsInCompiledPrograms) {
+    SymbolicExprTable table;
+    Expressions expressions(table, CTextUse::Program);
+    const SymbolicExprPrinter printer(table, false);
+    Compiler compiler(variables);
+    std::vector<Asked> asked;
+    std::vector<Compiler::Question> questions;
+    std::vector<std::int64_t> right;
+    while (asked.size() < 2000) {
+        const SymbolicExprId id = expressions.make(4);
+        if (!findCTextObstacles(table, id, CTextUse::Program).empty())
+            continue;
+        asked.push_back({CTruth(table, id), printer(id)});
+        compiler.add(asked.back().text);
+        for (int i = 0; i < 80; ++i) {
+            Compiler::Question question{asked.size() - 1, {}};
+            Assignment values;
+            for (const std::string& variable : variables) {
+                question.values.push_back(expressions.value());
+                values[variable] = question.values.back();
+            }
+            if (const auto value = asked.back().truth.under(values)) {
+                questions.push_back(std::move(question));
+                right.push_back(*value);
+            }
+        }
+    }
+    const std::vector<std::int64_t> computed = compiler.compute(questions);
+    ASSERT_EQ(computed.size(), right.size());
+    std::size_t differences = 0;
+    for (std::size_t i = 0; i < right.size(); ++i)
+        if (computed[i] != right[i] && ++differences <= 5)
+            ADD_FAILURE() << asked[questions[i].expression].text << " is " << computed[i] << ", not " << right[i];
+    std::cout << "compiler: " << right.size() << " values, " << differences << " differences\n";
+    EXPECT_GE(right.size(), 100'000U);
+}
+
+} // namespace
+} // namespace VT::Testing

@@ -1,0 +1,122 @@
+#include "tests/preprocessor/Judges.hpp"
+
+#include <algorithm>
+#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <sstream>
+#include <stdexcept>
+
+namespace VT::Testing {
+
+namespace {
+
+/// A directory that lives as long as this.
+class Directory {
+public:
+    Directory() {
+        std::string pattern = (std::filesystem::temp_directory_path() / "vtsym-XXXXXX").string();
+        if (mkdtemp(pattern.data()) == nullptr)
+            throw std::runtime_error("no directory for files");
+        path_ = pattern;
+    }
+
+    Directory(const Directory&) = delete;
+    Directory& operator=(const Directory&) = delete;
+
+    ~Directory() { std::filesystem::remove_all(path_); }
+
+    void write(const std::string& name, const std::string& content) const { std::ofstream(path_ / name) << content; }
+
+    [[nodiscard]] std::string read(const std::string& name) const {
+        std::ostringstream content;
+        content << std::ifstream(path_ / name).rdbuf();
+        return content.str();
+    }
+
+    /// Runs a command there.
+    void run(const std::string& command) const {
+        if (std::system(("cd '" + path_.string() + "' && { " + command + "; } 2>words").c_str()) != 0)
+            throw std::runtime_error(command + ": " + read("words").substr(0, 2000));
+    }
+
+private:
+    std::filesystem::path path_;
+};
+
+std::string macroName(std::string name) {
+    for (char& c : name)
+        c = c == '.' ? '_' : c;
+    return name;
+}
+
+} // namespace
+
+void Preprocessor::define(const Assignment& values, const std::vector<std::string>& functions) {
+    for (const std::string& name : defined_)
+        file_ += "#undef " + name + "\n";
+    defined_.clear();
+    for (const auto& [name, value] : values) {
+        defined_.push_back(macroName(name));
+        const bool isFunction = std::ranges::find(functions, name) != functions.end();
+        file_ += "#define " + defined_.back() + (isFunction ? "(...) " : " ") + std::to_string(value) + "\n";
+    }
+}
+
+std::string Preprocessor::decide() const {
+    const Directory directory;
+    directory.write("conditions.h", file_);
+    directory.run("cpp -P -undef conditions.h decided");
+    std::string answers = directory.read("decided");
+    std::erase_if(answers, [](char c) { return c != '0' && c != '1'; });
+    return answers;
+}
+
+std::string Compiler::program() const {
+    std::string text = "#include <stdbool.h>\n#include <stdio.h>\n";
+    std::map<std::string, std::string> fields;
+    for (const std::string& variable : variables_) {
+        const std::size_t point = variable.find('.');
+        if (point == std::string::npos)
+            text += "int " + variable + ";\n";
+        else
+            fields[variable.substr(0, point)] += "int " + variable.substr(point + 1) + "; ";
+    }
+    for (const auto& [name, members] : fields)
+        text += "struct { " + members + "} " + name + ";\n";
+    std::string addresses;
+    for (const std::string& variable : variables_)
+        addresses += "&" + variable + ", ";
+    text += "int *variables[] = {" + addresses + "};\n";
+    std::string functions;
+    for (std::size_t i = 0; i < expressions_.size(); ++i) {
+        const std::string name = "f" + std::to_string(i);
+        text += "long long " + name + "(void) { return " + expressions_[i] + "; }\n";
+        functions += name + ", ";
+    }
+    return text + "long long (*functions[])(void) = {" + functions +
+           "};\nint main(void) {\n  unsigned long f;\n  while (scanf(\"%lu\", &f) == 1) {\n"
+           "    for (unsigned v = 0; v < sizeof variables / sizeof *variables; ++v) scanf(\"%d\", variables[v]);\n"
+           "    printf(\"%lld\\n\", functions[f]());\n  }\n}\n";
+}
+
+std::vector<std::int64_t> Compiler::compute(const std::vector<Question>& questions) const {
+    const Directory directory;
+    directory.write("program.c", program());
+    std::ostringstream input;
+    for (const Question& question : questions) {
+        input << question.expression;
+        for (const std::int64_t value : question.values)
+            input << ' ' << value;
+        input << '\n';
+    }
+    directory.write("questions", input.str());
+    directory.run("gcc -w -O0 -o program program.c && ./program <questions >answers");
+    std::istringstream answers(directory.read("answers"));
+    std::vector<std::int64_t> values;
+    for (std::int64_t value = 0; answers >> value;)
+        values.push_back(value);
+    return values;
+}
+
+} // namespace VT::Testing

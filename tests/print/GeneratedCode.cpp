@@ -1,0 +1,220 @@
+// Texts of conditions for generated code.
+#include "base/print/CTextObstacles.hpp"
+#include "base/print/Predicates.hpp"
+#include "base/print/StringifyImpliedCondition.hpp"
+#include "tests/print/Reading.hpp"
+#include "tests/support/Parsing.hpp"
+#include "tests/support/RandomCondition.hpp"
+#include "tests/support/Truth.hpp"
+
+#include <gtest/gtest.h>
+
+namespace VT::Testing {
+namespace {
+
+using Op = SymbolicOp;
+
+class GeneratedCode : public testing::Test {
+protected:
+    SymbolicExprId read(const std::string& text) {
+        const ParseAnswer answer = parse(table, text);
+        EXPECT_FALSE(answer.error) << text;
+        return answer.id;
+    }
+
+    SymbolicExprTable table;
+    Trees tree{table};
+};
+
+TEST_F(GeneratedCode, ConditionsOfDirectives) {
+    struct Row {
+        SymbolicExprId id;
+        std::string clarified;
+        std::string bare;  ///< empty: as clarified
+        std::string quill; ///< of the clarified text; empty: as in C
+    };
+
+    const SymbolicExprId a = tree.name("a"), b = tree.name("b"), c = tree.name("c");
+    const SymbolicExprId both = tree(Op::SingleAnd, a, b), either = tree(Op::SingleOr, a, b);
+    const std::vector<Row> rows{
+        {read("true && Mode == 1"), "1 && Mode == 1", "", "true && Mode == 1"},
+        {read("false"), "0", "", "false"},
+        {read("A.B == 2"), "A_B == 2", "", "A.B == 2"},
+        {read("A.B.C+1"), "A_B_C + 1", "", "A.B.C + 1"},
+        {read("A || B && C"), "A || (B && C)", "A || B && C", ""},
+        {read("A && B && C"), "A && B && C", "", ""},
+        {read("A || (B || C)"), "A || (B || C)", "", ""},
+        {read("a == b == c"), "(a == b) == c", "", ""},
+        {read("a == (b == c)"), "a == (b == c)", "", ""},
+        {read("a < b == c"), "a < b == c", "", ""},
+        {read("(a < b) >= c"), "(a < b) >= c", "", ""},
+        {read("(a == b) < c"), "(a == b) < c", "", ""},
+        {read("!(a - -3 * -b)"), "!(a - -3 * -b)", "", "~(a - -3 * -b)"},
+        {read("a - (b - c) % 2"), "a - (b - c) % 2", "", "a - rem(b - c,2)"},
+        {read("defined(A.B) || f(a, b + 1) != 0"), "defined(A_B) || f(a,b + 1) != 0", "",
+         "defined(A.B) || f(a,b + 1) ~= 0"},
+        {tree(Op::And, both, either), "(a & b) && (a | b)", "a & b && a | b", ""},
+        {tree(Op::Or, both, either), "(a & b) || (a | b)", "a & b || a | b", ""},
+        {tree(Op::SingleOr, both, c), "(a & b) | c", "a & b | c", ""},
+        {tree(Op::SingleOr, c, both), "c | (a & b)", "c | a & b", ""},
+        {tree(Op::SingleAnd, either, c), "(a | b) & c", "", ""},
+    };
+    for (const Row& row : rows) {
+        EXPECT_EQ(PreprocessorVCExpr(table, false, true).print(row.id), row.clarified);
+        EXPECT_EQ(PreprocessorVCExpr(table, false).print(row.id), row.bare.empty() ? row.clarified : row.bare);
+        PreprocessorVCExpr visitor(table, true, true);
+        visitor.execute(table, row.id);
+        EXPECT_EQ(visitor.get(), row.quill.empty() ? row.clarified : row.quill);
+        StringifyImpliedCondition nothingKnown(table, false, true, invalidId);
+        EXPECT_EQ(nothingKnown.print(row.id), row.clarified);
+    }
+    table.insertAliasInfo("Mode", "true");
+    PreprocessorVCExpr aliased(table, false, true, SymbolicExprAliasPrinterPredicate(table));
+    EXPECT_EQ(aliased.print(read("Mode == 1")), "1 == 1");
+}
+
+TEST_F(GeneratedCode, ConditionsUnderAKnownOne) {
+    struct Row {
+        std::string known;
+        std::string condition;
+        std::string left;
+    };
+
+    const std::vector<Row> rows{
+        {"A == 1 && B", "A == 1 && C", "C"},
+        {"A == 1 && B", "C && (D || B) && A == 1", "C"},
+        {"A == 1 && B", "B && A == 1", "1"},
+        {"A == 1", "A != 1", "0"},
+        {"A == 1", "A != 1 || B", "B"},
+        {"A == 1", "1 == A && !(A != 1) && B", "B"},
+        {"A < B", "B > A && A >= B", "0"},
+        {"A < B", "B <= A || C || D", "C || D"},
+        {"!(A || B)", "A || C && !B", "C"},
+        {"!(A && B)", "A && B || C", "C"},
+        {"!(A && B)", "A && C", "A && C"},
+        {"A || B", "(A || B) && A", "A"},
+        {"A", "!(A && B) || C", "!B || C"},
+        {"A", "(A && B) + 1 == 2 && (A && B)", "(A && B) + 1 == 2 && B"},
+        {"A", "(B && (A && C)) == 1", "(B && C) == 1"},
+        {"true", "true && A", "A"},
+        {"A == 1 && A == 2", "A == 1", "1"},
+    };
+    for (const Row& row : rows) {
+        const SymbolicExprId known = read(row.known);
+        const SymbolicExprId condition = read(row.condition);
+        StringifyImpliedCondition printer(table, false, true, known);
+        EXPECT_EQ(printer.print(condition), row.left) << row.condition << " given " << row.known;
+        printer.forget();
+        EXPECT_EQ(printer.print(condition), row.left);
+        StringifyImpliedCondition visitor(table, false, true, known);
+        table.get(condition)->accept(table, visitor);
+        EXPECT_EQ(visitor.get(), row.left);
+    }
+    EXPECT_EQ(StringifyImpliedCondition(table, true, true, read("A")).print(read("A || B")), "true");
+}
+
+TEST_F(GeneratedCode, WhatIsLeftIsTrueExactlyWhereTheConditionIs) {
+    const ConditionShape shape{
+        .symbols = {"A", "B", "C"}, .lowest = 0, .highest = 1, .symbolPairs = true, .truthValues = true};
+    std::mt19937_64 random(9);
+    std::size_t shorter = 0;
+    for (int i = 0; i < 1500; ++i) {
+        const std::string given = randomCondition(random, 1 + random() % 4, shape);
+        const std::string other = randomCondition(random, 1 + random() % 6, shape);
+        const SymbolicExprId known = read(given);
+        const SymbolicExprId condition = read(i % 2 == 0 ? other : "(" + other + ") && (" + given + ")");
+        StringifyImpliedCondition printer(table, false, true, known);
+        const std::string text = printer.print(condition);
+        const SymbolicExprId left = read(text);
+        shorter += text.size() < PreprocessorVCExpr(table, false, true).print(condition).size() ? 1U : 0U;
+        bool canHold = false;
+        forEachAssignment(shape.symbols, -1, 2, [&](const Assignment& values) {
+            if (holds(table, known, values)) {
+                canHold = true;
+                ASSERT_EQ(holds(table, left, values), holds(table, condition, values)) << text;
+            }
+        });
+        EXPECT_TRUE(!canHold || printer.print(known) == "1") << given;
+    }
+    EXPECT_GT(shorter, 700U);
+}
+
+TEST_F(GeneratedCode, ObstaclesOfCText) {
+    struct Row {
+        SymbolicExprId id;
+        std::vector<CTextObstacle> inPrograms;
+        std::vector<CTextObstacle> inDirectives;
+    };
+
+    using enum CTextObstacle;
+    const SymbolicExprId a = tree.name("a"), b = tree.name("b"), truth = read("a > 1");
+    const SymbolicExprId call = tree(Op::FcnCall1U, a, b);
+    const std::vector<Row> rows{
+        {read("defined(A) && f(A, B) + ~(A % 2 << B / 3 ^ C) == -S.x.y"), {}, {}},
+        {tree(Op::SingleAnd, truth, tree(Op::Not, a)), {}, {}},
+        {tree(Op::SingleOr, truth, a), {BitwiseLogic}, {BitwiseLogic}},
+        {tree(Op::BitXOr, tree(Op::SingleOr, truth, truth), a), {BitwiseLogic}, {BitwiseLogic}},
+        {tree(Op::Equal, tree(Op::Power, a, b), tree(Op::Power, b, a)), {NoSuchOperator}, {NoSuchOperator}},
+        {read("a > .5"), {}, {RealConstant}},
+        {read("A.B_C && A.B == A_B.C"), {}, {SharedMacroName}},
+        {read("A.B || A_B"), {}, {SharedMacroName}},
+        {read("A.B.C || A_B"), {}, {}},
+        {tree(Op::MemberValue, call), {}, {MemberOfNoName}},
+        {tree(Op::FcnCall1U, read("S.f"), b), {}, {CalledNoName}},
+        {invalidId, {}, {}},
+    };
+    const auto obstacles = [&](SymbolicExprId id, CTextUse use) {
+        std::vector<CTextObstacle> found;
+        for (const CTextFinding& finding : findCTextObstacles(table, id, use))
+            if (found.empty() || found.back() != finding.obstacle)
+                found.push_back(finding.obstacle);
+        return found;
+    };
+    for (const Row& row : rows) {
+        SCOPED_TRACE(table.has(row.id) ? SymbolicExprPrinter(table, false)(row.id) : "");
+        EXPECT_EQ(obstacles(row.id, CTextUse::Program), row.inPrograms);
+        EXPECT_EQ(obstacles(row.id, CTextUse::Directive), row.inDirectives);
+    }
+    for (const OperatorInfo& op : operatorTable()) {
+        const bool onlyInQuill = op.op != Op::UnaryMinus && op.c.find_first_of(".\\':") != std::string_view::npos;
+        if (onlyInQuill && op.op != Op::MemberValue) {
+            const std::vector<SymbolicExprId> inputs(op.op == Op::QColon3               ? 3
+                                                     : op.form == OperatorForm::Postfix ? 1
+                                                                                        : 2,
+                                                     a);
+            EXPECT_EQ(obstacles(makeNode(table, op.op, inputs), CTextUse::Program), std::vector{NoSuchOperator})
+                << op.name;
+        }
+    }
+}
+
+TEST_F(GeneratedCode, SharedAndDeepConditions) {
+    const SymbolicExprId known = read("A == 1");
+    SymbolicExprId doubled = tree(Op::Or, known, read("B"));
+    SymbolicExprId open = read("C");
+    for (int i = 0; i < 64; ++i) {
+        doubled = tree(i % 2 == 0 ? Op::And : Op::Or, doubled, doubled);
+        open = tree(Op::And, open, open);
+    }
+    EXPECT_EQ(StringifyImpliedCondition(table, false, true, known).print(doubled), "1");
+    EXPECT_EQ(StringifyImpliedCondition(table, false, true, open).print(open), "1");
+    StringifyImpliedCondition printer(table, false, true, known);
+    EXPECT_THROW(static_cast<void>(printer.print(open)), std::length_error);
+    EXPECT_THROW(static_cast<void>(printer.print(invalidId)), std::out_of_range);
+    EXPECT_THROW(static_cast<void>(printer.get()), std::out_of_range);
+    EXPECT_TRUE(findCTextObstacles(table, open, CTextUse::Directive).empty());
+
+    SymbolicExprId spine = read("C");
+    SymbolicExprId member = read("S");
+    for (int i = 0; i < 200'000; ++i) {
+        spine = tree(i % 3 == 0 ? Op::Or : Op::And, spine, i % 3 == 1 ? known : tree.name("x" + std::to_string(i)));
+        member = tree(Op::MemberValue, member);
+    }
+    const std::string left = StringifyImpliedCondition(table, false, true, known).print(spine);
+    EXPECT_EQ(left.find("A == 1"), std::string::npos);
+    EXPECT_EQ(StringifyImpliedCondition(table, false, true, spine).print(spine), "1");
+    EXPECT_TRUE(findCTextObstacles(table, tree(Op::And, spine, member), CTextUse::Directive).empty());
+}
+
+} // namespace
+} // namespace VT::Testing

@@ -1,0 +1,186 @@
+// Decisions through the service: the operations, their texts, and conditions relative to others.
+#include "base/core/Limits.hpp"
+#include "host/Diagnostics.hpp"
+#include "tests/service/Customizers.hpp"
+#include "tests/support/RandomCondition.hpp"
+#include "tests/support/Truth.hpp"
+
+#include <gmock/gmock.h>
+
+namespace VT::Testing {
+namespace {
+
+std::string told(VCService& service, const Decision& decision) {
+    static const char* const answers[] = {"no", "yes", "undecided"};
+    const std::string answer = answers[static_cast<std::size_t>(decision.answer)];
+    return decision.witness ? answer + ": " + service.printWitness(*decision.witness) : answer;
+}
+
+TEST(ServiceDecisions, OfPairs) {
+    struct Row {
+        const char* a;
+        const char* b;
+        const char* implies;
+        const char* equivalent;
+        const char* disjoint;
+        const char* tighter;
+    };
+
+    constexpr Row rows[] = {
+        {"A<B && B<C", "A<C", "yes", "no: A=0, B=0, C=1", "no: A=0, B=1, C=2", "yes: A=0, B=0, C=1"},
+        {"A<C", "A<B && B<C", "no: A=0, B=0, C=1", "no: A=0, B=0, C=1", "no: A=0, B=1, C=2", "no: A=0, B=0, C=1"},
+        {"A==1||A==2||A==3", "A>=1 && A<=3", "yes", "yes", "no: A=1", "no"},
+        {"A<3", "A>3", "no: A=0", "no: A=0", "yes", "no: A=0"},
+        {"false", "true", "yes", "no: ", "yes", "yes: "},
+        {"", "A", "no: A=0", "no: A=0", "no: A=1", "no: A=0"},
+        // Operators that Quill writes as calls.
+        {"rem(n,2)==1", "n%2!=0", "yes", "no: n=-1", "no: n=1", "yes: n=-1"},
+        {"bitshift(x,-2)==1", "x>>2==1", "yes", "yes", "no: x=4", "no"},
+        {"(sim)", "!(codegen)", "yes", "yes", "no: (codegen)=0, (sim)=1", "no"},
+    };
+    for (const Row& row : rows) {
+        SCOPED_TRACE(std::string(row.a) + " with " + row.b);
+        for (const bool caching : {false, true}) {
+            const FreshService service(caching);
+            VCService& s = VCService::getInstance();
+            for (int again = 0; again < 2; ++again) {
+                EXPECT_EQ(told(s, s.impliesFromCConditions(row.a, row.b)), row.implies);
+                EXPECT_EQ(told(s, s.containsFromCConditions(row.b, row.a)), row.implies);
+                EXPECT_EQ(told(s, s.isEquivalentFromCConditions(row.a, row.b)), row.equivalent);
+                EXPECT_EQ(told(s, s.isEquivalentFromCConditions(row.b, row.a)), row.equivalent);
+                EXPECT_EQ(told(s, s.isDisjointFromCConditions(row.a, row.b)), row.disjoint);
+                EXPECT_EQ(told(s, s.isTighterThanFromCConditions(row.a, row.b)), row.tighter);
+                const Relation relation = s.compare(s.parseC(row.a), s.parseC(row.b));
+                EXPECT_EQ(relation.kind == RelationKind::Equivalent, std::string(row.equivalent) == "yes");
+                EXPECT_EQ(relation.onlyA.isNo(), std::string(row.implies) == "yes");
+            }
+        }
+    }
+}
+
+TEST(ServiceDecisions, OfQuillTextsAndSets) {
+    const FreshService service;
+    EXPECT_TRUE(service->impliesFromQConditions("A ~= 1 && A > 0", "A >= 2").isYes());
+    EXPECT_TRUE(service->isEquivalentFromQConditions("rem(n,2) == 0", "~rem(n,2)").isYes());
+    EXPECT_TRUE(service->isDisjointFromQConditions("A", "~A").isYes());
+    EXPECT_TRUE(service->containsFromQConditions("A | B", "B").isYes());
+    EXPECT_TRUE(service->isTighterThanFromQConditions("A == 1", "A").isYes());
+    EXPECT_TRUE(service->coversFromQConditions({"A < 3", "A == 3", "A > 3"}).isYes());
+    const SetDecision gap = service->coversFromCConditions({"A < 3", "A > 3"});
+    EXPECT_EQ(told(VCService::getInstance(), gap), "no: A=3");
+    const VCSymbolicExprId a = service->parseC("A>1");
+    const VCSymbolicExprId b = service->parseC("A<5");
+    EXPECT_EQ(service->isDisjoint({a, b}).members, std::pair(std::size_t{0}, std::size_t{1}));
+    EXPECT_THROW(service->impliesFromCConditions("A", "B ="), HostDiagnostic);
+    EXPECT_THROW(service->coversFromQConditions({"A", "B &&"}), HostDiagnostic);
+    for (const SymbolicExprId bad : {invalidId, SymbolicExprId{service->table().size() + 100}}) {
+        EXPECT_EQ(service->implies(a, bad).bound, DecisionBound::NoCondition);
+        EXPECT_EQ(service->compare(bad, a).bound, DecisionBound::NoCondition);
+        EXPECT_EQ(service->covers({a, bad}).bound, DecisionBound::NoCondition);
+        EXPECT_EQ(service->getImpliedCondition(bad, a), invalidId);
+        EXPECT_TRUE(service->computeUniqueAndOperandsId(bad).empty());
+    }
+}
+
+TEST(ServiceDecisions, FollowTheKeywordFlagAtTheTimeOfTheCall) {
+    const FreshService service;
+    const VCSymbolicExprId sim = service->parseC("(sim)");
+    const VCSymbolicExprId codegen = service->parseC("(codegen)");
+    EXPECT_TRUE(service->isDisjoint(sim, codegen).isYes());
+    const std::int32_t before = VTFEAT_VariantKeywordsSimCodegen->value();
+    VTFEAT_VariantKeywordsSimCodegen->setValue(0);
+    EXPECT_TRUE(service->isDisjoint(sim, codegen).isNo());
+    VTFEAT_VariantKeywordsSimCodegen->setValue(before);
+    EXPECT_TRUE(service->isDisjoint(sim, codegen).isYes());
+}
+
+TEST(ServiceSums, OfProducts) {
+    using testing::ElementsAre;
+    using testing::IsEmpty;
+    const FreshService service;
+    EXPECT_THAT(service->computeUniqueOrOperandsFromCCondition("c && (b==1 || A<2) || b==1 && c"),
+                ElementsAre("A<2 && c", "b==1 && c"));
+    EXPECT_THAT(service->computeUniqueAndOperandsFromCCondition("b && A!=1 && b"), ElementsAre("A!=1", "b"));
+    EXPECT_THAT(service->computeUniqueAndOperandsFromQCondition("b && A~=1"), ElementsAre("A~=1", "b"));
+    EXPECT_THAT(service->computeUniqueOrOperandsFromQCondition("b && A~=1"), ElementsAre("A~=1 && b"));
+    EXPECT_THAT(service->computeUniqueOrOperandsFromCCondition("A<1 && A>1"), IsEmpty());
+    EXPECT_THAT(service->computeUniqueAndOperandsFromCCondition("A<1 || A>=1"), IsEmpty());
+    EXPECT_THAT(service->computeUniqueOrOperandsFromCCondition("true"), ElementsAre(""));
+    EXPECT_THAT(service->computeUniqueAndOperandsFromCCondition("false"), ElementsAre("false"));
+}
+
+TEST(ImpliedConditions, AreShortest) {
+    struct Row {
+        const char* condition;
+        const char* known;
+        const char* result;
+    };
+
+    constexpr Row rows[] = {
+        {"A && B", "A", "B"},
+        {"A || B", "!A", "B"},
+        {"VERSION>=4 && VERSION>=2", "VERSION>=3", "VERSION>=4"},
+        {"A", "A>3", ""},
+        {"A==1", "A>3", "false"},
+        {"B", "A && !A", ""},
+        {"A && (B || C)", "A && !C", "B"},
+        {"A==1 || A==2 || A==3", "A>0", "A<=3"},
+        {"A==1 || A==2 || A==3", "A>0 && A<4", ""},
+        {"A && B || !A && C", "A", "B"},
+        {"(A || B) && (A || C)", "!A || B", "A || B && C"},
+        {"A>0 && B>0 && C>0", "A>2 && B==C", "B>0"},
+        {"!(A && B)", "A", "!B"},
+        {"A<B && B<C && A<C", "B<D", "A<B && B<C"},
+        {"A", "B", "A"},
+        {"A==1 || B", "true", "A==1 || B"},
+        {"A*B>3 && A*B>2", "C", "A*B>3"},
+    };
+    const FreshService service;
+    for (const Row& row : rows) {
+        SCOPED_TRACE(std::string(row.condition) + " given " + row.known);
+        EXPECT_EQ(service->getImpliedCExprFromCConditions(row.condition, row.known), row.result);
+    }
+    EXPECT_EQ(service->getImpliedQExprFromQConditions("A ~= 1 && B", "B | C & B"), "A~=1");
+    EXPECT_THROW(service->getImpliedCExprFromCConditions("A &&", "B"), HostDiagnostic);
+}
+
+TEST(ImpliedConditions, EqualTheGivenOneWhereTheKnownOneHolds) {
+    std::mt19937_64 random(30);
+    const ConditionShape shape{.symbols = {"A", "B"}, .symbolPairs = true, .truthValues = true};
+    std::size_t shorter = 0;
+    for (int round = 0; round < 400; ++round) {
+        const FreshService service;
+        const std::string condition = randomCondition(random, 1 + random() % 6, shape);
+        const std::string known = randomCondition(random, 1 + random() % 3, shape);
+        const VCSymbolicExprId given = service->parseC(condition);
+        const VCSymbolicExprId context = service->parseC(known);
+        const VCSymbolicExprId result = service->getImpliedCondition(given, context);
+        const std::string text = service->printCExpr(result);
+        if (result != service->table().getIdFALSE()) {
+            ASSERT_LE(text.size(), service->printCExpr(given).size());
+            ASSERT_LE(service->printQExpr(result).size(), service->printQExpr(given).size());
+        }
+        shorter += text.size() < service->printCExpr(given).size() ? 1U : 0U;
+        forEachAssignment(shape.symbols, -5, 6, [&](const Assignment& assignment) {
+            if (!holds(service->table(), context.id(), assignment))
+                return;
+            ASSERT_EQ(holds(service->table(), result.id(), assignment), holds(service->table(), given.id(), assignment))
+                << condition << " given " << known << " became " << text;
+        });
+    }
+    EXPECT_GT(shorter, 200U);
+}
+
+TEST(ImpliedConditions, OfManyOperandsStayWithinTheirBounds) {
+    const FreshService service;
+    std::string condition = "K";
+    for (int i = 0; i < 900; ++i)
+        condition += " && S" + std::to_string(i) + (i % 2 == 0 ? "" : ">=0");
+    EXPECT_EQ(service->getImpliedCExprFromCConditions(condition, condition), "");
+    const std::size_t nodes = service->table().size();
+    EXPECT_LT(service->getImpliedCExprFromCConditions(condition, "K && S1>4").size(), condition.size());
+    EXPECT_LT(service->table().size() - nodes, 4 * limits::impliedNodes);
+}
+
+} // namespace
+} // namespace VT::Testing

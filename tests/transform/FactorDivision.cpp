@@ -1,0 +1,133 @@
+// Divisions pulled outwards, judged in a finite field, where every division is exact.
+#include "base/transform/FactorDivision.hpp"
+#include "base/print/ExpressionPrinter.hpp"
+#include "base/simplify/Simplify.hpp"
+#include "tests/support/Parsing.hpp"
+
+#include <gtest/gtest.h>
+#include <map>
+#include <random>
+
+namespace VT::Testing {
+namespace {
+
+constexpr std::int64_t prime = 2'147'483'647;
+
+std::int64_t power(std::int64_t base, std::int64_t exponent) {
+    std::int64_t result = 1;
+    for (; exponent > 0; exponent /= 2, base = base * base % prime)
+        if (exponent % 2 != 0)
+            result = result * base % prime;
+    return result;
+}
+
+/// The value modulo a prime, each name worth a number of its own.
+std::int64_t valueOf(const SymbolicExprTable& table, SymbolicExprId id, std::map<SymbolicExprId, std::int64_t>& known) {
+    if (const auto found = known.find(id); found != known.end())
+        return found->second;
+    const SymbolicExpr& node = *table.get(id);
+    const auto in = [&](std::size_t i) { return valueOf(table, node.getInput(i), known); };
+    const std::int64_t value = [&]() -> std::int64_t {
+        switch (node.op()) {
+        case SymbolicOp::IntValue:
+            return static_cast<const SymbolicIntValue&>(node).getValue();
+        case SymbolicOp::Plus:
+            return in(0) + in(1);
+        case SymbolicOp::Minus:
+            return in(0) - in(1);
+        case SymbolicOp::UnaryMinus:
+            return -in(0);
+        case SymbolicOp::Multiply:
+            return in(0) * in(1);
+        case SymbolicOp::Divide:
+            return in(0) * power(in(1), prime - 2);
+        default:
+            return static_cast<std::int64_t>(node.getHash() % prime);
+        }
+    }();
+    return known[id] = (value % prime + prime) % prime;
+}
+
+class FactorDivision : public testing::Test {
+protected:
+    SymbolicExprId read(const std::string& text) { return parse(table, text).id; }
+
+    SymbolicExprId factored(SymbolicExprId id) { return SymbolicExprFactorDivision(table).factorDivision(id); }
+
+    std::string factored(const std::string& text) { return SymbolicExprPrinter(table, false)(factored(read(text))); }
+
+    SymbolicExprTable table;
+};
+
+TEST_F(FactorDivision, EveryOperatorOfQuotients) {
+    const std::vector<std::pair<std::string, std::string>> rows{
+        {"N/2 + M/3", "(N*3+M*2)/(2*3)"},
+        {"N/2 - 1", "(N-1*2)/2"},
+        {"1 + N/2", "(1*2+N)/2"},
+        {"N/2 % (M/3)", "N*3%(M*2)/(2*3)"},
+        {"N % (M/3)", "N*3%M/3"},
+        {"N/2 * (M/3)", "N*M/(2*3)"},
+        {"N * (M/2)", "N*M/2"},
+        {"N/2 * M", "N*M/2"},
+        {"(N/2) / (M/3)", "N*3/(2*M)"},
+        {"N/2/M", "N/(2*M)"},
+        {"N / (M/3)", "N*3/M"},
+        {"(N/2 + 1) / (M - L/3)", "(N+1*2)*3/(2*(M*3-L))"},
+        {"-(N/2) + !(M/3 == 1/K + 1)", "-(N/2)+!(M/3==(1+1*K)/K)"},
+        {"f(N/2 + 1)", "f((N+1*2)/2)"},
+    };
+    for (const auto& [before, after] : rows)
+        EXPECT_EQ(factored(before), after) << before;
+    for (const char* text : {"N*2 + M - K%3 == f(x)", "N/2", "(a + b)/(c*d)"})
+        EXPECT_EQ(factored(read(text)), read(text)) << text;
+    for (const SymbolicExprId id : {invalidId, SymbolicExprId{table.size()}})
+        EXPECT_EQ(factored(id), invalidId);
+    const SymbolicExprId x = read("x");
+    const SymbolicExprId elementWise = SymbolicDotDivExpr(table, SymbolicLDivExpr(table, x, x), x).getId(table);
+    EXPECT_EQ(factored(elementWise), elementWise);
+}
+
+TEST_F(FactorDivision, KeepsTheValueAndLeavesOneQuotient) {
+    std::mt19937_64 random(6);
+    for (int round = 0; round < 300; ++round) {
+        std::vector<SymbolicExprId> nodes{read("N"), read("M"), read("K"), read("3"), read("7")};
+        for (int i = 0; i < 12; ++i) {
+            const SymbolicExprId a = nodes[random() % nodes.size()], b = nodes[random() % nodes.size()];
+            const SymbolicExprId made[] = {
+                SymbolicPlusExpr(table, a, b).getId(table), SymbolicMinusExpr(table, a, b).getId(table),
+                SymbolicMultiplyExpr(table, a, b).getId(table), SymbolicDivideExpr(table, a, b).getId(table)};
+            std::map<SymbolicExprId, std::int64_t> values;
+            const SymbolicExprId chosen = made[random() % 4];
+            if (valueOf(table, chosen, values) != 0) // so that no divisor is zero
+                nodes.push_back(chosen);
+        }
+        std::uint64_t passes = 0;
+        const SymbolicExprId simplified = SymbolicExprSimplify(table).simplify(nodes.back(), passes);
+        const SymbolicExprId after = factored(nodes.back());
+        std::map<SymbolicExprId, std::int64_t> values;
+        std::map<SymbolicExprId, std::int64_t> below; // the nodes of the result
+        for (const SymbolicExprId rearranged : {simplified, factored(simplified)})
+            EXPECT_EQ(valueOf(table, nodes.back(), values), valueOf(table, rearranged, values));
+        EXPECT_EQ(valueOf(table, nodes.back(), values), valueOf(table, after, below));
+        below.erase(after);
+        for (const auto& [id, value] : below)
+            EXPECT_NE(table.get(id)->op(), SymbolicOp::Divide) << SymbolicExprPrinter(table, false)(after);
+        EXPECT_EQ(factored(after), after);
+    }
+}
+
+TEST_F(FactorDivision, SharedAndDeepExpressions) {
+    SymbolicExprId doubled = read("N/2");
+    for (int i = 0; i < 64; ++i)
+        doubled = SymbolicPlusExpr(table, doubled, doubled).getId(table);
+    SymbolicExprId spine = read("N/2");
+    for (int i = 0; i < 100'000; ++i)
+        spine = SymbolicDivideExpr(table, read("M"), spine).getId(table);
+    for (const SymbolicExprId id : {doubled, spine})
+        EXPECT_EQ(table.get(factored(id))->op(), SymbolicOp::Divide);
+    std::map<SymbolicExprId, std::int64_t> values;
+    EXPECT_EQ(valueOf(table, doubled, values), valueOf(table, factored(doubled), values));
+}
+
+} // namespace
+} // namespace VT::Testing
