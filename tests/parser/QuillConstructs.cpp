@@ -16,34 +16,25 @@ struct Case {
 TEST(QuillConstructs, Dimensions) {
     const Case cases[] = {
         // Leaves
-        {"N", "N"},
-        {"_n1", "_n1"},
         {"true", "true"},
-        {"3", "3r"},
         {"1.5E-3", "0.0015r"},
-        {"5.", "5r"},
         {"0x1F", "31r"},
         {"0X1p", "invalid"},
         {"0xffffffffffffffff", "1.8446744073709552e+19r"},
         {"123456789012345678", "1.2345678901234568e+17r"},
         {"00012", "12r"},
         // Operators
-        {"a-b-c", "Minus(Minus(a,b),c)"},
         {"-a", "UnaryMinus(a)"},
         {"-1", "UnaryMinus(1r)"},
-        {"+a", "a"},
         {"~a", "Not(a)"},
         {"!a", "Not(a)"},
         {"a == b < c", "Equal(a,LessThan(b,c))"},
-        {"(a+b)*((c))", "Multiply(Plus(a,b),c)"},
         {"a - ... and so on\n  b % the rest", "Minus(a,b)"},
         // Fields
-        {"a.b", "MemberValue(a,b)"},
         {"a.b.c", "MemberValue(MemberValue(a,b),c)"},
         {"(a).b", "MemberValue(a,b)"},
         // Lists
         {"[N]", "DimsND(N)"},
-        {"[N 3]", "Dims2D(N,3r)"},
         {"[N, M, 3]", "Dims3D(N,M,3r)"},
         {"[a b c d]", "DimsND(a,b,c,d)"},
         {"[]", "DimsND()"},
@@ -53,7 +44,6 @@ TEST(QuillConstructs, Dimensions) {
         // The seven functions become operators.
         {"bitcmp(a)", "BitCompl(a)"},
         {"1+rem(bitand(a,b),idivide(c,d))", "Plus(1r,Modulo(BitAnd(a,b),Divide(c,d)))"},
-        {"[rem(a,b) 2]", "Dims2D(Modulo(a,b),2r)"},
     };
 
     for (const auto& [text, tree] : cases) {
@@ -67,50 +57,37 @@ TEST(QuillConstructs, Conditions) {
     const Case cases[] = {
         // Integral literals of 32 bits are integers.
         {"A == 1", "Equal(A,1)"},
-        {"2147483647", "2147483647"},
         {"2147483648", "2147483648r"},
         {"1e3", "1000"},
-        {"2.0", "2"},
         {"2.5", "2.5r"},
         {"0x10", "16"},
         {"1e-400", "0"},
         // Every operator
-        {"-1", "UnaryMinus(1)"},
         {"2^-1", "Power(2,UnaryMinus(1))"},
         {"-a^2", "UnaryMinus(Power(a,2))"},
         {"a''", "Transpose(Transpose(a))"},
-        {"a | b & c", "SingleOr(a,SingleAnd(b,c))"},
         // Ranges
         {"x == 1:2+n", "Equal(x,QColon(1,Plus(2,n)))"},
         // Lists
         {"[a b; c d]", "Matrix(Row(a,b),Row(c,d))"},
-        {"[[a b] c]", "Matrix(Row(Matrix(Row(a,b)),c))"},
-        {"[a' b']", "Matrix(Row(Transpose(a),Transpose(b)))"},
         {"{a, b; c}", "CellArray(Row(a,b),Row(c))"},
         {"{}", "CellArray(Row())"},
         {"{{}, 1}", "CellArray(Row(CellArray(Row()),1))"},
         // Functions
-        {"@(p) p+1", "AnonymousFunc(@(p),Plus(p,1))"},
         {"@( p , q ) p", "AnonymousFunc(@(p,q),p)"},
-        {"@() 1", "AnonymousFunc(@(),1)"},
         {"@(p) @(q) p", "AnonymousFunc(@(p),AnonymousFunc(@(q),p))"},
         // Calls
         {"f()", "FcnCall(f)"},
-        {"f(a)", "FcnCall(f,a)"},
-        {"f(a, b, c, d)", "FcnCall(f,a,b,c,d)"},
         {"sqrt(x:y)", "FcnCall(sqrt,QColon(x,y))"},
         {"f(g(x), @(p) h(p))", "FcnCall(f,FcnCall(g,x),AnonymousFunc(@(p),FcnCall(h,p)))"},
         {"a.b(2)", "FcnCall(MemberValue(a,b),2)"},
         {"f(1)(2)", "FcnCall(FcnCall(f,1),2)"},
         {"a(1).b(2).c", "MemberValue(FcnCall(MemberValue(FcnCall(a,1),b),2),c)"},
         // The seven functions, with their number of arguments and with another one
-        {"bitand(F, 4) ~= 0", "NotEqual(BitAnd(F,4),0)"},
         {"bitshift(a, 2)", "ShiftLeft(a,2)"},
         {"bitshift(a, -3)", "ShiftRight(a,3)"},
-        {"rem(n, 2) == 1", "Equal(Modulo(n,2),1)"},
         {"rem(a,b,c)", "FcnCall(rem,a,b,c)"},
         {"bitand(a)", "FcnCall(bitand,a)"},
-        {"f(rem(a,b))", "FcnCall(f,Modulo(a,b))"},
     };
 
     for (const auto& [text, tree] : cases) {
@@ -127,29 +104,21 @@ std::string unhandledIn(const std::string& text, const std::string& name, std::s
 }
 
 TEST(QuillConstructs, OperatorsOfBoth) {
-    const Case cases[] = {{"a+b", "Plus"},
-                          {"a-b", "Minus"},
-                          {"a*b", "Multiply"},
-                          {"a/b", "Divide"},
-                          {"a==b", "Equal"},
-                          {"a~=b", "NotEqual"},
-                          {"a!=b", "NotEqual"},
-                          {"a<b", "LessThan"},
-                          {"a<=b", "LessThanEqual"},
-                          {"a>b", "GreaterThan"},
-                          {"a||b", "Or"},
-                          {"a>=b", "GreaterThanEqual"},
-                          {"a&&b", "And"},
-                          {"rem(a,b)", "Modulo"},
-                          {"idivide(a,b)", "Divide"},
-                          {"bitand(a,b)", "BitAnd"},
-                          {"bitor(a,b)", "BitOr"},
-                          {"bitxor(a,b)", "BitXOr"},
-                          {"bitshift(a,b)", "ShiftLeft"}};
-    for (const auto& [text, name] : cases) {
-        EXPECT_EQ(readDimension(text).tree, name + "(a,b)") << text;
-        EXPECT_EQ(readCondition(text).tree, name + "(a,b)") << text;
+    for (const OperatorInfo& row : operatorTable()) {
+        const std::string call(row.quillCall), infix(row.quill), name(row.name);
+        if (row.op >= SymbolicOp::Power || row.shape != "Binary" || row.form != OperatorForm::Infix)
+            continue;
+        std::vector<std::string> texts;
+        if (!infix.empty())
+            texts.push_back("a" + infix + "b");
+        if (!call.empty() && row.op != SymbolicOp::ShiftRight)
+            texts.push_back(call + "(a,b)");
+        for (const std::string& text : texts) {
+            EXPECT_EQ(readDimension(text).tree, name + "(a,b)") << text;
+            EXPECT_EQ(readCondition(text).tree, name + "(a,b)") << text;
+        }
     }
+    EXPECT_EQ(readDimension("a!=b").tree, "NotEqual(a,b)");
 }
 
 TEST(QuillConstructs, ConditionsOnly) {

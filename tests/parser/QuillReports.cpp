@@ -5,7 +5,6 @@
 
 #include <limits>
 #include <map>
-#include <set>
 
 namespace VT::Testing {
 namespace {
@@ -162,48 +161,6 @@ TEST(QuillReports, InUtf16Text) {
               "NonASCIIText(A%\xef\xbf\xbd\xf4\x8f\xb0\x80, 2)@2");
     EXPECT_EQ(report(u"[A;B]"), "NonVectorValue([A;B], 0)@0");
     EXPECT_EQ(readCondition(std::u16string(1, char16_t{0xdc00})).thrown.value().offset(), 0U);
-}
-
-TEST(QuillReports, EachHasItsKey) {
-    VTSymbolicExprErrorChecker checker;
-    _Q_parse_tree_T<char> name{0, 40, 7, {3}, {"foo"}};
-    _Q_parse_tree_T<char> call{1, 85, 7, {0}, {nullptr}};
-    call.childCount = 1;
-    call.children = &name;
-    checker.reportInvalidLiteralValue("0z", "t", 1);
-    checker.reportNonScalarValue("n", "t", 2);
-    checker.reportComplexValue("n", "t", 3);
-    checker.reportLogicalValue("n", "t", 4);
-    checker.reportNonIntegerLiteralValue("1.5", "t", 5);
-    checker.reportNonIntegerValue("n", "t", 6);
-    checker.reportUnsupportedValue("n", "t", 7);
-    checker.reportUnhandledExpr(name, "t");
-    checker.reportUnhandledExpr(call, "t");
-    checker.reportDivisionExpr(call, "t");
-    checker.reportUnsupportedFcn(0, call, "t");
-    checker.reportInvalidNumArgs(0, 2, 3, call, "t");
-    checker.reportInvalidExpr("t");
-    for (const char* const key : {"UnsupportedLiteralValue", "IntegerOverflow"})
-        checker.reportDiagnostic(symbolicDimsDiagnostic(key, {std::string("n"), std::string("t")}, 8));
-    for (const char* const key : {"NonVectorValue", "NonASCIIText"})
-        checker.reportDiagnostic(symbolicDimsDiagnostic(key, {std::string("t")}, 9));
-    std::string all;
-    for (const HostDiagnostic& diagnostic : checker.diagnostics())
-        all += reportText(diagnostic) + "\n";
-    EXPECT_EQ(all, "InvalidLiteralValue(0z, t, 1)@1\nNonScalarValue(n, t, 2)@2\nComplexValue(n, t, 3)@3\n"
-                   "LogicalValue(n, t, 4)@4\nNonIntegerLiteralValue(1.5, t, 5)@5\nNonIntegerValue(n, t, 6)@6\n"
-                   "NonNumericValue(n, t, 7)@7\nUnhandledExpression(foo, t, 7)@7\n"
-                   "UnhandledExpression(call, t, 7)@7\nUnsupportedDivision(t, 7)@7\n"
-                   "UnsupportedFunction(foo, t, 7)@7\nInvalidNumFcnArgs(foo, t, 7, 2, 3)@7\n"
-                   "InvalidExpression(t, 0)@0\nUnsupportedLiteralValue(n, t, 8)@8\n"
-                   "IntegerOverflow(n, t, 8)@8\nNonVectorValue(t, 9)@9\nNonASCIIText(t, 9)@9\n");
-    std::set<std::string> reported;
-    for (const HostDiagnostic& diagnostic : checker.diagnostics())
-        reported.insert(diagnostic.messageId());
-    for (const std::string key : {"UnboundSymbol", "CyclicValue", "NotEvaluable", "SizeMismatch"}) // evaluation's
-        reported.insert("Vantor:SymbolicDims:" + key);
-    for (const MessageInfo& row : messageCatalogue())
-        EXPECT_EQ(reported.contains(std::string(row.id)), row.id.starts_with("Vantor:SymbolicDims:")) << row.id;
 }
 
 TEST(QuillReports, AreSuppressedByTheCheckersFlag) {

@@ -7,7 +7,6 @@
 #include "base/simplify/Simplify.hpp"
 #include "tests/preprocessor/Judges.hpp"
 #include "tests/support/AnyNode.hpp"
-#include "tests/support/CTruth.hpp"
 #include "tests/support/Corpus.hpp"
 #include "tests/support/Parsing.hpp"
 
@@ -109,7 +108,7 @@ struct Quiz {
 };
 
 struct Asked {
-    CTruth truth;
+    Truth truth;
     std::string text;
 };
 
@@ -120,7 +119,8 @@ TEST(Decisions, RandomConditionsInDirectives) {
     while (conditions.size() < 4500) {
         const SymbolicExprId id = expressions.make(4);
         if (findCTextObstacles(table, id, CTextUse::Directive).empty())
-            conditions.push_back({CTruth(table, id), PreprocessorVCExpr(table, false, id % 2 == 0).print(id)});
+            conditions.push_back(
+                {Truth(table, id, Arithmetic::C), PreprocessorVCExpr(table, false, id % 2 == 0).print(id)});
     }
     Quiz quiz;
     for (int round = 0; round < 40; ++round) {
@@ -155,7 +155,7 @@ TEST(Decisions, RealConditionsAsTheyStandAndSimplified) {
             const SymbolicExprId id = parse(table, line, true, false).id;
             if (id == invalidId || !findCTextObstacles(table, id, CTextUse::Directive).empty())
                 continue;
-            const CTruth truth(table, id);
+            const Truth truth(table, id, Arithmetic::C);
             if (!areFree(truth.names()))
                 continue;
             names.insert(truth.names().begin(), truth.names().end());
@@ -196,7 +196,7 @@ TEST(Decisions, ValuesOfRandomExpressionsInCompiledPrograms) {
         const SymbolicExprId id = expressions.make(4);
         if (!findCTextObstacles(table, id, CTextUse::Program).empty())
             continue;
-        asked.push_back({CTruth(table, id), printer(id)});
+        asked.push_back({Truth(table, id, Arithmetic::C), printer(id)});
         compiler.add(asked.back().text);
         for (int i = 0; i < 80; ++i) {
             Compiler::Question question{asked.size() - 1, {}};

@@ -1,6 +1,6 @@
 // Sizes and shapes that would ruin a printer that recurses, copies texts or visits paths.
 #include "base/print/StringifySymbolicExpr.hpp"
-#include "tests/print/Reading.hpp"
+#include "tests/support/AnyNode.hpp"
 
 #include <gtest/gtest.h>
 

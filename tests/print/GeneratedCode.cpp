@@ -2,7 +2,7 @@
 #include "base/print/CTextObstacles.hpp"
 #include "base/print/Predicates.hpp"
 #include "base/print/StringifyImpliedCondition.hpp"
-#include "tests/print/Reading.hpp"
+#include "tests/support/AnyNode.hpp"
 #include "tests/support/Parsing.hpp"
 #include "tests/support/RandomCondition.hpp"
 #include "tests/support/Truth.hpp"

@@ -1,7 +1,7 @@
 // What expressions look like in both languages.
 #include "base/print/Predicates.hpp"
 #include "base/print/StringifySymbolicExpr.hpp"
-#include "tests/print/Reading.hpp"
+#include "tests/support/AnyNode.hpp"
 #include "tests/support/Parsing.hpp"
 
 #include <gtest/gtest.h>
@@ -10,6 +10,7 @@
 #include <cmath>
 #include <limits>
 #include <locale>
+#include <random>
 
 namespace VT::Testing {
 namespace {

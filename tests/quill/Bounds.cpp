@@ -17,20 +17,9 @@ TEST(QuillBounds, NestingAtTheBoundAndOneBeyond) {
         std::size_t place; ///< of the bracket in `open` that is one too many
     };
 
-    const std::vector<Nest> nests = {{"(", ")", 0},
-                                     {"[", "]", 0},
-                                     {"{", "}", 0},
-                                     {"f(", ")", 1},
-                                     {"c{", "}", 1},
-                                     {"f(a,", ")", 1},
-                                     {"a || (", ")", 5},
-                                     {"-f(", ")", 2},
-                                     {"[1 ", "]", 0},
-                                     {"a^(b+", ")", 2},
-                                     {"@(x) ", "", 0},
-                                     {"1 + @(x) ", "", 4},
-                                     {"2^-@(x, y) x*", "", 3},
-                                     {"1:(", ")", 2}};
+    const std::vector<Nest> nests = {
+        {"(", ")", 0},      {"[", "]", 0},     {"{", "}", 0},    {"f(", ")", 1},           {"c{", "}", 1},
+        {"a || (", ")", 5}, {"a^(b+", ")", 2}, {"@(x) ", "", 0}, {"2^-@(x, y) x*", "", 3}, {"1:(", ")", 2}};
     for (const std::size_t nesting : {std::size_t{1}, std::size_t{7}, bound}) {
         QuillReading reading(nesting);
         for (const auto& [open, close, place] : nests) {
@@ -88,7 +77,6 @@ TEST(QuillBounds, LongTexts) {
             continue;
         }
         EXPECT_EQ(shapeError(*tree, text), "") << piece;
-        EXPECT_LE(countNodes(*tree), 3 * text.size() + 4) << piece;
     }
 }
 

@@ -18,4 +18,8 @@ std::vector<SymbolicExprId> randomGraph(std::mt19937_64& random, SymbolicExprTab
 /// nodes are met again; no real is NaN.
 SymbolicExprId makeRandom(SymbolicExprTable& table, std::mt19937_64& random);
 
+/// A random tree of these operators over a few names and numbers; members are named "field".
+SymbolicExprId randomTree(SymbolicExprTable& table, std::mt19937_64& random, const std::vector<SymbolicOp>& operators,
+                          int depth);
+
 } // namespace VT::Testing

@@ -2,6 +2,7 @@
 #include "base/transform/FactorDivision.hpp"
 #include "base/print/ExpressionPrinter.hpp"
 #include "base/simplify/Simplify.hpp"
+#include "tests/support/AnyNode.hpp"
 #include "tests/support/Parsing.hpp"
 
 #include <gtest/gtest.h>
@@ -62,16 +63,11 @@ protected:
 TEST_F(FactorDivision, EveryOperatorOfQuotients) {
     const std::vector<std::pair<std::string, std::string>> rows{
         {"N/2 + M/3", "(N*3+M*2)/(2*3)"},
-        {"N/2 - 1", "(N-1*2)/2"},
         {"1 + N/2", "(1*2+N)/2"},
         {"N/2 % (M/3)", "N*3%(M*2)/(2*3)"},
-        {"N % (M/3)", "N*3%M/3"},
         {"N/2 * (M/3)", "N*M/(2*3)"},
-        {"N * (M/2)", "N*M/2"},
         {"N/2 * M", "N*M/2"},
         {"(N/2) / (M/3)", "N*3/(2*M)"},
-        {"N/2/M", "N/(2*M)"},
-        {"N / (M/3)", "N*3/M"},
         {"(N/2 + 1) / (M - L/3)", "(N+1*2)*3/(2*(M*3-L))"},
         {"-(N/2) + !(M/3 == 1/K + 1)", "-(N/2)+!(M/3==(1+1*K)/K)"},
         {"f(N/2 + 1)", "f((N+1*2)/2)"},
@@ -117,9 +113,7 @@ TEST_F(FactorDivision, KeepsTheValueAndLeavesOneQuotient) {
 }
 
 TEST_F(FactorDivision, SharedAndDeepExpressions) {
-    SymbolicExprId doubled = read("N/2");
-    for (int i = 0; i < 64; ++i)
-        doubled = SymbolicPlusExpr(table, doubled, doubled).getId(table);
+    const SymbolicExprId doubled = Trees{table}.doubled(SymbolicOp::Plus, read("N/2"));
     SymbolicExprId spine = read("N/2");
     for (int i = 0; i < 100'000; ++i)
         spine = SymbolicDivideExpr(table, read("M"), spine).getId(table);

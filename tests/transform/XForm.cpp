@@ -4,7 +4,6 @@
 #include "base/variants/Features.hpp"
 #include "base/variants/VariantKeywords.hpp"
 #include "tests/support/AnyNode.hpp"
-#include "tests/support/FlagSetting.hpp"
 #include "tests/support/RandomExpression.hpp"
 #include "tests/support/Slots.hpp"
 #include "tests/support/TreeText.hpp"
@@ -74,65 +73,19 @@ struct RandomTable {
     std::vector<double> sizes;
 };
 
-RC_GTEST_PROP(XForm, ReturnsWhatItIsGivenWithinATable, (std::uint64_t seed)) {
+RC_GTEST_PROP(XForm, IsNothingNewInATableAndTheSameTreeInAnother, (std::uint64_t seed)) {
     RandomTable random(seed);
-    for (SymbolicExprId id = 0; id < random.table.size(); ++id) {
-        if (random.sizes[id] > 3000)
-            continue;
-        for (const auto driver : drivers) {
-            RC_ASSERT(driver(random.table, id, random.table) == id);
-            RC_ASSERT(random.table.size() == random.sizes.size());
-        }
-    }
-}
-
-RC_GTEST_PROP(XForm, RebuildsTheSameTreeInAnotherTable, (std::uint64_t seed)) {
-    const RandomTable random(seed);
     for (const auto driver : drivers) {
         SymbolicExprTable target;
         SymbolicIntValue(target, 4711); // identifiers are others there
         for (SymbolicExprId id = 0; id < random.table.size(); ++id) {
             if (random.sizes[id] > 3000)
                 continue;
-            const SymbolicExprId copy = driver(random.table, id, target);
-            RC_ASSERT(treeText(target, copy) == treeText(random.table, id));
+            RC_ASSERT(driver(random.table, id, random.table) == id);
+            RC_ASSERT(treeText(target, driver(random.table, id, target)) == treeText(random.table, id));
         }
+        RC_ASSERT(random.table.size() == random.sizes.size());
         RC_ASSERT(target.size() <= 1 + random.table.size()); // what is shared stays shared
-    }
-}
-
-TEST(XForm, ADriverVisitsEachNodeOfADoublingGraphOnce) {
-    class Counting final : public SymbolicExprXFormVisitor {
-    public:
-        using SymbolicExprXFormVisitor::SymbolicExprXFormVisitor;
-        using SymbolicExprXFormVisitor::visit;
-
-        void visit(const SymbolicPlusExpr& node) override {
-            ++visits;
-            SymbolicExprXFormVisitor::visit(node);
-        }
-
-        int visits = 0;
-    };
-
-    SymbolicExprTable source;
-    const Trees tree{source};
-    const SymbolicExprId id = tree.doubled(SymbolicOp::Plus, tree.name("x"), 60);
-    SymbolicExprTable target;
-    Counting visitor(target);
-    EXPECT_EQ(visitor.rebuild(source, id), 60U);
-    EXPECT_EQ(visitor.visits, 60);
-}
-
-TEST(XForm, AMillionDeep) {
-    SymbolicExprTable source;
-    const Trees tree{source};
-    const SymbolicExprId x = tree.name("x");
-    const SymbolicExprId id = tree.zigzag(SymbolicOp::Plus, SymbolicOp::Plus, x, x, 1'000'000);
-    for (const auto driver : {executed<Rebuild>, accepted<Rebuild>, rebuilt<HookedRebuild>}) {
-        SymbolicExprTable target;
-        EXPECT_EQ(driver(source, id, target), id);
-        EXPECT_EQ(target.size(), source.size());
     }
 }
 
@@ -195,10 +148,7 @@ TEST(XForm, KeywordsAreInternedInTheTarget) {
     EXPECT_EQ(treeText(target, visitor.getSimVariantKeywordId()), VariantKeywords::getSimVariantKeyword());
     EXPECT_EQ(treeText(target, visitor.getCodegenVariantKeywordId()), VariantKeywords::getCodegenVariantKeyword());
     EXPECT_EQ(visitor.getSimVariantKeywordId(), 0U);
-    for (const std::int32_t value : {-1, 0, 1, 2}) {
-        const FlagSetting setting(*VTFEAT_VariantKeywordsSimCodegen, value);
-        EXPECT_EQ(visitor.isVariantKeywordsSimCodegenFeatureOn(), value >= 1) << value;
-    }
+    EXPECT_EQ(visitor.isVariantKeywordsSimCodegenFeatureOn(), isVariantKeywordsSimCodegenFeatureOn());
 }
 
 /// Builds others than were visited.

@@ -1,4 +1,5 @@
-// The symbols of conditions, by kind.
+// The symbols of expressions, all of them and by kind.
+#include "base/transform/Symbols.hpp"
 #include "base/service/VCSymbols.hpp"
 #include "tests/support/AnyNode.hpp"
 #include "tests/support/Parsing.hpp"
@@ -25,18 +26,13 @@ TEST(VCSymbols, ByKind) {
 
     const std::vector<Case> cases{
         {"A == 1 && B > A", 1, {"A", "B"}},
-        {"A == 1 && B > A", 14, {}},
         {"A && true", 1, {"A", "true"}},
-        {"bound.m + free.m + x", 1, {"x"}},
         {"bound.m + free.m + x", 2, {"bound.m"}},
         {"bound.m + free.m + x", 4, {"free.m"}},
         {"free.m + x + bound.m + free.m", 7, {"free.m", "x", "bound.m"}},
-        {"a.m.n < x", 15, {"a.m.n", "x"}}, // no look into the owner
-        {"f(x) + y", 1, {"x", "y"}},
-        {"f(x) + y", 8, {"f"}},
+        {"a.m.n < x", 15, {"a.m.n", "x"}},          // no look into the owner
         {"f + f(f) + f(f(g))", 8, {"f", "f", "f"}}, // once for each call
         {"f + f(f) + f(f(g))", 1, {"f", "g"}},
-        {"f(x) + f(x) + g()", 9, {"f", "x", "g"}},
         {"f(g(x), y)", 9, {"f", "g", "x", "y"}}, // the name comes first
         {"x + f(bound.m)", 0, {}},
     };
@@ -63,10 +59,17 @@ TEST(VCSymbols, KindsAreFourBits) {
             EXPECT_THAT(error.what(), testing::StartsWith("bitset::set"));
         }
     }
+}
+
+TEST(Symbols, ACollectorRemembersWhatItVisited) {
     SymbolicExprTable table;
+    SymbolsOfSymbolicExpr collector(table);
     Names names;
-    VCSymbolsOfSymbolicExpr(table, {Identifier, FunctionName}).getSymbols(read(table, "f(x) + a.b"), names);
-    EXPECT_THAT(names, testing::ElementsAre("f", "x"));
+    for (const char* text : {"a+b", "b+c", "a+b", "f(a)"})
+        collector.getSymbols(read(table, text), names);
+    collector.getSymbols(invalidId, names);
+    collector.getSymbols(table.size(), names);
+    EXPECT_THAT(names, testing::ElementsAre("a", "b", "c", "f"));
 }
 
 /// Every occurrence of a symbol, with the node that it was found at.
@@ -81,25 +84,29 @@ struct Occurrences {
             if ((kinds & kind) != 0)
                 found.emplace_back(id, symbol);
         };
-        switch (node.op()) {
-        case SymbolicOp::String:
+        const bool call = kinds != everything && callOps.contains(node.op()) && node.getNumInputs() > 0;
+        if (node.op() == SymbolicOp::String)
             return add(1, id);
-        case SymbolicOp::MemberValue:
+        if (kinds != everything && node.op() == SymbolicOp::MemberValue)
             return add(table.isUnsetValue(table.getValueId(id)) ? 4 : 2, id);
-        case SymbolicOp::FcnCall0U:
-        case SymbolicOp::FcnCall1U:
-        case SymbolicOp::FcnCall2U:
-        case SymbolicOp::FcnCall:
-            if (node.getNumInputs() > 0)
-                add(8, node.getInput(0));
-            for (std::size_t i = 1; i < node.getNumInputs(); ++i)
-                look(node.getInput(i));
-            return;
-        default:
-            for (std::size_t i = 0; i < node.getNumInputs(); ++i)
-                look(node.getInput(i));
-        }
+        if (call)
+            add(8, node.getInput(0));
+        for (std::size_t i = call ? 1 : 0; i < node.getNumInputs(); ++i)
+            look(node.getInput(i));
     }
+
+    /// The first one at each node.
+    std::vector<SymbolicExprId> firsts(SymbolicExprId root) {
+        std::vector<SymbolicExprId> symbols;
+        std::set<SymbolicExprId> met;
+        look(root);
+        for (const auto& [at, symbol] : found)
+            if (met.insert(at).second)
+                symbols.push_back(symbol);
+        return symbols;
+    }
+
+    static constexpr unsigned everything = 16 + 1; ///< identifiers wherever they stand
 };
 
 TEST(VCSymbols, AreTheFirstOccurrencesAtEachNode) {
@@ -113,15 +120,11 @@ TEST(VCSymbols, AreTheFirstOccurrencesAtEachNode) {
                 table.registerValueId(id, 0);
         for (const SymbolicExprId root : graph) {
             const auto kinds = static_cast<unsigned>(random() % 16);
-            Occurrences all{table, kinds, {}};
-            all.look(root);
-            std::vector<SymbolicExprId> expected, ids;
-            std::set<SymbolicExprId> met;
-            for (const auto& [at, symbol] : all.found)
-                if (met.insert(at).second)
-                    expected.push_back(symbol);
+            std::vector<SymbolicExprId> ids, all;
             VCSymbolsOfSymbolicExpr(table, kinds).getSymbolIds(root, ids);
-            ASSERT_EQ(ids, expected);
+            ASSERT_EQ(ids, (Occurrences{table, kinds, {}}.firsts(root)));
+            SymbolicExprSymbols{table}(root, all);
+            ASSERT_EQ(all, (Occurrences{table, Occurrences::everything, {}}.firsts(root)));
             total += ids.size();
         }
     }
@@ -143,6 +146,9 @@ TEST(VCSymbols, OddSharedAndDeepExpressions) {
     const SymbolicExprId doubled = tree.doubled(SymbolicOp::Plus, read(table, "a + b"));
     EXPECT_THAT(symbols(tree.zigzag(SymbolicOp::Plus, SymbolicOp::Minus, doubled, read(table, "c"), 1'000'000)),
                 testing::ElementsAre("c", "a", "b"));
+    Names all;
+    SymbolicExprSymbols{table}(table.size() - 1, all);
+    EXPECT_THAT(all, testing::UnorderedElementsAre("a", "b", "c"));
 }
 
 } // namespace
