@@ -1,11 +1,9 @@
 // Every operator on every pair of corner values, against arithmetic written down again over wide integers.
-#include "base/eval/Eval.hpp"
-#include "tests/support/AnyNode.hpp"
+#include "tests/eval/Scalars.hpp"
 
 #include <gtest/gtest.h>
 
 #include <cmath>
-#include <limits>
 
 namespace VT::Testing {
 namespace {
@@ -14,26 +12,6 @@ constexpr double infinity = std::numeric_limits<double>::infinity();
 constexpr double threshold = 1.4901161193847656e-08;
 constexpr std::int64_t greatest = 2147483647;
 constexpr std::int64_t least = -2147483648;
-
-const std::vector<SymbolicScalar>& corners() {
-    static const std::vector<SymbolicScalar> all = [] {
-        std::vector<SymbolicScalar> values{false, true};
-        for (const std::int64_t value :
-             {least, least + 1, std::int64_t{-33}, std::int64_t{-32}, std::int64_t{-31}, std::int64_t{-7},
-              std::int64_t{-1}, std::int64_t{0}, std::int64_t{1}, std::int64_t{2}, std::int64_t{31}, std::int64_t{32},
-              std::int64_t{33}, std::int64_t{46341}, greatest - 1, greatest})
-            values.emplace_back(static_cast<std::int32_t>(value));
-        for (const double value : {threshold, std::nextafter(threshold, 0.0), std::nextafter(threshold, 1.0), 0.0, 0.5,
-                                   0.3, 0.1 + 0.2, 1.0, 1.0 + threshold, 31.9, 32.0, 2147483647.5, 2147483648.0,
-                                   2147483648.5, 2147483649.0, 1e300, 5e-324, infinity}) {
-            values.emplace_back(value);
-            values.emplace_back(-value);
-        }
-        values.emplace_back(std::numeric_limits<double>::quiet_NaN());
-        return values;
-    }();
-    return all;
-}
 
 /// A scalar in the oracle's hands: an integer without bounds, or a real.
 struct Wide {
@@ -175,18 +153,6 @@ SymbolicScalar expected(SymbolicOp op, const Wide& a, const Wide& b) {
         ADD_FAILURE() << "the oracle does not know " << operatorInfo(op).name;
         return false;
     }
-}
-
-SymbolicExprId literal(SymbolicExprTable& table, const SymbolicScalar& value) {
-    if (value.type() == ScalarType::Double) {
-        if (value == SymbolicScalar(-0.0)) // as a literal it is that of 0
-            return SymbolicUnaryMinusExpr(table, literal(table, 0.0)).getId(table);
-        const SymbolicExprId found = SymbolicDoubleValue(table, value.getDouble()).getId(table);
-        return found != invalidId ? found : table.size() - 1; // NaN is not found
-    }
-    if (value.type() == ScalarType::Int)
-        return SymbolicIntValue(table, value.getInt()).getId(table);
-    return SymbolicString(table, value.getBool() ? "true" : "false").getId(table);
 }
 
 std::string shown(const SymbolicScalar& value) {

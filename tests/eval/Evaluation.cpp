@@ -3,6 +3,7 @@
 #include "base/eval/EvalVisitor.hpp"
 #include "host/Messages.hpp"
 #include "parser/SymbolicExprParser.hpp"
+#include "tests/support/AnyNode.hpp"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -49,22 +50,13 @@ TEST_F(Evaluation, AnswersTexts) {
     bind("Dims", "[N, M]");
     bind("s.gear", "M - 1");
     bind("true", "0"); // a truth value stays one
-    const double infinity = std::numeric_limits<double>::infinity();
     const std::vector<std::pair<const char*, SymbolicValue>> rows{
+        // Arithmetic on numbers is judged in Arithmetic.cpp.
         {"N*2+1", 7},
-        {"-7 / 2", -3},
-        {"0 / 0", 0},
-        {"0 / false", 2147483647},
-        {"-2147483648 / -1", 2147483647},
-        {"0.0 / 0.0", infinity},
-        {"-1.0 / 0.0", -infinity},
+        {"0.0 / 0.0", std::numeric_limits<double>::infinity()},
         {"0.1 + 0.2 == 0.3 && 0.1 + 0.2 > 0.3", true},
-        {"2147483647 + 1", std::numeric_limits<int>::min()},
         {"2147483647 + 1.0", 2147483648.0},
-        {"true + true", 2},
-        {"true", true},
         {"!Rate || M < 9", false},
-        {"-8 >> 40 | 1 << 4", -1},
         {"s.gear + 1 == M", true},
         {"[N, M, Rate]", Vector{3, 9, 0.5}},
         {"[N, M] * 2 - [1, 2]", Vector{5, 16}},
@@ -129,12 +121,9 @@ TEST_F(Evaluation, AnswersIdentifiersThatAreNoNodes) {
 
 TEST_F(Evaluation, EvaluatesSharedNodesOnce) {
     table.registerValue("x", 1);
-    SymbolicExprId id = name("x");
-    for (int i = 0; i < 64; ++i)
-        id = SymbolicPlusExpr(table, id, id).getId(table);
-    SymbolicExprId truth = name("x");
-    for (int i = 0; i < 64; ++i)
-        truth = SymbolicAndExpr(table, truth, truth).getId(table);
+    const Trees tree{table};
+    const SymbolicExprId id = tree.doubled(SymbolicOp::Plus, name("x"));
+    const SymbolicExprId truth = tree.doubled(SymbolicOp::And, name("x"));
     const auto start = std::chrono::steady_clock::now();
     EXPECT_EQ(SymbolicExprEval(table).eval(id), SymbolicValue(0)); // 2^64 wraps
     EXPECT_EQ(SymbolicExprEval(table).prepare(id).run(), SymbolicValue(0));
@@ -147,27 +136,24 @@ TEST_F(Evaluation, TakesDepthFromMemory) {
     const SymbolicExprId one = SymbolicIntValue(table, 1).getId(table);
     table.registerValueId("x", one);
     const SymbolicExprId x = name("x");
-    SymbolicExprId left = x;
-    SymbolicExprId right = x;
+    const SymbolicExprId sum = Trees{table}.zigzag(SymbolicOp::Plus, SymbolicOp::Plus, x, one, depth);
     SymbolicExprId prefix = x;
     SymbolicExprId bound = one;
     for (int i = 0; i < depth; ++i) {
-        left = SymbolicPlusExpr(table, left, one).getId(table);
-        right = SymbolicPlusExpr(table, one, right).getId(table);
         prefix = SymbolicBitComplExpr(table, prefix).getId(table);
         const SymbolicExprId symbol = name("s" + std::to_string(i));
         table.registerValueId(symbol, bound);
         bound = symbol;
     }
     for (const auto& [id, wanted] :
-         std::vector<std::pair<SymbolicExprId, int>>{{left, depth + 1}, {right, depth + 1}, {prefix, 1}, {bound, 1}}) {
+         std::vector<std::pair<SymbolicExprId, int>>{{sum, depth + 1}, {prefix, 1}, {bound, 1}}) {
         EXPECT_EQ(SymbolicExprEval(table).eval(id), SymbolicValue(wanted));
         PreparedExpr prepared = SymbolicExprEval(table).prepare(id);
         EXPECT_EQ(prepared.run(), SymbolicValue(wanted));
     }
     table.registerValueId("s0", bound); // a million symbols in a circle
     EXPECT_THROW(static_cast<void>(SymbolicExprEval(table).eval(bound)), HostDiagnostic);
-    EXPECT_THROW(static_cast<void>(SymbolicExprEval(table).eval(SymbolicPowerExpr(table, left, left).getId(table))),
+    EXPECT_THROW(static_cast<void>(SymbolicExprEval(table).eval(SymbolicPowerExpr(table, sum, sum).getId(table))),
                  HostDiagnostic);
 }
 

@@ -1,10 +1,8 @@
 // Prepared expressions answer what one evaluation under the same bindings answers, bit for bit, whatever is set when.
-#include "base/eval/Eval.hpp"
-#include "tests/support/AnyNode.hpp"
+#include "tests/eval/Scalars.hpp"
 
 #include <gtest/gtest.h>
 
-#include <limits>
 #include <random>
 
 namespace VT::Testing {
@@ -20,7 +18,7 @@ public:
             symbols_.push_back(SymbolicString(table, std::string(1, static_cast<char>('a' + i))).getId(table));
         std::vector<SymbolicExprId> nodes = symbols_;
         for (int i = 0; i < 6; ++i)
-            nodes.push_back(literal(scalar()));
+            nodes.push_back(literal(table, scalar()));
         const std::size_t count = 8 + below(40);
         while (nodes.size() < count)
             nodes.push_back(makeAny(table, anyOp(), {"", 0, 0, {any(nodes), any(nodes), any(nodes)}}));
@@ -31,14 +29,14 @@ public:
     SymbolicValue rebind(std::size_t symbol) {
         if (below(6) != 0) {
             const SymbolicScalar value = scalar();
-            table.registerValueId(symbols_[symbol], literal(value));
+            table.registerValueId(symbols_[symbol], literal(table, value));
             return value;
         }
         std::vector<SymbolicExprId> literals;
         SymbolicValue::Elements elements;
         for (std::size_t i = below(2) == 0 ? 2 : below(4); i > 0; --i) {
             elements.push_back(scalar());
-            literals.push_back(literal(elements.back()));
+            literals.push_back(literal(table, elements.back()));
         }
         table.registerValueId(symbols_[symbol], SymbolicNDExpr(table, literals).getId(table));
         return elements;
@@ -64,37 +62,7 @@ private:
         return scalarRules[below(scalarRules.size())].op;
     }
 
-    SymbolicScalar scalar() {
-        static const std::vector<SymbolicScalar> all{false,
-                                                     true,
-                                                     0,
-                                                     1,
-                                                     -1,
-                                                     3,
-                                                     31,
-                                                     -32,
-                                                     std::numeric_limits<int>::max(),
-                                                     std::numeric_limits<int>::min(),
-                                                     0.0,
-                                                     0.5,
-                                                     -2.75,
-                                                     1e-9,
-                                                     1e300,
-                                                     3e9,
-                                                     std::numeric_limits<double>::infinity(),
-                                                     -std::numeric_limits<double>::infinity(),
-                                                     std::numeric_limits<double>::quiet_NaN()};
-        return all[below(all.size())];
-    }
-
-    SymbolicExprId literal(const SymbolicScalar& value) {
-        if (value.type() == ScalarType::Bool)
-            return SymbolicString(table, value.getBool() ? "true" : "false").getId(table);
-        if (value.type() == ScalarType::Int)
-            return SymbolicIntValue(table, value.getInt()).getId(table);
-        const SymbolicExprId id = SymbolicDoubleValue(table, value.getDouble()).getId(table);
-        return id != invalidId ? id : table.size() - 1;
-    }
+    SymbolicScalar scalar() { return corners()[below(corners().size())]; }
 
     std::mt19937_64 random_;
     std::vector<SymbolicExprId> symbols_;

@@ -9,38 +9,25 @@ namespace {
 using foundation::core::log::Level;
 using Logger = foundation::core::log::basic_diagnostic_logger<char>;
 
-constexpr std::array levels{Level::Debug, Level::Info, Level::Warning, Level::Error};
-
-std::string linesAt(Level threshold) {
-    Logger logger("a::name");
-    logger.setLevel(threshold);
-    testing::internal::CaptureStderr();
-    logger.debug("one");
-    logger.info("two");
-    logger.warning("three");
-    logger.error("four");
-    return testing::internal::GetCapturedStderr();
-}
-
 TEST(Logger, WritesLinesFromItsLevelOn) {
-    const std::string one = "a::name: debug: one\n";
-    const std::string two = "a::name: info: two\n";
-    const std::string three = "a::name: warning: three\n";
-    const std::string four = "a::name: error: four\n";
-    EXPECT_EQ(linesAt(Level::Debug), one + two + three + four);
-    EXPECT_EQ(linesAt(Level::Info), two + three + four);
-    EXPECT_EQ(linesAt(Level::Warning), three + four);
-    EXPECT_EQ(linesAt(Level::Error), four);
-    EXPECT_EQ(linesAt(Level::Off), "");
-}
-
-TEST(Logger, TellsWhetherALineIsWorthItsMaking) {
     Logger logger("a::name");
     EXPECT_EQ(logger.level(), Level::Warning);
-    for (const Level threshold : levels) {
+    const std::array levels{Level::Debug, Level::Info, Level::Warning, Level::Error};
+    const std::array lines{"a::name: debug: one\n", "a::name: info: two\n", "a::name: warning: three\n",
+                           "a::name: error: four\n"};
+    for (const Level threshold : {Level::Debug, Level::Info, Level::Warning, Level::Error, Level::Off}) {
         logger.setLevel(threshold);
-        for (const Level level : levels)
-            EXPECT_EQ(logger.enabled(level), level >= threshold);
+        testing::internal::CaptureStderr();
+        logger.debug("one");
+        logger.info("two");
+        logger.warning("three");
+        logger.error("four");
+        std::string expected;
+        for (std::size_t i = 0; i < levels.size(); ++i) {
+            EXPECT_EQ(logger.enabled(levels[i]), levels[i] >= threshold);
+            expected += levels[i] >= threshold ? lines[i] : "";
+        }
+        EXPECT_EQ(testing::internal::GetCapturedStderr(), expected);
         EXPECT_FALSE(logger.enabled(Level::Off));
     }
 }

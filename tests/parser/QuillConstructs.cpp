@@ -2,51 +2,32 @@
 #include "base/variants/Features.hpp"
 #include "tests/parser/QuillReading.hpp"
 #include "tests/support/FlagSetting.hpp"
+#include "tests/support/Sides.hpp"
 
 #include <gtest/gtest.h>
 
 namespace VT::Testing {
 namespace {
 
-struct Case {
-    std::string text;
-    std::string tree;
-};
-
 TEST(QuillConstructs, Dimensions) {
-    const Case cases[] = {
+    const std::string cases[] = {
         // Leaves
-        {"true", "true"},
-        {"1.5E-3", "0.0015r"},
-        {"0x1F", "31r"},
-        {"0X1p", "invalid"},
-        {"0xffffffffffffffff", "1.8446744073709552e+19r"},
-        {"123456789012345678", "1.2345678901234568e+17r"},
-        {"00012", "12r"},
+        "true => true", "1.5E-3 => 0.0015r", "0x1F => 31r", "0X1p => invalid",
+        "0xffffffffffffffff => 1.8446744073709552e+19r", "123456789012345678 => 1.2345678901234568e+17r",
+        "00012 => 12r",
         // Operators
-        {"-a", "UnaryMinus(a)"},
-        {"-1", "UnaryMinus(1r)"},
-        {"~a", "Not(a)"},
-        {"!a", "Not(a)"},
-        {"a == b < c", "Equal(a,LessThan(b,c))"},
-        {"a - ... and so on\n  b % the rest", "Minus(a,b)"},
+        "-a => UnaryMinus(a)", "-1 => UnaryMinus(1r)", "~a => Not(a)", "!a => Not(a)",
+        "a == b < c => Equal(a,LessThan(b,c))", "a - ... and so on\n  b % the rest => Minus(a,b)",
         // Fields
-        {"a.b.c", "MemberValue(MemberValue(a,b),c)"},
-        {"(a).b", "MemberValue(a,b)"},
+        "a.b.c => MemberValue(MemberValue(a,b),c)", "(a).b => MemberValue(a,b)",
         // Lists
-        {"[N]", "DimsND(N)"},
-        {"[N, M, 3]", "Dims3D(N,M,3r)"},
-        {"[a b c d]", "DimsND(a,b,c,d)"},
-        {"[]", "DimsND()"},
-        {"[N -1]", "Dims2D(N,UnaryMinus(1r))"},
-        {"[N - 1]", "DimsND(Minus(N,1r))"},
-        {"[N 3]*2", "Multiply(Dims2D(N,3r),2r)"},
+        "[N] => DimsND(N)", "[N, M, 3] => Dims3D(N,M,3r)", "[a b c d] => DimsND(a,b,c,d)", "[] => DimsND()",
+        "[N -1] => Dims2D(N,UnaryMinus(1r))", "[N - 1] => DimsND(Minus(N,1r))", "[N 3]*2 => Multiply(Dims2D(N,3r),2r)",
         // The seven functions become operators.
-        {"bitcmp(a)", "BitCompl(a)"},
-        {"1+rem(bitand(a,b),idivide(c,d))", "Plus(1r,Modulo(BitAnd(a,b),Divide(c,d)))"},
-    };
+        "bitcmp(a) => BitCompl(a)", "1+rem(bitand(a,b),idivide(c,d)) => Plus(1r,Modulo(BitAnd(a,b),Divide(c,d)))"};
 
-    for (const auto& [text, tree] : cases) {
+    for (const std::string& each : cases) {
+        const auto& [text, tree] = sides(each);
         const QuillAnswer answer = readDimension(text);
         EXPECT_EQ(answer.tree, tree) << text;
         EXPECT_EQ(answer.reports.size(), tree == "invalid" ? 1U : 0U) << text;
@@ -54,43 +35,29 @@ TEST(QuillConstructs, Dimensions) {
 }
 
 TEST(QuillConstructs, Conditions) {
-    const Case cases[] = {
+    const std::string cases[] = {
         // Integral literals of 32 bits are integers.
-        {"A == 1", "Equal(A,1)"},
-        {"2147483648", "2147483648r"},
-        {"1e3", "1000"},
-        {"2.5", "2.5r"},
-        {"0x10", "16"},
-        {"1e-400", "0"},
+        "A == 1 => Equal(A,1)", "2147483648 => 2147483648r", "1e3 => 1000", "2.5 => 2.5r", "0x10 => 16", "1e-400 => 0",
         // Every operator
-        {"2^-1", "Power(2,UnaryMinus(1))"},
-        {"-a^2", "UnaryMinus(Power(a,2))"},
-        {"a''", "Transpose(Transpose(a))"},
+        "2^-1 => Power(2,UnaryMinus(1))", "-a^2 => UnaryMinus(Power(a,2))", "a'' => Transpose(Transpose(a))",
         // Ranges
-        {"x == 1:2+n", "Equal(x,QColon(1,Plus(2,n)))"},
+        "x == 1:2+n => Equal(x,QColon(1,Plus(2,n)))",
         // Lists
-        {"[a b; c d]", "Matrix(Row(a,b),Row(c,d))"},
-        {"{a, b; c}", "CellArray(Row(a,b),Row(c))"},
-        {"{}", "CellArray(Row())"},
-        {"{{}, 1}", "CellArray(Row(CellArray(Row()),1))"},
+        "[a b; c d] => Matrix(Row(a,b),Row(c,d))", "{a, b; c} => CellArray(Row(a,b),Row(c))", "{} => CellArray(Row())",
+        "{{}, 1} => CellArray(Row(CellArray(Row()),1))",
         // Functions
-        {"@( p , q ) p", "AnonymousFunc(@(p,q),p)"},
-        {"@(p) @(q) p", "AnonymousFunc(@(p),AnonymousFunc(@(q),p))"},
+        "@( p , q ) p => AnonymousFunc(@(p,q),p)", "@(p) @(q) p => AnonymousFunc(@(p),AnonymousFunc(@(q),p))",
         // Calls
-        {"f()", "FcnCall(f)"},
-        {"sqrt(x:y)", "FcnCall(sqrt,QColon(x,y))"},
-        {"f(g(x), @(p) h(p))", "FcnCall(f,FcnCall(g,x),AnonymousFunc(@(p),FcnCall(h,p)))"},
-        {"a.b(2)", "FcnCall(MemberValue(a,b),2)"},
-        {"f(1)(2)", "FcnCall(FcnCall(f,1),2)"},
-        {"a(1).b(2).c", "MemberValue(FcnCall(MemberValue(FcnCall(a,1),b),2),c)"},
+        "f() => FcnCall(f)", "sqrt(x:y) => FcnCall(sqrt,QColon(x,y))",
+        "f(g(x), @(p) h(p)) => FcnCall(f,FcnCall(g,x),AnonymousFunc(@(p),FcnCall(h,p)))",
+        "a.b(2) => FcnCall(MemberValue(a,b),2)", "f(1)(2) => FcnCall(FcnCall(f,1),2)",
+        "a(1).b(2).c => MemberValue(FcnCall(MemberValue(FcnCall(a,1),b),2),c)",
         // The seven functions, with their number of arguments and with another one
-        {"bitshift(a, 2)", "ShiftLeft(a,2)"},
-        {"bitshift(a, -3)", "ShiftRight(a,3)"},
-        {"rem(a,b,c)", "FcnCall(rem,a,b,c)"},
-        {"bitand(a)", "FcnCall(bitand,a)"},
-    };
+        "bitshift(a, 2) => ShiftLeft(a,2)", "bitshift(a, -3) => ShiftRight(a,3)", "rem(a,b,c) => FcnCall(rem,a,b,c)",
+        "bitand(a) => FcnCall(bitand,a)"};
 
-    for (const auto& [text, tree] : cases) {
+    for (const std::string& each : cases) {
+        const auto& [text, tree] = sides(each);
         const QuillAnswer answer = readCondition(text);
         EXPECT_EQ(answer.tree, tree) << text;
         EXPECT_EQ(reportsText(answer), "") << text;

@@ -1,19 +1,16 @@
 // What each construct of the language reads as, and where its tokens stand.
 #include "tests/quill/TreeText.hpp"
+#include "tests/support/Sides.hpp"
 
 #include <gtest/gtest.h>
 
 namespace VT::Testing {
 namespace {
 
-struct Case {
-    std::string text;
-    std::string tree;
-};
-
-void expectTrees(const std::vector<Case>& cases, const std::vector<std::string>& keywords = {}) {
+void expectTrees(const std::vector<std::string>& cases, const std::vector<std::string>& keywords = {}) {
     QuillReading reading(256, keywords);
-    for (const auto& [text, tree] : cases) {
+    for (const std::string& each : cases) {
+        const auto& [text, tree] = sides(each);
         EXPECT_EQ(reading.answer(text), tree) << text;
         if (const QuillNode* const root = reading.read(text)) {
             EXPECT_EQ(shapeError(*root, text), "") << text;
@@ -22,125 +19,107 @@ void expectTrees(const std::vector<Case>& cases, const std::vector<std::string>&
 }
 
 TEST(QuillConstructs, Operands) {
-    std::vector<Case> cases = {{"(x)", "(43 x)"}, {"((x))", "(43 (43 x))"}};
+    std::vector<std::string> cases = {"(x) => (43 x)", "((x)) => (43 (43 x))"};
     const auto addLeaves = [&cases](const std::vector<std::string>& texts) {
         for (const std::string& text : texts)
-            cases.push_back({text, text});
+            cases.push_back(text + " => " + text);
     };
     addLeaves({"x", "_x9_Y", "endx"});
     addLeaves({"12", "1.5", ".5", "5.", "1e3", "1.5E-3", "5.e+3", "0x1F", "0", "2i", "1.5e3j"});
     addLeaves({"'it''s'", R"("it's ""so""")", "''", "''''", "'% no comment ...'", "'\xC3\xA4'"});
     expectTrees(cases);
     // What a dot belongs to.
-    expectTrees({{"5.^2", "(77 5 2)"},
-                 {"5.*2", "(91 5 2)"},
-                 {"5./2", "(93 5 2)"},
-                 {R"(5.\2)", "(95 5 2)"},
-                 {"5.'", "(79 5)"},
-                 {"5..^2", "(77 5. 2)"},
-                 {"5..'", "(79 5.)"},
-                 {"1.5.*2", "(91 1.5 2)"},
-                 {"5...\n+1", "(49 5 1)"},
-                 {"5....\n+1", "(49 5 1)"}});
+    expectTrees({"5.^2 => (77 5 2)", "5.*2 => (91 5 2)", "5./2 => (93 5 2)", R"(5.\2 => (95 5 2))", "5.' => (79 5)",
+                 "5..^2 => (77 5. 2)", "5..' => (79 5.)", "1.5.*2 => (91 1.5 2)", "5...\n+1 => (49 5 1)",
+                 "5....\n+1 => (49 5 1)"});
 }
 
 // Infix operators and white space around them are compared with another reading in Precedence.cpp.
 TEST(QuillConstructs, Operators) {
-    expectTrees({{"-a^2", "(44 (76 a 2))"},
-                 {"a || b && c || d", "(130 (130 a (136 b c)) d)"},
-                 {"2^-~+a'", "(78 (76 2 (44 (46 a))))"},
-                 {"-2^-a*b", "(90 (44 (76 2 (44 a))) b)"},
-                 {"a.b'^c.d(1)", "(76 (78 (83 a b)) (85 (83 c d) (303 1)))"},
-                 {"a:b:c:d:e", "(305 (305 a b c) d e)"},
-                 {"a == 1:2:3 && b", "(136 (103 a (305 1 2 3)) b)"}});
+    expectTrees({"-a^2 => (44 (76 a 2))", "a || b && c || d => (130 (130 a (136 b c)) d)",
+                 "2^-~+a' => (78 (76 2 (44 (46 a))))", "-2^-a*b => (90 (44 (76 2 (44 a))) b)",
+                 "a.b'^c.d(1) => (76 (78 (83 a b)) (85 (83 c d) (303 1)))", "a:b:c:d:e => (305 (305 a b c) d e)",
+                 "a == 1:2:3 && b => (136 (103 a (305 1 2 3)) b)"});
 }
 
 // Calls, matrices and functions of any operands are compared there too.
 TEST(QuillConstructs, CallsListsAndFunctions) {
-    expectTrees({{"f()", "(85 f (303))"},
-                 {"f (a)", "(85 f (303 a))"},
-                 {"(a)(1)", "(85 (43 a) (303 1))"},
-                 {"[1 2](1)", "(85 (27 (302 1 2)) (303 1))"},
-                 {"f(x).y", "(83 (85 f (303 x)) y)"},
-                 {"c{}", "(300 c (303))"},
-                 {"a . b(2).c{1}", "(300 (83 (85 (83 a b) (303 2)) c) (303 1))"},
-                 {"a(end - 1, [end end'])", "(85 a (303 (50 end 1) (27 (302 end (78 end)))))"},
-                 {"c{end}", "(300 c (303 end))"},
-                 {"[ ]", "(27 (302))"},
-                 {"{}", "(301 (302))"},
-                 {"[1;]", "(27 (302 1) (302))"},
-                 {"{;}", "(301 (302) (302))"},
-                 {"{1}{1}", "(300 (301 (302 1)) (303 1))"},
-                 {"@ ( p, q ) p", "(306 (307 p q) p)"},
-                 {"@() 1", "(306 (307) 1)"},
-                 {"a + @(x) @(y) x + b", "(49 a (306 (307 x) (306 (307 y) (49 x b))))"},
-                 {"@f == @g", "(103 (308 f) (308 g))"},
-                 {" \t\n\v\f\ra\n", "a"},
-                 {"a % rest ) ( '", "a"},
-                 {"a...\r\n+ b", "(49 a b)"},
-                 {"a + % one\r b % two", "(49 a b)"},
-                 {"%\xFF\n a", "a"},
-                 {"a ...", "a"},
-                 {"...\n...\n%\n%\na", "a"}});
+    expectTrees({"f() => (85 f (303))",
+                 "f (a) => (85 f (303 a))",
+                 "(a)(1) => (85 (43 a) (303 1))",
+                 "[1 2](1) => (85 (27 (302 1 2)) (303 1))",
+                 "f(x).y => (83 (85 f (303 x)) y)",
+                 "c{} => (300 c (303))",
+                 "a . b(2).c{1} => (300 (83 (85 (83 a b) (303 2)) c) (303 1))",
+                 "a(end - 1, [end end']) => (85 a (303 (50 end 1) (27 (302 end (78 end)))))",
+                 "c{end} => (300 c (303 end))",
+                 "[ ] => (27 (302))",
+                 "{} => (301 (302))",
+                 "[1;] => (27 (302 1) (302))",
+                 "{;} => (301 (302) (302))",
+                 "{1}{1} => (300 (301 (302 1)) (303 1))",
+                 "@ ( p, q ) p => (306 (307 p q) p)",
+                 "@() 1 => (306 (307) 1)",
+                 "a + @(x) @(y) x + b => (49 a (306 (307 x) (306 (307 y) (49 x b))))",
+                 "@f == @g => (103 (308 f) (308 g))",
+                 " \t\n\v\f\ra\n => a",
+                 "a % rest ) ( ' => a",
+                 "a...\r\n+ b => (49 a b)",
+                 "a + % one\r b % two => (49 a b)",
+                 "%\xFF\n a => a",
+                 "a ... => a",
+                 "...\n...\n%\n%\na => a"});
 }
 
 TEST(QuillConstructs, WhiteSpaceInBrackets) {
-    const std::vector<Case> cases = {{"1 2", "1 2"},
-                                     {"1 -2", "1 (44 2)"},
-                                     {"1 - 2", "(50 1 2)"},
-                                     {"1-2", "(50 1 2)"},
-                                     {"1 -%c\n2", "(50 1 2)"},
-                                     {"1...\n-2", "1 (44 2)"},
-                                     {"1 - -2", "(50 1 (44 2))"},
-                                     {"1 --2", "1 (44 (44 2))"},
-                                     {"a' b'", "(78 a) (78 b)"},
-                                     {"a 'b'", "a 'b'"},
-                                     {"a .' b", "(79 a) b"},
-                                     {"a ~b", "a (46 b)"},
-                                     {"a ~ b", "a (46 b)"},
-                                     {"a ~= b", "(104 a b)"},
-                                     {"a *b", "(90 a b)"},
-                                     {"a .*b", "(91 a b)"},
-                                     {"a (1)", "a (43 1)"},
-                                     {"a(1)", "(85 a (303 1))"},
-                                     {"a {1}", "a (301 (302 1))"},
-                                     {"a .b", "(83 a b)"},
-                                     {"a .5", "a .5"},
-                                     {"1,...\n2", "1 2"},
-                                     {"(1 -2) 3", "(43 (50 1 2)) 3"},
-                                     {"f(a {1})", "(85 f (303 (300 a (303 1))))"},
-                                     {"@f 1", "(308 f) 1"},
-                                     {"1 @f", "1 (308 f)"},
-                                     {"@(x) x 1", "(306 (307 x) x) 1"},
-                                     {"@(x) - x", "(306 (307 x) (44 x))"},
-                                     {"[1 -2] 3", "(27 (302 1 (44 2))) 3"}};
-    std::vector<Case> all;
-    for (const auto& [text, elements] : cases) {
-        all.push_back({"[" + text + "]", "(27 (302 " + elements + "))"});
-        all.push_back({"{" + text + ";x}", "(301 (302 " + elements + ") (302 x))"});
-        all.push_back({"c{" + text + "}", "(300 c (303 " + elements + "))"});
+    const std::vector<std::string> cases = {"1 2 => 1 2",
+                                            "1 -2 => 1 (44 2)",
+                                            "1 - 2 => (50 1 2)",
+                                            "1-2 => (50 1 2)",
+                                            "1 -%c\n2 => (50 1 2)",
+                                            "1...\n-2 => 1 (44 2)",
+                                            "1 - -2 => (50 1 (44 2))",
+                                            "1 --2 => 1 (44 (44 2))",
+                                            "a' b' => (78 a) (78 b)",
+                                            "a 'b' => a 'b'",
+                                            "a .' b => (79 a) b",
+                                            "a ~b => a (46 b)",
+                                            "a ~ b => a (46 b)",
+                                            "a ~= b => (104 a b)",
+                                            "a *b => (90 a b)",
+                                            "a .*b => (91 a b)",
+                                            "a (1) => a (43 1)",
+                                            "a(1) => (85 a (303 1))",
+                                            "a {1} => a (301 (302 1))",
+                                            "a .b => (83 a b)",
+                                            "a .5 => a .5",
+                                            "1,...\n2 => 1 2",
+                                            "(1 -2) 3 => (43 (50 1 2)) 3",
+                                            "f(a {1}) => (85 f (303 (300 a (303 1))))",
+                                            "@f 1 => (308 f) 1",
+                                            "1 @f => 1 (308 f)",
+                                            "@(x) x 1 => (306 (307 x) x) 1",
+                                            "@(x) - x => (306 (307 x) (44 x))",
+                                            "[1 -2] 3 => (27 (302 1 (44 2))) 3"};
+    std::vector<std::string> all;
+    for (const std::string& each : cases) {
+        const auto& [text, elements] = sides(each);
+        all.push_back("[" + text + "] => (27 (302 " + elements + "))");
+        all.push_back("{" + text + ";x} => (301 (302 " + elements + ") (302 x))");
+        all.push_back("c{" + text + "} => (300 c (303 " + elements + "))");
     }
     expectTrees(all);
 }
 
 TEST(QuillConstructs, Keywords) {
     const std::vector<std::string> keywords = {"(sim)", "(codegen)"};
-    expectTrees({{"(sim)", "(sim)"},
-                 {"~(sim) && (codegen)", "(136 (46 (sim)) (codegen))"},
-                 {"f(sim)", "(85 f (303 sim))"},
-                 {"(f)(sim)", "(85 (43 f) (303 sim))"},
-                 {"f((sim))", "(85 f (303 (sim)))"},
-                 {"( sim)", "(43 sim)"},
-                 {"(simx)", "(43 simx)"},
-                 {"(Sim)", "(43 Sim)"},
-                 {"(sim)'", "(78 (sim))"},
-                 {"[f (sim)]", "(27 (302 f (sim)))"},
-                 {"[f(sim)]", "(27 (302 (85 f (303 sim))))"},
-                 {"@(sim) sim", "(306 (307 sim) sim)"},
-                 {"f (sim)", "2: an operator is missing"},
-                 {"(sim)(codegen)", "(85 (sim) (303 codegen))"}},
+    expectTrees({"(sim) => (sim)", "~(sim) && (codegen) => (136 (46 (sim)) (codegen))", "f(sim) => (85 f (303 sim))",
+                 "(f)(sim) => (85 (43 f) (303 sim))", "f((sim)) => (85 f (303 (sim)))", "( sim) => (43 sim)",
+                 "(simx) => (43 simx)", "(Sim) => (43 Sim)", "(sim)' => (78 (sim))", "[f (sim)] => (27 (302 f (sim)))",
+                 "[f(sim)] => (27 (302 (85 f (303 sim))))", "@(sim) sim => (306 (307 sim) sim)",
+                 "f (sim) => 2: an operator is missing", "(sim)(codegen) => (85 (sim) (303 codegen))"},
                 keywords);
-    expectTrees({{"(sim)", "(43 sim)"}, {"f (sim)", "(85 f (303 sim))"}});
+    expectTrees(std::vector<std::string>{"(sim) => (43 sim)", "f (sim) => (85 f (303 sim))"});
 }
 
 TEST(QuillConstructs, TokensAndTheirPlaces) {

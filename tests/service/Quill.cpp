@@ -3,37 +3,26 @@
 #include "tests/support/RandomCondition.hpp"
 
 #include <gtest/gtest.h>
+#include <map>
 #include <rapidcheck/gtest.h>
 
 namespace VT::Testing {
 namespace {
 
-struct Twin {
-    const char* quill;
-    const char* c;
-};
-
-void PrintTo(const Twin& twin, std::ostream* out) {
-    *out << twin.quill;
-}
-
-class QuillAndC : public ::testing::TestWithParam<Twin> {};
-
-TEST_P(QuillAndC, AreOneConditionAndConvertBothWays) {
+TEST(QuillService, ConvertsBothWays) {
     const VCServiceHandle service;
-    const auto& [quill, c] = GetParam();
-    EXPECT_EQ(service->parseQ(quill), service->parseC(c));
-    EXPECT_EQ(service->convertExprBetweenQandC(quill, true, false), c);
-    EXPECT_EQ(service->convertExprBetweenQandC(c, false, true), quill);
+    for (const auto& [quill, c] : std::map<std::string, std::string>{{"bitand(F,4)~=0", "(F&4)!=0"},
+                                                                     {"bitshift(a,-3)", "a>>3"},
+                                                                     {"rem(idivide(a,b),2)==1", "a/b%2==1"},
+                                                                     {"bitxor(a,bitor(b,bitcmp(c)))", "a^(b|~c)"},
+                                                                     {"~A || B && C~=1", "!A || B && C!=1"},
+                                                                     {"f(A,2)<=P.x", "f(A,2)<=P.x"},
+                                                                     {"(sim) && A", "(sim) && A"}}) {
+        EXPECT_EQ(service->parseQ(quill), service->parseC(c));
+        EXPECT_EQ(service->convertExprBetweenQandC(quill, true, false), c);
+        EXPECT_EQ(service->convertExprBetweenQandC(c, false, true), quill);
+    }
 }
-
-INSTANTIATE_TEST_SUITE_P(Texts, QuillAndC,
-                         ::testing::Values(Twin{"bitand(F,4)~=0", "(F&4)!=0"}, Twin{"bitshift(a,-3)", "a>>3"},
-                                           Twin{"rem(n,2)==1", "n%2==1"}, Twin{"idivide(a,b)", "a/b"},
-                                           Twin{"bitxor(a,bitor(b,c))", "a^(b|c)"},
-                                           Twin{"~A || B && C~=1", "!A || B && C!=1"},
-                                           Twin{"f(A,2)<=P.x", "f(A,2)<=P.x"}, Twin{"bitcmp(a)", "~a"},
-                                           Twin{"(sim) && A", "(sim) && A"}));
 
 TEST(QuillService, SimplifiesAndPrintsInEitherLanguage) {
     const VCServiceHandle service;
@@ -52,7 +41,6 @@ TEST(QuillService, ListsAndReplacesSymbols) {
     const VCSymbolicExprId condition = service->parseQ("Mode == 1 && f(Gear) > P.x");
     std::vector<std::string> names;
     service->getSymbolsFromExpression(condition, names, VCSymbolType::Identifier);
-    EXPECT_EQ(names, (std::vector<std::string>{"Mode", "Gear"}));
     service->getSymbolsFromExpression(condition, names, {VCSymbolType::FunctionName, VCSymbolType::UnboundMember});
     EXPECT_EQ(names, (std::vector<std::string>{"Mode", "Gear", "f", "P.x"}));
     std::vector<VCSymbolicExprId> ids;

@@ -2,6 +2,7 @@
 #include "base/transform/QuillConversion.hpp"
 #include "tests/support/AnyNode.hpp"
 #include "tests/support/Parsing.hpp"
+#include "tests/support/Sides.hpp"
 #include "tests/support/TreeText.hpp"
 
 #include <gtest/gtest.h>
@@ -9,19 +10,16 @@
 namespace VT::Testing {
 namespace {
 
-struct Conversion {
-    std::string from; ///< as C text
-    std::string to;   ///< as a tree
-};
-
 class QuillConversion : public testing::Test {
 protected:
     SymbolicExprId read(const std::string& text) { return Testing::read(table, text); }
 
     template <class Driver>
-    void expectConverted(const std::vector<Conversion>& conversions) {
-        for (const auto& [from, to] : conversions)
+    void expectConverted(const std::vector<std::string>& conversions) { // of C text to a tree
+        for (const std::string& each : conversions) {
+            const auto& [from, to] = sides(each);
             EXPECT_EQ(treeText(table, Driver(table)(read(from))), to) << from;
+        }
     }
 
     template <class Driver>
@@ -43,34 +41,26 @@ TEST_F(QuillConversion, NamesAreInternedInOrder) {
 }
 
 TEST_F(QuillConversion, CallsBecomeOperators) {
-    expectConverted<SymbolicExprQ2C>({
-        {"idivide(a, rem(b, c))", "Divide(a,Modulo(b,c))"},
-        {"g(bitxor(a, bitcmp(b)))", "FcnCall(g,BitXOr(a,BitCompl(b)))"},
-        {"bitshift(a, 0)", "ShiftLeft(a,0)"},
-        {"bitshift(a, -2)", "ShiftRight(a,2)"},
-        {"bitshift(a, - 0)", "ShiftLeft(a,0)"},
-        {"bitshift(a, -(-2))", "ShiftLeft(a,2)"},
-        {"bitshift(a, -n)", "ShiftRight(a,n)"},
-        {"bitshift(a, -2147483648)", "FcnCall(bitshift,a,-2147483648)"},
-        {"bitshift(a, -(-2147483648))", "ShiftLeft(a,UnaryMinus(-2147483648))"},
-        {"bitshift(a, -2147483647)", "ShiftRight(a,2147483647)"},
-    });
+    expectConverted<SymbolicExprQ2C>({"idivide(a, rem(b, c)) => Divide(a,Modulo(b,c))",
+                                      "g(bitxor(a, bitcmp(b))) => FcnCall(g,BitXOr(a,BitCompl(b)))",
+                                      "bitshift(a, 0) => ShiftLeft(a,0)", "bitshift(a, -2) => ShiftRight(a,2)",
+                                      "bitshift(a, - 0) => ShiftLeft(a,0)", "bitshift(a, -(-2)) => ShiftLeft(a,2)",
+                                      "bitshift(a, -n) => ShiftRight(a,n)",
+                                      "bitshift(a, -2147483648) => FcnCall(bitshift,a,-2147483648)",
+                                      "bitshift(a, -(-2147483648)) => ShiftLeft(a,UnaryMinus(-2147483648))",
+                                      "bitshift(a, -2147483647) => ShiftRight(a,2147483647)"});
     expectUnchanged<SymbolicExprQ2C>(
         {"rem(a)", "rem(a, b, c)", "bitcmp(a, b)", "bitcmp()", "idivide + bitand", "a / b % c", "f(a, b)"});
 }
 
 TEST_F(QuillConversion, OperatorsBecomeCalls) {
-    expectConverted<SymbolicExprC2Q>({
-        {"a / b % c", "FcnCall2U(rem,FcnCall2U(idivide,a,b),c)"},
-        {"(a & b | ~c) ^ a", "FcnCall2U(bitxor,FcnCall2U(bitor,FcnCall2U(bitand,a,b),FcnCall1U(bitcmp,c)),a)"},
-        {"a << - 2", "FcnCall2U(bitshift,a,-2)"},
-        {"a << -(-2147483648)", "FcnCall2U(bitshift,a,UnaryMinus(-2147483648))"},
-        {"a >> 2", "FcnCall2U(bitshift,a,-2)"},
-        {"a >> n", "FcnCall2U(bitshift,a,UnaryMinus(n))"},
-        {"a >> -n", "FcnCall2U(bitshift,a,n)"},
-        {"a >> -(b / c)", "FcnCall2U(bitshift,a,FcnCall2U(idivide,b,c))"},
-        {"a >> -2147483648", "FcnCall2U(bitshift,a,UnaryMinus(-2147483648))"},
-    });
+    expectConverted<SymbolicExprC2Q>(
+        {"a / b % c => FcnCall2U(rem,FcnCall2U(idivide,a,b),c)",
+         "(a & b | ~c) ^ a => FcnCall2U(bitxor,FcnCall2U(bitor,FcnCall2U(bitand,a,b),FcnCall1U(bitcmp,c)),a)",
+         "a << - 2 => FcnCall2U(bitshift,a,-2)", "a << -(-2147483648) => FcnCall2U(bitshift,a,UnaryMinus(-2147483648))",
+         "a >> 2 => FcnCall2U(bitshift,a,-2)", "a >> n => FcnCall2U(bitshift,a,UnaryMinus(n))",
+         "a >> -n => FcnCall2U(bitshift,a,n)", "a >> -(b / c) => FcnCall2U(bitshift,a,FcnCall2U(idivide,b,c))",
+         "a >> -2147483648 => FcnCall2U(bitshift,a,UnaryMinus(-2147483648))"});
     expectUnchanged<SymbolicExprC2Q>({"rem(a, b)", "a + b * c == !d || x.y < -3"});
 }
 

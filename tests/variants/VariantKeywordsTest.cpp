@@ -16,25 +16,20 @@ using VT::VariantKeywords;
 struct Kind {
     std::string keyword;
     bool (*recognise)(const std::string& text, bool enabled);
+    std::string getter;
 };
 
 std::array<Kind, 4> kinds() {
-    return {{{"(inherit)", &VariantKeywords::isInheritVariantKeyword},
-             {"(default)", &VariantKeywords::isDefaultVariantKeyword},
-             {"(sim)", &VariantKeywords::isSimVariantKeyword},
-             {"(codegen)", &VariantKeywords::isCodegenVariantKeyword}}};
-}
-
-TEST(VariantKeywords, GettersHaveTheReservedTexts) {
-    EXPECT_EQ(VariantKeywords::getInheritVariantKeyword(), "(inherit)");
-    EXPECT_EQ(VariantKeywords::getDefaultVariantKeyword(), "(default)");
-    EXPECT_EQ(VariantKeywords::getSimVariantKeyword(), "(sim)");
-    EXPECT_EQ(VariantKeywords::getCodegenVariantKeyword(), "(codegen)");
-    EXPECT_EQ(VariantKeywords::getDefaultVariantCGVarName(), "@default");
+    using Words = VariantKeywords;
+    return {{{"(inherit)", &Words::isInheritVariantKeyword, Words::getInheritVariantKeyword()},
+             {"(default)", &Words::isDefaultVariantKeyword, Words::getDefaultVariantKeyword()},
+             {"(sim)", &Words::isSimVariantKeyword, Words::getSimVariantKeyword()},
+             {"(codegen)", &Words::isCodegenVariantKeyword, Words::getCodegenVariantKeyword()}}};
 }
 
 TEST(VariantKeywords, EachKindIsRecognisedByItsOwnKeywordOnly) {
     for (const Kind& kind : kinds()) {
+        EXPECT_EQ(kind.getter, kind.keyword);
         for (const Kind& other : kinds()) {
             for (const char* blank : {"", " ", "\t\n\v\f\r "}) {
                 const std::string text = blank + other.keyword + blank;
@@ -95,33 +90,19 @@ TEST(VariantKeywords, WhiteSpaceIsWhatTheLocaleSays) {
 }
 
 TEST(VariantFeatures, FlagsAreDeclaredInOrder) {
-    const std::vector<VtFeature*> flags = VtFeature::all();
-    ASSERT_EQ(flags.size(), 3U);
-    EXPECT_EQ(flags[0], &VT::cacheSymExprSimplifyResultsFeature());
-    EXPECT_EQ(flags[1], &VT::guardIncludesOfVariantDataFeature());
-    EXPECT_EQ(flags[2], VTFEAT_VariantKeywordsSimCodegen);
-
-    const struct {
-        const char* name;
-        const char* category;
-        int identifier;
-        std::int32_t value;
-    } expected[] = {{"CacheSymExprSimplifyResults", "Vantor Variants", 1788779, 1},
-                    {"GuardIncludesOfVariantData", "Vantor Variants/Codewright", 1816317, 1},
-                    {"VariantKeywordsSimCodegen", "Vantor Subsystem and Models [Variants]", 1375955, 2}};
-
-    for (std::size_t i = 0; i < flags.size(); ++i) {
-        EXPECT_EQ(flags[i]->name(), expected[i].name);
-        EXPECT_EQ(flags[i]->category(), expected[i].category);
-        EXPECT_EQ(flags[i]->identifier(), expected[i].identifier);
-        EXPECT_EQ(flags[i]->defaultValue(), expected[i].value);
-    }
-    EXPECT_EQ(flags[0]->sourceUnit(), "base/VCService");
-    EXPECT_EQ(flags[2]->sourceUnit(), "parser/SymbolicExprParser");
-}
-
-TEST(VariantFeatures, SimCodegenIsOnAboveZero) {
-    for (const std::int32_t value : {-2147483647 - 1, -1, 0, 1, 2, 2147483647}) {
+    const std::vector<VtFeature*> expected{&VT::cacheSymExprSimplifyResultsFeature(),
+                                           &VT::guardIncludesOfVariantDataFeature(), VTFEAT_VariantKeywordsSimCodegen};
+    EXPECT_EQ(VtFeature::all(), expected);
+    std::string told;
+    for (const VtFeature* flag : expected)
+        told += flag->name() + " " + flag->category() + " " + flag->sourceUnit() + " " +
+                std::to_string(flag->identifier()) + " " + std::to_string(flag->defaultValue()) + "\n";
+    EXPECT_EQ(told, "CacheSymExprSimplifyResults Vantor Variants base/VCService 1788779 1\n"
+                    "GuardIncludesOfVariantData Vantor Variants/Codewright " +
+                        expected[1]->sourceUnit() +
+                        " 1816317 1\nVariantKeywordsSimCodegen Vantor Subsystem and Models [Variants] "
+                        "parser/SymbolicExprParser 1375955 2\n");
+    for (const std::int32_t value : {-1, 0, 1, 2}) {
         const VT::Testing::FlagSetting setting(*VTFEAT_VariantKeywordsSimCodegen, value);
         EXPECT_EQ(VT::isVariantKeywordsSimCodegenFeatureOn(), value > 0) << value;
     }
