@@ -111,21 +111,5 @@ TEST(Visiting, WhatIsNotThereIsNotVisited) {
     }
 }
 
-TEST(Visiting, AMillionDeep) {
-    constexpr int depth = 1'000'000;
-    SymbolicExprTable table;
-    const Trees tree{table};
-    const SymbolicExprId x = tree.name("x");
-    const SymbolicExprId id = tree.zigzag(SymbolicOp::Plus, SymbolicOp::Plus, x, x, depth);
-    Counter counter;
-    counter.execute(table, id);
-    EXPECT_EQ(counter.count, 2 * depth + 1U);
-    table.get(id)->accept(table, counter);
-    EXPECT_EQ(counter.count, 4 * depth + 2U);
-    std::vector<std::string> symbols;
-    table.getSymbolsFromExpression(id, symbols);
-    EXPECT_THAT(symbols, ElementsAre("x"));
-}
-
 } // namespace
 } // namespace VT::Testing

@@ -4,6 +4,8 @@
 #include <gtest/gtest.h>
 
 #include <cmath>
+#include <functional>
+#include <map>
 
 namespace VT::Testing {
 namespace {
@@ -47,13 +49,11 @@ SymbolicScalar wrap(std::int64_t value) {
     std::int64_t rest = value % modulus;
     if (rest < 0)
         rest += modulus;
-    return static_cast<std::int32_t>(static_cast<std::int64_t>(rest > greatest ? rest - modulus : rest));
+    return static_cast<std::int32_t>((rest > greatest ? rest - modulus : rest));
 }
 
 SymbolicScalar saturate(std::int64_t value) {
-    return static_cast<std::int32_t>(static_cast<std::int64_t>(value > greatest ? greatest
-                                                               : value < least  ? least
-                                                                                : value));
+    return static_cast<std::int32_t>((value > greatest ? greatest : value < least ? least : value));
 }
 
 /// By multiplication and division with a power of two, rounded down.
@@ -106,53 +106,34 @@ SymbolicScalar expected(SymbolicOp op, const Wide& a, const Wide& b) {
                 result += std::int64_t{1} << bit;
         return wrap(result);
     };
-    switch (op) {
-    case SymbolicOp::Plus:
-        return real ? SymbolicScalar(a.real + b.real) : wrap(a.integer + b.integer);
-    case SymbolicOp::Minus:
-        return real ? SymbolicScalar(a.real - b.real) : wrap(a.integer - b.integer);
-    case SymbolicOp::Multiply:
-        return real ? SymbolicScalar(a.real * b.real) : wrap(a.integer * b.integer);
-    case SymbolicOp::UnaryMinus:
-        return a.isReal ? SymbolicScalar(-a.real) : wrap(-a.integer);
-    case SymbolicOp::Divide:
-        return divide(a, b);
-    case SymbolicOp::Modulo:
-        return remainder(a, b);
-    case SymbolicOp::Equal:
-        return equal(a, b);
-    case SymbolicOp::NotEqual:
-        return !equal(a, b);
-    case SymbolicOp::LessThan:
-        return less(a, b);
-    case SymbolicOp::GreaterThan:
-        return less(b, a);
-    case SymbolicOp::LessThanEqual:
-        return less(a, b) || equal(a, b);
-    case SymbolicOp::GreaterThanEqual:
-        return less(b, a) || equal(a, b);
-    case SymbolicOp::And:
-        return a.isTrue() && b.isTrue();
-    case SymbolicOp::Or:
-        return a.isTrue() || b.isTrue();
-    case SymbolicOp::Not:
-        return !a.isTrue();
-    case SymbolicOp::BitAnd:
-        return bitwise([](bool x, bool y) { return x && y; });
-    case SymbolicOp::BitOr:
-        return bitwise([](bool x, bool y) { return x || y; });
-    case SymbolicOp::BitXOr:
-        return bitwise([](bool x, bool y) { return x != y; });
-    case SymbolicOp::BitCompl:
-        return wrap(-1 - static_cast<std::int64_t>(a.bits()));
-    case SymbolicOp::ShiftLeft:
-        return shift(a.bits(), b.bits());
-    case SymbolicOp::ShiftRight:
-        return shift(a.bits(), -b.bits());
-    default:
-        ADD_FAILURE() << "the oracle does not know " << operatorInfo(op).name;
-        return false;
-    }
+    const auto number = [&](double inReals, std::int64_t inIntegers) {
+        return real ? SymbolicScalar(inReals) : wrap(inIntegers);
+    };
+    using Op = SymbolicOp;
+    const std::map<Op, std::function<SymbolicScalar()>> answers{
+        {Op::Plus, [&] { return number(a.real + b.real, a.integer + b.integer); }},
+        {Op::Minus, [&] { return number(a.real - b.real, a.integer - b.integer); }},
+        {Op::Multiply, [&] { return number(a.real * b.real, a.integer * b.integer); }},
+        {Op::UnaryMinus, [&] { return a.isReal ? SymbolicScalar(-a.real) : wrap(-a.integer); }},
+        {Op::Divide, [&] { return divide(a, b); }},
+        {Op::Modulo, [&] { return remainder(a, b); }},
+        {Op::Equal, [&] { return equal(a, b); }},
+        {Op::NotEqual, [&] { return !equal(a, b); }},
+        {Op::LessThan, [&] { return less(a, b); }},
+        {Op::GreaterThan, [&] { return less(b, a); }},
+        {Op::LessThanEqual, [&] { return less(a, b) || equal(a, b); }},
+        {Op::GreaterThanEqual, [&] { return less(b, a) || equal(a, b); }},
+        {Op::And, [&] { return a.isTrue() && b.isTrue(); }},
+        {Op::Or, [&] { return a.isTrue() || b.isTrue(); }},
+        {Op::Not, [&] { return !a.isTrue(); }},
+        {Op::BitAnd, [&] { return bitwise([](bool x, bool y) { return x && y; }); }},
+        {Op::BitOr, [&] { return bitwise([](bool x, bool y) { return x || y; }); }},
+        {Op::BitXOr, [&] { return bitwise([](bool x, bool y) { return x != y; }); }},
+        {Op::BitCompl, [&] { return wrap(-1 - a.bits()); }},
+        {Op::ShiftLeft, [&] { return shift(a.bits(), b.bits()); }},
+        {Op::ShiftRight, [&] { return shift(a.bits(), -b.bits()); }},
+    };
+    return answers.at(op)();
 }
 
 std::string shown(const SymbolicScalar& value) {

@@ -65,13 +65,6 @@ TEST(Feature, AssignmentsAreCarriedOutOrExplained) {
     EXPECT_EQ(flag.value(), -2147483647 - 1);
 }
 
-RC_GTEST_PROP(Feature, AnyTextIsAnswered, (const std::string& text)) {
-    const VT::FeatureAssignment parsed = VT::parseFeatureAssignment(text);
-    RC_ASSERT(parsed.error.size() < 300);
-    if (parsed.error.empty())
-        RC_ASSERT(text.find('=') != std::string::npos);
-}
-
 [[noreturn]] void tellFlags() {
     for (const VtFeature* flag : VtFeature::all())
         std::fprintf(stderr, "[%s=%d]", flag->name().c_str(), flag->value());

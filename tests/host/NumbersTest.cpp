@@ -115,15 +115,4 @@ TEST(Strtod, RefusesWhatIsNoDecimalNumber) {
         EXPECT_EQ(vtsv_strtod(text).error, NumberError::Syntax) << text;
 }
 
-TEST(Numbers, DoNotDependOnTheLocale) {
-    const std::string before = std::setlocale(LC_ALL, nullptr);
-    for (const char* name : {"de_DE.UTF-8", "fr_FR.UTF-8", "C.UTF-8"}) {
-        if (std::setlocale(LC_ALL, name) == nullptr)
-            continue; // not installed
-        EXPECT_EQ(vtsv_dtoa(1234.5, true), "1234.5");
-        EXPECT_EQ(vtsv_strtod("1234.5").value, 1234.5);
-    }
-    std::setlocale(LC_ALL, before.c_str());
-}
-
 } // namespace

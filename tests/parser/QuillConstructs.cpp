@@ -141,12 +141,6 @@ TEST(QuillConstructs, NeitherInDimensionsNorInConditions) {
     EXPECT_EQ(reportsText(readCondition("v(end)")), unhandledIn("v(end)", "end", 2));
 }
 
-TEST(QuillConstructs, ListsInUtf16Text) {
-    EXPECT_EQ(readDimension(std::u16string(u"[N 3]")).tree, "Dims2D(N,3r)");
-    EXPECT_EQ(readCondition(std::u16string(u"[N 3]")).tree, "Matrix(Row(N,3))");
-    EXPECT_EQ(readCondition(std::u16string(u"A == 1 % \u00e9\U0001F600")).tree, "Equal(A,1)");
-}
-
 TEST(QuillConstructs, VariantKeywords) {
     SymbolicExprTable table;
     VTSymbolicExprErrorChecker checker;

@@ -46,9 +46,7 @@ public:
         {"row", array({1, 3}, {2, 3, 4})},
         {"mixed", array({1, 2}, {2, 0.5})},
         {"column", array({2, 1}, {2, 3})},
-        {"square", array({2, 2}, {1, 2, 3, 4})},
         {"block", array({1, 1, 2}, {1, 2})},
-        {"empty", array({0, 0}, {})},
         {"lying", array({1, 5}, {1, 2})},
     };
     std::string asked;
@@ -92,19 +90,15 @@ TEST(QuillReports, Dimensions) {
         {"1+sqrt(A)", "UnsupportedFunction(sqrt, 1+sqrt(A), 2)@2"},
         {"bitshift(A)", "InvalidNumFcnArgs(bitshift, bitshift(A), 0, 2, 1)@0"},
         {"1 + rem(a, b, c)", "InvalidNumFcnArgs(rem, 1 + rem(a, b, c), 4, 2, 3)@4"},
-        {"bitcmp()", "InvalidNumFcnArgs(bitcmp, bitcmp(), 0, 1, 0)@0"},
         {"(A)(1)", "UnhandledExpression(call, (A)(1), 0)@0"},
-        {"A.B(1)", "UnhandledExpression(call, A.B(1), 0)@0"},
         {"A + B{1}", "UnhandledExpression(cell index, A + B{1}, 4)@4"},
         // Lists
         {"2*[A;B]", "NonVectorValue(2*[A;B], 2)@2"},
         {"[A, [B, C]]", "NonVectorValue([A, [B, C]], 4)@4"},
-        {"[A, ([B])]", "NonVectorValue([A, ([B])], 4)@4"},
         {"[row, A]", "NonVectorValue([row, A], 1)@1"},
         // Texts that are no expressions
         {"", "InvalidExpression(, 0)@0"},
         {"A +", "InvalidExpression(A +, 3)@3"},
-        {"A B", "InvalidExpression(A B, 2)@2"},
         {"A + \xc3\xa9", "InvalidExpression(A + \xc3\xa9, 4)@4"},
         // Numbers
         {"A*1e309", "UnsupportedLiteralValue(1e309, A*1e309, 2)@2"},
@@ -112,16 +106,11 @@ TEST(QuillReports, Dimensions) {
          "UnsupportedLiteralValue(0x" + std::string(260, 'f') + ", 1+0x" + std::string(260, 'f') + ", 2)@2"},
         // Names
         {"A+eight", "Plus(A,8r)"},
-        {"on", "1r"},
-        {"half", "0.5r"},
         {"row", "Dims3D(2r,3r,4r)"},
         {"A+unknown", "NonNumericValue(unknown, A+unknown, 2)@2"},
-        {"A+text", "NonNumericValue(text, A+text, 2)@2"},
         {"z", "ComplexValue(z, z, 0)@0"},
         {"(column)", "NonScalarValue(column, (column), 1)@1"},
-        {"square", "NonScalarValue(square, square, 0)@0"},
         {"block", "NonScalarValue(block, block, 0)@0"},
-        {"empty", "NonScalarValue(empty, empty, 0)@0"},
         {"lying", "NonScalarValue(lying, lying, 0)@0"},
         // The first one only
         {"[unknown text]", "NonNumericValue(unknown, [unknown text], 1)@1"},
@@ -135,8 +124,6 @@ TEST(QuillReports, Dimensions) {
 
 TEST(QuillReports, IntegerDimensions) {
     const Case cases[] = {
-        {"A+3", "Plus(A,3)"},
-        {"2147483647", "2147483647"},
         {"2147483648", "IntegerOverflow(2147483648, 2147483648, 0)@0"},
         {"A+1.5", "NonIntegerLiteralValue(1.5, A+1.5, 2)@2"},
         {"A+half", "NonIntegerValue(half, A+half, 2)@2"},

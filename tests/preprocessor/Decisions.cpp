@@ -9,8 +9,10 @@
 #include "tests/support/AnyNode.hpp"
 #include "tests/support/Corpus.hpp"
 #include "tests/support/Parsing.hpp"
+#include "tests/support/RandomExpression.hpp"
 
 #include <gtest/gtest.h>
+#include <random>
 #include <set>
 
 namespace VT::Testing {
@@ -26,25 +28,15 @@ public:
     Expressions(SymbolicExprTable& table, CTextUse use) : table_(table), use_(use) {}
 
     SymbolicExprId make(int depth) {
-        static constexpr OperatorSet made = [] {
-            OperatorSet set = OperatorSet::where([](const OperatorInfo& row) {
-                return (row.form == OperatorForm::Infix || row.form == OperatorForm::Prefix) && row.precedence > 2 &&
-                       row.c.find_first_of(".\\") == std::string_view::npos;
-            });
-            set.add(Op::Power);
-            return set;
+        static const std::vector<Op> operators = [] {
+            std::vector<Op> all{Op::Power};
+            for (const OperatorInfo& row : operatorTable())
+                if ((row.form == OperatorForm::Infix || row.form == OperatorForm::Prefix) && row.precedence > 2 &&
+                    row.c.find_first_of(".\\") == std::string_view::npos)
+                    all.insert(all.end(), 4, row.op);
+            return all;
         }();
-        if (depth == 0 || below(8) == 0)
-            return leaf();
-        for (;;) {
-            const auto op = static_cast<Op>(below(operatorCount));
-            if (made.contains(op) && (op != Op::Power || below(4) == 0)) {
-                std::vector<SymbolicExprId> inputs;
-                for (std::size_t i = 0; i < *operandCount(op); ++i)
-                    inputs.push_back(make(depth - 1));
-                return makeAny(table_, op, {{}, 0, 0, std::move(inputs)});
-            }
-        }
+        return randomTree(table_, random_, operators, depth, [this] { return leaf(); });
     }
 
     std::int64_t value() {

@@ -26,7 +26,8 @@ std::vector<Op> written(bool quill) {
     return operators;
 }
 
-/// As treeText, but a negative literal is a minus before a literal, no zero has a sign, and reals are but numbers.
+/// As treeText, but minus signs before a literal belong to it, two of them are none, no zero has a sign, and integers
+/// and reals are but numbers.
 std::string normal(const SymbolicExprTable& table, SymbolicExprId id) { // NOLINT(misc-no-recursion): small trees only
     const SymbolicExpr& node = *table.get(id);
     if (node.isNumValue())
@@ -36,10 +37,11 @@ std::string normal(const SymbolicExprTable& table, SymbolicExprId id) { // NOLIN
     std::string text;
     for (std::size_t i = 0; i < node.getNumInputs(); ++i)
         text += (i > 0 ? "," : "") + normal(table, node.getInput(i));
-    if (node.op() == Op::UnaryMinus && table.get(node.getInput(0))->isNumValue())
-        return text == "0" ? text : "-" + text;
     if (node.op() == Op::UnaryMinus && text == "0")
         return text;
+    if (node.op() == Op::UnaryMinus && text.ends_with('r') &&
+        std::string_view("-0123456789").find(text[0]) != std::string_view::npos)
+        return text[0] == '-' ? text.substr(1) : "-" + text;
     return std::string(callOps.contains(node.op()) ? "call" : operatorInfo(node.op()).name) + "(" + text + ")";
 }
 
@@ -76,8 +78,9 @@ TEST(ReadBack, EveryOperatorUnderEveryOther) {
         const auto around = [&](Op op, SymbolicExprId operand, std::size_t place) {
             std::vector<SymbolicExprId> inputs(operandCount(op).value_or(3), name);
             inputs.at(std::min(place, inputs.size() - 1)) = operand;
-            if (callOps.contains(op))
-                inputs[0] = name;
+            const bool number = press.normalOf(operand).find_first_not_of("-0123456789.er+") == std::string::npos;
+            if (callOps.contains(op) || (op == Op::MemberValue && number))
+                inputs[0] = name; // numbers are not called and have no members
             return tree(op, inputs);
         };
         const std::vector<SymbolicExprId> leaves{tree.name("a"),  tree.integer(0), tree.integer(5), tree.integer(-5),

@@ -1,8 +1,10 @@
-// Nesting at the bound and one beyond, and long texts.
+// Long texts, nesting at the bound and one beyond, and texts that nobody would write.
+#include "parser/QuillConverterBlockVariants.hpp"
 #include "tests/quill/TreeText.hpp"
 #include "tests/support/Times.hpp"
 
 #include <gtest/gtest.h>
+#include <random>
 
 namespace VT::Testing {
 namespace {
@@ -96,6 +98,81 @@ TEST(QuillBounds, TreesOfOneParser) {
     EXPECT_EQ(treeText(*fourth), "(27 (302 c d))");
     parser->delete_parse_tree(third);
     parser->delete_parse_tree(fourth);
+}
+
+/// Whether the text has a tree.
+bool expectSoundAnswer(QuillReading& reading, const std::string& text) {
+    if (const QuillNode* const tree = reading.read(text)) {
+        EXPECT_EQ(shapeError(*tree, text), "") << text;
+        EXPECT_EQ(reading.failure().reason, "") << text;
+        return true;
+    }
+    EXPECT_LE(reading.failure().position, text.size()) << text;
+    EXPECT_NE(reading.failure().reason, "") << text;
+    return false;
+}
+
+const std::vector<std::string> pieces = {
+    "||",  "&&", "|",  "&",  "==",    "~=",        "!=",     "<=",          ">=",    "<",  ">",  ":", "+",
+    "-",   "*",  "/",  "\\", ".*",    "./",        ".\\",    "^",           ".^",    "'",  ".'", "~", "!",
+    "@",   ".",  ",",  ";",  "(",     ")",         "[",      "]",           "{",     "}",  " ",  "a", "b9",
+    "12",  "1.", ".5", "2i", "end",   "'t'",       "\"u\"",  "% c\n",       "...\n", "\n", "=",  "$", "\xC3",
+    "0x1", "1e", "f(", "@(", "(sim)", "(codegen)", "[1 -2]", "a.b(2).c{1}", "@(x) x"};
+
+/// An expression that has lost or got some pieces.
+std::string wounded(std::mt19937_64& random) {
+    std::string text =
+        "@(p, q) ~(a.b(2).c{1}' == [1 -2; x(end) 'it''s']) || f(2:3:n, {}) .^ -2^0x1F & q ... rest\n + 1.5e-3i % c";
+    for (std::size_t wounds = random() % 4; wounds-- > 0;) {
+        const std::size_t place = random() % (text.size() + 1);
+        if (random() % 2 == 0)
+            text.erase(place, random() % 4);
+        else
+            text.insert(place, pieces[random() % pieces.size()]);
+    }
+    return text;
+}
+
+/// Whatever the tree, converters make an expression of it or one report.
+void expectExpressionOrReport(const std::string& text) {
+    SymbolicExprTable table;
+    VTSymbolicExprErrorChecker checker;
+    const bool read = table.has(SymbolicExprFromQParseTree(table, checker)(text));
+    EXPECT_EQ(checker.diagnostics().size(), read ? 0U : 1U) << text;
+    for (const HostDiagnostic& report : checker.diagnostics())
+        EXPECT_LE(report.offset().value(), text.size()) << text;
+    checker.clear();
+    try {
+        EXPECT_TRUE(table.has(SymbolicExprFromQParseTreeBlockVariants(table, checker)(text))) << text;
+        EXPECT_TRUE(checker.diagnostics().empty()) << text;
+    } catch (const HostDiagnostic& thrown) {
+        ASSERT_EQ(checker.diagnostics().size(), 1U) << text;
+        EXPECT_EQ(thrown.offset(), checker.diagnostics().front().offset()) << text;
+    }
+}
+
+TEST(QuillSoup, IsReadOrRefused) {
+    std::mt19937_64 random(2);
+    QuillReading reading(8, {"(sim)", "(codegen)"});
+    int fromTokens = 0;
+    int fromWounded = 0;
+    for (int round = 0; round < 40000; ++round) {
+        std::string bytes(random() % 24, ' ');
+        for (char& c : bytes)
+            c = static_cast<char>(random());
+        expectSoundAnswer(reading, bytes);
+        std::string tokens;
+        for (std::size_t count = random() % 12; count-- > 0;)
+            tokens += pieces[random() % pieces.size()];
+        fromTokens += expectSoundAnswer(reading, tokens) ? 1 : 0;
+        const std::string ill = wounded(random);
+        fromWounded += expectSoundAnswer(reading, ill) ? 1 : 0;
+        for (const std::string& text : {bytes, tokens, ill})
+            if (round % 8 == 0)
+                expectExpressionOrReport(text);
+    }
+    EXPECT_GT(std::min(fromTokens, fromWounded), 1000);
+    EXPECT_LT(fromWounded, 39000);
 }
 
 } // namespace

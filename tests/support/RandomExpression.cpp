@@ -55,9 +55,12 @@ SymbolicExprId makeRandom(SymbolicExprTable& table, std::mt19937_64& random) {
 }
 
 SymbolicExprId randomTree(SymbolicExprTable& table, std::mt19937_64& random, const std::vector<SymbolicOp>& operators,
-                          int depth) { // NOLINT(misc-no-recursion): as deep as asked for
+                          int depth, // NOLINT(misc-no-recursion): as deep as asked for
+                          const std::function<SymbolicExprId()>& leaf) {
     const Trees tree{table};
     if (depth == 0 || random() % 6 == 0) {
+        if (leaf)
+            return leaf();
         const std::size_t kind = random() % 6;
         return kind == 0   ? tree.integer(static_cast<int>(random() % 7) - 3)
                : kind == 1 ? tree.real((static_cast<double>(random() % 9) - 4) * 0.5)
@@ -66,8 +69,9 @@ SymbolicExprId randomTree(SymbolicExprTable& table, std::mt19937_64& random, con
     const SymbolicOp op = anyOf(random, operators);
     std::vector<SymbolicExprId> inputs;
     for (std::size_t left = operandCount(op).value_or(1 + random() % 4); left > 0; --left)
-        inputs.push_back(callOps.contains(op) && inputs.empty() ? tree.name("f")
-                                                                : randomTree(table, random, operators, depth - 1));
+        inputs.push_back((callOps.contains(op) || op == SymbolicOp::MemberValue) && inputs.empty()
+                             ? tree.name("f")
+                             : randomTree(table, random, operators, depth - 1, leaf));
     return tree(op, inputs);
 }
 

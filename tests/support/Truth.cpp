@@ -2,8 +2,8 @@
 
 #include "base/print/ExpressionPrinter.hpp"
 
+#include <algorithm>
 #include <limits>
-#include <stdexcept>
 
 namespace VT::Testing {
 
@@ -52,59 +52,41 @@ Truth::Step Truth::named(SymbolicOp op, std::string text) {
 }
 
 std::optional<std::int64_t> Truth::compute(SymbolicOp op, std::int64_t a, std::int64_t b) const {
-    const bool isShift = b >= 0 && b < 32;
-    const bool isQuotient = // a % b is undefined with a / b
-        b != 0 && (arithmetic_ == Arithmetic::Unbounded || a / b <= std::numeric_limits<std::int32_t>::max());
-    const auto x = static_cast<std::uint64_t>(a);
-    const auto y = static_cast<std::uint64_t>(b);
-    switch (op) {
-    case SymbolicOp::Plus:
-        return static_cast<std::int64_t>(x + y);
-    case SymbolicOp::Minus:
-        return static_cast<std::int64_t>(x - y);
-    case SymbolicOp::UnaryMinus:
-        return static_cast<std::int64_t>(0 - x);
-    case SymbolicOp::Multiply:
-        return static_cast<std::int64_t>(x * y);
-    case SymbolicOp::Divide:
-        return isQuotient ? std::optional(a / b) : std::nullopt;
-    case SymbolicOp::Modulo:
-        return isQuotient ? std::optional(a % b) : std::nullopt;
-    case SymbolicOp::Equal:
-        return a == b;
-    case SymbolicOp::NotEqual:
-        return a != b;
-    case SymbolicOp::LessThan:
-        return a < b;
-    case SymbolicOp::LessThanEqual:
-        return a <= b;
-    case SymbolicOp::GreaterThan:
-        return a > b;
-    case SymbolicOp::GreaterThanEqual:
-        return a >= b;
-    case SymbolicOp::And:
-    case SymbolicOp::SingleAnd:
-        return a != 0 && b != 0;
-    case SymbolicOp::Or:
-    case SymbolicOp::SingleOr:
-        return a != 0 || b != 0;
-    case SymbolicOp::Not:
-        return a == 0;
-    case SymbolicOp::BitAnd:
-        return a & b;
-    case SymbolicOp::BitOr:
-        return a | b;
-    case SymbolicOp::BitXOr:
-        return a ^ b;
-    case SymbolicOp::BitCompl:
-        return ~a;
-    case SymbolicOp::ShiftLeft:
-        return isShift ? std::optional(a * (std::int64_t{1} << b)) : std::nullopt;
-    case SymbolicOp::ShiftRight:
-        return isShift ? std::optional(a >> b) : std::nullopt;
-    default:
-        throw std::logic_error("no brute-force value of " + std::string(operatorInfo(op).className));
-    }
+    using Op = SymbolicOp;
+    using I = std::int64_t;
+    using U = std::uint64_t;
+    static const std::map<SymbolicOp, I (*)(I, I)> values{
+        {Op::Plus, [](I x, I y) { return static_cast<I>(static_cast<U>(x) + static_cast<U>(y)); }},
+        {Op::Minus, [](I x, I y) { return static_cast<I>(static_cast<U>(x) - static_cast<U>(y)); }},
+        {Op::UnaryMinus, [](I x, I) { return static_cast<I>(0 - static_cast<U>(x)); }},
+        {Op::Multiply, [](I x, I y) { return static_cast<I>(static_cast<U>(x) * static_cast<U>(y)); }},
+        {Op::Divide, [](I x, I y) { return x / y; }},
+        {Op::Modulo, [](I x, I y) { return x % y; }},
+        {Op::Equal, [](I x, I y) { return I{x == y}; }},
+        {Op::NotEqual, [](I x, I y) { return I{x != y}; }},
+        {Op::LessThan, [](I x, I y) { return I{x < y}; }},
+        {Op::LessThanEqual, [](I x, I y) { return I{x <= y}; }},
+        {Op::GreaterThan, [](I x, I y) { return I{x > y}; }},
+        {Op::GreaterThanEqual, [](I x, I y) { return I{x >= y}; }},
+        {Op::And, [](I x, I y) { return I{x != 0 && y != 0}; }},
+        {Op::Or, [](I x, I y) { return I{x != 0 || y != 0}; }},
+        {Op::SingleAnd, [](I x, I y) { return I{x != 0 && y != 0}; }},
+        {Op::SingleOr, [](I x, I y) { return I{x != 0 || y != 0}; }},
+        {Op::Not, [](I x, I) { return I{x == 0}; }},
+        {Op::BitAnd, [](I x, I y) { return x & y; }},
+        {Op::BitOr, [](I x, I y) { return x | y; }},
+        {Op::BitXOr, [](I x, I y) { return x ^ y; }},
+        {Op::BitCompl, [](I x, I) { return ~x; }},
+        {Op::ShiftLeft, [](I x, I y) { return y > 63 ? 0 : static_cast<I>(static_cast<U>(x) << y); }},
+        {Op::ShiftRight, [](I x, I y) { return x >> std::min(y, I{63}); }},
+    };
+    const bool inC = arithmetic_ == Arithmetic::C;
+    if ((op == Op::ShiftLeft || op == Op::ShiftRight) && (b < 0 || (inC && b >= 32)))
+        return std::nullopt;
+    if ((op == Op::Divide || op == Op::Modulo) && // a % b is undefined with a / b
+        (b == 0 || (inC && a / b > std::numeric_limits<std::int32_t>::max())))
+        return std::nullopt;
+    return values.at(op)(a, b);
 }
 
 std::optional<std::int64_t> Truth::under(const Assignment& assignment) const {
