@@ -6,7 +6,6 @@
 #include "tests/support/Slots.hpp"
 
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 #include <sstream>
 
 namespace VT::Testing {

@@ -4,7 +4,6 @@
 #include "tests/support/TreeText.hpp"
 
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 
 #include <limits>
 #include <memory>

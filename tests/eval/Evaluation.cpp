@@ -9,7 +9,6 @@
 #include <chrono>
 #include <functional>
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 #include <limits>
 #include <random>
 

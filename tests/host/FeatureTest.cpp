@@ -1,7 +1,6 @@
 #include "host/Feature.hpp"
 
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 #include <rapidcheck.h>
 #include <rapidcheck/gtest.h>
 

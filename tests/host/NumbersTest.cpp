@@ -1,7 +1,6 @@
 #include "host/Numbers.hpp"
 
 #include <gtest/gtest.h>
-#include <rapidcheck.h>
 #include <rapidcheck/gtest.h>
 
 #include <bit>

@@ -6,7 +6,6 @@
 
 #include <array>
 #include <gtest/gtest.h>
-#include <rapidcheck.h>
 #include <rapidcheck/gtest.h>
 #include <set>
 #include <type_traits>

@@ -10,7 +10,6 @@
 #include <clocale>
 #include <cmath>
 #include <gtest/gtest.h>
-#include <map>
 
 namespace VT::Testing {
 namespace {
@@ -212,13 +211,10 @@ TEST(GrammarLimits, RunsOfPrefixesAtTheBoundAndOneBeyond) {
 TEST(GrammarLimits, LongChains) {
     // Depth on the left spine costs no stack: neither reading, nor conversion, nor the end of the syntax value.
     constexpr std::size_t count = 200000;
-    const std::map<std::string, std::size_t> chains = {
-        {"A + ", 2 + count - 1}, {"A && ", 2 + count - 1}, {"A - ", 2 + count - 1}, {"A.", 1 + count}};
-    for (const auto& [link, nodes] : chains) {
+    for (const std::string link : {"A + ", "A && ", "A - ", "A."}) {
         SymbolicExprTable table;
-        const std::string text = times(count, link) + (link == "A." ? "A" : "B");
-        EXPECT_FALSE(parse(table, text).error.has_value()) << link;
-        EXPECT_GE(table.size(), nodes - 1) << link;
+        EXPECT_FALSE(parse(table, times(count, link) + "B").error.has_value()) << link;
+        EXPECT_GE(table.size(), count) << link;
     }
     SymbolicExprTable table;
     const std::string list = "[" + times(count, "1,") + "1]";

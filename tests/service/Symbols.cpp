@@ -6,7 +6,6 @@
 #include "tests/support/RandomExpression.hpp"
 
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 
 #include <algorithm>
 #include <set>
@@ -51,14 +50,8 @@ TEST(VCSymbols, KindsAreFourBits) {
     using enum VCSymbolType;
     EXPECT_EQ((VCSymbolTypes{Identifier, BoundMember}).bits(), 3U);
     EXPECT_EQ((VCSymbolTypes{UnboundMember, FunctionName}).bits(), 12U);
-    for (const int outside : {4, 5, -1}) {
-        try {
-            const VCSymbolTypes kinds{static_cast<VCSymbolType>(outside)};
-            ADD_FAILURE() << outside;
-        } catch (const std::out_of_range& error) {
-            EXPECT_THAT(error.what(), testing::StartsWith("bitset::set"));
-        }
-    }
+    for (const int outside : {4, -1})
+        EXPECT_THROW(VCSymbolTypes{static_cast<VCSymbolType>(outside)}, std::out_of_range);
 }
 
 TEST(Symbols, ACollectorRemembersWhatItVisited) {

@@ -29,30 +29,24 @@ public:
     using SymbolicExprXFormVisitor2::SymbolicExprXFormVisitor2;
 };
 
-template <class Visitor>
-SymbolicExprId executed(const SymbolicExprTable& source, SymbolicExprId id, SymbolicExprTable& target) {
+enum class Way { Execute, Accept, Rebuild };
+
+template <class Visitor, Way way>
+SymbolicExprId driven(const SymbolicExprTable& source, SymbolicExprId id, SymbolicExprTable& target) {
     Visitor visitor(target);
-    visitor.execute(source, id);
+    if (way == Way::Rebuild) {
+        const SymbolicExprId result = visitor.rebuild(source, id);
+        EXPECT_EQ(visitor.get(), invalidId) << "nothing is left behind";
+        return result;
+    }
+    way == Way::Execute ? visitor.execute(source, id) : source.get(id)->accept(source, visitor);
     return visitor.get();
 }
 
-template <class Visitor>
-SymbolicExprId accepted(const SymbolicExprTable& source, SymbolicExprId id, SymbolicExprTable& target) {
-    Visitor visitor(target);
-    source.get(id)->accept(source, visitor);
-    return visitor.get();
-}
-
-template <class Visitor>
-SymbolicExprId rebuilt(const SymbolicExprTable& source, SymbolicExprId id, SymbolicExprTable& target) {
-    Visitor visitor(target);
-    const SymbolicExprId result = visitor.rebuild(source, id);
-    EXPECT_EQ(visitor.get(), invalidId) << "nothing is left behind";
-    return result;
-}
-
-constexpr std::array drivers{executed<Rebuild>,       accepted<Rebuild>,       rebuilt<Rebuild>,
-                             executed<HookedRebuild>, accepted<HookedRebuild>, rebuilt<HookedRebuild>};
+constexpr std::array drivers{driven<Rebuild, Way::Execute>,      driven<Rebuild, Way::Accept>,
+                             driven<Rebuild, Way::Rebuild>,      driven<HookedRebuild, Way::Execute>,
+                             driven<HookedRebuild, Way::Accept>, driven<HookedRebuild, Way::Rebuild>};
+constexpr auto executed = drivers[0], rebuilt = drivers[2];
 
 /// A table of random nodes of all classes whose unfolded trees stay small, with truth about their size.
 struct RandomTable {
@@ -109,10 +103,10 @@ TEST(XForm, WhatIsNotThereIsAnswered) {
     SymbolicExprTable target;
     EXPECT_EQ(Rebuild(target).rebuild(source, 3), invalidId);
     EXPECT_EQ(Rebuild(target).rebuild(source, invalidId), invalidId);
-    EXPECT_EQ(executed<Rebuild>(source, invalidId, target), invalidId);
+    EXPECT_EQ(executed(source, invalidId, target), invalidId);
     EXPECT_EQ(target.size(), 0U);
-    EXPECT_EQ(treeText(target, rebuilt<Rebuild>(source, self, target)), "Plus(invalid,x)");
-    EXPECT_EQ(treeText(target, rebuilt<Rebuild>(source, row, target)), "Row(invalid,x,invalid)");
+    EXPECT_EQ(treeText(target, rebuilt(source, self, target)), "Plus(invalid,x)");
+    EXPECT_EQ(treeText(target, rebuilt(source, row, target)), "Row(invalid,x,invalid)");
     for (const auto driver : drivers) // visits only what is there; whatever the answer is, it is one
         for (const SymbolicExprId id : {self, row})
             EXPECT_TRUE(target.has(driver(source, id, target)));
