@@ -1,5 +1,4 @@
 // Properties over random and over real conditions.
-#include "base/simplify/IntegerSet.hpp"
 #include "tests/simplify/Workbench.hpp"
 #include "tests/support/Corpus.hpp"
 #include "tests/support/Parsing.hpp"
@@ -25,7 +24,6 @@ std::string condition(std::uint64_t seed, const ConditionShape& shape) {
     return randomCondition(random, comparisons, shape);
 }
 
-// The cubes and covers within are tested by this alone, sets of integers on their own too.
 TEST(Simplify, KeepsTheTruthAndIsAFixedPoint) {
     for (std::uint64_t seed = 0; seed < 1000; ++seed) {
         const std::string text = condition(seed, shapes[seed % shapes.size()]);
@@ -50,34 +48,6 @@ RC_GTEST_PROP(Simplify, DoesNotDependOnWhatWasInternedBefore, ()) {
     for (std::uint64_t other = 0; other < 3; ++other)
         used.simplify(used.parse(condition(seed + other, shapes[0])));
     RC_ASSERT(fresh.simplified(text) == used.simplified(text));
-}
-
-IntegerSet anySet() {
-    IntegerSet set = *rc::gen::inRange(0, 2) == 0 ? IntegerSet::all() : IntegerSet();
-    for (int i = *rc::gen::inRange(0, 4); i > 0; --i) {
-        const SymbolicOp op = static_cast<SymbolicOp>(*rc::gen::inRange(9, 15));
-        const IntegerSet next = IntegerSet::satisfying(op, *rc::gen::inRange<std::int64_t>(-4, 5));
-        set = *rc::gen::inRange(0, 2) == 0 ? set.intersect(next) : set.unite(next);
-    }
-    return set;
-}
-
-RC_GTEST_PROP(IntegerSets, FollowTheirMembers, ()) {
-    const IntegerSet a = anySet(), b = anySet();
-    bool subset = true;
-    bool common = false;
-    for (std::int64_t x = -6; x <= 6; ++x) { // beyond every constant, so that it decides for all integers
-        const bool inA = a.contains(x), inB = b.contains(x);
-        RC_ASSERT(a.complement().contains(x) == !inA);
-        RC_ASSERT(a.intersect(b).contains(x) == (inA && inB));
-        RC_ASSERT(a.unite(b).contains(x) == (inA || inB));
-        RC_ASSERT(a.minus(b).contains(x) == (inA && !inB));
-        subset = subset && (!inA || inB);
-        common = common || (inA && inB);
-    }
-    RC_ASSERT(a.isSubsetOf(b) == subset);
-    RC_ASSERT(a.intersects(b) == common);
-    RC_ASSERT(a.complement().complement() == a);
 }
 
 /// A sum or product as text.
