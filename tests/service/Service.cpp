@@ -125,6 +125,8 @@ TEST(ServiceCombinations, OfConstantsAndConditions) {
         {"false", "false", "false", "false", "false", "false"},
         {"true", "!(x<1)", "!(x<1)", "x>=1", "", ""},
         {"false", "!(x<1)", "false", "false", "!(x<1)", "x>=1"},
+        {"!(x<1)", "false", "false", "false", "!(x<1)", "x>=1"},
+        {"!(x<1)", "true", "!(x<1)", "x>=1", "", ""},
         {"x==1", "x==2", "x==1 && x==2", "false", "x==1 || x==2", "x==1 || x==2"},
         {"x<3", "x>3", "x<3 && x>3", "false", "x<3 || x>3", "x!=3"},
         {"y", "x", "y && x", "x && y", "y || x", "x || y"},
