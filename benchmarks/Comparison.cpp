@@ -80,7 +80,7 @@ private:
         std::string mark;
         if (row.mark > 0) {
             mark.resize(16);
-            mark.resize(static_cast<std::size_t>(std::snprintf(mark.data(), mark.size(), "%.1f", row.mark)));
+            mark.resize(static_cast<std::size_t>(std::snprintf(mark.data(), mark.size(), "%.3g", row.mark)));
         }
         std::printf("%-44s %10s %10s %7.2f %7.2f %6s", (row.name + ", per " + row.unit).c_str(),
                     readable(library.median() / row.items).c_str(), readable(floor.median() / row.items).c_str(),

@@ -18,9 +18,9 @@ namespace VT {
 
 namespace {
 
-/// So many bounds of a path, each within the bound of linear forms, add up within 64 bits.
-constexpr std::uint64_t mostSteps = std::uint64_t{1} << 22U;
-static_assert(limits::decisionSteps <= mostSteps && mostSteps <= std::uint64_t{1} << 62U >> 40U);
+/// Numbers of nodes and edges have 31 bits.
+constexpr std::uint64_t mostSteps = std::uint64_t{1} << 24U;
+static_assert(limits::decisionSteps <= mostSteps);
 
 } // namespace
 

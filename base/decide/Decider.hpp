@@ -14,7 +14,7 @@ namespace VT {
 struct DecisionOptions {
     bool keywordsInForce = true; ///< "(sim)" and "(codegen)" are opposites; plain symbols otherwise
     bool bits32 = false;         ///< unknowns are signed 32-bit integers; integers without bounds otherwise
-    std::uint64_t steps = limits::decisionSteps; ///< that one question may cost, 2^22 at most
+    std::uint64_t steps = limits::decisionSteps; ///< that one question may cost, 2^24 at most
 };
 
 /// Decides questions about conditions of one table.

@@ -18,10 +18,16 @@
 #include "base/decide/DifferenceSystem.hpp"
 #include "base/decide/TermPlan.hpp"
 
+#include <cstdlib>
 #include <memory>
 #include <span>
 
 namespace VT {
+
+/// Whether a is nearer to 0 than b; of two equally near the positive one is.
+inline bool isSmaller(std::int64_t a, std::int64_t b) {
+    return std::abs(a) != std::abs(b) ? std::abs(a) < std::abs(b) : a > b;
+}
 
 class WitnessSearch {
 public:

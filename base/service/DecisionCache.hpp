@@ -3,9 +3,10 @@
 
 #include "base/decide/Decision.hpp"
 
+#include <boost/container_hash/hash.hpp>
 #include <boost/unordered_map.hpp>
 
-#include <tuple>
+#include <cstdint>
 
 namespace VT {
 
