@@ -122,12 +122,14 @@ public:
     VCSymbolicExprId replaceSymbolsInExpression(const VCSymbolicExprId& condition,
                                                 const std::unordered_map<std::string, std::string>& names);
 
-    // Deciding.  Answers are exact over the unbounded integers, or "undecided" with the bound that was hit, and come
-    // with a witness where one assignment proves them; see Decision.hpp.  Operators that Quill writes as calls are
-    // decided as operators, the variant keywords as opposites while they are in force.  A customizer has no say.
-    // Decisions about pairs are kept like simplified conditions; an identifier that is not of the table stays
-    // undecided.
+    // Deciding.  Answers are exact over the integers, without bounds unless asked for, or "undecided" with the bound
+    // that was hit, and come with a witness where one assignment proves them; see Decision.hpp.  Operators that Quill
+    // writes as calls are decided as operators, the variant keywords as opposites while they are in force.  A
+    // customizer has no say.  Decisions about pairs are kept like simplified conditions; an identifier that is not of
+    // the table stays undecided.
 
+    /// Whether decisions are over the signed 32-bit integers from now on; over all integers at first.
+    void setDecisions32Bit(bool are32Bit);
     /// Whether there is an assignment for which the condition holds; whether it holds for all.
     Decision canHold(const VCSymbolicExprId& condition);
     Decision mustHold(const VCSymbolicExprId& condition);

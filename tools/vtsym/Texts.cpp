@@ -48,11 +48,11 @@ void Answerer::answer(const std::string& text) {
     out_.clear();
     if (answering_.inBlocks && line_ > 1)
         out_ += '\n';
-    if (json_) {
+    if (json_)
         out_.append("{\"line\":").append(std::to_string(line_));
-        appendMember(out_, "input", jsonString(text));
-    }
     const std::size_t begin = out_.size();
+    if (json_ && !answering_.tellsInput)
+        appendMember(out_, "input", jsonString(text));
     try {
         answering_.answer(text, out_);
         warn();
@@ -67,10 +67,12 @@ void Answerer::answer(const std::string& text) {
 }
 
 void Answerer::explain(const std::string& text, const TextError& error) {
-    if (json_)
-        appendMember(out_, "error", jsonOf(error));
-    else
+    if (!json_) {
         console_.words(errorLines(line_, text, error, console_.wordStyle()));
+        return;
+    }
+    appendMember(out_, "input", jsonString(text));
+    appendMember(out_, "error", jsonOf(error));
 }
 
 void Answerer::warn() {
@@ -179,6 +181,15 @@ void addLanguageOption(CLI::App& command, TextOptions& options) {
                     "unless given)")
         ->check(oneOf({"c", "quill", "pp"}))
         ->type_name("LANGUAGE");
+}
+
+void addBitsOption(CLI::App& command, bool& bits32) {
+    command
+        .add_option_function<std::string>(
+            "--bits", [&bits32](const std::string&) { bits32 = true; },
+            "Take names for signed integers of 32 bits; for integers without bounds unless given")
+        ->check(oneOf({"32"}))
+        ->type_name("BITS");
 }
 
 bool answerTexts(const TextOptions& options, Console& console, const Answering& answering) {
