@@ -40,6 +40,7 @@ struct Command {
 Command addSimplify(CLI::App& program);
 Command addCompare(CLI::App& program);
 Command addGiven(CLI::App& program);
+Command addCheck(CLI::App& program);
 Command addConvert(CLI::App& program);
 Command addTree(CLI::App& program);
 Command addSymbols(CLI::App& program);

@@ -1,0 +1,61 @@
+// A model checked.
+#pragma once
+
+#include "base/service/BlockConditions.hpp"
+#include "base/service/ChoiceSet.hpp"
+#include "base/service/VCServiceHandle.hpp"
+#include "host/embedded/Model.hpp"
+#include "tools/vtsym/Findings.hpp"
+
+#include <string>
+#include <vector>
+
+namespace vtsym {
+
+/// Checks the conditions of blocks, the choices of each block against each other, and the ports.
+class ModelCheck {
+public:
+    /// What was found about the choices of a block.
+    struct ChoiceSet {
+        const VTBlock* block;
+        VT::ChoiceSetReport report;
+    };
+
+    /// `file` is what places are told in.  The model outlives the check.
+    ModelCheck(const VTRootBD& model, std::string file, bool bits32);
+
+    /// Writes what is found, block by block; once.  Blocks in one that is never active are left out.
+    void run(FindingWriter& writer);
+
+    /// The sets in the order of the model, as far as they were checked.
+    [[nodiscard]] const std::vector<ChoiceSet>& choiceSets() const noexcept { return choiceSets_; }
+
+    [[nodiscard]] VT::VCService& service() const { return *handle_; }
+
+    /// The text of a condition in the language of the model.
+    [[nodiscard]] std::string print(VT::SymbolicExprId condition) const;
+    /// The text of a witness; "any values" of one without unknowns.
+    [[nodiscard]] std::string witnessText(const VT::Witness& witness) const;
+
+private:
+    bool readConditions(FindingWriter& writer);
+    VT::ChoiceSetReport checkBlock(const VTBlock& block);
+    VT::ChoiceSetReport checkChoices(const VTBlock& block);
+    void checkPort(const vtPort& port);
+    void tell(const VTBlock& set, std::span<const VTBlock* const> blocks, const VT::ChoiceFinding& finding);
+    void tellUndecided(const VTBlock& set, std::span<const VTBlock* const> blocks, const VT::ChoiceFinding& finding);
+    void tellShortened(Finding& finding, const VTBlock& block, VT::SymbolicExprId proposed) const;
+    [[nodiscard]] VT::SymbolicExprId parentOf(const VTBlock& block);
+    [[nodiscard]] Place placeOf(const VTBlock& block) const;
+    [[nodiscard]] std::vector<RelatedPlace> conditionsAround(const VTBlock* block) const;
+
+    const VTRootBD& model_;
+    std::string file_;
+    VT::VCServiceHandle handle_;
+    VT::BlockConditions conditions_;
+    VT::ChoiceSetChecker checker_;
+    FindingWriter* writer_ = nullptr;
+    std::vector<ChoiceSet> choiceSets_;
+};
+
+} // namespace vtsym
