@@ -2,6 +2,7 @@
 #include "tools/vtsym/Commands.hpp"
 #include "tools/vtsym/Findings.hpp"
 #include "tools/vtsym/ModelCheck.hpp"
+#include "tools/vtsym/ModelPage.hpp"
 #include "tools/vtsym/Texts.hpp"
 
 #include "host/embedded/ModelFile.hpp"
@@ -24,6 +25,7 @@ could not be decided.
 
 Examples:
   vtsym check model.json
+  vtsym check --html page.html model.json
   vtsym check --sarif model.json > findings.sarif)";
 
 constexpr std::array<FindingRule, 5> rules{{
@@ -43,6 +45,7 @@ constexpr std::array<FindingRule, 5> rules{{
 
 struct CheckOptions {
     std::string file;
+    std::string page;
     FindingForm form = FindingForm::Compiler;
     bool bits32 = false;
 };
@@ -60,6 +63,15 @@ std::string contentOf(const std::string& path) {
     return content;
 }
 
+void writePage(const std::string& path, const std::string& page) {
+    errno = 0;
+    std::ofstream stream(path, std::ios::binary);
+    stream << page;
+    stream.close();
+    if (!stream)
+        throw std::runtime_error("The page " + path + " cannot be written: " + std::strerror(errno) + ".");
+}
+
 SearchResult check(const CheckOptions& options, Console& console) {
     const std::unique_ptr<FindingWriter> writer = makeFindingWriter(options.form, console, rules);
     try {
@@ -68,6 +80,8 @@ SearchResult check(const CheckOptions& options, Console& console) {
         VT::Embedded::readModel(contentOf(options.file), model);
         ModelCheck modelCheck(model, options.file, options.bits32);
         modelCheck.run(*writer);
+        if (!options.page.empty())
+            writePage(options.page, modelPage(model, modelCheck));
     } catch (const VT::Embedded::ModelError& error) {
         writer->problem({options.file, error.place().line, error.place().column, 0, 0, {}}, error.what());
     } catch (const std::runtime_error& error) {
@@ -82,6 +96,8 @@ Command addCheck(CLI::App& program) {
     CLI::App* const command = program.add_subcommand("check", "Check the choices of a model against each other");
     const auto options = std::make_shared<CheckOptions>();
     command->add_option("MODEL", options->file, "File of the model")->required()->type_name("");
+    command->add_option("--html", options->page, "Write a page that shows how the choices stand to each other")
+        ->type_name("FILE");
     addFormOptions(*command, options->form);
     addBitsOption(*command, options->bits32);
     command->footer(examples);

@@ -75,6 +75,16 @@ Place ModelCheck::placeOf(const VTBlock& block) const {
     return place;
 }
 
+void ModelCheck::write(std::vector<Finding>& kept, Finding finding) {
+    writer_->write(finding);
+    kept.push_back(std::move(finding));
+}
+
+void ModelCheck::problem(const Place& place, const std::string& sentence) {
+    writer_->problem(place, sentence);
+    problems_.push_back(sentence);
+}
+
 /// The conditions of a block and of its ancestors, the nearest first.
 std::vector<RelatedPlace> ModelCheck::conditionsAround(const VTBlock* block) const {
     std::vector<RelatedPlace> around;
@@ -89,11 +99,11 @@ VT::SymbolicExprId ModelCheck::parentOf(const VTBlock& block) {
 }
 
 /// Whether all conditions are some.
-bool ModelCheck::readConditions(FindingWriter& writer) {
+bool ModelCheck::readConditions() {
     bool allRead = true;
     std::unordered_set<const VTBlock*> withDefault;
     const auto refuse = [&](const VTBlock& block, const std::string& sentence) {
-        writer.problem(placeOf(block), block.path() + ": " + sentence);
+        problem(placeOf(block), block.path() + ": " + sentence);
         allRead = false;
     };
     for (const VTBlock& block : model_.blocks()) {
@@ -113,7 +123,7 @@ bool ModelCheck::readConditions(FindingWriter& writer) {
 
 void ModelCheck::run(FindingWriter& writer) {
     writer_ = &writer;
-    if (!readConditions(writer))
+    if (!readConditions())
         return;
     std::unordered_set<const VTBlock*> dead; // with all that is in them
     for (const VTBlock& block : model_.blocks()) {
@@ -131,7 +141,7 @@ void ModelCheck::run(FindingWriter& writer) {
         if (!block.choices().empty() && !dead.contains(&block))
             note(checkChoices(block), block.choices());
         if (checker_.stepsUsedUp()) {
-            writer.problem(placeOf(block), "The steps of the check are used up: what follows is not decided.");
+            problem(placeOf(block), "The steps of the check are used up: what follows is not decided.");
             return;
         }
     }
@@ -144,7 +154,7 @@ VT::ChoiceSetReport ModelCheck::checkBlock(const VTBlock& block) {
     VT::ChoiceSetReport report = checker_.checkCondition(parentOf(block), conditions_.own(block).id());
     const std::array blocks{&block};
     for (const VT::ChoiceFinding& finding : report.findings)
-        tell(block, blocks, finding);
+        write(otherFindings_, findingOf(block, blocks, finding));
     for (const VT::ChoiceFinding& finding : report.undecided)
         tellUndecided(block, blocks, finding);
     return report;
@@ -161,19 +171,21 @@ VT::ChoiceSetReport ModelCheck::checkChoices(const VTBlock& block) {
         return (finding.fault == VT::ChoiceFault::Redundant && isDefault(choice)) ||
                (finding.fault == VT::ChoiceFault::AlwaysActive && choices.size() == 1 && isUnconditional(choice));
     });
+    choiceSets_.push_back({&block, report, {}});
+    std::vector<Finding>& findings = choiceSets_.back().findings;
     for (const VT::ChoiceFinding& finding : report.findings)
-        tell(block, block.choices(), finding);
+        write(findings, findingOf(block, block.choices(), finding));
     for (const VT::ChoiceFinding& finding : report.undecided)
         tellUndecided(block, block.choices(), finding);
     if (!report.allOverlaps && !checker_.stepsUsedUp())
-        writer_->write(findingAt(placeOf(block), VT::ChoiceFault::Overlap,
-                                 "more choices of " + block.path() + " overlap than the pairs told",
-                                 print(conditions_.net(block).id())));
-    choiceSets_.push_back({&block, report});
+        write(findings, findingAt(placeOf(block), VT::ChoiceFault::Overlap,
+                                  "more choices of " + block.path() + " overlap than the pairs told",
+                                  print(conditions_.net(block).id())));
     return report;
 }
 
-void ModelCheck::tell(const VTBlock& set, std::span<const VTBlock* const> blocks, const VT::ChoiceFinding& finding) {
+Finding ModelCheck::findingOf(const VTBlock& set, std::span<const VTBlock* const> blocks,
+                              const VT::ChoiceFinding& finding) {
     const bool isOfSet = finding.fault == VT::ChoiceFault::Missing;
     const bool isPair = finding.fault == VT::ChoiceFault::Overlap;
     const VTBlock& block = isOfSet ? set : *blocks[isPair ? finding.other : finding.choice];
@@ -217,7 +229,7 @@ void ModelCheck::tell(const VTBlock& set, std::span<const VTBlock* const> blocks
     }
     if (finding.fault != VT::ChoiceFault::Dead)
         result.witness = handle_->printWitness(finding.witness);
-    writer_->write(result);
+    return result;
 }
 
 void ModelCheck::tellShortened(Finding& finding, const VTBlock& block, VT::SymbolicExprId proposed) const {
@@ -247,10 +259,10 @@ void ModelCheck::tellUndecided(const VTBlock& set, std::span<const VTBlock* cons
     default:
         question = path + (finding.fault == VT::ChoiceFault::Dead ? " can be active" : " is always active");
     }
-    writer_->problem(placeOf(block),
-                     "Whether " + question + " stays undecided: it " +
-                         (finding.bound == VT::DecisionBound::Steps ? "takes too many steps."
-                                                                    : "hangs on arithmetic beyond linear terms."));
+    problem(placeOf(block),
+            "Whether " + question + " stays undecided: it " +
+                (finding.bound == VT::DecisionBound::Steps ? "takes too many steps."
+                                                           : "hangs on arithmetic beyond linear terms."));
 }
 
 void ModelCheck::checkPort(const vtPort& port) {
@@ -264,7 +276,7 @@ void ModelCheck::checkPort(const vtPort& port) {
     Place place = regionOf(file_, port.place());
     place.name = port.name();
     if (flows.isUndecided())
-        writer_->problem(place, "Whether the port " + port.name() + " can be active stays undecided.");
+        problem(place, "Whether the port " + port.name() + " can be active stays undecided.");
     if (!flows.isNo())
         return;
     std::vector<RelatedPlace> follows = conditionsAround(&port.source());
@@ -277,7 +289,7 @@ void ModelCheck::checkPort(const vtPort& port) {
                                    " is never active together with a block that it goes to",
                                print(condition));
     result.follows = std::move(follows);
-    writer_->write(result);
+    write(otherFindings_, std::move(result));
 }
 
 } // namespace vtsym

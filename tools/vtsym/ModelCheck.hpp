@@ -19,6 +19,7 @@ public:
     struct ChoiceSet {
         const VTBlock* block;
         VT::ChoiceSetReport report;
+        std::vector<Finding> findings;
     };
 
     /// `file` is what places are told in.  The model outlives the check.
@@ -30,19 +31,26 @@ public:
     /// The sets in the order of the model, as far as they were checked.
     [[nodiscard]] const std::vector<ChoiceSet>& choiceSets() const noexcept { return choiceSets_; }
 
-    [[nodiscard]] VT::VCService& service() const { return *handle_; }
+    /// What was found about other blocks and about ports.
+    [[nodiscard]] const std::vector<Finding>& otherFindings() const noexcept { return otherFindings_; }
 
-    /// The text of a condition in the language of the model.
-    [[nodiscard]] std::string print(VT::SymbolicExprId condition) const;
+    /// Sentences on what could not be read or decided.
+    [[nodiscard]] const std::vector<std::string>& problems() const noexcept { return problems_; }
+
+    [[nodiscard]] const std::string& file() const noexcept { return file_; }
+
     /// The text of a witness; "any values" of one without unknowns.
     [[nodiscard]] std::string witnessText(const VT::Witness& witness) const;
 
 private:
-    bool readConditions(FindingWriter& writer);
+    [[nodiscard]] std::string print(VT::SymbolicExprId condition) const;
+    void write(std::vector<Finding>& kept, Finding finding);
+    void problem(const Place& place, const std::string& sentence);
+    bool readConditions();
     VT::ChoiceSetReport checkBlock(const VTBlock& block);
     VT::ChoiceSetReport checkChoices(const VTBlock& block);
     void checkPort(const vtPort& port);
-    void tell(const VTBlock& set, std::span<const VTBlock* const> blocks, const VT::ChoiceFinding& finding);
+    Finding findingOf(const VTBlock& set, std::span<const VTBlock* const> blocks, const VT::ChoiceFinding& finding);
     void tellUndecided(const VTBlock& set, std::span<const VTBlock* const> blocks, const VT::ChoiceFinding& finding);
     void tellShortened(Finding& finding, const VTBlock& block, VT::SymbolicExprId proposed) const;
     [[nodiscard]] VT::SymbolicExprId parentOf(const VTBlock& block);
@@ -56,6 +64,8 @@ private:
     VT::ChoiceSetChecker checker_;
     FindingWriter* writer_ = nullptr;
     std::vector<ChoiceSet> choiceSets_;
+    std::vector<Finding> otherFindings_;
+    std::vector<std::string> problems_;
 };
 
 } // namespace vtsym
