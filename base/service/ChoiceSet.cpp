@@ -5,12 +5,14 @@
 #include "base/VCService.hpp"
 #include "base/core/Table.hpp"
 #include "base/decide/Decider.hpp"
+#include "base/service/ChoiceRanges.hpp"
 #include "base/service/ImpliedCondition.hpp"
 #include "base/simplify/Simplify.hpp"
 #include "base/transform/QuillConversion.hpp"
 #include "base/variants/VariantKeywords.hpp"
 
 #include <algorithm>
+#include <limits>
 
 namespace VT {
 
@@ -25,20 +27,24 @@ struct ChoiceSetChecker::State {
 
     /// A run of choices whose conditions are joined by Or.
     struct Run {
-        std::size_t begin;
-        std::size_t end;
         SymbolicExprId holds; ///< where one of them is active
-        std::size_t left;     ///< positions of its halves; of a single choice its own
+        NameRanges ranges;    ///< of names there
+        std::size_t count;
+        std::size_t left; ///< positions of its halves in the runs; of a single choice its own among the choices
         std::size_t right;
 
-        [[nodiscard]] bool isSingle() const noexcept { return end - begin == 1; }
+        [[nodiscard]] bool isSingle() const noexcept { return count < 2; }
     };
 
     Decision ask(Decision (Decider::*question)(SymbolicExprId), SymbolicExprId condition);
     Decision ask(Decision (Decider::*question)(SymbolicExprId, SymbolicExprId), SymbolicExprId a, SymbolicExprId b);
     Decision counted(Decision decision);
     [[nodiscard]] std::size_t operandsOf(SymbolicExprId condition) const;
-    void checkOne(std::size_t position, SymbolicExprId parent, SymbolicExprId condition, SymbolicExprId holds,
+    static void add(ChoiceFinding finding, Decision decision, ChoiceSetReport& report);
+    void checkDefault(std::size_t position, SymbolicExprId parent, const std::vector<Run>& runs, const Decision& gap,
+                      ChoiceSetReport& report);
+    Decision findGap(SymbolicExprId parent, const std::vector<Run>& runs);
+    bool checkOne(std::size_t position, SymbolicExprId parent, SymbolicExprId condition, SymbolicExprId holds,
                   ChoiceSetReport& report);
     SymbolicExprId shorten(SymbolicExprId parent, SymbolicExprId condition);
     std::vector<Run> halve(std::span<const SymbolicExprId> holds);
@@ -112,49 +118,77 @@ SymbolicExprId ChoiceSetChecker::State::shorten(SymbolicExprId parent, SymbolicE
         return condition;
     const SymbolicExprId given = toC(condition);
     const SymbolicExprId context = toC(parent);
+    // Literals are taken from a context that is not large.
+    const SymbolicExprId literals = operandsOf(parent) > limits::choiceOperands ? table.getIdTRUE() : parent;
     const auto isEqual = [&](SymbolicExprId candidate) {
         return stepsLeft != 0 && counted(decider.equivalentGiven(toC(candidate), given, context)).isYes();
     };
     const SymbolicExprId shorter =
-        ImpliedCondition(table, service.simplifier().printer(), parent, isEqual).shorten(condition);
+        ImpliedCondition(table, service.simplifier().printer(), literals, isEqual).shorten(condition);
     return operandsOf(shorter) < operands ? shorter : condition;
 }
 
-/// `holds` is where both the parent and the condition hold.
-void ChoiceSetChecker::State::checkOne(std::size_t position, SymbolicExprId parent, SymbolicExprId condition,
+void ChoiceSetChecker::State::add(ChoiceFinding finding, Decision decision, ChoiceSetReport& report) {
+    finding.witness = std::move(decision.witness).value_or(Witness{});
+    finding.bound = decision.bound;
+    (decision.isUndecided() ? report.undecided : report.findings).push_back(std::move(finding));
+}
+
+/// The default choice is active in the gap of the others.
+void ChoiceSetChecker::State::checkDefault(std::size_t position, SymbolicExprId parent, const std::vector<Run>& runs,
+                                           const Decision& gap, ChoiceSetReport& report) {
+    if (!gap.isYes()) {
+        add({.fault = ChoiceFault::Dead, .choice = position}, gap, report);
+        return;
+    }
+    const auto isUnknown = [](const ChoiceFinding& finding) { return finding.fault == ChoiceFault::Dead; };
+    if (runs.back().count > static_cast<std::size_t>(std::ranges::count_if(report.undecided, isUnknown)))
+        return; // another choice can be active
+    Decision others = ask(&Decider::overlaps, parent, runs.back().holds);
+    if (others.isYes())
+        return;
+    if (others.isNo())
+        others.witness = gap.witness;
+    add({.fault = ChoiceFault::AlwaysActive, .choice = position}, std::move(others), report);
+}
+
+/// Checks a choice by itself; false where it is dead.  `holds` is where both the parent and the condition hold.
+bool ChoiceSetChecker::State::checkOne(std::size_t position, SymbolicExprId parent, SymbolicExprId condition,
                                        SymbolicExprId holds, ChoiceSetReport& report) {
-    const auto add = [&](ChoiceFault fault, Decision decision) {
-        auto& list = decision.isUndecided() ? report.undecided : report.findings;
-        list.push_back({.fault = fault,
-                        .choice = position,
-                        .witness = std::move(decision.witness).value_or(Witness{}),
-                        .bound = decision.bound});
-    };
     Decision active = ask(&Decider::canHold, holds);
     if (!active.isYes()) {
-        add(ChoiceFault::Dead, std::move(active));
-        return;
+        const bool isDead = active.isNo();
+        add({.fault = ChoiceFault::Dead, .choice = position}, std::move(active), report);
+        return !isDead;
     }
     Decision always = ask(&Decider::implies, toC(parent), toC(condition));
     if (!always.isNo()) {
         always.witness = std::move(active.witness);
-        add(ChoiceFault::AlwaysActive, std::move(always));
-        return;
+        add({.fault = ChoiceFault::AlwaysActive, .choice = position}, std::move(always), report);
+        return true;
     }
     if (const SymbolicExprId shorter = shorten(parent, condition); shorter != condition) {
-        add(ChoiceFault::Redundant, std::move(active));
-        report.findings.back().proposed = shorter;
+        add({.fault = ChoiceFault::Redundant, .choice = position, .proposed = shorter}, std::move(active), report);
     }
+    return true;
 }
 
-/// The choices in halves of halves; the last run is all of them.
+/// The choices, neighbours by their ranges, in halves of halves; the last run is all of them.
 std::vector<ChoiceSetChecker::State::Run> ChoiceSetChecker::State::halve(std::span<const SymbolicExprId> holds) {
+    std::vector<NameRanges> ranges;
+    ranges.reserve(holds.size());
+    for (const SymbolicExprId each : holds)
+        ranges.push_back(rangesOf(table, each));
     std::vector<Run> runs;
     std::vector<std::size_t> level;
-    for (std::size_t i = 0; i < holds.size(); ++i) {
-        runs.push_back({i, i + 1, holds[i], i, i});
-        level.push_back(i);
+    for (const std::size_t position : sortedByRange(ranges)) {
+        if (holds[position] == table.getIdFALSE())
+            continue;
+        level.push_back(runs.size());
+        runs.push_back({holds[position], std::move(ranges[position]), 1, position, position});
     }
+    if (runs.empty())
+        runs.push_back({table.getIdFALSE(), {}, 0, 0, 0});
     while (level.size() > 1) {
         std::size_t next = 0;
         for (std::size_t i = 0; i < level.size(); i += 2) {
@@ -162,7 +196,8 @@ std::vector<ChoiceSetChecker::State::Run> ChoiceSetChecker::State::halve(std::sp
             if (i + 1 < level.size()) {
                 const std::size_t right = level[i + 1];
                 const SymbolicExprId either = SymbolicOrExpr(table, runs[run].holds, runs[right].holds).getId(table);
-                runs.push_back({runs[run].begin, runs[right].end, either, run, right});
+                runs.push_back({either, joined(runs[run].ranges, runs[right].ranges),
+                                runs[run].count + runs[right].count, run, right});
                 run = runs.size() - 1;
             }
             level[next++] = run;
@@ -174,15 +209,13 @@ std::vector<ChoiceSetChecker::State::Run> ChoiceSetChecker::State::halve(std::sp
 
 void ChoiceSetChecker::State::tellOverlap(std::size_t first, std::size_t second, Decision decision,
                                           std::span<const SymbolicExprId> holds, ChoiceSetReport& report) {
-    ChoiceFinding finding{.fault = ChoiceFault::Overlap,
-                          .choice = std::min(first, second),
-                          .other = std::max(first, second),
-                          .witness = std::move(decision.witness).value_or(Witness{}),
-                          .bound = decision.bound};
+    ChoiceFinding finding{
+        .fault = ChoiceFault::Overlap, .choice = std::min(first, second), .other = std::max(first, second)};
     if (decision.isUndecided()) {
-        report.undecided.push_back(std::move(finding));
+        add(std::move(finding), std::move(decision), report);
         return;
     }
+    finding.witness = std::move(decision.witness).value_or(Witness{});
     finding.firstCovered = ask(&Decider::implies, holds[finding.choice], holds[finding.other]).isYes();
     finding.secondCovered = ask(&Decider::implies, holds[finding.other], holds[finding.choice]).isYes();
     report.findings.push_back(std::move(finding));
@@ -199,6 +232,8 @@ void ChoiceSetChecker::State::findOverlaps(const std::vector<Run>& runs, std::sp
         for (open.emplace_back(run.left, run.right); !open.empty();) {
             const auto [a, b] = open.back();
             open.pop_back();
+            if (areApart(runs[a].ranges, runs[b].ranges))
+                continue;
             Decision both = ask(&Decider::overlaps, runs[a].holds, runs[b].holds);
             if (both.isNo())
                 continue;
@@ -207,11 +242,11 @@ void ChoiceSetChecker::State::findOverlaps(const std::vector<Run>& runs, std::sp
                 return;
             }
             if (runs[a].isSingle() && runs[b].isSingle()) {
-                tellOverlap(runs[a].begin, runs[b].begin, std::move(both), holds, report);
+                tellOverlap(runs[a].left, runs[b].left, std::move(both), holds, report);
                 ++told;
                 continue;
             }
-            const bool splitsFirst = runs[a].end - runs[a].begin >= runs[b].end - runs[b].begin;
+            const bool splitsFirst = runs[a].count >= runs[b].count;
             const Run& split = runs[splitsFirst ? a : b];
             for (const std::size_t half : {split.right, split.left})
                 open.emplace_back(splitsFirst ? half : a, splitsFirst ? b : half);
@@ -219,33 +254,57 @@ void ChoiceSetChecker::State::findOverlaps(const std::vector<Run>& runs, std::sp
     }
 }
 
-ChoiceSetReport ChoiceSetChecker::check(SymbolicExprId parent, std::span<const SymbolicExprId> choices) {
+/// Where the parent is active and no choice is.  The price of an exact answer grows with the names in the conditions;
+/// when it is too high, values beyond all ranges may still show that there is a gap.
+Decision ChoiceSetChecker::State::findGap(SymbolicExprId parent, const std::vector<Run>& runs) {
+    const Run& all = runs.back();
+    Decision gap = ask(&Decider::implies, parent, all.holds).opposite();
+    if (!gap.isUndecided())
+        return gap;
+    for (const NameRange& range : all.ranges) {
+        for (const bool isAbove : {true, false}) {
+            const std::int64_t bound = isAbove ? range.high : range.low;
+            if (bound <= std::numeric_limits<int>::min() || bound >= std::numeric_limits<int>::max())
+                continue;
+            const SymbolicIntValue literal(table, static_cast<int>(bound) + (isAbove ? 1 : -1));
+            const SymbolicEqualExpr beyond(table, range.name, literal.getId(table));
+            Decision active = ask(&Decider::overlaps, parent, beyond.getId(table));
+            if (active.isYes())
+                return active;
+        }
+    }
+    return gap;
+}
+
+ChoiceSetReport ChoiceSetChecker::check(SymbolicExprId parent, std::span<const SymbolicExprId> choices,
+                                        std::optional<std::size_t> defaultChoice) {
     ChoiceSetReport report;
     State& state = *state_;
+    const SymbolicExprTable& table = state.table;
     const SymbolicExprId context = state.toC(parent);
     report.parentNeverHolds = state.ask(&Decider::canHold, context).isNo();
     if (report.parentNeverHolds || choices.empty())
         return report;
-    std::vector<SymbolicExprId> holds;
-    holds.reserve(choices.size());
+    std::vector<SymbolicExprId> holds(choices.size(), table.getIdFALSE()); // which overlaps nothing
     for (std::size_t i = 0; i < choices.size(); ++i) {
-        holds.push_back(state.service.AND(context, state.toC(choices[i]), false).id());
-        state.checkOne(i, parent, choices[i], holds[i], report);
+        if (i == defaultChoice)
+            continue;
+        holds[i] = state.service.AND(context, state.toC(choices[i]), false).id();
+        if (!state.checkOne(i, parent, choices[i], holds[i], report))
+            holds[i] = table.getIdFALSE();
     }
     const std::vector<State::Run> runs = state.halve(holds);
+    Decision gap = state.findGap(context, runs);
+    if (defaultChoice)
+        state.checkDefault(*defaultChoice, context, runs, gap, report);
     const std::size_t firstOverlap = report.findings.size();
     state.findOverlaps(runs, holds, report);
     std::sort(report.findings.begin() + static_cast<std::ptrdiff_t>(firstOverlap), report.findings.end(),
               [](const ChoiceFinding& a, const ChoiceFinding& b) {
                   return std::pair(a.choice, a.other) < std::pair(b.choice, b.other);
               });
-    Decision covered = state.ask(&Decider::implies, context, runs.back().holds);
-    if (!covered.isYes()) {
-        auto& list = covered.isNo() ? report.findings : report.undecided;
-        list.push_back({.fault = ChoiceFault::Missing,
-                        .witness = std::move(covered.witness).value_or(Witness{}),
-                        .bound = covered.bound});
-    }
+    if (!defaultChoice && !gap.isNo())
+        State::add({.fault = ChoiceFault::Missing}, std::move(gap), report);
     return report;
 }
 

@@ -5,6 +5,7 @@
 #include "base/decide/Decision.hpp"
 
 #include <memory>
+#include <optional>
 #include <span>
 #include <vector>
 
@@ -31,7 +32,7 @@ struct ChoiceFinding {
     ChoiceFault fault;
     std::size_t choice = 0;                    ///< position
     std::size_t other = 0;                     ///< the second of an overlap
-    Witness witness;                           ///< the parent is active and the fault shows; none for a dead choice
+    Witness witness = {};                      ///< the parent is active and the fault shows; none for a dead choice
     bool firstCovered = false;                 ///< of an overlap: the first is active only where the second is
     bool secondCovered = false;                ///< and the other way round
     SymbolicExprId proposed = invalidId;       ///< of a redundant operand: the condition without it
@@ -47,9 +48,10 @@ struct ChoiceSetReport {
 
 /// Checks choice sets against exact decisions: not one finding is a guess.
 ///
-/// Overlaps are looked for by halves: where no choice of one half overlaps one of the other, one decision settles all
-/// pairs.  So a set of n choices without overlaps takes some n log n steps, and each overlap found a few decisions more
-/// for each level of halves.  Steps are counted over all sets; when they are used up everything further is undecided.
+/// Ranges of names tell most choices apart without a decision.  Other overlaps are looked for by halves: where no
+/// choice of one half overlaps one of the other, one decision settles all pairs.  So a set of n choices without
+/// overlaps takes some n log n steps, and each overlap found a few decisions more for each level of halves.  Steps are
+/// counted over all sets; when they are used up everything further is undecided.
 class VTSYM_API ChoiceSetChecker {
 public:
     /// The service outlives the checker.
@@ -59,7 +61,9 @@ public:
     ~ChoiceSetChecker();
 
     /// Checks the conditions of choices where `parent` holds.  Identifiers are of the service's table.
-    ChoiceSetReport check(SymbolicExprId parent, std::span<const SymbolicExprId> choices);
+    /// A default choice is active where no other one is, whatever its own condition.
+    ChoiceSetReport check(SymbolicExprId parent, std::span<const SymbolicExprId> choices,
+                          std::optional<std::size_t> defaultChoice = std::nullopt);
     /// Checks one condition alone: whether it is dead, always active, or has a redundant operand.
     ChoiceSetReport checkCondition(SymbolicExprId parent, SymbolicExprId condition);
 

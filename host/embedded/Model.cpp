@@ -4,23 +4,19 @@
 
 namespace {
 
-constexpr std::size_t shownNames = 4; ///< at either end of a path
+constexpr std::size_t shownNames = 8; ///< of a path
 constexpr std::size_t shownBytes = 80;
 
 } // namespace
 
 std::string VTBlock::path() const {
     std::vector<const VTBlock*> blocks; // the innermost first
-    for (const VTBlock* block = this; block != nullptr; block = block->parent_)
+    const VTBlock* block = this;
+    for (; block != nullptr && blocks.size() < shownNames; block = block->parent_)
         blocks.push_back(block);
-    std::string path;
-    for (std::size_t i = blocks.size(); i-- > 0;) {
-        if (blocks.size() > 2 * shownNames && i == blocks.size() - shownNames - 1) {
-            path.append("/...");
-            i = shownNames - 1;
-        }
-        path.append(path.empty() ? "" : "/").append(blocks[i]->name_);
-    }
+    std::string path = block != nullptr ? "..." : "";
+    for (; !blocks.empty(); blocks.pop_back())
+        path.append(path.empty() ? "" : "/").append(blocks.back()->name_);
     return path;
 }
 

@@ -45,8 +45,7 @@ public:
     /// The alternatives of this block, in the order of the model.
     [[nodiscard]] std::span<const VTBlock* const> choices() const noexcept { return choices_; }
 
-    /// The names from the top of the model, separated by "/".  Of a path of more than eight, the first four and the
-    /// last four, with "..." between them.
+    /// The names from the top of the model, separated by "/"; of more than eight the last eight, behind ".../".
     [[nodiscard]] std::string path() const;
 
     [[nodiscard]] const VT::Embedded::TextPlace& namePlace() const noexcept { return namePlace_; }

@@ -16,6 +16,7 @@ namespace vtsym {
 namespace {
 
 constexpr std::size_t shownBytes = 200;   ///< of a condition in a sentence
+constexpr std::size_t climbed = 256;      ///< ancestors looked at
 constexpr std::size_t shownAncestors = 8; ///< whose conditions a finding follows from
 
 /// In the order of VT::ChoiceFault.
@@ -88,14 +89,23 @@ void ModelCheck::problem(const Place& place, const std::string& sentence) {
 /// The conditions of a block and of its ancestors, the nearest first.
 std::vector<RelatedPlace> ModelCheck::conditionsAround(const VTBlock* block) const {
     std::vector<RelatedPlace> around;
-    for (; block != nullptr && around.size() < shownAncestors; block = block->parent())
+    for (std::size_t i = 0; block != nullptr && i < climbed && around.size() < shownAncestors;
+         ++i, block = block->parent())
         if (!isUnconditional(*block))
             around.push_back({placeOf(*block), block->variantCondition()});
     return around;
 }
 
-VT::SymbolicExprId ModelCheck::parentOf(const VTBlock& block) {
-    return block.parent() != nullptr ? conditions_.net(*block.parent()).id() : handle_->table().getIdTRUE();
+VT::SymbolicExprId ModelCheck::contextOf(const VTBlock* block) const {
+    return block != nullptr ? contexts_.at(block) : handle_->table().getIdTRUE();
+}
+
+VT::SymbolicExprId ModelCheck::conditionOf(const vtPort& port) const {
+    VT::VCSymbolicExprId to = handle_->table().getIdFALSE();
+    for (const VTBlock* const destination : port.destinations())
+        if (contexts_.contains(destination))
+            to = handle_->OR(to, contextOf(destination), false);
+    return handle_->AND(contextOf(&port.source()), to, false).id();
 }
 
 /// Whether all conditions are some.
@@ -125,20 +135,28 @@ void ModelCheck::run(FindingWriter& writer) {
     writer_ = &writer;
     if (!readConditions())
         return;
-    std::unordered_set<const VTBlock*> dead; // with all that is in them
-    for (const VTBlock& block : model_.blocks()) {
-        if (dead.contains(block.parent()) || (dead.contains(&block) && !block.isChoice())) {
-            dead.insert(&block);
-            continue;
+    std::unordered_set<const VTBlock*> dead;      // with all that is in them
+    std::unordered_set<const VTBlock*> followers; // of what is around them
+    const auto note = [&](const VT::ChoiceSetReport& report, std::span<const VTBlock* const> blocks) {
+        for (const VT::ChoiceFinding& finding : report.findings) {
+            if (finding.fault == VT::ChoiceFault::Dead)
+                dead.insert(blocks[finding.choice]);
+            if (finding.fault == VT::ChoiceFault::AlwaysActive)
+                followers.insert(blocks[finding.choice]);
         }
-        const auto note = [&](const VT::ChoiceSetReport& report, std::span<const VTBlock* const> blocks) {
-            for (const VT::ChoiceFinding& finding : report.findings)
-                if (finding.fault == VT::ChoiceFault::Dead)
-                    dead.insert(blocks[finding.choice]);
-        };
-        if (!block.isChoice() && !isUnconditional(block))
-            note(checkBlock(block), std::array{&block});
-        if (!block.choices().empty() && !dead.contains(&block))
+    };
+    for (const VTBlock& block : model_.blocks()) {
+        const std::array self{&block};
+        if (dead.contains(block.parent()))
+            dead.insert(&block);
+        else if (!block.isChoice() && !isUnconditional(block))
+            note(checkBlock(block), self);
+        if (dead.contains(&block))
+            continue;
+        const VT::SymbolicExprId around = contextOf(block.parent());
+        contexts_.emplace(
+            &block, followers.contains(&block) ? around : handle_->AND(around, conditions_.own(block), false).id());
+        if (!block.choices().empty())
             note(checkChoices(block), block.choices());
         if (checker_.stepsUsedUp()) {
             problem(placeOf(block), "The steps of the check are used up: what follows is not decided.");
@@ -146,12 +164,12 @@ void ModelCheck::run(FindingWriter& writer) {
         }
     }
     for (const vtPort& port : model_.ports())
-        if (!dead.contains(&port.source()))
+        if (contexts_.contains(&port.source()))
             checkPort(port);
 }
 
 VT::ChoiceSetReport ModelCheck::checkBlock(const VTBlock& block) {
-    VT::ChoiceSetReport report = checker_.checkCondition(parentOf(block), conditions_.own(block).id());
+    VT::ChoiceSetReport report = checker_.checkCondition(contextOf(block.parent()), conditions_.own(block).id());
     const std::array blocks{&block};
     for (const VT::ChoiceFinding& finding : report.findings)
         write(otherFindings_, findingOf(block, blocks, finding));
@@ -165,11 +183,16 @@ VT::ChoiceSetReport ModelCheck::checkChoices(const VTBlock& block) {
     choices.reserve(block.choices().size());
     for (const VTBlock* const choice : block.choices())
         choices.push_back(conditions_.own(*choice).id());
-    VT::ChoiceSetReport report = checker_.check(conditions_.net(block).id(), choices);
+    const auto defaultChoice =
+        std::ranges::find_if(block.choices(), [](const VTBlock* each) { return isDefault(*each); });
+    VT::ChoiceSetReport report =
+        checker_.check(contextOf(&block), choices,
+                       defaultChoice == block.choices().end()
+                           ? std::nullopt
+                           : std::optional(static_cast<std::size_t>(defaultChoice - block.choices().begin())));
     std::erase_if(report.findings, [&](const VT::ChoiceFinding& finding) {
         const VTBlock& choice = *block.choices()[finding.choice];
-        return (finding.fault == VT::ChoiceFault::Redundant && isDefault(choice)) ||
-               (finding.fault == VT::ChoiceFault::AlwaysActive && choices.size() == 1 && isUnconditional(choice));
+        return finding.fault == VT::ChoiceFault::AlwaysActive && choices.size() == 1 && isUnconditional(choice);
     });
     choiceSets_.push_back({&block, report, {}});
     std::vector<Finding>& findings = choiceSets_.back().findings;
@@ -178,9 +201,9 @@ VT::ChoiceSetReport ModelCheck::checkChoices(const VTBlock& block) {
     for (const VT::ChoiceFinding& finding : report.undecided)
         tellUndecided(block, block.choices(), finding);
     if (!report.allOverlaps && !checker_.stepsUsedUp())
-        write(findings, findingAt(placeOf(block), VT::ChoiceFault::Overlap,
-                                  "more choices of " + block.path() + " overlap than the pairs told",
-                                  print(conditions_.net(block).id())));
+        write(findings,
+              findingAt(placeOf(block), VT::ChoiceFault::Overlap,
+                        "more choices of " + block.path() + " overlap than the pairs told", block.variantCondition()));
     return report;
 }
 
@@ -271,8 +294,7 @@ void ModelCheck::checkPort(const vtPort& port) {
     });
     if (!isJoined)
         return; // without destinations, or they are told themselves
-    const VT::SymbolicExprId condition = conditions_.of(port).id();
-    const VT::Decision flows = checker_.canHold(condition);
+    const VT::Decision flows = checker_.canHold(conditionOf(port));
     Place place = regionOf(file_, port.place());
     place.name = port.name();
     if (flows.isUndecided())
@@ -287,7 +309,7 @@ void ModelCheck::checkPort(const vtPort& port) {
     Finding result = findingAt(std::move(place), VT::ChoiceFault::Dead,
                                "the port " + shown(port.name()) + " is never active: " + port.source().path() +
                                    " is never active together with a block that it goes to",
-                               print(condition));
+                               {});
     result.follows = std::move(follows);
     write(otherFindings_, std::move(result));
 }

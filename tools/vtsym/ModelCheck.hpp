@@ -8,6 +8,7 @@
 #include "tools/vtsym/Findings.hpp"
 
 #include <string>
+#include <unordered_map>
 #include <vector>
 
 namespace vtsym {
@@ -53,7 +54,8 @@ private:
     Finding findingOf(const VTBlock& set, std::span<const VTBlock* const> blocks, const VT::ChoiceFinding& finding);
     void tellUndecided(const VTBlock& set, std::span<const VTBlock* const> blocks, const VT::ChoiceFinding& finding);
     void tellShortened(Finding& finding, const VTBlock& block, VT::SymbolicExprId proposed) const;
-    [[nodiscard]] VT::SymbolicExprId parentOf(const VTBlock& block);
+    [[nodiscard]] VT::SymbolicExprId contextOf(const VTBlock* block) const;
+    [[nodiscard]] VT::SymbolicExprId conditionOf(const vtPort& port) const;
     [[nodiscard]] Place placeOf(const VTBlock& block) const;
     [[nodiscard]] std::vector<RelatedPlace> conditionsAround(const VTBlock* block) const;
 
@@ -62,6 +64,8 @@ private:
     VT::VCServiceHandle handle_;
     VT::BlockConditions conditions_;
     VT::ChoiceSetChecker checker_;
+    /// Where a block is active, without the conditions that follow from those around them.
+    std::unordered_map<const VTBlock*, VT::SymbolicExprId> contexts_;
     FindingWriter* writer_ = nullptr;
     std::vector<ChoiceSet> choiceSets_;
     std::vector<Finding> otherFindings_;

@@ -13,6 +13,7 @@ namespace {
 // What a page shows at most; it says what it leaves out.
 constexpr std::size_t mostSets = 200;
 constexpr std::size_t mostColumns = 60;
+constexpr std::size_t denseColumns = 20;
 constexpr std::size_t mostFindings = 200; ///< of one set
 constexpr std::size_t shownBytes = 2000;  ///< of one text
 
@@ -105,7 +106,7 @@ std::string SetPage::ownCell(std::size_t row) const {
     case VT::ChoiceFault::AlwaysActive:
         return cell("always", "&#9679;", name + " is always active");
     default:
-        return cell("self", number, name + " has a redundant operand");
+        return cell("redundant", number, name + " has a redundant operand");
     }
 }
 
@@ -150,7 +151,8 @@ void SetPage::appendMatrix(std::string& html) const {
         html.append(" choices is left out; the findings are below.</p>\n");
         return;
     }
-    html.append("<div class=\"scroll\"><table><thead><tr><td></td>");
+    html.append("<div class=\"scroll\"><table").append(count > denseColumns ? " class=\"dense\"" : "");
+    html.append("><thead><tr><td></td>");
     for (std::size_t column = 0; column < count; ++column)
         html.append("<th scope=\"col\">").append(std::to_string(column + 1)).append("</th>");
     html.append("</tr></thead><tbody>\n");
@@ -199,6 +201,7 @@ constexpr const char* key = "<ul class=\"key\" aria-label=\"Signs\">"
                             "<li><span class=\"cell covered\">=</span>always together</li>"
                             "<li><span class=\"cell dead\">&#10005;</span>never active</li>"
                             "<li><span class=\"cell always\">&#9679;</span>always active</li>"
+                            "<li><span class=\"cell redundant\">1</span>redundant operand</li>"
                             "<li><span class=\"cell open\">?</span>undecided</li></ul>\n";
 
 } // namespace

@@ -4,9 +4,9 @@
 namespace vtsym {
 
 inline constexpr const char* pageStyle = R"css(
-:root { --ink: #1d2430; --soft: #5b6676; --line: #d9dee6; --paper: #ffffff; --band: #f4f6f9; --overlap: #d9480f;
+:root { --ink: #1d2430; --soft: #5b6676; --line: #d9dee6; --faint: #a3adba; --paper: #ffffff; --band: #f4f6f9; --overlap: #d9480f;
   --covered: #c2255c; --dead: #868e96; --always: #6741d9; --open: #b08900; --good: #2b8a3e; --tip: #1d2430; --tipInk: #ffffff; }
-@media (prefers-color-scheme: dark) { :root { --ink: #e6e9ef; --soft: #9aa5b5; --line: #364050; --paper: #151a22;
+@media (prefers-color-scheme: dark) { :root { --ink: #e6e9ef; --soft: #9aa5b5; --line: #364050; --faint: #5b6676; --paper: #151a22;
   --band: #1d2430; --overlap: #ff922b; --covered: #f783ac; --dead: #868e96; --always: #b197fc; --open: #ffd43b;
   --good: #69db7c; --tip: #e6e9ef; --tipInk: #151a22; } }
 * { box-sizing: border-box; }
@@ -32,10 +32,13 @@ tbody th .no { color: var(--soft); font-size: .8rem; min-width: 1.4em; text-alig
 tbody th b { overflow-wrap: anywhere; font-weight: 600; }
 tbody th code { display: -webkit-box; -webkit-box-orient: vertical; -webkit-line-clamp: 2; overflow: hidden;
   color: var(--soft); margin-left: 2em; }
+thead td { border: 0 !important; }
 td { padding: 0; border: 1px solid transparent; border-top-color: var(--line); width: 2rem; min-width: 2rem; height: 2rem; }
 .cell { display: flex; align-items: center; justify-content: center; width: 2rem; height: 2rem; margin: auto;
   border-radius: .3rem; font-size: .95rem; line-height: 1; cursor: default; }
-.none { color: var(--line); }
+.dense td, .dense td .cell { width: 1.6rem; min-width: 1.6rem; }
+.none { color: var(--faint); }
+.redundant { border: 2px dashed var(--overlap); color: var(--soft); font-size: .75rem; }
 .self { background: var(--band); color: var(--soft); font-size: .75rem; }
 .overlap { background: var(--overlap); color: var(--paper); font-weight: 700; }
 .covered { background: var(--covered); color: var(--paper); font-weight: 700; }
