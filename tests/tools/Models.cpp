@@ -299,16 +299,25 @@ TEST(Check, AgreesWithBruteForce) {
         }
     }
     std::set<std::string> found;
+    std::string shortened;
+    std::string equivalent;
     std::istringstream lines(checked(Json({{"blocks", blocks}}).dump(), {"--json"}).output);
     for (std::string line; std::getline(lines, line);) {
         const Json finding = Json::parse(line);
         const std::string kind = finding["kind"];
-        if (kind != "redundant")
+        if (kind == "redundant") {
+            const std::string context = "(" + finding["follows"][0]["text"].get<std::string>() + ") && (";
+            shortened += context + finding["condition"].get<std::string>() + ")\t" + context +
+                         finding["proposed"].get<std::string>() + ")\n";
+            equivalent += "equivalent\n";
+        } else
             found.insert(kind + (kind == "overlapping" ? " " + finding["follows"][0]["name"].get<std::string>() : "") +
                          " " + finding["name"].get<std::string>());
     }
     EXPECT_EQ(found, expected);
     EXPECT_GT(found.size(), 1000U);
+    EXPECT_GT(equivalent.size(), 1000U);
+    EXPECT_EQ(runProgram({{"compare"}, shortened, {}, {}}).output, equivalent);
 }
 
 TEST(Check, BoundsItsWork) {

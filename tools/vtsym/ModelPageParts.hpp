@@ -45,7 +45,8 @@ td { padding: 0; border: 1px solid transparent; border-top-color: var(--line); w
 .dead { background: var(--dead); color: var(--paper); }
 .always { background: var(--always); color: var(--paper); }
 .open { background: var(--open); color: var(--paper); font-weight: 700; }
-.cell:focus-visible, code:focus-visible, a:focus-visible { outline: 3px solid var(--ink); outline-offset: 1px; }
+.cell:focus-visible, code:focus-visible, a:focus-visible { outline: 3px solid var(--ink); outline-offset: 1px; position: relative;
+  z-index: 2; }
 .lit { background: var(--band); }
 .key { display: flex; flex-wrap: wrap; gap: .25rem 1.25rem; margin: 0 0 1rem; padding: 0; list-style: none; color: var(--soft);
   font-size: .875rem; }
