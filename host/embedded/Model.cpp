@@ -16,7 +16,7 @@ std::string VTBlock::path() const {
         blocks.push_back(block);
     std::string path = block != nullptr ? "..." : "";
     for (; !blocks.empty(); blocks.pop_back())
-        path.append(path.empty() ? "" : "/").append(blocks.back()->name_);
+        path.append(path.empty() ? "" : "/").append(VT::shownText(blocks.back()->name_, shownBytes));
     return path;
 }
 

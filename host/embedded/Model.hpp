@@ -46,6 +46,7 @@ public:
     [[nodiscard]] std::span<const VTBlock* const> choices() const noexcept { return choices_; }
 
     /// The names from the top of the model, separated by "/"; of more than eight the last eight, behind ".../".
+    /// Names are fit for a terminal, of a long one the beginning.
     [[nodiscard]] std::string path() const;
 
     [[nodiscard]] const VT::Embedded::TextPlace& namePlace() const noexcept { return namePlace_; }

@@ -79,6 +79,7 @@ TEST(Check, TellsWhatIsWrongWithChoices) {
              {"A>0 && A<3", {"A==1", "A==2"}, "", 0},
              {"", {"(sim)", "(codegen)"}, "", 0},
              {"A", {""}, "", 0},
+             {"A", {"(default)"}, "", 0},
              {"", {"A>0", "A<0"}, "m:1: no choice of S is active for A=0\n", 1},
              {"", {"A>0", "A<2"}, "m:1: S/c0 and S/c1 are both active for A=1\n", 1},
              {"A==3",
@@ -306,7 +307,8 @@ TEST(Check, AgreesWithBruteForce) {
         const Json finding = Json::parse(line);
         const std::string kind = finding["kind"];
         if (kind == "redundant") {
-            const std::string context = "(" + finding["follows"][0]["text"].get<std::string>() + ") && (";
+            const Json& around = finding["follows"];
+            const std::string context = around.empty() ? "(" : "(" + around[0]["text"].get<std::string>() + ") && (";
             shortened += context + finding["condition"].get<std::string>() + ")\t" + context +
                          finding["proposed"].get<std::string>() + ")\n";
             equivalent += "equivalent\n";

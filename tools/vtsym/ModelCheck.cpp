@@ -192,7 +192,8 @@ VT::ChoiceSetReport ModelCheck::checkChoices(const VTBlock& block) {
                            : std::optional(static_cast<std::size_t>(defaultChoice - block.choices().begin())));
     std::erase_if(report.findings, [&](const VT::ChoiceFinding& finding) {
         const VTBlock& choice = *block.choices()[finding.choice];
-        return finding.fault == VT::ChoiceFault::AlwaysActive && choices.size() == 1 && isUnconditional(choice);
+        return finding.fault == VT::ChoiceFault::AlwaysActive && choices.size() == 1 &&
+               (isUnconditional(choice) || isDefault(choice));
     });
     choiceSets_.push_back({&block, report, {}});
     std::vector<Finding>& findings = choiceSets_.back().findings;

@@ -195,7 +195,7 @@ int main() {
     const VTBlock engine{nullptr, "A > 1"};
     const VTBlock gear{&engine, "A > 2 && B"};
     const vtPort port{&gear};
-    expect(service->getCExprNetAAVCEString(&port, true) == "B && A>2", "conditions of this host's model");
+    expect(service->getCExprNetAAVCEString(&port, false) == "A>1 && (A>2 && B)", "conditions of this host's model");
     std::string said;
     try {
         service->parseC("A ===");
