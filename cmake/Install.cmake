@@ -11,10 +11,6 @@ foreach(folder IN ITEMS base parser host)
   install(DIRECTORY ${folder} DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/vtsym
     FILES_MATCHING PATTERN "*.hpp" PATTERN "*.def" PATTERN "embedded" EXCLUDE)
 endforeach()
-if(VTSYM_EMBEDDED_HOST)
-  install(FILES host/embedded/Model.hpp host/embedded/ModelFile.hpp
-    DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/vtsym/host/embedded)
-endif()
 install(FILES vtsym.hpp DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/vtsym)
 
 set(package_dir ${CMAKE_INSTALL_LIBDIR}/cmake/vtsym)
