@@ -281,6 +281,11 @@ ChoiceSetReport ChoiceSetChecker::check(SymbolicExprId parent, std::span<const S
     ChoiceSetReport report;
     State& state = *state_;
     const SymbolicExprTable& table = state.table;
+    if (!table.has(parent) || !std::ranges::all_of(choices, [&](SymbolicExprId id) { return table.has(id); })) {
+        State::add({.fault = ChoiceFault::Missing}, {Answer::Undecided, DecisionBound::NoCondition, std::nullopt},
+                   report);
+        return report;
+    }
     const SymbolicExprId context = state.toC(parent);
     report.parentNeverHolds = state.ask(&Decider::canHold, context).isNo();
     if (report.parentNeverHolds || choices.empty())
@@ -311,6 +316,10 @@ ChoiceSetReport ChoiceSetChecker::check(SymbolicExprId parent, std::span<const S
 ChoiceSetReport ChoiceSetChecker::checkCondition(SymbolicExprId parent, SymbolicExprId condition) {
     ChoiceSetReport report;
     State& state = *state_;
+    if (!state.table.has(parent) || !state.table.has(condition)) {
+        State::add({.fault = ChoiceFault::Dead}, {Answer::Undecided, DecisionBound::NoCondition, std::nullopt}, report);
+        return report;
+    }
     const SymbolicExprId context = state.toC(parent);
     report.parentNeverHolds = state.ask(&Decider::canHold, context).isNo();
     if (!report.parentNeverHolds)

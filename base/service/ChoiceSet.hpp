@@ -60,7 +60,8 @@ public:
     ChoiceSetChecker& operator=(ChoiceSetChecker&&) noexcept;
     ~ChoiceSetChecker();
 
-    /// Checks the conditions of choices where `parent` holds.  Identifiers are of the service's table.
+    /// Checks the conditions of choices where `parent` holds.  With an identifier that is not of the service's table
+    /// everything stays undecided.
     /// A default choice is active where no other one is, whatever its own condition.
     ChoiceSetReport check(SymbolicExprId parent, std::span<const SymbolicExprId> choices,
                           std::optional<std::size_t> defaultChoice = std::nullopt);
