@@ -7,6 +7,7 @@
 #include "base/service/VCSymbolicExprId.hpp"
 #include "base/service/VCSymbols.hpp"
 #include "base/simplify/VCCustomizer.hpp"
+#include "host/Model.hpp"
 
 #include <memory>
 #include <string>
@@ -122,12 +123,27 @@ public:
     VCSymbolicExprId replaceSymbolsInExpression(const VCSymbolicExprId& condition,
                                                 const std::unordered_map<std::string, std::string>& names);
 
-    // Deciding.  Answers are exact over the unbounded integers, or "undecided" with the bound that was hit, and come
-    // with a witness where one assignment proves them; see Decision.hpp.  Operators that Quill writes as calls are
-    // decided as operators, the variant keywords as opposites while they are in force.  A customizer has no say.
-    // Decisions about pairs are kept like simplified conditions; an identifier that is not of the table stays
-    // undecided.
+    // Blocks and ports of the host's model.
 
+    /// Where a block is active: the And of its own condition and those of its ancestors.  Where the signal of a port
+    /// flows: where its source is active, and one of its destinations.  With `simplify` as when combining; the invalid
+    /// identifier for nullptr.  Each call reads the conditions anew; BlockConditions reads many blocks' once.
+    VCSymbolicExprId getQExprNetAAVCEIdx(const VTBlock* block, bool simplify);
+    VCSymbolicExprId getQExprNetAAVCEIdx(const vtPort* port, bool simplify);
+    /// The same as Quill text and as C text.
+    std::string getQExprNetAAVCEString(const VTBlock* block, bool simplify);
+    std::string getQExprNetAAVCEString(const vtPort* port, bool simplify);
+    std::string getCExprNetAAVCEString(const VTBlock* block, bool simplify);
+    std::string getCExprNetAAVCEString(const vtPort* port, bool simplify);
+
+    // Deciding.  Answers are exact over the integers, without bounds unless asked for, or "undecided" with the bound
+    // that was hit, and come with a witness where one assignment proves them; see Decision.hpp.  Operators that Quill
+    // writes as calls are decided as operators, the variant keywords as opposites while they are in force.  A
+    // customizer has no say.  Decisions about pairs are kept like simplified conditions; an identifier that is not of
+    // the table stays undecided.
+
+    /// Whether decisions are over the signed 32-bit integers from now on; over all integers at first.
+    void setDecisions32Bit(bool are32Bit);
     /// Whether there is an assignment for which the condition holds; whether it holds for all.
     Decision canHold(const VCSymbolicExprId& condition);
     Decision mustHold(const VCSymbolicExprId& condition);

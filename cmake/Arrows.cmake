@@ -33,7 +33,7 @@ set(VTSYM_DOOR_service base/VC)
 
 # Libraries that only some layers may include, by the beginning of the header's name.
 set(VTSYM_GUARDED_HEADERS fmt/ spdlog/ boost/spirit boost/phoenix boost/fusion CLI/ nlohmann/ histedit editline gtest/ rapidcheck)
-set(VTSYM_HEADERS_embedded fmt/ spdlog/)
+set(VTSYM_HEADERS_embedded fmt/ spdlog/ nlohmann/)
 set(VTSYM_HEADERS_parser boost/spirit boost/phoenix boost/fusion)
 
 # All layers that `layer` may use, itself included.

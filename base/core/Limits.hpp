@@ -55,4 +55,14 @@ inline constexpr std::size_t confirmations = 8192;
 inline constexpr std::size_t impliedTries = 1000;
 inline constexpr std::size_t impliedNodes = std::size_t{1} << 16U;
 
+/// Steps that the checks of all choice sets of a model may cost together: about half a minute.  Beyond the bound what
+/// is left is undecided.
+inline constexpr std::uint64_t choiceSteps = std::uint64_t{1} << 28U;
+
+/// Overlapping pairs that are told of one choice set; n choices have up to n^2/2.  Beyond the bound there are more.
+inline constexpr std::size_t choiceOverlaps = 1000;
+
+/// Operands of a choice's condition up to which a redundant one is looked for.
+inline constexpr std::size_t choiceOperands = 64;
+
 } // namespace VT::limits

@@ -24,14 +24,14 @@ public:
         SymbolicExprId a;
         SymbolicExprId b;
         PairQuestion question;
-        bool keywordsInForce;
+        unsigned mode; ///< what the decider was told: ServiceParts::decisionMode()
         bool operator==(const Key&) const = default;
 
         friend std::size_t hash_value(const Key& key) noexcept {
             std::size_t seed = 0;
             boost::hash_combine(seed, key.a);
             boost::hash_combine(seed, key.b);
-            boost::hash_combine(seed, static_cast<unsigned>(key.question) * 2 + (key.keywordsInForce ? 1U : 0U));
+            boost::hash_combine(seed, static_cast<unsigned>(key.question) * 4 + key.mode);
             return seed;
         }
     };

@@ -20,11 +20,15 @@ bool ServiceParts::keywordsInForce() const {
     return simplifier.keywordsFlag() && isVariantKeywordsSimCodegenFeatureOn();
 }
 
+unsigned ServiceParts::decisionMode() const {
+    return (keywordsInForce() ? 1U : 0U) + (bits32 ? 2U : 0U);
+}
+
 Decider& ServiceParts::decider() {
-    const bool inForce = keywordsInForce();
-    std::unique_ptr<Decider>& decider = deciders[inForce ? 1 : 0];
+    std::unique_ptr<Decider>& decider = deciders.at(decisionMode());
     if (decider == nullptr)
-        decider = std::make_unique<Decider>(table, DecisionOptions{.keywordsInForce = inForce});
+        decider =
+            std::make_unique<Decider>(table, DecisionOptions{.keywordsInForce = keywordsInForce(), .bits32 = bits32});
     return *decider;
 }
 
@@ -34,7 +38,7 @@ Decision VCService::ask(PairQuestion question, const VCSymbolicExprId& a, const 
         return noCondition();
     const bool ordered = question == PairQuestion::FirstAlone;
     const DecisionCache::Key key{ordered ? a.id() : std::min(a.id(), b.id()),
-                                 ordered ? b.id() : std::max(a.id(), b.id()), question, parts_->keywordsInForce()};
+                                 ordered ? b.id() : std::max(a.id(), b.id()), question, parts_->decisionMode()};
     if (const Decision* known = parts_->caching ? parts_->decisions.find(key) : nullptr)
         return *known;
     // Operators that Quill writes as calls are decided as operators.
@@ -47,6 +51,10 @@ Decision VCService::ask(PairQuestion question, const VCSymbolicExprId& a, const 
     if (parts_->caching)
         parts_->decisions.insert(key, decision);
     return decision;
+}
+
+void VCService::setDecisions32Bit(bool are32Bit) {
+    parts_->bits32 = are32Bit;
 }
 
 Decision VCService::canHold(const VCSymbolicExprId& condition) {

@@ -35,7 +35,9 @@ struct ServiceParts {
 
     /// Whether the variant keywords are in force at this moment.
     [[nodiscard]] bool keywordsInForce() const;
-    /// The decider for the keywords' present state.
+    /// What decisions depend on beside their conditions: 1 for keywords in force, 2 for 32-bit unknowns.
+    [[nodiscard]] unsigned decisionMode() const;
+    /// The decider for the present mode.
     Decider& decider();
 
     std::unique_ptr<VCCustomizer, CustomizerRelease> customizer;
@@ -53,7 +55,8 @@ struct ServiceParts {
     std::array<SimplifyCache<SymbolicExprId>, 2> simplified;      ///< by condition
     std::array<SimplifyCache<std::string>, 2> simplifiedFromText; ///< by text
     DecisionCache decisions;
-    std::array<std::unique_ptr<Decider>, 2> deciders; ///< by whether the keywords are in force
+    std::array<std::unique_ptr<Decider>, 4> deciders; ///< by mode
+    bool bits32 = false;                              ///< unknowns are signed 32-bit integers to decisions
     bool caching;                                     ///< the cache feature when the service was made
 };
 

@@ -3,6 +3,7 @@
 
 #include "base/print/ExpressionPrinter.hpp"
 #include "base/simplify/Simplify.hpp"
+#include "host/Model.hpp"
 
 #include <boost/unordered_map.hpp>
 #include <boost/unordered_set.hpp>
@@ -10,12 +11,9 @@
 #include <string>
 #include <vector>
 
-/// A block of the host's model.  The library knows its address only.
-class VTBlock;
-
 namespace VT {
 
-/// Gives the dimension expressions of blocks identifiers.
+/// Gives the dimension expressions of blocks identifiers.  Of a block its address is used alone.
 ///
 /// An expression is simplified and printed as C text.  A text that is an identifier is its own; any other one becomes
 /// `dim_` and the text, in which _ is written __ and everything but letters and digits _xx, in hexadecimal: `N*2+1` is

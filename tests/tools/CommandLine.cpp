@@ -72,6 +72,61 @@ TEST(Program, ListsAndReplacesSymbols) {
     });
 }
 
+TEST(Program, ComparesConditions) {
+    expectRows({
+        {{"compare", "A<B && B<C", "A<C"}, "", "implies; second alone: A=0, B=0, C=1\n", {}, 0},
+        {{"compare", "A>3", "B<4"},
+         "",
+         "overlaps; first alone: A=4, B=4; second alone: A=0, B=0; both: A=4, B=0\n",
+         {},
+         0},
+        {{"compare", "A*A < 0", "B"},
+         "",
+         "undecided, it hangs on arithmetic beyond linear terms; "
+         "second alone: A=0, B=1\n",
+         {},
+         0},
+        {{"compare", "A<2147483647", "A!=2147483647"}, "", "implies; second alone: A=2147483648\n", {}, 0},
+        {{"compare", "--bits", "32", "A<2147483647", "A!=2147483647"}, "", "equivalent\n", {}, 0},
+        {{"compare", "--from", "quill", "A ~= 1", "--", "-A == -2"}, "", "implied by; first alone: A=0\n", {}, 0},
+        {{"compare"},
+         "A==1||A==2\tA>=1 && A<=2\nA\n\tA\nA\tB +\nA\tB\tC",
+         "equivalent\n\nimplied by; first alone: A=0\n\n\n",
+         {"line 2: Two conditions are separated by one tab.", "line 4: ", "  A\\x09B +\n         ^", "line 5: Two"},
+         1},
+        {{"compare", "--json", "-"},
+         "A==1\tA==2\n1\tA<=A\nA<A\tB\nA+\tB\n",
+         R"json({"line":1,"a":"A==1","b":"A==2","relation":"disjoint","witness":{"only_a":{"A":1},"only_b":{"A":2}}}
+{"line":2,"a":"1","b":"A<=A","relation":"equivalent","witness":{"both":{"A":0}}}
+{"line":3,"a":"A<A","b":"B","relation":"disjoint","witness":{"only_b":{"A":0,"B":1}}}
+{"line":4,"input":"A+\tB","error":{"id":"Vantor:Variants:ExpressionParseError","message":"The condition \"A+\" cannot be read at byte 2, before \"+\".","offset":1}}
+)json",
+         {},
+         1},
+        {{"given", "VERSION >= 3", "VERSION >= 4 && VERSION >= 2"}, "", "VERSION>=4\n", {}, 0},
+        {{"given", "--to", "pp", "!A", "A || B.x != 1"}, "", "B_x != 1\n", {}, 0},
+        {{"given", "--json"},
+         "A<B && B<C\tA<C\nA\tA && B\n",
+         "{\"line\":1,\"known\":\"A<B && B<C\",\"condition\":\"A<C\",\"result\":\"true\"}\n"
+         "{\"line\":2,\"known\":\"A\",\"condition\":\"A && B\",\"result\":\"B\"}\n",
+         {},
+         0},
+        {{"simplify", "--strong", "A<B && B<C && A<C", "A<B && B<C && C<A", "A<=3 || A>=0 && A!=1"},
+         "",
+         "A<B && B<C\nfalse\ntrue\n",
+         {},
+         0},
+        {{"simplify", "--explain", "--strong", "A<B && A<C && B<C"},
+         "",
+         "A<B && A<C && B<C\n  no rule applies\nproven equal  A<B && A<C && B<C  =>  A<B && B<C\n= A<B && B<C\n",
+         {},
+         0},
+        {{"compare", "A"}, "", "", {"two conditions are needed", "Try 'vtsym compare --help'"}, 2},
+        {{"given", "A", "B", "C"}, "", "", {"'C' is one argument too many"}, 2},
+        {{"compare", "--bits", "16", "A", "B"}, "", "", {"--bits: '16' is not offered; 32 is"}, 2},
+    });
+}
+
 TEST(Program, KeepsASession) {
     const std::string dialogue = "A>2 && A<4\nans || A>3\n:let N=A+1\n:let A=2\nN*2==6\n:quill\nB ~= A\n:c\n"
                                  ":tree A+1\n:explain 1 && B\n:symbols\n:pp !A.b || B && 2.5 < C\n";
@@ -274,8 +329,8 @@ TEST(Program, RefusesWrongUsageWithAHint) {
 }
 
 TEST(Program, HelpsOnRequest) {
-    for (const char* command :
-         {"", "simplify", "convert", "pp", "tree", "eval", "dims", "symbols", "replace", "repl", "operators"}) {
+    for (const char* command : {"", "simplify", "convert", "pp", "tree", "eval", "dims", "symbols", "replace", "repl",
+                                "operators", "compare", "given"}) {
         SCOPED_TRACE(command);
         std::vector<std::string> asked{command, "--help"};
         std::vector<std::string> helped{"help", command};

@@ -28,10 +28,15 @@ bool Conditions::makeRoomFor(const std::string& text) {
     textBytes_ += text.size() + cacheEntryBytes;
     if (service().table().size() < fullTable && textBytes_ < fullTexts)
         return false;
+    renew();
+    return true;
+}
+
+void Conditions::renew() {
     handle_.reset();
     handle_.emplace();
+    service().setDecisions32Bit(bits32_);
     textBytes_ = 0;
-    return true;
 }
 
 VT::SymbolicExprId Conditions::parse(const TextOptions& options, const std::string& text) const {

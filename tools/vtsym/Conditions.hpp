@@ -15,7 +15,8 @@ namespace vtsym {
 /// Identifiers hold until the next makeRoomFor().
 class Conditions {
 public:
-    Conditions() : handle_(std::in_place) {}
+    /// `bits32`: decisions are over signed 32-bit integers.
+    explicit Conditions(bool bits32 = false) : bits32_(bits32) { renew(); }
 
     [[nodiscard]] VT::VCService& service() const { return **handle_; }
 
@@ -36,6 +37,9 @@ public:
     [[nodiscard]] std::string printAsItStands(VT::SymbolicExprId condition, bool quill) const;
 
 private:
+    void renew();
+
+    bool bits32_;
     std::optional<VT::VCServiceHandle> handle_;
     std::size_t textBytes_ = 0; ///< of what the service may have kept
 };

@@ -47,6 +47,7 @@ Explanation::Explanation(const Conditions& conditions, const TextOptions& option
     if (withRules)
         listener.emplace(simplifier, firings_);
     result_ = simplifier.simplify(condition, passes_);
+    proven_ = result_;
 }
 
 /// A condition on the way; the beginning of a long one.
@@ -64,7 +65,9 @@ void Explanation::appendText(const Style& style, std::string& out) const {
         out.append("  no rule applies\n");
     else if (result_ == condition_)
         out.append("  what this leads to is longer or beyond a limit, so the condition stays\n");
-    out.append("= ").append(style.good(conditions_.print(options_, result_)));
+    if (proven_ != result_)
+        out.append("proven equal  ").append(step(result_)).append(style.faint("  =>  ")).append(step(proven_)) += '\n';
+    out.append("= ").append(style.good(conditions_.print(options_, proven_)));
 }
 
 void Explanation::appendSteps(const Style& style, std::string& out) const {
@@ -90,6 +93,12 @@ std::string Explanation::json() const {
         appendMember(steps, "rule", jsonString(firing.rule->name));
         appendMember(steps, "before", jsonString(step(firing.before)));
         appendMember(steps, "after", jsonString(step(firing.after)));
+        steps.append("}");
+    }
+    if (proven_ != result_) {
+        steps.append(steps.empty() ? "{\"rule\":\"proven equal\"" : ",{\"rule\":\"proven equal\"");
+        appendMember(steps, "before", jsonString(step(result_)));
+        appendMember(steps, "after", jsonString(step(proven_)));
         steps.append("}");
     }
     return "[" + steps + "]";

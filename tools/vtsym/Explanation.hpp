@@ -15,9 +15,13 @@ public:
     /// Simplifies a condition of the service; `conditions` and `options` outlive the explanation.
     Explanation(const Conditions& conditions, const TextOptions& options, VT::SymbolicExprId condition, bool withRules);
 
-    [[nodiscard]] VT::SymbolicExprId result() const noexcept { return result_; }
+    /// The result of the rules or, behind prove(), what was put in its place.
+    [[nodiscard]] VT::SymbolicExprId result() const noexcept { return proven_; }
 
     [[nodiscard]] std::uint64_t passes() const noexcept { return passes_; }
+
+    /// Puts a condition that was proven equal in the place of the result.
+    void prove(VT::SymbolicExprId equal) noexcept { proven_ = equal; }
 
     /// Appends the condition, each rule with before and after by passes, and the result.
     void appendText(const Style& style, std::string& out) const;
@@ -31,7 +35,8 @@ private:
     const Conditions& conditions_;
     const TextOptions& options_;
     VT::SymbolicExprId condition_;
-    VT::SymbolicExprId result_ = 0;
+    VT::SymbolicExprId result_ = 0; ///< of the rules
+    VT::SymbolicExprId proven_ = 0;
     std::uint64_t passes_ = 0;
     std::vector<VT::RuleFiring> firings_;
 };

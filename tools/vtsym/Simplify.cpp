@@ -14,23 +14,30 @@ constexpr const char* examples =
 
 Examples:
   vtsym simplify 'Mode == 1 && Mode == 2'
+  vtsym simplify --strong 'A<B && B<C && A<C'
   vtsym simplify --explain '!(A < 3) || A == 2'
   vtsym simplify --to quill 'a / b == 1 && x != 2'
   vtsym simplify --json < conditions.txt)";
 
 struct SimplifyOptions : TextOptions {
     bool explain = false;
+    bool strong = false;
+    bool bits32 = false;
 };
 
 class Simplifier {
 public:
-    Simplifier(const SimplifyOptions& options, const Style& style) : options_(options), style_(style) {}
+    Simplifier(const SimplifyOptions& options, const Style& style)
+        : options_(options),
+          style_(style),
+          conditions_(options.bits32) {}
 
     void answer(const std::string& text, std::string& out);
 
     [[nodiscard]] const std::vector<std::string>& warnings() const noexcept { return warnings_; }
 
 private:
+    [[nodiscard]] VT::SymbolicExprId strengthened(VT::SymbolicExprId result) const;
     VT::SymbolicExprId answerInDetail(const std::string& text, std::string& out) const;
 
     const SimplifyOptions& options_;
@@ -45,15 +52,22 @@ void Simplifier::answer(const std::string& text, std::string& out) {
     if (options_.json || options_.explain) {
         result = answerInDetail(text, out);
     } else {
-        result = conditions_.simplify(options_, text);
+        result = strengthened(conditions_.simplify(options_, text));
         out.append(conditions_.print(options_, result));
     }
     warnings_ = conditions_.warnings(options_, result);
 }
 
+/// With --strong: true, false or a shorter form that is proven equal, where there is one.
+VT::SymbolicExprId Simplifier::strengthened(VT::SymbolicExprId result) const {
+    VT::VCService& service = conditions_.service();
+    return options_.strong ? service.getImpliedCondition(result, service.table().getIdTRUE()).id() : result;
+}
+
 /// Past the service's caches, which know results only.
 VT::SymbolicExprId Simplifier::answerInDetail(const std::string& text, std::string& out) const {
-    const Explanation explanation(conditions_, options_, conditions_.parse(options_, text), options_.explain);
+    Explanation explanation(conditions_, options_, conditions_.parse(options_, text), options_.explain);
+    explanation.prove(strengthened(explanation.result()));
     if (!options_.json) {
         explanation.appendText(style_, out);
         return explanation.result();
@@ -73,6 +87,9 @@ Command addSimplify(CLI::App& program) {
     addTextOptions(*command, *options);
     addLanguageOption(*command, *options);
     command->add_flag("--explain", options->explain, "Show the rules that fired, pass by pass");
+    command->add_flag("--strong", options->strong,
+                      "Then decide: answer true, false or a shorter condition where it is proven equal");
+    addBitsOption(*command, options->bits32);
     command->footer(examples);
     return {
         command, [options](Console& console) {

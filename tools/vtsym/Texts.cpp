@@ -47,12 +47,12 @@ void Answerer::answer(const std::string& text) {
     out_.clear();
     if (answering_.inBlocks && line_ > 1)
         out_ += '\n';
-    if (json_) {
+    if (json_)
         out_.append("{\"line\":").append(std::to_string(line_));
-        appendMember(out_, "input", jsonString(text));
-    }
     std::string words;
     const std::size_t begin = out_.size();
+    if (json_ && !answering_.tellsInput)
+        appendMember(out_, "input", jsonString(text));
     try {
         answering_.answer(text, out_);
         words = warnings();
@@ -60,10 +60,12 @@ void Answerer::answer(const std::string& text) {
         const TextError error = currentTextError();
         allAnswered_ = false;
         out_.resize(begin);
-        if (json_)
+        if (json_) {
+            appendMember(out_, "input", jsonString(text));
             appendMember(out_, "error", jsonOf(error));
-        else
+        } else {
             words = errorLines(line_, text, error, console_.wordStyle());
+        }
     }
     out_ += json_ ? "}\n" : "\n";
     console_.data(out_);
@@ -176,6 +178,15 @@ void addLanguageOption(CLI::App& command, TextOptions& options) {
                     "unless given)")
         ->check(oneOf({"c", "quill", "pp"}))
         ->type_name("LANGUAGE");
+}
+
+void addBitsOption(CLI::App& command, bool& bits32) {
+    command
+        .add_option_function<std::string>(
+            "--bits", [&bits32](const std::string&) { bits32 = true; },
+            "Take names for signed integers of 32 bits; for integers without bounds unless given")
+        ->check(oneOf({"32"}))
+        ->type_name("BITS");
 }
 
 bool answerTexts(const TextOptions& options, Console& console, const Answering& answering) {

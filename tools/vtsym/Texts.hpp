@@ -36,6 +36,8 @@ struct Answering {
     bool inBlocks = false;
     /// What is to be told on standard error of the text that was answered last; nullptr for nothing ever.
     const std::vector<std::string>* warnings = nullptr;
+    /// Whether an answer with --json tells the text in members of its own; otherwise `"input"` does.
+    bool tellsInput = false;
 };
 
 /// Marks arguments that the parser of the command line would not take for texts: those behind `--`, unless they are the
@@ -49,6 +51,9 @@ void addTextOptions(CLI::App& command, TextOptions& options);
 void addSourceOption(CLI::App& command, TextOptions& options);
 /// Gives a command --to.
 void addLanguageOption(CLI::App& command, TextOptions& options);
+
+/// Gives a command --bits.
+void addBitsOption(CLI::App& command, bool& bits32);
 
 /// Whether a text is one name.
 bool isName(std::string_view text);

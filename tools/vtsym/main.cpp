@@ -15,7 +15,8 @@ namespace vtsym {
 
 namespace {
 
-enum ExitStatus : int { Success = 0, Failure = 1, WrongUsage = 2 };
+constexpr int success = 0;
+constexpr int wrongUsage = 2;
 
 constexpr const char* description =
     "Symbolic expressions and variant conditions: simplify, convert, evaluate, look inside.";
@@ -58,7 +59,8 @@ std::string unexpected(const std::vector<std::string>& arguments) {
 class Program {
 public:
     Program();
-    int run(Console& console, std::vector<std::string> arguments);
+    /// `onError` becomes what the command ends with when it throws.
+    int run(Console& console, std::vector<std::string> arguments, ExitStatus& onError);
 
 private:
     void addFeatures(CLI::App& app);
@@ -75,8 +77,8 @@ Program::Program() {
     app_.footer(footer);
     app_.get_formatter()->column_width(34);
     addFeatures(app_);
-    for (const auto add : {addSimplify, addConvert, addPreprocess, addTree, addEval, addDims, addSymbols, addReplace,
-                           addRepl, addOperators}) {
+    for (const auto add : {addSimplify, addCompare, addGiven, addCheck, addConvert, addPreprocess, addTree, addEval,
+                           addDims, addSymbols, addReplace, addRepl, addOperators}) {
         commands_.push_back(add(app_));
         addFeatures(*commands_.back().app);
     }
@@ -118,13 +120,13 @@ int Program::fail(Console& console, const std::string& problem) {
     std::string shown = problem;
     std::erase(shown, '\0'); // a guard of lists
     console.words("vtsym: " + shown + "\nTry '" + command + " --help'.\n");
-    return WrongUsage;
+    return wrongUsage;
 }
 
-int Program::run(Console& console, std::vector<std::string> arguments) {
+int Program::run(Console& console, std::vector<std::string> arguments, ExitStatus& onError) {
     if (arguments.empty()) {
         console.words("vtsym: a command is missing\n\n" + app_.help());
-        return WrongUsage;
+        return wrongUsage;
     }
     if (arguments.front() == "help") {
         arguments.erase(arguments.begin());
@@ -141,7 +143,7 @@ int Program::run(Console& console, std::vector<std::string> arguments) {
         app_.exit(wish, out, out);
         console.data(out.str());
         console.flush();
-        return Success;
+        return success;
     } catch (const CLI::ExtrasError&) {
         return fail(console, unexpected(app_.remaining(true)));
     } catch (const CLI::RequiredError&) {
@@ -151,19 +153,21 @@ int Program::run(Console& console, std::vector<std::string> arguments) {
         return fail(console, error.what());
     }
     const auto chosen = std::ranges::find_if(commands_, [](const Command& command) { return command.app->parsed(); });
-    return chosen->run(console) ? Success : Failure;
+    onError = chosen->onError;
+    return chosen->run(console).value();
 }
 
 int runOn(Console& console, std::vector<std::string> arguments) {
+    ExitStatus onError = false;
     try {
-        return Program().run(console, std::move(arguments));
+        return Program().run(console, std::move(arguments), onError);
     } catch (const OutputError& error) {
         if (!error.readerIsGone())
             console.words(std::string("vtsym: ") + error.what() + "\n");
     } catch (const std::exception& error) {
         console.words(std::string("vtsym: ") + error.what() + "\n");
     }
-    return Failure;
+    return onError.value();
 }
 
 } // namespace

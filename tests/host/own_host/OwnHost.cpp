@@ -7,6 +7,7 @@
 #include "host/Diagnostics.hpp"
 #include "host/Feature.hpp"
 #include "host/Log.hpp"
+#include "host/Model.hpp"
 #include "host/Numbers.hpp"
 #include "host/QuillParser.hpp"
 #include "host/Text.hpp"
@@ -149,6 +150,38 @@ const char* vtuQParserNonTerminalName(std::int32_t /*code*/) noexcept {
     return "non-terminal";
 }
 
+// The blocks of this host have a parent and a condition in C, and each of its ports is on a block.
+class VTBlock {
+public:
+    const VTBlock* parent;
+    const char* condition;
+};
+
+class vtPort {
+public:
+    const VTBlock* block;
+};
+
+const VTBlock* vtsvGetBlockParent(const VTBlock& block) {
+    return block.parent;
+}
+
+VT::VariantCondition vtsvGetBlockVariantCondition(const VTBlock& block) {
+    return {block.condition};
+}
+
+std::span<const VTBlock* const> vtsvGetBlockChoices(const VTBlock& /*block*/) {
+    return {};
+}
+
+const VTBlock* vtsvGetPortSource(const vtPort& port) {
+    return port.block;
+}
+
+std::span<const VTBlock* const> vtsvGetPortDestinations(const vtPort& /*port*/) {
+    return {};
+}
+
 int main() {
     expect(VtFeature::all().size() == 3, "the library has three flags");
     expect(!VT::isVariantKeywordsSimCodegenFeatureOn(), "flags start as this host has them start");
@@ -159,6 +192,10 @@ int main() {
 
     const VT::VCServiceHandle service;
     expect(service->simplifyCExprFromCCondition("A == 1 && A == 2") == "false", "the service works on this host");
+    const VTBlock engine{nullptr, "A > 1"};
+    const VTBlock gear{&engine, "A > 2 && B"};
+    const vtPort port{&gear};
+    expect(service->getCExprNetAAVCEString(&port, false) == "A>1 && (A>2 && B)", "conditions of this host's model");
     std::string said;
     try {
         service->parseC("A ===");

@@ -1,0 +1,39 @@
+// The conditions of the host's blocks and ports.
+#pragma once
+
+#include "base/service/VCSymbolicExprId.hpp"
+#include "host/Model.hpp"
+
+#include <boost/unordered_map.hpp>
+
+namespace VT {
+
+class VCService;
+
+/// Reads and combines the variant conditions of blocks, each once: a model with n blocks costs n conditions.  To be
+/// thrown away when the model changes.  The service outlives it.
+///
+/// Reading a condition may be refused by the host diagnostics of its language.  What was read stays.
+class VTSYM_API BlockConditions {
+public:
+    explicit BlockConditions(VCService& service) : service_(service) {}
+
+    /// The condition of a block itself.  "(inherit)" and no text at all are TRUE; "(default)" is that none of the
+    /// other choices' conditions holds, but for those that are "(default)" as well.
+    VCSymbolicExprId own(const VTBlock& block);
+    /// Whether a block is active: its own condition and those of all its ancestors, And from the top down.
+    VCSymbolicExprId net(const VTBlock& block);
+    /// Whether the signal of a port flows: its source is active, and one of its destinations.  That of a port without
+    /// destinations is that of its source.
+    VCSymbolicExprId of(const vtPort& port);
+
+private:
+    VCSymbolicExprId read(const VTBlock& block);
+    VCSymbolicExprId readDefault(const VTBlock& block);
+
+    VCService& service_;
+    boost::unordered_map<const VTBlock*, SymbolicExprId> own_;
+    boost::unordered_map<const VTBlock*, SymbolicExprId> net_;
+};
+
+} // namespace VT

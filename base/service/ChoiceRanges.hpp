@@ -1,0 +1,35 @@
+// Ranges that conditions confine names to: a look at a condition that often tells without a decision that it holds
+// nowhere where another one does.
+#pragma once
+
+#include "base/core/Table.hpp"
+
+#include <cstdint>
+#include <vector>
+
+namespace VT {
+
+/// The integers from `low` to `high` that a name is confined to.
+struct NameRange {
+    SymbolicExprId name;
+    std::int64_t low;
+    std::int64_t high;
+};
+
+/// Names and the ranges outside of which a condition does not hold; in the order of identifiers.
+using NameRanges = std::vector<NameRange>;
+
+/// The ranges that the comparisons of names with integers give in a condition that is an And, or an Or of Ands.  Looks
+/// at a few dozen operands; what it leaves out makes the ranges wider.
+NameRanges rangesOf(const SymbolicExprTable& table, SymbolicExprId condition);
+
+/// Ranges that hold wherever one of two conditions does.
+NameRanges joined(const NameRanges& a, const NameRanges& b);
+
+/// Whether ranges show that two conditions never hold together.
+bool areApart(const NameRanges& a, const NameRanges& b);
+
+/// Positions of conditions, sorted by the range of the name that most of them confine.
+std::vector<std::size_t> sortedByRange(const std::vector<NameRanges>& ranges);
+
+} // namespace VT

@@ -1,0 +1,416 @@
+// Reads a model while its JSON text goes by, with a stack of what is open.
+#include "host/embedded/ModelFile.hpp"
+
+#include "host/Text.hpp"
+
+#include <nlohmann/json.hpp>
+
+#include <algorithm>
+#include <array>
+#include <optional>
+#include <utility>
+
+namespace VT::Embedded {
+
+namespace {
+
+using Json = nlohmann::json;
+
+constexpr std::size_t shownBytes = 80;
+
+// Where the reader is in a text.
+
+/// Tells how far the parser has read, which it keeps to itself.
+class CountingIterator {
+public:
+    using iterator_category = std::input_iterator_tag;
+    using value_type = char;
+    using difference_type = std::ptrdiff_t;
+    using pointer = const char*;
+    using reference = const char&;
+
+    CountingIterator(const char* at, const char*& furthest) : at_(at), furthest_(&furthest) {}
+
+    reference operator*() const { return *at_; }
+
+    CountingIterator& operator++() {
+        *furthest_ = ++at_;
+        return *this;
+    }
+
+    bool operator==(const CountingIterator& other) const { return at_ == other.at_; }
+
+    bool operator!=(const CountingIterator& other) const { return at_ != other.at_; }
+
+private:
+    const char* at_;
+    const char** furthest_;
+};
+
+/// Lines and columns of a text, asked for from front to back.
+class Places {
+public:
+    explicit Places(const std::string& text) : text_(text) {}
+
+    /// The place of the bytes from begin to end, which hold no line break.
+    TextPlace of(std::size_t begin, std::size_t end) {
+        const std::uint64_t first = advance(begin);
+        const std::uint64_t line = line_;
+        return {line, first, advance(end)};
+    }
+
+private:
+    std::uint64_t advance(std::size_t to) {
+        for (; at_ < to && at_ < text_.size(); ++at_) {
+            const auto byte = static_cast<unsigned char>(text_[at_]);
+            if (byte == '\n') {
+                ++line_;
+                column_ = 1;
+            } else if ((byte & 0xc0U) != 0x80U) {
+                ++column_;
+            }
+        }
+        return column_;
+    }
+
+    const std::string& text_;
+    std::size_t at_ = 0;
+    std::uint64_t line_ = 1;
+    std::uint64_t column_ = 1;
+};
+
+// What a model is made of.
+
+enum class Part : std::uint8_t { Model, Blocks, Choices, Block, Ports, Port, Destinations };
+
+enum class Shape : std::uint8_t { Text, List, TextOrList };
+
+struct Member {
+    Part in;
+    std::string_view name;
+    Shape shape;
+    Part list; ///< what its list is
+};
+
+constexpr std::array<Member, 14> members{{
+    {Part::Model, "$schema", Shape::Text, {}},
+    {Part::Model, "name", Shape::Text, {}},
+    {Part::Model, "description", Shape::Text, {}},
+    {Part::Model, "language", Shape::Text, {}},
+    {Part::Model, "blocks", Shape::List, Part::Blocks},
+    {Part::Model, "ports", Shape::List, Part::Ports},
+    {Part::Block, "name", Shape::Text, {}},
+    {Part::Block, "description", Shape::Text, {}},
+    {Part::Block, "condition", Shape::Text, {}},
+    {Part::Block, "blocks", Shape::List, Part::Blocks},
+    {Part::Block, "choices", Shape::List, Part::Choices},
+    {Part::Port, "name", Shape::Text, {}},
+    {Part::Port, "from", Shape::Text, {}},
+    {Part::Port, "to", Shape::TextOrList, Part::Destinations},
+}};
+
+bool isObject(Part part) {
+    return part == Part::Model || part == Part::Block || part == Part::Port;
+}
+
+std::string_view nameOf(Part part) {
+    return part == Part::Model ? "a model" : part == Part::Block ? "a block" : "a port";
+}
+
+std::string inQuotes(std::string_view text) {
+    std::string result = "\"";
+    return result.append(shownText(text, shownBytes)).append("\"");
+}
+
+class Reader final : public nlohmann::json_sax<Json> {
+public:
+    Reader(const std::string& text, VTRootBD& model, const char*& furthest)
+        : text_(text),
+          model_(model),
+          furthest_(furthest),
+          places_(text),
+          end_(text.starts_with("\xef\xbb\xbf") ? 3 : 0) {}
+
+    void finish();
+
+    bool null() override { refuse(); }
+
+    bool boolean(bool) override { refuse(); }
+
+    bool number_integer(number_integer_t) override { refuse(); }
+
+    bool number_unsigned(number_unsigned_t) override { refuse(); }
+
+    bool number_float(number_float_t, const string_t&) override { refuse(); }
+
+    bool binary(binary_t&) override { refuse(); }
+
+    bool string(string_t& text) override;
+    bool start_object(std::size_t) override;
+    bool key(string_t& name) override;
+    bool end_object() override;
+    bool start_array(std::size_t) override;
+    bool end_array() override;
+    bool parse_error(std::size_t position, const std::string& token, const Json::exception& error) override;
+
+private:
+    /// An object or a list that is being read.
+    struct Open {
+        Part part;
+        TextPlace place;                ///< of its bracket
+        VTBlock* block = nullptr;       ///< that it is, or that owns the list
+        std::uint64_t index = 0;        ///< elements read before, in a list
+        const Member* member = nullptr; ///< whose value comes next, in an object
+        std::vector<std::string_view> seen = {};
+    };
+
+    struct PendingName {
+        std::string path;
+        TextPlace place;
+        std::string pointer;
+    };
+
+    struct PendingPort {
+        std::string name;
+        TextPlace place;
+        std::optional<PendingName> source;
+        std::vector<PendingName> destinations;
+    };
+
+    [[noreturn]] void fail(const std::string& sentence, const TextPlace& place, const std::string& pointer) const {
+        throw ModelError(pointer + ": " + sentence + ".", place);
+    }
+
+    [[noreturn]] void fail(const std::string& sentence) const { fail(sentence, place_, pointer()); }
+
+    /// Refuses a value of a type that nothing here has.
+    [[noreturn]] void refuse() {
+        step();
+        refuseShape();
+    }
+
+    [[noreturn]] void refuseShape() const;
+    void step();
+    [[nodiscard]] std::string pointer() const;
+    void open(Part part, VTBlock* block);
+    void close();
+    void setText(const std::string& text);
+    void setLanguage(const std::string& text);
+    const VTBlock& resolve(const PendingName& name) const;
+
+    const std::string& text_;
+    VTRootBD& model_;
+    const char*& furthest_;
+    Places places_;
+    TextPlace place_;     ///< of the token that was read last
+    std::size_t end_ = 0; ///< behind it
+    std::vector<Open> open_;
+    std::vector<PendingPort> ports_;
+};
+
+/// Finds the place of the token that the parser has just read.
+void Reader::step() {
+    std::size_t begin = end_;
+    while (begin < text_.size() && std::string_view(" \t\r\n,:").find(text_[begin]) != std::string_view::npos)
+        ++begin;
+    end_ = std::max(begin, static_cast<std::size_t>(furthest_ - text_.data()));
+    // The parser reads one byte beyond a number.
+    if (begin < end_ && std::string_view("\"{}[]").find(text_[begin]) == std::string_view::npos)
+        end_ = begin + 1;
+    place_ = places_.of(begin, end_);
+}
+
+/// The JSON pointer of the value that is being read, of a deep one the end.
+std::string Reader::pointer() const {
+    constexpr std::size_t shown = 16;
+    std::string pointer = open_.size() > shown ? "..." : "";
+    for (std::size_t i = open_.size() > shown ? open_.size() - shown : 0; i < open_.size(); ++i) {
+        if (!isObject(open_[i].part))
+            pointer.append("/").append(std::to_string(open_[i].index));
+        else if (open_[i].member != nullptr)
+            pointer.append("/").append(open_[i].member->name);
+    }
+    return pointer.empty() ? "the model" : pointer;
+}
+
+void Reader::refuseShape() const {
+    if (open_.empty())
+        fail("a model is an object: write {\"name\": ..., \"blocks\": [...]}");
+    const Open& top = open_.back();
+    if (!isObject(top.part))
+        fail(top.part == Part::Destinations ? "write the path of a block, such as \"Engine/Diesel\""
+             : top.part == Part::Ports      ? "write a port, {\"name\": ..., \"from\": ..., \"to\": ...}"
+                                            : "write a block, {\"name\": ..., \"condition\": ...}");
+    fail(top.member->shape == Shape::Text   ? "write a text in quotes"
+         : top.member->shape == Shape::List ? "write a list, [...]"
+                                            : "write the path of a block, or a list of such paths");
+}
+
+void Reader::open(Part part, VTBlock* block) {
+    open_.push_back({part, place_, block});
+}
+
+void Reader::close() {
+    open_.pop_back();
+    if (open_.empty())
+        return;
+    if (isObject(open_.back().part))
+        open_.back().member = nullptr;
+    else
+        ++open_.back().index;
+}
+
+bool Reader::start_object(std::size_t) {
+    step();
+    if (open_.empty()) {
+        open(Part::Model, nullptr);
+        return true;
+    }
+    const Open& top = open_.back();
+    if (top.part == Part::Blocks || top.part == Part::Choices) {
+        open(Part::Block, &model_.addBlock(top.block, top.part == Part::Choices));
+    } else if (top.part == Part::Ports) {
+        ports_.emplace_back();
+        ports_.back().place = place_;
+        open(Part::Port, nullptr);
+    } else {
+        refuseShape();
+    }
+    return true;
+}
+
+bool Reader::start_array(std::size_t) {
+    step();
+    if (open_.empty() || open_.back().member == nullptr || open_.back().member->shape == Shape::Text)
+        refuseShape();
+    open(open_.back().member->list, open_.back().block);
+    return true;
+}
+
+bool Reader::key(string_t& name) {
+    step();
+    Open& top = open_.back();
+    const auto* const member =
+        std::ranges::find_if(members, [&](const Member& each) { return each.in == top.part && each.name == name; });
+    if (member == members.end()) {
+        std::string known;
+        for (const Member& each : members)
+            if (each.in == top.part && each.name != "$schema")
+                known.append(known.empty() ? "" : ", ").append(each.name);
+        fail("there is no member " + inQuotes(name) + "; " + std::string(nameOf(top.part)) + " has " + known);
+    }
+    top.member = member;
+    if (std::ranges::find(top.seen, member->name) != top.seen.end())
+        fail("this member is here twice: take one away");
+    top.seen.push_back(member->name);
+    return true;
+}
+
+bool Reader::string(string_t& text) {
+    step();
+    if (open_.empty())
+        refuseShape();
+    Open& top = open_.back();
+    if (top.part == Part::Destinations) {
+        ports_.back().destinations.push_back({text, place_, pointer()});
+        ++top.index;
+        return true;
+    }
+    if (top.member == nullptr || top.member->shape == Shape::List)
+        refuseShape();
+    setText(text);
+    top.member = nullptr;
+    return true;
+}
+
+void Reader::setText(const std::string& text) {
+    const Open& top = open_.back();
+    const std::string_view member = top.member->name;
+    if (top.part == Part::Port) {
+        PendingPort& port = ports_.back();
+        if (member == "name")
+            port.name = text;
+        else if (member == "from")
+            port.source = PendingName{text, place_, pointer()};
+        else
+            port.destinations.push_back({text, place_, pointer()});
+        if (member == "name")
+            port.place = place_;
+    } else if (member == "name" && top.part == Part::Block) {
+        if (const std::string problem = model_.nameBlock(*top.block, text, place_); !problem.empty())
+            fail(problem);
+    } else if (member == "name") {
+        model_.setName(text);
+    } else if (member == "condition") {
+        top.block->setVariantCondition(text, place_);
+    } else if (member == "language") {
+        setLanguage(text);
+    }
+}
+
+void Reader::setLanguage(const std::string& text) {
+    if (text != "c" && text != "quill")
+        fail("there is no language " + inQuotes(text) + ": write \"c\" or \"quill\"");
+    model_.setQuill(text == "quill");
+}
+
+bool Reader::end_object() {
+    const TextPlace begin = open_.back().place;
+    const Part part = open_.back().part;
+    const auto has = [&](std::string_view name) {
+        return std::ranges::find(open_.back().seen, name) != open_.back().seen.end();
+    };
+    for (const std::string_view needed : {"name", "from"})
+        if ((part == Part::Block && needed == "name") || part == Part::Port)
+            if (!has(needed))
+                fail(std::string(nameOf(part)) + " without " + inQuotes(needed) + ": add it", begin, pointer());
+    step();
+    close();
+    return true;
+}
+
+bool Reader::end_array() {
+    step();
+    close();
+    return true;
+}
+
+bool Reader::parse_error(std::size_t position, const std::string&, const Json::exception& error) {
+    // "[...] parse error at line 1, column 2: while ... - what is wrong"
+    std::string sentence = error.what();
+    if (const std::size_t colon = sentence.find(": "); colon != std::string::npos)
+        sentence.erase(0, colon + 2);
+    const std::size_t at = std::min(position == 0 ? 0 : position - 1, text_.size());
+    throw ModelError("This is no JSON: " + shownText(sentence, 4 * shownBytes) + ".", Places(text_).of(at, at));
+}
+
+const VTBlock& Reader::resolve(const PendingName& name) const {
+    const VTBlock* const block = model_.find(name.path);
+    if (block == nullptr)
+        fail("there is no block " + inQuotes(name.path) + ": write the names from the top, separated by \"/\"",
+             name.place, name.pointer);
+    return *block;
+}
+
+/// Joins the ports to their blocks once all have their names.
+void Reader::finish() {
+    for (const PendingPort& port : ports_) {
+        const VTBlock& source = resolve(*port.source);
+        std::vector<const VTBlock*> destinations;
+        for (const PendingName& destination : port.destinations)
+            destinations.push_back(&resolve(destination));
+        model_.addPort({port.name, source, std::move(destinations), port.place});
+    }
+}
+
+} // namespace
+
+void readModel(const std::string& json, VTRootBD& model) {
+    const char* furthest = json.data();
+    Reader reader(json, model, furthest);
+    Json::sax_parse(CountingIterator(json.data(), furthest), CountingIterator(json.data() + json.size(), furthest),
+                    &reader);
+    reader.finish();
+}
+
+} // namespace VT::Embedded

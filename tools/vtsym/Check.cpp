@@ -1,0 +1,107 @@
+// vtsym check
+#include "tools/vtsym/Commands.hpp"
+#include "tools/vtsym/Findings.hpp"
+#include "tools/vtsym/ModelCheck.hpp"
+#include "tools/vtsym/ModelPage.hpp"
+#include "tools/vtsym/Texts.hpp"
+
+#include "host/embedded/ModelFile.hpp"
+
+#include <cerrno>
+#include <cstring>
+#include <fstream>
+#include <iterator>
+
+namespace vtsym {
+
+namespace {
+
+constexpr const char* examples =
+    R"(A model is a JSON file of blocks in blocks; the choices of a block are alternatives, each with a condition of its own.
+docs/model.schema.json describes it.  Every finding is proven; conditions are over integers without bounds.
+
+The exit status is 0 where nothing was found, 1 where something was, and 2 where the model could not be read or something
+could not be decided.
+
+Examples:
+  vtsym check model.json
+  vtsym check --html page.html model.json
+  vtsym check --sarif model.json > findings.sarif)";
+
+constexpr std::array<FindingRule, 5> rules{{
+    {"dead", "A block is never active.",
+     "The condition cannot hold where those of the blocks around it hold. Correct the condition, or take the block "
+     "away."},
+    {"always-active", "A block is always active.",
+     "The condition holds wherever those of the blocks around it hold. Take the condition away, or correct it."},
+    {"redundant", "A condition has an operand that can go.",
+     "Wherever the blocks around it are active, the condition means the same without the operand. Write the shorter "
+     "one."},
+    {"overlapping", "Two choices are active at once.",
+     "An assignment makes the conditions of two choices hold together. Make one condition exclude the other."},
+    {"missing", "No choice is active.",
+     "An assignment makes the block active and none of its choices. Add a choice for it, or a \"(default)\" one."},
+}};
+
+struct CheckOptions {
+    std::string file;
+    std::string page;
+    FindingForm form = FindingForm::Compiler;
+    bool bits32 = false;
+};
+
+/// The bytes of a file; an exception with the reason where it cannot be read.
+std::string contentOf(const std::string& path) {
+    errno = 0;
+    std::ifstream stream(path, std::ios::binary);
+    std::string content;
+    if (stream)
+        content.assign(std::istreambuf_iterator<char>(stream), {});
+    if (!stream || stream.bad())
+        throw std::runtime_error(std::string("The file cannot be read: ") + std::strerror(errno != 0 ? errno : EISDIR) +
+                                 ".");
+    return content;
+}
+
+void writePage(const std::string& path, const std::string& page) {
+    errno = 0;
+    std::ofstream stream(path, std::ios::binary);
+    stream << page;
+    stream.close();
+    if (!stream)
+        throw std::runtime_error("The page " + path + " cannot be written: " + std::strerror(errno) + ".");
+}
+
+SearchResult check(const CheckOptions& options, Console& console) {
+    const std::unique_ptr<FindingWriter> writer = makeFindingWriter(options.form, console, rules);
+    try {
+        console.working(1);
+        VTRootBD model;
+        VT::Embedded::readModel(contentOf(options.file), model);
+        ModelCheck modelCheck(model, options.file, options.bits32);
+        modelCheck.run(*writer);
+        if (!options.page.empty())
+            writePage(options.page, modelPage(model, modelCheck));
+    } catch (const VT::Embedded::ModelError& error) {
+        writer->problem({options.file, error.place().line, error.place().column, 0, 0, {}}, error.what());
+    } catch (const std::runtime_error& error) {
+        writer->problem({options.file, 0, 0, 0, 0, {}}, error.what());
+    }
+    return writer->finish();
+}
+
+} // namespace
+
+Command addCheck(CLI::App& program) {
+    CLI::App* const command = program.add_subcommand("check", "Check the choices of a model against each other");
+    const auto options = std::make_shared<CheckOptions>();
+    command->add_option("MODEL", options->file, "File of the model")->required()->type_name("");
+    command->add_option("--html", options->page, "Write a page that shows how the choices stand to each other")
+        ->type_name("FILE");
+    addFormOptions(*command, options->form);
+    addBitsOption(*command, options->bits32);
+    command->footer(examples);
+    return {command, [options](Console& console) { return check(*options, console); }, SearchResult::Failed};
+}
+
+} // namespace vtsym
