@@ -78,7 +78,7 @@ Program::Program() {
     app_.get_formatter()->column_width(34);
     addFeatures(app_);
     for (const auto add : {addSimplify, addConvert, addPreprocess, addTree, addEval, addDims, addSymbols, addReplace,
-                           addRepl, addOperators}) {
+                           addRepl, addOperators, addScan}) {
         commands_.push_back(add(app_));
         addFeatures(*commands_.back().app);
     }
