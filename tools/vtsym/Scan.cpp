@@ -45,10 +45,8 @@ Place placeOf(const std::string& file, const VT::SourceRegion& region) {
     return {file, region.line, region.column, region.endLine, region.endColumn, {}};
 }
 
-/// "since '#if A' (line 1) holds and '#if B' (line 2) does not".
+/// "since '#if A' (line 1) holds and '#if B' (line 2) does not hold here".
 std::string reasonsText(const std::vector<VT::BranchReason>& reasons) {
-    if (reasons.empty())
-        return "by itself";
     std::string text = "since ";
     for (std::size_t i = 0; i < reasons.size(); ++i) {
         text.append(i == 0 ? "" : i + 1 == reasons.size() ? " and " : ", ").append("'").append(reasons[i].directive);
@@ -58,19 +56,30 @@ std::string reasonsText(const std::vector<VT::BranchReason>& reasons) {
     return text + " here";
 }
 
+std::string messageOf(const VT::BranchFinding& found) {
+    std::string text = "'" + found.directive + "' ";
+    const char* alone = "";
+    switch (found.kind) {
+    case VT::BranchFindingKind::Dead:
+        text.append("is dead");
+        alone = ", the condition contradicts itself";
+        break;
+    case VT::BranchFindingKind::AlwaysTrue:
+        text.append("always holds");
+        alone = ", whatever the macros are";
+        break;
+    default:
+        text.append("can be '").append(found.directive, 0, found.directive.find(' ') + 1).append(found.proposed);
+        text.append("'");
+    }
+    return found.reasons.empty() ? text + alone : text + ", " + reasonsText(found.reasons);
+}
+
 Finding findingOf(const std::string& file, const VT::BranchFinding& found) {
-    using Kind = VT::BranchFindingKind;
     Finding finding;
     finding.place = placeOf(file, found.region);
     finding.kind = rules[static_cast<std::size_t>(found.kind)].kind;
-    finding.message.append("'").append(found.directive).append("' ");
-    std::string change;
-    if (found.kind == Kind::Removable)
-        change.append("can be '").append(found.proposed).append("'");
-    finding.message.append(found.kind == Kind::Dead         ? "is dead: it is never entered"
-                           : found.kind == Kind::AlwaysTrue ? "always holds"
-                                                            : change);
-    finding.message.append(found.reasons.empty() ? " " : ", ").append(reasonsText(found.reasons));
+    finding.message = messageOf(found);
     finding.condition = found.condition;
     if (!found.proposed.empty())
         finding.proposed = found.proposed;
