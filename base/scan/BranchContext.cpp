@@ -7,21 +7,21 @@ namespace VT {
 
 namespace {
 
-/// Facts about one subject that are looked at: between one and two windows, so that neighbours in a long chain look at
+/// Facts about one thing that are looked at: between one and two windows, so that neighbours in a long chain look at
 /// the same ones and share what was decided.
-constexpr std::size_t window = 256;
-constexpr std::size_t mostRelated = 2 * window;
+constexpr std::size_t window = 128;
+/// What all facts of a question may weigh: those about one thing are cheap to decide with.
+constexpr std::size_t mostWeight = 2 * window;
+constexpr std::size_t compoundWeight = 8;
 
 } // namespace
 
 void BranchContext::push(BranchFact fact) {
     const auto at = static_cast<std::uint32_t>(facts_.size());
-    for (const MacroUnknownId unknown : fact.unknowns) {
-        const MacroStates::Name subject = unknowns_[unknown].subject;
-        if (subject >= bySubject_.size())
-            bySubject_.resize(subject + 1);
-        bySubject_[subject].push_back(at);
-    }
+    byGroup_.resize(unknowns_.groups());
+    groupMarks_.resize(unknowns_.groups());
+    for (const MacroUnknownId unknown : fact.unknowns)
+        byGroup_[unknowns_[unknown].group].push_back(at);
     facts_.push_back(std::move(fact));
     marks_.push_back(0);
 }
@@ -35,7 +35,7 @@ void BranchContext::negateLast() {
 void BranchContext::pop(std::size_t size) {
     while (facts_.size() > size) {
         for (const MacroUnknownId unknown : facts_.back().unknowns)
-            bySubject_[unknowns_[unknown].subject].pop_back();
+            byGroup_[unknowns_[unknown].group].pop_back();
         facts_.pop_back();
         marks_.pop_back();
     }
@@ -43,23 +43,29 @@ void BranchContext::pop(std::size_t size) {
 
 std::vector<std::size_t> BranchContext::related(const DirectiveCondition& condition) {
     std::vector<std::size_t> result;
+    std::size_t weight = 0;
     ++question_;
+    const auto add = [&](std::size_t fact) {
+        if (marks_[fact] == question_)
+            return;
+        weight += facts_[fact].unknowns.size() == 1 ? 1 : compoundWeight;
+        marks_[fact] = question_;
+        result.push_back(fact);
+    };
     const auto addAbout = [&](const std::vector<MacroUnknownId>& unknowns) {
         for (const MacroUnknownId unknown : unknowns) {
-            const MacroStates::Name subject = unknowns_[unknown].subject;
-            if (subject >= bySubject_.size())
+            const std::uint32_t group = unknowns_[unknown].group;
+            if (group >= byGroup_.size() || groupMarks_[group] == question_)
                 continue;
-            const std::vector<std::uint32_t>& about = bySubject_[subject];
+            groupMarks_[group] = question_;
+            const std::vector<std::uint32_t>& about = byGroup_[group];
             const std::size_t first = about.size() > window ? (about.size() - window) / window * window : 0;
-            for (std::size_t i = about.size(); i-- > first && result.size() < mostRelated;)
-                if (marks_[about[i]] != question_) {
-                    marks_[about[i]] = question_;
-                    result.push_back(about[i]);
-                }
+            for (std::size_t i = about.size(); i-- > first && weight < mostWeight;)
+                add(about[i]);
         }
     };
     addAbout(condition.unknowns);
-    for (std::size_t i = 0; i < result.size() && result.size() < mostRelated; ++i)
+    for (std::size_t i = 0; i < result.size() && weight < mostWeight; ++i)
         addAbout(facts_[result[i]].unknowns);
     std::ranges::sort(result);
     return result;

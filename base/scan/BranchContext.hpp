@@ -50,8 +50,9 @@ private:
     SymbolicExprTable& table_;
     MacroUnknowns& unknowns_;
     std::vector<BranchFact> facts_;
-    std::vector<std::vector<std::uint32_t>> bySubject_;
-    std::vector<std::uint64_t> marks_; ///< by fact: the latest question that it was related to
+    std::vector<std::vector<std::uint32_t>> byGroup_; ///< facts by what they are about
+    std::vector<std::uint64_t> marks_;                ///< by fact: the latest question that it was related to
+    std::vector<std::uint64_t> groupMarks_;           ///< the same by what it is about
     std::uint64_t question_ = 0;
 };
 

@@ -88,21 +88,26 @@ BranchVerdict BranchJudge::judge(SymbolicExprId condition, const KnownConditions
 
 std::vector<std::size_t> BranchJudge::reasons(SymbolicExprId condition, const BranchVerdict& verdict,
                                               const KnownConditions& known) {
-    std::vector<std::size_t> kept(known.facts.size());
-    std::iota(kept.begin(), kept.end(), std::size_t{0});
     const bool toShorten = verdict.kind == BranchVerdictKind::Removable;
-    // Takes away whole runs of facts, then shorter ones, the outer ones first.
+    const auto suffices = [&](const std::vector<std::size_t>& positions) {
+        std::vector<SymbolicExprId> facts;
+        for (const std::size_t at : positions)
+            facts.push_back(known.facts[at]);
+        return holds(verdict, condition,
+                     all(facts, known.laws, toShorten ? std::span<const SymbolicExprId>() : known.deathLaws));
+    };
+    // The last facts that are enough, then without whole runs of them, then without shorter ones.
+    std::vector<std::size_t> kept;
+    for (std::size_t length = 0; length < known.facts.size() && !suffices(kept); length = length * 2 + 1) {
+        kept.resize(std::min(length * 2 + 1, known.facts.size()));
+        std::iota(kept.begin(), kept.end(), known.facts.size() - kept.size());
+    }
     for (std::size_t length = kept.size(); length > 0; length /= 2)
         for (std::size_t i = 0; i < kept.size();) {
             std::vector<std::size_t> without(kept.begin(), kept.begin() + static_cast<std::ptrdiff_t>(i));
             const std::size_t rest = std::min(i + length, kept.size());
             without.insert(without.end(), kept.begin() + static_cast<std::ptrdiff_t>(rest), kept.end());
-            std::vector<SymbolicExprId> facts;
-            for (const std::size_t at : without)
-                facts.push_back(known.facts[at]);
-            const SymbolicExprId rested =
-                all(facts, known.laws, toShorten ? std::span<const SymbolicExprId>() : known.deathLaws);
-            if (holds(verdict, condition, rested))
+            if (suffices(without))
                 kept = std::move(without);
             else
                 i = rest;

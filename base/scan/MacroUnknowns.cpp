@@ -40,6 +40,8 @@ MacroUnknownId MacroUnknowns::add(MacroUnknown unknown) {
             .append(".")
             .append(std::to_string(unknown.state.epoch));
     unknown.node = SymbolicString(table_, name).getId(table_);
+    const Key group{MacroUnknown::Kind::Value, key.subject, key.version, 0};
+    unknown.group = groups_.emplace(group, static_cast<std::uint32_t>(groups_.size())).first->second;
     const auto id = static_cast<MacroUnknownId>(unknowns_.size());
     byNode_.emplace(unknown.node, id);
     unknowns_.push_back(std::move(unknown));
@@ -50,7 +52,7 @@ MacroUnknownId MacroUnknowns::add(MacroUnknown unknown) {
 MacroUnknownId MacroUnknowns::asked(MacroUnknown::Kind kind, MacroStates::Name macro, const MacroStates::State& state) {
     const std::string& name = states_.textOf(macro);
     const bool fixed = isFixed(name);
-    MacroUnknown unknown{kind, fixed, macro, state, invalidId, name, {}};
+    MacroUnknown unknown{kind, fixed, macro, state, 0, invalidId, name, {}};
     if (fixed)
         unknown.state.epoch = 0;
     return add(std::move(unknown));
@@ -77,18 +79,19 @@ MacroStates::State MacroUnknowns::stateOf(const std::vector<MacroStates::Name>& 
 
 MacroUnknownId MacroUnknowns::comparison(const std::string& key, std::string left, std::string right,
                                          const std::vector<MacroStates::Name>& macros) {
-    return add({MacroUnknown::Kind::Comparison, false, states_.nameOf(key), stateOf(macros), invalidId, std::move(left),
-                std::move(right)});
+    return add({MacroUnknown::Kind::Comparison, false, states_.nameOf(key), stateOf(macros), 0, invalidId,
+                std::move(left), std::move(right)});
 }
 
 MacroUnknownId MacroUnknowns::term(const std::string& key, std::string text,
                                    const std::vector<MacroStates::Name>& macros) {
-    return add({MacroUnknown::Kind::Term, false, states_.nameOf(key), stateOf(macros), invalidId, std::move(text), {}});
+    return add(
+        {MacroUnknown::Kind::Term, false, states_.nameOf(key), stateOf(macros), 0, invalidId, std::move(text), {}});
 }
 
 MacroUnknownId MacroUnknowns::unique(std::string text) {
     const MacroStates::Name subject = states_.nameOf(text + "\n" + std::to_string(++unique_));
-    return add({MacroUnknown::Kind::Term, true, subject, {0, 0, false}, invalidId, std::move(text), {}});
+    return add({MacroUnknown::Kind::Term, true, subject, {0, 0, false}, 0, invalidId, std::move(text), {}});
 }
 
 const MacroUnknown* MacroUnknowns::find(SymbolicExprId node) const {

@@ -28,6 +28,7 @@ struct MacroUnknown {
     bool settled;              ///< no included file changes it
     MacroStates::Name subject; ///< the macro's name, or the text of what is asked
     MacroStates::State state;
+    std::uint32_t group; ///< of what is asked about one subject in one version
     SymbolicExprId node; ///< a symbol whose value it is
     std::string left;    ///< how the terms are written; `right` for a comparison alone
     std::string right;
@@ -48,6 +49,9 @@ public:
     MacroUnknownId term(const std::string& key, std::string text, const std::vector<MacroStates::Name>& macros);
     /// Like nothing else.
     MacroUnknownId unique(std::string text);
+
+    /// Groups are numbered from 0.
+    [[nodiscard]] std::size_t groups() const noexcept { return groups_.size(); }
 
     [[nodiscard]] const MacroUnknown& operator[](MacroUnknownId id) const { return unknowns_[id]; }
 
@@ -74,6 +78,7 @@ private:
     MacroStates& states_;
     std::vector<MacroUnknown> unknowns_;
     std::unordered_map<Key, MacroUnknownId, KeyHash> ids_;
+    std::unordered_map<Key, std::uint32_t, KeyHash> groups_; ///< by keys of values in no epoch
     std::unordered_map<SymbolicExprId, MacroUnknownId> byNode_;
     std::uint64_t unique_ = 0;
 };
