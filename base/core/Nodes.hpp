@@ -18,9 +18,12 @@ namespace VT {
 /// An operand of a constructor: an identifier or a node.
 class Operand {
 public:
+    // NOLINTBEGIN(google-explicit-constructor): identifiers and nodes are written where an operand is meant
     Operand(SymbolicExprId id) : id_(id) {}
 
     Operand(const SymbolicExpr& node) : id_(invalidId), node_(&node) {}
+
+    // NOLINTEND(google-explicit-constructor)
 
     [[nodiscard]] SymbolicExprId in(const SymbolicExprTable& table) const {
         return node_ != nullptr ? node_->getId(table) : id_;
@@ -34,11 +37,14 @@ private:
 /// The name of a called function: an operand, or a text that is interned as an identifier.
 class VTSYM_API CallName {
 public:
+    // NOLINTBEGIN(google-explicit-constructor): as for operands
     CallName(SymbolicExprId id) : operand_(id) {}
 
     CallName(const SymbolicExpr& node) : operand_(node) {}
 
     CallName(const std::string& text) : operand_(invalidId), text_(&text) {}
+
+    // NOLINTEND(google-explicit-constructor)
 
     [[nodiscard]] SymbolicExprId in(SymbolicExprTable& table) const;
 

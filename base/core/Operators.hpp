@@ -71,7 +71,7 @@ inline constexpr auto operatorRows = std::to_array<OperatorInfo>({
      SymbolicOp::Negated,                                                                                              \
      SymbolicOp::Mirrored,                                                                                             \
      OnEqual,                                                                                                          \
-     Boolean != 0,                                                                                                     \
+     (Boolean) != 0,                                                                                                   \
      Meaning},
 #include "base/core/operators.def"
 #undef VTSYM_OPERATOR

@@ -20,7 +20,7 @@ void makeRoom(std::vector<const SymbolicExpr*>& nodes) {
         return;
     std::vector<const SymbolicExpr*> larger;
     larger.reserve(std::max(firstSlots, nodes.size() * 2));
-    preferLargePages(larger.data(), larger.capacity() * sizeof(const SymbolicExpr*));
+    preferLargePages(larger.data(), larger.capacity() * sizeof(larger.front()));
     larger.assign(nodes.begin(), nodes.end());
     nodes.swap(larger);
 }
@@ -81,7 +81,8 @@ void SymbolicExprTable::add(const SymbolicExpr* node) {
     if (isFull())
         reserveOne();
     makeRoom(foreignNodes_);
-    const CellStore::Number number = cells_.allocate(sizeof(node));
+    const CellStore::Number number =
+        cells_.allocate(sizeof(node)); // NOLINT(bugprone-sizeof-expression): a pointer is kept
     NodeCell* const fresh = cell(number);
     fresh->id = static_cast<std::uint32_t>(nodes_.size());
     fresh->code = NodeCell::foreign;

@@ -213,10 +213,11 @@ const NodeCell* SymbolicExprTable::place(const Payload& candidate, std::uint32_t
 template <class Node, class Payload>
 SymbolicExprId SymbolicExprTable::idOf(const Payload& node) const {
     // Another node may stand where the remembered one stood, so it is compared, which is cheaper than hashing.
-    if constexpr (!Node::equalWithinTolerance)
+    if constexpr (!Node::equalWithinTolerance) {
         if (lastAnswer_.candidate == &node && lastAnswer_.cell->isOf(Node::code) &&
             static_cast<const Payload*>(lastAnswer_.cell->node())->hasParts(node))
             return lastAnswer_.cell->id;
+    }
     return lookup(&node);
 }
 

@@ -116,7 +116,7 @@ void Finder::compareNames() {
     const TextPool& texts = printer_.texts();
     const auto before = [&](const Name& a, const Name& b) {
         const int order = texts.compare(a.text, b.text);
-        return order != 0 ? order < 0 : a.id < b.id;
+        return order != 0 ? order < 0 : compareStructure(table_, a.id, b.id) < 0;
     };
     const auto same = [&](const Name& a, const Name& b) {
         return texts.length(a.text) == texts.length(b.text) && texts.compare(a.text, b.text) == 0;

@@ -201,7 +201,7 @@ TEST(Program, WritesConditionsOfDirectives) {
         {{"convert", "--to", "pp", "a b", "A.B_C == A_B.C && x > .5"},
          "",
          "\nA_B_C == A_B_C && x > 0.5\n",
-         {"line 1: ", "line 2: warning: A_B.C and A.B_C are both written A_B_C",
+         {"line 1: ", "line 2: warning: A.B_C and A_B.C are both written A_B_C",
           "line 2: warning: a preprocessor has no real constants: 0.5"},
          1},
         {{"simplify", "--to", "pp", "A>1||A<=1", "!(A.B<3)&&C||0"}, "", "1\nA_B >= 3 && C\n", {}, 0},

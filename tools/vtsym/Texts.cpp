@@ -32,8 +32,7 @@ public:
     [[nodiscard]] bool allAnswered() const noexcept { return allAnswered_; }
 
 private:
-    void explain(const std::string& text, const TextError& error);
-    void warn();
+    [[nodiscard]] std::string warnings() const;
 
     bool json_;
     Console& console_;
@@ -52,34 +51,32 @@ void Answerer::answer(const std::string& text) {
         out_.append("{\"line\":").append(std::to_string(line_));
         appendMember(out_, "input", jsonString(text));
     }
+    std::string words;
     const std::size_t begin = out_.size();
     try {
         answering_.answer(text, out_);
-        warn();
+        words = warnings();
     } catch (...) {
         const TextError error = currentTextError();
         allAnswered_ = false;
         out_.resize(begin);
-        explain(text, error);
+        if (json_)
+            appendMember(out_, "error", jsonOf(error));
+        else
+            words = errorLines(line_, text, error, console_.wordStyle());
     }
     out_ += json_ ? "}\n" : "\n";
     console_.data(out_);
+    if (!words.empty())
+        console_.words(words);
 }
 
-void Answerer::explain(const std::string& text, const TextError& error) {
-    if (json_)
-        appendMember(out_, "error", jsonOf(error));
-    else
-        console_.words(errorLines(line_, text, error, console_.wordStyle()));
-}
-
-void Answerer::warn() {
-    if (answering_.warnings == nullptr || answering_.warnings->empty())
-        return;
+std::string Answerer::warnings() const {
     std::string lines;
-    for (const std::string& warning : *answering_.warnings)
-        lines += warningLine(line_, warning, console_.wordStyle());
-    console_.words(lines);
+    if (answering_.warnings != nullptr)
+        for (const std::string& warning : *answering_.warnings)
+            lines += warningLine(line_, warning, console_.wordStyle());
+    return lines;
 }
 
 /// Calls `use` with every line of standard input; 0, or the error that ended reading.  Before it waits for more input,
