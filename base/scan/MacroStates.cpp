@@ -1,6 +1,7 @@
 #include "base/scan/MacroStates.hpp"
 
 #include <algorithm>
+#include <functional>
 
 namespace VT {
 
@@ -11,14 +12,23 @@ constexpr std::size_t mostFollowed = 1024; ///< times that one of them stands in
 
 } // namespace
 
-MacroStates::Name MacroStates::nameOf(std::string_view text) {
-    const auto known = numbers_.find(text);
-    if (known != numbers_.end())
-        return known->second;
+MacroStates::Name MacroStates::nameOf(std::string_view text, bool lasting) {
+    SymbolicExprId hash = std::hash<std::string_view>()(text);
+    hash -= hash == invalidId ? 1U : 0U; // which is no key
     const auto name = static_cast<Name>(texts_.size());
+    Name before = name;
+    if (const Name* latest = byHash_.find(hash))
+        for (Name known = before = *latest;; known = sameHash_[known]) {
+            if (texts_[known] == text)
+                return known;
+            if (sameHash_[known] == known)
+                break;
+        }
+    texts_.push_back(lasting ? text : copies_.emplace_back(text));
     versions_.push_back(0);
     bodies_.emplace_back();
-    numbers_.emplace(texts_.emplace_back(text), name);
+    sameHash_.push_back(before);
+    byHash_.insert(hash, name);
     return name;
 }
 

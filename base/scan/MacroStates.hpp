@@ -9,13 +9,14 @@
 // included.
 #pragma once
 
+#include "base/core/IdMap.hpp"
+
 #include <cstddef>
 #include <cstdint>
 #include <deque>
 #include <span>
 #include <string>
 #include <string_view>
-#include <unordered_map>
 #include <vector>
 
 namespace VT {
@@ -31,10 +32,10 @@ public:
         bool operator==(const State&) const = default;
     };
 
-    /// The number of a name.
-    Name nameOf(std::string_view text);
+    /// The number of a name.  With `lasting`, the text outlives this and need not be copied.
+    Name nameOf(std::string_view text, bool lasting = false);
 
-    [[nodiscard]] const std::string& textOf(Name name) const { return texts_[name]; }
+    [[nodiscard]] std::string_view textOf(Name name) const { return texts_[name]; }
 
     /// The macro is defined or undefined here.
     void change(Name name);
@@ -63,8 +64,10 @@ private:
         std::uint64_t latestEpoch;
     };
 
-    std::unordered_map<std::string_view, Name> numbers_;
-    std::deque<std::string> texts_;
+    IdMap<Name> byHash_;                  ///< the latest name of a hash
+    std::vector<Name> sameHash_;          ///< by name: the one before of its hash, or itself
+    std::vector<std::string_view> texts_; ///< by name
+    std::deque<std::string> copies_;
     std::vector<std::uint64_t> versions_;   ///< by name
     std::vector<std::vector<Name>> bodies_; ///< by name: what stands in all its definitions so far
     std::vector<Chain> chains_;             ///< open

@@ -27,7 +27,7 @@ MacroUnknownId MacroUnknowns::add(MacroUnknown unknown) {
     const Key key{unknown.kind, unknown.subject, unknown.state.version, unknown.state.epoch};
     if (const auto known = ids_.find(key); known != ids_.end())
         return known->second;
-    const std::string& subject = states_.textOf(unknown.subject);
+    const std::string_view subject = states_.textOf(unknown.subject);
     std::string name;
     if (unknown.kind == MacroUnknown::Kind::Defined)
         name.append("defined(").append(subject).append(")");
@@ -50,9 +50,9 @@ MacroUnknownId MacroUnknowns::add(MacroUnknown unknown) {
 }
 
 MacroUnknownId MacroUnknowns::asked(MacroUnknown::Kind kind, MacroStates::Name macro, const MacroStates::State& state) {
-    const std::string& name = states_.textOf(macro);
+    const std::string_view name = states_.textOf(macro);
     const bool fixed = isFixed(name);
-    MacroUnknown unknown{kind, fixed, macro, state, 0, invalidId, name, {}};
+    MacroUnknown unknown{kind, fixed, macro, state, 0, invalidId, std::string(name), {}};
     if (fixed)
         unknown.state.epoch = 0;
     return add(std::move(unknown));

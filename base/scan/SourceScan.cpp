@@ -116,6 +116,7 @@ private:
     DirectiveConditionReader conditions_;
     BranchContext context_;
     std::vector<Chain> chains_;
+    std::vector<MacroStates::Name> body_; ///< of the definition that is read
 };
 
 void FileScan::run() {
@@ -155,12 +156,14 @@ void FileScan::changeMacros(const Directive& directive) {
             states_.changeAll();
         return;
     }
-    const MacroStates::Name macro = states_.nameOf(directive.tokens.front().text);
-    std::vector<MacroStates::Name> body;
-    if (directive.kind == DirectiveKind::Define)
-        for (const DirectiveToken& token : directive.tokens.subspan(1))
-            body.push_back(states_.nameOf(token.text));
-    states_.addBody(macro, body);
+    const auto nameOf = [&](const DirectiveToken& token) { // a text of the file, but for a token with splices inside
+        return states_.nameOf(token.text, token.end - token.begin == token.text.size());
+    };
+    const MacroStates::Name macro = nameOf(directive.tokens.front());
+    body_.clear();
+    for (const DirectiveToken& token : directive.tokens.subspan(1))
+        body_.push_back(nameOf(token));
+    states_.addBody(macro, body_);
     states_.change(macro);
 }
 
