@@ -68,7 +68,6 @@ void scanLibrary(benchmark::State& state, std::int64_t branches) {
             scanner->scan(text, false, [&](const BranchFinding&) { ++found; });
             benchmark::DoNotOptimize(found);
         });
-    state.counters["bytes"] = static_cast<double>(text.size());
 }
 
 template <MakeText Make>

@@ -42,7 +42,7 @@ std::string spelledTokens(std::span<const DirectiveToken> tokens, bool compact =
 /// Reads conditions of one file, in its order.
 class DirectiveConditionReader {
 public:
-    /// With `truthConstants`, true and false are constants, as in C++; macros otherwise.
+    /// With `truthConstants`, true and false are constants, as in C++; unknowns otherwise.
     DirectiveConditionReader(SymbolicExprTable& table, MacroStates& states, MacroUnknowns& unknowns,
                              bool truthConstants)
         : table_(table),

@@ -51,9 +51,8 @@ MacroUnknownId MacroUnknowns::add(MacroUnknown unknown) {
 
 MacroUnknownId MacroUnknowns::asked(MacroUnknown::Kind kind, MacroStates::Name macro, const MacroStates::State& state) {
     const std::string_view name = states_.textOf(macro);
-    const bool fixed = isFixed(name);
-    MacroUnknown unknown{kind, fixed, macro, state, 0, invalidId, std::string(name), {}};
-    if (fixed)
+    MacroUnknown unknown{kind, macro, state, 0, invalidId, std::string(name), {}};
+    if (isFixed(name))
         unknown.state.epoch = 0;
     return add(std::move(unknown));
 }
@@ -79,19 +78,18 @@ MacroStates::State MacroUnknowns::stateOf(const std::vector<MacroStates::Name>& 
 
 MacroUnknownId MacroUnknowns::comparison(const std::string& key, std::string left, std::string right,
                                          const std::vector<MacroStates::Name>& macros) {
-    return add({MacroUnknown::Kind::Comparison, false, states_.nameOf(key), stateOf(macros), 0, invalidId,
-                std::move(left), std::move(right)});
+    return add({MacroUnknown::Kind::Comparison, states_.nameOf(key), stateOf(macros), 0, invalidId, std::move(left),
+                std::move(right)});
 }
 
 MacroUnknownId MacroUnknowns::term(const std::string& key, std::string text,
                                    const std::vector<MacroStates::Name>& macros) {
-    return add(
-        {MacroUnknown::Kind::Term, false, states_.nameOf(key), stateOf(macros), 0, invalidId, std::move(text), {}});
+    return add({MacroUnknown::Kind::Term, states_.nameOf(key), stateOf(macros), 0, invalidId, std::move(text), {}});
 }
 
 MacroUnknownId MacroUnknowns::unique(std::string text) {
     const MacroStates::Name subject = states_.nameOf(text + "\n" + std::to_string(++unique_));
-    return add({MacroUnknown::Kind::Term, true, subject, {0, 0, false}, 0, invalidId, std::move(text), {}});
+    return add({MacroUnknown::Kind::Term, subject, {0, 0, false}, 0, invalidId, std::move(text), {}});
 }
 
 const MacroUnknown* MacroUnknowns::find(SymbolicExprId node) const {

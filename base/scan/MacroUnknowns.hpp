@@ -25,7 +25,6 @@ struct MacroUnknown {
     };
 
     Kind kind;
-    bool settled;              ///< no included file changes it
     MacroStates::Name subject; ///< the macro's name, or the text of what is asked
     MacroStates::State state;
     std::uint32_t group; ///< of what is asked about one subject in one version

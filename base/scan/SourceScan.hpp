@@ -79,7 +79,7 @@ public:
 
     /// Tells the findings of a file in the order of its lines.  The text may be any bytes.  About linear in the text.
     ///
-    /// @param isCpp  whether true and false are constants; macros otherwise
+    /// @param isCpp  whether true and false are constants; either may be anything otherwise
     void scan(std::string_view text, bool isCpp, const std::function<void(const BranchFinding&)>& found);
 
     /// Of all files so far.
