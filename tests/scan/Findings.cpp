@@ -113,7 +113,8 @@ TEST(Findings, FollowWhatTheFileDoesToMacros) {
         {"what is not defined may be", "#if A < 2\n#include <a.h>\n#if A < 3\n#endif\n#endif", ""},
         {"not included in other branches", "#ifndef A\n#include <a.h>\n#elif !defined A\n#endif",
          "3 dead !defined A !1\n", false, true},
-        {"but perhaps behind",
+        {"but perhaps behind", "#ifndef A\n#if B\n#include <a.h>\n#else\n#endif\n#ifdef A\n#endif\n#endif", ""},
+        {"the same for strict readers",
          "#ifdef A\n#ifdef B\n#include <b.h>\n#endif\n#ifdef B\n#else\n#ifndef B\n#endif\n#endif\n#endif",
          "7 always !defined(B) !5\n", false, true},
     });

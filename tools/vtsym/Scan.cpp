@@ -123,7 +123,7 @@ Command addScan(CLI::App& program) {
     CLI::App* const command =
         program.add_subcommand("scan", "Find dead, redundant and shortenable preprocessor conditions in C and C++");
     const auto options = std::make_shared<ScanOptions>();
-    command->add_option("PATH", options->paths, "Files and directories")->required();
+    command->add_option("PATH", options->paths, "Files and directories")->required()->type_name("");
     addFormOptions(*command, options->form);
     command->add_flag("--strict-includes", options->strictIncludes, "Take it that an included file changes any macro");
     command->add_flag("--summary", options->summary, "Tell on standard error how much was read");
