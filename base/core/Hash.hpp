@@ -19,6 +19,9 @@ constexpr std::uint64_t hashStep(std::uint64_t hash, std::uint64_t key) noexcept
     return hash + 0xe6546b64U;
 }
 
+/// Multiplied by it, keys spread over the upper bits of the product: 2^64 divided by the golden ratio.
+inline constexpr std::uint64_t spread = 0x9e3779b97f4a7c15U;
+
 /// The hash in which a node kind's operands are then mixed.
 constexpr std::uint64_t hashSeed(SymbolicOp op) noexcept {
     return hashStep(0, static_cast<std::uint64_t>(static_cast<std::int64_t>(op)));

@@ -1,6 +1,7 @@
 // A small, fast map from identifiers to values, for memos that live during one walk.
 #pragma once
 
+#include "base/core/Hash.hpp"
 #include "base/core/Node.hpp"
 
 #include <bit>
@@ -54,7 +55,7 @@ private:
     /// The slot that holds a key or would.
     [[nodiscard]] std::size_t position(SymbolicExprId key) const noexcept {
         const std::size_t mask = slots_.size() - 1;
-        std::size_t at = static_cast<std::size_t>((key * 0x9e3779b97f4a7c15U) >> shift_) & mask;
+        std::size_t at = static_cast<std::size_t>((key * spread) >> shift_) & mask;
         while (slots_[at].key != key && slots_[at].key != invalidId)
             at = (at + 1) & mask;
         return at;

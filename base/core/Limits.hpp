@@ -26,6 +26,10 @@ inline constexpr std::size_t textBytes = std::size_t{1} << 30U;
 /// ordered by their structure.
 inline constexpr std::size_t orderedTextBytes = std::size_t{1} << 16U;
 
+/// In evaluation a real divisor below it counts as zero, and real values that differ by less are equal: the square root
+/// of the machine epsilon.
+inline constexpr double zeroThreshold = 0x1p-26;
+
 /// Elements of all vectors that one evaluation makes, and operations of a prepared expression.  Each node of a graph
 /// may make one more vector as long as the longest; beyond the bound evaluation throws std::length_error.
 inline constexpr std::size_t evaluatedElements = std::size_t{1} << 26U;

@@ -20,7 +20,8 @@ void makeRoom(std::vector<const SymbolicExpr*>& nodes) {
         return;
     std::vector<const SymbolicExpr*> larger;
     larger.reserve(std::max(firstSlots, nodes.size() * 2));
-    preferLargePages(larger.data(), larger.capacity() * sizeof(larger.front()));
+    preferLargePages(larger.data(),
+                     larger.capacity() * sizeof(larger.front())); // NOLINT(bugprone-sizeof-expression): of a pointer
     larger.assign(nodes.begin(), nodes.end());
     nodes.swap(larger);
 }

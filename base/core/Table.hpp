@@ -2,6 +2,7 @@
 #pragma once
 
 #include "base/core/Cells.hpp"
+#include "base/core/Hash.hpp"
 #include "base/core/Node.hpp"
 
 #include <boost/unordered_map.hpp>
@@ -118,7 +119,7 @@ private:
 
     [[nodiscard]] static std::uint32_t tagOf(std::uint64_t hash) noexcept {
         // Hashes of literals are their bits, so they are spread before the topmost bits choose the slot.
-        return static_cast<std::uint32_t>((hash * 0x9e3779b97f4a7c15U) >> 32U);
+        return static_cast<std::uint32_t>((hash * spread) >> 32U);
     }
 
     template <class Equal>

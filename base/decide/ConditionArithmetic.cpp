@@ -79,11 +79,12 @@ ConditionReader::Value ConditionReader::boundedTerm(const Frame& frame) {
             low = -high;
         }
     } else if (op == SymbolicOp::BitAnd) {
-        for (const std::size_t at : {0U, 1U})
+        for (const std::size_t at : {0U, 1U}) {
             if (const auto mask = constantOf(operand(frame, at)); mask && *mask >= 0) {
                 low = 0;
                 high = std::min(high, *mask);
             }
+        }
         if (low == 0) {
             Value value = term(frame.id, low, high);
             unknowns_.setMask(value.cases.front().form.parts.front().unknown, high);

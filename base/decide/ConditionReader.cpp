@@ -58,8 +58,7 @@ ReadCondition ConditionReader::read(SymbolicExprId condition) {
     result.truth = truthOf(condition);
     std::ranges::sort(leaves_,
                       [&](const UnknownLeaf& x, const UnknownLeaf& y) { return comesBefore(unknowns_, x, y); });
-    const auto repeated = std::ranges::unique(leaves_);
-    result.leaves.assign(leaves_.begin(), repeated.begin());
+    result.leaves.assign(leaves_.begin(), std::unique(leaves_.begin(), leaves_.end()));
     return result;
 }
 
@@ -78,13 +77,14 @@ bool ConditionReader::enter(SymbolicExprId id) {
     }
     const SymbolicExpr* node = table_.get(id);
     const std::size_t first = operands_.size();
-    if (chainOps.contains(node->op()))
+    if (chainOps.contains(node->op())) {
         collectChain(node->op(), id);
-    else
+    } else {
         for (std::size_t i = 0; i < node->getNumInputs(); ++i) {
             operands_.push_back(node->getInput(i));
             missing_ = missing_ || operands_.back() >= id;
         }
+    }
     frames_.push_back({id, node, first, first});
     return false;
 }
@@ -207,11 +207,11 @@ ConditionReader::Cases ConditionReader::casesOf(const Value& value) const {
 void ConditionReader::addCase(Cases& cases, Diagram guard, const LinearForm& form) {
     if (guard == never)
         return;
-    for (Case& known : cases)
-        if (known.form == form) {
-            known.guard = diagrams_.either(known.guard, guard);
-            return;
-        }
+    const auto known = std::ranges::find(cases, form, &Case::form);
+    if (known != cases.end()) {
+        known->guard = diagrams_.either(known->guard, guard);
+        return;
+    }
     cases.push_back({guard, form});
 }
 
@@ -238,13 +238,15 @@ ConditionReader::Value ConditionReader::comparison(const Frame& frame) {
         }
         return ofTruth(truth);
     }
-    if (op == SymbolicOp::Equal || op == SymbolicOp::NotEqual)
-        for (const auto& [tested, other] : {std::pair(&a, &b), std::pair(&b, &a)})
+    if (op == SymbolicOp::Equal || op == SymbolicOp::NotEqual) {
+        for (const auto& [tested, other] : {std::pair(&a, &b), std::pair(&b, &a)}) {
             if (tested->nonZero && constantOf(*other) == 0)
                 return ofTruth(op == SymbolicOp::Equal ? opposite(*tested->nonZero) : *tested->nonZero);
+        }
+    }
     const Cases left = casesOf(a);
     const Cases right = casesOf(b);
-    for (const Case& x : left)
+    for (const Case& x : left) {
         for (const Case& y : right) {
             steps_.take();
             const auto form = combine(x.form, 1, y.form, -1);
@@ -253,22 +255,25 @@ ConditionReader::Value ConditionReader::comparison(const Frame& frame) {
             const Diagram guard = diagrams_.both(x.guard, y.guard);
             truth = diagrams_.either(truth, diagrams_.both(guard, compare(op, *form)));
         }
+    }
     return ofTruth(truth);
 }
 
-/// Where `form op 0` holds.
 Diagram ConditionReader::compare(SymbolicOp op, const LinearForm& form) {
-    switch (op) { // two of the operators are enough
+    switch (op) {
     case SymbolicOp::NotEqual:
     case SymbolicOp::GreaterThan:
     case SymbolicOp::GreaterThanEqual:
-        return opposite(compare(operatorInfo(op).negated, form));
+        return opposite(compareDirectly(operatorInfo(op).negated, form));
     default:
-        break;
+        return compareDirectly(op, form);
     }
+}
+
+Diagram ConditionReader::compareDirectly(SymbolicOp op, const LinearForm& form) {
     if (form.isConstant())
         return compareNumbers(op, form.constant, std::int64_t{0}) ? always : never;
-    std::int64_t factor = 0;
+    std::int64_t factor = form.parts.front().factor;
     for (const LinearPart& part : form.parts)
         factor = std::gcd(factor, part.factor);
     Quantity quantity = unknowns_[form.parts.front().unknown].quantity;

@@ -93,7 +93,10 @@ private:
     Diagram truthOf(SymbolicExprId id);
     Cases casesOf(const Value& value) const;
     void addCase(Cases& cases, Diagram guard, const LinearForm& form);
+    /// Where `form op 0` holds.
     Diagram compare(SymbolicOp op, const LinearForm& form);
+    /// The same for the three operators that the others are the opposites of.
+    Diagram compareDirectly(SymbolicOp op, const LinearForm& form);
     std::optional<Diagram> compareReal(SymbolicOp op, const LinearForm& form, double real);
 
     static Value ofTruth(Diagram truth) { return {Value::Kind::Truth, truth, 0, {}, {}}; }

@@ -122,8 +122,7 @@ const Decider::State::Leaves& Decider::State::leavesOf(std::span<const Read* con
             joined.insert(joined.end(), read->condition.leaves.begin(), read->condition.leaves.end());
         std::ranges::sort(joined, before);
     }
-    const auto repeated = std::ranges::unique(joined);
-    joined.erase(repeated.begin(), repeated.end());
+    joined.erase(std::unique(joined.begin(), joined.end()), joined.end());
     return joined;
 }
 

@@ -1,5 +1,7 @@
 #include "base/decide/Decision.hpp"
 
+#include <algorithm>
+
 namespace VT {
 
 Relation Relation::of(Decision onlyA, Decision onlyB, Decision both) {
@@ -17,10 +19,12 @@ Relation Relation::of(Decision onlyA, Decision onlyB, Decision both) {
         relation.kind = RelationKind::ImpliedBy;
     else if (relation.both.isYes() && relation.onlyA.isYes() && relation.onlyB.isYes())
         relation.kind = RelationKind::Overlaps;
-    else
-        for (const Decision* each : {&relation.onlyA, &relation.onlyB, &relation.both})
-            if (each->isUndecided() && relation.bound == DecisionBound::None)
-                relation.bound = each->bound;
+    if (relation.kind == RelationKind::Undecided) {
+        const auto undecided = {&relation.onlyA, &relation.onlyB, &relation.both};
+        const auto first = std::ranges::find_if(undecided, &Decision::isUndecided);
+        if (first != undecided.end())
+            relation.bound = (*first)->bound;
+    }
     return relation;
 }
 

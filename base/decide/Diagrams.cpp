@@ -1,5 +1,7 @@
 #include "base/decide/Diagrams.hpp"
 
+#include "base/core/Hash.hpp"
+
 #include <algorithm>
 
 namespace VT {
@@ -9,7 +11,7 @@ namespace {
 constexpr std::size_t firstSlots = 256;
 
 std::uint64_t mix(std::uint64_t hash, std::uint64_t value) noexcept {
-    hash = (hash ^ value) * 0x9e3779b97f4a7c15U;
+    hash = (hash ^ value) * spread;
     return hash ^ (hash >> 29U);
 }
 

@@ -37,13 +37,14 @@ bool DifferenceSystem::canBeMet() {
     for (std::size_t round = 0; round <= count_; ++round) {
         steps_.take(bounds_.size() / boundsPerStep + 1);
         bool changed = false;
-        for (const Bound& bound : bounds_)
+        for (const Bound& bound : bounds_) {
             if (distance_[bound.x] > distance_[bound.y] + bound.most) {
                 distance_[bound.x] = distance_[bound.y] + bound.most;
                 changed = true;
                 if (distance_[bound.x] < shortest)
                     return false;
             }
+        }
         if (!changed)
             return true;
     }

@@ -94,8 +94,7 @@ std::vector<std::int64_t> WitnessSearch::candidates(const std::vector<std::int64
             literals.insert(literals.end(), term.plan->constants().begin(), term.plan->constants().end());
     const auto tidy = [](std::vector<std::int64_t>& values) {
         std::ranges::sort(values, isSmaller);
-        const auto repeated = std::ranges::unique(values);
-        values.erase(repeated.begin(), repeated.end());
+        values.erase(std::unique(values.begin(), values.end()), values.end());
     };
     tidy(literals);
     std::vector<std::int64_t> values;
@@ -111,7 +110,7 @@ std::vector<std::int64_t> WitnessSearch::candidates(const std::vector<std::int64
             if (literal % divisor == 0)
                 values.insert(values.end(), {divisor, literal / divisor, -literal / divisor});
     }
-    for (std::size_t i = 0; i < std::min(literals.size(), fewest); ++i)
+    for (std::size_t i = 0; i < std::min(literals.size(), fewest); ++i) {
         for (std::size_t j = 0; j < i; ++j) {
             suggest(literals[i] + literals[j]);
             suggest(literals[i] - literals[j]);
@@ -119,6 +118,7 @@ std::vector<std::int64_t> WitnessSearch::candidates(const std::vector<std::int64
             if (!__builtin_mul_overflow(literals[i], literals[j], &product))
                 suggest(product);
         }
+    }
     tidy(values);
     values.resize(std::min(values.size(), most));
     return values;
@@ -173,26 +173,29 @@ bool WitnessSearch::confirmNear(const std::vector<std::int64_t>& solution) {
         ones.emplace_back(number, replaced ? 1 : solution[number]);
     }
     // From the last unknown on, so that the first ones stay small.
-    for (const Base& base : {zeros, ones})
-        for (std::size_t i = movable_.size(); i-- > 0;)
+    for (const Base& base : {zeros, ones}) {
+        for (std::size_t i = movable_.size(); i-- > 0;) {
             for (const std::int64_t value : possible[i]) {
                 base_ = base;
                 if (confirmWith(std::array{Change(i, value)}))
                     return true;
             }
+        }
+    }
     base_ = zeros;
-    for (std::size_t i = movable_.size(); i-- > 1;) // what one sum gains another may have to lose
+    for (std::size_t i = movable_.size(); i-- > 1;) { // what one sum gains another may have to lose
         for (std::size_t j = i; j-- > 0;) {
             for (const std::int64_t value : possible[j])
                 if (confirmWith(std::array{Change(j, value), Change(i, -value)}))
                     return true;
             base_ = zeros;
         }
-    for (std::size_t reach = 8; reach < 4 * all.size(); reach *= 4) // near values for all pairs first
-        for (const Base& base : {zeros, ones})
-            for (std::size_t i = movable_.size(); i-- > 1;)
-                for (std::size_t j = i; j-- > 0;)
-                    for (std::size_t a = 0; a < std::min(reach, possible[j].size()); ++a)
+    }
+    for (std::size_t reach = 8; reach < 4 * all.size(); reach *= 4) { // near values for all pairs first
+        for (const Base& base : {zeros, ones}) {
+            for (std::size_t i = movable_.size(); i-- > 1;) {
+                for (std::size_t j = i; j-- > 0;) {
+                    for (std::size_t a = 0; a < std::min(reach, possible[j].size()); ++a) {
                         for (std::size_t b = 0; b < std::min(reach, possible[i].size()); ++b) {
                             if (triesLeft_ == 0)
                                 return false;
@@ -200,6 +203,11 @@ bool WitnessSearch::confirmNear(const std::vector<std::int64_t>& solution) {
                             if (confirmWith(std::array{Change(j, possible[j][a]), Change(i, possible[i][b])}))
                                 return true;
                         }
+                    }
+                }
+            }
+        }
+    }
     return false;
 }
 

@@ -128,15 +128,16 @@ void WitnessSearch::collect(Diagram diagram, std::span<const UnknownLeaf> leaves
     }
     for (const UnknownLeaf& leaf : leaves)
         meet(leaf.unknown);
-    std::vector<Unknown> free; // what terms are computed from
-    for (std::size_t i = 0; i < order_.size(); ++i) {
-        const UnknownInfo info = unknowns_[order_[i]]; // a copy: meeting more may move it
-        if (info.kind == UnknownKind::Sum)
+    std::vector<Unknown> free;                         // what terms are computed from
+    for (std::size_t i = 0; i < order_.size(); ++i) {  // NOLINT(modernize-loop-convert): meeting more appends
+        const UnknownInfo info = unknowns_[order_[i]]; // a copy, which stays where it is
+        if (info.kind == UnknownKind::Sum) {
             for (const LinearPart& part : info.sum) {
                 meet(part.unknown);
                 if (!unknowns_[part.unknown].isComputed())
                     free.push_back(part.unknown);
             }
+        }
         if (info.kind == UnknownKind::Term) {
             terms_.push_back({0, std::make_unique<TermPlan>(leafReader_, unknowns_, info.node)});
             steps_.take(terms_.back().plan->size());
@@ -159,8 +160,7 @@ void WitnessSearch::collect(Diagram diagram, std::span<const UnknownLeaf> leaves
     for (const Unknown unknown : free)
         movable_.push_back(numberOf(unknown));
     std::ranges::sort(movable_);
-    const auto repeated = std::ranges::unique(movable_);
-    movable_.erase(repeated.begin(), repeated.end());
+    movable_.erase(std::unique(movable_.begin(), movable_.end()), movable_.end());
     system_.begin(order_.size());
     for (std::size_t i = 0; i < order_.size(); ++i)
         system_.restrict(static_cast<Number>(i + 1), 0, unknowns_[order_[i]].low, unknowns_[order_[i]].high);

@@ -72,7 +72,7 @@ private:
     using Change = std::pair<std::size_t, std::int64_t>;
 
     bool confirmWith(std::span<const Change> changes);
-    bool confirmNear(const std::vector<std::int64_t>& values);
+    bool confirmNear(const std::vector<std::int64_t>& solution);
     bool isExcluded();
     [[nodiscard]] std::vector<std::int64_t> candidates(const std::vector<std::int64_t>& solution) const;
 

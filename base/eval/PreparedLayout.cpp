@@ -119,10 +119,11 @@ std::uint32_t PreparedExprLayout::addLeaf(const SymbolicScalar& value, bool isCo
 
 std::uint32_t PreparedExprLayout::addOperation(ScalarRuleIndex rule, std::uint32_t left, std::uint32_t right) {
     const auto isConstant = [this](std::uint32_t cell) { return (cell & ofResult) == 0 && constant_[cell]; };
-    if (isConstant(left) && isConstant(right))
+    if (isConstant(left) && isConstant(right)) {
         return addLeaf(evaluateScalars(scalarRules[static_cast<std::size_t>(rule)], {types_[left], cells_[left]},
                                        {types_[right], cells_[right]}),
                        true);
+    }
     if (operations_.size() >= limits::evaluatedElements)
         throw std::length_error("evaluation: too many operations");
     operations_.push_back({detail::operationCode(rule, ScalarType::Bool, ScalarType::Bool), left, right});

@@ -4,6 +4,7 @@
 // holds them for every pair of operand types, with the type of the result.
 #pragma once
 
+#include "base/core/Limits.hpp"
 #include "base/core/Operators.hpp"
 #include "host/Diagnostics.hpp"
 
@@ -116,10 +117,6 @@ private:
     std::variant<SymbolicScalar, Elements> value_;
 };
 
-/// A divisor below it counts as zero, and doubles that differ by less are equal: the square root of the machine
-/// epsilon.
-inline constexpr double zeroThreshold = 0x1p-26;
-
 /// The rules.  Operands are bool, std::int32_t or double; the result has the type of the function's answer.
 namespace rules {
 
@@ -186,7 +183,7 @@ auto multiply(L a, R b) {
 /// zero included.
 inline double quotient(double a, double b) {
     constexpr double infinity = std::numeric_limits<double>::infinity();
-    if (std::fabs(b) >= zeroThreshold)
+    if (std::fabs(b) >= limits::zeroThreshold)
         return a / b;
     if (a >= 0)
         return infinity;
@@ -215,7 +212,7 @@ auto divide(L a, R b) {
 template <class L, class R>
 auto remainder(L a, R b) {
     if constexpr (anyReal<L, R>) {
-        return std::fabs(real(b)) < zeroThreshold ? real(a) : std::fmod(real(a), real(b));
+        return std::fabs(real(b)) < limits::zeroThreshold ? real(a) : std::fmod(real(a), real(b));
     } else {
         const std::int32_t dividend = integer(a);
         const std::int32_t divisor = integer(b);
@@ -231,7 +228,7 @@ bool equal(L a, R b) {
     if constexpr (anyReal<L, R>) {
         const double x = real(a);
         const double y = real(b);
-        return x == y || std::fabs(x - y) < zeroThreshold || (std::isnan(x) && std::isnan(y));
+        return x == y || std::fabs(x - y) < limits::zeroThreshold || (std::isnan(x) && std::isnan(y));
     } else {
         return integer(a) == integer(b);
     }

@@ -53,10 +53,11 @@ void StringifyImpliedCondition::learn(SymbolicExprId known) {
         const auto [literal, positive] = literalOf(fact.id, node);
         facts_.emplace(literal, positive == fact.holds);
         const bool isNot = node.op() == SymbolicOp::Not;
-        if (isNot || node.op() == (fact.holds ? SymbolicOp::And : SymbolicOp::Or))
+        if (isNot || node.op() == (fact.holds ? SymbolicOp::And : SymbolicOp::Or)) {
             for (std::size_t i = node.getNumInputs(); i-- > 0;)
                 if (node.getInput(i) < fact.id)
                     pending.push_back({node.getInput(i), fact.holds != isNot});
+        }
     }
 }
 

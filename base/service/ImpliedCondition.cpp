@@ -177,7 +177,7 @@ bool ImpliedCondition::replaceGroups() {
 void ImpliedCondition::collectComparisons(SymbolicExprId condition) {
     std::vector<SymbolicExprId> operands;
     std::vector<std::set<int>> literals;
-    for (const SymbolicExprId root : {condition, context_})
+    for (const SymbolicExprId root : {condition, context_}) {
         walkDistinct(
             table_, root,
             [&](SymbolicExprId, const SymbolicExpr& node) {
@@ -201,12 +201,15 @@ void ImpliedCondition::collectComparisons(SymbolicExprId condition) {
                 }
             },
             [](SymbolicExprId) {});
+    }
     candidates_.clear();
-    for (std::size_t i = 0; i < operands.size(); ++i)
-        for (const int literal : literals[i])
+    for (std::size_t i = 0; i < operands.size(); ++i) {
+        for (const int literal : literals[i]) {
             for (const OperatorInfo& row : operatorTable())
                 if (comparisonOps.contains(row.op))
                     candidates_.push_back(compareWith(table_, row.op, operands[i], literal));
+        }
+    }
     std::ranges::sort(candidates_, [&](SymbolicExprId a, SymbolicExprId b) {
         const auto lengthA = printer_.textLength(a);
         const auto lengthB = printer_.textLength(b);

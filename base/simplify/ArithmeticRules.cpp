@@ -5,6 +5,7 @@
 // where it fits 32.  Reals are rounded at each step, so they are folded pair by pair and never regrouped.  Quotients
 // are moved as if they were exact.
 #include "base/core/IdMap.hpp"
+#include "base/core/Limits.hpp"
 #include "base/core/Walk.hpp"
 #include "base/simplify/IntegerSet.hpp"
 #include "base/simplify/RuleTables.hpp"
@@ -17,9 +18,6 @@
 namespace VT {
 
 namespace {
-
-/// Evaluation takes a smaller real divisor for zero, so its quotient is no finite number.
-constexpr double leastDivisor = 0x1p-26;
 
 SymbolicExprId integerIfFits(RuleContext& context, std::int64_t value) {
     return fitsInt(value) ? context.make<SymbolicIntValue>(static_cast<int>(value)) : invalidId;
@@ -59,7 +57,7 @@ SymbolicExprId foldNumbers(RuleContext& context, SymbolicOp op, SymbolicExprId a
     case SymbolicOp::Multiply:
         return realIfFinite(context, x * y);
     default:
-        return std::fabs(y) >= leastDivisor ? realIfFinite(context, x / y) : invalidId;
+        return std::fabs(y) >= limits::zeroThreshold ? realIfFinite(context, x / y) : invalidId;
     }
 }
 

@@ -138,10 +138,11 @@ bool decides(SymbolicOp op, double number) {
 
 bool numberOperand(Chain& chain) {
     const auto value = [&](SymbolicExprId id) { return chain.context.resolve(id); };
-    for (const SymbolicExprId operand : chain.operands)
+    for (const SymbolicExprId operand : chain.operands) {
         if (chain.context.isNumber(value(operand)) &&
             decides(chain.op, chain.context.node(value(operand)).getNumValue()))
             return chain.decide(chain.dominant());
+    }
     if (std::ranges::all_of(chain.operands, [&](SymbolicExprId id) { return chain.context.isNumber(value(id)); }))
         return chain.decide(chain.neutral());
     return chain.drop([&](SymbolicExprId id) { return chain.context.isNumber(value(id)); });
@@ -184,11 +185,10 @@ bool absorbedAlternative(Chain& chain) {
            }) > 0;
 }
 
-bool makeSmaller(Cover& cover, CoverBudget& budget) {
-    bool any = false;
-    while (joinCubes(cover) || absorb(cover) || dropComparisons(cover, budget) || dropCubes(cover, budget))
-        any = true;
-    return any;
+void makeSmaller(Cover& cover, CoverBudget& budget) {
+    bool changed = true;
+    while (changed)
+        changed = joinCubes(cover) || absorb(cover) || dropComparisons(cover, budget) || dropCubes(cover, budget);
 }
 
 /// Multiplies covers one after the other and keeps what comes out small.  False where the operand limit is exceeded.

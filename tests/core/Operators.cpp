@@ -1,169 +1,152 @@
-// Codes, classes, counts of operands and slots of virtual functions: what hosts rely on in binary form.  The data stand
-// here again on purpose.
+// Codes, classes, operands and slots of virtual functions: what hosts rely on in binary form.  The data stand here
+// again on purpose.
 #include "base/core/Nodes.hpp"
+#include "host/Diagnostics.hpp"
 #include "tests/support/AnyNode.hpp"
 #include "tests/support/Slots.hpp"
 
-#include <gtest/gtest.h>
+#include <gmock/gmock.h>
+#include <sstream>
 
 namespace VT::Testing {
 namespace {
 
 using Visitor = SymbolicExprVisitor;
 
-constexpr int leaf = 0;
-constexpr int any = -1;
+/// The classes in the order of their codes and of the visitors' slots, with their operands; * is any number.
+constexpr const char* classes =
+    "String0 IntValue0 DoubleValue0 PlusExpr2 MinusExpr2 UnaryMinusExpr1 MultiplyExpr2 DivideExpr2 ModuloExpr2 "
+    "EqualExpr2 NotEqualExpr2 LessThanExpr2 LessThanEqualExpr2 GreaterThanExpr2 GreaterThanEqualExpr2 AndExpr2 OrExpr2 "
+    "NotExpr1 BitAndExpr2 BitOrExpr2 BitXOrExpr2 BitComplExpr1 ShiftLeftExpr2 ShiftRightExpr2 2DExpr2 3DExpr3 NDExpr* "
+    "FcnCall0UExpr1 FcnCall1UExpr2 FcnCall2UExpr3 FcnCallExpr* MemberValue1 QColonExpr2 QColon3Expr3 RowExpr* "
+    "CellArrayExpr* MatrixExpr* PowerExpr2 DotPowerExpr2 DotMulExpr2 DotDivExpr2 LDivExpr2 DotLDivExpr2 TransposeExpr1 "
+    "DotTransposeExpr1 SingleAndExpr2 SingleOrExpr2 AnonymousFuncExpr2";
 
 struct Row {
-    int code;
     std::string className;
-    int operands;
     std::ptrdiff_t visitSlot;
-    bool unary, binary, ternary, multi;
 };
 
-template <class Node>
-Row row(int code, std::string className, int operands) {
-    return {code,
-            std::move(className),
-            operands,
-            slotOf(static_cast<void (Visitor::*)(const Node&)>(&Visitor::visit)),
-            std::is_base_of_v<SymbolicUnaryExpr, Node>,
-            std::is_base_of_v<SymbolicBinaryExpr, Node>,
-            std::is_base_of_v<SymbolicTernaryExpr, Node>,
-            std::is_base_of_v<SymbolicMultiExpr, Node>};
-}
-
-#define ROW(Code, Class, Operands) row<Class>(Code, #Class, Operands)
-
-std::vector<Row> rows() {
-    return {
-        ROW(0, SymbolicString, leaf),
-        ROW(1, SymbolicIntValue, leaf),
-        ROW(2, SymbolicDoubleValue, leaf),
-        ROW(3, SymbolicPlusExpr, 2),
-        ROW(4, SymbolicMinusExpr, 2),
-        ROW(5, SymbolicUnaryMinusExpr, 1),
-        ROW(6, SymbolicMultiplyExpr, 2),
-        ROW(7, SymbolicDivideExpr, 2),
-        ROW(8, SymbolicModuloExpr, 2),
-        ROW(9, SymbolicEqualExpr, 2),
-        ROW(10, SymbolicNotEqualExpr, 2),
-        ROW(11, SymbolicLessThanExpr, 2),
-        ROW(12, SymbolicLessThanEqualExpr, 2),
-        ROW(13, SymbolicGreaterThanExpr, 2),
-        ROW(14, SymbolicGreaterThanEqualExpr, 2),
-        ROW(15, SymbolicAndExpr, 2),
-        ROW(16, SymbolicOrExpr, 2),
-        ROW(17, SymbolicNotExpr, 1),
-        ROW(18, SymbolicBitAndExpr, 2),
-        ROW(19, SymbolicBitOrExpr, 2),
-        ROW(20, SymbolicBitXOrExpr, 2),
-        ROW(21, SymbolicBitComplExpr, 1),
-        ROW(22, SymbolicShiftLeftExpr, 2),
-        ROW(23, SymbolicShiftRightExpr, 2),
-        ROW(24, Symbolic2DExpr, 2),
-        ROW(25, Symbolic3DExpr, 3),
-        ROW(26, SymbolicNDExpr, any),
-        ROW(27, SymbolicFcnCall0UExpr, 1),
-        ROW(28, SymbolicFcnCall1UExpr, 2),
-        ROW(29, SymbolicFcnCall2UExpr, 3),
-        ROW(30, SymbolicFcnCallExpr, any),
-        ROW(31, SymbolicMemberValue, 1),
-        ROW(32, SymbolicQColonExpr, 2),
-        ROW(33, SymbolicQColon3Expr, 3),
-        ROW(34, SymbolicRowExpr, any),
-        ROW(35, SymbolicCellArrayExpr, any),
-        ROW(36, SymbolicMatrixExpr, any),
-        ROW(37, SymbolicPowerExpr, 2),
-        ROW(38, SymbolicDotPowerExpr, 2),
-        ROW(39, SymbolicDotMulExpr, 2),
-        ROW(40, SymbolicDotDivExpr, 2),
-        ROW(41, SymbolicLDivExpr, 2),
-        ROW(42, SymbolicDotLDivExpr, 2),
-        ROW(43, SymbolicTransposeExpr, 1),
-        ROW(44, SymbolicDotTransposeExpr, 1),
-        ROW(45, SymbolicSingleAndExpr, 2),
-        ROW(46, SymbolicSingleOrExpr, 2),
-        ROW(47, SymbolicAnonymousFuncExpr, 2),
-    };
-}
+const Row rows[] = {
+#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                         \
+    {#Class, slotOf(static_cast<void (Visitor::*)(const Class&)>(&Visitor::visit))},
+#include "base/core/operators.def"
+#undef VTSYM_OPERATOR
+};
 
 TEST(Operators, EachClassHasItsCodeItsOperandsAndItsSlot) {
-    const std::vector<Row> all = rows();
-    ASSERT_EQ(operatorTable().size(), all.size());
-    for (const Row& expected : all) {
-        SCOPED_TRACE(expected.className);
-        const auto op = static_cast<SymbolicOp>(expected.code);
-        EXPECT_EQ(operatorInfo(op).className, expected.className);
-        EXPECT_EQ(expected.visitSlot, expected.code + 3);
+    std::istringstream words(classes);
+    int code = 0;
+    for (std::string word; words >> word; ++code) {
+        SCOPED_TRACE(word);
+        const bool any = word.back() == '*';
+        const std::size_t count = any ? 4 : static_cast<std::size_t>(word.back() - '0');
+        word.pop_back();
+        const auto op = static_cast<SymbolicOp>(code);
+        EXPECT_EQ(operatorInfo(op).className, "Symbolic" + word);
+        EXPECT_EQ(rows[code].className, "Symbolic" + word);
+        EXPECT_EQ(rows[code].visitSlot, code + 3);
+        EXPECT_EQ(operandCount(op), any ? std::nullopt : std::optional(count)) << "its base class";
 
         SymbolicExprTable table;
-        const std::size_t count = expected.operands == any ? 4 : static_cast<std::size_t>(expected.operands);
-        NodeParts parts;
-        parts.text = "N";
+        NodeParts parts{"N", 0, 0, {}};
         for (std::size_t i = 0; i < count; ++i)
             parts.inputs.push_back(SymbolicString(table, std::string(i + 1, 'x')).getId(table));
         const SymbolicExpr& node = *table.get(makeAny(table, op, parts));
-
         EXPECT_EQ(node.op(), op);
-        EXPECT_EQ(node.getNumInputs(), count);
+        ASSERT_EQ(node.getNumInputs(), count);
         for (std::size_t i = 0; i < count; ++i)
             EXPECT_EQ(node.getInput(i), i);
-        EXPECT_EQ(node.isTermExpr(), expected.operands == leaf);
-        EXPECT_EQ(node.isNumValue(), expected.code == 1 || expected.code == 2);
-        EXPECT_EQ(node.isUnaryExpr(), expected.operands == 1);
-        EXPECT_EQ(node.isBinaryExpr(), expected.operands == 2);
-        EXPECT_EQ(node.isTernaryExpr(), expected.operands == 3);
-        EXPECT_EQ(node.isMultiExpr(), expected.operands == any);
-        EXPECT_EQ(expected.unary, expected.operands == 1);
-        EXPECT_EQ(expected.binary, expected.operands == 2);
-        EXPECT_EQ(expected.ternary, expected.operands == 3);
-        EXPECT_EQ(expected.multi, expected.operands == any);
-        EXPECT_EQ(node.isFcnCallExpr(), expected.code >= 27 && expected.code <= 29) << "not the generic call";
-        EXPECT_EQ(node.getNumDimensions(), expected.code >= 24 && expected.code <= 26 ? count : 0);
-        const bool headed = (expected.code >= 27 && expected.code <= 30) || expected.code == 35;
-        EXPECT_EQ(node.getNumArgs(), headed ? count - 1 : 0);
-        EXPECT_EQ(node.getNumValue(), expected.code == 1 || expected.code == 2 ? 0.0 : 18446744073709551616.0);
+        const bool number = code == 1 || code == 2;
+        EXPECT_EQ(node.isTermExpr(), count == 0);
+        EXPECT_EQ(node.isNumValue(), number);
+        EXPECT_EQ(node.isUnaryExpr(), count == 1);
+        EXPECT_EQ(node.isBinaryExpr(), count == 2);
+        EXPECT_EQ(node.isTernaryExpr(), count == 3);
+        EXPECT_EQ(node.isMultiExpr(), any);
+        EXPECT_EQ(node.isFcnCallExpr(), code >= 27 && code <= 29) << "not the generic call";
+        EXPECT_EQ(node.getNumDimensions(), code >= 24 && code <= 26 ? count : 0);
+        EXPECT_EQ(node.getNumArgs(), (code >= 27 && code <= 30) || code == 35 ? count - 1 : 0);
+        EXPECT_EQ(node.getNumValue(), number ? 0.0 : 18446744073709551616.0);
     }
+    EXPECT_EQ(operatorTable().size(), static_cast<std::size_t>(code));
 }
 
 TEST(Operators, SlotsOfNodesTablesAndVisitors) {
     using Node = SymbolicExpr;
     using Table = SymbolicExprTable;
+    // In order; destructors take slots 0 and 1.
+    const std::vector<std::ptrdiff_t> nodes{slotOf(&Node::op),
+                                            slotOf(&Node::operator==),
+                                            slotOf(&Node::getHash),
+                                            slotOf(&Node::getNumInputs),
+                                            slotOf(&Node::isTermExpr),
+                                            slotOf(&Node::isNumValue),
+                                            slotOf(&Node::isUnaryExpr),
+                                            slotOf(&Node::isBinaryExpr),
+                                            slotOf(&Node::isTernaryExpr),
+                                            slotOf(&Node::isMultiExpr),
+                                            slotOf(&Node::isFcnCallExpr),
+                                            slotOf(&Node::getNumValue),
+                                            slotOf(&Node::getInput),
+                                            slotOf(&Node::getNumDimensions),
+                                            slotOf(&Node::getNumArgs),
+                                            slotOf(&Node::accept),
+                                            slotOf(&Node::invoke)};
+    const std::vector<std::ptrdiff_t> tables{
+        slotOf(&Table::add), slotOf(&Table::contains),
+        slotOf(static_cast<SymbolicExprId (Table::*)(const Node*) const>(&Table::lookup)), slotOf(&Table::get),
+        slotOf(&Table::CreateSymbolicExprTable)};
+    for (const auto& slots : {nodes, tables, {slotOf(&Visitor::isBottomUpVistor)}})
+        for (std::size_t i = 0; i < slots.size(); ++i)
+            EXPECT_EQ(slots[i], static_cast<std::ptrdiff_t>(i + 2));
+}
+
+TEST(OperandAccessDeathTest, OutOfRange) {
+    using Op = SymbolicOp;
 
     const struct {
-        const char* name;
-        std::ptrdiff_t slot;
-        std::ptrdiff_t expected; // destructors take slots 0 and 1
+        Op op;
+        std::size_t operands;
+        std::string message;
+        std::string function;
+        bool checkedOnly; ///< answered while assertions are off
+        SymbolicExprId answer;
     } cases[] = {
-        {"op", slotOf(&Node::op), 2},
-        {"==", slotOf(&Node::operator==), 3},
-        {"getHash", slotOf(&Node::getHash), 4},
-        {"getNumInputs", slotOf(&Node::getNumInputs), 5},
-        {"isTermExpr", slotOf(&Node::isTermExpr), 6},
-        {"isNumValue", slotOf(&Node::isNumValue), 7},
-        {"isUnaryExpr", slotOf(&Node::isUnaryExpr), 8},
-        {"isBinaryExpr", slotOf(&Node::isBinaryExpr), 9},
-        {"isTernaryExpr", slotOf(&Node::isTernaryExpr), 10},
-        {"isMultiExpr", slotOf(&Node::isMultiExpr), 11},
-        {"isFcnCallExpr", slotOf(&Node::isFcnCallExpr), 12},
-        {"getNumValue", slotOf(&Node::getNumValue), 13},
-        {"getInput", slotOf(&Node::getInput), 14},
-        {"getNumDimensions", slotOf(&Node::getNumDimensions), 15},
-        {"getNumArgs", slotOf(&Node::getNumArgs), 16},
-        {"accept", slotOf(&Node::accept), 17},
-        {"invoke", slotOf(&Node::invoke), 18},
-        {"add", slotOf(&Table::add), 2},
-        {"contains", slotOf(&Table::contains), 3},
-        {"lookup", slotOf(static_cast<SymbolicExprId (Table::*)(const Node*) const>(&Table::lookup)), 4},
-        {"get", slotOf(&Table::get), 5},
-        {"CreateSymbolicExprTable", slotOf(&Table::CreateSymbolicExprTable), 6},
-        {"isBottomUpVistor", slotOf(&Visitor::isBottomUpVistor), 2},
+        {Op::String, 0, "VT::SymbolicExpr::getInput() should not be called", "VT::SymbolicExpr::getInput(", false, 0},
+        {Op::Not, 1, "VT::SymbolicUnaryExpr::getInput(aIdx) aIdx is greater than 0", "VT::SymbolicUnaryExpr::getInput(",
+         true, 0},
+        {Op::MemberValue, 1, "VT::SymbolicUnaryExpr::getInput(aIdx) aIdx is greater than 0",
+         "VT::SymbolicUnaryExpr::getInput(", true, 0},
+        {Op::Plus, 2, "VT::SymbolicBinaryExpr::getInput(aIdx) aIdx is out of bounds",
+         "virtual VT::SymbolicExprId VT::SymbolicBinaryExpr::getInput(std::size_t) const", false, 0},
+        {Op::QColon3, 3, "VT::SymbolicTernaryExpr::getInput(aIdx) aIdx is out of bounds",
+         "VT::SymbolicTernaryExpr::getInput(", false, 0},
+        {Op::Row, 2, "VT::SymbolicUnaryExpr::getInput(aIdx) aIdx is out of bounds", "VT::SymbolicMultiExpr::getInput(",
+         true, invalidId},
+        {Op::DimsND, 0, "VT::SymbolicUnaryExpr::getInput(aIdx) aIdx is out of bounds",
+         "VT::SymbolicMultiExpr::getInput(", true, invalidId},
     };
 
-    for (const auto& [name, slot, expected] : cases)
-        EXPECT_EQ(slot, expected) << name;
+    for (const auto& [op, operands, message, function, checkedOnly, answer] : cases) {
+        SCOPED_TRACE(operatorInfo(op).className);
+        SymbolicExprTable table;
+        SymbolicString(table, "x");
+        const NodeParts parts{"y", 0, 0, std::vector<SymbolicExprId>(operands, 0)};
+        const SymbolicExpr& node = *table.get(makeAny(table, op, parts));
+        for (const std::size_t index : {operands, ~std::size_t{0}}) {
+            for (const bool enabled : {true, false}) {
+                vtsvSetAssertionsEnabled(enabled);
+                if (enabled || !checkedOnly) {
+                    EXPECT_DEATH(static_cast<void>(node.getInput(index)),
+                                 testing::AllOf(testing::HasSubstr(message), testing::HasSubstr(function)));
+                } else {
+                    EXPECT_EQ(node.getInput(index), answer);
+                }
+            }
+        }
+    }
+    vtsvSetAssertionsEnabled(true);
 }
 
 } // namespace

@@ -1,11 +1,11 @@
 // Every operator on every pair of corner values, against arithmetic written down again over wide integers.
-#include "base/eval/Eval.hpp"
-#include "tests/support/AnyNode.hpp"
+#include "tests/eval/Scalars.hpp"
 
 #include <gtest/gtest.h>
 
 #include <cmath>
-#include <limits>
+#include <functional>
+#include <map>
 
 namespace VT::Testing {
 namespace {
@@ -14,26 +14,6 @@ constexpr double infinity = std::numeric_limits<double>::infinity();
 constexpr double threshold = 1.4901161193847656e-08;
 constexpr std::int64_t greatest = 2147483647;
 constexpr std::int64_t least = -2147483648;
-
-const std::vector<SymbolicScalar>& corners() {
-    static const std::vector<SymbolicScalar> all = [] {
-        std::vector<SymbolicScalar> values{false, true};
-        for (const std::int64_t value :
-             {least, least + 1, std::int64_t{-33}, std::int64_t{-32}, std::int64_t{-31}, std::int64_t{-7},
-              std::int64_t{-1}, std::int64_t{0}, std::int64_t{1}, std::int64_t{2}, std::int64_t{31}, std::int64_t{32},
-              std::int64_t{33}, std::int64_t{46341}, greatest - 1, greatest})
-            values.emplace_back(static_cast<std::int32_t>(value));
-        for (const double value : {threshold, std::nextafter(threshold, 0.0), std::nextafter(threshold, 1.0), 0.0, 0.5,
-                                   0.3, 0.1 + 0.2, 1.0, 1.0 + threshold, 31.9, 32.0, 2147483647.5, 2147483648.0,
-                                   2147483648.5, 2147483649.0, 1e300, 5e-324, infinity}) {
-            values.emplace_back(value);
-            values.emplace_back(-value);
-        }
-        values.emplace_back(std::numeric_limits<double>::quiet_NaN());
-        return values;
-    }();
-    return all;
-}
 
 /// A scalar in the oracle's hands: an integer without bounds, or a real.
 struct Wide {
@@ -69,13 +49,11 @@ SymbolicScalar wrap(std::int64_t value) {
     std::int64_t rest = value % modulus;
     if (rest < 0)
         rest += modulus;
-    return static_cast<std::int32_t>(static_cast<std::int64_t>(rest > greatest ? rest - modulus : rest));
+    return static_cast<std::int32_t>((rest > greatest ? rest - modulus : rest));
 }
 
 SymbolicScalar saturate(std::int64_t value) {
-    return static_cast<std::int32_t>(static_cast<std::int64_t>(value > greatest ? greatest
-                                                               : value < least  ? least
-                                                                                : value));
+    return static_cast<std::int32_t>((value > greatest ? greatest : value < least ? least : value));
 }
 
 /// By multiplication and division with a power of two, rounded down.
@@ -128,65 +106,34 @@ SymbolicScalar expected(SymbolicOp op, const Wide& a, const Wide& b) {
                 result += std::int64_t{1} << bit;
         return wrap(result);
     };
-    switch (op) {
-    case SymbolicOp::Plus:
-        return real ? SymbolicScalar(a.real + b.real) : wrap(a.integer + b.integer);
-    case SymbolicOp::Minus:
-        return real ? SymbolicScalar(a.real - b.real) : wrap(a.integer - b.integer);
-    case SymbolicOp::Multiply:
-        return real ? SymbolicScalar(a.real * b.real) : wrap(a.integer * b.integer);
-    case SymbolicOp::UnaryMinus:
-        return a.isReal ? SymbolicScalar(-a.real) : wrap(-a.integer);
-    case SymbolicOp::Divide:
-        return divide(a, b);
-    case SymbolicOp::Modulo:
-        return remainder(a, b);
-    case SymbolicOp::Equal:
-        return equal(a, b);
-    case SymbolicOp::NotEqual:
-        return !equal(a, b);
-    case SymbolicOp::LessThan:
-        return less(a, b);
-    case SymbolicOp::GreaterThan:
-        return less(b, a);
-    case SymbolicOp::LessThanEqual:
-        return less(a, b) || equal(a, b);
-    case SymbolicOp::GreaterThanEqual:
-        return less(b, a) || equal(a, b);
-    case SymbolicOp::And:
-        return a.isTrue() && b.isTrue();
-    case SymbolicOp::Or:
-        return a.isTrue() || b.isTrue();
-    case SymbolicOp::Not:
-        return !a.isTrue();
-    case SymbolicOp::BitAnd:
-        return bitwise([](bool x, bool y) { return x && y; });
-    case SymbolicOp::BitOr:
-        return bitwise([](bool x, bool y) { return x || y; });
-    case SymbolicOp::BitXOr:
-        return bitwise([](bool x, bool y) { return x != y; });
-    case SymbolicOp::BitCompl:
-        return wrap(-1 - static_cast<std::int64_t>(a.bits()));
-    case SymbolicOp::ShiftLeft:
-        return shift(a.bits(), b.bits());
-    case SymbolicOp::ShiftRight:
-        return shift(a.bits(), -b.bits());
-    default:
-        ADD_FAILURE() << "the oracle does not know " << operatorInfo(op).name;
-        return false;
-    }
-}
-
-SymbolicExprId literal(SymbolicExprTable& table, const SymbolicScalar& value) {
-    if (value.type() == ScalarType::Double) {
-        if (value == SymbolicScalar(-0.0)) // as a literal it is that of 0
-            return SymbolicUnaryMinusExpr(table, literal(table, 0.0)).getId(table);
-        const SymbolicExprId found = SymbolicDoubleValue(table, value.getDouble()).getId(table);
-        return found != invalidId ? found : table.size() - 1; // NaN is not found
-    }
-    if (value.type() == ScalarType::Int)
-        return SymbolicIntValue(table, value.getInt()).getId(table);
-    return SymbolicString(table, value.getBool() ? "true" : "false").getId(table);
+    const auto number = [&](double inReals, std::int64_t inIntegers) {
+        return real ? SymbolicScalar(inReals) : wrap(inIntegers);
+    };
+    using Op = SymbolicOp;
+    const std::map<Op, std::function<SymbolicScalar()>> answers{
+        {Op::Plus, [&] { return number(a.real + b.real, a.integer + b.integer); }},
+        {Op::Minus, [&] { return number(a.real - b.real, a.integer - b.integer); }},
+        {Op::Multiply, [&] { return number(a.real * b.real, a.integer * b.integer); }},
+        {Op::UnaryMinus, [&] { return a.isReal ? SymbolicScalar(-a.real) : wrap(-a.integer); }},
+        {Op::Divide, [&] { return divide(a, b); }},
+        {Op::Modulo, [&] { return remainder(a, b); }},
+        {Op::Equal, [&] { return equal(a, b); }},
+        {Op::NotEqual, [&] { return !equal(a, b); }},
+        {Op::LessThan, [&] { return less(a, b); }},
+        {Op::GreaterThan, [&] { return less(b, a); }},
+        {Op::LessThanEqual, [&] { return less(a, b) || equal(a, b); }},
+        {Op::GreaterThanEqual, [&] { return less(b, a) || equal(a, b); }},
+        {Op::And, [&] { return a.isTrue() && b.isTrue(); }},
+        {Op::Or, [&] { return a.isTrue() || b.isTrue(); }},
+        {Op::Not, [&] { return !a.isTrue(); }},
+        {Op::BitAnd, [&] { return bitwise([](bool x, bool y) { return x && y; }); }},
+        {Op::BitOr, [&] { return bitwise([](bool x, bool y) { return x || y; }); }},
+        {Op::BitXOr, [&] { return bitwise([](bool x, bool y) { return x != y; }); }},
+        {Op::BitCompl, [&] { return wrap(-1 - a.bits()); }},
+        {Op::ShiftLeft, [&] { return shift(a.bits(), b.bits()); }},
+        {Op::ShiftRight, [&] { return shift(a.bits(), -b.bits()); }},
+    };
+    return answers.at(op)();
 }
 
 std::string shown(const SymbolicScalar& value) {

@@ -63,11 +63,8 @@ std::size_t livingAllocations() {
 
 using namespace VT::Testing;
 
+// The forms for arrays call these.
 void* operator new(std::size_t bytes) {
-    return allocateOrThrow(bytes, usual);
-}
-
-void* operator new[](std::size_t bytes) {
     return allocateOrThrow(bytes, usual);
 }
 
@@ -75,15 +72,7 @@ void* operator new(std::size_t bytes, std::align_val_t alignment) {
     return allocateOrThrow(bytes, static_cast<std::size_t>(alignment));
 }
 
-void* operator new[](std::size_t bytes, std::align_val_t alignment) {
-    return allocateOrThrow(bytes, static_cast<std::size_t>(alignment));
-}
-
 void* operator new(std::size_t bytes, const std::nothrow_t&) noexcept {
-    return allocate(bytes, usual);
-}
-
-void* operator new[](std::size_t bytes, const std::nothrow_t&) noexcept {
     return allocate(bytes, usual);
 }
 
@@ -91,15 +80,7 @@ void operator delete(void* place) noexcept {
     release(place);
 }
 
-void operator delete[](void* place) noexcept {
-    release(place);
-}
-
 void operator delete(void* place, std::size_t) noexcept {
-    release(place);
-}
-
-void operator delete[](void* place, std::size_t) noexcept {
     release(place);
 }
 
@@ -107,14 +88,6 @@ void operator delete(void* place, std::align_val_t) noexcept {
     release(place);
 }
 
-void operator delete[](void* place, std::align_val_t) noexcept {
-    release(place);
-}
-
 void operator delete(void* place, std::size_t, std::align_val_t) noexcept {
-    release(place);
-}
-
-void operator delete[](void* place, std::size_t, std::align_val_t) noexcept {
     release(place);
 }

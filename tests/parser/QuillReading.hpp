@@ -2,8 +2,12 @@
 #pragma once
 
 #include "base/VTSymbolicExpr.hpp"
+#include "host/Messages.hpp"
+#include "host/Text.hpp"
 #include "parser/QuillConverterBlockVariants.hpp"
 #include "tests/support/TreeText.hpp"
+
+#include <gtest/gtest.h>
 
 #include <optional>
 #include <string>
@@ -46,8 +50,15 @@ QuillAnswer readCondition(const Text& text, SymbolValidator* validator = nullptr
     return readQuill<SymbolicExprFromQParseTreeBlockVariants>(text, validator);
 }
 
-/// A diagnostic in one line: the key, the arguments, the offset.
+/// A diagnostic in one line: the key, the arguments, the offset.  Its sentence must have room for the arguments and
+/// quote the text.
 inline std::string reportText(const HostDiagnostic& report) {
+    const MessageInfo* const row = findMessage(report.messageId());
+    EXPECT_TRUE(row != nullptr && fits(*row, report.arguments())) << report.messageId();
+    const std::size_t textAt = row != nullptr && row->arguments.size() > 2 ? 1 : 0;
+    const std::string quoted = shownText(std::get<std::string>(report.arguments().at(textAt)), 10);
+    EXPECT_NE(std::string(report.what()).find(quoted.substr(0, quoted.find("..."))), std::string::npos)
+        << report.what();
     std::string text = report.messageId().substr(report.messageId().rfind(':') + 1) + "(";
     const char* separator = "";
     for (const DiagnosticArgument& argument : report.arguments()) {

@@ -7,11 +7,12 @@
 #include "base/simplify/Simplify.hpp"
 #include "tests/preprocessor/Judges.hpp"
 #include "tests/support/AnyNode.hpp"
-#include "tests/support/CTruth.hpp"
 #include "tests/support/Corpus.hpp"
 #include "tests/support/Parsing.hpp"
+#include "tests/support/RandomExpression.hpp"
 
 #include <gtest/gtest.h>
+#include <random>
 #include <set>
 
 namespace VT::Testing {
@@ -27,25 +28,15 @@ public:
     Expressions(SymbolicExprTable& table, CTextUse use) : table_(table), use_(use) {}
 
     SymbolicExprId make(int depth) {
-        static constexpr OperatorSet made = [] {
-            OperatorSet set = OperatorSet::where([](const OperatorInfo& row) {
-                return (row.form == OperatorForm::Infix || row.form == OperatorForm::Prefix) && row.precedence > 2 &&
-                       row.c.find_first_of(".\\") == std::string_view::npos;
-            });
-            set.add(Op::Power);
-            return set;
+        static const std::vector<Op> operators = [] {
+            std::vector<Op> all{Op::Power};
+            for (const OperatorInfo& row : operatorTable())
+                if ((row.form == OperatorForm::Infix || row.form == OperatorForm::Prefix) && row.precedence > 2 &&
+                    row.c.find_first_of(".\\") == std::string_view::npos)
+                    all.insert(all.end(), 4, row.op);
+            return all;
         }();
-        if (depth == 0 || below(8) == 0)
-            return leaf();
-        for (;;) {
-            const auto op = static_cast<Op>(below(operatorCount));
-            if (made.contains(op) && (op != Op::Power || below(4) == 0)) {
-                std::vector<SymbolicExprId> inputs;
-                for (std::size_t i = 0; i < *operandCount(op); ++i)
-                    inputs.push_back(make(depth - 1));
-                return makeAny(table_, op, {{}, 0, 0, std::move(inputs)});
-            }
-        }
+        return randomTree(table_, random_, operators, depth, [this] { return leaf(); });
     }
 
     std::int64_t value() {
@@ -109,7 +100,7 @@ struct Quiz {
 };
 
 struct Asked {
-    CTruth truth;
+    Truth truth;
     std::string text;
 };
 
@@ -120,7 +111,8 @@ TEST(Decisions, RandomConditionsInDirectives) {
     while (conditions.size() < 4500) {
         const SymbolicExprId id = expressions.make(4);
         if (findCTextObstacles(table, id, CTextUse::Directive).empty())
-            conditions.push_back({CTruth(table, id), PreprocessorVCExpr(table, false, id % 2 == 0).print(id)});
+            conditions.push_back(
+                {Truth(table, id, Arithmetic::C), PreprocessorVCExpr(table, false, id % 2 == 0).print(id)});
     }
     Quiz quiz;
     for (int round = 0; round < 40; ++round) {
@@ -155,7 +147,7 @@ TEST(Decisions, RealConditionsAsTheyStandAndSimplified) {
             const SymbolicExprId id = parse(table, line, true, false).id;
             if (id == invalidId || !findCTextObstacles(table, id, CTextUse::Directive).empty())
                 continue;
-            const CTruth truth(table, id);
+            const Truth truth(table, id, Arithmetic::C);
             if (!areFree(truth.names()))
                 continue;
             names.insert(truth.names().begin(), truth.names().end());
@@ -196,7 +188,7 @@ TEST(Decisions, ValuesOfRandomExpressionsInCompiledPrograms) {
         const SymbolicExprId id = expressions.make(4);
         if (!findCTextObstacles(table, id, CTextUse::Program).empty())
             continue;
-        asked.push_back({CTruth(table, id), printer(id)});
+        asked.push_back({Truth(table, id, Arithmetic::C), printer(id)});
         compiler.add(asked.back().text);
         for (int i = 0; i < 80; ++i) {
             Compiler::Question question{asked.size() - 1, {}};

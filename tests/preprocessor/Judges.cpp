@@ -1,48 +1,17 @@
 #include "tests/preprocessor/Judges.hpp"
 
+#include "tests/support/Workplace.hpp"
+
 #include <algorithm>
-#include <cstdlib>
-#include <filesystem>
-#include <fstream>
-#include <sstream>
-#include <stdexcept>
 
 namespace VT::Testing {
 
 namespace {
 
-/// A directory that lives as long as this.
-class Directory {
-public:
-    Directory() {
-        std::string pattern = (std::filesystem::temp_directory_path() / "vtsym-XXXXXX").string();
-        if (mkdtemp(pattern.data()) == nullptr)
-            throw std::runtime_error("no directory for files");
-        path_ = pattern;
-    }
-
-    Directory(const Directory&) = delete;
-    Directory& operator=(const Directory&) = delete;
-
-    ~Directory() { std::filesystem::remove_all(path_); }
-
-    void write(const std::string& name, const std::string& content) const { std::ofstream(path_ / name) << content; }
-
-    [[nodiscard]] std::string read(const std::string& name) const {
-        std::ostringstream content;
-        content << std::ifstream(path_ / name).rdbuf();
-        return content.str();
-    }
-
-    /// Runs a command there.
-    void run(const std::string& command) const {
-        if (std::system(("cd '" + path_.string() + "' && { " + command + "; } 2>words").c_str()) != 0)
-            throw std::runtime_error(command + ": " + read("words").substr(0, 2000));
-    }
-
-private:
-    std::filesystem::path path_;
-};
+void run(const Workplace& place, const std::string& command) {
+    if (place.run("{ " + command + "; } 2>words") != 0)
+        throw std::runtime_error(command + ": " + place.read("words").substr(0, 2000));
+}
 
 std::string macroName(std::string name) {
     for (char& c : name)
@@ -64,10 +33,10 @@ void Preprocessor::define(const Assignment& values, const std::vector<std::strin
 }
 
 std::string Preprocessor::decide() const {
-    const Directory directory;
-    directory.write("conditions.h", file_);
-    directory.run("cpp -P -undef conditions.h decided");
-    std::string answers = directory.read("decided");
+    const Workplace place;
+    place.write("conditions.h", file_);
+    run(place, "cpp -P -undef conditions.h decided");
+    std::string answers = place.read("decided");
     std::erase_if(answers, [](char c) { return c != '0' && c != '1'; });
     return answers;
 }
@@ -109,8 +78,8 @@ std::string Compiler::program() const {
 }
 
 std::vector<std::int64_t> Compiler::compute(const std::vector<Question>& questions) const {
-    const Directory directory;
-    directory.write("program.c", program());
+    const Workplace place;
+    place.write("program.c", program());
     std::ostringstream input;
     for (const Question& question : questions) {
         input << question.expression;
@@ -118,9 +87,9 @@ std::vector<std::int64_t> Compiler::compute(const std::vector<Question>& questio
             input << ' ' << value;
         input << '\n';
     }
-    directory.write("questions", input.str());
-    directory.run("gcc -w -O0 -o program program.c && ./program <questions >answers");
-    std::istringstream answers(directory.read("answers"));
+    place.write("questions", input.str());
+    run(place, "gcc -w -O0 -o program program.c && ./program <questions >answers");
+    std::istringstream answers(place.read("answers"));
     std::vector<std::int64_t> values;
     for (std::int64_t value = 0; answers >> value;)
         values.push_back(value);

@@ -2,11 +2,12 @@
 #include "base/print/CTextObstacles.hpp"
 #include "base/print/Predicates.hpp"
 #include "base/print/StringifyImpliedCondition.hpp"
-#include "tests/print/Reading.hpp"
+#include "tests/support/AnyNode.hpp"
 #include "tests/support/Parsing.hpp"
 #include "tests/support/RandomCondition.hpp"
 #include "tests/support/Truth.hpp"
 
+#include <array>
 #include <gtest/gtest.h>
 
 namespace VT::Testing {
@@ -16,11 +17,7 @@ using Op = SymbolicOp;
 
 class GeneratedCode : public testing::Test {
 protected:
-    SymbolicExprId read(const std::string& text) {
-        const ParseAnswer answer = parse(table, text);
-        EXPECT_FALSE(answer.error) << text;
-        return answer.id;
-    }
+    SymbolicExprId read(const std::string& text) { return Testing::read(table, text); }
 
     SymbolicExprTable table;
     Trees tree{table};
@@ -39,18 +36,13 @@ TEST_F(GeneratedCode, ConditionsOfDirectives) {
     const std::vector<Row> rows{
         {read("true && Mode == 1"), "1 && Mode == 1", "", "true && Mode == 1"},
         {read("false"), "0", "", "false"},
-        {read("A.B == 2"), "A_B == 2", "", "A.B == 2"},
         {read("A.B.C+1"), "A_B_C + 1", "", "A.B.C + 1"},
         {read("A || B && C"), "A || (B && C)", "A || B && C", ""},
-        {read("A && B && C"), "A && B && C", "", ""},
         {read("A || (B || C)"), "A || (B || C)", "", ""},
         {read("a == b == c"), "(a == b) == c", "", ""},
         {read("a == (b == c)"), "a == (b == c)", "", ""},
-        {read("a < b == c"), "a < b == c", "", ""},
         {read("(a < b) >= c"), "(a < b) >= c", "", ""},
-        {read("(a == b) < c"), "(a == b) < c", "", ""},
         {read("!(a - -3 * -b)"), "!(a - -3 * -b)", "", "~(a - -3 * -b)"},
-        {read("a - (b - c) % 2"), "a - (b - c) % 2", "", "a - rem(b - c,2)"},
         {read("defined(A.B) || f(a, b + 1) != 0"), "defined(A_B) || f(a,b + 1) != 0", "",
          "defined(A.B) || f(a,b + 1) ~= 0"},
         {tree(Op::And, both, either), "(a & b) && (a | b)", "a & b && a | b", ""},
@@ -74,41 +66,30 @@ TEST_F(GeneratedCode, ConditionsOfDirectives) {
 }
 
 TEST_F(GeneratedCode, ConditionsUnderAKnownOne) {
-    struct Row {
-        std::string known;
-        std::string condition;
-        std::string left;
-    };
-
-    const std::vector<Row> rows{
+    const std::vector<std::array<std::string, 3>> rows{
+        // what is known, a condition, what is left of it
         {"A == 1 && B", "A == 1 && C", "C"},
         {"A == 1 && B", "C && (D || B) && A == 1", "C"},
-        {"A == 1 && B", "B && A == 1", "1"},
         {"A == 1", "A != 1", "0"},
-        {"A == 1", "A != 1 || B", "B"},
         {"A == 1", "1 == A && !(A != 1) && B", "B"},
         {"A < B", "B > A && A >= B", "0"},
-        {"A < B", "B <= A || C || D", "C || D"},
         {"!(A || B)", "A || C && !B", "C"},
-        {"!(A && B)", "A && B || C", "C"},
         {"!(A && B)", "A && C", "A && C"},
-        {"A || B", "(A || B) && A", "A"},
         {"A", "!(A && B) || C", "!B || C"},
         {"A", "(A && B) + 1 == 2 && (A && B)", "(A && B) + 1 == 2 && B"},
         {"A", "(B && (A && C)) == 1", "(B && C) == 1"},
-        {"true", "true && A", "A"},
         {"A == 1 && A == 2", "A == 1", "1"},
     };
-    for (const Row& row : rows) {
-        const SymbolicExprId known = read(row.known);
-        const SymbolicExprId condition = read(row.condition);
+    for (const auto& [given, text, left] : rows) {
+        const SymbolicExprId known = read(given);
+        const SymbolicExprId condition = read(text);
         StringifyImpliedCondition printer(table, false, true, known);
-        EXPECT_EQ(printer.print(condition), row.left) << row.condition << " given " << row.known;
+        EXPECT_EQ(printer.print(condition), left) << text << " given " << given;
         printer.forget();
-        EXPECT_EQ(printer.print(condition), row.left);
+        EXPECT_EQ(printer.print(condition), left);
         StringifyImpliedCondition visitor(table, false, true, known);
         table.get(condition)->accept(table, visitor);
-        EXPECT_EQ(visitor.get(), row.left);
+        EXPECT_EQ(visitor.get(), left);
     }
     EXPECT_EQ(StringifyImpliedCondition(table, true, true, read("A")).print(read("A || B")), "true");
 }
@@ -178,10 +159,7 @@ TEST_F(GeneratedCode, ObstaclesOfCText) {
     for (const OperatorInfo& op : operatorTable()) {
         const bool onlyInQuill = op.op != Op::UnaryMinus && op.c.find_first_of(".\\':") != std::string_view::npos;
         if (onlyInQuill && op.op != Op::MemberValue) {
-            const std::vector<SymbolicExprId> inputs(op.op == Op::QColon3               ? 3
-                                                     : op.form == OperatorForm::Postfix ? 1
-                                                                                        : 2,
-                                                     a);
+            const std::vector<SymbolicExprId> inputs(*operandCount(op.op), a);
             EXPECT_EQ(obstacles(makeNode(table, op.op, inputs), CTextUse::Program), std::vector{NoSuchOperator})
                 << op.name;
         }

@@ -1,7 +1,7 @@
 // What expressions look like in both languages.
 #include "base/print/Predicates.hpp"
 #include "base/print/StringifySymbolicExpr.hpp"
-#include "tests/print/Reading.hpp"
+#include "tests/support/AnyNode.hpp"
 #include "tests/support/Parsing.hpp"
 
 #include <gtest/gtest.h>
@@ -10,6 +10,7 @@
 #include <cmath>
 #include <limits>
 #include <locale>
+#include <random>
 
 namespace VT::Testing {
 namespace {
@@ -49,15 +50,11 @@ protected:
 TEST_F(Texts, OperatorsOfBothLanguages) {
     expectWritten({
         {tree(Op::NotEqual, a, tree(Op::Not, b)), "a~=~b", "a!=!b"},
-        {tree(Op::Minus, tree(Op::Minus, a, b), c), "a-b-c", "a-b-c"},
-        {tree(Op::Minus, a, tree(Op::Minus, b, c)), "a-(b-c)", "a-(b-c)"},
-        {tree(Op::Power, a, tree(Op::Power, b, c)), "a^(b^c)", "a^(b^c)"},
         {tree(Op::Power, tree(Op::Power, a, b), c), "a^b^c", "a^b^c"},
         {tree(Op::Transpose, tree(Op::Transpose, x)), "(x')'", "(x')'"},
         {tree(Op::DotTranspose, tree(Op::LDiv, a, tree(Op::DotLDiv, b, c))), "(a\\(b.\\c)).'", "(a\\(b.\\c)).'"},
         {tree(Op::MemberValue, tree(Op::MemberValue, a)), "a.field.field", "a.field.field"},
         {tree(Op::FcnCall1U, tree(Op::MemberValue, a), x), "(a.field)(x)", "(a.field)(x)"},
-        {tree(Op::FcnCall0U, a), "a()", "a()"},
         {tree(Op::FcnCall, a, x, tree(Op::Plus, b, c), x), "a(x,b+c,x)", "a(x,b+c,x)"},
         {tree(Op::QColon, tree(Op::Equal, a, b), c), "a==b:c", "a==b:c"},
         {tree(Op::QColon3, a, tree.integer(2), c), "a:2:c", "a:2:c"},
@@ -78,17 +75,12 @@ TEST_F(Texts, SignsThatWouldReadDifferently) {
     const SymbolicExprId minusX = tree(Op::UnaryMinus, x);
     expectWritten({
         {tree(Op::UnaryMinus, zero), "0", "0"},
-        {tree(Op::UnaryMinus, tree(Op::UnaryMinus, zero)), "0", "0"},
         {tree(Op::UnaryMinus, tree.real(0.0)), "-0", "-0.0"},
-        {tree(Op::UnaryMinus, minusX), "-(-x)", "-(-x)"},
         {tree(Op::UnaryMinus, tree.integer(-5)), "-(-5)", "-(-5)"},
         {tree(Op::Minus, a, tree.integer(-5)), "a-(-5)", "a-(-5)"},
         {tree(Op::Minus, a, tree(Op::Multiply, minusX, b)), "a-(-x*b)", "a-(-x*b)"},
-        {tree(Op::Plus, a, tree.integer(-5)), "a+-5", "a+-5"},
         {tree(Op::Power, tree.integer(-5), b), "(-5)^b", "(-5)^b"},
-        {tree(Op::Power, a, tree.integer(-5)), "a^-5", "a^-5"},
         {tree(Op::Transpose, tree.real(-2.5)), "(-2.5)'", "(-2.5)'"},
-        {tree(Op::Multiply, tree.integer(-5), minusX), "-5*-x", "-5*-x"},
     });
 }
 
@@ -97,7 +89,6 @@ TEST_F(Texts, CallsForOperatorsThatQuillLacks) {
     const SymbolicExprId quotient = tree(Op::Divide, a, b);
     const auto minus = [&](SymbolicExprId id) { return tree(Op::UnaryMinus, id); };
     expectWritten({
-        {quotient, "a/b", "a/b"},
         {tree(Op::Modulo, quotient, c), "rem(idivide(a,b),c)", "a/b%c"},
         {tree(Op::Plus, quotient,
               tree(Op::BitXOr, tree(Op::Plus, tree(Op::Divide, quotient, c), x), tree(Op::BitCompl, a))),
@@ -106,14 +97,10 @@ TEST_F(Texts, CallsForOperatorsThatQuillLacks) {
          "bitor(x(idivide(a,b),a,b),[idivide(a,b)])", "x(a/b,a,b)|[a/b]"},
         {tree(Op::Multiply, a, tree(Op::BitCompl, tree(Op::UnaryMinus, quotient))), "a*bitcmp(-idivide(a,b))",
          "a*~(-(a/b))"},
-        {tree(Op::ShiftLeft, a, tree.integer(-2)), "bitshift(a,-2)", "a<<-2"},
         {tree(Op::ShiftLeft, a, minus(tree.integer(2))), "bitshift(a,-2)", "a<<-2"},
-        {tree(Op::ShiftRight, a, tree.integer(2)), "bitshift(a,-2)", "a>>2"},
         {tree(Op::ShiftRight, a, tree.integer(-2)), "bitshift(a,2)", "a>>-2"},
-        {tree(Op::ShiftRight, a, x), "bitshift(a,-x)", "a>>x"},
         {tree(Op::ShiftRight, a, minus(x)), "bitshift(a,x)", "a>>-x"},
         {tree(Op::ShiftRight, a, minus(quotient)), "bitshift(a,idivide(a,b))", "a>>-(a/b)"},
-        {tree(Op::ShiftRight, a, quotient), "bitshift(a,-idivide(a,b))", "a>>a/b"},
         {tree(Op::ShiftRight, a, tree.integer(smallest)), "bitshift(a,-(-2147483648))", "a>>-2147483648"},
         {tree(Op::ShiftLeft, a, minus(tree.integer(smallest))), "bitshift(a,-(-2147483648))", "a<<-(-2147483648)"},
     });
@@ -124,7 +111,6 @@ TEST_F(Texts, RealLiterals) {
     expectWritten({
         {tree.real(2.0), "2", "2.0"},
         {tree.real(-0.0), "-0.0", "-0.0"},
-        {tree.real(0.1), "0.1", "0.1"},
         {tree.real(1e22), "1e+22", "1.0e+22"},
         {tree.real(-1.5e-7), "-1.5e-07", "-1.5e-07"},
         {tree.real(infinity), "Inf", "Inf"},

@@ -1,73 +1,16 @@
-// Nesting at the bound and one beyond, long texts, and memory that runs out.
+// Long texts, nesting at the bound and one beyond, and texts that nobody would write.
+#include "parser/QuillConverterBlockVariants.hpp"
 #include "tests/quill/TreeText.hpp"
+#include "tests/support/Times.hpp"
 
 #include <gtest/gtest.h>
-
-#include <atomic>
-#include <cstdlib>
-#include <new>
-
-namespace {
-
-// Allocations of the program, and the one that fails.
-std::atomic<long> living{0};
-std::atomic<long> allowed{-1};
-
-void* allocate(std::size_t size) {
-    if (allowed.load() >= 0 && allowed.fetch_sub(1) == 0)
-        throw std::bad_alloc();
-    void* const memory = std::malloc(size == 0 ? 1 : size);
-    if (memory == nullptr)
-        throw std::bad_alloc();
-    ++living;
-    return memory;
-}
-
-void release(void* memory) noexcept {
-    if (memory == nullptr)
-        return;
-    --living;
-    std::free(memory);
-}
-
-} // namespace
-
-void* operator new(std::size_t size) {
-    return allocate(size);
-}
-
-void* operator new[](std::size_t size) {
-    return allocate(size);
-}
-
-void operator delete(void* memory) noexcept {
-    release(memory);
-}
-
-void operator delete[](void* memory) noexcept {
-    release(memory);
-}
-
-void operator delete(void* memory, std::size_t) noexcept {
-    release(memory);
-}
-
-void operator delete[](void* memory, std::size_t) noexcept {
-    release(memory);
-}
+#include <random>
 
 namespace VT::Testing {
 namespace {
 
 constexpr std::size_t bound = 256;
 constexpr std::size_t mebibyte = std::size_t{1} << 20U;
-
-std::string times(std::size_t count, const std::string& text) {
-    std::string all;
-    for (std::size_t i = 0; i < count; ++i)
-        all += text;
-    return all;
-}
 
 TEST(QuillBounds, NestingAtTheBoundAndOneBeyond) {
     struct Nest {
@@ -76,20 +19,9 @@ TEST(QuillBounds, NestingAtTheBoundAndOneBeyond) {
         std::size_t place; ///< of the bracket in `open` that is one too many
     };
 
-    const std::vector<Nest> nests = {{"(", ")", 0},
-                                     {"[", "]", 0},
-                                     {"{", "}", 0},
-                                     {"f(", ")", 1},
-                                     {"c{", "}", 1},
-                                     {"f(a,", ")", 1},
-                                     {"a || (", ")", 5},
-                                     {"-f(", ")", 2},
-                                     {"[1 ", "]", 0},
-                                     {"a^(b+", ")", 2},
-                                     {"@(x) ", "", 0},
-                                     {"1 + @(x) ", "", 4},
-                                     {"2^-@(x, y) x*", "", 3},
-                                     {"1:(", ")", 2}};
+    const std::vector<Nest> nests = {
+        {"(", ")", 0},      {"[", "]", 0},     {"{", "}", 0},    {"f(", ")", 1},           {"c{", "}", 1},
+        {"a || (", ")", 5}, {"a^(b+", ")", 2}, {"@(x) ", "", 0}, {"2^-@(x, y) x*", "", 3}, {"1:(", ")", 2}};
     for (const std::size_t nesting : {std::size_t{1}, std::size_t{7}, bound}) {
         QuillReading reading(nesting);
         for (const auto& [open, close, place] : nests) {
@@ -147,33 +79,7 @@ TEST(QuillBounds, LongTexts) {
             continue;
         }
         EXPECT_EQ(shapeError(*tree, text), "") << piece;
-        EXPECT_LE(countNodes(*tree), 3 * text.size() + 4) << piece;
     }
-}
-
-TEST(QuillBounds, MemoryThatRunsOut) {
-    const std::vector<std::string> texts = {"a + b", times(600, "f(1,[2 3;4],@(x)-x){'t'} + ") + "a.b'",
-                                            "[" + times(3000, "1 ") + "]", times(3000, "a^") + "$", times(200, "((")};
-    const long before = living;
-    for (const std::string& text : texts) {
-        const auto parser = PARSER_T<char>::create(bound);
-        bool done = false;
-        for (long n = 0; !done; ++n) {
-            allowed = n;
-            try {
-                parser->delete_parse_tree(parser->generate_parse_tree(text.data(), text.size()));
-                done = true;
-            } catch (const std::bad_alloc&) {
-                EXPECT_LT(n, 1000);
-            }
-            allowed = -1;
-            const QuillNode* const next = parser->generate_parse_tree("1 + x");
-            ASSERT_NE(next, nullptr);
-            EXPECT_EQ(treeText(*next), "(49 1 x)");
-            parser->delete_parse_tree(next);
-        }
-    }
-    EXPECT_EQ(living, before);
 }
 
 /// A parser that has read one long text does not hold on to its memory, and trees live apart from each other.
@@ -192,6 +98,81 @@ TEST(QuillBounds, TreesOfOneParser) {
     EXPECT_EQ(treeText(*fourth), "(27 (302 c d))");
     parser->delete_parse_tree(third);
     parser->delete_parse_tree(fourth);
+}
+
+/// Whether the text has a tree.
+bool expectSoundAnswer(QuillReading& reading, const std::string& text) {
+    if (const QuillNode* const tree = reading.read(text)) {
+        EXPECT_EQ(shapeError(*tree, text), "") << text;
+        EXPECT_EQ(reading.failure().reason, "") << text;
+        return true;
+    }
+    EXPECT_LE(reading.failure().position, text.size()) << text;
+    EXPECT_NE(reading.failure().reason, "") << text;
+    return false;
+}
+
+const std::vector<std::string> pieces = {
+    "||",  "&&", "|",  "&",  "==",    "~=",        "!=",     "<=",          ">=",    "<",  ">",  ":", "+",
+    "-",   "*",  "/",  "\\", ".*",    "./",        ".\\",    "^",           ".^",    "'",  ".'", "~", "!",
+    "@",   ".",  ",",  ";",  "(",     ")",         "[",      "]",           "{",     "}",  " ",  "a", "b9",
+    "12",  "1.", ".5", "2i", "end",   "'t'",       "\"u\"",  "% c\n",       "...\n", "\n", "=",  "$", "\xC3",
+    "0x1", "1e", "f(", "@(", "(sim)", "(codegen)", "[1 -2]", "a.b(2).c{1}", "@(x) x"};
+
+/// An expression that has lost or got some pieces.
+std::string wounded(std::mt19937_64& random) {
+    std::string text =
+        "@(p, q) ~(a.b(2).c{1}' == [1 -2; x(end) 'it''s']) || f(2:3:n, {}) .^ -2^0x1F & q ... rest\n + 1.5e-3i % c";
+    for (std::size_t wounds = random() % 4; wounds-- > 0;) {
+        const std::size_t place = random() % (text.size() + 1);
+        if (random() % 2 == 0)
+            text.erase(place, random() % 4);
+        else
+            text.insert(place, pieces[random() % pieces.size()]);
+    }
+    return text;
+}
+
+/// Whatever the tree, converters make an expression of it or one report.
+void expectExpressionOrReport(const std::string& text) {
+    SymbolicExprTable table;
+    VTSymbolicExprErrorChecker checker;
+    const bool read = table.has(SymbolicExprFromQParseTree(table, checker)(text));
+    EXPECT_EQ(checker.diagnostics().size(), read ? 0U : 1U) << text;
+    for (const HostDiagnostic& report : checker.diagnostics())
+        EXPECT_LE(report.offset().value(), text.size()) << text;
+    checker.clear();
+    try {
+        EXPECT_TRUE(table.has(SymbolicExprFromQParseTreeBlockVariants(table, checker)(text))) << text;
+        EXPECT_TRUE(checker.diagnostics().empty()) << text;
+    } catch (const HostDiagnostic& thrown) {
+        ASSERT_EQ(checker.diagnostics().size(), 1U) << text;
+        EXPECT_EQ(thrown.offset(), checker.diagnostics().front().offset()) << text;
+    }
+}
+
+TEST(QuillSoup, IsReadOrRefused) {
+    std::mt19937_64 random(2);
+    QuillReading reading(8, {"(sim)", "(codegen)"});
+    int fromTokens = 0;
+    int fromWounded = 0;
+    for (int round = 0; round < 40000; ++round) {
+        std::string bytes(random() % 24, ' ');
+        for (char& c : bytes)
+            c = static_cast<char>(random());
+        expectSoundAnswer(reading, bytes);
+        std::string tokens;
+        for (std::size_t count = random() % 12; count-- > 0;)
+            tokens += pieces[random() % pieces.size()];
+        fromTokens += expectSoundAnswer(reading, tokens) ? 1 : 0;
+        const std::string ill = wounded(random);
+        fromWounded += expectSoundAnswer(reading, ill) ? 1 : 0;
+        for (const std::string& text : {bytes, tokens, ill})
+            if (round % 8 == 0)
+                expectExpressionOrReport(text);
+    }
+    EXPECT_GT(std::min(fromTokens, fromWounded), 1000);
+    EXPECT_LT(fromWounded, 39000);
 }
 
 } // namespace

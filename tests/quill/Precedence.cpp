@@ -104,115 +104,58 @@ std::string oracle(Items items) {
     return items.front().tree;
 }
 
-class RandomExpression {
-public:
-    explicit RandomExpression(std::uint64_t seed) : random_(seed) {}
+// NOLINTEND(misc-no-recursion)
 
-    /// An expression whose text is separated by blanks or by nothing.
-    Item make(std::size_t operands, bool blanksSeparate) {
-        std::vector<Item> items;
-        addOperand(items, operands / 4);
-        for (std::size_t i = 1; i < operands; ++i) {
+/// Operators, signs and postfixes around operands whose readings are known.
+std::vector<Item> randomItems(std::mt19937_64& random, std::size_t operands) {
+    static const std::vector<Item> stock = {{"a", "a"},
+                                            {"b", "b"},
+                                            {"1.5", "1.5"},
+                                            {"(-c)", "(43 (44 c))"},
+                                            {"f(x,1)", "(85 f (303 x 1))"},
+                                            {"[1 -2]", "(27 (302 1 (44 2)))"},
+                                            {"{a;b}", "(301 (302 a) (302 b))"},
+                                            {"a.f{2}", "(300 (83 a f) (303 2))"},
+                                            {"(@(p)p)", "(43 (306 (307 p) p))"}};
+    static const std::vector<std::string> signs = {"-", "~", "!", "+"};
+    const auto below = [&](std::size_t bound) { return static_cast<std::size_t>(random() % bound); };
+    std::vector<Item> items;
+    for (std::size_t i = 0; i < operands; ++i) {
+        if (i > 0) {
             const auto& level = levels[below(levels.size())];
             items.push_back({level[below(level.size())].text});
-            addOperand(items, operands / 4);
         }
-        return {written(items, blanksSeparate), oracle(items)};
-    }
-
-private:
-    std::size_t below(std::size_t bound) { return random_() % bound; }
-
-    void addOperand(std::vector<Item>& items, std::size_t inner) {
-        static const std::vector<std::string> signs = {"-", "~", "!", "+"};
         while (below(4) == 0)
             items.push_back({signs[below(signs.size())]});
-        items.push_back(operand(inner));
+        items.push_back(stock[below(stock.size())]);
         while (below(5) == 0)
             items.push_back({below(2) == 0 ? "'" : ".'"});
     }
+    return items;
+}
 
-    Item operand(std::size_t inner) {
-        const std::string name(1, static_cast<char>('a' + below(26)));
-        if (inner == 0)
-            return below(2) == 0 ? Item{name, name} : Item{"1.5", "1.5"};
-        const auto group = [&](bool blanksSeparate) { return make(1 + below(inner), blanksSeparate); };
-        const auto list = [&](bool blanksSeparate) {
-            Item items = group(blanksSeparate);
-            while (below(2) == 0) {
-                const Item next = group(blanksSeparate);
-                items.text += (blanksSeparate && below(2) == 0 ? " " : ",") + next.text;
-                items.tree += " " + next.tree;
-            }
-            return items;
-        };
-        switch (below(7)) {
-        case 0: {
-            const Item e = group(false);
-            return {"(" + e.text + ")", "(43 " + e.tree + ")"};
-        }
-        case 1: {
-            const Item arguments = list(false);
-            return {name + "(" + arguments.text + ")", "(85 " + name + " (303 " + arguments.tree + "))"};
-        }
-        case 2: {
-            const Item elements = list(true);
-            return {"[" + elements.text + "]", "(27 (302 " + elements.tree + "))"};
-        }
-        case 3: {
-            const Item first = list(true);
-            const Item second = list(true);
-            return {"{" + first.text + ";" + second.text + "}",
-                    "(301 (302 " + first.tree + ") (302 " + second.tree + "))"};
-        }
-        case 4: {
-            const Item body = group(false);
-            return {"(@(p)" + body.text + ")", "(43 (306 (307 p) " + body.tree + "))"};
-        }
-        case 5:
-            return {name + ".f{2}", "(300 (83 " + name + " f) (303 2))"};
-        default:
-            return {name, name};
-        }
+/// White space may stand everywhere but before a quote, and must stand where tokens would grow together.
+std::string written(const std::vector<Item>& items, std::mt19937_64& random) {
+    static const std::vector<std::string> blanks = {" ", "\t", "\n", "% c\n", "... c\n", "  "};
+    std::string text;
+    for (std::size_t i = 0; i < items.size(); ++i) {
+        const std::string& token = items[i].text;
+        const bool grows = i > 0 && (token == "~" || token == "!" || token[0] == '=');
+        if (token != "'" && (grows || random() % 3 == 0))
+            text += blanks[random() % blanks.size()];
+        text += token;
     }
-
-    /// White space may stand everywhere but before a quote; where it separates elements it may stand on both sides of
-    /// an infix operator only.
-    std::string written(const std::vector<Item>& items, bool blanksSeparate) {
-        static const std::vector<std::string> blanks = {" ", "\t", "\n", "% c\n", "... c\n", "  "};
-        const auto blank = [&](bool wanted) { return wanted ? blanks[below(blanks.size())] : std::string(); };
-        std::string text;
-        for (std::size_t i = 0; i < items.size(); ++i) {
-            const bool infix = i > 0 && items[i].tree.empty() && endsOperand(items[i - 1]) && !endsOperand(items[i]);
-            const bool quote = items[i].text == "'";
-            // 1.5 behind a dot or a name, and a dot behind 5, would be other tokens.
-            const bool wide = below(3) == 0 || needsBlank(items, i);
-            if (infix && blanksSeparate)
-                text += blank(wide) + items[i].text + blank(wide);
-            else if (blanksSeparate || quote)
-                text += items[i].text;
-            else
-                text += blank(wide) + items[i].text;
-        }
-        return text;
-    }
-
-    /// Whether the token would grow together with the one before it.
-    static bool needsBlank(const std::vector<Item>& items, std::size_t i) {
-        return i > 0 && (items[i].text == "~" || items[i].text == "!" || items[i].text[0] == '=');
-    }
-
-    std::mt19937_64 random_;
-};
-
-// NOLINTEND(misc-no-recursion)
+    return text;
+}
 
 TEST(QuillPrecedence, RandomExpressionsReadAsTheirSplitting) {
     QuillReading reading;
-    for (std::uint64_t seed = 0; seed < 6000; ++seed) {
-        const Item expected = RandomExpression(seed).make(1 + seed % 17, false);
-        ASSERT_EQ(reading.answer(expected.text), expected.tree) << seed << "\n" << expected.text;
-        ASSERT_EQ(shapeError(*reading.read(expected.text), expected.text), "") << expected.text;
+    std::mt19937_64 random(7);
+    for (std::size_t round = 0; round < 6000; ++round) {
+        const std::vector<Item> items = randomItems(random, 1 + round % 17);
+        const std::string text = written(items, random);
+        ASSERT_EQ(reading.answer(text), oracle(items)) << text;
+        ASSERT_EQ(shapeError(*reading.read(text), text), "") << text;
     }
 }
 

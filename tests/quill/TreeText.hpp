@@ -39,11 +39,8 @@ private:
 /// and brackets, which the code tells already, are left out.
 std::string treeText(const QuillNode& root);
 
-/// What is wrong with the shape of a tree: kinds, codes, child counts, the order of tokens and their places in the
-/// text; empty where nothing is.
+/// What is wrong with a tree: kinds, tokens, their order and places in the text, the number of nodes; empty where
+/// nothing is.
 std::string shapeError(const QuillNode& root, std::string_view text);
-
-/// Number of nodes.
-std::size_t countNodes(const QuillNode& root);
 
 } // namespace VT::Testing

@@ -3,6 +3,7 @@
 #include "base/simplify/SimplifyVisitorBlockVariants.hpp"
 #include "tests/service/Customizers.hpp"
 
+#include <array>
 #include <tuple>
 
 #include <stdexcept>
@@ -49,28 +50,21 @@ TEST(Customizer, MayUseTheServiceWhileOneEnds) {
 }
 
 TEST(Customizer, RewriteCountsWhereItDecides) {
-    struct Row {
-        const char* condition;
-        const char* rewritten;
-        const char* result;
-        const char* unasked; // past the customizer
-    };
-
-    constexpr Row rows[] = {
+    const std::vector<std::array<std::string, 4>> rows{
+        // condition, rewritten, result, and past the customizer
         {"A==1", "true", "", "A==1"},         {"A==1", "B==1 && B==2", "false", "A==1"},
         {"A==1", "B==1 || B!=1", "", "A==1"}, {"A==1", "B==1", "A==1", "A==1"},
         {"A>2 && A>5", "B", "A>5", "A>5"},    {"true", "false", "", ""},
         {"false", "true", "false", "false"},
     };
-    for (const Row& row : rows) {
+    for (const auto& [condition, rewritten, result, unasked] : rows) {
         for (const bool isQuill : {false, true}) {
-            SCOPED_TRACE(std::string(row.condition) + " rewritten to " + row.rewritten);
             TestCustomizer customizer; // outlives the service
             const FreshService service;
-            customizer.onRewrite = rewriteTo(row.rewritten);
+            customizer.onRewrite = rewriteTo(rewritten);
             service->setVCCustomizer(&customizer);
-            EXPECT_EQ(service->printCExpr(service->simplify(service->parseC(row.condition), isQuill)), row.result);
-            EXPECT_EQ(service->simplifyExpressionWithoutEvalChecks(row.condition, false, false), row.unasked);
+            EXPECT_EQ(service->printCExpr(service->simplify(service->parseC(condition), isQuill)), result) << rewritten;
+            EXPECT_EQ(service->simplifyExpressionWithoutEvalChecks(condition, false, false), unasked) << rewritten;
         }
     }
 }
@@ -126,34 +120,27 @@ TEST(Customizer, CachesKeepTheirAnswersByLanguage) {
 }
 
 TEST(Customizer, ConfirmsSelfComparisonsInQuillMode) {
-    struct Row {
-        const char* text;
-        const char* agreed;
-        const char* refused;
-        const char* asked; // about the replacement by this
-    };
-
-    constexpr Row rows[] = {
-        {"P<P", "false", "", "false"},  {"P==P", "", "false", "true"}, {"P>=P", "", "false", "true"},
-        {"P!=P", "false", "", "false"}, {"P>P", "false", "", "false"}, {"P<=P", "", "false", "true"},
-    };
-    for (const Row& row : rows) {
-        SCOPED_TRACE(row.text);
+    for (const std::string op : {"<", "==", ">=", "!=", ">", "<="}) {
+        const std::string text = "P" + op + "P";
+        SCOPED_TRACE(text);
+        const bool truth = op.ends_with('=') && op != "!=";
+        const std::string agreed = truth ? "" : "false", refused = truth ? "false" : "";
         for (const bool agrees : {true, false}) {
             TestCustomizer customizer; // outlives the service
             const FreshService service;
-            const VCSymbolicExprId condition = service->parseC(row.text);
+            const VCSymbolicExprId condition = service->parseC(text);
             customizer.agrees = agrees;
             service->setVCCustomizer(&customizer);
-            EXPECT_EQ(service->printCExpr(service->simplify(condition, false)), row.agreed);
+            EXPECT_EQ(service->printCExpr(service->simplify(condition, false)), agreed);
             EXPECT_TRUE(customizer.questions.empty());
-            EXPECT_EQ(service->printCExpr(service->simplify(condition, true)), agrees ? row.agreed : row.refused);
+            EXPECT_EQ(service->printCExpr(service->simplify(condition, true)), agrees ? agreed : refused);
             ASSERT_FALSE(customizer.questions.empty());
-            EXPECT_EQ(customizer.questions.front(), std::pair(service->printQExpr(condition), std::string(row.asked)));
+            EXPECT_EQ(customizer.questions.front().first, service->printQExpr(condition));
+            EXPECT_EQ(customizer.questions.front().second, truth ? "true" : "false");
             service->setVCCustomizer(nullptr);
         }
         const FreshService alone;
-        EXPECT_EQ(alone->printCExpr(alone->simplify(alone->parseC(row.text), true)), row.agreed);
+        EXPECT_EQ(alone->printCExpr(alone->simplify(alone->parseC(text), true)), agreed);
     }
 }
 

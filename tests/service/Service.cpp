@@ -1,11 +1,17 @@
-// The service without a customizer: lifetime, texts, combinations, queries.
+// The service without a customizer: lifetime, texts in both languages, combinations, queries.
+#include "base/VCService.hpp"
 #include "base/service/TruthTexts.hpp"
 #include "base/simplify/Simplify.hpp"
 #include "base/variants/VariantKeywords.hpp"
 #include "host/Diagnostics.hpp"
 #include "tests/service/Customizers.hpp"
+#include "tests/support/RandomCondition.hpp"
 
+#include <array>
+#include <gtest/gtest.h>
+#include <map>
 #include <optional>
+#include <rapidcheck/gtest.h>
 
 namespace VT::Testing {
 namespace {
@@ -60,42 +66,29 @@ TEST(ServiceLifetime, ReadsTheCacheFeatureOnce) {
 }
 
 TEST(ServiceTexts, AreReadAndPrinted) {
-    struct Row {
-        const char* text;
-        const char* c; // converted
-        const char* quill;
-        const char* simpleC; // simplified
-        const char* simpleQuill;
-    };
-
-    constexpr Row rows[] = {
+    const std::vector<std::array<std::string, 5>> rows{
+        // a text, in C and in Quill, simplified in C and in Quill
         {"", "", "", "", ""},
-        {"true", "", "", "", ""},
         {"false", "false", "false", "false", "false"},
-        {"True", "True", "True", "True", "True"},
         {"A==1&&A==2", "A==1 && A==2", "A==1 && A==2", "false", "false"},
-        {"A == 1 || A != 1", "A==1 || A!=1", "A==1 || A~=1", "", ""},
         {"!(A<3)", "!(A<3)", "~(A<3)", "A>=3", "A>=3"},
-        {"a / b == 1", "a/b==1", "idivide(a,b)==1", "a/b==1", "idivide(a,b)==1"},
         {"(a/b)%c", "a/b%c", "rem(idivide(a,b),c)", "a/b%c", "rem(idivide(a,b),c)"},
-        {"rem(n, 2) == 1", "n%2==1", "rem(n,2)==1", "n%2==1", "rem(n,2)==1"},
         {"F & 4 || x >> 2", "F&4 || x>>2", "bitand(F,4) || bitshift(x,-2)", "F&4 || x>>2",
          "bitand(F,4) || bitshift(x,-2)"},
         {"(sim) && (codegen)", "(sim) && (codegen)", "(sim) && (codegen)", "false", "false"},
     };
     const FreshService service;
-    for (const Row& row : rows) {
-        SCOPED_TRACE(row.text);
-        EXPECT_EQ(service->convertExprBetweenQandC(row.text, false, false), row.c);
-        EXPECT_EQ(service->convertExprBetweenQandC(row.text, false, true), row.quill);
+    for (const auto& [text, c, quill, simpleC, simpleQuill] : rows) {
+        SCOPED_TRACE(text);
+        EXPECT_EQ(service->convertExprBetweenQandC(text, false, false), c);
+        EXPECT_EQ(service->convertExprBetweenQandC(text, false, true), quill);
         for (int again = 0; again < 2; ++again) {
-            EXPECT_EQ(service->simplifyCExprFromCCondition(row.text), row.simpleC);
-            EXPECT_EQ(service->simplifyQExprFromCCondition(row.text), row.simpleQuill);
+            EXPECT_EQ(service->simplifyCExprFromCCondition(text), simpleC);
+            EXPECT_EQ(service->simplifyQExprFromCCondition(text), simpleQuill);
         }
-        EXPECT_EQ(service->simplifyExpressionWithoutEvalChecks(row.text, false, true), row.simpleQuill);
-        EXPECT_EQ(service->getBoolean(service->simplifyFromCCondition(row.text).id()), *row.simpleC == '\0');
-        EXPECT_EQ(VCService::isTRUEOrFALSEString(row.text),
-                  std::string(row.text) == "true" || std::string(row.text) == "false");
+        EXPECT_EQ(service->simplifyExpressionWithoutEvalChecks(text, false, true), simpleQuill);
+        EXPECT_EQ(service->getBoolean(service->simplifyFromCCondition(text).id()), simpleC.empty());
+        EXPECT_EQ(VCService::isTRUEOrFALSEString(text), text == "true" || text == "false");
     }
 }
 
@@ -119,41 +112,34 @@ TEST(ServiceTexts, ThatAreNoConditionAreRefused) {
         EXPECT_THROW(service->simplifyCExprFromCCondition(text), HostDiagnostic);
         EXPECT_THROW(service->convertExprBetweenQandC(text, false, true), HostDiagnostic);
     }
+    for (const char* text : {"A == ", "A = 1", "1 +", "c{2}", "'text'"})
+        EXPECT_THROW(service->parseQ(text), HostDiagnostic) << text;
     EXPECT_EQ(service->table().size(), nodes);
 }
 
 TEST(ServiceCombinations, OfConstantsAndConditions) {
-    struct Row {
-        const char* a;
-        const char* b;
-        const char* conjunction; // not simplified, then simplified
-        const char* simpleConjunction;
-        const char* disjunction;
-        const char* simpleDisjunction;
-    };
-
-    constexpr Row rows[] = {
-        {"true", "true", "", "", "", ""},
+    const std::vector<std::array<std::string, 6>> rows{
+        // two conditions; both of them, not simplified and simplified; either of them
+        {"true", "", "", "", "", ""},
         {"true", "false", "false", "false", "", ""},
-        {"false", "true", "false", "false", "", ""},
         {"false", "false", "false", "false", "false", "false"},
         {"true", "!(x<1)", "!(x<1)", "x>=1", "", ""},
-        {"!(x<1)", "true", "!(x<1)", "x>=1", "", ""},
         {"false", "!(x<1)", "false", "false", "!(x<1)", "x>=1"},
         {"!(x<1)", "false", "false", "false", "!(x<1)", "x>=1"},
+        {"!(x<1)", "true", "!(x<1)", "x>=1", "", ""},
         {"x==1", "x==2", "x==1 && x==2", "false", "x==1 || x==2", "x==1 || x==2"},
         {"x<3", "x>3", "x<3 && x>3", "false", "x<3 || x>3", "x!=3"},
         {"y", "x", "y && x", "x && y", "y || x", "x || y"},
     };
-    for (const Row& row : rows) {
-        SCOPED_TRACE(std::string(row.a) + " with " + row.b);
+    for (const auto& [textA, textB, both, simpleBoth, either, simpleEither] : rows) {
+        SCOPED_TRACE(textA + " with " + textB);
         const FreshService service;
-        const VCSymbolicExprId a = service->parseC(row.a);
-        const VCSymbolicExprId b = service->parseC(row.b);
-        EXPECT_EQ(service->printCExpr(service->AND(a, b, false)), row.conjunction);
-        EXPECT_EQ(service->printCExpr(service->AND(a, b, true)), row.simpleConjunction);
-        EXPECT_EQ(service->printCExpr(service->OR(a, b, false)), row.disjunction);
-        EXPECT_EQ(service->printCExpr(service->OR(a, b, true)), row.simpleDisjunction);
+        const VCSymbolicExprId a = service->parseC(textA);
+        const VCSymbolicExprId b = service->parseC(textB);
+        EXPECT_EQ(service->printCExpr(service->AND(a, b, false)), both);
+        EXPECT_EQ(service->printCExpr(service->AND(a, b, true)), simpleBoth);
+        EXPECT_EQ(service->printCExpr(service->OR(a, b, false)), either);
+        EXPECT_EQ(service->printCExpr(service->OR(a, b, true)), simpleEither);
     }
 }
 
@@ -191,23 +177,8 @@ TEST(ServiceIds, ThatAreNotOfTheTableAreAnswered) {
         EXPECT_THROW(service->printCExprNoConversion(bad), std::out_of_range);
     }
     EXPECT_EQ(VCSymbolicExprId(), invalidId);
-}
-
-TEST(ServiceIds, CompareByMeaningOrAsNumbers) {
-    TestCustomizer customizer; // outlives the service
-    const FreshService service;
-    customizer.parameters = {{"N", 1}};
-    const VCSymbolicExprId n = service->parseC("N");
-    const VCSymbolicExprId one = service->parseC("1");
-    const VCSymbolicExprId alwaysTrue = service->parseC("true");
-    EXPECT_FALSE(n == one);
-    service->setVCCustomizer(&customizer);
-    EXPECT_TRUE(n == one);
-    EXPECT_FALSE(n != one);
-    EXPECT_FALSE(n == service->parseC("M"));
-    EXPECT_TRUE(alwaysTrue == service->parseC("true"));
-    EXPECT_TRUE(n == n.id() && n.id() == n); // numbers
-    EXPECT_TRUE(n != one.id() && one.id() != n);
+    EXPECT_TRUE(x == x.id() && x.id() == x); // as numbers
+    EXPECT_FALSE(x != x.id() || x.id() != x);
 }
 
 TEST(ServiceAliases, FirstOneStays) {
@@ -218,6 +189,67 @@ TEST(ServiceAliases, FirstOneStays) {
     EXPECT_EQ(service->getParameterAlias("N"), "N_1");
     EXPECT_EQ(service->getParameterAlias("n"), "");
     EXPECT_EQ(service->printCExpr(service->parseC("N")), "N");
+}
+
+TEST(QuillService, ConvertsBothWays) {
+    const VCServiceHandle service;
+    for (const auto& [quill, c] : std::map<std::string, std::string>{{"bitand(F,4)~=0", "(F&4)!=0"},
+                                                                     {"bitshift(a,-3)", "a>>3"},
+                                                                     {"rem(idivide(a,b),2)==1", "a/b%2==1"},
+                                                                     {"bitxor(a,bitor(b,bitcmp(c)))", "a^(b|~c)"},
+                                                                     {"~A || B && C~=1", "!A || B && C!=1"},
+                                                                     {"f(A,2)<=P.x", "f(A,2)<=P.x"},
+                                                                     {"(sim) && A", "(sim) && A"}}) {
+        EXPECT_EQ(service->parseQ(quill), service->parseC(c));
+        EXPECT_EQ(service->convertExprBetweenQandC(quill, true, false), c);
+        EXPECT_EQ(service->convertExprBetweenQandC(c, false, true), quill);
+    }
+}
+
+TEST(QuillService, SimplifiesAndPrintsInEitherLanguage) {
+    const VCServiceHandle service;
+    EXPECT_EQ(service->simplifyQExprFromQCondition("A == 1 && A == 2"), "false");
+    EXPECT_EQ(service->simplifyQExprFromQCondition("A ~= 1 || A ~= 2"), "");
+    EXPECT_EQ(service->simplifyCExprFromQCondition("~(A < 3) && bitand(F, 4) ~= 0"), "A>=3 && (F&4)!=0");
+    EXPECT_EQ(service->simplifyExpressionWithoutEvalChecks("~(A < 3)", true, false), "A>=3");
+    EXPECT_EQ(service->simplifyExpressionWithoutEvalChecks("A != 3 && true", false, true), "A~=3");
+    for (const char* const constant : {"", "true"})
+        EXPECT_EQ(service->parseQ(constant), service->table().getIdTRUE());
+    EXPECT_EQ(service->parseQ("false"), service->table().getIdFALSE());
+}
+
+TEST(QuillService, ListsAndReplacesSymbols) {
+    const VCServiceHandle service;
+    const VCSymbolicExprId condition = service->parseQ("Mode == 1 && f(Gear) > P.x");
+    std::vector<std::string> names;
+    service->getSymbolsFromExpression(condition, names, VCSymbolType::Identifier);
+    service->getSymbolsFromExpression(condition, names, {VCSymbolType::FunctionName, VCSymbolType::UnboundMember});
+    EXPECT_EQ(names, (std::vector<std::string>{"Mode", "Gear", "f", "P.x"}));
+    std::vector<VCSymbolicExprId> ids;
+    service->getSymbolsFromExpression(condition, ids, VCSymbolType::Identifier);
+    EXPECT_EQ(ids.size(), 2U);
+    EXPECT_THROW(service->getSymbolsFromExpression(condition, names, static_cast<VCSymbolType>(4)), std::out_of_range);
+    const auto swapped = service->replaceSymbolsInExpression(condition, {{"Mode", "Gear"}, {"Gear", "Mode"}});
+    EXPECT_EQ(service->printQExpr(swapped), "Gear==1 && f(Mode)>P.x");
+    EXPECT_EQ(service->printQExpr(service->replaceSymbolsInExpression(service->parseC("A"), {{"A", "B"}})), "B");
+    const std::size_t nodes = service->table().size();
+    EXPECT_EQ(service->replaceSymbolsInExpression(condition, {{"NotThere", "Nowhere"}}), condition);
+    EXPECT_EQ(service->table().size(), nodes);
+}
+
+RC_GTEST_PROP(QuillService, ReadsWhatCReads, ()) {
+    const VCServiceHandle service;
+    std::mt19937_64 random(*rc::gen::arbitrary<std::uint64_t>());
+    ConditionShape shape;
+    shape.lowest = 0; // a sign belongs to a literal in C alone
+    shape.symbolPairs = shape.truthValues = true;
+    const std::string c = randomCondition(random, 1 + random() % 8, shape);
+    std::string quill;
+    for (std::size_t i = 0; i < c.size(); ++i)
+        quill += c[i] == '!' ? '~' : c[i];
+    RC_ASSERT(service->parseQ(quill) == service->parseC(c));
+    RC_ASSERT(service->simplifyFromQCondition(quill).id() == service->simplifyFromCCondition(c).id());
+    RC_ASSERT(service->parseQ(service->printQExpr(service->parseC(c))) == service->parseC(c));
 }
 
 } // namespace

@@ -2,6 +2,7 @@
 #include "tests/simplify/Workbench.hpp"
 
 #include "base/core/Limits.hpp"
+#include "tests/support/AnyNode.hpp"
 
 namespace VT::Testing {
 namespace {
@@ -10,18 +11,17 @@ constexpr std::size_t limit = limits::chainOperands;
 
 /// `count` different operands joined by an operator.
 SymbolicExprId chain(SymbolicExprTable& table, SymbolicOp op, std::size_t count, bool leftDeep) {
-    SymbolicExprId sum = SymbolicString(table, "S" + std::to_string(count)).getId(table);
+    const Trees tree{table};
+    SymbolicExprId sum = tree.name("S" + std::to_string(count));
     for (std::size_t i = 1; i < count; ++i) {
-        const SymbolicString symbol(table, "S" + std::to_string(count - i));
-        const SymbolicExprId left = leftDeep ? sum : symbol.getId(table);
-        const SymbolicExprId right = leftDeep ? symbol.getId(table) : sum;
-        sum = op == SymbolicOp::And ? SymbolicAndExpr(table, left, right).getId(table)
-                                    : SymbolicOrExpr(table, left, right).getId(table);
+        const SymbolicExprId symbol = tree.name("S" + std::to_string(count - i));
+        sum = leftDeep ? tree(op, sum, symbol) : tree(op, symbol, sum);
     }
     return sum;
 }
 
 TEST(OperandLimit, HoldsAtTheBoundAndGivesUpOneBeyond) {
+    using Operands = boost::container::flat_set<SymbolicExprId>;
     for (const SymbolicOp op : {SymbolicOp::And, SymbolicOp::Or}) {
         for (const bool leftDeep : {true, false}) {
             Workbench bench;
@@ -31,24 +31,18 @@ TEST(OperandLimit, HoldsAtTheBoundAndGivesUpOneBeyond) {
             EXPECT_NE(sorted, within);
             EXPECT_EQ(bench.simplify(sorted), sorted);
             EXPECT_EQ(bench.simplify(beyond), beyond);
+            const auto operandsOf = [&](SymbolicExprId id, bool ofAnd) {
+                Operands operands;
+                const SymbolicExpr& node = *bench.table.get(id);
+                ofAnd ? bench.simplifier.computeUniqueAndOperandsId(node, operands)
+                      : bench.simplifier.computeUniqueOrOperandsId(node, operands);
+                return operands;
+            };
+            const bool isAnd = op == SymbolicOp::And;
+            EXPECT_EQ(operandsOf(within, isAnd).size(), limit);
+            EXPECT_EQ(operandsOf(beyond, isAnd), Operands{beyond});
+            EXPECT_EQ(operandsOf(within, !isAnd), Operands{within});
         }
-    }
-}
-
-TEST(OperandLimit, BoundsTheOperandsOfAChain) {
-    Workbench bench;
-    for (const bool leftDeep : {true, false}) {
-        boost::container::flat_set<SymbolicExprId> operands;
-        const SymbolicExprId within = chain(bench.table, SymbolicOp::And, limit, leftDeep);
-        bench.simplifier.computeUniqueAndOperandsId(*bench.table.get(within), operands);
-        EXPECT_EQ(operands.size(), limit);
-        const SymbolicExprId beyond = chain(bench.table, SymbolicOp::And, limit + 1, leftDeep);
-        operands.clear();
-        bench.simplifier.computeUniqueAndOperandsId(*bench.table.get(beyond), operands);
-        EXPECT_EQ(operands, boost::container::flat_set<SymbolicExprId>{beyond});
-        operands.clear();
-        bench.simplifier.computeUniqueOrOperandsId(*bench.table.get(within), operands);
-        EXPECT_EQ(operands, boost::container::flat_set<SymbolicExprId>{within});
     }
 }
 
@@ -81,28 +75,22 @@ TEST(LongChains, AreReducedWhateverTheirLength) {
 // Each graph has few nodes and more paths than could be walked.
 TEST(SharedGraphs, CostTheirNodes) {
     Workbench bench;
-    const auto doubled = [&](auto join) {
-        SymbolicExprId id = bench.parse("A == 1");
-        for (int level = 0; level < 64; ++level)
-            id = join(id);
-        return bench.simplify(id);
-    };
-    SymbolicExprTable& table = bench.table;
-    EXPECT_EQ(doubled([&](SymbolicExprId x) { return SymbolicAndExpr(table, x, x).getId(table); }),
-              bench.parse("A == 1"));
-    EXPECT_EQ(doubled([&](SymbolicExprId x) { return SymbolicOrExpr(table, x, x).getId(table); }),
-              bench.parse("A == 1"));
-    doubled([&](SymbolicExprId x) { return SymbolicMultiplyExpr(table, x, x).getId(table); });
-    doubled([&](SymbolicExprId x) { return SymbolicPlusExpr(table, x, x).getId(table); });
-    const SymbolicExprId compared = doubled([&](SymbolicExprId x) {
-        return SymbolicLessThanExpr(table, x, SymbolicPowerExpr(table, x, x).getId(table)).getId(table);
-    });
-    EXPECT_TRUE(table.has(compared));
+    const Trees tree{bench.table};
+    const SymbolicExprId condition = bench.parse("A == 1");
+    for (const SymbolicOp op : {SymbolicOp::And, SymbolicOp::Or})
+        EXPECT_EQ(bench.simplify(tree.doubled(op, condition)), condition);
+    for (const SymbolicOp op : {SymbolicOp::Multiply, SymbolicOp::Plus})
+        EXPECT_TRUE(bench.table.has(bench.simplify(tree.doubled(op, condition))));
+    SymbolicExprId compared = condition;
+    for (int level = 0; level < 64; ++level)
+        compared = tree(SymbolicOp::LessThan, compared, tree(SymbolicOp::Power, compared, compared));
+    EXPECT_TRUE(bench.table.has(bench.simplify(compared)));
 }
 
 TEST(DeepGraphs, NeedNoDeepStack) {
+    using Op = SymbolicOp;
     Workbench bench;
-    SymbolicExprTable& table = bench.table;
+    const Trees tree{bench.table};
     const SymbolicExprId a = bench.parse("A");
     const auto deep = [&](auto wrap) {
         SymbolicExprId id = a;
@@ -110,14 +98,12 @@ TEST(DeepGraphs, NeedNoDeepStack) {
             id = wrap(id);
         return bench.simplify(id);
     };
-    EXPECT_EQ(deep([&](SymbolicExprId x) { return SymbolicAndExpr(table, a, x).getId(table); }), a);
-    EXPECT_EQ(deep([&](SymbolicExprId x) { return SymbolicMinusExpr(table, x, a).getId(table); }),
-              bench.parse("-199999*A"));
-    EXPECT_EQ(deep([&](SymbolicExprId x) { return SymbolicUnaryMinusExpr(table, x).getId(table); }), a);
-    const SymbolicExprId nots = deep([&](SymbolicExprId x) { return SymbolicNotExpr(table, x).getId(table); });
-    EXPECT_EQ(nots, bench.parse("!!A"));
-    EXPECT_TRUE(table.has(deep([&](SymbolicExprId x) { return SymbolicModuloExpr(table, a, x).getId(table); })));
-    EXPECT_TRUE(table.has(deep([&](SymbolicExprId x) { return SymbolicLessThanExpr(table, x, a).getId(table); })));
+    EXPECT_EQ(deep([&](SymbolicExprId x) { return tree(Op::And, a, x); }), a);
+    EXPECT_EQ(deep([&](SymbolicExprId x) { return tree(Op::Minus, x, a); }), bench.parse("-199999*A"));
+    EXPECT_EQ(deep([&](SymbolicExprId x) { return tree(Op::UnaryMinus, x); }), a);
+    EXPECT_EQ(deep([&](SymbolicExprId x) { return tree(Op::Not, x); }), bench.parse("!!A"));
+    EXPECT_TRUE(bench.table.has(deep([&](SymbolicExprId x) { return tree(Op::Modulo, a, x); })));
+    EXPECT_TRUE(bench.table.has(deep([&](SymbolicExprId x) { return tree(Op::LessThan, x, a); })));
 }
 
 } // namespace

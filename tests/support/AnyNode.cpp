@@ -1,7 +1,5 @@
 #include "tests/support/AnyNode.hpp"
 
-#include <array>
-#include <limits>
 #include <type_traits>
 
 namespace VT::Testing {
@@ -71,20 +69,17 @@ SymbolicExprId makeAny(SymbolicExprTable& table, SymbolicOp op, const NodeParts&
     return invalidId;
 }
 
-SymbolicExprId makeRandom(SymbolicExprTable& table, std::mt19937_64& random) {
-    static const std::array<const char*, 5> texts{"", "a", "b", "true", "\xff"};
-    static const std::array<double, 6> reals{
-        0.0, -0.0, 1.0, 1.0 + std::numeric_limits<double>::epsilon(), 1e300, std::numeric_limits<double>::infinity()};
-    NodeParts parts;
-    parts.text = texts[random() % texts.size()];
-    parts.integer = static_cast<int>(random() % 5) - 2;
-    parts.real = reals[random() % reals.size()];
-    const bool leaf = table.size() == 0 || random() % 4 == 0;
-    const auto op = static_cast<SymbolicOp>(leaf ? random() % 3 : 3 + random() % (operatorCount - 3));
-    const std::size_t count = operandCount(op).value_or(random() % 5);
-    for (std::size_t i = 0; i < count; ++i)
-        parts.inputs.push_back(random() % table.size());
-    return makeAny(table, op, parts);
+SymbolicExprId Trees::doubled(SymbolicOp op, SymbolicExprId id, int times) const {
+    for (int i = 0; i < times; ++i)
+        id = (*this)(op, id, id);
+    return id;
+}
+
+SymbolicExprId Trees::zigzag(SymbolicOp left, SymbolicOp right, SymbolicExprId id, SymbolicExprId leaf,
+                             int depth) const {
+    for (int i = 0; i < depth; ++i)
+        id = i % 2 == 0 ? (*this)(left, id, leaf) : (*this)(right, leaf, id);
+    return id;
 }
 
 } // namespace VT::Testing

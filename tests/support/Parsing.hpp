@@ -4,6 +4,8 @@
 #include "host/Diagnostics.hpp"
 #include "parser/SymbolicExprParser.hpp"
 
+#include <gtest/gtest.h>
+
 #include <optional>
 #include <string>
 
@@ -26,6 +28,13 @@ inline ParseAnswer parse(SymbolicExprTable& table, const std::string& text, bool
     } catch (const HostDiagnostic& diagnostic) {
         return {invalidId, diagnostic};
     }
+}
+
+/// The expression of a text that must be one.
+inline SymbolicExprId read(SymbolicExprTable& table, const std::string& text) {
+    const ParseAnswer answer = parse(table, text);
+    EXPECT_FALSE(answer.error) << text;
+    return answer.id;
 }
 
 } // namespace VT::Testing

@@ -1,6 +1,6 @@
 #include "tests/support/RandomExpression.hpp"
 
-#include "base/transform/XForm.hpp"
+#include "tests/support/AnyNode.hpp"
 
 #include <limits>
 
@@ -8,112 +8,71 @@ namespace VT::Testing {
 
 namespace {
 
-class Maker {
-public:
-    Maker(std::mt19937_64& random, SymbolicExprTable& table, const std::vector<SymbolicExprId>& operands)
-        : random_(random),
-          factory_(table),
-          operands_(operands) {}
+template <class T>
+const T& anyOf(std::mt19937_64& random, const std::vector<T>& all) {
+    return all[random() % all.size()];
+}
 
-    SymbolicExprId make(SymbolicOp op) {
-#define MAKE(...) return factory_.make<Node>(__VA_ARGS__)
-#define MAKE_String() MAKE(anyOf(randomNames()))
-#define MAKE_Int() MAKE(integer())
-#define MAKE_Double() MAKE(real())
-#define MAKE_Unary() MAKE(in[0])
-#define MAKE_Member() MAKE(in[0], anyOf(randomNames()))
-#define MAKE_Binary() MAKE(in[0], in[1])
-#define MAKE_Ternary() MAKE(in[0], in[1], in[2])
-#define MAKE_Multi() MAKE(some(in))
-#define MAKE_Dims2() MAKE_Binary()
-#define MAKE_Dims3() MAKE_Ternary()
-#define MAKE_DimsN() MAKE_Multi()
-#define MAKE_Call0() MAKE(anyOf(randomNames()))
-#define MAKE_Call1() MAKE(anyOf(randomNames()), in[0])
-#define MAKE_Call2() MAKE(anyOf(randomNames()), in[0], in[1])
-#define MAKE_CallN() MAKE(anyOf(randomNames()), some(in))
-#define MAKE_Cell() MAKE_Multi()
-        std::vector<SymbolicExprId> in;
-        while (in.size() < mostOperands && !operands_.empty())
-            in.push_back(anyOf(operands_));
-        switch (op) {
-#define VTSYM_OPERATOR(Code, Name, Class, Shape, ...)                                                                  \
-    case SymbolicOp::Name: {                                                                                           \
-        using Node = Class;                                                                                            \
-        MAKE_##Shape();                                                                                                \
-    }
-#include "base/core/operators.def"
-#undef VTSYM_OPERATOR
-        case SymbolicOp::None:
-            break;
-        }
-        return invalidId;
-    }
+const std::vector<std::string> names{"", "a", "b", "N", "f", "true", "(sim)", "\xff"};
+const std::vector<int> integers{-2, -1, 0, 1, 2, 3, std::numeric_limits<int>::min(), std::numeric_limits<int>::max()};
+const std::vector<double> reals{0.0,   -0.0,
+                                0.5,   1.0,
+                                -2.75, 1.0 + std::numeric_limits<double>::epsilon(),
+                                1e300, std::numeric_limits<double>::infinity()};
+const std::vector<double> oddReals{0.5, -std::numeric_limits<double>::infinity(),
+                                   std::numeric_limits<double>::quiet_NaN()};
 
-    SymbolicOp op() {
-        if (!operands_.empty())
-            return static_cast<SymbolicOp>(below(operatorCount));
-        return below(2) == 0 ? SymbolicOp::String : static_cast<SymbolicOp>(below(3));
-    }
-
-private:
-    static constexpr std::size_t mostOperands = 5;
-
-    std::size_t below(std::size_t bound) {
-        return std::uniform_int_distribution<std::size_t>(0, bound - 1)(random_);
-    }
-
-    template <class T>
-    const T& anyOf(const std::vector<T>& all) {
-        return all[below(all.size())];
-    }
-
-    std::vector<SymbolicExprId> some(std::vector<SymbolicExprId> all) {
-        all.resize(1 + below(all.size()));
-        return all;
-    }
-
-    int integer() {
-        static const std::vector<int> bounds{std::numeric_limits<int>::min(), std::numeric_limits<int>::max()};
-        return below(4) == 0 ? anyOf(bounds) : static_cast<int>(below(7)) - 3;
-    }
-
-    double real() {
-        static const std::vector<double> values{0.0,
-                                                0.5,
-                                                1.0,
-                                                1.0 + std::numeric_limits<double>::epsilon(),
-                                                -2.75,
-                                                1e300,
-                                                std::numeric_limits<double>::infinity(),
-                                                -std::numeric_limits<double>::infinity(),
-                                                std::numeric_limits<double>::quiet_NaN()};
-        return anyOf(values);
-    }
-
-    std::mt19937_64& random_;
-    SymbolicExprFactory factory_;
-    const std::vector<SymbolicExprId>& operands_;
-};
+/// A node whose operands are what `pick` answers for an operator and a position.
+template <class Pick>
+SymbolicExprId make(SymbolicExprTable& table, std::mt19937_64& random, SymbolicOp op, double real, Pick pick) {
+    NodeParts parts{anyOf(random, names), anyOf(random, integers), real, {}};
+    const std::size_t count = operandCount(op).value_or(random() % 6);
+    for (std::size_t i = 0; i < count; ++i)
+        parts.inputs.push_back(pick(i));
+    const SymbolicExprId id = makeAny(table, op, parts);
+    return id == invalidId ? table.size() - 1 : id; // no look-up finds a NaN
+}
 
 } // namespace
 
-const std::vector<std::string>& randomNames() {
-    static const std::vector<std::string> names{"a", "b", "c", "N", "f", "g", "true", "(sim)"};
-    return names;
-}
-
-SymbolicExprId randomNode(std::mt19937_64& random, SymbolicExprTable& table,
-                          const std::vector<SymbolicExprId>& operands) {
-    Maker maker(random, table, operands);
-    return maker.make(maker.op());
-}
-
 std::vector<SymbolicExprId> randomGraph(std::mt19937_64& random, SymbolicExprTable& table, std::size_t nodes) {
     std::vector<SymbolicExprId> ids;
-    while (ids.size() < nodes)
-        ids.push_back(randomNode(random, table, ids.size() < nodes / 4 ? std::vector<SymbolicExprId>{} : ids));
+    while (ids.size() < nodes) {
+        const bool leaf = ids.size() < nodes / 4;
+        const auto op = static_cast<SymbolicOp>(leaf && random() % 2 == 0 ? 0 : random() % (leaf ? 3 : operatorCount));
+        ids.push_back(make(table, random, op, anyOf(random, random() % 4 == 0 ? oddReals : reals), [&](std::size_t i) {
+            return i == 0 && callOps.contains(op) ? SymbolicString(table, anyOf(random, names)).getId(table)
+                                                  : anyOf(random, ids);
+        }));
+    }
     return ids;
+}
+
+SymbolicExprId makeRandom(SymbolicExprTable& table, std::mt19937_64& random) {
+    const bool leaf = table.size() == 0 || random() % 4 == 0;
+    const auto op = static_cast<SymbolicOp>(leaf ? random() % 3 : 3 + random() % (operatorCount - 3));
+    return make(table, random, op, anyOf(random, reals), [&](std::size_t) { return random() % table.size(); });
+}
+
+SymbolicExprId randomTree(SymbolicExprTable& table, std::mt19937_64& random, const std::vector<SymbolicOp>& operators,
+                          int depth, // NOLINT(misc-no-recursion): as deep as asked for
+                          const std::function<SymbolicExprId()>& leaf) {
+    const Trees tree{table};
+    if (depth == 0 || random() % 6 == 0) {
+        if (leaf)
+            return leaf();
+        const std::size_t kind = random() % 6;
+        return kind == 0   ? tree.integer(static_cast<int>(random() % 7) - 3)
+               : kind == 1 ? tree.real((static_cast<double>(random() % 9) - 4) * 0.5)
+                           : tree.name(std::string(1, "abcd"[random() % 4]));
+    }
+    const SymbolicOp op = anyOf(random, operators);
+    std::vector<SymbolicExprId> inputs;
+    for (std::size_t left = operandCount(op).value_or(1 + random() % 4); left > 0; --left)
+        inputs.push_back((callOps.contains(op) || op == SymbolicOp::MemberValue) && inputs.empty()
+                             ? tree.name("f")
+                             : randomTree(table, random, operators, depth - 1, leaf));
+    return tree(op, inputs);
 }
 
 } // namespace VT::Testing

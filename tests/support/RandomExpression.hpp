@@ -4,22 +4,25 @@
 #include "base/core/Nodes.hpp"
 
 #include <cstddef>
+#include <functional>
 #include <random>
-#include <string>
 #include <vector>
 
 namespace VT::Testing {
 
-/// Adds a node of a random class, all classes alike.  Its operands are among `operands`, but for the names of calls; a
-/// leaf where there are none, mostly an identifier.  Literals include the bounds of int, infinities and NaN.
-SymbolicExprId randomNode(std::mt19937_64& random, SymbolicExprTable& table,
-                          const std::vector<SymbolicExprId>& operands);
-
-/// Adds random nodes, a quarter of them leaves and then each on operands among those before it, so that much is shared.
-/// Answers their identifiers.
+/// Adds random nodes, a quarter of them leaves and then all classes alike, each on operands among those before it, so
+/// that much is shared.  Calls are of names.  Literals include the bounds of int, infinities and NaN.  Answers the
+/// identifiers.
 std::vector<SymbolicExprId> randomGraph(std::mt19937_64& random, SymbolicExprTable& table, std::size_t nodes);
 
-/// The names of the identifiers in random expressions.
-const std::vector<std::string>& randomNames();
+/// Interns one random node over all nodes that are there, calls included.  Leaves come from a small stock, so that many
+/// nodes are met again; no real is NaN.
+SymbolicExprId makeRandom(SymbolicExprTable& table, std::mt19937_64& random);
+
+/// A random tree of these operators; what is called or has a member "field" is
+/// the name "f".  Its leaves are what the function makes, else a few
+/// names and numbers.
+SymbolicExprId randomTree(SymbolicExprTable& table, std::mt19937_64& random, const std::vector<SymbolicOp>& operators,
+                          int depth, const std::function<SymbolicExprId()>& leaf = nullptr);
 
 } // namespace VT::Testing

@@ -99,55 +99,38 @@ private:
     }
 
     Z3_ast build(SymbolicExprId id, const SymbolicExpr& node) {
-        const auto numbers = [&](auto make) {
-            const Z3_ast both[] = {asNumber(node.getInput(0)), asNumber(node.getInput(1))};
-            return make(both);
+        using Op = SymbolicOp;
+        static const std::map<Op, Z3_ast (*)(Z3_context, Z3_ast, Z3_ast)> comparisons{
+            {Op::Equal, Z3_mk_eq},       {Op::LessThan, Z3_mk_lt},         {Op::LessThanEqual, Z3_mk_le},
+            {Op::GreaterThan, Z3_mk_gt}, {Op::GreaterThanEqual, Z3_mk_ge},
         };
-        const auto compare = [&](auto make) {
-            return make(context_, asNumber(node.getInput(0)), asNumber(node.getInput(1)));
+        static const std::map<Op, Z3_ast (*)(Z3_context, unsigned, const Z3_ast*)> chains{
+            {Op::Plus, Z3_mk_add}, {Op::Minus, Z3_mk_sub}, {Op::Multiply, Z3_mk_mul},
+            {Op::And, Z3_mk_and},  {Op::Or, Z3_mk_or},
         };
-        const auto chain = [&](auto make) {
-            const Z3_ast both[] = {asTruth(node.getInput(0)), asTruth(node.getInput(1))};
-            return make(context_, 2, both);
-        };
-        switch (node.op()) {
-        case SymbolicOp::String: {
+        const Op op = node.op();
+        const auto number = [&](std::size_t i) { return asNumber(node.getInput(i)); };
+        if (op == Op::String) {
             const std::string& name = static_cast<const SymbolicString&>(node).getName();
             return name == "true" || name == "false" ? integer(name == "true") : unknown(name);
         }
-        case SymbolicOp::IntValue:
+        if (op == Op::IntValue)
             return integer(static_cast<const SymbolicIntValue&>(node).getValue());
-        case SymbolicOp::Plus:
-            return numbers([&](const Z3_ast* both) { return Z3_mk_add(context_, 2, both); });
-        case SymbolicOp::Minus:
-            return numbers([&](const Z3_ast* both) { return Z3_mk_sub(context_, 2, both); });
-        case SymbolicOp::UnaryMinus:
-            return Z3_mk_unary_minus(context_, asNumber(node.getInput(0)));
-        case SymbolicOp::Multiply:
-            if (table_.get(node.getInput(0))->isNumValue() || table_.get(node.getInput(1))->isNumValue())
-                return numbers([&](const Z3_ast* both) { return Z3_mk_mul(context_, 2, both); });
-            return unknown("term " + std::to_string(id));
-        case SymbolicOp::Equal:
-            return compare(Z3_mk_eq);
-        case SymbolicOp::NotEqual:
-            return Z3_mk_not(context_, compare(Z3_mk_eq));
-        case SymbolicOp::LessThan:
-            return compare(Z3_mk_lt);
-        case SymbolicOp::LessThanEqual:
-            return compare(Z3_mk_le);
-        case SymbolicOp::GreaterThan:
-            return compare(Z3_mk_gt);
-        case SymbolicOp::GreaterThanEqual:
-            return compare(Z3_mk_ge);
-        case SymbolicOp::And:
-            return chain(Z3_mk_and);
-        case SymbolicOp::Or:
-            return chain(Z3_mk_or);
-        case SymbolicOp::Not:
+        if (op == Op::UnaryMinus)
+            return Z3_mk_unary_minus(context_, number(0));
+        if (op == Op::Not)
             return Z3_mk_not(context_, asTruth(node.getInput(0)));
-        default:
+        if (op == Op::NotEqual)
+            return Z3_mk_not(context_, Z3_mk_eq(context_, number(0), number(1)));
+        if (const auto make = comparisons.find(op); make != comparisons.end())
+            return make->second(context_, number(0), number(1));
+        const auto make = chains.find(op);
+        if (make == chains.end() || (op == Op::Multiply && !table_.get(node.getInput(0))->isNumValue() &&
+                                     !table_.get(node.getInput(1))->isNumValue()))
             return unknown("term " + std::to_string(id));
-        }
+        const auto operand = [&](std::size_t i) { return isTruth(id) ? asTruth(node.getInput(i)) : number(i); };
+        const Z3_ast both[] = {operand(0), operand(1)};
+        return make->second(context_, 2, both);
     }
 
     const SymbolicExprTable& table_;

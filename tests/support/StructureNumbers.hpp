@@ -13,7 +13,7 @@
 namespace VT::Testing {
 
 /// Numbers structures: equal trees, in whichever tables, have equal numbers, and others do not.  Reals are compared by
-/// their bits.  A class with any number of operands and its twin with a fixed number are one structure.
+/// their bits, but for the sign of zero.  A class with any number of operands and its twin with a fixed number are one structure.
 class StructureNumbers {
 public:
     /// The number of a node with these operands; that of an invalid operand is `none`.
@@ -59,7 +59,7 @@ private:
         if (node.op() == SymbolicOp::MemberValue)
             return static_cast<const SymbolicMemberValue&>(node).getMemberName();
         if (node.isNumValue())
-            return std::to_string(std::bit_cast<std::uint64_t>(node.getNumValue()));
+            return std::to_string(std::bit_cast<std::uint64_t>(node.getNumValue() + 0.0));
         return {};
     }
 

@@ -7,15 +7,11 @@
 
 namespace VT::Testing {
 
-namespace {
-
 std::string realText(double value) {
     std::array<char, 40> digits{};
     std::snprintf(digits.data(), digits.size(), "%.17gr", value);
     return digits.data();
 }
-
-} // namespace
 
 std::string treeText(const SymbolicExprTable& table, SymbolicExprId id) { // NOLINT(misc-no-recursion): small trees only
     const SymbolicExpr* node = table.get(id);

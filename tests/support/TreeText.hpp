@@ -11,4 +11,7 @@ namespace VT::Testing {
 /// member's name behind its owner.  The invalid identifier is "invalid".  Recurses; for small expressions only.
 std::string treeText(const SymbolicExprTable& table, SymbolicExprId id);
 
+/// A real as it stands there.
+std::string realText(double value);
+
 } // namespace VT::Testing

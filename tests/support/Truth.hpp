@@ -1,4 +1,4 @@
-// Brute force: what conditions are worth under an assignment of integers.
+// Brute force: what expressions are worth under an assignment of integers, without any rule of the library.
 #pragma once
 
 #include "base/VTSymbolicExpr.hpp"
@@ -7,19 +7,58 @@
 #include <exception>
 #include <functional>
 #include <map>
+#include <optional>
 #include <string>
 #include <vector>
 
 namespace VT::Testing {
 
+using Assignment = std::map<std::string, std::int64_t>;
+
+/// Integers without bounds (sums and products are right modulo 2^64), where calls and members are worth what the
+/// assignment says of their text; or C, where a call is looked up by the name of its function, `defined(X)` tells
+/// whether the assignment names X, and the right operands of && and || count only where C computes them.
+enum class Arithmetic : bool { Unbounded, C };
+
+/// An expression for many assignments; what they do not name is worth 0.  Element-wise logic is logic.
+class Truth {
+public:
+    Truth(const SymbolicExprTable& table, SymbolicExprId root, Arithmetic arithmetic = Arithmetic::Unbounded);
+
+    /// The value; nothing where one that counts divides by zero, shifts by what is no number of bits, or, in C, is no
+    /// int.
+    [[nodiscard]] std::optional<std::int64_t> under(const Assignment& assignment) const;
+
+    /// What an assignment may give values to: names, members, and functions other than `defined`.
+    [[nodiscard]] const std::vector<std::string>& names() const noexcept { return names_; }
+
+    [[nodiscard]] const std::vector<std::string>& functions() const noexcept { return functions_; }
+
+private:
+    struct Step {
+        SymbolicOp op;
+        std::int64_t literal = 0;
+        std::string name = {}; ///< what is looked up
+        std::vector<std::size_t> inputs = {};
+    };
+
+    [[nodiscard]] std::optional<std::int64_t> compute(SymbolicOp op, std::int64_t a, std::int64_t b) const;
+
+    [[nodiscard]] Step named(SymbolicOp op, std::string text);
+
+    Arithmetic arithmetic_;
+    std::vector<Step> steps_; ///< operands before their operators
+    std::vector<std::string> names_;
+    std::vector<std::string> functions_;
+};
+
 /// A quotient by zero.
 struct NoValue : std::exception {};
 
-using Assignment = std::map<std::string, std::int64_t>;
-
-/// The value of an expression of integers, truth values and C's arithmetic over them, computed from the meaning of each
-/// operator without any rule of the library.  Calls and members are worth what the assignment says of their text.
-std::int64_t valueOf(const SymbolicExprTable& table, SymbolicExprId id, const Assignment& assignment);
+inline std::int64_t valueOf(const SymbolicExprTable& table, SymbolicExprId id, const Assignment& assignment) {
+    const std::optional<std::int64_t> value = Truth(table, id).under(assignment);
+    return value ? *value : throw NoValue();
+}
 
 inline bool holds(const SymbolicExprTable& table, SymbolicExprId id, const Assignment& assignment) {
     return valueOf(table, id, assignment) != 0;

@@ -51,7 +51,7 @@ struct LineEditor::State {
         el_end(editor);
     }
 
-    static unsigned char completeHere(EditLine* editor, int key);
+    static unsigned char completeHere(EditLine* editor, wint_t key);
     void list(const std::set<std::string>& candidates) const;
 
     std::string prompt;
@@ -83,12 +83,12 @@ LineEditor::State::State(std::string text, std::function<const std::set<std::str
     el_set(editor, EL_EDITOR, "emacs");
     el_set(editor, EL_SIGNAL, 1);
     el_set(editor, EL_HIST, ::history, history);
-    el_set(editor, EL_ADDFN, "complete", "Complete a name", &completeHere);
+    el_wset(editor, EL_ADDFN, L"complete", L"Complete a name", &completeHere); // el_set leaks copies of its texts
     el_set(editor, EL_BIND, "^I", "complete", nullptr);
     el_source(editor, nullptr);
 }
 
-unsigned char LineEditor::State::completeHere(EditLine* editor, int) {
+unsigned char LineEditor::State::completeHere(EditLine* editor, wint_t) {
     State* state = nullptr;
     el_get(editor, EL_CLIENTDATA, &state);
     const LineInfo* const line = el_line(editor);

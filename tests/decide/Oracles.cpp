@@ -1,9 +1,15 @@
-// Every condition of at most three operators, and random ones, against all assignments of a small world.
+// Every condition of at most three operators and random ones against all assignments of a small world; random pairs
+// against an independent solver; witnesses of pairs of the corpus.
 #include "tests/decide/Bench.hpp"
+#include "tests/support/AnyNode.hpp"
+#include "tests/support/Corpus.hpp"
+#include "tests/support/Parsing.hpp"
 #include "tests/support/RandomCondition.hpp"
+#include "tests/support/Solver.hpp"
 
 #include <algorithm>
 #include <array>
+#include <cstdlib>
 #include <random>
 
 namespace VT::Testing {
@@ -36,20 +42,22 @@ std::vector<Entry> leaves(SymbolicExprTable& table) {
     return {a, b, two};
 }
 
-template <class Node, class Compute>
-void combineAll(SymbolicExprTable& table, const std::vector<Entry>& left, const std::vector<Entry>& right,
-                Compute compute, std::vector<Entry>& out, bool arithmetic = false) {
-    for (const Entry& a : left)
-        for (const Entry& b : right) {
-            Entry entry{Node(table, a.id, b.id).getId(table), {}, arithmetic || a.arithmetic || b.arithmetic};
-            for (std::size_t i = 0; i < entry.values.size(); ++i)
-                entry.values[i] = static_cast<std::int8_t>(compute(a.values[i], b.values[i]));
-            out.push_back(entry);
-        }
-}
-
 /// The conditions of so many operators made of those of fewer.
 std::vector<Entry> ofOperators(SymbolicExprTable& table, const std::vector<std::vector<Entry>>& smaller) {
+    static const struct {
+        SymbolicOp op;
+        int (*compute)(int, int);
+        bool arithmetic;
+    } operators[] = {
+        {SymbolicOp::Plus, [](int x, int y) { return x + y; }, true},
+        {SymbolicOp::Minus, [](int x, int y) { return x - y; }, true},
+        {SymbolicOp::Equal, [](int x, int y) { return int{x == y}; }, false},
+        {SymbolicOp::LessThan, [](int x, int y) { return int{x < y}; }, false},
+        {SymbolicOp::GreaterThanEqual, [](int x, int y) { return int{x >= y}; }, false},
+        {SymbolicOp::And, [](int x, int y) { return int{x != 0 && y != 0}; }, false},
+        {SymbolicOp::Or, [](int x, int y) { return int{x != 0 || y != 0}; }, false},
+    };
+
     std::vector<Entry> all;
     const std::size_t count = smaller.size();
     for (const Entry& a : smaller[count - 1]) {
@@ -65,20 +73,13 @@ std::vector<Entry> ofOperators(SymbolicExprTable& table, const std::vector<std::
     for (std::size_t i = 0; i < count; ++i) {
         const std::vector<Entry>& a = smaller[i];
         const std::vector<Entry>& b = smaller[count - 1 - i];
-        combineAll<SymbolicPlusExpr>(
-            table, a, b, [](int x, int y) { return x + y; }, all, true);
-        combineAll<SymbolicMinusExpr>(
-            table, a, b, [](int x, int y) { return x - y; }, all, true);
-        combineAll<SymbolicEqualExpr>(
-            table, a, b, [](int x, int y) { return x == y; }, all);
-        combineAll<SymbolicLessThanExpr>(
-            table, a, b, [](int x, int y) { return x < y; }, all);
-        combineAll<SymbolicGreaterThanEqualExpr>(
-            table, a, b, [](int x, int y) { return x >= y; }, all);
-        combineAll<SymbolicAndExpr>(
-            table, a, b, [](int x, int y) { return x != 0 && y != 0; }, all);
-        combineAll<SymbolicOrExpr>(
-            table, a, b, [](int x, int y) { return x != 0 || y != 0; }, all);
+        for (const auto& [op, compute, arithmetic] : operators)
+            for (const Entry& x : a)
+                for (const Entry& y : b) {
+                    all.push_back({makeNode(table, op, {x.id, y.id}), {}, arithmetic || x.arithmetic || y.arithmetic});
+                    for (std::size_t at = 0; at < x.values.size(); ++at)
+                        all.back().values[at] = static_cast<std::int8_t>(compute(x.values[at], y.values[at]));
+                }
     }
     return all;
 }
@@ -233,6 +234,97 @@ TEST(BruteForce, AnswersDoNotDependOnHistory) {
         };
         ASSERT_EQ(answers(false), answers(true)) << texts[0] << "\n" << texts[1];
     }
+}
+
+/// Each "yes" comes with a witness, for which the conditions hold as asked.
+void expectWitnesses(const DecisionBench& bench, SymbolicExprId a, SymbolicExprId b, const Relation& relation) {
+    const auto expectWitness = [&](const Decision& decision, bool wantsA, bool wantsB) {
+        ASSERT_EQ(decision.isYes(), decision.witness.has_value());
+        if (decision.isYes()) {
+            ASSERT_EQ(bench.holdsFor(a, decision), wantsA) << SymbolicExprPrinter(bench.table, false)(a);
+            ASSERT_EQ(bench.holdsFor(b, decision), wantsB) << SymbolicExprPrinter(bench.table, false)(b);
+        }
+    };
+    expectWitness(relation.onlyA, true, false);
+    expectWitness(relation.onlyB, false, true);
+    expectWitness(relation.both, true, true);
+}
+
+#ifdef VTSYM_HAVE_Z3
+
+/// Compares the answers to the three questions about a pair.
+void expectSame(Solver& solver, SymbolicExprId a, SymbolicExprId b, const Relation& relation) {
+    const auto expectOne = [&](const Decision& decision, bool wantsA, bool wantsB) {
+        const Z3_ast inA = wantsA ? solver.truth(a) : solver.negated(solver.truth(a));
+        const Z3_ast inB = wantsB ? solver.truth(b) : solver.negated(solver.truth(b));
+        ASSERT_EQ(decision.answer, solver.canHold(inA, inB) ? Answer::Yes : Answer::No);
+    };
+    expectOne(relation.onlyA, true, false);
+    expectOne(relation.onlyB, false, true);
+    expectOne(relation.both, true, true);
+}
+
+TEST(AgainstSolver, RandomPairs) {
+    const char* asked = std::getenv("VTSYM_SOLVER_PAIRS");
+    const std::size_t pairs = asked != nullptr ? std::strtoul(asked, nullptr, 10) : 10000;
+    std::mt19937_64 random(22);
+    ConditionShape shape{.symbols = {"A", "B", "C", "D"}, .symbolPairs = true, .truthValues = true};
+    std::size_t done = 0;
+    while (done < pairs) {
+        DecisionBench bench; // a fresh one now and then, so that neither side grows without end
+        Solver solver(bench.table);
+        for (int i = 0; i < 500 && done < pairs; ++i, ++done) {
+            const auto text = [&] {
+                std::string condition = randomCondition(random, 1 + random() % 5, shape);
+                if (random() % 4 == 0)
+                    condition += random() % 2 == 0 ? " || A+2<=C" : " && 3*B-1>D-D+2*B+(C<2)";
+                return condition;
+            };
+            const SymbolicExprId a = bench.parse(text());
+            const SymbolicExprId b = bench.parse(text());
+            const Relation relation = bench.decider.classify(a, b);
+            expectSame(solver, a, b, relation);
+            expectWitnesses(bench, a, b, relation);
+            ASSERT_FALSE(HasFatalFailure()) << SymbolicExprPrinter(bench.table, false)(a) << "\n"
+                                            << SymbolicExprPrinter(bench.table, false)(b);
+        }
+    }
+}
+
+#else
+
+TEST(AgainstSolver, RandomPairs) {
+    GTEST_SKIP() << "skipped: the solver's development files (libz3-dev) were not there when the tests were built";
+}
+
+#endif
+
+/// Neighbours among the lines that share a symbol.
+TEST(CorpusPairs, AreDecidedAndWitnessesHold) {
+    DecisionBench bench;
+    std::map<std::string, std::vector<SymbolicExprId>> bySymbol;
+    for (const CorpusFile& file : corpusFiles)
+        for (const std::string& line : corpusLines(file.name)) {
+            const SymbolicExprId id = parse(bench.table, line).id;
+            std::vector<std::string> symbols; // none of a text that is no condition
+            bench.table.getSymbolsFromExpression(id, symbols);
+            for (const std::string& symbol : symbols)
+                if (symbol != "defined")
+                    bySymbol[symbol].push_back(id);
+        }
+    std::size_t pairs = 0;
+    std::size_t undecided = 0;
+    for (const auto& [symbol, ids] : bySymbol)
+        for (std::size_t i = 1; i < ids.size(); ++i) {
+            const SymbolicExprId a = ids[i - 1];
+            const SymbolicExprId b = ids[i];
+            const Relation relation = bench.decider.classify(a, b);
+            ++pairs;
+            undecided += relation.kind == RelationKind::Undecided ? 1U : 0U;
+            expectWitnesses(bench, a, b, relation);
+        }
+    EXPECT_GT(pairs, 10000U);
+    EXPECT_LT(undecided * 1000, pairs) << undecided << " of " << pairs;
 }
 
 } // namespace

@@ -1,0 +1,47 @@
+// A place for other programs to work in.
+#pragma once
+
+#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <sstream>
+#include <stdexcept>
+#include <string>
+#include <sys/wait.h>
+
+namespace VT::Testing {
+
+/// A directory that lives as long as this.
+class Workplace {
+public:
+    Workplace() {
+        std::string pattern = (std::filesystem::temp_directory_path() / "vtsym-XXXXXX").string();
+        if (mkdtemp(pattern.data()) == nullptr)
+            throw std::runtime_error("no directory for files");
+        path_ = pattern;
+    }
+
+    Workplace(const Workplace&) = delete;
+    Workplace& operator=(const Workplace&) = delete;
+
+    ~Workplace() { std::filesystem::remove_all(path_); }
+
+    void write(const std::string& name, const std::string& content) const { std::ofstream(path_ / name) << content; }
+
+    [[nodiscard]] std::string read(const std::string& name) const {
+        std::ostringstream content;
+        content << std::ifstream(path_ / name).rdbuf();
+        return content.str();
+    }
+
+    /// The exit status of a shell's command there; -1 where a signal ended it.
+    int run(const std::string& command) const {
+        const int status = std::system(("cd '" + path_.string() + "' && " + command).c_str());
+        return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+    }
+
+private:
+    std::filesystem::path path_;
+};
+
+} // namespace VT::Testing
