@@ -1,7 +1,7 @@
 # The layers of the library: their folders, and the arrows between them.  The build links by this table and a test holds every
 # #include against it.  A layer may use what its arrows reach.
 
-set(VTSYM_LAYERS host core variants transform print simplify decide eval parser service embedded)
+set(VTSYM_LAYERS host core variants transform print simplify decide eval parser service scan embedded)
 
 set(VTSYM_FOLDER_host host)
 set(VTSYM_FOLDER_core base/core)
@@ -13,6 +13,7 @@ set(VTSYM_FOLDER_decide base/decide)
 set(VTSYM_FOLDER_eval base/eval)
 set(VTSYM_FOLDER_parser parser)
 set(VTSYM_FOLDER_service base/service)
+set(VTSYM_FOLDER_scan base/scan)
 set(VTSYM_FOLDER_embedded host/embedded)
 
 set(VTSYM_ARROWS_host)
@@ -25,6 +26,7 @@ set(VTSYM_ARROWS_decide print)
 set(VTSYM_ARROWS_eval print)
 set(VTSYM_ARROWS_parser print)
 set(VTSYM_ARROWS_service parser simplify decide eval)
+set(VTSYM_ARROWS_scan service)
 set(VTSYM_ARROWS_embedded host)
 
 # The two front doors stand in base/ itself.

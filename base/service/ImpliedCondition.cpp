@@ -15,6 +15,8 @@ namespace {
 constexpr std::size_t mostOperands = 8;  ///< that comparisons are made of
 constexpr std::size_t mostLiterals = 12; ///< that each of them is compared with
 
+} // namespace
+
 SymbolicExprId compareWith(SymbolicExprTable& table, SymbolicOp op, SymbolicExprId operand, int literal) {
     const SymbolicIntValue value(table, literal);
     switch (op) {
@@ -32,8 +34,6 @@ SymbolicExprId compareWith(SymbolicExprTable& table, SymbolicOp op, SymbolicExpr
         return SymbolicGreaterThanEqualExpr(table, operand, value).getId(table);
     }
 }
-
-} // namespace
 
 ImpliedCondition::ImpliedCondition(SymbolicExprTable& table, const SymbolicExprPrinter& printer, SymbolicExprId context,
                                    IsEqual isEqual)

@@ -9,6 +9,9 @@
 
 namespace VT {
 
+/// Interns the comparison of an operand with an integer; any other operator gives >=.
+SymbolicExprId compareWith(SymbolicExprTable& table, SymbolicOp op, SymbolicExprId operand, int literal);
+
 /// Shortens a condition by what keeps it equal in a context: operands of && and || taken away, the longest first, and
 /// groups replaced by one comparison with a literal that the condition or the context mentions.  Every change is proven
 /// by the caller's `isEqual` before it stays, so the result is right whatever is tried; it need not be the shortest

@@ -41,6 +41,14 @@ std::string Preprocessor::decide() const {
     return answers;
 }
 
+std::string preprocessed(const std::string& file, const std::string& header) {
+    const Directory directory;
+    directory.write("file.c", file);
+    directory.write("header.h", header);
+    directory.run("cpp -P -undef -std=c2x file.c decided");
+    return directory.read("decided");
+}
+
 std::string Compiler::program() const {
     std::string text = "#include <stdbool.h>\n#include <stdio.h>\n";
     std::map<std::string, std::string> fields;

@@ -25,6 +25,10 @@ private:
     std::vector<std::string> defined_;
 };
 
+/// What the preprocessor makes of a file; a header of the given text is there as "header.h".  Throws std::runtime_error
+/// with the preprocessor's words.
+[[nodiscard]] std::string preprocessed(const std::string& file, const std::string& header);
+
 /// Compiles expressions and computes them.
 class Compiler {
 public:

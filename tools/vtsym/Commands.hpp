@@ -50,5 +50,6 @@ Command addPreprocess(CLI::App& program);
 Command addEval(CLI::App& program);
 Command addDims(CLI::App& program);
 Command addOperators(CLI::App& program);
+Command addScan(CLI::App& program);
 
 } // namespace vtsym

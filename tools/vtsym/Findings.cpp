@@ -98,11 +98,12 @@ public:
 
 private:
     void add(const Finding& finding) override;
-    void addProblem(const Place& place, const std::string& sentence) override;
+    void addProblem(const Place& place, const std::string& sentence, bool fails) override;
     void end() override;
 
     std::span<const FindingRule> rules_;
     std::string notifications_;
+    bool successful_ = true;
     bool first_ = true;
 };
 
@@ -181,15 +182,18 @@ void SarifWriter::add(const Finding& finding) {
     console().data(out + "}");
 }
 
-void SarifWriter::addProblem(const Place& place, const std::string& sentence) {
-    notifications_.append(notifications_.empty() ? "" : ",").append("\n{\"level\":\"error\"");
+void SarifWriter::addProblem(const Place& place, const std::string& sentence, bool fails) {
+    successful_ = successful_ && !fails;
+    notifications_.append(notifications_.empty() ? "\n{" : ",\n{").append("\"level\":");
+    notifications_.append(fails ? "\"error\"" : "\"note\"");
     appendMember(notifications_, "message", jsonMessage(sentence));
-    appendMember(notifications_, "locations", "[" + jsonLocation(place) + "]}");
+    appendMember(notifications_, "locations", "[" + jsonLocation(place) + "]");
+    notifications_.push_back('}');
 }
 
 void SarifWriter::end() {
     std::string out = "\n],\"invocations\":[{\"executionSuccessful\":";
-    out.append(notifications_.empty() ? "true" : "false");
+    out.append(successful_ ? "true" : "false");
     if (!notifications_.empty())
         appendMember(out, "toolExecutionNotifications", "[" + notifications_ + "]");
     console().data(out + "}]}]}\n");
@@ -203,9 +207,17 @@ void FindingWriter::write(const Finding& finding) {
 }
 
 void FindingWriter::problem(const Place& place, const std::string& sentence) {
+    tell(place, sentence, true);
+}
+
+void FindingWriter::note(const Place& place, const std::string& sentence) {
+    tell(place, sentence, false);
+}
+
+void FindingWriter::tell(const Place& place, const std::string& sentence, bool fails) {
     console_.words("vtsym: " + placeText(place) + ": " + shown(sentence) + "\n");
-    addProblem(place, sentence);
-    failed_ = true;
+    addProblem(place, sentence, fails);
+    failed_ = failed_ || fails;
 }
 
 SearchResult FindingWriter::finish() {

@@ -69,6 +69,8 @@ public:
     void write(const Finding& finding);
     /// Tells on standard error that something could not be searched, or not to its end.
     void problem(const Place& place, const std::string& sentence);
+    /// The same where the search is none the worse for it: it does not fail.
+    void note(const Place& place, const std::string& sentence);
     /// Ends the output: nothing may follow.  What the search ends with.
     SearchResult finish();
 
@@ -82,9 +84,11 @@ protected:
 private:
     virtual void add(const Finding& finding) = 0;
 
-    virtual void addProblem(const Place&, const std::string&) {}
+    virtual void addProblem(const Place&, const std::string&, bool /*fails*/) {}
 
     virtual void end() {}
+
+    void tell(const Place& place, const std::string& sentence, bool fails);
 
     Console& console_;
     std::uint64_t found_ = 0;

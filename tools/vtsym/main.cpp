@@ -77,8 +77,8 @@ Program::Program() {
     app_.footer(footer);
     app_.get_formatter()->column_width(34);
     addFeatures(app_);
-    for (const auto add : {addSimplify, addCompare, addGiven, addCheck, addConvert, addPreprocess, addTree, addEval,
-                           addDims, addSymbols, addReplace, addRepl, addOperators}) {
+    for (const auto add : {addSimplify, addCompare, addGiven, addCheck, addScan, addConvert, addPreprocess, addTree,
+                           addEval, addDims, addSymbols, addReplace, addRepl, addOperators}) {
         commands_.push_back(add(app_));
         addFeatures(*commands_.back().app);
     }

@@ -1,0 +1,132 @@
+#include "base/scan/BranchContext.hpp"
+
+#include <algorithm>
+#include <tuple>
+
+namespace VT {
+
+namespace {
+
+/// Facts about one thing that are looked at: between one and two windows, so that neighbours in a long chain look at
+/// the same ones and share what was decided.
+constexpr std::size_t window = 128;
+/// What all facts of a question may weigh: those about one thing are cheap to decide with.
+constexpr std::size_t mostWeight = 2 * window;
+constexpr std::size_t compoundWeight = 8;
+
+} // namespace
+
+void BranchContext::push(BranchFact fact) {
+    const auto at = static_cast<std::uint32_t>(facts_.size());
+    byGroup_.resize(unknowns_.groups());
+    groupMarks_.resize(unknowns_.groups());
+    for (const MacroUnknownId unknown : fact.unknowns)
+        byGroup_[unknowns_[unknown].group].push_back(at);
+    facts_.push_back(std::move(fact));
+    marks_.push_back(0);
+}
+
+void BranchContext::negateLast() {
+    BranchFact& last = facts_.back();
+    last.negated = !last.negated;
+    last.node = SymbolicNotExpr(table_, last.node).getId(table_);
+}
+
+void BranchContext::pop(std::size_t size) {
+    while (facts_.size() > size) {
+        for (const MacroUnknownId unknown : facts_.back().unknowns)
+            byGroup_[unknowns_[unknown].group].pop_back();
+        facts_.pop_back();
+        marks_.pop_back();
+    }
+}
+
+std::vector<std::size_t> BranchContext::related(const DirectiveCondition& condition) {
+    std::vector<std::size_t> result;
+    std::size_t weight = 0;
+    ++question_;
+    const auto add = [&](std::size_t fact) {
+        if (marks_[fact] == question_)
+            return;
+        weight += facts_[fact].unknowns.size() == 1 ? 1 : compoundWeight;
+        marks_[fact] = question_;
+        result.push_back(fact);
+    };
+    const auto addAbout = [&](const std::vector<MacroUnknownId>& unknowns) {
+        for (const MacroUnknownId unknown : unknowns) {
+            const std::uint32_t group = unknowns_[unknown].group;
+            if (group >= byGroup_.size() || groupMarks_[group] == question_)
+                continue;
+            groupMarks_[group] = question_;
+            const std::vector<std::uint32_t>& about = byGroup_[group];
+            const std::size_t first = about.size() > window ? (about.size() - window) / window * window : 0;
+            for (std::size_t i = about.size(); i-- > first && weight < mostWeight;)
+                add(about[i]);
+        }
+    };
+    addAbout(condition.unknowns);
+    for (std::size_t i = 0; i < result.size() && weight < mostWeight; ++i)
+        addAbout(facts_[result[i]].unknowns);
+    std::ranges::sort(result);
+    return result;
+}
+
+BranchContext::Laws BranchContext::laws(const DirectiveCondition& condition, const std::vector<std::size_t>& facts) {
+    using Kind = MacroUnknown::Kind;
+    std::vector<MacroUnknownId> asked = condition.unknowns;
+    for (const std::size_t fact : facts)
+        asked.insert(asked.end(), facts_[fact].unknowns.begin(), facts_[fact].unknowns.end());
+    std::erase_if(asked, [&](MacroUnknownId id) {
+        return unknowns_[id].kind != Kind::Value && unknowns_[id].kind != Kind::Defined;
+    });
+    const auto order = [&](MacroUnknownId id) {
+        const MacroUnknown& unknown = unknowns_[id];
+        return std::tuple(unknown.subject, unknown.state.version, unknown.state.epoch, unknown.kind);
+    };
+    std::ranges::sort(asked, {}, order);
+    const auto repeated = std::ranges::unique(asked);
+    asked.erase(repeated.begin(), repeated.end());
+
+    // One round for each macro in one version: its epochs from the first to the last.
+    Laws laws;
+    const auto equal = [&](SymbolicExprId a, SymbolicExprId b) {
+        return SymbolicEqualExpr(table_, a, b).getId(table_);
+    };
+    const auto either = [&](SymbolicExprId a, SymbolicExprId b) { return SymbolicOrExpr(table_, a, b).getId(table_); };
+    for (std::size_t i = 0; i < asked.size();) {
+        const MacroUnknown first = unknowns_[asked[i]];
+        std::vector<std::uint64_t> epochs;
+        bool value = false;
+        bool defined = false;
+        for (; i < asked.size(); ++i) {
+            const MacroUnknown& each = unknowns_[asked[i]];
+            if (each.subject != first.subject || each.state.version != first.state.version)
+                break;
+            if (epochs.empty() || epochs.back() != each.state.epoch)
+                epochs.push_back(each.state.epoch);
+            (each.kind == Kind::Value ? value : defined) = true;
+        }
+        const auto at = [&](Kind kind, std::uint64_t epoch) {
+            return unknowns_[unknowns_.asked(kind, first.subject, {first.state.version, epoch, first.state.derived})]
+                .node;
+        };
+        for (std::size_t e = 0; e < epochs.size(); ++e) {
+            const bool isLast = e + 1 == epochs.size();
+            if (value && (defined || !isLast)) {
+                const SymbolicExprId zero =
+                    equal(at(Kind::Value, epochs[e]), SymbolicIntValue(table_, 0).getId(table_));
+                (isLast ? laws.undefined : laws.states).push_back(either(at(Kind::Defined, epochs[e]), zero));
+            }
+            if (isLast || first.state.derived)
+                continue;
+            const SymbolicExprId undefined = SymbolicNotExpr(table_, at(Kind::Defined, epochs[e])).getId(table_);
+            if (value)
+                laws.states.push_back(
+                    either(undefined, equal(at(Kind::Value, epochs[e]), at(Kind::Value, epochs[e + 1]))));
+            laws.states.push_back(either(undefined, at(Kind::Defined, epochs[e + 1])));
+        }
+    }
+    return laws;
+}
+
+} // namespace VT

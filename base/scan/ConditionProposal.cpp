@@ -1,0 +1,74 @@
+#include "base/scan/ConditionProposal.hpp"
+
+#include <algorithm>
+
+namespace VT {
+
+namespace {
+
+/// The text of a part that is no chain of && or ||.
+std::optional<std::string> partText(const SymbolicExprTable& table, const MacroUnknowns& unknowns,
+                                    const DirectiveCondition& condition, std::span<const DirectiveToken> tokens,
+                                    SymbolicExprId part) {
+    const auto spelling = std::ranges::find(condition.spellings, part, &PartSpelling::part);
+    if (spelling != condition.spellings.end())
+        return spelledTokens(tokens.subspan(spelling->first, spelling->last - spelling->first + 1));
+    const SymbolicExpr& node = *table.get(part);
+    if (!comparisonOps.contains(node.op()))
+        return std::nullopt;
+    const MacroUnknown* const unknown = unknowns.find(node.getInput(0));
+    const SymbolicExpr* const literal = table.get(node.getInput(1));
+    if (unknown == nullptr || literal->op() != SymbolicOp::IntValue)
+        return std::nullopt;
+    const int value = static_cast<const SymbolicIntValue*>(literal)->getValue();
+    const bool ofTwo = unknown->kind == MacroUnknown::Kind::Comparison;
+    if (unknown->kind == MacroUnknown::Kind::Defined || (ofTwo && value != 0))
+        return std::nullopt;
+    std::string text = unknown->left;
+    text.append(" ").append(operatorInfo(node.op()).c).append(" ");
+    return text.append(ofTwo ? unknown->right : std::to_string(value));
+}
+
+} // namespace
+
+std::optional<std::string> proposalText(const SymbolicExprTable& table, const MacroUnknowns& unknowns,
+                                        const DirectiveCondition& condition, std::span<const DirectiveToken> tokens,
+                                        SymbolicExprId proposal) {
+    struct Piece {
+        SymbolicExprId id; ///< invalid for a text
+        SymbolicOp around;
+        const char* text;
+    };
+
+    std::string result;
+    std::vector<Piece> pieces{{proposal, SymbolicOp::None, ""}};
+    while (!pieces.empty()) {
+        const Piece piece = pieces.back();
+        pieces.pop_back();
+        if (piece.id == invalidId) {
+            result.append(piece.text);
+            continue;
+        }
+        const SymbolicExpr& node = *table.get(piece.id);
+        if (node.op() != SymbolicOp::And && node.op() != SymbolicOp::Or) {
+            const auto text = partText(table, unknowns, condition, tokens, piece.id);
+            if (!text)
+                return std::nullopt;
+            result.append(*text);
+            continue;
+        }
+        const bool isAnd = node.op() == SymbolicOp::And;
+        const bool brackets = (isAnd && piece.around == SymbolicOp::Or && condition.bracketed) ||
+                              (!isAnd && piece.around == SymbolicOp::And);
+        if (brackets)
+            pieces.push_back({invalidId, SymbolicOp::None, ")"});
+        pieces.push_back({node.getInput(1), node.op(), ""});
+        pieces.push_back({invalidId, SymbolicOp::None, isAnd ? " && " : " || "});
+        pieces.push_back({node.getInput(0), node.op(), ""});
+        if (brackets)
+            pieces.push_back({invalidId, SymbolicOp::None, "("});
+    }
+    return result;
+}
+
+} // namespace VT

@@ -1,0 +1,314 @@
+#include "base/scan/DirectiveCondition.hpp"
+
+#include <algorithm>
+#include <array>
+#include <utility>
+
+namespace VT {
+
+namespace {
+
+constexpr std::size_t mostTokens = 4096; ///< of a condition that is looked into
+constexpr std::uint8_t loosest = 255;
+
+constexpr auto infixOperators = std::to_array<std::pair<std::string_view, SymbolicOp>>({
+    {"&&", SymbolicOp::And},
+    {"||", SymbolicOp::Or},
+    {"==", SymbolicOp::Equal},
+    {"!=", SymbolicOp::NotEqual},
+    {">=", SymbolicOp::GreaterThanEqual},
+    {"<=", SymbolicOp::LessThanEqual},
+    {">", SymbolicOp::GreaterThan},
+    {"<", SymbolicOp::LessThan},
+    {"+", SymbolicOp::Plus},
+    {"-", SymbolicOp::Minus},
+    {"*", SymbolicOp::Multiply},
+    {"/", SymbolicOp::Divide},
+    {"%", SymbolicOp::Modulo},
+    {"&", SymbolicOp::BitAnd},
+    {"|", SymbolicOp::BitOr},
+    {"^", SymbolicOp::BitXOr},
+    {"<<", SymbolicOp::ShiftLeft},
+    {">>", SymbolicOp::ShiftRight},
+    {"and", SymbolicOp::And},
+    {"or", SymbolicOp::Or},
+    {"not_eq", SymbolicOp::NotEqual},
+    {"bitand", SymbolicOp::BitAnd},
+    {"bitor", SymbolicOp::BitOr},
+    {"xor", SymbolicOp::BitXOr},
+});
+
+SymbolicOp infixOf(const DirectiveToken& token) {
+    const bool mayBe = token.kind == DirectiveTokenKind::Operator || token.kind == DirectiveTokenKind::Name;
+    const auto* const known =
+        std::ranges::find(infixOperators, token.text, [](const auto& each) -> std::string_view { return each.first; });
+    return mayBe && known != infixOperators.end() ? known->second : SymbolicOp::None;
+}
+
+/// The operator of a prefix; Plus for a plus, None for none.
+SymbolicOp prefixOf(std::string_view text) {
+    return text == "!" || text == "not"     ? SymbolicOp::Not
+           : text == "-"                    ? SymbolicOp::UnaryMinus
+           : text == "~" || text == "compl" ? SymbolicOp::BitCompl
+           : text == "+"                    ? SymbolicOp::Plus
+                                            : SymbolicOp::None;
+}
+
+bool isWord(const DirectiveToken& token) {
+    return token.kind != DirectiveTokenKind::Operator;
+}
+
+} // namespace
+
+std::string spelledTokens(std::span<const DirectiveToken> tokens, bool compact) {
+    std::string text;
+    for (std::size_t i = 0; i < tokens.size(); ++i) {
+        const bool needed = i != 0 && isWord(tokens[i - 1]) && isWord(tokens[i]);
+        if (i != 0 && (compact ? needed : tokens[i].afterBlank))
+            text.push_back(' ');
+        text.append(tokens[i].text);
+    }
+    return text;
+}
+
+DirectiveCondition DirectiveConditionReader::read(const Directive& directive) {
+    tokens_ = directive.tokens;
+    condition_ = {};
+    const bool isExpression = directive.kind == DirectiveKind::If || directive.kind == DirectiveKind::Elif;
+    if (isExpression) {
+        if (tokens_.size() > mostTokens || !parse())
+            readAsWhole();
+    } else if (tokens_.empty() || tokens_[0].kind != DirectiveTokenKind::Name) {
+        readAsWhole();
+    } else {
+        condition_.node = use(unknowns_.defined(states_.nameOf(tokens_[0].text)));
+        if (directive.kind == DirectiveKind::Ifndef || directive.kind == DirectiveKind::Elifndef)
+            condition_.node = SymbolicNotExpr(table_, condition_.node).getId(table_);
+    }
+    std::ranges::sort(condition_.unknowns);
+    const auto repeated = std::ranges::unique(condition_.unknowns);
+    condition_.unknowns.erase(repeated.begin(), repeated.end());
+    return std::move(condition_);
+}
+
+/// An unknown as a whole: equal conditions are still equal, but for those beyond the bound.
+void DirectiveConditionReader::readAsWhole() {
+    condition_ = {};
+    condition_.understood = false;
+    bool unstable = tokens_.empty() || tokens_.size() > mostTokens;
+    if (unstable) {
+        condition_.node = use(unknowns_.unique("?"));
+        return;
+    }
+    const auto last = static_cast<std::uint32_t>(tokens_.size() - 1);
+    const auto names = macros(0, last, unstable);
+    condition_.node =
+        use(unstable ? unknowns_.unique("?") : unknowns_.term(text(0, last, true), text(0, last, false), names));
+}
+
+// Reading.
+
+bool DirectiveConditionReader::parse() {
+    operands_.clear();
+    operations_.clear();
+    bool operandExpected = true;
+    for (std::uint32_t i = 0; i < tokens_.size(); ++i) {
+        const DirectiveToken& token = tokens_[i];
+        if (operandExpected) {
+            const SymbolicOp prefix = prefixOf(token.text);
+            if (token.text == "(")
+                operations_.push_back({SymbolicOp::None, true, loosest, i});
+            else if (prefix != SymbolicOp::None)
+                operations_.push_back({prefix, true, operatorInfo(SymbolicOp::Not).precedence, i});
+            else if (readOperand(i))
+                operandExpected = false;
+            else
+                return false;
+        } else if (token.text == ")") {
+            if (!closeParenthesis(i))
+                return false;
+        } else {
+            if (!readInfix(i))
+                return false;
+            operandExpected = true;
+        }
+    }
+    if (operandExpected)
+        return false;
+    reduceTo(loosest - 1);
+    if (!operations_.empty())
+        return false;
+    const Operand& whole = operands_.back();
+    if (whole.kind == Operand::Kind::Constant)
+        condition_.constant = whole.constant.bits != 0;
+    condition_.node = truth(whole);
+    return true;
+}
+
+bool DirectiveConditionReader::readOperand(std::uint32_t& token) {
+    const DirectiveToken& read = tokens_[token];
+    Operand operand{.first = token, .last = token, .innerFirst = token, .innerLast = token};
+    std::optional<DirectiveConstant> constant;
+    switch (read.kind) {
+    case DirectiveTokenKind::Number:
+        constant = readConstant(read.text);
+        break;
+    case DirectiveTokenKind::Character:
+        constant = readCharacter(read.text);
+        break;
+    case DirectiveTokenKind::Name:
+        if (read.text == "defined")
+            return readDefined(token);
+        if (infixOf(read) != SymbolicOp::None)
+            return false;
+        if (token + 1 < tokens_.size() && tokens_[token + 1].text == "(")
+            return readCall(token);
+        if (read.text == "true" || read.text == "false") { // with a value though not defined, or a macro
+            if (truthConstants_)
+                constant = DirectiveConstant{read.text == "true" ? 1U : 0U, false};
+        } else if (read.text != "__LINE__" && read.text != "__COUNTER__") {
+            operand.kind = Operand::Kind::Value;
+        }
+        break;
+    default:
+        return false;
+    }
+    if (constant) {
+        operand.kind = Operand::Kind::Constant;
+        operand.constant = *constant;
+    }
+    operands_.push_back(operand);
+    return true;
+}
+
+bool DirectiveConditionReader::readDefined(std::uint32_t& token) {
+    const std::uint32_t first = token;
+    const auto is = [&](std::uint32_t at, std::string_view text) {
+        return at < tokens_.size() && tokens_[at].text == text;
+    };
+    const bool bracketed = is(token + 1, "(");
+    token += bracketed ? 2 : 1;
+    if (token >= tokens_.size() || tokens_[token].kind != DirectiveTokenKind::Name ||
+        (bracketed && !is(token + 1, ")")))
+        return false;
+    const MacroUnknownId defined = unknowns_.defined(states_.nameOf(tokens_[token].text));
+    token += bracketed ? 1 : 0;
+    operands_.push_back(truthOf(use(defined), first, token));
+    return true;
+}
+
+bool DirectiveConditionReader::readCall(std::uint32_t& token) {
+    const std::uint32_t first = token;
+    std::size_t open = 0;
+    for (++token; token < tokens_.size(); ++token) {
+        open += tokens_[token].text == "(" ? 1U : 0U;
+        open -= tokens_[token].text == ")" ? 1U : 0U;
+        if (open == 0) {
+            operands_.push_back({.first = first, .last = token, .innerFirst = first, .innerLast = token});
+            return true;
+        }
+    }
+    return false;
+}
+
+bool DirectiveConditionReader::readInfix(std::uint32_t token) {
+    const SymbolicOp op = infixOf(tokens_[token]);
+    if (op == SymbolicOp::None)
+        return false;
+    const std::uint8_t precedence = operatorInfo(op).precedence;
+    reduceTo(precedence);
+    operations_.push_back({op, false, precedence, token});
+    return true;
+}
+
+bool DirectiveConditionReader::closeParenthesis(std::uint32_t token) {
+    reduceTo(loosest - 1);
+    if (operations_.empty())
+        return false;
+    operands_.back().first = operations_.back().token;
+    operands_.back().last = token;
+    operations_.pop_back();
+    return true;
+}
+
+// Joining.
+
+/// Applies the operators that bind at least so tightly.
+void DirectiveConditionReader::reduceTo(std::uint8_t precedence) {
+    while (!operations_.empty() && operations_.back().precedence <= precedence)
+        reduce();
+}
+
+void DirectiveConditionReader::reduce() {
+    const Operation operation = operations_.back();
+    operations_.pop_back();
+    const Operand b = operands_.back();
+    operands_.pop_back();
+    if (operation.prefix) {
+        operands_.push_back(prefixed(operation, b));
+        return;
+    }
+    const Operand a = operands_.back();
+    operands_.pop_back();
+    operands_.push_back(joined(operation.op, a, b));
+}
+
+DirectiveConditionReader::Operand DirectiveConditionReader::truthOf(SymbolicExprId node, std::uint32_t first,
+                                                                    std::uint32_t last) {
+    condition_.spellings.push_back({node, first, last});
+    return {.kind = Operand::Kind::Truth,
+            .first = first,
+            .last = last,
+            .innerFirst = first,
+            .innerLast = last,
+            .truth = node};
+}
+
+SymbolicExprId DirectiveConditionReader::truth(const Operand& operand) {
+    if (operand.kind == Operand::Kind::Truth)
+        return operand.truth;
+    const SymbolicExprId node = operand.kind == Operand::Kind::Constant
+                                    ? use(unknowns_.unique(text(operand.innerFirst, operand.innerLast, false)))
+                                    : symbol(operand);
+    condition_.spellings.push_back({node, operand.innerFirst, operand.innerLast});
+    return node;
+}
+
+/// The symbol of a value or a term.
+SymbolicExprId DirectiveConditionReader::symbol(const Operand& operand) {
+    if (operand.kind == Operand::Kind::Value)
+        return use(unknowns_.value(states_.nameOf(tokens_[operand.innerFirst].text)));
+    bool unstable = false;
+    const auto names = macros(operand.innerFirst, operand.innerLast, unstable);
+    std::string shown = text(operand.innerFirst, operand.innerLast, false);
+    if (unstable)
+        return use(unknowns_.unique(std::move(shown)));
+    return use(unknowns_.term(text(operand.innerFirst, operand.innerLast, true),
+                              operand.compound ? "(" + shown + ")" : shown, names));
+}
+
+SymbolicExprId DirectiveConditionReader::use(MacroUnknownId unknown) {
+    condition_.unknowns.push_back(unknown);
+    return unknowns_[unknown].node;
+}
+
+// Texts.
+
+std::string DirectiveConditionReader::text(std::uint32_t first, std::uint32_t last, bool compact) const {
+    return spelledTokens(tokens_.subspan(first, last - first + 1), compact);
+}
+
+/// The macros that a text names; `unstable` where it may change between any two directives.
+std::vector<MacroStates::Name> DirectiveConditionReader::macros(std::uint32_t first, std::uint32_t last,
+                                                                bool& unstable) {
+    std::vector<MacroStates::Name> names;
+    for (std::uint32_t i = first; i <= last; ++i) {
+        if (tokens_[i].kind != DirectiveTokenKind::Name)
+            continue;
+        names.push_back(states_.nameOf(tokens_[i].text));
+        unstable = unstable || tokens_[i].text == "__LINE__" || tokens_[i].text == "__COUNTER__";
+    }
+    return names;
+}
+
+} // namespace VT

@@ -1,0 +1,106 @@
+// Conditions of #if and #elif become nodes.
+//
+// A macro stands for one integer, signed or unsigned, of 64 bits; one that is not defined is 0.  Understood are && ||
+// !, defined, and comparisons of a macro with a constant that is the same integer for both kinds of macros: not
+// negative, not unsigned where it is ordered, and no more than an int.  Any other comparison of two terms is an unknown
+// of its own that is negative, zero or positive, so that A < B and A >= B are opposites but nothing follows for a third
+// macro: one of them may be unsigned.  Other arithmetic is an unknown of its own, equal where its text is equal; so are
+// calls of macros, __has_include() and the like.  Constants are computed.
+//
+// A constant that is a condition by itself (#if 0, #if 1 && A) is a switch set by hand: nothing follows from it.
+#pragma once
+
+#include "base/scan/ConstantArithmetic.hpp"
+#include "base/scan/DirectiveReader.hpp"
+#include "base/scan/MacroUnknowns.hpp"
+
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace VT {
+
+/// How a part of a condition is written: tokens from `first` to `last`.
+struct PartSpelling {
+    SymbolicExprId part;
+    std::uint32_t first;
+    std::uint32_t last;
+};
+
+struct DirectiveCondition {
+    SymbolicExprId node = invalidId;
+    std::optional<bool> constant;         ///< a switch as a whole
+    bool understood = true;               ///< false: an unknown as a whole
+    bool bracketed = false;               ///< && is in parentheses between ||
+    std::vector<MacroUnknownId> unknowns; ///< each once
+    std::vector<PartSpelling> spellings;  ///< of what && and || join
+};
+
+/// The text of tokens: with one blank where there was any, or with none that is not needed.
+std::string spelledTokens(std::span<const DirectiveToken> tokens, bool compact = false);
+
+/// Reads conditions of one file, in its order.
+class DirectiveConditionReader {
+public:
+    /// With `truthConstants`, true and false are constants, as in C++; unknowns otherwise.
+    DirectiveConditionReader(SymbolicExprTable& table, MacroStates& states, MacroUnknowns& unknowns,
+                             bool truthConstants)
+        : table_(table),
+          states_(states),
+          unknowns_(unknowns),
+          truthConstants_(truthConstants) {}
+
+    /// The condition of a directive that has one.  Linear in its tokens.
+    DirectiveCondition read(const Directive& directive);
+
+private:
+    struct Operand {
+        enum class Kind : std::uint8_t { Constant, Truth, Value, Term } kind = Kind::Term;
+        bool compound = false;   ///< a term made by operators
+        std::uint32_t first = 0; ///< tokens, with parentheses around it
+        std::uint32_t last = 0;
+        std::uint32_t innerFirst = 0; ///< without them
+        std::uint32_t innerLast = 0;
+        DirectiveConstant constant{};
+        SymbolicExprId truth = invalidId;
+    };
+
+    struct Operation {
+        SymbolicOp op; ///< None for an open parenthesis
+        bool prefix;
+        std::uint8_t precedence;
+        std::uint32_t token;
+    };
+
+    bool parse();
+    bool readOperand(std::uint32_t& token);
+    bool readInfix(std::uint32_t token);
+    bool closeParenthesis(std::uint32_t token);
+    bool readDefined(std::uint32_t& token);
+    bool readCall(std::uint32_t& token);
+    void reduceTo(std::uint8_t precedence);
+    void reduce();
+    Operand prefixed(const Operation& operation, const Operand& a);
+    Operand joined(SymbolicOp op, const Operand& a, const Operand& b);
+    Operand compared(SymbolicOp op, const Operand& a, const Operand& b);
+    Operand truthOf(SymbolicExprId node, std::uint32_t first, std::uint32_t last);
+    Operand difference(SymbolicOp op, const Operand& a, const Operand& b);
+    SymbolicExprId truth(const Operand& operand);
+    SymbolicExprId symbol(const Operand& operand);
+    SymbolicExprId use(MacroUnknownId unknown);
+    void readAsWhole();
+
+    [[nodiscard]] std::string text(std::uint32_t first, std::uint32_t last, bool compact) const;
+    [[nodiscard]] std::vector<MacroStates::Name> macros(std::uint32_t first, std::uint32_t last, bool& unstable);
+
+    SymbolicExprTable& table_;
+    MacroStates& states_;
+    MacroUnknowns& unknowns_;
+    bool truthConstants_;
+    std::span<const DirectiveToken> tokens_;
+    DirectiveCondition condition_;
+    std::vector<Operand> operands_;
+    std::vector<Operation> operations_;
+};
+
+} // namespace VT

@@ -1,0 +1,100 @@
+// What operators of directives' conditions make of their operands.
+#include "base/scan/DirectiveCondition.hpp"
+#include "base/service/ImpliedCondition.hpp"
+
+#include <algorithm>
+#include <limits>
+
+namespace VT {
+
+DirectiveConditionReader::Operand DirectiveConditionReader::prefixed(const Operation& operation, const Operand& a) {
+    const std::uint32_t first = operation.token;
+    Operand result{.compound = true, .first = first, .last = a.last, .innerFirst = first, .innerLast = a.last};
+    if (a.kind == Operand::Kind::Constant) {
+        const auto value =
+            operation.op == SymbolicOp::Plus ? std::optional(a.constant) : computeConstant(operation.op, a.constant);
+        if (value) {
+            result.kind = Operand::Kind::Constant;
+            result.constant = *value;
+            return result;
+        }
+    }
+    if (operation.op == SymbolicOp::Not)
+        return truthOf(SymbolicNotExpr(table_, truth(a)).getId(table_), first, a.last);
+    return result;
+}
+
+DirectiveConditionReader::Operand DirectiveConditionReader::joined(SymbolicOp op, const Operand& a, const Operand& b) {
+    if (op == SymbolicOp::And || op == SymbolicOp::Or) {
+        for (const Operand* const each : {&a, &b})
+            condition_.bracketed = condition_.bracketed || (op == SymbolicOp::Or && each->first != each->innerFirst &&
+                                                            each->kind == Operand::Kind::Truth &&
+                                                            table_.get(each->truth)->op() == SymbolicOp::And);
+        const SymbolicExprId left = truth(a);
+        const SymbolicExprId right = truth(b);
+        const SymbolicExprId node = op == SymbolicOp::And ? SymbolicAndExpr(table_, left, right).getId(table_)
+                                                          : SymbolicOrExpr(table_, left, right).getId(table_);
+        return {.kind = Operand::Kind::Truth,
+                .first = a.first,
+                .last = b.last,
+                .innerFirst = a.first,
+                .innerLast = b.last,
+                .truth = node};
+    }
+    Operand result{.compound = true, .first = a.first, .last = b.last, .innerFirst = a.first, .innerLast = b.last};
+    if (a.kind == Operand::Kind::Constant && b.kind == Operand::Kind::Constant) {
+        if (const auto value = computeConstant(op, a.constant, b.constant)) {
+            result.kind = Operand::Kind::Constant;
+            result.constant = *value;
+        }
+        return result;
+    }
+    return comparisonOps.contains(op) ? compared(op, a, b) : result;
+}
+
+DirectiveConditionReader::Operand DirectiveConditionReader::compared(SymbolicOp op, const Operand& a,
+                                                                     const Operand& b) {
+    using Kind = Operand::Kind;
+    if (a.kind == Kind::Constant)
+        return compared(operatorInfo(op).mirrored, b, a);
+    if (b.kind != Kind::Constant)
+        return difference(op, a, b);
+    const std::uint32_t first = std::min(a.first, b.first);
+    const std::uint32_t last = std::max(a.last, b.last);
+    if (a.kind == Kind::Truth) {
+        const bool ofFalse = computeConstant(op, {0, false}, b.constant)->bits != 0;
+        const bool ofTrue = computeConstant(op, {1, false}, b.constant)->bits != 0;
+        if (ofFalse != ofTrue)
+            return truthOf(ofTrue ? a.truth : SymbolicNotExpr(table_, a.truth).getId(table_), first, last);
+        Operand constant{.kind = Kind::Constant, .first = first, .last = last, .innerFirst = first, .innerLast = last};
+        constant.constant.bits = ofTrue ? 1 : 0;
+        return constant;
+    }
+    const bool ordered = op != SymbolicOp::Equal && op != SymbolicOp::NotEqual;
+    if (b.constant.bits > static_cast<std::uint64_t>(std::numeric_limits<int>::max()) ||
+        (ordered && b.constant.isUnsigned))
+        return difference(op, a, b);
+    return truthOf(compareWith(table_, op, symbol(a), static_cast<int>(b.constant.bits)), first, last);
+}
+
+/// A comparison as one of an unknown with 0.
+DirectiveConditionReader::Operand DirectiveConditionReader::difference(SymbolicOp op, const Operand& a,
+                                                                       const Operand& b) {
+    const auto key = [&](const Operand& each) { return text(each.innerFirst, each.innerLast, true); };
+    const auto shown = [&](const Operand& each) { return text(each.first, each.last, false); };
+    const std::string keyA = key(a);
+    const std::string keyB = key(b);
+    const bool swapped = keyB < keyA;
+    bool unstable = false;
+    std::vector<MacroStates::Name> names = macros(a.first, a.last, unstable);
+    for (const MacroStates::Name name : macros(b.first, b.last, unstable))
+        names.push_back(name);
+    const MacroUnknownId unknown =
+        unstable ? unknowns_.unique("?")
+                 : unknowns_.comparison((swapped ? keyB : keyA) + "\n=\n" + (swapped ? keyA : keyB),
+                                        shown(swapped ? b : a), shown(swapped ? a : b), names);
+    const SymbolicExprId node = compareWith(table_, swapped ? operatorInfo(op).mirrored : op, use(unknown), 0);
+    return truthOf(node, std::min(a.first, b.first), std::max(a.last, b.last));
+}
+
+} // namespace VT

@@ -1,0 +1,334 @@
+#include "base/scan/DirectiveReader.hpp"
+
+#include <algorithm>
+#include <array>
+#include <utility>
+
+namespace VT {
+
+namespace {
+
+enum class Class : std::uint8_t { Plain, Name, Digit, Blank, NewLine, Slash, Quote, Backslash };
+
+constexpr std::array<Class, 256> classes = [] {
+    std::array<Class, 256> table{};
+    for (unsigned c = 0; c < 256; ++c)
+        if ((c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || c == '_' || c == '$' || c >= 0x80)
+            table[c] = Class::Name;
+        else if (c >= '0' && c <= '9')
+            table[c] = Class::Digit;
+    for (const unsigned char c : {' ', '\t', '\v', '\f', '\r', '\0'})
+        table[c] = Class::Blank;
+    table['\n'] = Class::NewLine;
+    table['/'] = Class::Slash;
+    table['"'] = table['\''] = Class::Quote;
+    table['\\'] = Class::Backslash;
+    return table;
+}();
+
+Class classOf(char c) {
+    return classes[static_cast<unsigned char>(c)];
+}
+
+bool isOfName(char c) {
+    return classOf(c) == Class::Name || classOf(c) == Class::Digit;
+}
+
+bool isRawPrefix(std::string_view name) {
+    return name == "R" || name == "LR" || name == "uR" || name == "UR" || name == "u8R";
+}
+
+constexpr std::size_t longestRawDelimiter = 16;
+constexpr unsigned mostEndlessRawStrings = 8; ///< each is looked for up to the end of the text
+
+constexpr auto keywords = std::to_array<std::pair<std::string_view, DirectiveKind>>({
+    {"if", DirectiveKind::If},
+    {"ifdef", DirectiveKind::Ifdef},
+    {"ifndef", DirectiveKind::Ifndef},
+    {"elif", DirectiveKind::Elif},
+    {"elifdef", DirectiveKind::Elifdef},
+    {"elifndef", DirectiveKind::Elifndef},
+    {"else", DirectiveKind::Else},
+    {"endif", DirectiveKind::Endif},
+    {"define", DirectiveKind::Define},
+    {"undef", DirectiveKind::Undef},
+    {"include", DirectiveKind::Include},
+    {"include_next", DirectiveKind::Include},
+    {"import", DirectiveKind::Include},
+    {"pragma", DirectiveKind::Pragma},
+});
+
+constexpr auto longOperators =
+    std::to_array<std::string_view>({"&&", "||", "==", "!=", "<=", ">=", "<<", ">>", "##", "->"});
+constexpr std::string_view shortOperators = "()!~+-*/%<>&^|?:,=#.;[]{}";
+
+/// Whether a token of a definition can name a macro that its value hangs on.
+constexpr bool isKept(DirectiveKind kind, DirectiveTokenKind token) {
+    return kind != DirectiveKind::Define || token == DirectiveTokenKind::Name;
+}
+
+} // namespace
+
+DirectiveReader::DirectiveReader(std::string_view text) : text_(text) {
+    if (text_.starts_with("\xEF\xBB\xBF"))
+        place_ = 3;
+}
+
+std::size_t DirectiveReader::behindSplices(std::size_t place) const {
+    while (at(place) == '\\') {
+        std::size_t end = place + 1;
+        while (end < text_.size() && classOf(text_[end]) == Class::Blank)
+            ++end;
+        if (at(end) != '\n')
+            break;
+        place = end + 1;
+    }
+    return place;
+}
+
+bool DirectiveReader::beginsComment(std::size_t place) const {
+    if (at(place) != '/')
+        return false;
+    const char next = at(behindSplices(place + 1));
+    return next == '/' || next == '*';
+}
+
+std::size_t DirectiveReader::behindComment(std::size_t place) const {
+    place = behindSplices(place + 1);
+    if (at(place++) == '*') {
+        while ((place = text_.find('*', place)) != std::string_view::npos) {
+            const std::size_t next = behindSplices(++place);
+            if (at(next) == '/')
+                return next + 1;
+        }
+        return text_.size();
+    }
+    while ((place = text_.find('\n', place)) != std::string_view::npos) {
+        std::size_t last = place;
+        while (last > 0 && text_[last - 1] != '\n' && classOf(text_[last - 1]) == Class::Blank)
+            --last;
+        if (last == 0 || text_[last - 1] != '\\')
+            return place;
+        ++place;
+    }
+    return text_.size();
+}
+
+/// The place behind a literal; that of the end of its line where it has no end.
+std::size_t DirectiveReader::behindQuoted(std::size_t place) const {
+    const char quote = text_[place++];
+    while (place < text_.size() && text_[place] != quote && text_[place] != '\n') {
+        if (text_[place] != '\\') {
+            ++place;
+            continue;
+        }
+        const std::size_t next = behindSplices(place);
+        place = next != place ? next : behindSplices(place + 1) + 1; // a splice, or an escaped character
+    }
+    return at(place) == quote ? place + 1 : std::min(place, text_.size());
+}
+
+/// The place behind a raw string whose quote is given; the place of the quote where it is none.
+std::size_t DirectiveReader::behindRawString(std::size_t quote) {
+    if (endlessRawStrings_ == mostEndlessRawStrings)
+        return quote;
+    const std::size_t open = text_.substr(0, quote + 2 + longestRawDelimiter).find('(', quote + 1);
+    if (open == std::string_view::npos)
+        return quote;
+    const std::string_view delimiter = text_.substr(quote + 1, open - quote - 1);
+    if (delimiter.find_first_of(" \t\v\f\r\n\\)\"") != std::string_view::npos)
+        return quote;
+    std::string end(1, ')');
+    end.append(delimiter).push_back('"');
+    const std::size_t close = text_.find(end, open);
+    endlessRawStrings_ += close == std::string_view::npos ? 1U : 0U;
+    return close == std::string_view::npos ? quote : close + end.size();
+}
+
+/// Passes blanks, comments and splices; whether there were any.
+bool DirectiveReader::skipBlanks() {
+    const std::size_t before = place_;
+    while (place_ < text_.size()) {
+        const Class kind = classOf(text_[place_]);
+        const std::size_t next = kind == Class::Blank                            ? place_ + 1
+                                 : kind == Class::Backslash                      ? behindSplices(place_)
+                                 : kind == Class::Slash && beginsComment(place_) ? behindComment(place_)
+                                                                                 : place_;
+        if (next == place_)
+            break;
+        commentPassed_ = commentPassed_ || kind == Class::Slash;
+        place_ = next;
+    }
+    return place_ != before;
+}
+
+/// Passes the rest of a logical line.
+void DirectiveReader::skipLine() {
+    while (place_ < text_.size()) {
+        switch (classOf(text_[place_])) {
+        case Class::NewLine:
+            ++place_;
+            return;
+        case Class::Name:
+        case Class::Digit: {
+            const bool number = classOf(text_[place_]) == Class::Digit;
+            const std::size_t begin = place_++;
+            while (place_ < text_.size() &&
+                   (isOfName(text_[place_]) || (number && text_[place_] == '\'' && isOfName(at(place_ + 1)))))
+                ++place_;
+            if (at(place_) == '"' && isRawPrefix(text_.substr(begin, place_ - begin)))
+                place_ = behindRawString(place_);
+            break;
+        }
+        case Class::Slash:
+            place_ = beginsComment(place_) ? behindComment(place_) : place_ + 1;
+            break;
+        case Class::Quote:
+            place_ = behindQuoted(place_);
+            break;
+        case Class::Backslash:
+            place_ = std::max(place_ + 1, behindSplices(place_));
+            break;
+        default:
+            ++place_;
+        }
+    }
+}
+
+/// A name, or what the preprocessor takes for a number; a text of its own where splices were inside.
+std::string_view DirectiveReader::readRun(bool number) {
+    std::size_t begin = place_;
+    std::string* joined = nullptr;
+    for (;;) {
+        while (place_ < text_.size()) {
+            const char c = text_[place_];
+            const char before = place_ == begin ? '\0' : text_[place_ - 1];
+            const bool sign = (c == '+' || c == '-') && std::string_view("eEpP").find(before) != std::string_view::npos;
+            if (!isOfName(c) &&
+                !(number && (c == '.' || (sign && before != '\0') || (c == '\'' && isOfName(at(place_ + 1))))))
+                break;
+            ++place_;
+        }
+        const std::size_t next = behindSplices(place_);
+        if (next == place_ || !isOfName(at(next)))
+            break;
+        if (joined == nullptr)
+            joined = &joined_.emplace_back();
+        joined->append(text_.substr(begin, place_ - begin));
+        begin = place_ = next;
+    }
+    const std::string_view last = text_.substr(begin, place_ - begin);
+    return joined == nullptr ? last : std::string_view(joined->append(last));
+}
+
+/// Reads a token of the line; false at its end.
+bool DirectiveReader::readToken(bool afterBlank, DirectiveToken& token) {
+    if (place_ >= text_.size() || text_[place_] == '\n')
+        return false;
+    const std::size_t begin = place_;
+    const char c = text_[begin];
+    token = {DirectiveTokenKind::Other, afterBlank, {}, begin, begin};
+    const std::size_t next = behindSplices(begin + 1);
+    if (classOf(c) == Class::Digit || (c == '.' && classOf(at(next)) == Class::Digit)) {
+        token.kind = DirectiveTokenKind::Number;
+        token.text = readRun(true);
+    } else if (classOf(c) == Class::Name) {
+        token.kind = DirectiveTokenKind::Name;
+        token.text = readRun(false);
+        const bool raw = at(place_) == '"' && isRawPrefix(token.text);
+        const std::size_t end = raw ? behindRawString(place_) : place_;
+        const bool prefix = token.text == "L" || token.text == "u" || token.text == "U" || token.text == "u8";
+        if (raw && end != place_)
+            token.kind = DirectiveTokenKind::String;
+        else if (prefix && classOf(at(place_)) == Class::Quote)
+            token.kind = at(place_) == '"' ? DirectiveTokenKind::String : DirectiveTokenKind::Other;
+        if (token.kind != DirectiveTokenKind::Name) {
+            place_ = raw ? end : behindQuoted(place_);
+            token.text = text_.substr(begin, place_ - begin);
+        }
+    } else if (classOf(c) == Class::Quote) {
+        token.kind = c == '"' ? DirectiveTokenKind::String : DirectiveTokenKind::Character;
+        place_ = behindQuoted(begin);
+        token.text = text_.substr(begin, place_ - begin);
+    } else {
+        for (const std::string_view spelling : longOperators)
+            if (spelling[0] == c && spelling[1] == at(next)) {
+                token.kind = DirectiveTokenKind::Operator;
+                token.text = spelling;
+                place_ = next + 1;
+            }
+        if (token.text.empty()) {
+            place_ = begin + 1;
+            const std::size_t known = shortOperators.find(c);
+            if (known != std::string_view::npos)
+                token.kind = DirectiveTokenKind::Operator;
+            token.text = text_.substr(begin, 1);
+        }
+    }
+    token.end = place_;
+    return true;
+}
+
+std::uint64_t DirectiveReader::lineOf(std::size_t place) {
+    line_ += static_cast<std::uint64_t>(std::count(text_.begin() + static_cast<std::ptrdiff_t>(counted_),
+                                                   text_.begin() + static_cast<std::ptrdiff_t>(place), '\n'));
+    counted_ = place;
+    return line_;
+}
+
+/// Reads a directive behind its mark; false for a kind that is of no interest.
+bool DirectiveReader::readDirective(Directive& directive) {
+    directive.line = lineOf(directive.begin);
+    skipBlanks();
+    directive.keyword = place_;
+    if (classOf(at(place_)) != Class::Name || place_ >= text_.size())
+        return false;
+    const std::string_view word = readRun(false);
+    const auto* const known =
+        std::ranges::find(keywords, word, [](const auto& each) -> std::string_view { return each.first; });
+    if (known == keywords.end())
+        return false;
+    directive.kind = known->second;
+    directive.keywordEnd = directive.end = place_;
+    commentPassed_ = false;
+    bool blank = skipBlanks();
+    if (directive.kind == DirectiveKind::Include) { // a header's name is no token: <sys//types.h>
+        if (at(place_) == '<')
+            place_ = std::min(text_.find_first_of(">\n", place_), text_.size());
+        skipLine();
+        return true;
+    }
+    DirectiveToken token{};
+    while (readToken(blank, token)) {
+        directive.end = token.end;
+        directive.hasComment = commentPassed_; // up to this token
+        if (isKept(directive.kind, token.kind))
+            tokens_.push_back(token);
+        blank = skipBlanks();
+    }
+    directive.tokens = tokens_;
+    return true;
+}
+
+bool DirectiveReader::next(Directive& directive) {
+    while (place_ < text_.size()) {
+        skipBlanks();
+        const std::size_t begin = place_;
+        const bool digraph = at(begin) == '%' && at(behindSplices(begin + 1)) == ':';
+        if (at(begin) != '#' && !digraph) {
+            skipLine();
+            continue;
+        }
+        place_ = digraph ? behindSplices(begin + 1) + 1 : begin + 1;
+        tokens_.clear();
+        joined_.clear();
+        directive = {};
+        directive.begin = begin;
+        if (readDirective(directive))
+            return true;
+        skipLine();
+    }
+    return false;
+}
+
+} // namespace VT

@@ -1,0 +1,90 @@
+// The preprocessor directives of a C or C++ file.
+#pragma once
+
+#include "host/Export.hpp"
+
+#include <cstddef>
+#include <cstdint>
+#include <deque>
+#include <span>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace VT {
+
+enum class DirectiveTokenKind : std::uint8_t { Name, Number, Character, String, Operator, Other };
+
+struct DirectiveToken {
+    DirectiveTokenKind kind;
+    bool afterBlank;       ///< blanks or a comment stand before it
+    std::string_view text; ///< without line splices; operators in their ordinary spelling
+    std::size_t begin;     ///< byte offsets in the file
+    std::size_t end;
+};
+
+enum class DirectiveKind : std::uint8_t {
+    If,
+    Ifdef,
+    Ifndef,
+    Elif,
+    Elifdef,
+    Elifndef,
+    Else,
+    Endif,
+    Define,
+    Undef,
+    Include,
+    Pragma,
+};
+
+struct Directive {
+    DirectiveKind kind;
+    bool hasComment;    ///< between the keyword and the last token
+    std::uint64_t line; ///< from 1
+    std::size_t begin;  ///< byte offsets: of the #, of the keyword, behind the keyword, behind the last token
+    std::size_t keyword;
+    std::size_t keywordEnd;
+    std::size_t end;
+    std::span<const DirectiveToken> tokens; ///< behind the keyword; of a definition the names alone
+};
+
+/// Reads the directives of a text one by one, as a C preprocessor finds them: behind line splices and comments, not in
+/// comments, string literals, character constants and raw strings.  Blanks between a backslash and the end of its line
+/// are overlooked.  There are no trigraphs.  A literal that does not end on its line ends with it, as in prose that
+/// is left out; what looks like a raw string without an end is an ordinary string.
+///
+/// Linear in the text, which may be any bytes and outlives the reader.
+class VTSYM_API DirectiveReader {
+public:
+    explicit DirectiveReader(std::string_view text);
+
+    /// Reads the next directive of the kinds above; false at the end.  Tokens are valid until the next call.
+    bool next(Directive& directive);
+
+private:
+    [[nodiscard]] char at(std::size_t place) const { return place < text_.size() ? text_[place] : '\0'; }
+
+    [[nodiscard]] std::size_t behindSplices(std::size_t place) const;
+    [[nodiscard]] bool beginsComment(std::size_t place) const;
+    [[nodiscard]] std::size_t behindComment(std::size_t place) const;
+    [[nodiscard]] std::size_t behindQuoted(std::size_t place) const;
+    [[nodiscard]] std::size_t behindRawString(std::size_t quote);
+    bool skipBlanks();
+    void skipLine();
+    std::string_view readRun(bool number);
+    bool readToken(bool afterBlank, DirectiveToken& token);
+    bool readDirective(Directive& directive);
+    std::uint64_t lineOf(std::size_t place);
+
+    std::string_view text_;
+    std::size_t place_ = 0;
+    std::size_t counted_ = 0; ///< up to where lines were counted
+    std::uint64_t line_ = 1;
+    bool commentPassed_ = false;
+    unsigned endlessRawStrings_ = 0;
+    std::vector<DirectiveToken> tokens_;
+    std::deque<std::string> joined_; ///< tokens with splices inside
+};
+
+} // namespace VT

@@ -1,0 +1,82 @@
+// What a file does to macros on its way.
+//
+// A macro's state is a number that is new whenever its value may be.  Two readings of a macro in one state are equal;
+// nothing is known of readings in different states.
+//
+// A macro that the file defines or undefines is another one in all that follows, in the other branches of a chain too.
+// A macro that the file defines by other macros changes with them.  An included file may define what is not defined,
+// which is told apart by the epoch: one more for each #include, but in other branches of its chain, where it was not
+// included.
+#pragma once
+
+#include "base/core/IdMap.hpp"
+
+#include <cstddef>
+#include <cstdint>
+#include <deque>
+#include <span>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace VT {
+
+class MacroStates {
+public:
+    using Name = std::uint32_t;
+
+    struct State {
+        std::uint64_t version; ///< new with every definition that concerns the macro
+        std::uint64_t epoch;   ///< new with every #include
+        bool derived;          ///< the file defines the macro by others
+        bool operator==(const State&) const = default;
+    };
+
+    /// The number of a name.  With `lasting`, the text outlives this and need not be copied.
+    Name nameOf(std::string_view text, bool lasting = false);
+
+    [[nodiscard]] std::string_view textOf(Name name) const { return texts_[name]; }
+
+    /// The macro is defined or undefined here.
+    void change(Name name);
+    /// The macro's definition holds these names.
+    void addBody(Name name, std::span<const Name> body);
+
+    /// Any macro may be defined or undefined.
+    void changeAll() { floor_ = latestFloor_ = ++latest_; }
+
+    /// Macros that are not defined may be.
+    void include() { epoch_ = ++latestEpoch_; }
+
+    /// A chain of branches begins; goes on with its next branch; ends.
+    void open();
+    void nextBranch();
+    void close();
+
+    /// Linear in what the macro is defined by, up to a bound; beyond it every reading is a state of its own.
+    State stateOf(Name name);
+
+private:
+    struct Chain { ///< what was in force where it began
+        std::uint64_t floor;
+        std::uint64_t epoch;
+        std::uint64_t latestFloor;
+        std::uint64_t latestEpoch;
+    };
+
+    IdMap<Name> byHash_;                  ///< the latest name of a hash
+    std::vector<Name> sameHash_;          ///< by name: the one before of its hash, or itself
+    std::vector<std::string_view> texts_; ///< by name
+    std::deque<std::string> copies_;
+    std::vector<std::uint64_t> versions_;   ///< by name
+    std::vector<std::vector<Name>> bodies_; ///< by name: what stands in all its definitions so far
+    std::vector<Chain> chains_;             ///< open
+    std::vector<Name> reached_;             ///< by stateOf()
+    std::uint64_t latest_ = 0;
+    std::uint64_t floor_ = 0; ///< the least version of any macro
+    std::uint64_t latestFloor_ = 0;
+    std::uint64_t epoch_ = 0;
+    std::uint64_t latestEpoch_ = 0;
+};
+
+} // namespace VT

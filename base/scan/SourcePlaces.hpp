@@ -1,0 +1,16 @@
+// Lines and columns of a file.
+#pragma once
+
+#include "base/scan/SourceScan.hpp"
+
+#include <cstddef>
+#include <string_view>
+
+namespace VT {
+
+/// The region between two byte offsets; `line` is that of `anchor`, which stands before them.  Linear in what lies
+/// between the beginning of the anchor's line and the end.
+SourceRegion regionOf(std::string_view text, std::size_t anchor, std::uint64_t line, std::size_t begin,
+                      std::size_t end);
+
+} // namespace VT

@@ -1,0 +1,331 @@
+// One pass over the directives of a file.  What is open is on stacks: chains, and what holds inside them.
+#include "base/scan/SourceScan.hpp"
+
+#include "base/scan/BranchContext.hpp"
+#include "base/scan/BranchVerdict.hpp"
+#include "base/scan/ConditionProposal.hpp"
+#include "base/scan/SourcePlaces.hpp"
+
+#include <utility>
+
+namespace VT {
+
+namespace {
+
+/// Nodes that are kept from file to file; with more, the next file begins anew.
+constexpr std::size_t mostNodes = std::size_t{1} << 20U;
+
+/// Bytes of a directive that a reason quotes.
+constexpr std::size_t mostQuoted = 4096;
+
+using Found = std::function<void(const BranchFinding&)>;
+
+std::string_view keywordText(DirectiveKind kind) {
+    switch (kind) {
+    case DirectiveKind::If:
+        return "#if";
+    case DirectiveKind::Ifdef:
+        return "#ifdef";
+    case DirectiveKind::Ifndef:
+        return "#ifndef";
+    case DirectiveKind::Elif:
+        return "#elif";
+    case DirectiveKind::Elifdef:
+        return "#elifdef";
+    case DirectiveKind::Elifndef:
+        return "#elifndef";
+    default:
+        return "#else";
+    }
+}
+
+bool isExpression(DirectiveKind kind) {
+    return kind == DirectiveKind::If || kind == DirectiveKind::Elif;
+}
+
+bool opensChain(DirectiveKind kind) {
+    return kind == DirectiveKind::If || kind == DirectiveKind::Ifdef || kind == DirectiveKind::Ifndef;
+}
+
+std::string directiveText(const Directive& directive) {
+    std::string text(keywordText(directive.kind));
+    if (directive.kind != DirectiveKind::Else && !directive.tokens.empty())
+        text.append(" ").append(
+            spelledTokens(isExpression(directive.kind) ? directive.tokens : directive.tokens.first(1)));
+    return text;
+}
+
+std::string conditionText(const Directive& directive) {
+    if (isExpression(directive.kind))
+        return spelledTokens(directive.tokens);
+    const bool negated = directive.kind == DirectiveKind::Ifndef || directive.kind == DirectiveKind::Elifndef;
+    std::string text(negated ? "!defined(" : "defined(");
+    return text.append(directive.tokens.front().text).append(")");
+}
+
+/// One file.
+class FileScan {
+public:
+    FileScan(SymbolicExprTable& table, BranchJudge& judge, const SourceScanOptions& options, SourceScanCounts& counts,
+             std::string_view text, bool isCpp, const Found& found)
+        : table_(table),
+          judge_(judge),
+          options_(options),
+          counts_(counts),
+          text_(text),
+          found_(found),
+          unknowns_(table, states_),
+          conditions_(table, states_, unknowns_, isCpp),
+          context_(table, unknowns_) {}
+
+    void run();
+
+private:
+    struct Chain {
+        std::size_t firstFact;
+        bool silentAround;    ///< nothing is told of the whole chain
+        bool silent = false;  ///< nothing is told inside the branch
+        bool hasFact = false; ///< the branch's condition is the last fact
+        bool hadElse = false;
+        bool switchedOn = false;              ///< a branch before is entered by a switch
+        std::optional<BranchReason> always{}; ///< the branch that is entered before those behind it
+    };
+
+    [[nodiscard]] bool isSilent() const {
+        return !chains_.empty() && (chains_.back().silentAround || chains_.back().silent);
+    }
+
+    void changeMacros(const Directive& directive);
+    void beginBranch(const Directive& directive);
+    void leaveBranch();
+    void readBranch(const Directive& directive);
+    void judgeBranch(const Directive& directive, const DirectiveCondition& condition);
+    [[nodiscard]] bool isSingle(SymbolicExprId condition) const;
+    [[nodiscard]] BranchFinding finding(BranchFindingKind kind, const Directive& directive) const;
+    void tell(BranchFinding finding, const Directive& directive, std::string proposed);
+    [[nodiscard]] BranchReason reasonOf(const BranchFact& fact) const;
+
+    SymbolicExprTable& table_;
+    BranchJudge& judge_;
+    const SourceScanOptions& options_;
+    SourceScanCounts& counts_;
+    std::string_view text_;
+    const Found& found_;
+    MacroStates states_;
+    MacroUnknowns unknowns_;
+    DirectiveConditionReader conditions_;
+    BranchContext context_;
+    std::vector<Chain> chains_;
+    std::vector<MacroStates::Name> body_; ///< of the definition that is read
+};
+
+void FileScan::run() {
+    DirectiveReader reader(text_);
+    for (Directive directive; reader.next(directive);)
+        switch (directive.kind) {
+        case DirectiveKind::Define:
+        case DirectiveKind::Undef:
+        case DirectiveKind::Include:
+        case DirectiveKind::Pragma:
+            changeMacros(directive);
+            break;
+        case DirectiveKind::Endif:
+            if (chains_.empty())
+                break;
+            context_.pop(chains_.back().firstFact);
+            chains_.pop_back();
+            states_.close();
+            break;
+        default:
+            beginBranch(directive);
+        }
+}
+
+void FileScan::changeMacros(const Directive& directive) {
+    if (directive.kind == DirectiveKind::Include) {
+        if (options_.strictIncludes)
+            states_.changeAll();
+        else
+            states_.include();
+        return;
+    }
+    if (directive.tokens.empty() || directive.tokens.front().kind != DirectiveTokenKind::Name)
+        return;
+    if (directive.kind == DirectiveKind::Pragma) {
+        if (directive.tokens.front().text == "pop_macro")
+            states_.changeAll();
+        return;
+    }
+    const auto nameOf = [&](const DirectiveToken& token) { // a text of the file, but for a token with splices inside
+        return states_.nameOf(token.text, token.end - token.begin == token.text.size());
+    };
+    const MacroStates::Name macro = nameOf(directive.tokens.front());
+    body_.clear();
+    for (const DirectiveToken& token : directive.tokens.subspan(1))
+        body_.push_back(nameOf(token));
+    states_.addBody(macro, body_);
+    states_.change(macro);
+}
+
+void FileScan::beginBranch(const Directive& directive) {
+    if (opensChain(directive.kind)) {
+        const bool silent = isSilent();
+        states_.open();
+        chains_.push_back({context_.size(), silent});
+    } else if (chains_.empty()) {
+        return;
+    } else {
+        leaveBranch();
+        if (chains_.back().hadElse) { // no chain that means anything
+            chains_.back().silent = true;
+            return;
+        }
+    }
+    ++counts_.branches;
+    Chain& chain = chains_.back();
+    chain.silent = chain.switchedOn || chain.always.has_value();
+    if (chain.always && !chain.switchedOn && !chain.silentAround) {
+        BranchFinding dead = finding(BranchFindingKind::Dead, directive);
+        dead.reasons.push_back(*chain.always);
+        tell(std::move(dead), directive, "0");
+    }
+    chain.hadElse = directive.kind == DirectiveKind::Else;
+    if (!isSilent() && !chain.hadElse)
+        readBranch(directive);
+}
+
+void FileScan::leaveBranch() {
+    states_.nextBranch();
+    Chain& chain = chains_.back();
+    if (chain.hasFact)
+        context_.negateLast();
+    chain.hasFact = false;
+}
+
+void FileScan::readBranch(const Directive& directive) {
+    DirectiveCondition condition = conditions_.read(directive);
+    counts_.unread += condition.understood ? 0U : 1U;
+    Chain& chain = chains_.back();
+    if (condition.constant) {
+        chain.silent = !*condition.constant;
+        chain.switchedOn = *condition.constant;
+        return;
+    }
+    judgeBranch(directive, condition);
+    chain.hasFact = true;
+    context_.push(
+        {condition.node, false, directive.line, directive.begin, directive.end, std::move(condition.unknowns)});
+}
+
+/// Whether a condition has no && or ||.
+bool FileScan::isSingle(SymbolicExprId condition) const {
+    const SymbolicExpr* node = table_.get(condition);
+    while (node->op() == SymbolicOp::Not)
+        node = table_.get(node->getInput(0));
+    return node->op() != SymbolicOp::And && node->op() != SymbolicOp::Or;
+}
+
+void FileScan::judgeBranch(const Directive& directive, const DirectiveCondition& condition) {
+    const std::vector<std::size_t> related = context_.related(condition);
+    if (related.empty() && isSingle(condition.node))
+        return;
+    BranchContext::Laws laws = context_.laws(condition, related);
+    KnownConditions known{{}, std::move(laws.states), std::move(laws.undefined)};
+    for (const std::size_t fact : related)
+        known.facts.push_back(context_[fact].node);
+    const BranchVerdict verdict = judge_.judge(condition.node, known);
+    if (verdict.kind == BranchVerdictKind::None)
+        return;
+    std::string proposed = verdict.kind == BranchVerdictKind::Dead ? "0" : "1";
+    if (verdict.kind == BranchVerdictKind::Removable) {
+        auto shorter = proposalText(table_, unknowns_, condition, directive.tokens, verdict.shorter);
+        if (!shorter || shorter->size() >= conditionText(directive).size())
+            return;
+        proposed = *std::move(shorter);
+    }
+    BranchFinding result = finding(verdict.kind == BranchVerdictKind::Dead         ? BranchFindingKind::Dead
+                                   : verdict.kind == BranchVerdictKind::AlwaysTrue ? BranchFindingKind::AlwaysTrue
+                                                                                   : BranchFindingKind::Removable,
+                                   directive);
+    for (const std::size_t at : judge_.reasons(condition.node, verdict, known))
+        result.reasons.push_back(reasonOf(context_[related[at]]));
+    Chain& chain = chains_.back();
+    chain.silent = verdict.kind == BranchVerdictKind::Dead;
+    if (verdict.kind == BranchVerdictKind::AlwaysTrue)
+        chain.always = BranchReason{result.region, result.directive, true};
+    tell(std::move(result), directive, std::move(proposed));
+}
+
+BranchReason FileScan::reasonOf(const BranchFact& fact) const {
+    const std::string_view quoted = text_.substr(fact.begin, std::min(fact.end - fact.begin, mostQuoted));
+    DirectiveReader reader(quoted);
+    Directive directive{};
+    BranchReason reason{regionOf(text_, fact.begin, fact.line, fact.begin, fact.end), {}, !fact.negated};
+    if (reader.next(directive))
+        reason.directive = directiveText(directive);
+    return reason;
+}
+
+BranchFinding FileScan::finding(BranchFindingKind kind, const Directive& directive) const {
+    BranchFinding result{};
+    result.kind = kind;
+    result.region = regionOf(text_, directive.begin, directive.line, directive.begin, directive.end);
+    result.directive = directiveText(directive);
+    return result;
+}
+
+/// Tells a finding with what to write instead of its condition; #else has none.
+void FileScan::tell(BranchFinding finding, const Directive& directive, std::string proposed) {
+    if (directive.kind != DirectiveKind::Else && !directive.tokens.empty()) {
+        finding.condition = conditionText(directive);
+        const bool whole = !isExpression(directive.kind);
+        if (!directive.hasComment) { // a comment inside is not for us to take away
+            const std::size_t begin = whole ? directive.keyword : directive.tokens.front().begin;
+            finding.replaced = regionOf(text_, directive.begin, directive.line, begin, directive.end);
+            finding.replacement = whole ? opensChain(directive.kind) ? "if " : "elif " : "";
+            finding.replacement.append(proposed);
+        }
+        finding.proposed = std::move(proposed);
+    }
+    found_(finding);
+}
+
+} // namespace
+
+struct SourceScanner::State {
+    explicit State(const SourceScanOptions& given) : options(given) { renew(); }
+
+    void renew() {
+        judge.reset();
+        table = std::make_unique<SymbolicExprTable>();
+        judge = std::make_unique<BranchJudge>(*table);
+    }
+
+    SourceScanOptions options;
+    SourceScanCounts counts;
+    std::uint64_t undecidedBefore = 0; ///< by the judges before this one
+    std::unique_ptr<SymbolicExprTable> table;
+    std::unique_ptr<BranchJudge> judge;
+};
+
+SourceScanner::SourceScanner(const SourceScanOptions& options) : state_(std::make_unique<State>(options)) {}
+
+SourceScanner::SourceScanner(SourceScanner&&) noexcept = default;
+SourceScanner& SourceScanner::operator=(SourceScanner&&) noexcept = default;
+SourceScanner::~SourceScanner() = default;
+
+void SourceScanner::scan(std::string_view text, bool isCpp, const std::function<void(const BranchFinding&)>& found) {
+    State& state = *state_;
+    if (state.table->size() > mostNodes) {
+        state.undecidedBefore = state.counts.undecided;
+        state.renew();
+    }
+    FileScan(*state.table, *state.judge, state.options, state.counts, text, isCpp, found).run();
+    state.counts.undecided = state.undecidedBefore + state.judge->undecided();
+}
+
+const SourceScanCounts& SourceScanner::counts() const noexcept {
+    return state_->counts;
+}
+
+} // namespace VT

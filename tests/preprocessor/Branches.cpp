@@ -1,0 +1,224 @@
+// What a scan tells of branches, against a real preprocessor under every definition of the macros of a small world.
+#include "base/scan/SourceScan.hpp"
+#include "tests/preprocessor/Judges.hpp"
+
+#include <gtest/gtest.h>
+
+#include <map>
+#include <random>
+#include <set>
+#include <sstream>
+
+namespace VT::Testing {
+namespace {
+
+const std::vector<std::string> macros{"A", "B", "C"};
+/// What a macro is defined as; empty where it is not.
+const std::vector<std::string> values{"", "(-1)", "0", "1", "2", "3u", "18446744073709551615u"};
+const std::string header = "#ifndef A\n#define A 2\n#endif\n";
+
+struct Branch {
+    std::size_t line;
+    int parent; ///< -1 for none
+    std::vector<int> earlier;
+    bool isElse;
+};
+
+/// A file of chains within each other.  Each branch holds its number behind an @.
+class RandomSource {
+public:
+    /// With `plain`, conditions are those that are decided completely, and nothing changes macros on the way.
+    RandomSource(std::mt19937_64& random, bool plain) : random_(random), plain_(plain) {
+        for (int i = 0; i < 3; ++i)
+            addChain(-1, 0);
+    }
+
+    std::string text;
+    std::vector<Branch> branches;
+
+private:
+    std::size_t below(std::size_t bound) { return std::uniform_int_distribution<std::size_t>(0, bound - 1)(random_); }
+
+    template <class... Texts>
+    std::string oneOf(const Texts&... texts) {
+        const std::string all[] = {texts...};
+        return all[below(sizeof...(texts))];
+    }
+
+    std::string macro() { return macros[below(macros.size())]; }
+
+    std::string atom() {
+        const std::string op = oneOf("==", "!=", "<", "<=", ">", ">=");
+        switch (below(plain_ ? 6 : 10)) {
+        case 0:
+            return "defined(" + macro() + ")";
+        case 1:
+            return "defined " + macro();
+        case 2:
+            return macro();
+        case 6:
+            return macro() + " " + op + " " + macro();
+        case 7:
+            return macro() + op + oneOf("-1", "1u", "0xFFFFFFFFFFFFFFFF", "'\\3'");
+        case 8:
+            return "(" + macro() + " & 1) " + op + " " + oneOf("0", "1");
+        case 9:
+            return macro() + "+1 " + op + " " + oneOf("2", macro() + "*2");
+        default:
+            return below(4) == 0 ? oneOf("0", "1", "2") + " " + op + macro()
+                                 : macro() + " " + op + " " + oneOf("0", "0x1", "1L", "02", "0b10");
+        }
+    }
+
+    std::string condition(std::size_t depth) {
+        if (depth == 0 || below(3) == 0)
+            return atom();
+        if (below(4) == 0)
+            return "!(" + condition(depth - 1) + ")";
+        const std::string op = oneOf(" && ", " || ", "&& \\\n");
+        return "(" + condition(depth - 1) + ")" + op + (below(2) == 0 ? atom() : "(" + condition(depth - 1) + ")");
+    }
+
+    std::string directive(bool first) {
+        const std::string begin = oneOf("#", " # ", "%:") + (first ? "" : "el");
+        const std::size_t kind = below(5);
+        return begin + (kind == 0 ? "ifdef " + macro() : kind == 1 ? "ifndef " + macro() : "if " + condition(2));
+    }
+
+    void add(const std::string& line) { text += line + "\n"; }
+
+    void addBranch(const std::string& directive, int parent, const std::vector<int>& earlier, std::size_t depth) {
+        const int number = static_cast<int>(branches.size());
+        branches.push_back(
+            {static_cast<std::size_t>(std::ranges::count(text, '\n')) + 1, parent, earlier, directive == "#else"});
+        add(directive);
+        add("@" + std::to_string(number));
+        for (std::size_t i = below(depth == 0 ? 3 : 2); i > 0 && depth < 3; --i) {
+            if (!plain_ && below(3) == 0) {
+                const std::string name = macro();
+                add(oneOf("#undef " + name + "\n#define " + name + " " + oneOf("1", "B"), "#undef " + name,
+                          std::string("#include \"header.h\"")));
+            }
+            addChain(number, depth + 1);
+        }
+    }
+
+    void addChain(int parent, std::size_t depth) {
+        std::vector<int> earlier;
+        for (std::size_t i = 0; i == 0 || below(2) == 0; ++i) {
+            const int number = static_cast<int>(branches.size());
+            addBranch(directive(i == 0), parent, earlier, depth);
+            earlier.push_back(number);
+        }
+        if (below(2) == 0)
+            addBranch("#else", parent, earlier, depth);
+        add("#endif");
+    }
+
+    std::mt19937_64& random_;
+    bool plain_;
+};
+
+/// The branches that are entered, for every definition.
+std::vector<std::set<int>> entered(const std::string& text) {
+    std::string all;
+    std::vector<std::size_t> digits(macros.size());
+    for (bool more = true; more;) {
+        for (std::size_t i = 0; i < macros.size(); ++i) {
+            all += "#undef " + macros[i] + "\n";
+            if (!values[digits[i]].empty())
+                all += "#define " + macros[i] + " " + values[digits[i]] + "\n";
+        }
+        all += "@@\n" + text;
+        more = false;
+        for (std::size_t i = 0; i < digits.size() && !more; ++i) {
+            digits[i] = (digits[i] + 1) % values.size();
+            more = digits[i] != 0;
+        }
+    }
+    std::vector<std::set<int>> result;
+    std::istringstream lines(preprocessed(all, header));
+    for (std::string line; std::getline(lines, line);)
+        if (line == "@@")
+            result.emplace_back();
+        else if (line.starts_with('@'))
+            result.back().insert(std::stoi(line.substr(1)));
+    return result;
+}
+
+bool isReached(const Branch& branch, const std::set<int>& entered) {
+    return (branch.parent < 0 || entered.contains(branch.parent)) &&
+           std::ranges::none_of(branch.earlier, [&](int other) { return entered.contains(other); });
+}
+
+std::size_t offsetOf(const std::string& text, std::uint64_t line, std::uint64_t column) {
+    std::size_t at = 0;
+    for (; line > 1; --line)
+        at = text.find('\n', at) + 1;
+    return at + column - 1;
+}
+
+void check(const RandomSource& source, bool plain, std::map<BranchFindingKind, int>& told) {
+    const std::vector<std::set<int>> worlds = entered(source.text);
+    ASSERT_EQ(worlds.size(), 343U);
+    std::map<int, BranchFindingKind> found;
+    std::vector<BranchFinding> fixes;
+    SourceScanner().scan(source.text, false, [&](const BranchFinding& finding) {
+        ++told[finding.kind];
+        const auto branch =
+            std::ranges::find(source.branches, static_cast<std::size_t>(finding.region.line), &Branch::line);
+        ASSERT_NE(branch, source.branches.end());
+        const int number = static_cast<int>(branch - source.branches.begin());
+        found[number] = finding.kind;
+        for (const std::set<int>& world : worlds) {
+            const bool isRight = finding.kind == BranchFindingKind::Dead ? !world.contains(number)
+                                 : finding.kind == BranchFindingKind::AlwaysTrue
+                                     ? !isReached(*branch, world) || world.contains(number)
+                                     : true;
+            ASSERT_TRUE(isRight) << finding.directive << "\n" << source.text;
+        }
+        if (finding.replaced)
+            fixes.push_back(finding);
+    });
+    std::string mended = source.text; // all at once
+    for (auto fix = fixes.rbegin(); fix != fixes.rend(); ++fix) {
+        const std::size_t begin = offsetOf(mended, fix->replaced->line, fix->replaced->column);
+        const std::size_t end = offsetOf(mended, fix->replaced->endLine, fix->replaced->endColumn);
+        mended.replace(begin, end - begin, fix->replacement);
+    }
+    EXPECT_TRUE(entered(mended) == worlds) << source.text << "\nis not\n" << mended;
+    for (std::size_t i = 0; plain && i < source.branches.size(); ++i) {
+        const Branch& branch = source.branches[i];
+        const int number = static_cast<int>(i);
+        const auto in = [number](const std::set<int>& world) { return world.contains(number); };
+        const auto lives = [&](const auto& world) { return branch.parent < 0 || world.contains(branch.parent); };
+        const auto reached = [&](const auto& world) { return isReached(branch, world); };
+        const auto decidesNothing = [&](const auto& world) { return !reached(world) || in(world); };
+        const bool isDead = std::ranges::any_of(worlds, lives) && std::ranges::none_of(worlds, in);
+        const bool always =
+            !branch.isElse && std::ranges::any_of(worlds, reached) && std::ranges::all_of(worlds, decidesNothing);
+        const auto is = [&](BranchFindingKind kind) { return found.contains(number) && found[number] == kind; };
+        EXPECT_EQ(is(BranchFindingKind::Dead), isDead) << branch.line << "\n" << source.text;
+        EXPECT_EQ(is(BranchFindingKind::AlwaysTrue), always) << branch.line << "\n" << source.text;
+    }
+}
+
+constexpr int rounds = 60;
+
+class Branches : public ::testing::TestWithParam<bool> {};
+
+TEST_P(Branches, AreWhatAPreprocessorMakesOfThem) {
+    std::mt19937_64 random(GetParam() ? 1 : 2);
+    std::map<BranchFindingKind, int> told;
+    for (int i = 0; i < rounds && !HasFailure(); ++i)
+        check(RandomSource(random, GetParam()), GetParam(), told);
+    std::cout << "dead " << told[BranchFindingKind::Dead] << ", always true " << told[BranchFindingKind::AlwaysTrue]
+              << ", removable " << told[BranchFindingKind::Removable] << "\n";
+    for (const auto& [kind, times] : told)
+        EXPECT_GT(times, 10);
+}
+
+INSTANTIATE_TEST_SUITE_P(PlainAndAny, Branches, ::testing::Bool());
+
+} // namespace
+} // namespace VT::Testing

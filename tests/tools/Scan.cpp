@@ -1,0 +1,128 @@
+// vtsym scan on directories: every form of its output, and how it ends.
+#include "tests/support/JsonSchema.hpp"
+#include "tests/tools/Program.hpp"
+
+#include <gmock/gmock.h>
+
+#include <filesystem>
+#include <fstream>
+#include <sstream>
+
+namespace VT::Testing {
+namespace {
+
+using ::testing::HasSubstr;
+using Json = nlohmann::json;
+namespace fs = std::filesystem;
+
+class Scan : public ::testing::Test {
+protected:
+    Scan() {
+        std::string pattern = (fs::temp_directory_path() / "vtsym-XXXXXX").string();
+        directory_ = mkdtemp(pattern.data());
+        fs::create_directories(directory_ / "sub dir");
+    }
+
+    ~Scan() override { fs::remove_all(directory_); }
+
+    fs::path write(const std::string& name, const std::string& text) {
+        std::ofstream(directory_ / name, std::ios::binary) << text;
+        return directory_ / name;
+    }
+
+    ProgramResult scan(std::vector<std::string> options = {}) {
+        options.insert(options.begin(), "scan");
+        options.push_back(directory_.string());
+        return runProgram({options, {}, {}, {}});
+    }
+
+    fs::path directory_;
+};
+
+const std::string source = "#ifdef A\n"
+                           "# if  B && /* no */ defined(A)\n"
+                           "# elif defined A /* \xC3\xA4 */ && B > \\\n"
+                           "   3\n"
+                           "# elif 1 && !B\n"
+                           "# endif\n"
+                           "#else\n"
+                           "# ifdef \xC3\xA4 // \xC3\xA4\n"
+                           "/* \xC3\xA4 */ # ifdef \xC3\xA4\n"
+                           "# endif\n# endif\n"
+                           "#endif\n";
+
+TEST_F(Scan, TellsInEveryForm) {
+    const std::string a = write("a.c", source).string();
+    const std::string b = write("sub dir/%b.hh", "#if true\n#if X\n#elif X == 1\n#endif\n#endif").string();
+    write("sub dir/other.txt", source);
+    fs::create_directory_symlink(directory_, directory_ / "sub dir" / "loop");
+    fs::create_symlink(a, directory_ / "again.c");
+
+    const ProgramResult compiler = scan();
+    EXPECT_EQ(
+        compiler.output,
+        a + ":2: '#if B && defined(A)' can be '#if B', since '#ifdef A' (line 1) holds here\n" +                      //
+            a + ":3: '#elif defined A && B > 3' is dead, since '#if B && defined(A)' (line 2) does not hold here\n" + //
+            a +
+            ":5: '#elif 1 && !B' can be '#elif 1', since '#ifdef A' (line 1) holds and "
+            "'#if B && defined(A)' (line 2) does not hold here\n" +
+            a + ":9: '#ifdef \xC3\xA4' always holds, since '#ifdef \xC3\xA4' (line 8) holds here\n" + //
+            b + ":3: '#elif X == 1' is dead, since '#if X' (line 2) does not hold here\n");
+    EXPECT_EQ(compiler.status, 1);
+    EXPECT_EQ(compiler.words, "");
+
+    std::istringstream lines(scan({"--json"}).output);
+    std::vector<Json> objects;
+    for (std::string line; std::getline(lines, line);)
+        objects.push_back(Json::parse(line));
+    ASSERT_EQ(objects.size(), 5U);
+    const Json removable = {{"file", a},           {"line", 2},
+                            {"kind", "removable"}, {"condition", "B && defined(A)"},
+                            {"proposed", "B"},     {"follows", {{{"line", 1}, {"text", "#ifdef A"}}}}};
+    EXPECT_EQ(objects[0], removable);
+    EXPECT_EQ(objects[1]["kind"], "dead");
+    EXPECT_EQ(objects[3]["kind"], "always-true");
+    EXPECT_EQ(objects[4]["file"], b);
+
+    const Json sarif = Json::parse(scan({"--sarif"}).output);
+    const Json schema = Json::parse(std::ifstream(VTSYM_TEST_DATA "/sarif-2.1.0.json"));
+    EXPECT_EQ(schemaErrors(schema, schema, sarif), "");
+    const Json& results = sarif["runs"][0]["results"];
+    ASSERT_EQ(results.size(), 5U);
+    for (const Json& result : results)
+        EXPECT_EQ(sarif["runs"][0]["tool"]["driver"]["rules"][result["ruleIndex"].get<std::size_t>()]["id"],
+                  result["ruleId"]);
+    for (const std::size_t commented : {0U, 1U})
+        EXPECT_FALSE(results[commented].contains("fixes")); // a comment would be lost
+    const auto& location = results[4]["locations"][0]["physicalLocation"];
+    EXPECT_THAT(location["artifactLocation"]["uri"].get<std::string>(), HasSubstr("/sub%20dir/%25b.hh"));
+    const Json replacement = {
+        {"deletedRegion", {{"startLine", 9}, {"startColumn", 11}, {"endLine", 9}, {"endColumn", 18}}},
+        {"insertedContent", {{"text", "if 1"}}}};
+    EXPECT_EQ(results[3]["fixes"][0]["artifactChanges"][0]["replacements"][0], replacement);
+}
+
+TEST_F(Scan, EndsAsItWent) {
+    EXPECT_EQ(scan().status, 2);
+    write("binary.c", std::string("\0\1", 2));
+    fs::create_symlink("nowhere", directory_ / "gone.c");
+    const ProgramResult unread = scan({"--sarif", (directory_ / "gone.c").string()});
+    EXPECT_EQ(unread.status, 2);
+    EXPECT_THAT(unread.words, HasSubstr("gone.c: cannot be read: No such file"));
+    EXPECT_THAT(unread.words, HasSubstr("binary.c: is no text"));
+    const Json schema = Json::parse(std::ifstream(VTSYM_TEST_DATA "/sarif-2.1.0.json"));
+    EXPECT_EQ(schemaErrors(schema, schema, Json::parse(unread.output)), "");
+    EXPECT_THAT(unread.output, HasSubstr("\"executionSuccessful\":false"));
+
+    write("some.h",
+          "#ifndef A\n#include <a.h>\n#ifdef A\n#if B\n#include <b.h>\n#if B == 0\n#endif\n#endif\n#endif\n#endif");
+    EXPECT_EQ(scan({"--strict-includes"}).status, 0);
+    const ProgramResult some = scan({"--summary"});
+    EXPECT_EQ(some.status, 1);
+    EXPECT_THAT(some.words, HasSubstr("1 files, 4 branches, 1 findings"));
+    EXPECT_EQ(runProgram({{"scan"}, {}, {}, {}}).status, 2);
+    EXPECT_EQ(scan({"--json", "--sarif"}).status, 2);
+}
+
+} // namespace
+} // namespace VT::Testing
