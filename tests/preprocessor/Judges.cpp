@@ -42,11 +42,11 @@ std::string Preprocessor::decide() const {
 }
 
 std::string preprocessed(const std::string& file, const std::string& header) {
-    const Directory directory;
-    directory.write("file.c", file);
-    directory.write("header.h", header);
-    directory.run("cpp -P -undef -std=c2x file.c decided");
-    return directory.read("decided");
+    const Workplace place;
+    place.write("file.c", file);
+    place.write("header.h", header);
+    run(place, "cpp -P -undef -std=c2x file.c decided");
+    return place.read("decided");
 }
 
 std::string Compiler::program() const {
