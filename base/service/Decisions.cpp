@@ -14,6 +14,19 @@ Decision noCondition() {
     return {Answer::Undecided, DecisionBound::NoCondition, std::nullopt};
 }
 
+/// What is asked about a set, with operators in the place of the calls that Quill writes for them.
+SetDecision askAbout(ServiceParts& parts, SetDecision (Decider::*question)(std::span<const SymbolicExprId>),
+                     const std::vector<VCSymbolicExprId>& conditions) {
+    std::vector<SymbolicExprId> converted;
+    converted.reserve(conditions.size());
+    for (const VCSymbolicExprId& condition : conditions) {
+        if (!parts.table.has(condition.id()))
+            return {noCondition(), std::nullopt};
+        converted.push_back(parts.toC(condition.id()));
+    }
+    return (parts.decider().*question)(converted);
+}
+
 } // namespace
 
 bool ServiceParts::keywordsInForce() const {
@@ -95,25 +108,11 @@ Relation VCService::compare(const VCSymbolicExprId& a, const VCSymbolicExprId& b
 }
 
 SetDecision VCService::covers(const std::vector<VCSymbolicExprId>& conditions) {
-    std::vector<SymbolicExprId> converted;
-    converted.reserve(conditions.size());
-    for (const VCSymbolicExprId& condition : conditions) {
-        if (!has(condition))
-            return {noCondition(), std::nullopt};
-        converted.push_back(parts_->toC(condition.id()));
-    }
-    return parts_->decider().covers(converted);
+    return askAbout(*parts_, &Decider::covers, conditions);
 }
 
 SetDecision VCService::isDisjoint(const std::vector<VCSymbolicExprId>& conditions) {
-    std::vector<SymbolicExprId> converted;
-    converted.reserve(conditions.size());
-    for (const VCSymbolicExprId& condition : conditions) {
-        if (!has(condition))
-            return {noCondition(), std::nullopt};
-        converted.push_back(parts_->toC(condition.id()));
-    }
-    return parts_->decider().disjoint(converted);
+    return askAbout(*parts_, &Decider::disjoint, conditions);
 }
 
 // Sums of products.

@@ -26,7 +26,14 @@ public:
 
     ~Workplace() { std::filesystem::remove_all(path_); }
 
-    void write(const std::string& name, const std::string& content) const { std::ofstream(path_ / name) << content; }
+    /// A name in the directory.
+    [[nodiscard]] std::string path(const std::string& name) const { return (path_ / name).string(); }
+
+    /// Writes a file; its path.
+    std::string write(const std::string& name, const std::string& content) const {
+        std::ofstream(path_ / name, std::ios::binary) << content;
+        return path(name);
+    }
 
     [[nodiscard]] std::string read(const std::string& name) const {
         std::ostringstream content;

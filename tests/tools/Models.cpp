@@ -1,11 +1,9 @@
 // vtsym check: what it finds in models, against brute force too, and what it says of files that are none.
+#include "tests/support/Workplace.hpp"
 #include "tests/tools/Program.hpp"
 
 #include <algorithm>
 #include <array>
-#include <cstdlib>
-#include <filesystem>
-#include <fstream>
 #include <gmock/gmock.h>
 #include <nlohmann/json.hpp>
 #include <random>
@@ -19,31 +17,8 @@ using ::testing::HasSubstr;
 using ::testing::Not;
 using Json = nlohmann::json;
 
-/// A folder that goes with the test.
-class Folder {
-public:
-    Folder() {
-        std::string path = (std::filesystem::temp_directory_path() / "vtsymXXXXXX").string();
-        if (mkdtemp(path.data()) == nullptr)
-            throw std::runtime_error("no folder");
-        path_ = path;
-    }
-
-    ~Folder() { std::filesystem::remove_all(path_); }
-
-    [[nodiscard]] std::string file(const std::string& name) const { return (path_ / name).string(); }
-
-    [[nodiscard]] std::string write(const std::string& name, const std::string& text) const {
-        std::ofstream(file(name), std::ios::binary) << text;
-        return file(name);
-    }
-
-private:
-    std::filesystem::path path_;
-};
-
 ProgramResult checked(const std::string& model, std::vector<std::string> options = {}) {
-    const Folder folder;
+    const Workplace folder;
     options.insert(options.begin(), "check");
     const std::string file = folder.write("m", model);
     options.push_back(file);
@@ -191,22 +166,21 @@ TEST(Check, SaysWhatToChangeInAFile) {
 }
 
 TEST(Check, WritesAPageThatStandsAlone) {
-    const Folder folder;
+    const Workplace folder;
     const std::string model =
         Json({{"name", "</title><script>x"},
               {"blocks",
                {{{"name", "<b>&\"'"},
                  {"choices", {{{"name", "<i>"}, {"condition", "A<3&&B"}}, {{"name", "j"}, {"condition", "A>1"}}}}}}}})
             .dump();
-    const std::string page = folder.file("page.html");
+    const std::string page = folder.path("page.html");
     EXPECT_EQ(runProgram({{"check", "--html", page, folder.write("m", model)}, "", {}, {}}).status, 1);
-    std::stringstream html;
-    html << std::ifstream(page).rdbuf();
-    EXPECT_THAT(html.str(), HasSubstr("title=\"&lt;i&gt; and j are both active for A=2, B=1\""));
-    EXPECT_THAT(html.str(), HasSubstr("<h2>&lt;b&gt;&amp;&quot;&#39;</h2>"));
+    const std::string html = folder.read("page.html");
+    EXPECT_THAT(html, HasSubstr("title=\"&lt;i&gt; and j are both active for A=2, B=1\""));
+    EXPECT_THAT(html, HasSubstr("<h2>&lt;b&gt;&amp;&quot;&#39;</h2>"));
     for (const char* outside : {"<b>&\"", "<i>", "</title><script>x", "http:", "https:", "src=", "url("})
-        EXPECT_THAT(html.str(), Not(HasSubstr(outside)));
-    EXPECT_EQ(runProgram({{"check", "--html", "/nowhere/page", folder.file("m")}, "", {}, {}}).status, 2);
+        EXPECT_THAT(html, Not(HasSubstr(outside)));
+    EXPECT_EQ(runProgram({{"check", "--html", "/nowhere/page", folder.path("m")}, "", {}, {}}).status, 2);
 }
 
 // Random sets over three names with small constants.  Conditions change their value next to constants only, so the

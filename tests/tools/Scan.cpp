@@ -1,5 +1,6 @@
 // vtsym scan on directories: every form of its output, and how it ends.
 #include "tests/support/JsonSchema.hpp"
+#include "tests/support/Workplace.hpp"
 #include "tests/tools/Program.hpp"
 
 #include <gmock/gmock.h>
@@ -17,18 +18,9 @@ namespace fs = std::filesystem;
 
 class Scan : public ::testing::Test {
 protected:
-    Scan() {
-        std::string pattern = (fs::temp_directory_path() / "vtsym-XXXXXX").string();
-        directory_ = mkdtemp(pattern.data());
-        fs::create_directories(directory_ / "sub dir");
-    }
+    Scan() { fs::create_directories(directory_ / "sub dir"); }
 
-    ~Scan() override { fs::remove_all(directory_); }
-
-    fs::path write(const std::string& name, const std::string& text) {
-        std::ofstream(directory_ / name, std::ios::binary) << text;
-        return directory_ / name;
-    }
+    fs::path write(const std::string& name, const std::string& text) { return place_.write(name, text); }
 
     ProgramResult scan(std::vector<std::string> options = {}) {
         options.insert(options.begin(), "scan");
@@ -36,7 +28,8 @@ protected:
         return runProgram({options, {}, {}, {}});
     }
 
-    fs::path directory_;
+    Workplace place_;
+    fs::path directory_ = fs::path(place_.path("any")).parent_path();
 };
 
 const std::string source = "#ifdef A\n"
