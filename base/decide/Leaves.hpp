@@ -33,8 +33,8 @@ public:
         : table_(table),
           keywordsInForce_(keywordsInForce) {}
 
-    /// `node` is of the table.
-    [[nodiscard]] LeafMeaning operator()(SymbolicExprId node) const;
+    /// `id` is of the table.
+    [[nodiscard]] LeafMeaning operator()(SymbolicExprId id) const;
 
     [[nodiscard]] const SymbolicExprTable& table() const noexcept { return table_; }
 

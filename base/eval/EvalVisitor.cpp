@@ -89,13 +89,13 @@ void SymbolicExprEvalImpl::enter(SymbolicExprId id, const Frame* parent) {
 void SymbolicExprEvalImpl::enterOperands(SymbolicExprId id, const SymbolicExpr& node, SymbolicOp op) {
     const ScalarRuleIndex rule = scalarRuleIndex(op);
     if (rule == ScalarRuleIndex::None) {
-        frames_.emplace_back(&node, id, invalidId, invalidId, 0, node.getNumInputs(), rule, false);
+        frames_.push_back({&node, id, invalidId, invalidId, 0, node.getNumInputs(), rule, false});
     } else if (scalarRules[static_cast<std::size_t>(rule)].operands == 1) {
         const auto& unary = static_cast<const SymbolicUnaryExpr&>(node);
-        frames_.emplace_back(&node, id, unary.operand(), invalidId, 0, 1, rule, false);
+        frames_.push_back({&node, id, unary.operand(), invalidId, 0, 1, rule, false});
     } else {
         const auto& binary = static_cast<const SymbolicBinaryExpr&>(node);
-        frames_.emplace_back(&node, id, binary.left(), binary.right(), 0, 2, rule, false);
+        frames_.push_back({&node, id, binary.left(), binary.right(), 0, 2, rule, false});
     }
 }
 
@@ -116,8 +116,8 @@ void SymbolicExprEvalImpl::enterSymbol(SymbolicExprId id, const SymbolicExpr& no
         return;
     }
     known_.insert(id, values_.size());
-    values_.emplace_back(SymbolicScalar(), &open);
-    frames_.emplace_back(&node, id, value, invalidId, 0, 1, ScalarRuleIndex::None, true);
+    values_.push_back({SymbolicScalar(), &open});
+    frames_.push_back({&node, id, value, invalidId, 0, 1, ScalarRuleIndex::None, true});
 }
 
 /// Makes the value of the topmost frame's node from those of its operands, and remembers it.

@@ -96,7 +96,7 @@ private:
 
     void push(const SymbolicScalar& scalar, const Elements* elements) {
         stack_.push_back(values_.size());
-        values_.emplace_back(scalar, elements);
+        values_.push_back({scalar, elements});
     }
 
     void push(Elements elements);

@@ -15,6 +15,10 @@ template <ScalarType Left, ScalarType Right, class Function>
         result.integer = value;
 }
 
+#define VTSYM_RULE(Op, Operands, Function) constexpr std::size_t operandsOf##Op = Operands;
+VTSYM_SCALAR_RULES(VTSYM_RULE)
+#undef VTSYM_RULE
+
 } // namespace
 
 // The rules are inlined here, one place for each pair of types.  Each place jumps to the next one itself, so that the
@@ -47,15 +51,11 @@ void execute(const Operation* operation, ScalarCell* cells, ScalarCell* result) 
 
     goto* places[operation->code];
 #define VTSYM_PAIR(Op, Function, Left, Right)                                                                          \
-    Op##Left##Right : apply<ScalarType::Left, operands == 1 ? ScalarType::Left : ScalarType::Right>(                   \
+    Op##Left##Right : apply<ScalarType::Left, typeOfSecond(operandsOf##Op, ScalarType::Left, ScalarType::Right)>(      \
                           [](auto a, auto b) { return rules::Function(a, b); }, cells[operation->left],                \
                           cells[operation->right], *result++);                                                         \
     goto* places[(++operation)->code];
-#define VTSYM_RULE(Op, Operands, Function)                                                                             \
-    {                                                                                                                  \
-        constexpr int operands = Operands;                                                                             \
-        VTSYM_PAIRS(VTSYM_PAIR, Op, Function)                                                                          \
-    }
+#define VTSYM_RULE(Op, Operands, Function) VTSYM_PAIRS(VTSYM_PAIR, Op, Function)
     VTSYM_SCALAR_RULES(VTSYM_RULE)
 #undef VTSYM_RULE
 #undef VTSYM_PAIR

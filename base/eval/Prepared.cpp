@@ -75,10 +75,11 @@ std::optional<std::size_t> PreparedExpr::slotOf(SymbolicExprId symbol) const {
 }
 
 std::optional<std::size_t> PreparedExpr::slotOf(const std::string& name) const {
-    for (std::size_t slot = 0; slot < symbols_.size(); ++slot)
-        if (const auto* node = dynamic_cast<const SymbolicString*>(table_->get(symbols_[slot])))
-            if (node->getName() == name)
-                return slot;
+    for (std::size_t slot = 0; slot < symbols_.size(); ++slot) {
+        const auto* const node = dynamic_cast<const SymbolicString*>(table_->get(symbols_[slot]));
+        if (node != nullptr && node->getName() == name)
+            return slot;
+    }
     return std::nullopt;
 }
 

@@ -424,9 +424,13 @@ constexpr TypedRule typedRule(Function) {
 }
 
 /// An operator of one operand is given it as both, so that the types are the same.
+constexpr ScalarType typeOfSecond(std::size_t operands, ScalarType left, ScalarType right) {
+    return operands == 1 ? left : right;
+}
+
 template <std::size_t Operands, ScalarType Left, ScalarType Right, class Function>
 constexpr TypedRule ruleOfTypes(Function function) {
-    return typedRule < Left, Operands == 1 ? Left : Right > (function);
+    return typedRule<Left, typeOfSecond(Operands, Left, Right)>(function);
 }
 
 template <std::size_t Operands, class Function>

@@ -108,7 +108,7 @@ void Finder::compareNames() {
     };
 
     std::ranges::sort(names_);
-    names_.erase(std::ranges::unique(names_).begin(), names_.end());
+    names_.erase(std::unique(names_.begin(), names_.end()), names_.end());
     std::vector<Name> names;
     names.reserve(names_.size());
     for (const SymbolicExprId id : names_)

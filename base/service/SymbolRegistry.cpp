@@ -77,7 +77,7 @@ std::string SymbolRegistry::registerExpression(const VTBlock* block, SymbolicExp
     std::uint64_t passes = 0;
     const SymbolicExprId simplified = simplifier_.simplify(expression, passes);
     const std::string text = printer_(simplified);
-    const std::string identifier = identifierOf(text);
+    std::string identifier = identifierOf(text);
     entries_.try_emplace(identifier, Entry{text, simplified});
     if (identifier != text)
         table_.insertAliasInfo(identifier, table_.get(simplified)->isTermExpr() ? text : '(' + text + ')');

@@ -56,7 +56,7 @@ private:
             if (c.atom < occurrences_.atoms())
                 indices.insert(indices.end(), occurrences_.of(c.atom).begin(), occurrences_.of(c.atom).end());
         std::ranges::sort(indices);
-        indices.erase(std::ranges::unique(indices).begin(), indices.end());
+        indices.erase(std::unique(indices.begin(), indices.end()), indices.end());
         std::vector<const Cube*> result;
         for (const std::size_t i : indices) {
             const bool helps = std::ranges::all_of(cover_[i].constraints(), [&](const Constraint& c) {
@@ -68,6 +68,7 @@ private:
         return result;
     }
 
+    // NOLINTNEXTLINE(misc-no-recursion): the depth has a bound
     bool search(const Cube& cube, const std::vector<const Cube*>& cubes, std::size_t depth) {
         std::vector<const Cube*> touching;
         for (const Cube* other : cubes) {
@@ -97,10 +98,11 @@ private:
     void dropUnhelpful(const Cube& cube, std::vector<const Cube*>& cubes) {
         for (bool again = true; again && !cubes.empty();) {
             Reach reach;
-            for (const Cube* other : cubes)
+            for (const Cube* other : cubes) {
                 for (const Constraint& c : other->constraints())
                     if (restricts(cube, c))
                         reach[c.atom].insert(reach[c.atom].end(), c.set.intervals().begin(), c.set.intervals().end());
+            }
             again = false;
             for (auto& [atom, intervals] : reach) {
                 const IntegerSet reached = IntegerSet::of(std::move(intervals));
@@ -144,7 +146,7 @@ std::vector<IntegerSet> relaxations(const IntegerSet& set) {
     if (set.low() != IntegerSet::minusInfinity && set.high() != IntegerSet::plusInfinity) {
         result.push_back(set.unite({IntegerSet::minusInfinity, set.low()}));
         result.push_back(set.unite({set.high(), IntegerSet::plusInfinity}));
-    } else if (!(hull == set)) {
+    } else if (!(hull == set) && !hull.isAll()) {
         result.push_back(set.unite(hull.complement()));
     }
     for (const std::int64_t hole : set.holes())

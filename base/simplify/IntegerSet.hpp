@@ -27,7 +27,7 @@ public:
     struct Interval {
         std::int64_t low;
         std::int64_t high;
-        auto operator<=>(const Interval&) const = default;
+        auto operator<=>(const Interval&) const = default; // NOLINT(modernize-use-nullptr): no pointer here
     };
 
     using Intervals = ShortVector<Interval, 2>;

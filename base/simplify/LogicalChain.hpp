@@ -8,10 +8,10 @@ namespace VT {
 /// Simplifies the And or Or chain rooted at a node, whose operands are simplified already: to a truth constant, an
 /// operand or a sum of products in the order of texts.  Gives up, and answers the chain as it stands, where the operand
 /// limit is exceeded.
-SymbolicExprId simplifyChain(RuleContext& context, SymbolicExprId chain);
+SymbolicExprId simplifyChain(RuleContext& context, SymbolicExprId root);
 
 /// The negation of an And or Or chain by De Morgan's laws as a sum of products; the invalid identifier where it gives
 /// up.
-SymbolicExprId negateChain(RuleContext& context, SymbolicExprId chain);
+SymbolicExprId negateChain(RuleContext& context, SymbolicExprId root);
 
 } // namespace VT

@@ -6,7 +6,6 @@
 #include "base/core/Walk.hpp"
 #include "base/variants/VariantKeywords.hpp"
 
-#include <ranges>
 #include <type_traits>
 
 namespace VT {
@@ -110,8 +109,8 @@ SymbolicExprId SymbolicExprXFormVisitor::identity(const Node& node) {
         return inPlace && same ? current_ : factory_.make<Node>(a, b, c);
     } else if constexpr (std::is_base_of_v<SymbolicMultiExpr, Node>) {
         std::vector<SymbolicExprId> inputs(node.getNumInputs());
-        for (SymbolicExprId& input : std::ranges::reverse_view(inputs))
-            input = pop();
+        for (std::size_t i = inputs.size(); i-- > 0;)
+            inputs[i] = pop();
         return inPlace && inputs == node.inputs() ? current_ : factory_.make<Node>(std::move(inputs));
     } else if constexpr (Node::code == SymbolicOp::String) {
         return inPlace ? current_ : factory_.make<Node>(node.getName());
