@@ -84,8 +84,7 @@ BranchContext::Laws BranchContext::laws(const DirectiveCondition& condition, con
         return std::tuple(unknown.subject, unknown.state.version, unknown.state.epoch, unknown.kind);
     };
     std::ranges::sort(asked, {}, order);
-    const auto repeated = std::ranges::unique(asked);
-    asked.erase(repeated.begin(), repeated.end());
+    asked.erase(std::unique(asked.begin(), asked.end()), asked.end());
 
     // One round for each macro in one version: its epochs from the first to the last.
     Laws laws;

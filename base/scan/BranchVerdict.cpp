@@ -4,6 +4,7 @@
 
 #include <boost/container_hash/hash.hpp>
 
+#include <algorithm>
 #include <numeric>
 
 namespace VT {
@@ -90,9 +91,8 @@ std::vector<std::size_t> BranchJudge::reasons(SymbolicExprId condition, const Br
                                               const KnownConditions& known) {
     const bool toShorten = verdict.kind == BranchVerdictKind::Removable;
     const auto suffices = [&](const std::vector<std::size_t>& positions) {
-        std::vector<SymbolicExprId> facts;
-        for (const std::size_t at : positions)
-            facts.push_back(known.facts[at]);
+        std::vector<SymbolicExprId> facts(positions.size());
+        std::ranges::transform(positions, facts.begin(), [&](std::size_t at) { return known.facts[at]; });
         return holds(verdict, condition,
                      all(facts, known.laws, toShorten ? std::span<const SymbolicExprId>() : known.deathLaws));
     };
@@ -102,7 +102,7 @@ std::vector<std::size_t> BranchJudge::reasons(SymbolicExprId condition, const Br
         kept.resize(std::min(length * 2 + 1, known.facts.size()));
         std::iota(kept.begin(), kept.end(), known.facts.size() - kept.size());
     }
-    for (std::size_t length = kept.size(); length > 0; length /= 2)
+    for (std::size_t length = kept.size(); length > 0; length /= 2) {
         for (std::size_t i = 0; i < kept.size();) {
             std::vector<std::size_t> without(kept.begin(), kept.begin() + static_cast<std::ptrdiff_t>(i));
             const std::size_t rest = std::min(i + length, kept.size());
@@ -112,6 +112,7 @@ std::vector<std::size_t> BranchJudge::reasons(SymbolicExprId condition, const Br
             else
                 i = rest;
         }
+    }
     return kept;
 }
 

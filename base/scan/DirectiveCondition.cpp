@@ -86,8 +86,8 @@ DirectiveCondition DirectiveConditionReader::read(const Directive& directive) {
             condition_.node = SymbolicNotExpr(table_, condition_.node).getId(table_);
     }
     std::ranges::sort(condition_.unknowns);
-    const auto repeated = std::ranges::unique(condition_.unknowns);
-    condition_.unknowns.erase(repeated.begin(), repeated.end());
+    auto& unknowns = condition_.unknowns;
+    unknowns.erase(std::unique(unknowns.begin(), unknowns.end()), unknowns.end());
     return std::move(condition_);
 }
 

@@ -26,10 +26,11 @@ DirectiveConditionReader::Operand DirectiveConditionReader::prefixed(const Opera
 
 DirectiveConditionReader::Operand DirectiveConditionReader::joined(SymbolicOp op, const Operand& a, const Operand& b) {
     if (op == SymbolicOp::And || op == SymbolicOp::Or) {
-        for (const Operand* const each : {&a, &b})
+        for (const Operand* const each : {&a, &b}) {
             condition_.bracketed = condition_.bracketed || (op == SymbolicOp::Or && each->first != each->innerFirst &&
                                                             each->kind == Operand::Kind::Truth &&
                                                             table_.get(each->truth)->op() == SymbolicOp::And);
+        }
         const SymbolicExprId left = truth(a);
         const SymbolicExprId right = truth(b);
         const SymbolicExprId node = op == SymbolicOp::And ? SymbolicAndExpr(table_, left, right).getId(table_)
@@ -49,14 +50,14 @@ DirectiveConditionReader::Operand DirectiveConditionReader::joined(SymbolicOp op
         }
         return result;
     }
-    return comparisonOps.contains(op) ? compared(op, a, b) : result;
+    if (!comparisonOps.contains(op))
+        return result;
+    return a.kind == Operand::Kind::Constant ? compared(operatorInfo(op).mirrored, b, a) : compared(op, a, b);
 }
 
 DirectiveConditionReader::Operand DirectiveConditionReader::compared(SymbolicOp op, const Operand& a,
                                                                      const Operand& b) {
     using Kind = Operand::Kind;
-    if (a.kind == Kind::Constant)
-        return compared(operatorInfo(op).mirrored, b, a);
     if (b.kind != Kind::Constant)
         return difference(op, a, b);
     const std::uint32_t first = std::min(a.first, b.first);

@@ -12,11 +12,12 @@ enum class Class : std::uint8_t { Plain, Name, Digit, Blank, NewLine, Slash, Quo
 
 constexpr std::array<Class, 256> classes = [] {
     std::array<Class, 256> table{};
-    for (unsigned c = 0; c < 256; ++c)
+    for (unsigned c = 0; c < 256; ++c) {
         if ((c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || c == '_' || c == '$' || c >= 0x80)
             table[c] = Class::Name;
         else if (c >= '0' && c <= '9')
             table[c] = Class::Digit;
+    }
     for (const unsigned char c : {' ', '\t', '\v', '\f', '\r', '\0'})
         table[c] = Class::Blank;
     table['\n'] = Class::NewLine;
@@ -251,12 +252,13 @@ bool DirectiveReader::readToken(bool afterBlank, DirectiveToken& token) {
         place_ = behindQuoted(begin);
         token.text = text_.substr(begin, place_ - begin);
     } else {
-        for (const std::string_view spelling : longOperators)
+        for (const std::string_view spelling : longOperators) {
             if (spelling[0] == c && spelling[1] == at(next)) {
                 token.kind = DirectiveTokenKind::Operator;
                 token.text = spelling;
                 place_ = next + 1;
             }
+        }
         if (token.text.empty()) {
             place_ = begin + 1;
             const std::size_t known = shortOperators.find(c);

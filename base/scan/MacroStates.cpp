@@ -17,13 +17,14 @@ MacroStates::Name MacroStates::nameOf(std::string_view text, bool lasting) {
     hash -= hash == invalidId ? 1U : 0U; // which is no key
     const auto name = static_cast<Name>(texts_.size());
     Name before = name;
-    if (const Name* latest = byHash_.find(hash))
+    if (const Name* latest = byHash_.find(hash)) {
         for (Name known = before = *latest;; known = sameHash_[known]) {
             if (texts_[known] == text)
                 return known;
             if (sameHash_[known] == known)
                 break;
         }
+    }
     texts_.push_back(lasting ? text : copies_.emplace_back(text));
     versions_.push_back(0);
     bodies_.emplace_back();

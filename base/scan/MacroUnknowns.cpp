@@ -16,7 +16,7 @@ bool isFixed(std::string_view name) {
 } // namespace
 
 std::size_t MacroUnknowns::KeyHash::operator()(const Key& key) const noexcept {
-    std::size_t seed = static_cast<std::size_t>(key.kind);
+    auto seed = static_cast<std::size_t>(key.kind);
     boost::hash_combine(seed, key.subject);
     boost::hash_combine(seed, key.version);
     boost::hash_combine(seed, key.epoch);
@@ -34,11 +34,12 @@ MacroUnknownId MacroUnknowns::add(MacroUnknown unknown) {
     else
         name = subject;
     // A line break is in no name, and keeps names of macros apart from the truth constants.
-    if (unknown.state.version != 0 || unknown.state.epoch != 0 || name == "true" || name == "false")
+    if (unknown.state.version != 0 || unknown.state.epoch != 0 || name == "true" || name == "false") {
         name.append("\n")
             .append(std::to_string(unknown.state.version))
             .append(".")
             .append(std::to_string(unknown.state.epoch));
+    }
     unknown.node = SymbolicString(table_, name).getId(table_);
     const Key group{MacroUnknown::Kind::Value, key.subject, key.version, 0};
     unknown.group = groups_.emplace(group, static_cast<std::uint32_t>(groups_.size())).first->second;

@@ -121,7 +121,7 @@ private:
 
 void FileScan::run() {
     DirectiveReader reader(text_);
-    for (Directive directive; reader.next(directive);)
+    for (Directive directive; reader.next(directive);) {
         switch (directive.kind) {
         case DirectiveKind::Define:
         case DirectiveKind::Undef:
@@ -139,6 +139,7 @@ void FileScan::run() {
         default:
             beginBranch(directive);
         }
+    }
 }
 
 void FileScan::changeMacros(const Directive& directive) {

@@ -17,6 +17,7 @@ bool isDefault(const VTBlock& block) {
 
 } // namespace
 
+// NOLINTBEGIN(misc-no-recursion): a default choice asks for the others, and those ask no further
 VCSymbolicExprId BlockConditions::own(const VTBlock& block) {
     if (const auto known = own_.find(&block); known != own_.end())
         return known->second;
@@ -35,12 +36,15 @@ VCSymbolicExprId BlockConditions::read(const VTBlock& block) {
 
 VCSymbolicExprId BlockConditions::readDefault(const VTBlock& block) {
     VCSymbolicExprId others = service_.table().getIdFALSE();
-    if (const VTBlock* const parent = vtsvGetBlockParent(block))
+    if (const VTBlock* const parent = vtsvGetBlockParent(block)) {
         for (const VTBlock* const choice : vtsvGetBlockChoices(*parent))
             if (!isDefault(*choice))
                 others = service_.OR(others, own(*choice), false);
+    }
     return service_.NOT(others, false);
 }
+
+// NOLINTEND(misc-no-recursion)
 
 VCSymbolicExprId BlockConditions::net(const VTBlock& block) {
     std::vector<const VTBlock*> open; // the innermost first

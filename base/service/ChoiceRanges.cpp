@@ -139,11 +139,12 @@ std::vector<std::size_t> sortedByRange(const std::vector<NameRanges>& ranges) {
             ++uses[range.name];
     SymbolicExprId key = invalidId;
     std::size_t most = 0;
-    for (const auto& [name, count] : uses)
+    for (const auto& [name, count] : uses) {
         if (count > most || (count == most && name < key)) {
             key = name;
             most = count;
         }
+    }
     const auto lowOf = [&](std::size_t position) {
         const auto at = std::ranges::lower_bound(ranges[position], key, {}, &NameRange::name);
         return at == ranges[position].end() || at->name != key ? highest : at->low;

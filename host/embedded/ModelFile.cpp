@@ -235,12 +235,13 @@ std::string Reader::pointer() const {
 
 void Reader::refuseShape() const {
     if (open_.empty())
-        fail("a model is an object: write {\"name\": ..., \"blocks\": [...]}");
+        fail(R"(a model is an object: write {"name": ..., "blocks": [...]})");
     const Open& top = open_.back();
-    if (!isObject(top.part))
+    if (!isObject(top.part)) {
         fail(top.part == Part::Destinations ? "write the path of a block, such as \"Engine/Diesel\""
-             : top.part == Part::Ports      ? "write a port, {\"name\": ..., \"from\": ..., \"to\": ...}"
-                                            : "write a block, {\"name\": ..., \"condition\": ...}");
+             : top.part == Part::Ports      ? R"(write a port, {"name": ..., "from": ..., "to": ...})"
+                                            : R"(write a block, {"name": ..., "condition": ...})");
+    }
     fail(top.member->shape == Shape::Text   ? "write a text in quotes"
          : top.member->shape == Shape::List ? "write a list, [...]"
                                             : "write the path of a block, or a list of such paths");
@@ -350,7 +351,7 @@ void Reader::setText(const std::string& text) {
 
 void Reader::setLanguage(const std::string& text) {
     if (text != "c" && text != "quill")
-        fail("there is no language " + inQuotes(text) + ": write \"c\" or \"quill\"");
+        fail("there is no language " + inQuotes(text) + R"(: write "c" or "quill")");
     model_.setQuill(text == "quill");
 }
 
@@ -360,10 +361,11 @@ bool Reader::end_object() {
     const auto has = [&](std::string_view name) {
         return std::ranges::find(open_.back().seen, name) != open_.back().seen.end();
     };
-    for (const std::string_view needed : {"name", "from"})
+    for (const std::string_view needed : {"name", "from"}) {
         if ((part == Part::Block && needed == "name") || part == Part::Port)
             if (!has(needed))
                 fail(std::string(nameOf(part)) + " without " + inQuotes(needed) + ": add it", begin, pointer());
+    }
     step();
     close();
     return true;
