@@ -16,6 +16,7 @@
 #include "base/print/PreprocessorVCExpr.hpp"
 #include "base/print/StringifyImpliedCondition.hpp"
 #include "base/print/StringifySymbolicExpr.hpp"
+#include "base/scan/SourceScan.hpp"
 #include "base/service/BlockConditions.hpp"
 #include "base/service/ChoiceSet.hpp"
 #include "base/service/SymbolRegistry.hpp"

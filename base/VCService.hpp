@@ -187,8 +187,8 @@ public:
     Decision isEquivalentFromQConditions(const std::string& a, const std::string& b);
     Decision isDisjointFromCConditions(const std::string& a, const std::string& b);
     Decision isDisjointFromQConditions(const std::string& a, const std::string& b);
-    Decision containsFromCConditions(const std::string& outer, const std::string& inner);
-    Decision containsFromQConditions(const std::string& outer, const std::string& inner);
+    Decision containsFromCConditions(const std::string& a, const std::string& b);
+    Decision containsFromQConditions(const std::string& a, const std::string& b);
     Decision isTighterThanFromCConditions(const std::string& a, const std::string& b);
     Decision isTighterThanFromQConditions(const std::string& a, const std::string& b);
     SetDecision coversFromCConditions(const std::vector<std::string>& conditions);

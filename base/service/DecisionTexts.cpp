@@ -4,7 +4,7 @@
 
 namespace VT {
 
-#define VTSYM_DECISION_OF_TEXTS(operation, a, b)                                                                       \
+#define VTSYM_DECISION_OF_TEXTS(operation)                                                                             \
     Decision VCService::operation##FromCConditions(const std::string& a, const std::string& b) {                       \
         const SymbolicExprId first = parse(a, false);                                                                  \
         return operation(first, parse(b, false));                                                                      \
@@ -14,11 +14,11 @@ namespace VT {
         return operation(first, parse(b, true));                                                                       \
     }
 
-VTSYM_DECISION_OF_TEXTS(implies, a, b)
-VTSYM_DECISION_OF_TEXTS(isEquivalent, a, b)
-VTSYM_DECISION_OF_TEXTS(isDisjoint, a, b)
-VTSYM_DECISION_OF_TEXTS(contains, outer, inner)
-VTSYM_DECISION_OF_TEXTS(isTighterThan, a, b)
+VTSYM_DECISION_OF_TEXTS(implies)
+VTSYM_DECISION_OF_TEXTS(isEquivalent)
+VTSYM_DECISION_OF_TEXTS(isDisjoint)
+VTSYM_DECISION_OF_TEXTS(contains)
+VTSYM_DECISION_OF_TEXTS(isTighterThan)
 
 #undef VTSYM_DECISION_OF_TEXTS
 

@@ -38,7 +38,7 @@ VT::SymbolicExprId readDimension(VT::SymbolicExprTable& table, const std::string
     VT::VTSymbolicExprErrorChecker checker;
     const VT::SymbolicExprId id = VT::SymbolicExprFromQParseTree(table, checker)(text);
     if (!checker.diagnostics().empty())
-        throw checker.diagnostics().front();
+        throw VT::HostDiagnostic(checker.diagnostics().front());
     return VT::SymbolicExprCast2Int(table).cast2Int(id);
 }
 
