@@ -96,7 +96,7 @@ std::string Explanation::json() const {
         steps.append("}");
     }
     if (proven_ != result_) {
-        steps.append(steps.empty() ? "{\"rule\":\"proven equal\"" : ",{\"rule\":\"proven equal\"");
+        steps.append(steps.empty() ? R"({"rule":"proven equal")" : R"(,{"rule":"proven equal")");
         appendMember(steps, "before", jsonString(step(result_)));
         appendMember(steps, "after", jsonString(step(proven_)));
         steps.append("}");

@@ -119,7 +119,7 @@ std::string jsonRegion(const Place& place) {
 }
 
 std::string jsonArtifact(const Place& place) {
-    return "\"artifactLocation\":{\"uri\":" + jsonString(uriOf(place.file)) + "}";
+    return R"("artifactLocation":{"uri":)" + jsonString(uriOf(place.file)) + "}";
 }
 
 /// A location; `further` are members that it has beside its place.
@@ -152,7 +152,7 @@ SarifWriter::SarifWriter(Console& console, std::span<const FindingRule> rules) :
         appendMember(out, "defaultConfiguration", R"({"level":"warning"})");
         out.push_back('}');
     }
-    console.data(out + "]}},\"columnKind\":\"unicodeCodePoints\",\"results\":[");
+    console.data(out + R"(]}},"columnKind":"unicodeCodePoints","results":[)");
 }
 
 void SarifWriter::add(const Finding& finding) {
