@@ -201,10 +201,11 @@ VT::ChoiceSetReport ModelCheck::checkChoices(const VTBlock& block) {
         write(findings, findingOf(block, block.choices(), finding));
     for (const VT::ChoiceFinding& finding : report.undecided)
         tellUndecided(block, block.choices(), finding);
-    if (!report.allOverlaps && !checker_.stepsUsedUp())
+    if (!report.allOverlaps && !checker_.stepsUsedUp()) {
         write(findings,
               findingAt(placeOf(block), VT::ChoiceFault::Overlap,
                         "more choices of " + block.path() + " overlap than the pairs told", block.variantCondition()));
+    }
     return report;
 }
 
@@ -303,10 +304,11 @@ void ModelCheck::checkPort(const vtPort& port) {
     if (!flows.isNo())
         return;
     std::vector<RelatedPlace> follows = conditionsAround(&port.source());
-    for (const VTBlock* const destination : port.destinations())
+    for (const VTBlock* const destination : port.destinations()) {
         for (RelatedPlace& each : conditionsAround(destination))
             if (follows.size() < 2 * shownAncestors)
                 follows.push_back(std::move(each));
+    }
     Finding result = findingAt(std::move(place), VT::ChoiceFault::Dead,
                                "the port " + shown(port.name()) + " is never active: " + port.source().path() +
                                    " is never active together with a block that it goes to",

@@ -70,11 +70,12 @@ Command addSymbols(CLI::App& program) {
                     conditions.makeRoomFor(text);
                     const auto symbols = conditions.symbols(conditions.parse(*options, text), kindsOf(*options));
                     std::string list;
-                    for (const std::string& symbol : symbols)
+                    for (const std::string& symbol : symbols) {
                         list.append(list.empty()    ? ""
                                     : options->json ? ","
                                                     : " ")
                             .append(options->json ? jsonString(symbol) : symbol);
+                    }
                     if (options->json)
                         appendMember(out, "symbols", "[" + list + "]");
                     else
