@@ -1,5 +1,7 @@
 #include "base/scan/ConstantArithmetic.hpp"
 
+#include "base/decide/Arithmetic.hpp"
+
 #include <limits>
 #include <string>
 
@@ -52,14 +54,6 @@ std::optional<DirectiveConstant> computeSigned(SymbolicOp op, std::int64_t a, st
             return std::nullopt;
         value = op == SymbolicOp::Divide ? a / b : a % b;
         break;
-    case SymbolicOp::LessThan:
-        return truth(a < b);
-    case SymbolicOp::LessThanEqual:
-        return truth(a <= b);
-    case SymbolicOp::GreaterThan:
-        return truth(a > b);
-    case SymbolicOp::GreaterThanEqual:
-        return truth(a >= b);
     default:
         return std::nullopt;
     }
@@ -79,14 +73,6 @@ std::optional<DirectiveConstant> computeUnsigned(SymbolicOp op, std::uint64_t a,
         if (b == 0)
             return std::nullopt;
         return DirectiveConstant{op == SymbolicOp::Divide ? a / b : a % b, true};
-    case SymbolicOp::LessThan:
-        return truth(a < b);
-    case SymbolicOp::LessThanEqual:
-        return truth(a <= b);
-    case SymbolicOp::GreaterThan:
-        return truth(a > b);
-    case SymbolicOp::GreaterThanEqual:
-        return truth(a >= b);
     default:
         return std::nullopt;
     }
@@ -146,11 +132,9 @@ std::optional<DirectiveConstant> computeConstant(SymbolicOp op, DirectiveConstan
 
 std::optional<DirectiveConstant> computeConstant(SymbolicOp op, DirectiveConstant a, DirectiveConstant b) {
     const bool isUnsigned = a.isUnsigned || b.isUnsigned;
+    if (comparisonOps.contains(op))
+        return truth(isUnsigned ? compareNumbers(op, a.bits, b.bits) : compareNumbers(op, a.asSigned(), b.asSigned()));
     switch (op) {
-    case SymbolicOp::Equal:
-        return truth(a.bits == b.bits);
-    case SymbolicOp::NotEqual:
-        return truth(a.bits != b.bits);
     case SymbolicOp::BitAnd:
         return DirectiveConstant{a.bits & b.bits, isUnsigned};
     case SymbolicOp::BitOr:

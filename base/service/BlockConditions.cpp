@@ -9,13 +9,9 @@
 
 namespace VT {
 
-namespace {
-
-bool isDefault(const VTBlock& block) {
+bool BlockConditions::isDefault(const VTBlock& block) {
     return VariantKeywords::isDefaultVariantKeyword(std::string(vtsvGetBlockVariantCondition(block).text), true);
 }
-
-} // namespace
 
 // NOLINTBEGIN(misc-no-recursion): a default choice asks for the others, and those ask no further
 VCSymbolicExprId BlockConditions::own(const VTBlock& block) {

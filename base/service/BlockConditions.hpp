@@ -18,6 +18,8 @@ class VTSYM_API BlockConditions {
 public:
     explicit BlockConditions(VCService& service) : service_(service) {}
 
+    /// Whether a block is the choice for where no other one is active.
+    static bool isDefault(const VTBlock& block);
     /// The condition of a block itself.  "(inherit)" and no text at all are TRUE; "(default)" is that none of the
     /// other choices' conditions holds, but for those that are "(default)" as well.
     VCSymbolicExprId own(const VTBlock& block);

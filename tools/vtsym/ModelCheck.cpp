@@ -26,10 +26,6 @@ std::string_view kindOf(VT::ChoiceFault fault) {
     return kinds.at(static_cast<std::size_t>(fault));
 }
 
-bool isDefault(const VTBlock& block) {
-    return VT::VariantKeywords::isDefaultVariantKeyword(block.variantCondition(), true);
-}
-
 bool isUnconditional(const VTBlock& block) {
     return block.variantCondition().empty() ||
            VT::VariantKeywords::isInheritVariantKeyword(block.variantCondition(), true);
@@ -117,14 +113,14 @@ bool ModelCheck::readConditions() {
         allRead = false;
     };
     for (const VTBlock& block : model_.blocks()) {
-        if (isDefault(block) && !block.isChoice())
+        if (VT::BlockConditions::isDefault(block) && !block.isChoice())
             refuse(block, "\"(default)\" is for choices alone: write a condition.");
-        else if (isDefault(block) && !withDefault.insert(block.parent()).second)
+        else if (VT::BlockConditions::isDefault(block) && !withDefault.insert(block.parent()).second)
             refuse(block, "There is another \"(default)\" choice: write a condition.");
         try {
             conditions_.own(block);
         } catch (const VT::HostDiagnostic& diagnostic) {
-            if (!isDefault(block)) // which reads the others, that are told themselves
+            if (!VT::BlockConditions::isDefault(block)) // which reads the others, that are told themselves
                 refuse(block, diagnostic.what());
         }
     }
@@ -183,8 +179,8 @@ VT::ChoiceSetReport ModelCheck::checkChoices(const VTBlock& block) {
     choices.reserve(block.choices().size());
     for (const VTBlock* const choice : block.choices())
         choices.push_back(conditions_.own(*choice).id());
-    const auto defaultChoice =
-        std::ranges::find_if(block.choices(), [](const VTBlock* each) { return isDefault(*each); });
+    const auto defaultChoice = std::ranges::find_if(
+        block.choices(), [](const VTBlock* each) { return VT::BlockConditions::isDefault(*each); });
     VT::ChoiceSetReport report =
         checker_.check(contextOf(&block), choices,
                        defaultChoice == block.choices().end()
@@ -193,7 +189,7 @@ VT::ChoiceSetReport ModelCheck::checkChoices(const VTBlock& block) {
     std::erase_if(report.findings, [&](const VT::ChoiceFinding& finding) {
         const VTBlock& choice = *block.choices()[finding.choice];
         return finding.fault == VT::ChoiceFault::AlwaysActive && choices.size() == 1 &&
-               (isUnconditional(choice) || isDefault(choice));
+               (isUnconditional(choice) || VT::BlockConditions::isDefault(choice));
     });
     choiceSets_.push_back({&block, report, {}});
     std::vector<Finding>& findings = choiceSets_.back().findings;
@@ -223,7 +219,7 @@ Finding ModelCheck::findingOf(const VTBlock& set, std::span<const VTBlock* const
     switch (finding.fault) {
     case VT::ChoiceFault::Dead:
         result.message = path + " is never active: ";
-        if (isDefault(block))
+        if (VT::BlockConditions::isDefault(block))
             result.message += "the other choices leave nothing to it";
         else if (checker_.canHold(conditions_.own(block).id()).isYes())
             result.message += condition + " cannot hold" + where + " active";
