@@ -3,11 +3,11 @@
 #include "base/core/Limits.hpp"
 #include "base/variants/Features.hpp"
 #include "tests/support/FlagSetting.hpp"
+#include "tests/support/Locales.hpp"
 #include "tests/support/Parsing.hpp"
 #include "tests/support/Times.hpp"
 #include "tests/support/TreeText.hpp"
 
-#include <clocale>
 #include <cmath>
 #include <gtest/gtest.h>
 
@@ -149,14 +149,10 @@ TEST(Grammar, CallsTakeTheClassThatWasInternedFirst) {
 }
 
 TEST(Grammar, LocalesChangeNothing) {
-    const std::string before = std::setlocale(LC_ALL, nullptr);
-    for (const char* name : {"de_DE.UTF-8", "de_DE.ISO-8859-1", "tr_TR.UTF-8", "C.UTF-8"}) {
-        if (std::setlocale(LC_ALL, name) == nullptr)
-            continue;
+    inEveryLocale([] {
         expectTrees({{"1.5 + I", "Plus(1.5r,I)"}});
         expectStops({"1`,5", "`\xe4", "a`\xa0"});
-    }
-    std::setlocale(LC_ALL, before.c_str());
+    });
 }
 
 constexpr std::size_t bound = limits::nesting;

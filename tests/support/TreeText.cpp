@@ -3,14 +3,16 @@
 #include "base/core/Nodes.hpp"
 
 #include <array>
-#include <cstdio>
+#include <charconv>
 
 namespace VT::Testing {
 
 std::string realText(double value) {
     std::array<char, 40> digits{};
-    std::snprintf(digits.data(), digits.size(), "%.17gr", value);
-    return digits.data();
+    const char* const end = std::to_chars(digits.data(), digits.data() + digits.size(), value,
+                                          std::chars_format::general, 17) // in every locale
+                                .ptr;
+    return std::string(static_cast<const char*>(digits.data()), end) + "r";
 }
 
 std::string treeText(const SymbolicExprTable& table, SymbolicExprId id) { // NOLINT(misc-no-recursion): small trees only
