@@ -1,3 +1,8 @@
+// Computes single values as a witness needs them: exactly, or not at all.
+//
+// Sums and products are those of the unbounded integers as long as they fit 64 bits. Quotients truncate toward zero as
+// in C. Bits and shifts are those of 32-bit values. A comparison with a real literal never rounds the integer: it
+// compares with the literal's whole part and then asks whether there is a fraction.
 #include "base/decide/Arithmetic.hpp"
 
 #include <cmath>

@@ -1,4 +1,8 @@
-// Arithmetic in conditions: linear where it can be, else an unknown for each node.
+// Reads arithmetic inside conditions: as linear forms where it is linear, otherwise as one unknown for each node.
+//
+// A sum or a product by a constant combines forms, guarded case by guarded case. Any other operator on constants is
+// computed. What remains becomes an unknown with the bounds that its operator implies (`a % 8` lies in -7..7, `a & 6`
+// is made of the bits 6) and with what its operands say about 0.
 #include "base/core/Limits.hpp"
 #include "base/decide/Arithmetic.hpp"
 #include "base/decide/ConditionReader.hpp"

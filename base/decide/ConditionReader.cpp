@@ -1,3 +1,8 @@
+// Reads conditions bottom-up with an explicit stack and builds their diagrams.
+//
+// Every node is read once; a chain of one operator is read as a whole and its operands are joined pairwise. Strict and
+// unequal comparisons are read as the opposite of the comparison that they negate, so that only three operators build
+// diagrams. One step for each operand, plus those of the diagrams.
 #include "base/decide/ConditionReader.hpp"
 
 #include "base/decide/Arithmetic.hpp"

@@ -1,3 +1,4 @@
+// Names the relation of two conditions from the three answers that determine it.
 #include "base/decide/Decision.hpp"
 
 #include <algorithm>

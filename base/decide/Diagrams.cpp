@@ -1,3 +1,10 @@
+// Implements reduced ordered decision diagrams with interval edges and complemented references.
+//
+// Method: the apply algorithm (Bryant, "Graph-based algorithms for Boolean function manipulation", 1986) on an explicit
+// stack, a unique table with open addressing, and a memo of pairs that a new question invalidates by counting. The
+// first edge of a node is never complemented, which makes references canonical.
+//
+// Cost: one step for each edge that is joined; 16 bytes for each edge and 16 for each node that is kept.
 #include "base/decide/Diagrams.hpp"
 
 #include "base/core/Hash.hpp"

@@ -1,3 +1,10 @@
+// Solves bounds on integers and their differences.
+//
+// Method: shortest paths after Bellman and Ford find a negative cycle; then values are fixed one after the other, each
+// as near to 0 as the ranges allow, and the ranges are tightened after each (Cormen et al., "Introduction to
+// Algorithms", difference constraints).
+//
+// Relies on: every bound is within `largestNumber`, so a path of at most 2^20 of them stays within 64 bits.
 #include "base/decide/DifferenceSystem.hpp"
 
 #include "base/decide/LinearForm.hpp"

@@ -1,3 +1,4 @@
+// Classifies a leaf by its node and, for a member, by the value bound to it. O(1); interns nothing.
 #include "base/decide/Leaves.hpp"
 
 #include "base/core/Nodes.hpp"

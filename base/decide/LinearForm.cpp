@@ -1,3 +1,7 @@
+// Adds multiples of linear forms by merging their sorted parts.
+//
+// Every product and sum is checked: a number beyond `largestNumber` refuses the whole combination instead of rounding
+// it. Linear in the parts of both forms.
 #include "base/decide/LinearForm.hpp"
 
 namespace VT {

@@ -1,3 +1,8 @@
+// Flattens a term into a list of nodes, operands before operators, and evaluates it in one pass.
+//
+// The list is ordered by identifier, because operands are interned before their operator. Evaluation yields no value as
+// soon as one node has none; `&&` and `||` do not hide a division by zero on their right. Linear in the distinct nodes,
+// no recursion.
 #include "base/decide/TermPlan.hpp"
 
 #include "base/core/Nodes.hpp"

@@ -1,3 +1,11 @@
+// Numbers the unknowns of conditions and keeps them in the order of their texts.
+//
+// Method: order maintenance with labels (Dietz and Sleator, "Two algorithms for maintaining order in a list", 1987): a
+// balanced tree finds the place of a new unknown by text, and a 64-bit label between its neighbours makes every later
+// comparison one of numbers. When a gap is full, all labels are dealt again.
+//
+// Cost: one text comparison for each level of the tree when an unknown is met first, O(1) afterwards; relabelling is
+// linear and rare, since gaps begin at 2^32.
 #include "base/decide/Unknowns.hpp"
 
 #include "base/core/Nodes.hpp"

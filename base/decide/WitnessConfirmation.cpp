@@ -1,4 +1,10 @@
-// Witnesses that hang on arithmetic which is not understood: confirmed by evaluation, or looked for nearby.
+// Confirms witnesses by evaluation where a path restricts arithmetic that the diagrams do not understand.
+//
+// Method: compute each term from the values of its free unknowns and follow the whole diagram. If that fails, change
+// one unknown, then two, to values that the literals suggest (the literals, their neighbours, divisors, sums,
+// differences and products) and ask again.
+//
+// Cost: at most limits::confirmations trials in one question; each costs the nodes of the terms and one path.
 #include "base/decide/WitnessSearch.hpp"
 
 #include <algorithm>

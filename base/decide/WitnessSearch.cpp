@@ -1,3 +1,10 @@
+// Walks the paths of a diagram to the smallest assignment that reaches `always`.
+//
+// Method: branch and bound. A frame for each node on the path holds the solution of the bounds so far, which is a lower
+// bound for all assignments below; edges are tried from that solution outwards. Where the diagram branches on unknowns
+// alone, one descent suffices.
+//
+// Cost: one step for each edge tried plus those of the difference system.
 #include "base/decide/WitnessSearch.hpp"
 
 #include "base/core/Limits.hpp"
