@@ -67,8 +67,6 @@ void implyAgainLibrary(benchmark::State& state, std::int64_t) {
         });
 }
 
-#ifdef VTSYM_HAVE_Z3
-
 void implySolver(benchmark::State& state, std::int64_t) {
     measure(
         state, [] { return std::make_unique<Testing::Solver>(corpus().table); },
@@ -94,8 +92,6 @@ void implyAgainSolver(benchmark::State& state, std::int64_t) {
                 benchmark::DoNotOptimize(solver->canHold(solver->truth(a), solver->negated(solver->truth(b))));
         });
 }
-
-#endif
 
 /// A set of conditions in a table of its own.
 struct Set {
@@ -160,8 +156,6 @@ void readFloor(benchmark::State& state, std::int64_t size) {
         });
 }
 
-#ifdef VTSYM_HAVE_Z3
-
 /// The solver's context, which takes a millisecond to make, is there already.
 template <auto build>
 void holdSolver(benchmark::State& state, std::int64_t size) {
@@ -183,8 +177,6 @@ void holdSolver(benchmark::State& state, std::int64_t size) {
         });
 }
 
-#endif
-
 SetDecision covers(Decider& decider, const Set& set) {
     return decider.covers(set.ids);
 }
@@ -199,7 +191,6 @@ Decision canHold(Decider& decider, const Set& set) {
 
 const bool registered = [] {
     const auto pairs = static_cast<double>(corpus().pairs.size());
-#ifdef VTSYM_HAVE_Z3
     compare({.name = "decide corpus pairs, read on the way (floor: Z3)",
              .library = implyLibrary,
              .floor = implySolver,
@@ -223,10 +214,6 @@ const bool registered = [] {
                  .floor = holdSolver<conjunctionOf<step>>,
                  .size = atoms});
     }
-#else
-    std::fprintf(stderr, "Z3 (libz3-dev) was not there at build time: comparisons with it are left out\n");
-    static_cast<void>(pairs);
-#endif
     for (const std::int64_t choices : {10, 100, 1000, 10000}) {
         const std::string count = std::to_string(choices);
         compare({.name = "cover by " + count + " choices (floor: read)",

@@ -250,8 +250,6 @@ void expectWitnesses(const DecisionBench& bench, SymbolicExprId a, SymbolicExprI
     expectWitness(relation.both, true, true);
 }
 
-#ifdef VTSYM_HAVE_Z3
-
 /// Compares the answers to the three questions about a pair.
 void expectSame(Solver& solver, SymbolicExprId a, SymbolicExprId b, const Relation& relation) {
     const auto expectOne = [&](const Decision& decision, bool wantsA, bool wantsB) {
@@ -290,14 +288,6 @@ TEST(AgainstSolver, RandomPairs) {
         }
     }
 }
-
-#else
-
-TEST(AgainstSolver, RandomPairs) {
-    GTEST_SKIP() << "skipped: the solver's development files (libz3-dev) were not there when the tests were built";
-}
-
-#endif
 
 /// Neighbours among the lines that share a symbol.
 TEST(CorpusPairs, AreDecidedAndWitnessesHold) {

@@ -1,5 +1,4 @@
-// An independent solver as oracle: conditions over unbounded integers decided by Z3, where its development files are
-// there.
+// An independent solver as oracle: conditions over unbounded integers decided by Z3.
 #pragma once
 
 #include "base/VTSymbolicExpr.hpp"
@@ -8,7 +7,6 @@
 #include <stdexcept>
 #include <string>
 
-#ifdef VTSYM_HAVE_Z3
 #include <z3.h>
 
 namespace VT::Testing {
@@ -141,4 +139,3 @@ private:
 };
 
 } // namespace VT::Testing
-#endif
