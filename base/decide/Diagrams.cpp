@@ -7,6 +7,7 @@
 // Cost: one step for each edge that is joined; 16 bytes for each edge and 16 for each node that is kept.
 #include "base/decide/Diagrams.hpp"
 
+#include "base/core/Check.hpp"
 #include "base/core/Hash.hpp"
 
 #include <algorithm>
@@ -72,6 +73,20 @@ void Diagrams::append(std::size_t scratch, std::int64_t high, Diagram child) {
         scratch_.push_back({high, child});
 }
 
+/// Whether the edges from `scratch` on are those of a node: in order, up to infinity, no two neighbours alike, and
+/// children that branch on later quantities.
+[[maybe_unused]] bool Diagrams::isReduced(Quantity quantity, std::size_t scratch) const {
+    for (std::size_t i = scratch; i < scratch_.size(); ++i) {
+        const Edge& edge = scratch_[i];
+        const bool follows = i == scratch || (scratch_[i - 1].high < edge.high && scratch_[i - 1].child != edge.child);
+        const bool below =
+            isTerminal(edge.child) || unknowns_.key(quantity) < unknowns_.key(this->quantity(edge.child));
+        if (!follows || !below)
+            return false;
+    }
+    return scratch_.back().high == plusInfinite;
+}
+
 /// The node with the edges from `scratch` on, which are taken away.
 Diagram Diagrams::make(Quantity quantity, std::size_t scratch) {
     const Diagram flip = scratch_[scratch].child & 1U; // the first edge of a node is never negated
@@ -81,6 +96,7 @@ Diagram Diagrams::make(Quantity quantity, std::size_t scratch) {
         scratch_.resize(scratch);
         return only;
     }
+    VTSYM_CHECK(isReduced(quantity, scratch));
     std::uint64_t hash = quantity;
     for (std::size_t i = scratch; i < scratch_.size(); ++i) {
         scratch_[i].child ^= flip;
@@ -203,8 +219,10 @@ Diagram Diagrams::both(Diagram a, Diagram b) {
             result = make(frame.quantity, frame.scratch);
             remember(frame.a, frame.b, result);
             frames_.pop_back();
-            if (frames_.size() == bottom)
+            if (frames_.size() == bottom) {
+                VTSYM_CHECK(bottom != 0 || scratch_.empty());
                 return result;
+            }
             continue;
         }
         steps_.take();

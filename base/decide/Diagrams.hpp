@@ -110,6 +110,7 @@ private:
     bool resolve(Diagram a, Diagram b, Diagram& result);
     void enter(Diagram a, Diagram b);
     void append(std::size_t scratch, std::int64_t high, Diagram child);
+    [[nodiscard]] bool isReduced(Quantity quantity, std::size_t scratch) const;
     Diagram make(Quantity quantity, std::size_t scratch);
     Known& slotOf(Diagram a, Diagram b);
     void remember(Diagram a, Diagram b, Diagram result);

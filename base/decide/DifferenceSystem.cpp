@@ -7,6 +7,7 @@
 // Relies on: every bound is within `largestNumber`, so a path of at most 2^20 of them stays within 64 bits.
 #include "base/decide/DifferenceSystem.hpp"
 
+#include "base/core/Check.hpp"
 #include "base/decide/LinearForm.hpp"
 
 #include <algorithm>
@@ -94,6 +95,7 @@ bool DifferenceSystem::solve(std::vector<std::int64_t>& values) {
         tighten();
     }
     values.assign(low_.begin(), low_.end());
+    VTSYM_CHECK(std::ranges::all_of(bounds_, [&](const Bound& b) { return values[b.x] - values[b.y] <= b.most; }));
     return true;
 }
 

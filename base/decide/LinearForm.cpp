@@ -4,6 +4,10 @@
 // it. Linear in the parts of both forms.
 #include "base/decide/LinearForm.hpp"
 
+#include "base/core/Check.hpp"
+
+#include <algorithm>
+
 namespace VT {
 
 namespace {
@@ -42,6 +46,7 @@ std::optional<LinearForm> combine(const LinearForm& a, std::int64_t factorA, con
         if (*factor != 0)
             sum.parts.push_back({unknown, *factor});
     }
+    VTSYM_CHECK(std::ranges::is_sorted(sum.parts, {}, &LinearPart::unknown));
     return sum;
 }
 

@@ -8,6 +8,7 @@
 // linear and rare, since gaps begin at 2^32.
 #include "base/decide/Unknowns.hpp"
 
+#include "base/core/Check.hpp"
 #include "base/core/Nodes.hpp"
 
 #include <boost/container_hash/hash.hpp>
@@ -97,7 +98,10 @@ Unknown Unknowns::add(UnknownInfo info) {
     info.quantity = static_cast<Quantity>(quantities_.size());
     quantities_.push_back({unknown, noUnknown, info.low, info.high});
     unknowns_.push_back(std::move(info));
-    label(order_.insert(unknown).first);
+    const auto at = order_.insert(unknown).first;
+    label(at);
+    VTSYM_CHECK(at == order_.begin() || before(*std::prev(at), unknown));
+    VTSYM_CHECK(std::next(at) == order_.end() || before(unknown, *std::next(at)));
     return unknown;
 }
 

@@ -39,21 +39,28 @@ bool WitnessSearch::computeTerms(std::vector<std::int64_t>& values) {
     return true;
 }
 
+/// Follows the whole diagram from its root; the values are those of all unknowns, terms included.
+WitnessSearch::Followed WitnessSearch::follow(const std::vector<std::int64_t>& values) const {
+    Followed path{root_, 0};
+    while (path.end > never) {
+        ++path.edges;
+        const QuantityInfo& info = unknowns_.quantity(diagrams_.quantity(path.end));
+        std::int64_t value = values[numberOf(info.plus)];
+        if (info.isDifference() && __builtin_sub_overflow(value, values[numberOf(info.minus)], &value))
+            return {never, path.edges};
+        path.end = diagrams_.edge(path.end, diagrams_.edgeOf(path.end, value)).child;
+    }
+    return path;
+}
+
 /// Asks the whole diagram with the terms computed; the values are in trial_.
 bool WitnessSearch::confirm(const std::vector<std::int64_t>& values) {
     trial_ = values;
     if (!computeTerms(trial_))
         return false;
-    Diagram at = root_;
-    while (at > never) {
-        steps_.take();
-        const QuantityInfo& info = unknowns_.quantity(diagrams_.quantity(at));
-        std::int64_t value = trial_[numberOf(info.plus)];
-        if (info.isDifference() && __builtin_sub_overflow(value, trial_[numberOf(info.minus)], &value))
-            return false;
-        at = diagrams_.edge(at, diagrams_.edgeOf(at, value)).child;
-    }
-    return at == always;
+    const Followed path = follow(trial_);
+    steps_.take(path.edges);
+    return path.end == always;
 }
 
 /// Whether a sum lies on this path where the ranges of its parts do not reach.

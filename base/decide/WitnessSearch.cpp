@@ -7,6 +7,7 @@
 // Cost: one step for each edge tried plus those of the difference system.
 #include "base/decide/WitnessSearch.hpp"
 
+#include "base/core/Check.hpp"
 #include "base/core/Limits.hpp"
 
 #include <algorithm>
@@ -48,8 +49,10 @@ Decision WitnessSearch::find(Diagram diagram, std::span<const UnknownLeaf> leave
     } catch (const StepsUsedUp&) {
         bound = DecisionBound::Steps;
     }
-    if (best_)
+    if (best_) {
+        VTSYM_CHECK(follow(*best_).end == always);
         return {Answer::Yes, DecisionBound::None, witness(*best_, leaves)};
+    }
     if (bound == DecisionBound::None && unconfirmed_)
         bound = DecisionBound::Terms;
     return {bound == DecisionBound::None ? Answer::No : Answer::Undecided, bound, std::nullopt};

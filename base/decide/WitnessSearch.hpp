@@ -66,6 +66,12 @@ private:
         std::unique_ptr<TermPlan> plan; ///< none for a sum
     };
 
+    struct Followed {
+        Diagram end; ///< `always` or `never`
+        std::size_t edges;
+    };
+
+    [[nodiscard]] Followed follow(const std::vector<std::int64_t>& values) const;
     bool computeTerms(std::vector<std::int64_t>& values);
     bool confirm(const std::vector<std::int64_t>& values);
     /// Another value for the unknown at a position of movable_.
