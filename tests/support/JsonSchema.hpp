@@ -3,6 +3,8 @@
 
 #include <nlohmann/json.hpp>
 
+#include <algorithm>
+#include <regex>
 #include <set>
 #include <string>
 
@@ -14,6 +16,11 @@ inline std::string schemaErrors(const nlohmann::json& root, const nlohmann::json
     if (schema.contains("$ref"))
         return schemaErrors(root, root.at(nlohmann::json::json_pointer(schema["$ref"].get<std::string>().substr(1))),
                             value, place);
+    if (schema.contains("anyOf"))
+        return std::ranges::any_of(schema["anyOf"],
+                                   [&](const auto& one) { return schemaErrors(root, one, value).empty(); })
+                   ? ""
+                   : place + ": is none of the forms\n";
     const std::string type = schema.value("type", "");
     const bool isOfType = type.empty() || (type == "integer" ? value.is_number_integer() : type == value.type_name());
     if (!isOfType)
@@ -23,6 +30,9 @@ inline std::string schemaErrors(const nlohmann::json& root, const nlohmann::json
         errors += place + ": is none of the values\n";
     if (schema.contains("minimum") && value < schema["minimum"])
         errors += place + ": is too small\n";
+    if (value.is_string() && schema.contains("pattern") &&
+        !std::regex_match(value.get<std::string>(), std::regex(schema["pattern"].get<std::string>())))
+        errors += place + ": is not of the pattern\n";
     if (value.is_array()) {
         if (value.size() < schema.value("minItems", 0U))
             errors += place + ": has too few items\n";
