@@ -2,8 +2,11 @@
 //
 // Integer arithmetic wraps at 32 bits.  Adding and multiplying integers modulo 2^32 is associative, commutative and
 // distributive, so terms may be gathered in any order; what a rule writes down is exact in 64 bits and written only
-// where it fits 32.  Reals are rounded at each step, so they are folded pair by pair and never regrouped.  Quotients
-// are moved as if they were exact.
+// where it fits 32.  Reals are rounded at each step, so sums of them are folded pair by pair and never regrouped; a
+// real factor is multiplied into a constant beside it, which may round once where evaluation rounds twice.
+//
+// Quotients are exact in dimensions, and rules move them there; those of a condition are truncated, and stay where they
+// are.
 #include "base/core/IdMap.hpp"
 #include "base/core/Limits.hpp"
 #include "base/core/Walk.hpp"
@@ -74,6 +77,8 @@ const SymbolicBinaryExpr* binary(const RuleContext& context, SymbolicExprId id, 
 // Products.
 
 SymbolicExprId cancelledQuotient(RuleContext& context, const RuleOperands& x) {
+    if (context.inCondition())
+        return invalidId;
     if (const auto* quotient = binary(context, x.a, SymbolicOp::Divide);
         quotient != nullptr && quotient->right() == x.b)
         return quotient->left();
@@ -97,32 +102,39 @@ SymbolicExprId zeroFactor(RuleContext& context, const RuleOperands& x) {
     return context.integer(x.valueB) == 0 ? x.b : invalidId;
 }
 
-/// c*(r + d) with integers c and d; what r is multiplied with is not distributed again.
-SymbolicExprId distributedFactor(RuleContext& context, const RuleOperands& x) {
-    const bool plus = binary(context, x.b, SymbolicOp::Plus) != nullptr;
-    const auto* sum = plus ? binary(context, x.b, SymbolicOp::Plus) : binary(context, x.b, SymbolicOp::Minus);
-    if (sum == nullptr || !context.integer(x.valueA) || !context.integer(sum->right()))
+/// The product of two literals; the invalid identifier where it is too large, or so small that only zero is left of it.
+SymbolicExprId productOfNumbers(RuleContext& context, SymbolicExprId a, SymbolicExprId b) {
+    const SymbolicExprId product = foldNumbers(context, SymbolicOp::Multiply, a, b);
+    if (product == invalidId)
         return invalidId;
-    const SymbolicExprId constant = foldNumbers(context, SymbolicOp::Multiply, x.valueA, sum->right());
+    const auto value = [&](SymbolicExprId id) { return context.node(id).getNumValue(); };
+    return value(product) == 0 && value(a) != 0 && value(b) != 0 ? invalidId : product;
+}
+
+/// c*(r + d) and c*(r - d) as c*r + c*d, or unchanged where the rewrite is refused.
+SymbolicExprId distributedFactor(RuleContext& context, const RuleOperands& x) {
+    const SymbolicOp op = context.op(x.b);
+    if (op != SymbolicOp::Plus && op != SymbolicOp::Minus)
+        return invalidId;
+    const auto& sum = static_cast<const SymbolicBinaryExpr&>(context.node(x.b));
+    const SymbolicExprId constant = productOfNumbers(context, x.valueA, sum.right());
     if (constant == invalidId)
         return invalidId;
-    const SymbolicOp op = plus ? SymbolicOp::Plus : SymbolicOp::Minus;
-    const bool nested = sumOps.contains(context.op(sum->left()));
-    const SymbolicExprId product = nested ? context.makeBinary(SymbolicOp::Multiply, x.a, sum->left())
-                                          : simplifyMultiply(context, x.a, sum->left());
-    const SymbolicExprId result = simplifySum(context, context.makeBinary(op, product, constant));
+    const SymbolicExprId result =
+        context.makeBinary(op, context.makeBinary(SymbolicOp::Multiply, x.a, sum.left()), constant);
     const SymbolicExprId expression = context.makeBinary(SymbolicOp::Multiply, x.a, x.b);
-    return context.confirmRewrite(expression, result) ? result : invalidId;
+    return context.confirmRewrite(expression, result) ? result : expression;
 }
 
 SymbolicExprId gatheredFactor(RuleContext& context, const RuleOperands& x) {
     const auto* product = binary(context, x.b, SymbolicOp::Multiply);
-    if (product == nullptr || !context.integer(x.valueA) || !context.integer(product->left()))
+    if (product == nullptr)
         return invalidId;
-    const SymbolicExprId factor = foldNumbers(context, SymbolicOp::Multiply, x.valueA, product->left());
+    const SymbolicExprId factor = productOfNumbers(context, x.valueA, product->left());
     return factor == invalidId ? invalidId : context.makeBinary(SymbolicOp::Multiply, factor, product->right());
 }
 
+/// c*(x/d) where d divides c.  A truncated quotient may be moved only where nothing is cut off.
 SymbolicExprId reducedFraction(RuleContext& context, const RuleOperands& x) {
     const auto* quotient = binary(context, x.b, SymbolicOp::Divide);
     if (quotient == nullptr)
@@ -131,19 +143,21 @@ SymbolicExprId reducedFraction(RuleContext& context, const RuleOperands& x) {
     const std::optional<int> divisor = context.integer(quotient->right());
     if (!factor || !divisor || *divisor == 0 || std::int64_t{*factor} % *divisor != 0)
         return invalidId;
+    if (context.inCondition() && *divisor != 1 && *divisor != -1)
+        return invalidId;
     const SymbolicExprId rest = integerIfFits(context, std::int64_t{*factor} / *divisor);
-    return rest == invalidId ? invalidId : simplifyMultiply(context, rest, quotient->left());
+    return rest == invalidId ? invalidId : context.makeBinary(SymbolicOp::Multiply, rest, quotient->left());
 }
 
 constexpr OperatorSet multiplyOnly{SymbolicOp::Multiply};
 constexpr NodeRule multiplyRules[] = {
     {{multiplyOnly, "folded product", "2*3", "6"}, foldedNumbers},
     {{multiplyOnly, "cancelled quotient", "N/M*M", "N"}, cancelledQuotient},
-    {{multiplyOnly, "neutral factor", "1*N", "N"}, neutralFactor},
-    {{multiplyOnly, "zero factor", "N*0", "0"}, zeroFactor},
     {{multiplyOnly, "distributed factor", "2*(N + 3)", "2*N + 6"}, distributedFactor},
     {{multiplyOnly, "gathered factor", "2*(3*N)", "6*N"}, gatheredFactor},
     {{multiplyOnly, "reduced fraction", "4*(N/2)", "2*N"}, reducedFraction},
+    {{multiplyOnly, "neutral factor", "1*N", "N"}, neutralFactor},
+    {{multiplyOnly, "zero factor", "N*0", "0"}, zeroFactor},
 };
 
 // Quotients.
@@ -330,9 +344,38 @@ const RuleInfo& LinearSum::rule() const {
 } // namespace
 
 SymbolicExprId simplifyMultiply(RuleContext& context, SymbolicExprId a, SymbolicExprId b) {
-    const RuleOperands operands{SymbolicOp::Multiply, a, b, context.resolve(a), context.resolve(b)};
-    const SymbolicExprId result = applyFirst(multiplyRules, context, operands);
-    return result != invalidId ? result : context.makeBinary(SymbolicOp::Multiply, a, b);
+    struct Addend {
+        SymbolicOp op;
+        SymbolicExprId constant;
+    };
+
+    // What is left after a rule may be a product to which a further one applies, or a distribution's sum with such a
+    // product on its left.
+    std::vector<Addend> addends;
+    SymbolicExprId product = context.makeBinary(SymbolicOp::Multiply, a, b);
+    for (;;) {
+        const auto* factors = binary(context, product, SymbolicOp::Multiply);
+        if (factors == nullptr)
+            break;
+        const SymbolicExprId left = factors->left();
+        const SymbolicExprId right = factors->right();
+        const RuleOperands operands{SymbolicOp::Multiply, left, right, context.resolve(left), context.resolve(right)};
+        const SymbolicExprId result = applyFirst(multiplyRules, context, operands);
+        if (result == invalidId || result == product)
+            break;
+        product = result;
+        const SymbolicOp op = context.op(result);
+        if (op != SymbolicOp::Plus && op != SymbolicOp::Minus)
+            continue;
+        const auto& sum = static_cast<const SymbolicBinaryExpr&>(context.node(result));
+        addends.push_back({op, sum.right()});
+        product = sum.left();
+    }
+    if (addends.empty())
+        return product;
+    for (; !addends.empty(); addends.pop_back())
+        product = context.makeBinary(addends.back().op, product, addends.back().constant);
+    return simplifySum(context, product);
 }
 
 SymbolicExprId simplifyDivide(RuleContext& context, SymbolicExprId a, SymbolicExprId b) {

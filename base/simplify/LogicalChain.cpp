@@ -1,5 +1,6 @@
 #include "base/simplify/LogicalChain.hpp"
 
+#include "base/core/IdMap.hpp"
 #include "base/simplify/Atoms.hpp"
 #include "base/simplify/RuleTables.hpp"
 
@@ -307,6 +308,26 @@ SymbolicExprId reduceSum(Chain& chain) {
 }
 
 } // namespace
+
+bool chainIsWithin(const SymbolicExprTable& table, const SymbolicExpr& root, std::uint64_t limit) {
+    std::uint64_t operands = 0;
+    std::vector<SymbolicExprId> pending{root.getInput(1), root.getInput(0)};
+    IdMap<bool> seen;
+    while (!pending.empty() && operands <= limit) {
+        const SymbolicExprId id = pending.back();
+        pending.pop_back();
+        if (!table.has(id) || seen.find(id) != nullptr)
+            continue;
+        seen.insert(id, true);
+        const SymbolicExpr& node = *table.get(id);
+        if (node.op() != root.op())
+            ++operands;
+        else
+            for (const std::size_t side : {1, 0})
+                pending.push_back(node.getInput(side));
+    }
+    return operands <= limit;
+}
 
 SymbolicExprId simplifyChain(RuleContext& context, SymbolicExprId root) {
     Chain chain(context, context.op(root), root);

@@ -11,6 +11,7 @@ namespace {
 
 constexpr const char* examples =
     R"(Conditions are over integers: every name stands for an integer, and what is not zero is true.
+Quotients of a condition are truncated, as in C; dimensions, such as N/2*2, divide exactly.
 
 Examples:
   vtsym simplify 'Mode == 1 && Mode == 2'
