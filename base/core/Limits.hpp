@@ -14,6 +14,18 @@ inline constexpr std::uint64_t simplifyPasses = 10;
 /// beyond the bound the simplifier gives up the pass and returns what it was given.
 inline constexpr std::uint64_t chainOperands = 1000;
 
+/// Literals of all products that one call of the simplifier multiplies out, in all of its passes.  At most about half a
+/// second; real conditions take up to a hundred.  Beyond the bound the call gives up and returns what it was given.
+inline constexpr std::size_t multipliedLiterals = 50'000;
+
+/// Literals that the search for redundant parts of one sum of products looks at: so many, and so many more for each
+/// literal of the sum.  Beyond the bound the sum stays as it is.
+inline constexpr std::size_t coverSteps = 50'000;
+inline constexpr std::size_t coverStepsPerLiteral = 64;
+
+/// Nested case distinctions of that search.  Beyond the bound it counts as exhausted.
+inline constexpr std::size_t coverDepth = 200;
+
 /// Nesting of brackets and runs of prefix operators in a text: what the strictest common C compilers read.  One more is
 /// a parse error at that place.
 inline constexpr std::size_t nesting = 256;

@@ -24,6 +24,9 @@ public:
     virtual bool confirmRewrite(SymbolicExprId expression, SymbolicExprId replacement) = 0;
     /// Operands of a flattened chain and products of a distribution.
     [[nodiscard]] virtual std::uint64_t operandLimit() const = 0;
+    /// Takes note of literals that are about to be multiplied out; false, and gives up, where they are more than the
+    /// call may have.
+    virtual bool multiplies(std::size_t literals) = 0;
     /// Whether the node at hand is below a comparison or a logical operator, where quotients are truncated; elsewhere
     /// they are exact.
     [[nodiscard]] virtual bool inCondition() const = 0;

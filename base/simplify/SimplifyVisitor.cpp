@@ -36,6 +36,16 @@ public:
 
     void giveUp() override { visitor_.gaveUp = true; }
 
+    bool multiplies(std::size_t literals) override {
+        if (literals > visitor_.affordable_) {
+            visitor_.affordable_ = 0;
+            visitor_.gaveUp = true;
+            return false;
+        }
+        visitor_.affordable_ -= literals;
+        return true;
+    }
+
 private:
     SymbolicExprSimplifyVisitor& visitor_;
 };

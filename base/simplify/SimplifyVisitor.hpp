@@ -2,6 +2,7 @@
 #pragma once
 
 #include "base/core/IdMap.hpp"
+#include "base/core/Limits.hpp"
 #include "base/print/ExpressionPrinter.hpp"
 #include "base/simplify/Rule.hpp"
 #include "base/transform/XForm.hpp"
@@ -50,6 +51,16 @@ public:
         operandLimit = limit;
     }
 
+    /// Lets further passes multiply out as many literals as one call may.
+    void renewBudget() noexcept {
+        affordable_ = limits::multipliedLiterals;
+    }
+
+    /// Whether a pass has given up since, because it would have multiplied out more.
+    [[nodiscard]] bool hasExhaustedBudget() const noexcept {
+        return gaveUp && affordable_ == 0;
+    }
+
     /// Receives the rules that fire in further passes; nullptr for none.
     void setListener(RuleListener* listener) noexcept {
         listener_ = listener;
@@ -69,6 +80,7 @@ private:
     std::unique_ptr<Rules> rules_;
     RuleListener* listener_ = nullptr;
     std::uint64_t passes_ = 0;
+    std::size_t affordable_ = limits::multipliedLiterals; ///< literals that may still be multiplied out
     bool inChain_ = false;     ///< the node that is visited goes on in its parent, which is simplified for both
     bool inCondition_ = false; ///< the node that is visited is below a comparison or a logical operator
     std::vector<SymbolicExprId> operands_;
