@@ -50,20 +50,27 @@ private:
     /// The cubes that may help: a cube that restricts an atom of which some value is out of reach helps only where the
     /// atom is restricted already.
     std::vector<const Cube*> candidates(const Cube& cube, std::size_t skip) {
-        std::vector<std::size_t> indices = everywhere_;
-        for (const Constraint& c : cube.constraints())
-            if (c.atom < occurrences_.atoms())
-                indices.insert(indices.end(), occurrences_.of(c.atom).begin(), occurrences_.of(c.atom).end());
-        std::ranges::sort(indices);
-        indices.erase(std::unique(indices.begin(), indices.end()), indices.end());
+        std::vector<bool> near(cover_.size(), false);
+        for (const std::size_t i : everywhere_)
+            near[i] = true;
+        for (const Constraint& c : cube.constraints()) {
+            if (c.atom >= occurrences_.atoms())
+                continue;
+            if (!budget_.spend(occurrences_.of(c.atom).size()))
+                return {};
+            for (const std::size_t i : occurrences_.of(c.atom))
+                near[i] = true;
+        }
         std::vector<const Cube*> result;
-        for (const std::size_t i : indices) {
+        for (std::size_t i = 0; i < near.size(); ++i) {
+            if (!near[i] || i == skip || gone_[i])
+                continue;
             if (!budget_.spend(1 + cover_[i].constraints().size()))
                 return {};
             const bool helps = std::ranges::all_of(cover_[i].constraints(), [&](const Constraint& c) {
                 return spanned_[c.atom] || cube.find(c.atom) != nullptr;
             });
-            if (i != skip && !gone_[i] && helps)
+            if (helps)
                 result.push_back(&cover_[i]);
         }
         return result;

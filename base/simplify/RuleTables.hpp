@@ -54,6 +54,7 @@ void appendInfo(std::span<const Rule> rules, std::vector<const RuleInfo*>& out) 
 void appendNotRules(std::vector<const RuleInfo*>& out);
 void appendComparisonRules(std::vector<const RuleInfo*>& out);
 void appendLogicalRules(std::vector<const RuleInfo*>& out);
-void appendArithmeticRules(std::vector<const RuleInfo*>& out);
+void appendSumRules(std::vector<const RuleInfo*>& out);
+void appendProductRules(std::vector<const RuleInfo*>& out);
 
 } // namespace VT

@@ -12,7 +12,8 @@ std::span<const RuleInfo* const> simplificationRules() {
         appendNotRules(all);
         appendComparisonRules(all);
         appendLogicalRules(all);
-        appendArithmeticRules(all);
+        appendSumRules(all);
+        appendProductRules(all);
         return all;
     }();
     return rules;
