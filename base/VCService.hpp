@@ -3,6 +3,7 @@
 #pragma once
 
 #include "base/decide/Decision.hpp"
+#include "base/service/ShortForm.hpp"
 #include "base/service/VCServiceHandle.hpp"
 #include "base/service/VCSymbolicExprId.hpp"
 #include "base/service/VCSymbols.hpp"
@@ -171,10 +172,22 @@ public:
     /// A product of such a sum as a set of factors: the operands of its And.  TRUE is the empty product.
     std::vector<VCSymbolicExprId> computeUniqueAndOperandsId(const VCSymbolicExprId& condition);
 
-    /// The shortest condition found that equals the given one wherever the known one holds; equality is proven.  TRUE
-    /// where the known one implies it, FALSE where they are disjoint; any other result is in print no longer than the
-    /// given condition, which comes back where nothing shorter was found.
-    VCSymbolicExprId getImpliedCondition(const VCSymbolicExprId& condition, const VCSymbolicExprId& known);
+    // Shorter conditions.  Lengths are those of printQExpr in Quill and of printCExpr in C, where the result has C
+    // shape.  The search takes at most limits::shortenWork and its proofs limits::shortenSteps together; beyond these
+    // bounds the shortest form proven so far is returned.
+
+    /// The shortest form found that is proven equal to a condition for all assignments: the fewest comparisons and
+    /// other truth values, and of those forms the fewest bytes.  Never longer than the condition, which comes back
+    /// where nothing better is proven; TRUE and FALSE are the shortest of all.  A root that is no truth value, as in
+    /// `2+3` or `N`, is a number: it is simplified where that makes it no longer, and keeps its value.
+    ///
+    /// `forms` receives the forms that were looked at on the way, the shortest first; none for numbers.
+    VCSymbolicExprId shortestCondition(const VCSymbolicExprId& condition, bool isQuill,
+                                       std::vector<ShortForm>* forms = nullptr);
+    /// The shortest form found that is proven equal to a condition wherever the known one holds.  TRUE where the known
+    /// one implies it, FALSE where they are disjoint, and otherwise as shortestCondition().
+    VCSymbolicExprId getImpliedCondition(const VCSymbolicExprId& condition, const VCSymbolicExprId& known,
+                                         bool isQuill = false);
 
     /// A witness as text: "A=3, B=0".
     std::string printWitness(const Witness& witness);
@@ -193,6 +206,10 @@ public:
     Decision isTighterThanFromQConditions(const std::string& a, const std::string& b);
     SetDecision coversFromCConditions(const std::vector<std::string>& conditions);
     SetDecision coversFromQConditions(const std::vector<std::string>& conditions);
+    std::string shortestCExprFromCCondition(const std::string& text);
+    std::string shortestQExprFromCCondition(const std::string& text);
+    std::string shortestCExprFromQCondition(const std::string& text);
+    std::string shortestQExprFromQCondition(const std::string& text);
     std::string getImpliedCExprFromCConditions(const std::string& condition, const std::string& known);
     std::string getImpliedQExprFromQConditions(const std::string& condition, const std::string& known);
     std::vector<std::string> computeUniqueAndOperandsFromCCondition(const std::string& condition);

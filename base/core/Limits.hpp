@@ -50,8 +50,20 @@ inline constexpr std::size_t termCases = 64;
 /// undecided.
 inline constexpr std::size_t confirmations = 8192;
 
-/// Changes tried, each with a proof, and nodes interned on the way, to shorten one condition by what is known.  Beyond
-/// either bound the shortest form found so far stands.
+/// Steps that all proofs for one shorter condition may cost together: about an eighth of a second.  Beyond the bound
+/// the shortest form found so far stands.
+inline constexpr std::uint64_t shortenSteps = std::uint64_t{1} << 20U;
+
+/// Comparisons of a condition, each occurrence counted, up to which a shorter form is looked for.  A longer one keeps
+/// its form.
+inline constexpr std::size_t shortenComparisons = 4096;
+
+/// Work of the algebra on one condition: operands looked at and products made.  Beyond the bound the forms found so far
+/// are left to choose from.
+inline constexpr std::size_t shortenWork = std::size_t{1} << 16U;
+
+/// Changes tried, each with a proof, and nodes interned on the way, to take operands from one condition.  Beyond either
+/// bound the shortest form found so far stands.
 inline constexpr std::size_t impliedTries = 1000;
 inline constexpr std::size_t impliedNodes = std::size_t{1} << 16U;
 

@@ -70,6 +70,8 @@ public:
     [[nodiscard]] std::string nameOf(SymbolicExprId unknown) const;
 
     [[nodiscard]] const DecisionOptions& options() const noexcept;
+    /// What a further question may cost, at most what the options say.
+    void limitSteps(std::uint64_t steps) noexcept;
     /// Steps that the latest question took.
     [[nodiscard]] std::uint64_t stepsTaken() const noexcept;
     /// Forgets everything that was read.

@@ -1,6 +1,5 @@
 // How conditions stand to each other.
 #include "base/VCService.hpp"
-#include "base/service/ImpliedCondition.hpp"
 #include "base/service/ServiceParts.hpp"
 #include "base/variants/VariantKeywords.hpp"
 
@@ -141,36 +140,6 @@ std::vector<VCSymbolicExprId> VCService::computeUniqueAndOperandsId(const VCSymb
 
 std::vector<VCSymbolicExprId> VCService::computeUniqueOrOperandsId(const VCSymbolicExprId& condition) {
     return uniqueOperands(condition, false);
-}
-
-// Conditions relative to others.
-
-VCSymbolicExprId VCService::getImpliedCondition(const VCSymbolicExprId& condition, const VCSymbolicExprId& known) {
-    if (!has(condition) || !has(known))
-        return invalidId;
-    SymbolicExprTable& table = parts_->table;
-    if (implies(known, condition).isYes())
-        return table.getIdTRUE();
-    if (isDisjoint(known, condition).isYes())
-        return table.getIdFALSE();
-    const SymbolicExprId given = parts_->toC(condition.id());
-    const SymbolicExprId context = parts_->toC(known.id());
-    const auto isEqual = [&](SymbolicExprId candidate) {
-        return parts_->decider().equivalentGiven(parts_->toC(candidate), given, context).isYes();
-    };
-    const SymbolicExprPrinter& printer = parts_->cPrinter;
-    ImpliedCondition implied(table, printer, known.id(), isEqual);
-    SymbolicExprId best = implied.shorten(condition.id());
-    // Another form may have operands to take away that this one hides.
-    const SymbolicExprId simple = simplify(condition, true).id();
-    for (const SymbolicExprId form : {simple, AND(known, condition, true).id()}) {
-        if (form == condition.id() || !isEqual(form))
-            continue;
-        const SymbolicExprId other = implied.shorten(form);
-        if (printer.textLength(other) < printer.textLength(best))
-            best = other;
-    }
-    return best;
 }
 
 std::string VCService::printWitness(const Witness& witness) {

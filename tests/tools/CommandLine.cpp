@@ -47,7 +47,7 @@ void expectRows(const std::vector<Row>& rows) {
 
 TEST(Program, AnswersTexts) {
     expectRows({
-        {{"simplify", "--", "-x", "-5 < A"}, "", "-x\nA>-5\n"},
+        {{"simplify", "--", "-x", "-5 < A"}, "", "-x\n-5<A\n"},
         {{"simplify", "[1,2] == tree", "{}"}, "", "[1,2]==tree\n\n", {"line 2:"}, 1},
         {{"simplify", "--from", "quill", "~(A < 3) | B"}, "", "A>=3 | B\n"},
         {{"convert", "--from", "quill", "--to", "c", "bitshift(a, -3) ~= 0"}, "", "a>>3!=0\n"},
@@ -111,14 +111,17 @@ TEST(Program, ComparesConditions) {
          "{\"line\":2,\"known\":\"A\",\"condition\":\"A && B\",\"result\":\"B\"}\n",
          {},
          0},
-        {{"simplify", "--strong", "A<B && B<C && A<C", "A<B && B<C && C<A", "A<=3 || A>=0 && A!=1"},
+        {{"simplify", "A<B && B<C && A<C", "A<B && B<C && C<A", "A<=3 || A>=0 && A!=1"},
          "",
          "A<B && B<C\nfalse\ntrue\n",
          {},
          0},
-        {{"simplify", "--explain", "--strong", "A<B && A<C && B<C"},
+        {{"simplify", "--explain", "A<B && A<C && B<C"},
          "",
-         "A<B && A<C && B<C\n  no rule applies\nproven equal  A<B && A<C && B<C  =>  A<B && B<C\n= A<B && B<C\n",
+         "A<B && A<C && B<C\n  no rule applies\nshortest form\n"
+         "  operands taken away, each with a proof         A<B && B<C  2 comparisons, 10 bytes, proven equal\n"
+         "  comparisons joined, common operands taken out  A<B && A<C && B<C  3 comparisons, 17 bytes\n"
+         "= A<B && B<C\n",
          {},
          0},
         {{"compare", "A"}, "", "", {"two conditions are needed", "Try 'vtsym compare --help'"}, 2},
@@ -130,8 +133,10 @@ TEST(Program, ComparesConditions) {
 TEST(Program, KeepsASession) {
     const std::string dialogue = "A>2 && A<4\nans || A>3\n:let N=A+1\n:let A=2\nN*2==6\n:quill\nB ~= A\n:c\n"
                                  ":tree A+1\n:explain 1 && B\n:symbols\n:pp !A.b || B && 2.5 < C\n";
-    const std::string answers = "A==3\nA>=3\nN = A+1\nA = 2\n(A+1)*2==6\n(A+1)*2==6\nB~=2\nB!=2\n"
-                                "Plus +\n├─ 2\n└─ 1\n1 && B\npass 1\n  number in And  1 && B  =>  B\n= B\nB\n"
+    const std::string answers = "A==3\nA>=3\nN = A+1\nA = 2\nA==2\nA==2\nB~=2\nB!=2\n"
+                                "Plus +\n├─ 2\n└─ 1\n1 && B\npass 1\n  number in And  1 && B  =>  B\n"
+                                "normal form\n  B\nshortest form\n  comparisons joined, common operands taken out  B  "
+                                "1 comparison, 1 byte, proven equal\n= B\nB\n"
                                 "!A_b || (B && 2.5 < C)\nwarning: a preprocessor has no real constants: 2.5\n";
     expectRows({
         {{"repl"}, dialogue, answers},
@@ -213,10 +218,16 @@ TEST(Program, Evaluates) {
 TEST(Program, ExplainsSimplification) {
     expectRows({
         {{"simplify", "--explain", "A"}, "", "A\n  no rule applies\n= A\n"},
+        {{"simplify", "--normal-form", "(A || B) && C", "2+3", "A<A"}, "", "A && C || B && C\n5\nfalse\n"},
+        {{"simplify", "(A || B) && C", "2+3", "A<A", "!0", "A==A"}, "", "(A || B) && C\n5\n0\n1\ntrue\n"},
+        {{"simplify", "--to", "quill", "A/B==1 && A/B>0"}, "", "idivide(A,B)==1\n"},
+        {{"simplify", "--strong", "A"}, "", "", {"there is no option '--strong'"}, 2},
         {{"simplify", "--explain", "--json", "A && true"},
          "",
          "{\"line\":1,\"input\":\"A && true\",\"result\":\"A\",\"passes\":2,\"steps\":[{\"pass\":1,\"rule\":"
-         "\"true operand of And\",\"before\":\"A && true\",\"after\":\"A\"}]}\n"},
+         "\"true operand of And\",\"before\":\"A && true\",\"after\":\"A\"},{\"form\":\"A\",\"way\":\"comparisons "
+         "joined, common operands "
+         "taken out\",\"comparisons\":1,\"bytes\":1,\"chosen\":true}]}\n"},
     });
 }
 
