@@ -2,6 +2,7 @@
 // and prints them.
 #pragma once
 
+#include "base/core/Limits.hpp"
 #include "base/decide/Decision.hpp"
 #include "base/service/ShortForm.hpp"
 #include "base/service/VCServiceHandle.hpp"
@@ -235,7 +236,8 @@ private:
     VCSymbolicExprId combined(SymbolicExprId condition, bool simplify);
     SymbolicExprId replaceParameters(SymbolicExprId condition, const ParameterReplacements& parameters);
     SymbolicExprId rewritten(SymbolicExprId condition);
-    Decision ask(PairQuestion question, const VCSymbolicExprId& a, const VCSymbolicExprId& b);
+    Decision ask(PairQuestion question, const VCSymbolicExprId& a, const VCSymbolicExprId& b,
+                 std::uint64_t steps = limits::decisionSteps);
     std::vector<VCSymbolicExprId> uniqueOperands(const VCSymbolicExprId& condition, bool ofAnd);
     std::vector<VCSymbolicExprId> parseAll(const std::vector<std::string>& texts, bool isQuill);
     std::vector<std::string> operandTexts(const std::string& condition, bool ofAnd, bool isQuill);

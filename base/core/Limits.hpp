@@ -39,6 +39,10 @@ inline constexpr std::size_t evaluatedElements = std::size_t{1} << 26U;
 /// some hundred thousand.  Beyond the bound the question is undecided.
 inline constexpr std::uint64_t decisionSteps = std::uint64_t{1} << 21U;
 
+/// Steps of the further questions of a comparison after one that used up its own, so that a hard pair costs little more
+/// than one question.
+inline constexpr std::uint64_t furtherSteps = std::uint64_t{1} << 17U;
+
 /// Edges of diagrams that are kept between questions, 16 bytes each.  When there are more, all are thrown away before
 /// the next question, which builds anew what it needs.
 inline constexpr std::size_t diagramEdges = std::size_t{1} << 22U;

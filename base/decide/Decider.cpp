@@ -213,14 +213,18 @@ Decision Decider::equivalentGiven(SymbolicExprId a, SymbolicExprId b, SymbolicEx
 
 Relation Decider::classify(SymbolicExprId a, SymbolicExprId b) {
     std::uint64_t taken = 0;
+    const std::uint64_t allowed = state_->questionSteps;
     const auto counted = [&](Decision decision) {
         taken += state_->taken;
+        if (decision.bound == DecisionBound::Steps)
+            limitSteps(std::min(allowed, limits::furtherSteps));
         return decision;
     };
     Decision onlyA = counted(implies(a, b).opposite());
     Decision onlyB = counted(implies(b, a).opposite());
     Relation relation = Relation::of(std::move(onlyA), std::move(onlyB), counted(overlaps(a, b)));
     state_->taken = taken;
+    limitSteps(allowed);
     return relation;
 }
 

@@ -45,7 +45,8 @@ Decider& ServiceParts::decider() {
 }
 
 /// The decision about a pair, from the cache where it is there.
-Decision VCService::ask(PairQuestion question, const VCSymbolicExprId& a, const VCSymbolicExprId& b) {
+Decision VCService::ask(PairQuestion question, const VCSymbolicExprId& a, const VCSymbolicExprId& b,
+                        std::uint64_t steps) {
     if (!has(a) || !has(b))
         return noCondition();
     const bool ordered = question == PairQuestion::FirstAlone;
@@ -57,10 +58,13 @@ Decision VCService::ask(PairQuestion question, const VCSymbolicExprId& a, const 
     const SymbolicExprId first = parts_->toC(key.a);
     const SymbolicExprId second = parts_->toC(key.b);
     Decider& decider = parts_->decider();
+    decider.limitSteps(steps);
     Decision decision = question == PairQuestion::Both         ? decider.overlaps(first, second)
                         : question == PairQuestion::FirstAlone ? decider.implies(first, second).opposite()
                                                                : decider.equivalent(first, second).opposite();
-    if (parts_->caching)
+    decider.limitSteps(limits::decisionSteps);
+    // What stays undecided with fewer steps may be decided with all.
+    if (parts_->caching && (steps == limits::decisionSteps || !decision.isUndecided()))
         parts_->decisions.insert(key, decision);
     return decision;
 }
@@ -102,8 +106,16 @@ Decision VCService::isTighterThan(const VCSymbolicExprId& a, const VCSymbolicExp
 }
 
 Relation VCService::compare(const VCSymbolicExprId& a, const VCSymbolicExprId& b) {
-    return Relation::of(ask(PairQuestion::FirstAlone, a, b), ask(PairQuestion::FirstAlone, b, a),
-                        ask(PairQuestion::Both, a, b));
+    std::uint64_t steps = limits::decisionSteps;
+    const auto next = [&](PairQuestion question, const VCSymbolicExprId& x, const VCSymbolicExprId& y) {
+        Decision decision = ask(question, x, y, steps);
+        if (decision.bound == DecisionBound::Steps)
+            steps = limits::furtherSteps;
+        return decision;
+    };
+    Decision onlyA = next(PairQuestion::FirstAlone, a, b);
+    Decision onlyB = next(PairQuestion::FirstAlone, b, a);
+    return Relation::of(std::move(onlyA), std::move(onlyB), next(PairQuestion::Both, a, b));
 }
 
 SetDecision VCService::covers(const std::vector<VCSymbolicExprId>& conditions) {
