@@ -73,8 +73,13 @@ SymbolicExprId BranchJudge::shortened(SymbolicExprId condition, SymbolicExprId k
     const SymbolicOp op = table_.get(condition)->op();
     if (op != SymbolicOp::And && op != SymbolicOp::Or)
         return condition;
+    bool gaveUp = false; // the neighbours of what is too hard are as hard
     const auto isEqual = [&](SymbolicExprId candidate) {
-        return holds({BranchVerdictKind::Removable, candidate}, condition, known);
+        if (gaveUp)
+            return false;
+        const Decision equal = decider_.equivalentGiven(candidate, condition, known);
+        gaveUp = equal.bound == DecisionBound::Steps;
+        return proven(equal);
     };
     return ImpliedCondition(table_, printer_, known, isEqual).shorten(condition);
 }

@@ -5,6 +5,7 @@
 #include "base/service/ComparedTerms.hpp"
 
 #include "base/core/Nodes.hpp"
+#include "base/service/ImpliedCondition.hpp"
 
 #include <algorithm>
 #include <cstdlib>
@@ -21,23 +22,6 @@ constexpr std::size_t comparisonCost = 1U << 10U;
 
 /// Intervals up to which the best cut is looked for.
 constexpr std::size_t mostIntervals = 64;
-
-SymbolicExprId binary(SymbolicExprTable& table, SymbolicOp op, SymbolicExprId a, SymbolicExprId b) {
-    switch (op) {
-    case SymbolicOp::Equal:
-        return SymbolicEqualExpr(table, a, b).getId(table);
-    case SymbolicOp::NotEqual:
-        return SymbolicNotEqualExpr(table, a, b).getId(table);
-    case SymbolicOp::LessThan:
-        return SymbolicLessThanExpr(table, a, b).getId(table);
-    case SymbolicOp::LessThanEqual:
-        return SymbolicLessThanEqualExpr(table, a, b).getId(table);
-    case SymbolicOp::GreaterThan:
-        return SymbolicGreaterThanExpr(table, a, b).getId(table);
-    default:
-        return SymbolicGreaterThanEqualExpr(table, a, b).getId(table);
-    }
-}
 
 bool isBounded(const IntegerSet::Interval& interval) {
     return interval.low != minusInfinity && interval.high != plusInfinity;
@@ -191,7 +175,7 @@ SymbolicExprId ComparedTerms::literal(Atom atom, const IntegerSet& set) {
         return isTruth ? invalidId : compose(atom, set, false);
     const SymbolicExpr& node = *table_.get(opposite);
     if (comparisonOps.contains(node.op()) && !isTruth)
-        return binary(table_, operatorInfo(node.op()).negated, node.getInput(0), node.getInput(1));
+        return makeComparison(table_, operatorInfo(node.op()).negated, node.getInput(0), node.getInput(1));
     const SymbolicExprId negated = SymbolicNotExpr(table_, opposite).getId(table_);
     const SymbolicExprId composed = isTruth ? invalidId : compose(atom, set, false);
     return composed != invalidId && printer_.textLength(composed) < printer_.textLength(negated) ? composed : negated;
@@ -224,7 +208,7 @@ SymbolicExprId ComparedTerms::compose(Atom atom, const IntegerSet& set, bool str
     const bool moves = difference && right < 0;
     const SymbolicExprId left = side(parts, 1, moves ? -right : 0);
     const SymbolicExprId other = side(parts, -1, moves ? 0 : right);
-    return left == invalidId || other == invalidId ? invalidId : binary(table_, op, left, other);
+    return left == invalidId || other == invalidId ? invalidId : makeComparison(table_, op, left, other);
 }
 
 /// The sum of the parts with a sign and of a constant, which stands alone or where it is not 0.

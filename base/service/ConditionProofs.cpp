@@ -11,6 +11,7 @@ ConditionProofs::ConditionProofs(Decider& decider, const SymbolicExprQ2C& toC, S
       condition_(toC(condition)),
       known_(toC(known)),
       isAnythingKnown_(isAnythingKnown),
+      steps_(steps),
       left_(steps) {}
 
 ConditionProofs::~ConditionProofs() {

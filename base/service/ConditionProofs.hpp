@@ -30,6 +30,9 @@ public:
 
     [[nodiscard]] bool usedUp() const noexcept { return left_ == 0; }
 
+    /// Steps that the proofs took; one that gave up counts for what was left.
+    [[nodiscard]] std::uint64_t stepsTaken() const noexcept { return steps_ - left_; }
+
 private:
     template <class Ask>
     bool isYes(Ask ask);
@@ -39,6 +42,7 @@ private:
     SymbolicExprId condition_;
     SymbolicExprId known_;
     bool isAnythingKnown_;
+    std::uint64_t steps_;
     std::uint64_t left_;
 };
 

@@ -1,7 +1,5 @@
 #include "base/service/FormulaRewriting.hpp"
 
-#include "base/core/Limits.hpp"
-
 #include <algorithm>
 #include <utility>
 
@@ -18,8 +16,6 @@ constexpr std::size_t factorRounds = 32;
 
 /// Takes work from the budget; false where there is not enough left.
 bool FormulaRewriting::takeWork(std::size_t amount) {
-    if (!std::exchange(workSet_, true))
-        workLeft_ = limits::shortenWork;
     const bool enough = amount <= workLeft_;
     workLeft_ -= enough ? amount : workLeft_;
     return enough;

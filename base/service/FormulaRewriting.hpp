@@ -2,6 +2,7 @@
 // some; work beyond limits::shortenWork is left undone.
 #pragma once
 
+#include "base/core/Limits.hpp"
 #include "base/service/Formulas.hpp"
 
 #include <boost/unordered_map.hpp>
@@ -52,8 +53,7 @@ private:
 
     Formulas& formulas_;
     Formulas::Comparisons comparisons_;
-    std::size_t workLeft_ = 0;
-    bool workSet_ = false;
+    std::size_t workLeft_ = limits::shortenWork;
     std::vector<Range> known_; ///< by atom
     std::vector<std::pair<Atom, Range>> trail_;
     std::vector<Frame> frames_;
