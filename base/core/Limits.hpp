@@ -66,6 +66,22 @@ inline constexpr std::size_t shortenComparisons = 4096;
 /// are left to choose from.
 inline constexpr std::size_t shortenWork = std::size_t{1} << 16U;
 
+/// Products of the sums that a shorter form is taken from, and steps of the search for redundant ones among them.  A
+/// larger sum is not looked at; what was not proven redundant stays.
+inline constexpr std::size_t shortenProducts = 128;
+inline constexpr std::size_t shortenCoverSteps = 4000;
+
+/// Rounds of taking out common operands, and of that together with judging constraints by those around them.  Real
+/// conditions take two or three; the latest form stands.
+inline constexpr std::size_t factorRounds = 32;
+inline constexpr std::size_t shortenRounds = 4;
+
+/// Intervals of a set up to which the shortest way to write it is looked for.  Those beyond are written one by one.
+inline constexpr std::size_t writtenIntervals = 64;
+
+/// Comparisons of a form up to which operands are taken away one by one, each with a proof.  A longer one stays.
+inline constexpr std::size_t shortenByProofs = 64;
+
 /// Changes tried, each with a proof, and nodes interned on the way, to take operands from one condition.  Beyond either
 /// bound the shortest form found so far stands.
 inline constexpr std::size_t impliedTries = 1000;

@@ -4,6 +4,7 @@
 // between, and the set as an Or of its runs.  The cheapest cut is found by dynamic programming in k^2 steps.
 #include "base/service/ComparedTerms.hpp"
 
+#include "base/core/Limits.hpp"
 #include "base/core/Nodes.hpp"
 #include "base/service/ImpliedCondition.hpp"
 
@@ -19,9 +20,6 @@ constexpr std::int64_t plusInfinity = IntegerSet::plusInfinity;
 
 /// Comparisons weigh most; among cuts with as many of them, those that the condition does not write itself.
 constexpr std::size_t comparisonCost = 1U << 10U;
-
-/// Intervals up to which the best cut is looked for.
-constexpr std::size_t mostIntervals = 64;
 
 bool isBounded(const IntegerSet::Interval& interval) {
     return interval.low != minusInfinity && interval.high != plusInfinity;
@@ -77,7 +75,7 @@ ComparedTerms::Runs ComparedTerms::runs(const Constraint& constraint) const {
     for (std::size_t last = 0; last < intervals.size(); ++last) {
         std::size_t inner = 0; // of the integers missing in the run
         best.push_back({last, (last > 0 ? best[last - 1].cost : 0) + cost(atom, intervals[last])});
-        for (std::size_t first = last; first-- > 0 && last < mostIntervals;) {
+        for (std::size_t first = last; first-- > 0 && last < limits::writtenIntervals;) {
             const std::int64_t missing = gap(intervals[first], intervals[first + 1]);
             if (missing > 2)
                 break;

@@ -5,15 +5,6 @@
 
 namespace VT {
 
-namespace {
-
-constexpr std::size_t mostCubes = 128;    ///< of a sum of products
-constexpr std::size_t coverSteps = 4000;  ///< of the search for redundant products
-constexpr std::size_t mostIntervals = 16; ///< of sets that are relaxed
-constexpr std::size_t factorRounds = 32;
-
-} // namespace
-
 /// Takes work from the budget; false where there is not enough left.
 bool FormulaRewriting::takeWork(std::size_t amount) {
     const bool enough = amount <= workLeft_;
@@ -43,7 +34,7 @@ Formula FormulaRewriting::relaxed(Formula leaf) {
         return Formulas::no;
     if (range.isSubsetOf(constraint.set))
         return Formulas::yes;
-    if (formulas_.comparisons(leaf) == 1 || range.intervals().size() > mostIntervals)
+    if (formulas_.comparisons(leaf) == 1 || range.intervals().size() > limits::writtenIntervals)
         return leaf;
     // What is out of the range may be in the set or not.
     const IntegerSet outside = range.complement();
@@ -194,7 +185,7 @@ Formula FormulaRewriting::factoredOnce(Formula formula) {
 }
 
 Formula FormulaRewriting::factored(Formula formula) {
-    for (std::size_t round = 0; round < factorRounds; ++round) {
+    for (std::size_t round = 0; round < limits::factorRounds; ++round) {
         const Formula next = factoredOnce(formula);
         if (next == formula)
             break;
@@ -230,7 +221,8 @@ std::optional<Cover> FormulaRewriting::coverOf(Formula formula) {
             cover.emplace_back();
             for (const Formula operand : formulas_.operands(all[i])) {
                 const Cover& factor = coverAt(operand);
-                if (cover.size() * factor.size() > 2 * mostCubes || !takeWork(cover.size() * factor.size()))
+                if (cover.size() * factor.size() > 2 * limits::shortenProducts ||
+                    !takeWork(cover.size() * factor.size()))
                     return std::nullopt;
                 cover = product(cover, factor);
                 if (cover.size() > 1)
@@ -238,7 +230,7 @@ std::optional<Cover> FormulaRewriting::coverOf(Formula formula) {
             }
             break;
         }
-        if (cover.size() > mostCubes || !takeWork(cover.size()))
+        if (cover.size() > limits::shortenProducts || !takeWork(cover.size()))
             return std::nullopt;
     }
     return std::move(covers.back());
@@ -246,9 +238,9 @@ std::optional<Cover> FormulaRewriting::coverOf(Formula formula) {
 
 std::optional<Formula> FormulaRewriting::minimalSum(Formula formula) {
     std::optional<Cover> cover = coverOf(formula);
-    if (!cover || !takeWork(coverSteps / 4))
+    if (!cover || !takeWork(limits::shortenCoverSteps / 4))
         return std::nullopt;
-    CoverBudget budget{coverSteps};
+    CoverBudget budget{limits::shortenCoverSteps};
     while (joinCubes(*cover) || absorb(*cover) || dropComparisons(*cover, budget) || dropCubes(*cover, budget))
         continue;
     Formulas::Operands products;

@@ -10,11 +10,6 @@ namespace {
 
 using Kind = Formulas::Kind;
 
-constexpr std::size_t simplifyRounds = 4;
-
-/// Comparisons of a form from which operands are taken away one by one.
-constexpr std::size_t mostForProofs = 64;
-
 } // namespace
 
 ShortestForm::ShortestForm(SymbolicExprTable& table, const SymbolicExprPrinter& printer, bool keywordsInForce,
@@ -29,7 +24,7 @@ ShortestForm::ShortestForm(SymbolicExprTable& table, const SymbolicExprPrinter& 
       writer_(table, printer, formulas_, terms_) {}
 
 Formula ShortestForm::simplified(Formula formula) {
-    for (std::size_t round = 0; round < simplifyRounds; ++round) {
+    for (std::size_t round = 0; round < limits::shortenRounds; ++round) {
         const Formula next = rewriting_.factored(rewriting_.inContext(formula, facts_));
         if (next == formula)
             break;
@@ -160,7 +155,7 @@ bool ShortestForm::considerSums(Formula formula) {
 void ShortestForm::shortenByProofs(SymbolicExprId known) {
     const auto count = [&](const Considered& each) { return formulas_.comparisons(each.formula); };
     const Formula fewest = std::ranges::min_element(considered_, {}, count)->formula;
-    if (formulas_.comparisons(fewest) > mostForProofs || formulas_.kind(fewest) == Kind::Constant)
+    if (formulas_.comparisons(fewest) > limits::shortenByProofs || formulas_.kind(fewest) == Kind::Constant)
         return;
     const SymbolicExprId start = writer_.writePlainly(fewest);
     if (start == invalidId || !proofs_.isEqual(start))
