@@ -59,7 +59,7 @@ inline constexpr std::size_t confirmations = 8192;
 inline constexpr std::uint64_t shortenSteps = std::uint64_t{1} << 20U;
 
 /// Comparisons of a condition, each occurrence counted, up to which a shorter form is looked for.  A longer one keeps
-/// its form.
+/// its form or takes its normal form.
 inline constexpr std::size_t shortenComparisons = 4096;
 
 /// Work of the algebra on one condition: operands looked at and products made.  Beyond the bound the forms found so far

@@ -198,8 +198,11 @@ SymbolicExprId ShortestForm::find(SymbolicExprId condition, SymbolicExprId known
     forms_.clear();
     facts_.clear();
     const auto read = reader_.read(condition);
-    if (!read)
-        return condition;
+    if (!read) { // too long to look for more than its normal form
+        const SymbolicExprId normal = normalForm();
+        const bool isShorter = table_.has(normal) && printer_.textLength(normal) < printer_.textLength(condition);
+        return isShorter && proofs_.isEqual(normal) ? normal : condition;
+    }
     writer_.use(reader_.chainOps());
     const bool isAnythingKnown = known != invalidId;
     if (isAnythingKnown)

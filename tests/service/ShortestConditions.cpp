@@ -149,6 +149,20 @@ TEST(ShortestConditions, EqualRandomConditionsAndStayTheSame) {
     EXPECT_GT(shorter, 900U);
 }
 
+TEST(ShortestConditions, OfAnyLength) {
+    const FreshService service;
+    for (const std::size_t operands : {limits::shortenComparisons, limits::shortenComparisons + 1}) {
+        std::string again = "A";
+        std::string distinct = "A0";
+        for (std::size_t i = 1; i < operands; ++i) {
+            again += " && A";
+            distinct += " && A" + std::to_string(i);
+        }
+        EXPECT_EQ(service->shortestCExprFromCCondition(again), "A");
+        EXPECT_EQ(service->shortestCExprFromCCondition(distinct), distinct);
+    }
+}
+
 /// Below 1 KB, and hard: no text takes more than its budgets.
 TEST(ShortestConditions, OfHostileTextsStayWithinTheirBudgets) {
     const auto join = [](std::size_t count, const std::string& op, auto part) {
