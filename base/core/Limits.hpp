@@ -18,6 +18,11 @@ inline constexpr std::uint64_t chainOperands = 1000;
 /// a parse error at that place.
 inline constexpr std::size_t nesting = 256;
 
+/// Visits of one rebuilding run whose results serve one occurrence of their node only: where a host's table leads in
+/// circles, or a host's visitor does not leave one result for a node.  Beyond the bound the first result of a node
+/// serves for all of its occurrences.
+inline constexpr std::size_t repeatedVisits = std::size_t{1} << 20U;
+
 /// Bytes of one printed text.  A shared graph of a few nodes can stand for more text than any memory holds; beyond the
 /// bound printing throws std::length_error.
 inline constexpr std::size_t textBytes = std::size_t{1} << 30U;

@@ -4,6 +4,7 @@
 #include "base/core/Operators.hpp"
 #include "host/Export.hpp"
 
+#include <concepts>
 #include <cstddef>
 #include <cstdint>
 
@@ -72,5 +73,12 @@ protected:
     SymbolicExpr() = default;
     SymbolicExpr(const SymbolicExpr&) = default;
 };
+
+/// Structural equality of nodes of any two classes.  Fits both better than the virtual operation of either, which the
+/// language would also try with the sides exchanged.
+template <std::derived_from<SymbolicExpr> Left, std::derived_from<SymbolicExpr> Right>
+[[nodiscard]] bool operator==(const Left& left, const Right& right) {
+    return static_cast<const SymbolicExpr&>(left).operator==(static_cast<const SymbolicExpr&>(right));
+}
 
 } // namespace VT

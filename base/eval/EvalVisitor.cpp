@@ -13,7 +13,7 @@ using detail::Evaluation;
 
 namespace {
 
-/// Marks a symbol whose value is being evaluated.
+/// Marks a node whose value is being evaluated.
 const SymbolicValue::Elements open;
 
 } // namespace
@@ -61,9 +61,10 @@ void SymbolicExprEvalImpl::evaluateToStack(SymbolicExprId id) {
 
 /// Puts the value of an expression on the stack, or its node on the frames.
 void SymbolicExprEvalImpl::enter(SymbolicExprId id, const Frame* parent) {
-    // An operand is older than its node; a value may be any node.
+    // A value may be any node; an operand may not.
+    const bool isOperand = parent != nullptr && !parent->isSymbol;
     const SymbolicExpr* const found = table_.get(id);
-    if (found == nullptr || (parent != nullptr && !parent->isSymbol && id >= parent->id))
+    if (found == nullptr || (isOperand && !table_.hasOperand(parent->id, id)))
         detail::throwMissingNode(table_, id, parent != nullptr ? parent->node : nullptr);
     const SymbolicExpr& node = *found;
     const SymbolicOp op = node.op();
@@ -73,17 +74,28 @@ void SymbolicExprEvalImpl::enter(SymbolicExprId id, const Frame* parent) {
         return;
     }
     if (const std::size_t* const known = known_.find(id); known != nullptr) {
-        if (values_[*known].elements == &open)
+        if (values_[*known].elements == &open) {
+            if (isOperand && way == Evaluation::Operands)
+                detail::throwMissingNode(table_, id, parent->node);
             detail::throwCyclicValue(table_, node);
+        }
         stack_.push_back(*known);
         return;
     }
     if (way == Evaluation::None)
         detail::throwNotEvaluable(table_, node);
-    if (way == Evaluation::Operands)
+    if (way == Evaluation::Operands) {
+        if (!table_.isPlain()) // in which operands lead in no circle
+            markOpen(id);
         enterOperands(id, node, op);
-    else
+    } else
         enterSymbol(id, node, way == Evaluation::Member);
+}
+
+/// Marks a node as one whose value needs what is evaluated until it is left.
+void SymbolicExprEvalImpl::markOpen(SymbolicExprId id) {
+    known_.insert(id, values_.size());
+    values_.push_back({SymbolicScalar(), &open});
 }
 
 void SymbolicExprEvalImpl::enterOperands(SymbolicExprId id, const SymbolicExpr& node, SymbolicOp op) {
@@ -115,8 +127,7 @@ void SymbolicExprEvalImpl::enterSymbol(SymbolicExprId id, const SymbolicExpr& no
         known_.insert(id, stack_.back());
         return;
     }
-    known_.insert(id, values_.size());
-    values_.push_back({SymbolicScalar(), &open});
+    markOpen(id);
     frames_.push_back({&node, id, value, invalidId, 0, 1, ScalarRuleIndex::None, true});
 }
 

@@ -84,6 +84,7 @@ private:
 
     void evaluateToStack(SymbolicExprId id);
     void enter(SymbolicExprId id, const Frame* parent);
+    void markOpen(SymbolicExprId id);
     void enterOperands(SymbolicExprId id, const SymbolicExpr& node, SymbolicOp op);
     void enterSymbol(SymbolicExprId id, const SymbolicExpr& node, bool isMember);
     void leave();

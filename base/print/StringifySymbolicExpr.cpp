@@ -115,8 +115,12 @@ std::string StringifySymbolicExpr::print(SymbolicExprId id) {
 
 std::string StringifySymbolicExpr::print(const SymbolicExpr& node) {
     const StackDepth depth(stack_);
-    for (std::size_t i = 0; i < node.getNumInputs(); ++i)
+    const SymbolicExprId id = table_.lookup(&node);
+    for (std::size_t i = 0; i < node.getNumInputs(); ++i) {
+        if (!table_.hasOperand(id, node.getInput(i)))
+            throwNoSuchExpression();
         push(printed(node.getInput(i)));
+    }
     node.invoke(*this);
     return get();
 }

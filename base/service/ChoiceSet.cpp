@@ -98,14 +98,15 @@ std::size_t ChoiceSetChecker::State::operandsOf(SymbolicExprId condition) const 
     std::size_t count = 0;
     std::vector<SymbolicExprId> open{condition};
     while (!open.empty() && count + open.size() <= limits::choiceOperands) {
-        const SymbolicExpr& node = *table.get(open.back());
+        const SymbolicExpr* const node = table.get(open.back());
         open.pop_back();
-        const bool isChain = node.op() == SymbolicOp::And || node.op() == SymbolicOp::Or;
-        if (isChain || node.op() == SymbolicOp::Not)
-            open.push_back(node.getInput(0));
+        const SymbolicOp op = node != nullptr ? node->op() : SymbolicOp::None; // of an operand that is missing
+        const bool isChain = op == SymbolicOp::And || op == SymbolicOp::Or;
+        if (isChain || op == SymbolicOp::Not)
+            open.push_back(node->getInput(0));
         if (isChain)
-            open.push_back(node.getInput(1));
-        if (!isChain && node.op() != SymbolicOp::Not)
+            open.push_back(node->getInput(1));
+        if (!isChain && op != SymbolicOp::Not)
             ++count;
     }
     return count + open.size();

@@ -18,10 +18,10 @@ const SymbolicIntValue* asLiteral(const SymbolicExprTable& table, SymbolicExprId
     return node != nullptr && node->op() == SymbolicOp::IntValue ? static_cast<const SymbolicIntValue*>(node) : nullptr;
 }
 
-/// The operand of an unary minus, or nothing.
+/// The operand of an unary minus that has one, or nothing.
 std::optional<SymbolicExprId> operandOfMinus(const SymbolicExprTable& table, SymbolicExprId id) {
     const SymbolicExpr* const node = table.get(id);
-    if (node == nullptr || node->op() != SymbolicOp::UnaryMinus)
+    if (node == nullptr || node->op() != SymbolicOp::UnaryMinus || !table.hasOperand(id, node->getInput(0)))
         return std::nullopt;
     return node->getInput(0);
 }
