@@ -12,8 +12,8 @@
 
 #include <algorithm>
 #include <cmath>
-#include <functional>
 #include <limits>
+#include <ranges>
 
 namespace VT {
 
@@ -241,29 +241,32 @@ bool LinearSum::add(const RuleContext& context, SymbolicExprId operand, std::int
 }
 
 bool LinearSum::read(const RuleContext& context, SymbolicExprId root) {
-    // How often each node of the chain occurs is known once everything above it has been counted: identifiers fall
-    // downwards.
-    std::vector<SymbolicExprId> order;
-    std::vector<SymbolicExprId> pending{root};
+    std::vector<SymbolicExprId> order; // operands before the nodes of the chain that they are operands of
     IdMap<std::int64_t> multiples;
-    while (!pending.empty()) {
-        const SymbolicExprId id = pending.back();
-        pending.pop_back();
-        if (multiples.find(id) != nullptr)
-            continue;
+    bool readable = true;
+    const auto note = [&](SymbolicExprId id) {
         multiples.insert(id, 0);
         order.push_back(id);
-        const SymbolicExpr& node = context.node(id);
-        if (node.op() == SymbolicOp::DoubleValue)
-            return false;
-        if (sumOps.contains(node.op()))
-            for (std::size_t i = node.getNumInputs(); i-- > 0;)
-                pending.push_back(node.getInput(i));
-    }
-    std::vector<SymbolicExprId> downwards = order;
-    std::ranges::sort(downwards, std::greater<>());
+        readable = readable && context.op(id) != SymbolicOp::DoubleValue;
+    };
+    std::vector<WalkFrame> stack;
+    walkUnknown(
+        context.table(), root, stack,
+        [&](SymbolicExprId id, const SymbolicExpr*) {
+            if (multiples.find(id) != nullptr)
+                return true;
+            const bool isTerm = !sumOps.contains(context.op(id));
+            if (isTerm)
+                note(id);
+            return isTerm;
+        },
+        [&](SymbolicExprId id, const SymbolicExpr&, const SymbolicExpr*) { note(id); },
+        [&](SymbolicExprId, const SymbolicExpr*) { readable = false; });
+    if (!readable)
+        return false;
+    // How often a node occurs is known once everything above it has been counted.
     multiples.insert(root, 1);
-    for (const SymbolicExprId id : downwards) {
+    for (const SymbolicExprId id : order | std::views::reverse) {
         const SymbolicExpr& node = context.node(id);
         if (!sumOps.contains(node.op()))
             continue;
