@@ -62,35 +62,30 @@ std::optional<Nodes> expected(NumberedTable& table, SymbolicExprId root, bool bo
 }
 
 TEST(Visiting, AgreesWithRecursionOverTablesOfEachKind) {
-    std::mt19937_64 random(5);
     std::size_t compared = 0;
-    for (int round = 0; round < 120; ++round) {
-        for (const auto& numbered : tablesOfEachKind()) {
-            addBrokenGraph(random, *numbered, 25);
-            const SymbolicExprTable& table = numbered->table();
-            for (std::size_t position = 0; position < numbered->count(); ++position) {
-                const SymbolicExprId root = numbered->idAt(position);
-                const auto after = expected(*numbered, root, true);
-                const auto before = expected(*numbered, root, false);
-                if (!after || !before)
-                    continue;
-                const SymbolicExpr& node = *table.get(root);
-                ASSERT_THAT(executed(table, root), ElementsAreArray(*after));
-                ASSERT_THAT(executed(table, root, false), ElementsAreArray(*after)) << "execute() does not ask";
-                ASSERT_THAT(accepted(table, node), ElementsAreArray(*after));
-                ASSERT_THAT(accepted(table, node, false), ElementsAreArray(*before));
-                compared += after->size();
+    forBrokenGraphs(5, 120, 25, [&](NumberedTable& numbered, const std::vector<SymbolicExprId>& ids) {
+        const SymbolicExprTable& table = numbered.table();
+        for (const SymbolicExprId root : ids) {
+            const auto after = expected(numbered, root, true);
+            const auto before = expected(numbered, root, false);
+            if (!after || !before)
+                continue;
+            const SymbolicExpr& node = *table.get(root);
+            ASSERT_THAT(executed(table, root), ElementsAreArray(*after));
+            ASSERT_THAT(executed(table, root, false), ElementsAreArray(*after)) << "execute() does not ask";
+            ASSERT_THAT(accepted(table, node), ElementsAreArray(*after));
+            ASSERT_THAT(accepted(table, node, false), ElementsAreArray(*before));
+            compared += after->size();
 
-                std::vector<std::string> symbols;
-                table.getSymbolsFromExpression(root, symbols);
-                std::set<std::string> names;
-                for (const SymbolicExpr* each : *after)
-                    if (each->op() == SymbolicOp::String)
-                        names.insert(static_cast<const SymbolicString&>(*each).getName());
-                ASSERT_THAT(symbols, testing::UnorderedElementsAreArray(names));
-            }
+            std::vector<std::string> symbols;
+            table.getSymbolsFromExpression(root, symbols);
+            std::set<std::string> names;
+            for (const SymbolicExpr* each : *after)
+                if (each->op() == SymbolicOp::String)
+                    names.insert(static_cast<const SymbolicString&>(*each).getName());
+            ASSERT_THAT(symbols, testing::UnorderedElementsAreArray(names));
         }
-    }
+    });
     EXPECT_GT(compared, 50'000U);
 }
 

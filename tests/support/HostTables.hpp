@@ -5,6 +5,8 @@
 #include "base/core/Nodes.hpp"
 #include "tests/support/AnyNode.hpp"
 
+#include <gtest/gtest.h>
+
 #include <algorithm>
 #include <limits>
 #include <memory>
@@ -81,21 +83,21 @@ private:
     std::unordered_multimap<std::uint64_t, SymbolicExprId> byHash_;
 };
 
-/// The library's table, or one derived from it that leaves the storage to it.
-template <class Table>
-class LibraryTable final : public Table, public NumberedTable {
+/// A table derived from the library's that leaves the storage to it.
+class DerivedTable final : public SymbolicExprTable, public NumberedTable {
 public:
-    const SymbolicExpr* get(SymbolicExprId id) const override { return Table::get(id); }
+    const SymbolicExpr* get(SymbolicExprId id) const override { return SymbolicExprTable::get(id); }
 
     SymbolicExprTable& table() override { return *this; }
 
     [[nodiscard]] SymbolicExprId idAt(std::size_t position) const override { return position; }
 
-    [[nodiscard]] std::size_t count() const override { return this->size(); }
+    [[nodiscard]] std::size_t count() const override { return size(); }
 
     [[nodiscard]] bool isOrdered() const override { return true; }
 };
 
+/// The library's own table.
 class PlainTable final : public NumberedTable {
 public:
     SymbolicExprTable& table() override { return table_; }
@@ -114,7 +116,7 @@ private:
 inline std::vector<std::unique_ptr<NumberedTable>> tablesOfEachKind() {
     std::vector<std::unique_ptr<NumberedTable>> tables;
     tables.push_back(std::make_unique<PlainTable>());
-    tables.push_back(std::make_unique<LibraryTable<SymbolicExprTable>>());
+    tables.push_back(std::make_unique<DerivedTable>());
     for (const auto numbering :
          {HostTable::Numbering::Dense, HostTable::Numbering::Descending, HostTable::Numbering::Far})
         tables.push_back(std::make_unique<HostTable>(numbering));
@@ -141,8 +143,25 @@ inline void addBrokenGraph(std::mt19937_64& random, NumberedTable& into, std::si
     }
 }
 
-/// Calls `visit(node)` for every occurrence of a node below and including one, and `missing()` for every operand that
-/// is missing.  False where there are more than so many occurrences.
+/// Calls `check(table, ids)` for random graphs of so many nodes in tables of each kind.
+template <class Check>
+void forBrokenGraphs(std::uint64_t seed, int rounds, std::size_t nodes, Check check) {
+    std::mt19937_64 random(seed);
+    for (int round = 0; round < rounds; ++round) {
+        for (const auto& table : tablesOfEachKind()) {
+            addBrokenGraph(random, *table, nodes);
+            std::vector<SymbolicExprId> ids;
+            for (std::size_t position = 0; position < table->count(); ++position)
+                ids.push_back(table->idAt(position));
+            check(*table, ids);
+            if (::testing::Test::HasFailure())
+                return;
+        }
+    }
+}
+
+/// A walk by recursion: calls `visit(node)` for every occurrence of a node below and including one, and `missing()` for
+/// every operand that is missing.  False where there are more than so many occurrences.
 template <class Visit, class Missing>
 class Recursion {
 public:

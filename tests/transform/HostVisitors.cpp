@@ -4,7 +4,6 @@
 #include "base/transform/FactorDivision.hpp"
 #include "base/transform/QuillConversion.hpp"
 #include "base/transform/Replacement.hpp"
-#include "base/transform/Symbols.hpp"
 #include "base/transform/XForm.hpp"
 #include "tests/support/HostTables.hpp"
 #include "tests/support/TreeText.hpp"
@@ -191,43 +190,35 @@ public:
 /// of each kind; how many results there were.
 template <class Visitor>
 std::size_t compareDrivers(const Model& model, bool acceptsBottomUp = true) {
-    std::mt19937_64 random(11);
     std::size_t results = 0;
-    for (int round = 0; round < 40; ++round) {
-        for (const auto& source : tablesOfEachKind()) {
-            addBrokenGraph(random, *source, 25);
-            const SymbolicExprTable& nodes = source->table();
-            const std::size_t count = source->count();
-            PlainTable elsewhere;
-            SymbolicIntValue(elsewhere.table(), 4711); // identifiers are others there
-            for (NumberedTable* const target : {static_cast<NumberedTable*>(&elsewhere), source.get()}) {
-                for (std::size_t position = 0; position < count; ++position) {
-                    const SymbolicExprId root = source->idAt(position);
-                    const auto after = run(*source, root, model);
-                    const auto before = acceptsBottomUp ? after : run(*source, root, model, false);
-                    if (!after || !before)
-                        continue;
-                    Visitor visitor(target->table());
-                    visitor.execute(nodes, root);
-                    const SymbolicExprId executed = visitor.get();
-                    // A host's table that does not find a NaN cannot tell which node it has become.
-                    const bool isLost = !target->isOrdered() && after->find("nan") != std::string::npos &&
-                                        textOf(*target, executed) != *after;
-                    if (isLost)
-                        continue;
-                    EXPECT_EQ(textOf(*target, executed), *after);
-                    results += *after != noResult ? 1 : 0;
-                    const SymbolicExprId rebuilt = Visitor(target->table()).rebuild(nodes, root);
-                    EXPECT_EQ(textOf(*target, rebuilt), *after);
-                    Visitor accepting(target->table());
-                    nodes.get(root)->accept(nodes, accepting);
-                    EXPECT_EQ(textOf(*target, accepting.get()), *before);
-                    if (::testing::Test::HasFailure())
-                        return results;
-                }
+    forBrokenGraphs(11, 40, 25, [&](NumberedTable& source, const std::vector<SymbolicExprId>& ids) {
+        const SymbolicExprTable& nodes = source.table();
+        PlainTable elsewhere;
+        SymbolicIntValue(elsewhere.table(), 4711); // identifiers are others there
+        for (NumberedTable* const target : {static_cast<NumberedTable*>(&elsewhere), &source}) {
+            for (const SymbolicExprId root : ids) {
+                const auto after = run(source, root, model);
+                const auto before = acceptsBottomUp ? after : run(source, root, model, false);
+                if (!after || !before)
+                    continue;
+                Visitor visitor(target->table());
+                visitor.execute(nodes, root);
+                const SymbolicExprId executed = visitor.get();
+                // A host's table that does not find a NaN cannot tell which node it has become.
+                const bool isLost = !target->isOrdered() && after->find("nan") != std::string::npos &&
+                                    textOf(*target, executed) != *after;
+                if (isLost)
+                    continue;
+                ASSERT_EQ(textOf(*target, executed), *after);
+                results += *after != noResult ? 1 : 0;
+                const SymbolicExprId rebuilt = Visitor(target->table()).rebuild(nodes, root);
+                ASSERT_EQ(textOf(*target, rebuilt), *after);
+                Visitor accepting(target->table());
+                nodes.get(root)->accept(nodes, accepting);
+                ASSERT_EQ(textOf(*target, accepting.get()), *before);
             }
         }
-    }
+    });
     return results;
 }
 
@@ -249,69 +240,49 @@ bool isBroken(NumberedTable& table, SymbolicExprId root) {
 }
 
 TEST(HostVisitors, InPlaceAWholeExpressionIsItself) {
-    std::mt19937_64 random(3);
     std::size_t whole = 0;
-    for (int round = 0; round < 200; ++round) {
-        for (const auto& numbered : tablesOfEachKind()) {
-            addBrokenGraph(random, *numbered, 20);
-            SymbolicExprTable& table = numbered->table();
-            const std::size_t count = numbered->count();
-            for (std::size_t position = 0; position < count; ++position) {
-                const SymbolicExprId id = numbered->idAt(position);
-                if (isBroken(*numbered, id))
-                    continue;
-                ++whole;
-                EXPECT_EQ(Rebuild(table).rebuild(table, id), id); // also what holds a NaN
-                EXPECT_EQ(HookedRebuild(table).rebuild(table, id), id);
-                for (const bool accept : {true, false}) {
-                    Rebuild visitor(table);
-                    accept ? table.get(id)->accept(table, visitor) : visitor.execute(table, id);
-                    EXPECT_EQ(visitor.get(), id);
-                }
-                EXPECT_EQ(SymbolicExprCopy(table, table)(id), id);
+    forBrokenGraphs(3, 200, 20, [&](NumberedTable& numbered, const std::vector<SymbolicExprId>& ids) {
+        SymbolicExprTable& table = numbered.table();
+        for (const SymbolicExprId id : ids) {
+            if (isBroken(numbered, id))
+                continue;
+            ++whole;
+            EXPECT_EQ(Rebuild(table).rebuild(table, id), id); // also what holds a NaN
+            EXPECT_EQ(HookedRebuild(table).rebuild(table, id), id);
+            for (const bool accept : {true, false}) {
+                Rebuild visitor(table);
+                accept ? table.get(id)->accept(table, visitor) : visitor.execute(table, id);
+                EXPECT_EQ(visitor.get(), id);
             }
-            ASSERT_EQ(numbered->count(), count);
+            EXPECT_EQ(SymbolicExprCopy(table, table)(id), id);
         }
-    }
+        EXPECT_EQ(numbered.count(), ids.size());
+    });
     EXPECT_GT(whole, 5000U);
 }
 
-/// A missing operand is as if an unknown name stood there, but that no rule looks at its node.
 TEST(HostVisitors, TheLibrarysTransformsKeepMissingOperands) {
-    std::mt19937_64 random(8);
     std::size_t broken = 0;
-    for (int round = 0; round < 100; ++round) {
-        for (const auto& numbered : tablesOfEachKind()) {
-            addBrokenGraph(random, *numbered, 25);
-            SymbolicExprTable& table = numbered->table();
-            SymbolicExprTable copies;
-            const SymbolicExprReplacements replacements{
-                {SymbolicString(table, "x").getId(table), SymbolicString(table, "y").getId(table)},
-                {invalidId, SymbolicString(table, "a").getId(table)}};
-            const std::size_t count = numbered->count();
-            for (std::size_t position = 0; position < count; ++position) {
-                const SymbolicExprId id = numbered->idAt(position);
-                const auto before = run(*numbered, id, Model());
-                if (!before || !isBroken(*numbered, id))
-                    continue;
-                ++broken;
-                std::vector<SymbolicExprId> after{SymbolicExprCast2Int(table).cast2Int(id),
-                                                  SymbolicExprReplacement(table, replacements)(id),
-                                                  SymbolicExprQ2C(table)(id), SymbolicExprC2Q(table)(id),
-                                                  SymbolicExprFactorDivision(table).factorDivision(id)};
-                for (const SymbolicExprId result : after) {
-                    ASSERT_TRUE(table.has(result));
-                    EXPECT_TRUE(isBroken(*numbered, result)) << *before;
-                }
-                // These look at no operand that could be missing.
-                std::vector<SymbolicExprId> symbols;
-                SymbolicExprSymbols{table}(id, symbols);
-                for (const SymbolicExprId symbol : symbols)
-                    EXPECT_EQ(table.get(symbol)->op(), SymbolicOp::String);
-                EXPECT_TRUE(copies.has(SymbolicExprCopy(table, copies)(id)));
+    forBrokenGraphs(8, 100, 25, [&](NumberedTable& numbered, const std::vector<SymbolicExprId>& ids) {
+        SymbolicExprTable& table = numbered.table();
+        SymbolicExprTable copies;
+        const Trees tree{table};
+        const SymbolicExprReplacements replacements{{tree.name("x"), tree.name("y")}, {invalidId, tree.name("a")}};
+        for (const SymbolicExprId id : ids) {
+            const auto before = run(numbered, id, Model());
+            if (!before || !isBroken(numbered, id))
+                continue;
+            ++broken;
+            for (const SymbolicExprId result :
+                 {SymbolicExprCast2Int(table).cast2Int(id), SymbolicExprReplacement(table, replacements)(id),
+                  SymbolicExprQ2C(table)(id), SymbolicExprC2Q(table)(id),
+                  SymbolicExprFactorDivision(table).factorDivision(id)}) {
+                ASSERT_TRUE(table.has(result));
+                EXPECT_TRUE(isBroken(numbered, result)) << *before;
             }
+            EXPECT_TRUE(copies.has(SymbolicExprCopy(table, copies)(id)));
         }
-    }
+    });
     EXPECT_GT(broken, 5000U);
 }
 
