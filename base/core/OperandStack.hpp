@@ -10,6 +10,7 @@
 namespace VT {
 
 namespace detail {
+template <class Path>
 class OccurrenceWalk;
 }
 
@@ -114,6 +115,7 @@ protected:
     };
 
 private:
+    template <class Path>
     friend class detail::OccurrenceWalk;
 
     std::vector<SymbolicExprId> stack_;

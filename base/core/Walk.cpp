@@ -7,6 +7,7 @@ namespace VT {
 namespace detail {
 
 /// Visits the nodes below and including one, each as often as it occurs.
+template <class Path>
 class OccurrenceWalk {
 public:
     OccurrenceWalk(const SymbolicExprTable& table, SymbolicExprVisitor& visitor)
@@ -72,20 +73,29 @@ private:
     const SymbolicExprTable& table_;
     SymbolicExprVisitor& visitor_;
     OperandStack* operands_;
-    WalkPath path_;
+    Path path_;
     std::vector<Frame> stack_;
 };
+
+/// `id` is that of the root, or the invalid one.
+template <class BottomUp>
+void visitOccurrences(const SymbolicExprTable& table, SymbolicExprId id, const SymbolicExpr& root,
+                      SymbolicExprVisitor& visitor, BottomUp bottomUp) {
+    if (table.isPlain())
+        OccurrenceWalk<PlainPath>(table, visitor).run(id, root, bottomUp);
+    else
+        OccurrenceWalk<WalkPath>(table, visitor).run(id, root, bottomUp);
+}
 
 } // namespace detail
 
 void visitEveryOccurrence(const SymbolicExprTable& table, const SymbolicExpr& root, SymbolicExprVisitor& visitor) {
-    const SymbolicExprId id = table.lookup(&root);
-    detail::OccurrenceWalk(table, visitor).run(id, root, [&] { return visitor.isBottomUpVistor(); });
+    detail::visitOccurrences(table, table.lookup(&root), root, visitor, [&] { return visitor.isBottomUpVistor(); });
 }
 
 void SymbolicExprVisitor::execute(const SymbolicExprTable& table, SymbolicExprId id) {
     if (table.has(id))
-        detail::OccurrenceWalk(table, *this).run(id, *table.get(id), [] { return true; });
+        detail::visitOccurrences(table, id, *table.get(id), *this, [] { return true; });
 }
 
 } // namespace VT

@@ -19,15 +19,33 @@ namespace VT {
 VTSYM_API void visitEveryOccurrence(const SymbolicExprTable& table, const SymbolicExpr& root,
                                     SymbolicExprVisitor& visitor);
 
-/// The nodes that a walk is inside of.  Costs nothing in a plain table, whose nodes lead in no circle.
+/// The nodes that a walk over a plain table is inside of: none that matters, because its nodes lead in no circle.
+class PlainPath {
+public:
+    explicit PlainPath(const SymbolicExprTable& table) : size_(table.size()) {}
+
+    static void enter(SymbolicExprId) {}
+
+    static void leave(SymbolicExprId) {}
+
+    static constexpr std::size_t depthOf(SymbolicExprId) { return 0; }
+
+    /// As SymbolicExprTable::hasOperand().
+    [[nodiscard]] bool hasOperand(SymbolicExprId id, SymbolicExprId operand) const {
+        return operand < id && operand < size_;
+    }
+
+private:
+    std::size_t size_;
+};
+
+/// The nodes that a walk over any table is inside of.
 class WalkPath {
 public:
-    explicit WalkPath(const SymbolicExprTable& table) : table_(table), plain_(table.isPlain()) {}
+    explicit WalkPath(const SymbolicExprTable& table) : table_(table) {}
 
     /// Goes down into a node; the invalid identifier stands for one that is not interned.
     void enter(SymbolicExprId id) {
-        if (plain_)
-            return;
         ++depth_;
         if (id != invalidId)
             depths_.insert(id, depth_);
@@ -35,8 +53,6 @@ public:
 
     /// Goes up from the node that was entered last.
     void leave(SymbolicExprId id) {
-        if (plain_)
-            return;
         --depth_;
         if (id != invalidId)
             depths_.insert(id, 0);
@@ -44,18 +60,17 @@ public:
 
     /// How many nodes down the walk entered a node that it did not leave; 0 for another node.
     [[nodiscard]] std::size_t depthOf(SymbolicExprId id) const {
-        const std::size_t* const depth = plain_ ? nullptr : depths_.find(id);
+        const std::size_t* const depth = depths_.find(id);
         return depth != nullptr ? *depth : 0;
     }
 
     /// Whether there is a node for an operand of `id`, on the path or not.
     [[nodiscard]] bool hasOperand(SymbolicExprId id, SymbolicExprId operand) const {
-        return plain_ ? operand < id && operand < table_.size() : table_.hasOperand(id, operand);
+        return table_.hasOperand(id, operand);
     }
 
 private:
     const SymbolicExprTable& table_;
-    bool plain_;
     std::size_t depth_ = 0;
     IdMap<std::size_t> depths_;
 };
@@ -71,18 +86,14 @@ struct WalkFrame {
     std::size_t circle = noCircle; ///< the least depth of a node on the path that was met again below this one
 };
 
-/// Post-order walk for a caller that remembers the nodes itself, operands from left to right.
-///
-/// `known(id, parent)` tells whether the node was visited before, in this walk or an earlier one, and takes note of a
-/// further occurrence if so; `visit(id, node, parent)` is called for every other node, and `missing(id, parent)` for an
-/// operand that no node stands for.  `parent` is the node on whose behalf, nullptr for the root.  A `visit` with a
-/// fourth parameter is told whether the node is part of a circle, so that what is below it depends on the path to it.
-/// `stack` is room that a caller of many small walks may keep.  Linear in the number of edges.
-template <class Known, class Visit, class Missing>
-void walkUnknown(const SymbolicExprTable& table, SymbolicExprId root, std::vector<WalkFrame>& stack, Known&& known,
-                 Visit&& visit, Missing&& missing) {
+namespace detail {
+
+template <class Path, class Known, class Visit, class Missing>
+void walkUnknownBelow(const SymbolicExprTable& table, SymbolicExprId root, std::vector<WalkFrame>& stack, Known&& known,
+                      Visit&& visit, Missing&& missing) {
+    constexpr bool isPlain = std::is_same_v<Path, PlainPath>;
     stack.clear();
-    WalkPath path(table);
+    Path path(table);
     const auto finish = [&](SymbolicExprId id, const SymbolicExpr& node, const SymbolicExpr* parent,
                             [[maybe_unused]] bool isInCircle) {
         if constexpr (std::is_invocable_v<Visit&, SymbolicExprId, const SymbolicExpr&, const SymbolicExpr*, bool>)
@@ -91,7 +102,7 @@ void walkUnknown(const SymbolicExprTable& table, SymbolicExprId root, std::vecto
             visit(id, node, parent);
     };
     const auto enter = [&](SymbolicExprId id, const SymbolicExpr* parent) {
-        const SymbolicExpr* node = table.get(id);
+        const SymbolicExpr* node = isPlain ? table.SymbolicExprTable::get(id) : table.get(id);
         const std::size_t count = node->getNumInputs();
         if (count == 0) {
             finish(id, *node, parent, false);
@@ -110,9 +121,10 @@ void walkUnknown(const SymbolicExprTable& table, SymbolicExprId root, std::vecto
             const WalkFrame done = top;
             stack.pop_back();
             path.leave(done.id);
-            if (!stack.empty())
+            if (!isPlain && !stack.empty())
                 stack.back().circle = std::min(stack.back().circle, done.circle);
-            finish(done.id, *done.node, stack.empty() ? nullptr : stack.back().node, done.circle <= stack.size() + 1);
+            finish(done.id, *done.node, stack.empty() ? nullptr : stack.back().node,
+                   !isPlain && done.circle <= stack.size() + 1);
             continue;
         }
         const SymbolicExprId operand = top.node->getInput(top.next++);
@@ -126,6 +138,24 @@ void walkUnknown(const SymbolicExprTable& table, SymbolicExprId root, std::vecto
             enter(operand, parent);
         }
     }
+}
+
+} // namespace detail
+
+/// Post-order walk for a caller that remembers the nodes itself, operands from left to right.
+///
+/// `known(id, parent)` tells whether the node was visited before, in this walk or an earlier one, and takes note of a
+/// further occurrence if so; `visit(id, node, parent)` is called for every other node, and `missing(id, parent)` for an
+/// operand that no node stands for.  `parent` is the node on whose behalf, nullptr for the root.  A `visit` with a
+/// fourth parameter is told whether the node is part of a circle, so that what is below it depends on the path to it.
+/// `stack` is room that a caller of many small walks may keep.  Linear in the number of edges.
+template <class Known, class Visit, class Missing>
+void walkUnknown(const SymbolicExprTable& table, SymbolicExprId root, std::vector<WalkFrame>& stack, Known&& known,
+                 Visit&& visit, Missing&& missing) {
+    if (table.isPlain())
+        detail::walkUnknownBelow<PlainPath>(table, root, stack, known, visit, missing);
+    else
+        detail::walkUnknownBelow<WalkPath>(table, root, stack, known, visit, missing);
 }
 
 /// Post-order walk over the distinct nodes below and including `root`, operands from left to right.
