@@ -158,7 +158,7 @@ private:
     [[nodiscard]] Printed insideCall(const Printed& printed) const;
     void setInsideCall(Printed& printed, const Printed& form);
 
-    [[nodiscard]] bool losesSign(const Printed& operand, unsigned char precedence) const;
+    [[nodiscard]] bool needsParentheses(const Printed& operand, unsigned char precedence) const;
     void appendInteger(int value);
     void appendDouble(double value);
     [[nodiscard]] Text integer(int value);
