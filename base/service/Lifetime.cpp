@@ -25,6 +25,10 @@ ServiceParts::ServiceParts()
       cPrinter(table, false, true),
       caching(cacheSymExprSimplifyResultsFeature().isOn()) {
     table.addBoolSymbols();
+    addSimCodegenVariantKeywordSymbols();
+}
+
+void ServiceParts::addSimCodegenVariantKeywordSymbols() {
     const SymbolicString sim(table, VariantKeywords::getSimVariantKeyword());
     const SymbolicString codegen(table, VariantKeywords::getCodegenVariantKeyword());
 }

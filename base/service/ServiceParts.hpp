@@ -27,6 +27,9 @@ struct CustomizerRelease {
 struct ServiceParts {
     ServiceParts();
 
+    /// Interns (sim) and (codegen) as identifiers, whether or not they are in force.
+    void addSimCodegenVariantKeywordSymbols();
+
     /// The cache of a language.
     template <class Cache>
     static Cache& of(std::array<Cache, 2>& caches, bool isQuill) {
