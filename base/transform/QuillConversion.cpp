@@ -63,9 +63,8 @@ void SymbolicExprQ2CVisitor::convert(const Call& node) {
     if (!inputs.empty()) {
         const std::span<const SymbolicExprId> arguments(inputs.data() + 1, inputs.size() - 1);
         const SymbolicOp op = operatorOf(inputs.front(), arguments.size());
-        const SymbolicExprId built = op == SymbolicOp::None ? invalidId : build(op, arguments);
-        if (built != invalidId) {
-            push(built);
+        if (op != SymbolicOp::None) {
+            push(build(op, arguments));
             return;
         }
     }
@@ -74,7 +73,7 @@ void SymbolicExprQ2CVisitor::convert(const Call& node) {
     SymbolicExprXFormVisitor::visit(node);
 }
 
-/// The C operator on the arguments, or the invalid identifier where the call has to stay.
+/// The C operator on the arguments.
 SymbolicExprId SymbolicExprQ2CVisitor::build(SymbolicOp op, std::span<const SymbolicExprId> arguments) {
     switch (op) {
     case SymbolicOp::Divide:
@@ -95,14 +94,8 @@ SymbolicExprId SymbolicExprQ2CVisitor::build(SymbolicOp op, std::span<const Symb
         return invalidId;
     }
     const CShift shift = shiftOfQuillCall(table(), arguments[1]);
-    switch (shift.op) {
-    case SymbolicOp::ShiftLeft:
-        return factory_.make<SymbolicShiftLeftExpr>(arguments[0], make(shift.amount));
-    case SymbolicOp::ShiftRight:
-        return factory_.make<SymbolicShiftRightExpr>(arguments[0], make(shift.amount));
-    default:
-        return invalidId;
-    }
+    return shift.op == SymbolicOp::ShiftLeft ? factory_.make<SymbolicShiftLeftExpr>(arguments[0], make(shift.amount))
+                                             : factory_.make<SymbolicShiftRightExpr>(arguments[0], make(shift.amount));
 }
 
 // C to Quill.

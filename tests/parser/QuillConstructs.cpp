@@ -43,7 +43,7 @@ TEST(QuillConstructs, Conditions) {
         "2^-2147483648 => Power(2,-2147483648)", "-(2147483648) => UnaryMinus(2147483648r)",
         "-2147483648^2 => UnaryMinus(Power(2147483648r,2))", "-2147483648' => UnaryMinus(Transpose(2147483648r))",
         "a-2147483648 => Minus(a,2147483648r)", "-2147483649 => UnaryMinus(2147483649r)",
-        "-02147483647 => UnaryMinus(2147483647)", "bitshift(a,-2147483648) => FcnCall(bitshift,a,-2147483648)",
+        "-02147483647 => UnaryMinus(2147483647)", "bitshift(a,-2147483648) => ShiftRight(a,2147483647)",
         // Every operator
         "2^-1 => Power(2,UnaryMinus(1))", "-a^2 => UnaryMinus(Power(a,2))", "a'' => Transpose(Transpose(a))",
         // Ranges

