@@ -90,6 +90,9 @@ public:
     /// The alias of an identifier, or the empty text.
     [[nodiscard]] std::string getAliasForSymbolicIdentifier(const std::string& identifier) const;
 
+    /// Number of identifiers with an alias.  Aliases neither change nor go, so equal numbers mean equal aliases.
+    [[nodiscard]] std::size_t aliasCount() const noexcept { return aliases_.size(); }
+
 private:
     template <class Node, SymbolicOp Op, class Payload>
     friend class detail::InternedNode;

@@ -89,6 +89,16 @@ bool StringifySymbolicExpr::pushKnown(SymbolicExprId id) {
 }
 
 StringifySymbolicExpr::Printed StringifySymbolicExpr::printed(SymbolicExprId id) {
+    if (!plainNames_)
+        if (const std::uint64_t version = predicate_.version(); version != knownUnder_) {
+            known_.clear(); // texts stay, for those who hold them
+            knownUnder_ = version;
+        }
+    return printedOnce(id);
+}
+
+/// The same while a walk may be under way.
+StringifySymbolicExpr::Printed StringifySymbolicExpr::printedOnce(SymbolicExprId id) {
     const StackDepth depth(stack_);
     if (pushKnown(id))
         return stack_.back();
@@ -318,7 +328,7 @@ StringifySymbolicExpr::Printed StringifySymbolicExpr::shiftAmount(const Symbolic
     case ShiftAmount::Form::Expression:
         break;
     }
-    return converted.expression == shift.getInput(1) ? amount : insideCall(printed(converted.expression));
+    return converted.expression == shift.getInput(1) ? amount : insideCall(printedOnce(converted.expression));
 }
 
 void StringifySymbolicExpr::PrintQExprFromCExpr(const SymbolicExpr& node) {

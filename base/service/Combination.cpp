@@ -1,5 +1,6 @@
 // Conditions put together, compared and asked.
 #include "base/VCService.hpp"
+#include "base/service/AliasText.hpp"
 #include "base/service/ServiceParts.hpp"
 
 namespace VT {
@@ -73,7 +74,7 @@ std::string VCService::getParameterAlias(const std::string& parameter) const {
 }
 
 void VCService::addParameterAlias(const std::string& parameter, const std::string& alias) {
-    parts_->parameterAliases.emplace(parameter, alias);
+    parts_->parameterAliases.emplace(parameter, aliasText(alias));
 }
 
 SymbolicExprTable& VCService::table() noexcept {

@@ -88,8 +88,11 @@ TEST_F(GeneratedCode, ConditionsUnderAKnownOne) {
         printer.forget();
         EXPECT_EQ(printer.print(condition), left);
         StringifyImpliedCondition visitor(table, false, true, known);
-        table.get(condition)->accept(table, visitor);
-        EXPECT_EQ(visitor.get(), left);
+        StringifySymbolicExpr& base = visitor;
+        table.get(condition)->accept(table, base);
+        EXPECT_EQ(base.get(), left);
+        EXPECT_EQ(base.print(condition), left);
+        EXPECT_EQ(base.print(*table.get(condition)), left);
     }
     EXPECT_EQ(StringifyImpliedCondition(table, true, true, read("A")).print(read("A || B")), "true");
 }
