@@ -18,6 +18,7 @@ namespace VT {
 
 class SymbolicExprSimplify;
 class SymbolicExprTable;
+class SymbolRegistry;
 enum class PairQuestion : std::uint8_t;
 struct ServiceParts;
 
@@ -106,8 +107,12 @@ public:
     bool isEqual(const SymbolicExprId& a, const SymbolicExprId& b);
     /// The alias of a parameter, or the empty text.
     [[nodiscard]] std::string getParameterAlias(const std::string& parameter) const;
-    /// Records an alias of a parameter; the first alias stays.
+    /// Records an alias of a parameter, that of a negative literal in parentheses; the first alias stays.
     void addParameterAlias(const std::string& parameter, const std::string& alias);
+    /// Records for each parameter of a block's condition what a customizer puts in its place there
+    /// (VCCustomizer::parameterOfBlock), as above.  Records nothing for nullptr, for a parameter that stays, and for an
+    /// identifier that is not of the table.
+    void addParameterAlias(const VTBlock* block, SymbolicExprId condition, const VCCustomizer* customizer);
 
     /// Appends the symbols of the kinds asked for, as Quill text or as identifiers.  Throws std::out_of_range for a
     /// kind that is none.
@@ -128,13 +133,16 @@ public:
     /// Where a block is active: the And of its own condition and those of its ancestors.  Where the signal of a port
     /// flows: where its source is active, and one of its destinations.  With `simplify` as when combining; the invalid
     /// identifier for nullptr.  Each call reads the conditions anew; BlockConditions reads many blocks' once.
-    VCSymbolicExprId getQExprNetAAVCEIdx(const VTBlock* block, bool simplify);
-    VCSymbolicExprId getQExprNetAAVCEIdx(const vtPort* port, bool simplify);
+    ///
+    /// A customizer says what the parameters of each block's own condition stand for (VCCustomizer::parameterOfBlock).
+    /// It need not be the one that is installed, which alone has a say in simplification.
+    VCSymbolicExprId getQExprNetAAVCEIdx(const VTBlock* block, bool simplify, const VCCustomizer* customizer = nullptr);
+    VCSymbolicExprId getQExprNetAAVCEIdx(const vtPort* port, bool simplify, const VCCustomizer* customizer = nullptr);
     /// The same as Quill text and as C text.
-    std::string getQExprNetAAVCEString(const VTBlock* block, bool simplify);
-    std::string getQExprNetAAVCEString(const vtPort* port, bool simplify);
-    std::string getCExprNetAAVCEString(const VTBlock* block, bool simplify);
-    std::string getCExprNetAAVCEString(const vtPort* port, bool simplify);
+    std::string getQExprNetAAVCEString(const VTBlock* block, bool simplify, const VCCustomizer* customizer = nullptr);
+    std::string getQExprNetAAVCEString(const vtPort* port, bool simplify, const VCCustomizer* customizer = nullptr);
+    std::string getCExprNetAAVCEString(const VTBlock* block, bool simplify, const VCCustomizer* customizer = nullptr);
+    std::string getCExprNetAAVCEString(const vtPort* port, bool simplify, const VCCustomizer* customizer = nullptr);
 
     // Deciding.  Answers are exact over the integers, without bounds unless asked for, or "undecided" with the bound
     // that was hit, and come with a witness where one assignment proves them; see Decision.hpp.  Operators that Quill
@@ -204,6 +212,11 @@ public:
 
     [[nodiscard]] SymbolicExprTable& table() noexcept;
     [[nodiscard]] SymbolicExprSimplify& simplifier() noexcept;
+    /// The names that dimension expressions of blocks have in the service's table.
+    [[nodiscard]] SymbolRegistry& symbolRegistry() noexcept;
+    /// Whether "(sim)" and "(codegen)" are keywords: the feature "VariantKeywordsSimCodegen" was on when the service
+    /// was made, and is.
+    [[nodiscard]] bool areVariantKeywordsInForce() const;
 
 private:
     friend class VCServiceHandle;
@@ -216,7 +229,6 @@ private:
     VCSymbolicExprId simplifyFrom(const std::string& text, bool isQuill);
     std::string printIn(bool quill, SymbolicExprId condition, bool wasQuill);
     VCSymbolicExprId combined(SymbolicExprId condition, bool simplify);
-    SymbolicExprId replaceParameters(SymbolicExprId condition, const ParameterReplacements& parameters);
     SymbolicExprId rewritten(SymbolicExprId condition);
     Decision ask(PairQuestion question, const VCSymbolicExprId& a, const VCSymbolicExprId& b);
     std::vector<VCSymbolicExprId> uniqueOperands(const VCSymbolicExprId& condition, bool ofAnd);

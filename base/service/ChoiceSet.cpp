@@ -9,7 +9,6 @@
 #include "base/service/ImpliedCondition.hpp"
 #include "base/simplify/Simplify.hpp"
 #include "base/transform/QuillConversion.hpp"
-#include "base/variants/VariantKeywords.hpp"
 
 #include <algorithm>
 #include <limits>
@@ -21,7 +20,7 @@ struct ChoiceSetChecker::State {
         : service(theService),
           table(theService.table()),
           toC(table),
-          decider(table, {.keywordsInForce = isVariantKeywordsSimCodegenFeatureOn(), .bits32 = theOptions.bits32}),
+          decider(table, {.keywordsInForce = theService.areVariantKeywordsInForce(), .bits32 = theOptions.bits32}),
           options(theOptions),
           stepsLeft(theOptions.steps) {}
 

@@ -30,7 +30,7 @@ SetDecision askAbout(ServiceParts& parts, SetDecision (Decider::*question)(std::
 } // namespace
 
 bool ServiceParts::keywordsInForce() const {
-    return simplifier.keywordsFlag() && isVariantKeywordsSimCodegenFeatureOn();
+    return keywordFlag && isVariantKeywordsSimCodegenFeatureOn();
 }
 
 unsigned ServiceParts::decisionMode() const {

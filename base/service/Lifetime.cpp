@@ -18,7 +18,9 @@ std::uint64_t generation = 0;  ///< of the latest service
 ServiceParts::ServiceParts()
     : cParser(table, true, true),
       quillParser(table, checker),
+      registry(table),
       simplifier(table),
+      keywordFlag(isVariantKeywordsSimCodegenFeatureOn()),
       toC(table),
       toQuill(table),
       quillPrinter(table, true, true),

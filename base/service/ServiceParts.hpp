@@ -5,6 +5,7 @@
 #include "base/print/ExpressionPrinter.hpp"
 #include "base/service/DecisionCache.hpp"
 #include "base/service/SimplifyCache.hpp"
+#include "base/service/SymbolRegistry.hpp"
 #include "base/simplify/Simplify.hpp"
 #include "base/simplify/VCCustomizer.hpp"
 #include "base/transform/QuillConversion.hpp"
@@ -33,7 +34,7 @@ struct ServiceParts {
         return caches[isQuill ? 0 : 1];
     }
 
-    /// Whether the variant keywords are in force at this moment.
+    /// Whether the variant keywords are in force at this moment: they were when the service was made, and are.
     [[nodiscard]] bool keywordsInForce() const;
     /// What decisions depend on beside their conditions: 1 for keywords in force, 2 for 32-bit unknowns.
     [[nodiscard]] unsigned decisionMode() const;
@@ -46,7 +47,9 @@ struct ServiceParts {
     SymbolicExprParser cParser;
     VTSymbolicExprErrorCheckerBlockVariants checker;
     SymbolicExprFromQParseTreeBlockVariants quillParser;
+    SymbolRegistry registry;
     SymbolicExprSimplify simplifier;
+    bool keywordFlag; ///< the keyword feature when the service was made
     SymbolicExprQ2C toC;
     SymbolicExprC2Q toQuill;
     SymbolicExprPrinter quillPrinter;
