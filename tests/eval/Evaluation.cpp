@@ -1,7 +1,9 @@
 // What expressions are worth, and prepared expressions: they answer what one evaluation answers, bit for bit.
 #include "base/eval/Eval.hpp"
 #include "base/eval/EvalVisitor.hpp"
+#include "base/transform/DimensionLists.hpp"
 #include "host/Messages.hpp"
+#include "parser/QuillConverterBlockVariants.hpp"
 #include "parser/SymbolicExprParser.hpp"
 #include "tests/eval/Scalars.hpp"
 #include "tests/support/AnyNode.hpp"
@@ -134,6 +136,30 @@ TEST_F(Evaluation, AnswersIdentifiersThatAreNoNodes) {
     const SymbolicPlusExpr sum(other, two, two);
     sum.accept(table, visitor);
     EXPECT_EQ(visitor.get(), SymbolicValue(2)) << "1 + 1 in this table";
+}
+
+TEST_F(Evaluation, QuillWritesListsAsMatrices) {
+    VTSymbolicExprErrorCheckerBlockVariants checker;
+    SymbolicExprFromQParseTreeBlockVariants quill(table, checker);
+    const SymbolicExprDimensionLists lists(table);
+    bind("N", "3");
+    const std::vector<std::pair<const char*, SymbolicValue>> rows{
+        {"[1 2]*3", Vector{3, 6}}, {"[N, N*2] + [1 2]", Vector{4, 8}},
+        {"-[5]", Vector{-5}},      {"[1 2 3 N]", Vector{1, 2, 3, 3}},
+        {"[] * 2", Vector{}},      {"2 - (7 > [1 9])", Vector{1, 2}},
+    };
+    for (const auto& [text, wanted] : rows)
+        EXPECT_EQ(SymbolicExprEval(table).eval(lists(quill(text))), wanted) << text;
+    EXPECT_EQ(lists(quill("[1 2]*3")), read("[1, 2]*3"));
+    for (const char* text : {"[1; 2] + 1", "{1, 2}", "N + f(N)"}) {
+        const SymbolicExprId id = quill(text);
+        EXPECT_EQ(lists(id), id) << text;
+        EXPECT_THROW(static_cast<void>(SymbolicExprEval(table).eval(id)), HostDiagnostic) << text;
+    }
+    EXPECT_THROW(static_cast<void>(SymbolicExprEval(table).eval(lists(quill("[[1 2] 3]")))), HostDiagnostic);
+    EXPECT_EQ(lists(invalidId), invalidId);
+    const SymbolicExprId hollow = SymbolicMatrixExpr(table, std::vector<SymbolicExprId>{1000}).getId(table);
+    EXPECT_THROW(static_cast<void>(SymbolicExprEval(table).eval(lists(hollow))), HostDiagnostic);
 }
 
 TEST_F(Evaluation, EvaluatesSharedNodesOnce) {
