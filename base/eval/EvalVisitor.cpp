@@ -145,7 +145,7 @@ void SymbolicExprEvalImpl::enterSymbol(SymbolicExprId id, const SymbolicExpr& no
 
 /// Makes the value of the topmost frame's node from those of its operands, and remembers it.
 void SymbolicExprEvalImpl::leave() {
-    const Frame done = frames_.back();
+    const Frame& done = frames_.back();
     if (done.rule != ScalarRuleIndex::None)
         combine(*done.node, done.rule);
     else if (!done.isSymbol)

@@ -1,5 +1,6 @@
 #include "base/print/CTextObstacles.hpp"
 
+#include "base/core/IdMap.hpp"
 #include "base/core/Walk.hpp"
 #include "base/print/PreprocessorVCExpr.hpp"
 #include "base/variants/VariantKeywords.hpp"
@@ -68,9 +69,8 @@ private:
     void lookAtMember(SymbolicExprId id, const SymbolicMemberValue& member);
     void lookAtCall(SymbolicExprId id, const SymbolicExpr& call);
     void compareNames();
-    [[nodiscard]] bool isZeroOrOne(SymbolicExprId id) const;
-    [[nodiscard]] bool isTruthConstant(SymbolicExprId id) const;
-    [[nodiscard]] bool isNamed(SymbolicExprId id) const;
+    [[nodiscard]] bool isZeroOrOne(SymbolicExprId id);
+    [[nodiscard]] bool isNamed(SymbolicExprId id);
     [[nodiscard]] bool isReserved(std::string_view word) const;
 
     [[nodiscard]] bool inDirective() const noexcept { return use_ == CTextUse::Directive; }
@@ -80,17 +80,20 @@ private:
         return node != nullptr ? node->op() : SymbolicOp::None;
     }
 
-    /// The text of an identifier; empty for any other node.
-    [[nodiscard]] std::string written(SymbolicExprId id) const {
-        return op(id) == SymbolicOp::String
-                   ? predicate_.printIdentifier(static_cast<const SymbolicString&>(*table_.get(id)))
-                   : std::string();
-    }
+    /// What C makes of the text of an identifier; all false for any other node.
+    struct Words {
+        bool isTruth = false; ///< `true` or `false`
+        bool isIdentifier = false;
+        bool isReserved = false; ///< a word that C, or the preprocessor, keeps to itself
+    };
+
+    Words wordsOf(SymbolicExprId id);
 
     const SymbolicExprTable& table_;
     CTextUse use_;
     const SymbolicExprPrinter::PredicateHandle& predicate_;
     PreprocessorVCExpr printer_;
+    IdMap<Words> looked_;               ///< at identifiers, which may be long and occur often
     std::vector<SymbolicExprId> names_; ///< what becomes a name in the text
     std::vector<CTextFinding> findings_;
 };
@@ -104,14 +107,14 @@ void Finder::note(CTextObstacle obstacle, SymbolicExprId id, SymbolicExprId othe
 }
 
 /// Whether & and | of an operand are the same bit by bit.
-bool Finder::isZeroOrOne(SymbolicExprId id) const {
+bool Finder::isZeroOrOne(SymbolicExprId id) {
     const SymbolicOp kind = op(id);
     if (kind == SymbolicOp::IntValue) {
         const int value = static_cast<const SymbolicIntValue&>(*table_.get(id)).getValue();
         return value == 0 || value == 1;
     }
     if (kind == SymbolicOp::String)
-        return isTruthConstant(id);
+        return wordsOf(id).isTruth;
     return booleanOps.contains(kind);
 }
 
@@ -136,17 +139,21 @@ void Finder::look(SymbolicExprId id, const SymbolicExpr& node) {
         lookAtCall(id, node);
 }
 
-bool Finder::isTruthConstant(SymbolicExprId id) const {
-    const std::string text = written(id);
-    return text == "true" || text == "false";
+Finder::Words Finder::wordsOf(SymbolicExprId id) {
+    if (op(id) != SymbolicOp::String)
+        return {};
+    if (const Words* const known = looked_.find(id))
+        return *known;
+    const std::string text = predicate_.printIdentifier(static_cast<const SymbolicString&>(*table_.get(id)));
+    return looked_.insert(id, {text == "true" || text == "false", isIdentifier(text), isReserved(text)});
 }
 
 /// Whether what stands before a point or an argument list is written so that C can read it.  Members are looked at
 /// themselves.
-bool Finder::isNamed(SymbolicExprId id) const {
+bool Finder::isNamed(SymbolicExprId id) {
     const SymbolicOp kind = op(id);
     if (kind == SymbolicOp::String)
-        return !isTruthConstant(id) && (!inDirective() || isIdentifier(written(id)));
+        return !wordsOf(id).isTruth && (!inDirective() || wordsOf(id).isIdentifier);
     return kind == SymbolicOp::MemberValue || (!inDirective() && callOps.contains(kind));
 }
 
@@ -157,7 +164,7 @@ bool Finder::isReserved(std::string_view word) const {
 
 /// A text that a predicate has chosen is the host's.
 void Finder::lookAtName(SymbolicExprId id, const SymbolicString& name) {
-    const std::string text = written(id);
+    const std::string text = predicate_.printIdentifier(name);
     if (VariantKeywords::isVariantKeyword(text, false))
         note(CTextObstacle::VariantKeyword, id);
     else if (text == name.getName() && (!isIdentifier(text) || (!inDirective() && isReserved(text))))
@@ -177,9 +184,9 @@ void Finder::lookAtCall(SymbolicExprId id, const SymbolicExpr& call) {
     const SymbolicExprId callee = call.getNumInputs() > 0 ? call.getInput(0) : invalidId;
     if (!isNamed(callee) || (inDirective() && op(callee) != SymbolicOp::String))
         note(CTextObstacle::CalledNoName, id);
-    if (!inDirective() || written(callee) != definedOperator)
+    if (!inDirective() || !wordsOf(callee).isReserved)
         return;
-    if (call.getNumInputs() != 2 || !isNamed(call.getInput(1)) || isReserved(written(call.getInput(1))))
+    if (call.getNumInputs() != 2 || !isNamed(call.getInput(1)) || wordsOf(call.getInput(1)).isReserved)
         note(CTextObstacle::DefinedNoName, id);
 }
 
@@ -191,7 +198,7 @@ void Finder::occurs(SymbolicExprId id, const SymbolicExpr* parent) {
         return;
     names_.push_back(id);
     const bool isCalled = parent != nullptr && callOps.contains(parent->op()) && parent->getInput(0) == id;
-    if (inDirective() && !isCalled && isReserved(written(id)))
+    if (inDirective() && !isCalled && wordsOf(id).isReserved)
         note(CTextObstacle::NoSuchName, id);
 }
 
