@@ -5,7 +5,6 @@
 #include "tools/vtsym/Json.hpp"
 
 #include <algorithm>
-#include <limits>
 #include <new>
 
 namespace vtsym {
@@ -26,10 +25,6 @@ std::size_t characterAt(std::string_view text, std::size_t offset) {
     while (begin > 0 && begin < text.size() && offset - begin < 3 && continuesCharacter(text[begin]))
         --begin;
     return begin < text.size() && continuesCharacter(text[begin]) ? offset : begin;
-}
-
-std::string shown(std::string_view text) {
-    return VT::shownText(text, std::numeric_limits<std::size_t>::max());
 }
 
 } // namespace
@@ -53,8 +48,8 @@ std::string withCaret(std::string_view text, std::size_t offset, const Style& st
     const std::size_t begin = characterAt(text, offset > shownBefore ? offset - shownBefore : 0);
     const std::size_t end = characterAt(text, std::min(text.size() - offset, shownBehind) + offset);
     std::string before = begin > 0 ? "..." : "";
-    before += shown(text.substr(begin, offset - begin));
-    std::string behind = shown(text.substr(offset, end - offset));
+    before += VT::shownText(text.substr(begin, offset - begin));
+    std::string behind = VT::shownText(text.substr(offset, end - offset));
     if (end < text.size())
         behind += "...";
     const auto columns = std::ranges::count_if(before, [](char byte) { return !continuesCharacter(byte); });
@@ -66,12 +61,16 @@ std::string withCaret(std::string_view text, std::size_t offset, const Style& st
 std::string errorText(std::string_view text, const TextError& error, const Style& style) {
     std::string lines = error.message + "\n";
     if (error.offset)
-        lines += withCaret(text, *error.offset, style);
+        lines += withCaret(text.substr(error.begin, error.end - error.begin), *error.offset - error.begin, style);
     return lines;
 }
 
 std::string errorLines(std::uint64_t line, std::string_view text, const TextError& error, const Style& style) {
-    return style.strong("line " + std::to_string(line) + ":") + " " + errorText(text, error, style);
+    const std::string begin = style.strong("line " + std::to_string(line) + ":") + " ";
+    std::string lines = begin + errorText(text, error, style);
+    for (const TextError& each : error.further)
+        lines += begin + errorText(text, each, style);
+    return lines;
 }
 
 std::string warningLine(std::uint64_t line, std::string_view warning, const Style& style) {
@@ -83,6 +82,11 @@ std::string jsonOf(const TextError& error) {
     appendMember(json, "message", jsonString(error.message));
     if (error.offset)
         appendMember(json, "offset", std::to_string(*error.offset));
+    std::string further;
+    for (const TextError& each : error.further)
+        further.append(further.empty() ? "" : ",").append(jsonOf(each));
+    if (!further.empty())
+        appendMember(json, "further", "[" + further + "]");
     return json + "}";
 }
 

@@ -10,6 +10,7 @@
 #include <stdexcept>
 #include <string>
 #include <string_view>
+#include <vector>
 
 namespace vtsym {
 
@@ -18,12 +19,18 @@ struct TextError {
     std::string id;                    ///< of the message
     std::string message;               ///< a sentence
     std::optional<std::size_t> offset; ///< byte of the text that it is about
+    // The part of the text that is shown.
+    std::size_t begin = 0;
+    std::size_t end = std::string::npos;
+    std::vector<TextError> further = {}; ///< in other parts of the text
 };
 
 /// A line that mixes commands and texts cannot be followed.
 class CommandError : public std::runtime_error {
 public:
     explicit CommandError(const std::string& sentence) : CommandError(TextError{"vtsym:Command", sentence, {}}) {}
+
+    explicit CommandError(TextError error) : std::runtime_error(error.message), error_(std::move(error)) {}
 
     /// An error in a text that begins at a byte of the line.
     CommandError(TextError error, std::size_t begin) : CommandError(std::move(error)) {
@@ -34,8 +41,6 @@ public:
     [[nodiscard]] const TextError& error() const noexcept { return error_; }
 
 private:
-    explicit CommandError(TextError error) : std::runtime_error(error.message), error_(std::move(error)) {}
-
     TextError error_;
 };
 
@@ -46,7 +51,7 @@ TextError currentTextError();
 /// not show as it is, is shown as \xNN.
 std::string withCaret(std::string_view text, std::size_t offset, const Style& style);
 
-/// The lines for standard error, without and with the number of the text.
+/// The lines for standard error, without the number of the text and with it, which tells all errors.
 std::string errorText(std::string_view text, const TextError& error, const Style& style);
 std::string errorLines(std::uint64_t line, std::string_view text, const TextError& error, const Style& style);
 

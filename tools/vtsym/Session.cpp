@@ -2,6 +2,7 @@
 
 #include "base/core/Nodes.hpp"
 #include "host/Diagnostics.hpp"
+#include "host/Text.hpp"
 #include "tools/vtsym/ErrorText.hpp"
 #include "tools/vtsym/Explanation.hpp"
 #include "tools/vtsym/TreeWriters.hpp"
@@ -13,6 +14,7 @@ namespace vtsym {
 namespace {
 
 constexpr const char* lastResult = "ans";
+constexpr std::size_t shownBytes = 80; ///< of a word
 
 std::string_view trimmed(std::string_view text) {
     constexpr const char* blanks = " \t\r";
@@ -74,7 +76,7 @@ const Session::CommandRow& Session::commandOf(std::string_view word) {
     for (const CommandRow& command : commands)
         if (word == command.word)
             return command;
-    throw CommandError("There is no command " + std::string(word) + "; :help lists them.");
+    throw CommandError("There is no command " + VT::shownText(word, shownBytes) + "; :help lists them.");
 }
 
 /// The condition of a part of the line.
