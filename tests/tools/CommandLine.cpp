@@ -131,6 +131,12 @@ TEST(Program, ComparesConditions) {
          "\n",
          {"line 1: The condition \"A +\"", "\n  A +\n    ^\nline 1: The condition \"B +\"", "\n  B +\n    ^\n"},
          1},
+        {{"compare", "--json", "A +", "B +"},
+         "",
+         R"json({"line":1,"input":"A +\tB +","error":{"id":"Vantor:Variants:ExpressionParseError","message":"The condition \"A +\" cannot be read at byte 3, before \"+\".","offset":2,"further":[{"id":"Vantor:Variants:ExpressionParseError","message":"The condition \"B +\" cannot be read at byte 3, before \"+\".","offset":6}]}}
+)json",
+         {},
+         1},
         {{"compare", "", "A"}, "B\tB", "implied by; first alone: A=0\n"},
         {{"given", "--", "-A", "-A && B"}, "", "B\n"},
         {{"compare", "A"}, "", "", {"two conditions are needed", "Try 'vtsym compare --help'"}, 2},

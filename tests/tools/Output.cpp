@@ -41,8 +41,8 @@ std::string spoiled(const std::string& text) {
     return {};
 }
 
-void expectSafe(const Arguments& arguments, const std::string& input = {}) {
-    const ProgramResult result = runProgram({arguments, input, {}, {}});
+void expectSafe(const Arguments& arguments, const std::string& input = {}, const std::string& flags = {}) {
+    const ProgramResult result = runProgram({arguments, input, {"VTSYM_LOG=debug", "VTSYM_FEATURES=" + flags}, {}});
     SCOPED_TRACE(Json(arguments).dump(-1, ' ', true, Json::error_handler_t::replace));
     EXPECT_GE(result.status, 0);
     EXPECT_EQ(spoiled(result.output), "");
@@ -84,6 +84,7 @@ TEST(Output, IsSafeForTerminalsWhateverTheArguments) {
                  {"scan", "--max-size", text, "."},
              })
             expectSafe(arguments);
+        expectSafe({"simplify", "A"}, {}, text + "=1," + text + ",CacheSymExprSimplifyResults=" + text);
     }
 }
 

@@ -29,18 +29,22 @@ std::size_t characterAt(std::string_view text, std::size_t offset) {
 
 } // namespace
 
-TextError currentTextError() {
+std::vector<TextError> currentTextErrors() {
     try {
         throw;
     } catch (const VT::HostDiagnostic& diagnostic) {
-        return {diagnostic.messageId(), diagnostic.what(), diagnostic.offset()};
+        return {{diagnostic.messageId(), diagnostic.what(), diagnostic.offset()}};
     } catch (const CommandError& error) {
-        return error.error();
+        return error.errors();
     } catch (const std::length_error&) {
-        return {"vtsym:TextTooLong", "The answer is longer than a text may be.", std::nullopt};
+        return {{"vtsym:TextTooLong", "The answer is longer than a text may be.", std::nullopt}};
     } catch (const std::bad_alloc&) {
-        return {"vtsym:OutOfMemory", "There is not enough memory for the answer.", std::nullopt};
+        return {{"vtsym:OutOfMemory", "There is not enough memory for the answer.", std::nullopt}};
     }
+}
+
+TextError currentTextError() {
+    return currentTextErrors().front();
 }
 
 std::string withCaret(std::string_view text, std::size_t offset, const Style& style) {
@@ -65,11 +69,11 @@ std::string errorText(std::string_view text, const TextError& error, const Style
     return lines;
 }
 
-std::string errorLines(std::uint64_t line, std::string_view text, const TextError& error, const Style& style) {
-    const std::string begin = style.strong("line " + std::to_string(line) + ":") + " ";
-    std::string lines = begin + errorText(text, error, style);
-    for (const TextError& each : error.further)
-        lines += begin + errorText(text, each, style);
+std::string errorLines(std::uint64_t line, std::string_view text, std::span<const TextError> errors,
+                       const Style& style) {
+    std::string lines;
+    for (const TextError& error : errors)
+        lines += style.strong("line " + std::to_string(line) + ":") + " " + errorText(text, error, style);
     return lines;
 }
 
@@ -77,14 +81,18 @@ std::string warningLine(std::uint64_t line, std::string_view warning, const Styl
     return style.strong("line " + std::to_string(line) + ":").append(" warning: ").append(warning).append("\n");
 }
 
-std::string jsonOf(const TextError& error) {
-    std::string json = "{\"id\":" + jsonString(error.id);
-    appendMember(json, "message", jsonString(error.message));
-    if (error.offset)
-        appendMember(json, "offset", std::to_string(*error.offset));
+std::string jsonOf(std::span<const TextError> errors) {
+    const auto members = [](const TextError& error) {
+        std::string json = "{\"id\":" + jsonString(error.id);
+        appendMember(json, "message", jsonString(error.message));
+        if (error.offset)
+            appendMember(json, "offset", std::to_string(*error.offset));
+        return json;
+    };
     std::string further;
-    for (const TextError& each : error.further)
-        further.append(further.empty() ? "" : ",").append(jsonOf(each));
+    for (const TextError& error : errors.subspan(1))
+        further.append(further.empty() ? "" : ",").append(members(error)).append("}");
+    std::string json = members(errors.front());
     if (!further.empty())
         appendMember(json, "further", "[" + further + "]");
     return json + "}";

@@ -163,10 +163,11 @@ std::string sizeText(std::size_t bytes) {
 void addSizeOption(CLI::App& command, std::size_t& bound) {
     const auto take = [&bound](const std::string& size) {
         bound = bytesOf(size);
-        if (bound == 0)
+        if (bound == 0) {
             throw CLI::ValidationError("--max-size",
                                        quotedArgument(size) +
                                            " is not a size: write a number of bytes, or such as 64K, 64M or 1G");
+        }
     };
     addArgument(command, "--max-size", take, "Reject files that are larger (" + sizeText(mostBytes) + " unless given)")
         ->type_name("SIZE");

@@ -6,7 +6,6 @@
 #include "tools/vtsym/Json.hpp"
 
 #include <algorithm>
-#include <iterator>
 
 namespace vtsym {
 
@@ -66,11 +65,9 @@ ConditionPair readPair(const Conditions& conditions, const TextOptions& options,
     std::vector<TextError> errors;
     pair.first = readPart(conditions, options, pair.firstText, 0, errors);
     pair.second = readPart(conditions, options, pair.secondText, tab + 1, errors);
-    if (errors.empty())
-        return pair;
-    TextError error = std::move(errors.front());
-    error.further.assign(std::next(errors.begin()), errors.end());
-    throw CommandError(std::move(error));
+    if (!errors.empty())
+        throw CommandError(std::move(errors));
+    return pair;
 }
 
 std::string witnessText(const Conditions& conditions, const TextOptions& options, const VT::Witness& witness) {

@@ -62,14 +62,14 @@ void Answerer::answer(const std::string& text, bool isWhole) {
         answering_.answer(text, out_);
         words = warnings();
     } catch (...) {
-        const TextError error = currentTextError();
+        const std::vector<TextError> errors = currentTextErrors();
         allAnswered_ = false;
         out_.resize(begin);
         if (json_) {
             appendMember(out_, "input", jsonString(text));
-            appendMember(out_, "error", jsonOf(error));
+            appendMember(out_, "error", jsonOf(errors));
         } else {
-            words = errorLines(line_, text, error, console_.wordStyle());
+            words = errorLines(line_, text, errors, console_.wordStyle());
         }
     }
     out_ += json_ ? "}\n" : "\n";

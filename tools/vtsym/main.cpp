@@ -7,7 +7,6 @@
 
 #include <algorithm>
 #include <csignal>
-#include <iterator>
 #include <numeric>
 #include <span>
 #include <sstream>
@@ -130,9 +129,9 @@ void Program::markArguments(std::vector<std::string>& arguments) const {
     const auto word = std::ranges::find_if(arguments, isCommand);
     if (word == arguments.end())
         return;
-    const auto first = std::next(word);
-    const std::vector<std::string> marked = markedArguments(std::span(first, arguments.end()));
-    arguments.erase(first, arguments.end());
+    const auto first = static_cast<std::size_t>(word - arguments.begin()) + 1;
+    const std::vector<std::string> marked = markedArguments(std::span(arguments).subspan(first));
+    arguments.resize(first);
     arguments.insert(arguments.end(), marked.begin(), marked.end());
 }
 
