@@ -1,6 +1,7 @@
 #include "base/decide/Unknowns.hpp"
 
 #include "base/core/Nodes.hpp"
+#include "base/decide/OrderLabels.hpp"
 
 #include <boost/container_hash/hash.hpp>
 
@@ -9,8 +10,6 @@
 namespace VT {
 
 namespace {
-
-constexpr std::uint64_t labelGap = std::uint64_t{1} << 32U;
 
 /// a - b for bounds that may be infinite: `infinite` where either is.
 std::int64_t boundDifference(std::int64_t a, std::int64_t b, std::int64_t infinite) {
@@ -89,25 +88,9 @@ Unknown Unknowns::add(UnknownInfo info) {
     info.quantity = static_cast<Quantity>(quantities_.size());
     quantities_.push_back({unknown, noUnknown, info.low, info.high});
     unknowns_.push_back(std::move(info));
-    label(order_.insert(unknown).first);
+    labelInserted(order_.begin(), order_.end(), order_.insert(unknown).first,
+                  [&](Unknown each) -> std::uint64_t& { return unknowns_[each].label; });
     return unknown;
-}
-
-void Unknowns::label(std::set<Unknown, ByText>::const_iterator at) {
-    const std::uint64_t below = at == order_.begin() ? 0 : unknowns_[*std::prev(at)].label;
-    const auto next = std::next(at);
-    if (next == order_.end() && below < ~std::uint64_t{0} - labelGap) {
-        unknowns_[*at].label = below + labelGap;
-        return;
-    }
-    const std::uint64_t above = next == order_.end() ? ~std::uint64_t{0} : unknowns_[*next].label;
-    if (above - below > 1) {
-        unknowns_[*at].label = below + (above - below) / 2;
-        return;
-    }
-    std::uint64_t fresh = 0;
-    for (const Unknown unknown : order_)
-        unknowns_[unknown].label = fresh += labelGap;
 }
 
 Unknown Unknowns::simulation() {
