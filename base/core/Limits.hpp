@@ -65,4 +65,40 @@ inline constexpr std::size_t choiceOverlaps = 1000;
 /// Operands of a choice's condition up to which a redundant one is looked for.
 inline constexpr std::size_t choiceOperands = 64;
 
+/// Steps that decisions about the conditions of one source file may cost: so many for a file, and so many more for each
+/// condition as it is read.  Real conditions take some hundred, those of long chains over one macro some thousand.
+/// While they are used up, a condition is not decided, which is counted.
+inline constexpr std::uint64_t scanSteps = std::uint64_t{1} << 22U;
+inline constexpr std::uint64_t scanStepsPerBranch = std::uint64_t{1} << 13U;
+
+/// Steps of all decisions about one condition of a source file, and of each of them.  Beyond the first the shortest
+/// form found so far is reported; a decision beyond the second is given up.
+inline constexpr std::uint64_t branchSteps = std::uint64_t{1} << 20U;
+inline constexpr std::uint64_t branchDecisionSteps = std::uint64_t{1} << 16U;
+
+/// Nodes that a scanner keeps from file to file.  When there are more, the next file begins anew.
+inline constexpr std::size_t scanNodes = std::size_t{1} << 20U;
+
+/// Facts of branches around a condition that it is compared with: between one and two windows of those about one macro,
+/// and of all together what weighs so much, a fact about several macros as much as several.  Further ones are left out.
+inline constexpr std::size_t factWindow = 128;
+inline constexpr std::size_t factWeight = 256;
+inline constexpr std::size_t compoundFactWeight = 8;
+
+/// Tokens of a directive's condition that is looked into, and how often each of them may be written into the texts of
+/// unknowns (comparisons within comparisons repeat their operands).  Beyond either bound the condition is an unknown.
+inline constexpr std::size_t conditionTokens = 4096;
+inline constexpr std::size_t conditionTexts = 16;
+
+/// Macros that a macro is followed through to those that define it, and names in their definitions.  Beyond either
+/// bound nothing is known of the macro's value.
+inline constexpr std::size_t macrosFollowed = 64;
+inline constexpr std::size_t macroNamesFollowed = 1024;
+
+/// Raw strings without an end in one file that are searched to the end of the file.  Further ones are ordinary strings.
+inline constexpr unsigned endlessRawStrings = 8;
+
+/// Bytes of a directive that a finding quotes as a reason; what is longer is cut.
+inline constexpr std::size_t quotedBytes = 4096;
+
 } // namespace VT::limits

@@ -54,7 +54,8 @@ struct SourceScanOptions {
 struct SourceScanCounts {
     std::uint64_t branches = 0;  ///< that begin with a condition or #else
     std::uint64_t unread = 0;    ///< conditions that were not understood as a whole
-    std::uint64_t undecided = 0; ///< decisions that took too many steps
+    std::uint64_t undecided = 0; ///< conditions about which a decision took too many steps and was given up
+    std::uint64_t steps = 0;     ///< that decisions took
 };
 
 /// Holds the condition of every #if, #ifdef, #ifndef, #elif, #elifdef and #elifndef against those around it and those
