@@ -50,6 +50,13 @@ std::string directiveText(const Directive& directive) {
     return text;
 }
 
+/// A directive as a reason quotes it.
+std::string quoted(std::string text) {
+    if (text.size() > limits::quotedBytes)
+        text.replace(limits::quotedBytes, std::string::npos, "...");
+    return text;
+}
+
 std::string conditionText(const Directive& directive) {
     if (isExpression(directive.kind))
         return spelledTokens(directive.tokens);
@@ -266,17 +273,16 @@ void FileScan::judgeBranch(const Directive& directive, const DirectiveCondition&
     Chain& chain = chains_.back();
     chain.silent = verdict.kind == BranchVerdictKind::Dead;
     if (verdict.kind == BranchVerdictKind::AlwaysTrue)
-        chain.always = BranchReason{result.region, result.directive, true};
+        chain.always = BranchReason{result.region, quoted(result.directive), true};
     tell(std::move(result), directive, std::move(proposed));
 }
 
 BranchReason FileScan::reasonOf(const BranchFact& fact) const {
-    const std::string_view quoted = text_.substr(fact.begin, std::min(fact.end - fact.begin, limits::quotedBytes));
-    DirectiveReader reader(quoted);
+    DirectiveReader reader(text_.substr(fact.begin, std::min(fact.end - fact.begin, 2 * limits::quotedBytes)));
     Directive directive{};
     BranchReason reason{regionOf(text_, fact.begin, fact.line, fact.begin, fact.end), {}, !fact.negated};
     if (reader.next(directive))
-        reason.directive = directiveText(directive);
+        reason.directive = quoted(directiveText(directive));
     return reason;
 }
 
