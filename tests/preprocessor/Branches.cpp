@@ -42,8 +42,10 @@ public:
             add("#define DO(x) _Pragma(#x)");
             if (below(8) == 0)
                 add("#define POP DO(pop_macro(\"" + macro() + "\"))");
-            for (const std::string& name : derived)
+            for (const std::string& name : derived) {
+                favourites_[name] = body(name);
                 add("#define " + name + " " + body(name));
+            }
         }
         for (int i = 0; i < 3; ++i)
             addChain(-1, 0);
@@ -75,18 +77,23 @@ private:
         const std::string constant = moves_ ? place : oneOf("1", "2");
         if (macroName == "VAL")
             return constant;
+        const auto favourite = favourites_.find(macroName);
+        if (favourite != favourites_.end() && below(4) != 0)
+            return favourite->second;
+        if (below(3) == 0)
+            return oneOf("JOIN(V, AL)", "V ## AL", constant);
         const bool mayTest = std::ranges::find(derived, macroName) != derived.end();
         if (mayTest && below(4) == 0)
             return oneOf("defined(A)", "defined B || C", "!defined " + name(), "E");
         const std::string operand = macroName == "C" ? "C" : mayTest ? name() : macro();
         const std::string call = macroName == "C" ? "JOIN(V, AL)" : "F(" + macro() + ")";
         return oneOf("1", "(" + operand + ")", operand, "-" + operand, operand + " - 1", "C || " + operand,
-                     "C == " + operand, call, "(" + call + " + 1)", "JOIN(V, AL)", "V ## AL", constant);
+                     "C == " + operand, call, "(" + call + " + 1)");
     }
 
     /// What changes macros, or looks as if it did.
     std::string change() {
-        const std::string name = oneOf("A", "B", "C", "D", "E", "VAL");
+        const std::string name = oneOf("A", "B", "C", "D", "E", "VAL", "VAL", "VAL");
         const std::string pop = "pop_macro(\\\"" + name + "\\\")\")";
         switch (below(14)) {
         case 0:
@@ -194,8 +201,9 @@ private:
 
     std::mt19937_64& random_;
     bool plain_;
-    bool moves_ = below(4) == 0;          ///< macros hang on places
-    bool few_ = !plain_ && below(2) == 0; ///< conditions are about two of them
+    std::map<std::string, std::string> favourites_; ///< definitions that come again
+    bool moves_ = below(4) == 0;                    ///< macros hang on places
+    bool few_ = !plain_ && below(2) == 0;           ///< conditions are about two of them
 };
 
 /// The branches that are entered, for every definition.
