@@ -158,6 +158,11 @@ private:
     }
 
     std::string condition(std::size_t depth) {
+        if (depth == 2 && !plain_ && below(2) == 0) { // some come again
+            if (often_.size() < 4)
+                often_.push_back(below(2) == 0 ? atom() : derived[below(derived.size())]);
+            return often_[below(often_.size())];
+        }
         if (depth == 0 || below(3) == 0)
             return atom();
         if (below(4) == 0)
@@ -202,6 +207,7 @@ private:
     std::mt19937_64& random_;
     bool plain_;
     std::map<std::string, std::string> favourites_; ///< definitions that come again
+    std::vector<std::string> often_;                ///< conditions that do
     bool moves_ = below(4) == 0;                    ///< macros hang on places
     bool few_ = !plain_ && below(2) == 0;           ///< conditions are about two of them
 };
