@@ -4,6 +4,7 @@
 
 #include <gtest/gtest.h>
 
+#include <array>
 #include <map>
 #include <random>
 #include <set>
@@ -40,7 +41,10 @@ public:
             add("#define F(x) " + oneOf("x", "(x)", "x + 1", "x || C", "V%:%:x", "!x", "JOIN(V, AL)"));
             add("#define JOIN(a, b) JOINED(a, b)\n#define JOINED(a, b) a ## b");
             add("#define DO(x) _Pragma(#x)");
-            if (below(8) == 0)
+            for (const std::string& name : macros)
+                if (theme_ == Theme::Pops)
+                    add("#pragma push_macro(\"" + name + "\")\n#undef " + name + "\n#define " + name + " 1");
+            if (theme_ == Theme::Pops && below(2) == 0)
                 add("#define POP DO(pop_macro(\"" + macro() + "\"))");
             for (const std::string& name : derived) {
                 favourites_[name] = body(name);
@@ -93,9 +97,9 @@ private:
 
     /// What changes macros, or looks as if it did.
     std::string change() {
-        const std::string name = oneOf("A", "B", "C", "D", "E", "VAL", "VAL", "VAL");
+        const std::string name = oneOf(macro(), macro(), "D", "E", "VAL", "VAL");
         const std::string pop = "pop_macro(\\\"" + name + "\\\")\")";
-        switch (below(14)) {
+        switch (theme_ != Theme::None && below(2) == 0 ? static_cast<std::size_t>(theme_) - below(3) : below(15)) {
         case 0:
             return "#undef " + name;
         case 1:
@@ -118,12 +122,12 @@ private:
         case 10:
             return below(2) == 0 ? "POP" : "DO(pop_macro(\"" + name + "\"))";
         case 11:
-            return oneOf("#define \u00e9 1", "#undef \\u00e9", "#undef " + name + "\u00a0");
+            return oneOf("#define \u00e9 1", "#undef \\u00e9", "#undef " + macro() + "\u00a0");
         case 12:
+        case 13:
             return oneOf("#assert m(x)", "#unassert m");
         default:
-            return oneOf("/*\n#undef " + name + " */", "s = '\"'; // \\\n#undef " + name,
-                         below(8) == 0 ? "?\?=undef A" : "");
+            return oneOf("/*\n#undef " + name + " */", "s = '\"'; // \\\n#undef " + name);
         }
     }
 
@@ -147,6 +151,8 @@ private:
         case 10:
             return oneOf("F(" + macro() + ")", "F(AL)", "JOIN(V, AL)") + oneOf("", " " + op + " 1");
         case 11:
+            if (theme_ == Theme::Odd)
+                return oneOf("#m(x)", "defined \u00e9", "defined(\\u00e9)");
             return oneOf("__has_include(<no//t.h>)", "__has_include ( <header//.h> )", "#m(x)", "defined \u00e9",
                          "defined(\\u00e9)", "not -" + name());
         case 12:
@@ -159,6 +165,8 @@ private:
 
     std::string condition(std::size_t depth) {
         if (depth == 2 && !plain_ && below(2) == 0) { // some come again
+            if (often_.empty() && theme_ == Theme::Odd)
+                often_.push_back(oneOf("#m(x)", "defined \u00e9"));
             if (often_.size() < 4)
                 often_.push_back(below(2) == 0 ? atom() : derived[below(derived.size())]);
             return often_[below(often_.size())];
@@ -187,7 +195,7 @@ private:
         add("@" + std::to_string(number));
         for (std::size_t i = below(depth == 0 ? 3 : 2); i > 0 && depth < 3; --i) {
             if (!plain_ && below(3) == 0)
-                add(change());
+                add(below(60) == 0 ? "?\?=undef " + macro() : change());
             addChain(number, depth + 1);
         }
     }
@@ -208,8 +216,11 @@ private:
     bool plain_;
     std::map<std::string, std::string> favourites_; ///< definitions that come again
     std::vector<std::string> often_;                ///< conditions that do
-    bool moves_ = below(4) == 0;                    ///< macros hang on places
-    bool few_ = !plain_ && below(2) == 0;           ///< conditions are about two of them
+    /// What changes macros often, as the last of three kinds of changes.
+    enum class Theme : std::uint8_t { None = 0, Pops = 10, Odd = 13 };
+    Theme theme_ = plain_ ? Theme::None : std::array{Theme::None, Theme::Pops, Theme::Odd}[below(3)];
+    bool moves_ = below(4) == 0;          ///< macros hang on places
+    bool few_ = !plain_ && below(2) == 0; ///< conditions are about two of them
 };
 
 /// The branches that are entered, for every definition.
