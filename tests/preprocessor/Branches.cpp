@@ -41,10 +41,7 @@ public:
             add("#define F(x) " + oneOf("x", "(x)", "x + 1", "x || C", "V%:%:x", "!x", "JOIN(V, AL)"));
             add("#define JOIN(a, b) JOINED(a, b)\n#define JOINED(a, b) a ## b");
             add("#define DO(x) _Pragma(#x)");
-            for (const std::string& name : macros)
-                if (theme_ == Theme::Pops)
-                    add("#pragma push_macro(\"" + name + "\")\n#undef " + name + "\n#define " + name + " 1");
-            if (theme_ == Theme::Pops && below(2) == 0)
+            if (theme_ == Theme::Pops && below(4) == 0)
                 add("#define POP DO(pop_macro(\"" + macro() + "\"))");
             for (const std::string& name : derived) {
                 favourites_[name] = body(name);
@@ -120,7 +117,7 @@ private:
         case 9:
             return "_Pra\\\ngma\n(\"" + pop;
         case 10:
-            return below(2) == 0 ? "POP" : "DO(pop_macro(\"" + name + "\"))";
+            return text.find("define POP") != std::string::npos ? "POP" : "DO(pop_macro(\"" + macro() + "\"))";
         case 11:
             return oneOf("#define \u00e9 1", "#undef \\u00e9", "#undef " + macro() + "\u00a0");
         case 12:
@@ -154,7 +151,7 @@ private:
             if (theme_ == Theme::Odd)
                 return oneOf("#m(x)", "defined \u00e9", "defined(\\u00e9)");
             return oneOf("__has_include(<no//t.h>)", "__has_include ( <header//.h> )", "#m(x)", "defined \u00e9",
-                         "defined(\\u00e9)", "not -" + name());
+                         "defined(\\u00e9)", "not -" + macro(), "-" + macro());
         case 12:
             return derived[below(derived.size())] + op + "1";
         default:
@@ -167,6 +164,8 @@ private:
         if (depth == 2 && !plain_ && below(2) == 0) { // some come again
             if (often_.empty() && theme_ == Theme::Odd)
                 often_.push_back(oneOf("#m(x)", "defined \u00e9"));
+            if (often_.empty() && theme_ == Theme::None && below(4) == 0)
+                often_ = {"not -A", "-A"};
             if (often_.size() < 4)
                 often_.push_back(below(2) == 0 ? atom() : derived[below(derived.size())]);
             return often_[below(often_.size())];
@@ -225,12 +224,25 @@ private:
 
 /// The branches that are entered, for every definition.
 std::vector<std::set<int>> entered(std::string text, const Values& values) {
-    std::string begin; // leaves nothing of the definition before
+    const auto pragma = [](const std::string& what, const std::string& name) {
+        return "#pragma " + what + "_macro(\"" + name + "\")\n";
+    };
+    std::size_t pushed = 2;
+    for (std::size_t at = 0; (at = text.find("push_macro", at)) != std::string::npos; ++at)
+        ++pushed;
+    std::string begin; // leaves nothing of the definition before, and something to pop
     for (const std::string& name : defined) {
-        for (std::size_t at = text.find("push_macro"); at != std::string::npos; at = text.find("push_macro", at + 1))
-            begin += "#pragma pop_macro(\"" + name + "\")\n";
+        for (std::size_t i = 0; i < pushed; ++i)
+            begin += pragma("pop", name);
         begin += "#undef " + name + "\n";
     }
+    for (const std::string& name : macros)
+        for (const char* const value : {" 1\n", " 0\n"})
+            begin.append("#define ")
+                .append(name)
+                .append(value)
+                .append(pragma("push", name))
+                .append("#undef " + name + "\n");
     begin += "#unassert m\n";
     for (const std::string import : {"export import", "import"}) // of a header: its macros are those of an #include
         for (std::size_t at = 0; (at = text.find("\n" + import, at)) != std::string::npos;)
