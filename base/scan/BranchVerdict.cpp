@@ -1,6 +1,7 @@
 #include "base/scan/BranchVerdict.hpp"
 
 #include "base/core/Limits.hpp"
+#include "base/core/Walk.hpp"
 #include "base/service/ImpliedCondition.hpp"
 
 #include <boost/container_hash/hash.hpp>
@@ -85,10 +86,11 @@ SymbolicExprId BranchJudge::shortened(SymbolicExprId condition, SymbolicExprId k
     const auto isEqual = [&](SymbolicExprId candidate) {
         return holds({BranchVerdictKind::Removable, candidate}, condition, known);
     };
-    const std::size_t nodes = table_.size();
-    const SymbolicExprId shorter = ImpliedCondition(table_, printer_, known, isEqual).shorten(condition);
-    charge(table_.size() - nodes);
-    return shorter;
+    std::uint64_t nodes = 0; // what is tried is made of them, at most each time with one of them left out
+    walkDistinct(
+        table_, condition, [&](SymbolicExprId, const SymbolicExpr&) { ++nodes; }, [](SymbolicExprId) {});
+    charge(std::min<std::uint64_t>(nodes * nodes, limits::impliedNodes));
+    return ImpliedCondition(table_, printer_, known, isEqual).shorten(condition);
 }
 
 bool BranchJudge::beginBranch() noexcept {

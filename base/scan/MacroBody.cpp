@@ -73,8 +73,23 @@ bool variesByItself(std::string_view name) {
 }
 
 bool isOddName(const DirectiveToken& token) {
-    const auto isOdd = [](char c) { return static_cast<unsigned char>(c) >= 0x80; };
-    return token.text == "\\" || (token.kind == DirectiveTokenKind::Name && std::ranges::any_of(token.text, isOdd));
+    if (token.text == "\\")
+        return true;
+    if (token.kind != DirectiveTokenKind::Name)
+        return false;
+    const std::string_view text = token.text;
+    for (std::size_t i = 0; i < text.size(); ++i) {
+        const auto lead = static_cast<unsigned char>(text[i]);
+        if (lead < 0x80)
+            continue;
+        const unsigned next = ++i < text.size() ? static_cast<unsigned char>(text[i]) : 0U;
+        const unsigned letter = (lead & 0x1FU) << 6U | (next & 0x3FU);
+        const bool isLatin = letter >= 0xC0 && letter < 0x250 && letter != 0xD7 && letter != 0xF7;
+        const bool isCyrillic = letter >= 0x400 && letter < 0x482;
+        if ((lead & 0xE0U) != 0xC0U || (next & 0xC0U) != 0x80U || !(isLatin || isCyrillic))
+            return true;
+    }
+    return false;
 }
 
 MacroBody readMacroBody(Tokens definition) {

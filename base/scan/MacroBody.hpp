@@ -29,7 +29,7 @@ struct MacroBody {
 [[nodiscard]] bool variesByItself(std::string_view name);
 
 /// Whether a token is part of a name that may be spelled, or cut, in another way: a universal character name, or
-/// characters beyond ASCII, some of which are part of a name for one compiler only.
+/// characters beyond ASCII other than Latin and Cyrillic letters, some of which are letters for one compiler only.
 [[nodiscard]] bool isOddName(const DirectiveToken& token);
 
 /// Whether a pragma, given by its tokens or those of an operator with its text, may change macros.

@@ -245,10 +245,8 @@ bool FileScan::isSingle(SymbolicExprId condition) const {
 }
 
 void FileScan::judgeBranch(const Directive& directive, const DirectiveCondition& condition) {
-    if (!judge_.beginBranch())
-        return;
     const std::vector<std::size_t> related = context_.related(condition);
-    if (related.empty() && isSingle(condition.node))
+    if ((related.empty() && isSingle(condition.node)) || !judge_.beginBranch())
         return;
     BranchContext::Laws laws = context_.laws(condition, related);
     KnownConditions known{{}, std::move(laws.states), std::move(laws.undefined)};
