@@ -27,6 +27,7 @@
 #include "base/simplify/VCCustomizer.hpp"
 #include "base/transform/Cast2Int.hpp"
 #include "base/transform/Copy.hpp"
+#include "base/transform/DimensionLists.hpp"
 #include "base/transform/FactorDivision.hpp"
 #include "base/transform/QuillConversion.hpp"
 #include "base/transform/Replacement.hpp"

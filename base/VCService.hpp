@@ -2,7 +2,9 @@
 // and prints them.
 #pragma once
 
+#include "base/core/Limits.hpp"
 #include "base/decide/Decision.hpp"
+#include "base/service/ShortForm.hpp"
 #include "base/service/VCServiceHandle.hpp"
 #include "base/service/VCSymbolicExprId.hpp"
 #include "base/service/VCSymbols.hpp"
@@ -18,6 +20,7 @@ namespace VT {
 
 class SymbolicExprSimplify;
 class SymbolicExprTable;
+class SymbolRegistry;
 enum class PairQuestion : std::uint8_t;
 struct ServiceParts;
 
@@ -106,8 +109,12 @@ public:
     bool isEqual(const SymbolicExprId& a, const SymbolicExprId& b);
     /// The alias of a parameter, or the empty text.
     [[nodiscard]] std::string getParameterAlias(const std::string& parameter) const;
-    /// Records an alias of a parameter; the first alias stays.
+    /// Records an alias of a parameter, that of a negative literal in parentheses; the first alias stays.
     void addParameterAlias(const std::string& parameter, const std::string& alias);
+    /// Records for each parameter of a block's condition what a customizer puts in its place there
+    /// (VCCustomizer::parameterOfBlock), as above.  Records nothing for nullptr, for a parameter that stays, and for an
+    /// identifier that is not of the table.
+    void addParameterAlias(const VTBlock* block, SymbolicExprId condition, const VCCustomizer* customizer);
 
     /// Appends the symbols of the kinds asked for, as Quill text or as identifiers.  Throws std::out_of_range for a
     /// kind that is none.
@@ -128,13 +135,16 @@ public:
     /// Where a block is active: the And of its own condition and those of its ancestors.  Where the signal of a port
     /// flows: where its source is active, and one of its destinations.  With `simplify` as when combining; the invalid
     /// identifier for nullptr.  Each call reads the conditions anew; BlockConditions reads many blocks' once.
-    VCSymbolicExprId getQExprNetAAVCEIdx(const VTBlock* block, bool simplify);
-    VCSymbolicExprId getQExprNetAAVCEIdx(const vtPort* port, bool simplify);
+    ///
+    /// A customizer says what the parameters of each block's own condition stand for (VCCustomizer::parameterOfBlock).
+    /// It need not be the one that is installed, which alone has a say in simplification.
+    VCSymbolicExprId getQExprNetAAVCEIdx(const VTBlock* block, bool simplify, const VCCustomizer* customizer = nullptr);
+    VCSymbolicExprId getQExprNetAAVCEIdx(const vtPort* port, bool simplify, const VCCustomizer* customizer = nullptr);
     /// The same as Quill text and as C text.
-    std::string getQExprNetAAVCEString(const VTBlock* block, bool simplify);
-    std::string getQExprNetAAVCEString(const vtPort* port, bool simplify);
-    std::string getCExprNetAAVCEString(const VTBlock* block, bool simplify);
-    std::string getCExprNetAAVCEString(const vtPort* port, bool simplify);
+    std::string getQExprNetAAVCEString(const VTBlock* block, bool simplify, const VCCustomizer* customizer = nullptr);
+    std::string getQExprNetAAVCEString(const vtPort* port, bool simplify, const VCCustomizer* customizer = nullptr);
+    std::string getCExprNetAAVCEString(const VTBlock* block, bool simplify, const VCCustomizer* customizer = nullptr);
+    std::string getCExprNetAAVCEString(const vtPort* port, bool simplify, const VCCustomizer* customizer = nullptr);
 
     // Deciding.  Answers are exact over the integers, without bounds unless asked for, or "undecided" with the bound
     // that was hit, and come with a witness where one assignment proves them; see Decision.hpp.  Operators that Quill
@@ -171,10 +181,22 @@ public:
     /// A product of such a sum as a set of factors: the operands of its And.  TRUE is the empty product.
     std::vector<VCSymbolicExprId> computeUniqueAndOperandsId(const VCSymbolicExprId& condition);
 
-    /// The shortest condition found that equals the given one wherever the known one holds; equality is proven.  TRUE
-    /// where the known one implies it, FALSE where they are disjoint; any other result is in print no longer than the
-    /// given condition, which comes back where nothing shorter was found.
-    VCSymbolicExprId getImpliedCondition(const VCSymbolicExprId& condition, const VCSymbolicExprId& known);
+    // Shorter conditions.  Lengths are those of printQExpr in Quill and of printCExpr in C, where the result has C
+    // shape.  The search takes at most limits::shortenWork and its proofs limits::shortenSteps together; beyond these
+    // bounds the shortest form proven so far is returned.
+
+    /// The shortest form found that is proven equal to a condition for all assignments: the fewest comparisons and
+    /// other truth values, and of those forms the fewest bytes.  Never longer than the condition, which comes back
+    /// where nothing better is proven; TRUE and FALSE are the shortest of all.  A root that is no truth value, as in
+    /// `2+3` or `N`, is a number: it is simplified where that makes it no longer, and keeps its value.
+    ///
+    /// `forms` receives the forms that were looked at on the way, the shortest first; none for numbers.
+    VCSymbolicExprId shortestCondition(const VCSymbolicExprId& condition, bool isQuill,
+                                       std::vector<ShortForm>* forms = nullptr);
+    /// The shortest form found that is proven equal to a condition wherever the known one holds.  TRUE where the known
+    /// one implies it, FALSE where they are disjoint, and otherwise as shortestCondition().
+    VCSymbolicExprId getImpliedCondition(const VCSymbolicExprId& condition, const VCSymbolicExprId& known,
+                                         bool isQuill = false);
 
     /// A witness as text: "A=3, B=0".
     std::string printWitness(const Witness& witness);
@@ -193,6 +215,10 @@ public:
     Decision isTighterThanFromQConditions(const std::string& a, const std::string& b);
     SetDecision coversFromCConditions(const std::vector<std::string>& conditions);
     SetDecision coversFromQConditions(const std::vector<std::string>& conditions);
+    std::string shortestCExprFromCCondition(const std::string& text);
+    std::string shortestQExprFromCCondition(const std::string& text);
+    std::string shortestCExprFromQCondition(const std::string& text);
+    std::string shortestQExprFromQCondition(const std::string& text);
     std::string getImpliedCExprFromCConditions(const std::string& condition, const std::string& known);
     std::string getImpliedQExprFromQConditions(const std::string& condition, const std::string& known);
     std::vector<std::string> computeUniqueAndOperandsFromCCondition(const std::string& condition);
@@ -204,6 +230,11 @@ public:
 
     [[nodiscard]] SymbolicExprTable& table() noexcept;
     [[nodiscard]] SymbolicExprSimplify& simplifier() noexcept;
+    /// The names that dimension expressions of blocks have in the service's table.
+    [[nodiscard]] SymbolRegistry& symbolRegistry() noexcept;
+    /// Whether "(sim)" and "(codegen)" are keywords: the feature "VariantKeywordsSimCodegen" was on when the service
+    /// was made, and is.
+    [[nodiscard]] bool areVariantKeywordsInForce() const;
 
 private:
     friend class VCServiceHandle;
@@ -216,9 +247,9 @@ private:
     VCSymbolicExprId simplifyFrom(const std::string& text, bool isQuill);
     std::string printIn(bool quill, SymbolicExprId condition, bool wasQuill);
     VCSymbolicExprId combined(SymbolicExprId condition, bool simplify);
-    SymbolicExprId replaceParameters(SymbolicExprId condition, const ParameterReplacements& parameters);
     SymbolicExprId rewritten(SymbolicExprId condition);
-    Decision ask(PairQuestion question, const VCSymbolicExprId& a, const VCSymbolicExprId& b);
+    Decision ask(PairQuestion question, const VCSymbolicExprId& a, const VCSymbolicExprId& b,
+                 std::uint64_t steps = limits::decisionSteps);
     std::vector<VCSymbolicExprId> uniqueOperands(const VCSymbolicExprId& condition, bool ofAnd);
     std::vector<VCSymbolicExprId> parseAll(const std::vector<std::string>& texts, bool isQuill);
     std::vector<std::string> operandTexts(const std::string& condition, bool ofAnd, bool isQuill);

@@ -58,6 +58,14 @@ std::string deepNest(std::int64_t branches) {
     return text;
 }
 
+/// A macro and a constant for each branch, every macro between two that are there.
+std::string distinctMacros(std::int64_t branches) {
+    std::string text = "#ifdef MACRO_Z\n";
+    for (std::int64_t i = 0; i < branches; ++i)
+        text += "#if MACRO_" + std::to_string(branches + i) + " > " + std::to_string(i) + " && MACRO_Z\n#endif\n";
+    return text;
+}
+
 template <MakeText Make>
 void scanLibrary(benchmark::State& state, std::int64_t branches) {
     const std::string text = Make(branches);
@@ -100,6 +108,8 @@ const bool registered = [] {
         add<longChain>(" of one chain", branches);
         add<deepNest>(" within each other", branches);
     }
+    for (const std::int64_t branches : {10000, 100000})
+        add<distinctMacros>(" of distinct macros", branches);
     return true;
 }();
 

@@ -1,4 +1,5 @@
 // Simplification, conversion and copies beside the least that any of them does: one walk that interns each node again.
+#include "base/VCService.hpp"
 #include "base/core/Nodes.hpp"
 #include "base/simplify/Simplify.hpp"
 #include "base/transform/QuillConversion.hpp"
@@ -212,7 +213,41 @@ void corpusFloor(benchmark::State& state, std::int64_t) {
         });
 }
 
+/// The corpus in a service of its own.
+struct ServiceCorpus {
+    ServiceCorpus() {
+        for (const std::string& line : readableLines())
+            ids.push_back(service->parseC(line));
+    }
+
+    VCServiceHandle service;
+    std::vector<SymbolicExprId> ids;
+};
+
+void shortestLibrary(benchmark::State& state, std::int64_t) {
+    measure(
+        state, [] { return std::make_unique<ServiceCorpus>(); },
+        [](auto& corpus) {
+            for (const SymbolicExprId id : corpus->ids)
+                benchmark::DoNotOptimize(corpus->service->shortestCondition(id, false));
+        });
+}
+
+void shortestFloor(benchmark::State& state, std::int64_t) {
+    measure(
+        state, [] { return std::make_unique<ServiceCorpus>(); },
+        [](auto& corpus) {
+            for (const SymbolicExprId id : corpus->ids)
+                benchmark::DoNotOptimize(corpus->service->simplify(id, false));
+        });
+}
+
 const bool registered = [] {
+    compare({.name = "shortest forms of the corpus (floor: its normal forms)",
+             .library = shortestLibrary,
+             .floor = shortestFloor,
+             .items = static_cast<double>(readableLines().size()),
+             .unit = "line"});
     compare({.name = "simplify the corpus (floor: read it)",
              .library = corpusLibrary,
              .floor = corpusFloor,

@@ -4,8 +4,18 @@
 
 namespace {
 
-/// Bytes of the UTF-8 character at the front of the text that can be shown as it is; 0 where there is none.
-std::size_t plainCharacter(std::string_view text) {
+/// Controls, and what has no width or changes the direction of the text around it.
+bool isInvisible(char32_t point) {
+    const auto in = [point](char32_t first, char32_t last) { return point >= first && point <= last; };
+    return in(0x80, 0x9f) || point == 0xad || point == 0x61c || point == 0x180e || in(0x200b, 0x200f) ||
+           in(0x2028, 0x202e) || in(0x2060, 0x206f) || point == 0xfeff || in(0xfff9, 0xfffb) || in(0xe0000, 0xe007f);
+}
+
+} // namespace
+
+std::size_t VT::plainCharacter(std::string_view text) {
+    if (text.empty())
+        return 0;
     const auto byte = [&text](std::size_t at) { return static_cast<unsigned char>(text[at]); };
     if (byte(0) < 0x80)
         return byte(0) >= 0x20 && byte(0) != 0x7f ? 1 : 0;
@@ -18,14 +28,10 @@ std::size_t plainCharacter(std::string_view text) {
             return 0;
         point = point << 6U | (byte(at) & 0x3fU);
     }
-    const auto in = [point](char32_t first, char32_t last) { return point >= first && point <= last; };
     const bool overlong = (length == 3 && point < 0x800) || (length == 4 && point < 0x10000);
-    const bool invisible =
-        in(0x80, 0x9f) || in(0x200b, 0x200f) || in(0x2028, 0x202e) || in(0x2066, 0x2069) || point == 0xfeff;
-    return overlong || in(0xd800, 0xdfff) || point > 0x10ffff || invisible ? 0 : length;
+    const bool surrogate = point >= 0xd800 && point <= 0xdfff;
+    return overlong || surrogate || point > 0x10ffff || isInvisible(point) ? 0 : length;
 }
-
-} // namespace
 
 std::string VT::shownText(std::string_view text, std::size_t bound) {
     constexpr std::string_view digits = "0123456789abcdef";

@@ -4,6 +4,8 @@
 #include "base/core/Limits.hpp"
 #include "base/variants/VariantKeywords.hpp"
 #include "host/Numbers.hpp"
+#include "parser/StrictRealPolicies.hpp"
+#include "parser/SyntaxActions.hpp"
 
 #include <boost/spirit/include/phoenix_core.hpp>
 #include <boost/spirit/include/phoenix_operator.hpp>
@@ -35,27 +37,49 @@ struct Reading {
     }
 };
 
-/// An infix operator with its binding strength: a smaller number binds tighter.
+/// An infix operator: its binding strength, of which a smaller number binds tighter, and what its operands become.
 struct Infix {
-    SymbolicOp op = SymbolicOp::None;
     std::uint8_t precedence = 0;
+    expression_ast (*combine)(SyntaxArena& arena, const expression_ast& left, const expression_ast& right) = nullptr;
 };
 
-constexpr Infix infixOf(SymbolicOp op) {
-    return {op, operatorInfo(op).precedence};
-}
+struct InfixRow {
+    SymbolicOp op;
+    Infix infix;
+};
+
+template <SymbolicOp Op, class Action = binary_expr<Op>>
+constexpr InfixRow infix{
+    Op, {operatorInfo(Op).precedence, [](SyntaxArena& arena, const expression_ast& left, const expression_ast& right) {
+             return Action()(arena, left, right);
+         }}};
 
 /// The infix operators of the grammar.  Their spellings and strengths are those of the operator table.
-constexpr auto infixOperators = std::to_array<SymbolicOp>(
-    {SymbolicOp::Or, SymbolicOp::And, SymbolicOp::BitOr, SymbolicOp::BitXOr, SymbolicOp::BitAnd, SymbolicOp::Equal,
-     SymbolicOp::NotEqual, SymbolicOp::LessThanEqual, SymbolicOp::LessThan, SymbolicOp::GreaterThanEqual,
-     SymbolicOp::GreaterThan, SymbolicOp::ShiftRight, SymbolicOp::ShiftLeft, SymbolicOp::Plus, SymbolicOp::Minus,
-     SymbolicOp::Multiply, SymbolicOp::Divide, SymbolicOp::Modulo});
+constexpr auto infixOperators = std::to_array<InfixRow>({
+    infix<SymbolicOp::Or>,
+    infix<SymbolicOp::And>,
+    infix<SymbolicOp::BitOr>,
+    infix<SymbolicOp::BitXOr>,
+    infix<SymbolicOp::BitAnd>,
+    infix<SymbolicOp::Equal>,
+    infix<SymbolicOp::NotEqual>,
+    infix<SymbolicOp::LessThanEqual>,
+    infix<SymbolicOp::LessThan>,
+    infix<SymbolicOp::GreaterThanEqual>,
+    infix<SymbolicOp::GreaterThan>,
+    infix<SymbolicOp::ShiftRight>,
+    infix<SymbolicOp::ShiftLeft>,
+    infix<SymbolicOp::Plus>,
+    infix<SymbolicOp::Minus>,
+    infix<SymbolicOp::Multiply>,
+    infix<SymbolicOp::Divide>,
+    infix<SymbolicOp::Modulo, modulo_expr>,
+});
 
 constexpr std::size_t countPrecedences() {
     std::uint64_t seen = 0;
-    for (const SymbolicOp op : infixOperators)
-        seen |= std::uint64_t{1} << operatorInfo(op).precedence;
+    for (const InfixRow& row : infixOperators)
+        seen |= std::uint64_t{1} << row.infix.precedence;
     return static_cast<std::size_t>(std::popcount(seen));
 }
 
@@ -85,7 +109,7 @@ private:
     void foldUpTo(SyntaxArena& arena, std::uint8_t precedence) {
         for (; waiting_ > 0 && operators_[waiting_ - 1].precedence <= precedence; --waiting_)
             operands_[waiting_ - 1] =
-                arena.binary(operators_[waiting_ - 1].op, operands_[waiting_ - 1], operands_[waiting_]);
+                operators_[waiting_ - 1].combine(arena, operands_[waiting_ - 1], operands_[waiting_]);
     }
 
     std::array<expression_ast, levels + 1> operands_;
@@ -145,19 +169,22 @@ struct apply_prefixes {
     void operator()(const Attribute& pair, Context& context, bool&) const {
         expression_ast value = fusion::at_c<1>(pair);
         const std::string_view prefixes = textOf(fusion::at_c<0>(pair));
-        for (std::size_t i = prefixes.size(); i-- > 0;) {
-            const SymbolicOp op = operatorOf(prefixes[i]);
-            if (op != SymbolicOp::None)
-                value = readingOf(context).arena.unary(op, value);
-        }
+        for (std::size_t i = prefixes.size(); i-- > 0;)
+            value = apply(prefixes[i], readingOf(context).arena, value);
         valueOf(context) = value;
     }
 
-    static SymbolicOp operatorOf(char prefix) {
-        return prefix == '-'   ? SymbolicOp::UnaryMinus
-               : prefix == '!' ? SymbolicOp::Not
-               : prefix == '~' ? SymbolicOp::BitCompl
-                               : SymbolicOp::None; // a plus changes nothing, nor does a blank
+    static expression_ast apply(char prefix, SyntaxArena& arena, const expression_ast& operand) {
+        switch (prefix) {
+        case '-':
+            return negate_expr()(arena, operand);
+        case '!':
+            return not_expr()(arena, operand);
+        case '~':
+            return cmp_expr()(arena, operand);
+        default: // a plus changes nothing, nor does a blank
+            return operand;
+        }
     }
 };
 
@@ -206,27 +233,22 @@ struct store_real {
     }
 };
 
-struct member_val {
-    template <class Context>
-    void operator()(const Range& name, Context& context, bool&) const {
-        expression_ast& value = valueOf(context);
-        value = readingOf(context).arena.binary(SymbolicOp::MemberValue, value, textOf(name));
-    }
-};
-
-struct void_fcn_call_expr {
+/// Makes more of the value that was read before: of a name a call or a member.
+template <class Action>
+struct extend_value {
     template <class Context>
     void operator()(qi::unused_type, Context& context, bool&) const {
-        expression_ast& value = valueOf(context);
-        value = readingOf(context).arena.unary(SymbolicOp::FcnCall0U, value);
+        valueOf(context) = Action()(readingOf(context).arena, valueOf(context));
     }
-};
 
-struct fcn_call_expr {
+    template <class Context>
+    void operator()(const Range& name, Context& context, bool&) const {
+        valueOf(context) = Action()(readingOf(context).arena, valueOf(context), textOf(name));
+    }
+
     template <class Context>
     void operator()(const expression_list* arguments, Context& context, bool&) const {
-        expression_ast& value = valueOf(context);
-        value = readingOf(context).arena.binary(SymbolicOp::FcnCall2U, value, arguments);
+        valueOf(context) = Action()(readingOf(context).arena, valueOf(context), arguments);
     }
 };
 
@@ -281,15 +303,14 @@ ConditionGrammar::ConditionGrammar(const GrammarOptions& options) {
     const std::string simKeyword = VariantKeywords::getSimVariantKeyword();
     const std::string codegenKeyword = VariantKeywords::getCodegenVariantKeyword();
 
-    for (const SymbolicOp op : infixOperators)
-        infix_.add(std::string(operatorInfo(op).c), infixOf(op));
+    for (const InfixRow& row : infixOperators)
+        infix_.add(std::string(operatorInfo(row.op).c), row.infix);
     if (!options.cOperators)
-        infix_.add(std::string(operatorInfo(SymbolicOp::NotEqual).quill), infixOf(SymbolicOp::NotEqual));
+        infix_.add(std::string(operatorInfo(SymbolicOp::NotEqual).quill), infix<SymbolicOp::NotEqual>.infix);
 
     const auto identifier = qi::copy(raw[lexeme[(alpha | char_('_')) >> *(alnum | char_('_'))]]);
     const auto sign = qi::copy(char_("+-"));
-    const auto real =
-        qi::copy(raw[lexeme[-sign >> (+digit >> '.' >> *digit | '.' >> +digit) >> -(char_("eE") >> -sign >> +digit)]]);
+    const auto real = qi::copy(raw[qi::real_parser<double, strict_real_policies<double>>()]);
     const auto integerOutOfRange = qi::copy(omit[lexeme[-sign >> raw[digit][refuse()]]]);
     // A sign directly before a number belongs to the number.
     const auto prefix = qi::copy(lexeme[char_("!~") | sign >> !(-lit('.') >> digit)]);
@@ -303,9 +324,9 @@ ConditionGrammar::ConditionGrammar(const GrammarOptions& options) {
         operand_(_r1, _r2)[store_value()] | (raw[repeat(std::size_t{1}, limits::nesting)[prefix]] >>
                                              !omit[raw[prefix][refuse()]] >> operand_(_r1, _r2))[apply_prefixes()];
 
-    const auto call =
-        qi::copy(open('(') >> (lit(')')[void_fcn_call_expr()] | (elements_(_r1, inBrackets) >> ')')[fcn_call_expr()]));
-    const auto members = qi::copy(+('.' >> identifier[member_val()]));
+    const auto call = qi::copy(open('(') >> (lit(')')[extend_value<void_fcn_call_expr>()] |
+                                             (elements_(_r1, inBrackets) >> ')')[extend_value<fcn_call_expr>()]));
+    const auto members = qi::copy(+('.' >> identifier[extend_value<member_val>()]));
     const auto keyword = qi::copy(raw[lit(simKeyword) | lit(codegenKeyword)]);
 
     operand_ = identifier[store_text()] >> -(call | members)                       //

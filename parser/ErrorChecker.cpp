@@ -45,6 +45,10 @@ std::size_t VTSymbolicExprErrorChecker::getNodeStartIdx(const ParseTree& node) c
 
 void VTSymbolicExprErrorChecker::startText() {}
 
+std::string VTSymbolicExprErrorChecker::wholeText(const char* text) const {
+    return text == text_.data() ? std::string(text_) : std::string(text);
+}
+
 void VTSymbolicExprErrorChecker::collect(std::string_view key, std::vector<DiagnosticArgument> arguments,
                                          std::size_t position, std::string additionalText) {
     if (!skip_)
@@ -53,7 +57,7 @@ void VTSymbolicExprErrorChecker::collect(std::string_view key, std::vector<Diagn
 
 void VTSymbolicExprErrorChecker::collectNamed(std::string_view key, std::string name, const char* text,
                                               std::size_t position) {
-    collect(key, {std::move(name), std::string(text)}, position);
+    collect(key, {std::move(name), wholeText(text)}, position);
 }
 
 void VTSymbolicExprErrorChecker::reportInvalidLiteralValue(const std::string& literal, const char* text,
@@ -98,7 +102,7 @@ void VTSymbolicExprErrorChecker::reportUnhandledExpr(const ParseTree& node, cons
 }
 
 void VTSymbolicExprErrorChecker::reportDivisionExpr(const ParseTree& node, const char* text) {
-    collect("UnsupportedDivision", {std::string(text)}, getNodeStartIdx(node));
+    collect("UnsupportedDivision", {wholeText(text)}, getNodeStartIdx(node));
 }
 
 void VTSymbolicExprErrorChecker::reportUnsupportedFcn(SymbolicExprId, const ParseTree& node, const char* text) {
@@ -112,13 +116,13 @@ void VTSymbolicExprErrorChecker::reportInvalidNumArgs(SymbolicExprId, std::size_
     const std::size_t position = getNodeStartIdx(node);
     diagnostics_.push_back(
         vtsvCreateDiagnostic("Vantor:SymbolicDims:InvalidNumFcnArgs",
-                             {nameOf(calleeOf(node)), std::string(text), static_cast<std::int64_t>(position),
+                             {nameOf(calleeOf(node)), wholeText(text), static_cast<std::int64_t>(position),
                               static_cast<std::int64_t>(expected), static_cast<std::int64_t>(actual)},
                              {}, position));
 }
 
 void VTSymbolicExprErrorChecker::reportInvalidExpr(const char* text, const QuillFailure& failure) {
-    collect("InvalidExpression", {std::string(text)}, failure.position, sentenceOf(failure));
+    collect("InvalidExpression", {wholeText(text)}, failure.position, sentenceOf(failure));
 }
 
 void VTSymbolicExprErrorCheckerBlockVariants::startText() {

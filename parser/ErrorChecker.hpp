@@ -42,6 +42,9 @@ public:
     [[nodiscard]] virtual std::size_t getNodeStartIdx(const ParseTree& node) const;
     /// A converter begins with another text.
     virtual void startText();
+    /// The whole of the text that a report is about, where it is the one that a converter is at: a NUL in it ends
+    /// nothing.
+    [[nodiscard]] std::string wholeText(const char* text) const;
 
     virtual void reportInvalidLiteralValue(const std::string& literal, const char* text, std::size_t position);
     virtual void reportNonScalarValue(const std::string& name, const char* text, std::size_t position);
@@ -65,11 +68,14 @@ public:
     virtual void reportInvalidExpr(const char* text, const QuillFailure& failure = {});
 
 private:
+    friend class SymbolicExprFromQParseTree;
+
     void collect(std::string_view key, std::vector<DiagnosticArgument> arguments, std::size_t position,
                  std::string additionalText = {});
     void collectNamed(std::string_view key, std::string name, const char* text, std::size_t position);
 
     std::vector<HostDiagnostic> diagnostics_;
+    std::string_view text_; ///< that a converter is at
     bool skip_ = false;
 };
 

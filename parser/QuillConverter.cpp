@@ -6,8 +6,11 @@
 #include "base/variants/VariantKeywords.hpp"
 #include "host/Text.hpp"
 #include "parser/ParseTreeDump.hpp"
+#include "parser/QuillNumber.hpp"
 
 #include <algorithm>
+#include <limits>
+#include <typeinfo>
 
 namespace VT {
 
@@ -27,6 +30,29 @@ std::size_t countOf(const ParseTree& node) {
     return node.kind == ParseTree::nonTerminal ? static_cast<std::size_t>(std::max(node.childCount, 0)) : 0;
 }
 
+constexpr double leastInteger = std::numeric_limits<std::int32_t>::min();
+
+/// Whether a node is a minus directly before the literal 2147483648.  They are one literal, for the number alone is no
+/// integer of 32 bits.
+bool isMinusLeast(const ParseTree& node) {
+    if (!isRule(node, QuillRule::UnaryMinus) && !isRule(node, QuillRule::UnaryMinus2))
+        return false;
+    if (countOf(node) < 2)
+        return false;
+    constexpr std::size_t fewestDigits = 10; // in decimal and, with 0x, in hexadecimal
+    const ParseTree& operand = SymbolicExprFromQParseTree::skipExprGoal(node.children[1]);
+    return isTerminal(operand, QuillToken::Number) && operand.length >= fewestDigits &&
+           quillNumber({operand.text, operand.length}).value == -leastInteger;
+}
+
+/// Whether a callee is more than a plain name, which may stand in parentheses.
+bool isFurtherCallee(const ParseTree& callee) {
+    const ParseTree* inner = &SymbolicExprFromQParseTree::skipExprGoal(callee);
+    while ((isRule(*inner, QuillRule::Parentheses) || isRule(*inner, QuillRule::Parentheses2)) && countOf(*inner) > 1)
+        inner = &SymbolicExprFromQParseTree::skipExprGoal(inner->children[1]);
+    return !isTerminal(*inner, QuillToken::Identifier);
+}
+
 /// Whether a name is that of a function which C has an operator for.
 bool isQuillCall(const SymbolicExpr* name) {
     return name != nullptr && name->op() == SymbolicOp::String && std::ranges::any_of(quillCalls, [&](SymbolicOp op) {
@@ -35,6 +61,29 @@ bool isQuillCall(const SymbolicExpr* name) {
 }
 
 } // namespace
+
+/// While a text is converted the checker knows all of it.
+class SymbolicExprFromQParseTree::TextInWork {
+public:
+    TextInWork(SymbolicExprFromQParseTree& self, std::string_view text)
+        : checker_(self.checker_),
+          outer_(self.checker_.text_) {
+        checker_.startText();
+        checker_.text_ = text;
+        self.earlierReports_ = checker_.diagnostics().size();
+        self.reportedPosition_ = 0;
+        self.failure_ = {};
+    }
+
+    TextInWork(const TextInWork&) = delete;
+    TextInWork& operator=(const TextInWork&) = delete;
+
+    ~TextInWork() { checker_.text_ = outer_; }
+
+private:
+    VTSymbolicExprErrorChecker& checker_;
+    std::string_view outer_;
+};
 
 /// Leaves the stacks as they were, however the conversion ends, and gives the memory of a huge one back.
 class SymbolicExprFromQParseTree::Unwind {
@@ -77,6 +126,14 @@ SymbolicExprFromQParseTree::SymbolicExprFromQParseTree(SymbolicExprTable& table,
 
 SymbolicExprFromQParseTree::~SymbolicExprFromQParseTree() = default;
 
+void SymbolicExprFromQParseTree::destroy() noexcept {
+    this->~SymbolicExprFromQParseTree();
+}
+
+void SymbolicExprFromQParseTree::destroyAndFree() noexcept {
+    delete this;
+}
+
 // Whole texts.
 
 SymbolicExprId SymbolicExprFromQParseTree::operator()(const char* text) {
@@ -101,7 +158,7 @@ SymbolicExprId SymbolicExprFromQParseTree::convert(const std::u16string& text, s
         if (isHigh(text[at]) && at + 1 < text.size() && isLow(text[at + 1])) {
             ++at;
         } else if (isHigh(text[at]) || isLow(text[at])) {
-            checker_.startText();
+            const TextInWork inWork(*this, converted);
             const std::size_t position = cvt_ustring_string(std::u16string_view(text).substr(0, at)).size();
             reportDiagnostic(symbolicDimsDiagnostic("NonASCIIText", {converted}, position));
             return invalidId;
@@ -112,9 +169,7 @@ SymbolicExprId SymbolicExprFromQParseTree::convert(const std::u16string& text, s
 }
 
 SymbolicExprId SymbolicExprFromQParseTree::convert(std::string_view text, const Request& request) {
-    checker_.startText();
-    reportedPosition_ = 0;
-    failure_ = {};
+    const TextInWork inWork(*this, text);
     Parser& parser = parserFor(request.variantKeywords);
     const auto free = [&parser](const ParseTree* tree) { parser.delete_parse_tree(tree); };
     const std::unique_ptr<const ParseTree, decltype(free)> tree(parser.generate_parse_tree(text.data(), text.size()),
@@ -136,8 +191,9 @@ SymbolicExprId SymbolicExprFromQParseTree::convert(std::string_view text, const 
     } else {
         id = visitNode(*tree, text.data());
     }
-    // Nothing but a call of one of those functions is said differently in C.
-    return id == invalidId || convertible_ == before ? id : SymbolicExprQ2C(table_)(id);
+    // Nothing but a call of one of those functions is said differently in C.  One that an override made is not counted.
+    const bool mayHoldCalls = convertible_ != before || typeid(*this) != *request.ownClass;
+    return id != invalidId && mayHoldCalls ? SymbolicExprQ2C(table_)(id) : id;
 }
 
 SymbolicExprFromQParseTree::Parser& SymbolicExprFromQParseTree::parserFor(bool variantKeywords) {
@@ -159,7 +215,10 @@ SymbolicExprId SymbolicExprFromQParseTree::visitNode(const ParseTree& node, cons
 }
 
 const ParseTree& SymbolicExprFromQParseTree::skipExprGoal(const ParseTree& node) {
-    return isRule(node, QuillRule::Root) && countOf(node) > 0 ? node.children[0] : node;
+    const ParseTree* goal = &node;
+    while (isRule(*goal, QuillRule::Root) && countOf(*goal) > 0)
+        goal = goal->children;
+    return *goal;
 }
 
 SymbolicExprId SymbolicExprFromQParseTree::enter(const ParseTree& node, const char* text) {
@@ -205,6 +264,9 @@ SymbolicExprId SymbolicExprFromQParseTree::afterOperands(const ParseTree& node, 
 }
 
 SymbolicExprId SymbolicExprFromQParseTree::afterOperands(const ParseTree& node, const Rule& rule, const char* text) {
+    if (isMinusLeast(node))
+        return getNumberFromValue(leastInteger, '-' + textOf(skipExprGoal(node.children[1])), text,
+                                  checker_.getNodeStartIdx(node), true);
     const std::size_t children = countOf(node);
     if (rule.count == allChildren)
         return afterOperands(node, {nullptr, node.children, static_cast<std::uint32_t>(children), 1}, rule.build);
@@ -254,7 +316,7 @@ SymbolicExprId SymbolicExprFromQParseTree::visitNonTerminal(const ParseTree& nod
     case QuillRule::Field:
         return visitMDot(node, text);
     case QuillRule::Call:
-        return visitCallNode(node, text);
+        return visitCallNode(node, text, false);
     default:
         return refuse(node, text);
     }
@@ -264,7 +326,8 @@ SymbolicExprId SymbolicExprFromQParseTree::visitNonTerminal(const ParseTree& nod
 
 SymbolicExprId SymbolicExprFromQParseTree::visitMatrixNode(const ParseTree& node, const char* text) {
     if (countOf(node) > 1) {
-        reportDiagnostic(symbolicDimsDiagnostic("NonVectorValue", {std::string(text)}, checker_.getNodeStartIdx(node)));
+        reportDiagnostic(
+            symbolicDimsDiagnostic("NonVectorValue", {checker_.wholeText(text)}, checker_.getNodeStartIdx(node)));
         return invalidId;
     }
     if (countOf(node) == 0)
@@ -281,7 +344,7 @@ SymbolicExprId SymbolicExprFromQParseTree::buildDimensions(SymbolicExprFromQPars
         const SymbolicExpr* const element = self.table_.get(operands[i]);
         if (element != nullptr && dimensionOps.contains(element->op())) {
             const std::size_t position = self.checker_.getNodeStartIdx(node.children[0].children[i]);
-            self.reportDiagnostic(symbolicDimsDiagnostic("NonVectorValue", {std::string(text)}, position));
+            self.reportDiagnostic(symbolicDimsDiagnostic("NonVectorValue", {self.checker_.wholeText(text)}, position));
             return invalidId;
         }
     }
@@ -315,12 +378,13 @@ SymbolicExprId SymbolicExprFromQParseTree::buildMember(SymbolicExprFromQParseTre
 
 // Calls.
 
-SymbolicExprId SymbolicExprFromQParseTree::visitCallNode(const ParseTree& node, const char* text) {
+SymbolicExprId SymbolicExprFromQParseTree::visitCallNode(const ParseTree& node, const char* text, bool furtherCallees) {
     if (countOf(node) < 3 || node.children[2].kind == ParseTree::terminal)
         return refuse(node, text);
     const SymbolicExprId name = getFunctionNameSymId(node.children[0], text);
     if (name == invalidId)
-        return refuse(node, text);
+        return furtherCallees && isFurtherCallee(node.children[0]) ? afterArguments(node, invalidId)
+                                                                   : refuse(node, text);
     if (!supportFcn(name, countOf(node.children[2]), node, text))
         return invalidId;
     return afterArguments(node, name);

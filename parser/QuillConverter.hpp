@@ -14,6 +14,7 @@
 #include <span>
 #include <string>
 #include <string_view>
+#include <typeinfo>
 #include <utility>
 #include <vector>
 
@@ -24,7 +25,7 @@ namespace VT {
 ///
 /// Welcome are names, numbers, the operators + - * / && || ~ and the comparisons, fields, lists of one row, and calls
 /// of idivide, rem, bitand, bitor, bitxor, bitcmp and bitshift with their number of arguments.  Every literal is a real
-/// number.  Names are given to the symbol validator.
+/// number, and a minus directly before 2147483648 belongs to it.  Names are given to the symbol validator.
 ///
 /// Anything else makes the invalid identifier and one report, which goes through a report operation to the error
 /// checker.  Nothing is thrown for bad text.  Exceptions of the host's parser, the validator, the checker and
@@ -34,10 +35,13 @@ namespace VT {
 /// used by one thread at a time.
 ///
 /// The order of the virtual functions is fixed: hosts call them by slot.  Every one of them may be overridden.  The
-/// visits answer an identifier, the invalid one behind a report, or what afterOperands() answers.
+/// visits answer an identifier, the invalid one after a report, or `deferred`.
 class VTSYM_API SymbolicExprFromQParseTree {
 public:
     using ParseTree = _Q_parse_tree_T<char>;
+
+    /// What a visit answers for a node whose children are converted next; the node follows them.  No table has it.
+    static constexpr SymbolicExprId deferred = invalidId - 1;
 
     /// All of them outlive the converter.  Without a validator every name is a symbol.
     SymbolicExprFromQParseTree(SymbolicExprTable& table, VTSymbolicExprErrorChecker& checker,
@@ -55,7 +59,7 @@ public:
     /// The expression of a node of a tree of the text.
     SymbolicExprId visitNode(const ParseTree& node, const char* text);
 
-    /// The first child of a root, any other node itself.
+    /// The expression below a root, be it a root in roots; any other node itself.
     static const ParseTree& skipExprGoal(const ParseTree& node);
 
     [[nodiscard]] bool skipDiagnostics() const noexcept { return checker_.skipDiagnostics(); }
@@ -121,6 +125,13 @@ public:
     /// A field of an owner.  The validator is asked for the owner's name only.
     virtual SymbolicExprId visitMDot(const ParseTree& node, const char* text);
 
+    // Slots 28 and 29, for hosts that end a converter by slot.
+
+    /// Destroys the converter and leaves its memory.
+    virtual void destroy() noexcept;
+    /// Destroys the converter, which new has made, and frees its memory.
+    virtual void destroyAndFree() noexcept;
+
 protected:
     /// Makes the expression of a node from those of its operands, in their order.
     using Build = SymbolicExprId (*)(SymbolicExprFromQParseTree& self, const ParseTree& node,
@@ -170,8 +181,10 @@ protected:
                                  SymbolicExprId head = invalidId);
     /// The same by a rule.  A node without the children that the rule asks for is reported.
     SymbolicExprId afterOperands(const ParseTree& node, const Rule& rule, const char* text);
-    /// A call, whose callee stands before its arguments among the operands.
-    SymbolicExprId afterArguments(const ParseTree& node, SymbolicExprId name);
+    /// Converts a call.
+    ///
+    /// @param furtherCallees  whether other callees than names are welcome.  A name in parentheses is no callee.
+    SymbolicExprId visitCallNode(const ParseTree& node, const char* text, bool furtherCallees);
 
     /// Calls `build` with its operands as arguments, for the table of rules.
     template <class Node>
@@ -200,6 +213,8 @@ protected:
         bool variantKeywords = false; ///< (sim) and (codegen) are names
         bool listAtTop = false;       ///< a list that is the whole text is one of dimensions
         std::ostream* dump = nullptr; ///< receives the parse tree
+        /// The class that the library itself converts with.  One derived from it may answer nodes of its own.
+        const std::type_info* ownClass = &typeid(SymbolicExprFromQParseTree);
     };
 
     /// `text` is followed by NUL.
@@ -215,6 +230,9 @@ protected:
     /// The validator; nullptr for the default one.
     [[nodiscard]] SymbolValidator* validator() const noexcept { return validator_; }
 
+    /// The reports that the checker had before the latest text.
+    [[nodiscard]] std::size_t earlierReports() const noexcept { return earlierReports_; }
+
     /// The position of the latest report, whether or not the checker kept it.
     [[nodiscard]] std::size_t reportedPosition() const noexcept { return reportedPosition_; }
 
@@ -224,9 +242,6 @@ protected:
 private:
     using Parser = PARSER_T<char>;
 
-    /// Answered by a visit for a node that waits for its operands.
-    static constexpr SymbolicExprId deferred = invalidId - 1;
-
     /// A node that waits for its operands.
     struct Frame {
         const ParseTree* node;
@@ -235,6 +250,7 @@ private:
         std::size_t converted; ///< where those that are begin on their stack
     };
 
+    class TextInWork;
     class Unwind;
 
     static SymbolicExprId buildDimensions(SymbolicExprFromQParseTree& self, const ParseTree& node,
@@ -248,7 +264,8 @@ private:
     Parser& parserFor(bool variantKeywords);
     SymbolicExprId enter(const ParseTree& node, const char* text);
     SymbolicExprId finish(SymbolicExprId id, std::size_t frames, const char* text);
-    SymbolicExprId visitCallNode(const ParseTree& node, const char* text);
+    /// A call, whose callee stands before its arguments among the operands.
+    SymbolicExprId afterArguments(const ParseTree& node, SymbolicExprId name);
     SymbolicExprId dimensions(std::span<const SymbolicExprId> ids);
 
     SymbolicExprId getNumberFromString(const std::string& literal, const char* text, std::size_t position);
@@ -264,6 +281,7 @@ private:
     std::vector<Frame> frames_;
     std::vector<SymbolicExprId> operands_;
     std::uint64_t convertible_ = 0; ///< calls that C has operators for, counted when they are met
+    std::size_t earlierReports_ = 0;
     std::size_t reportedPosition_ = 0;
     QuillFailure failure_;
 };

@@ -15,11 +15,6 @@ bool isRule(const ParseTree& node, QuillRule code) {
     return node.kind == ParseTree::nonTerminal && node.code == static_cast<std::int32_t>(code);
 }
 
-/// Whether a callee is one beside the plain names: a field, or a call that answers what is called or indexed.
-bool isFurtherCallee(const ParseTree& callee) {
-    return isRule(callee, QuillRule::Field) || isRule(callee, QuillRule::Call);
-}
-
 } // namespace
 
 SymbolicExprFromQParseTreeBlockVariants::SymbolicExprFromQParseTreeBlockVariants(SymbolicExprTable& table,
@@ -38,18 +33,22 @@ SymbolicExprId SymbolicExprFromQParseTreeBlockVariants::operator()(const std::st
     return convertOrThrow(text, debug);
 }
 
-SymbolicExprId SymbolicExprFromQParseTreeBlockVariants::convertOrThrow(std::string_view text, bool debug) {
+SymbolicExprFromQParseTree::Request SymbolicExprFromQParseTreeBlockVariants::conditionRequest() {
     Request request;
     request.variantKeywords = isVariantKeywordsSimCodegenFeatureOn();
+    request.ownClass = &typeid(SymbolicExprFromQParseTreeBlockVariants);
+    return request;
+}
+
+SymbolicExprId SymbolicExprFromQParseTreeBlockVariants::convertOrThrow(std::string_view text, bool debug) {
+    Request request = conditionRequest();
     request.dump = debug ? &std::cout : nullptr;
     return answer(convert(text, request), text);
 }
 
 SymbolicExprId SymbolicExprFromQParseTreeBlockVariants::operator()(const std::u16string& text) {
-    Request request;
-    request.variantKeywords = isVariantKeywordsSimCodegenFeatureOn();
     std::string converted;
-    const SymbolicExprId id = convert(text, converted, request);
+    const SymbolicExprId id = convert(text, converted, conditionRequest());
     return answer(id, converted);
 }
 
@@ -60,7 +59,7 @@ SymbolicExprId SymbolicExprFromQParseTreeBlockVariants::answer(SymbolicExprId id
     std::string pointer(reportedPosition() + 1, ' ');
     pointer += '^';
     std::string reason = sentenceOf(failure());
-    if (reason.empty() && !checker().diagnostics().empty())
+    if (reason.empty() && checker().diagnostics().size() > earlierReports())
         reason = checker().diagnostics().back().what();
     vtsvThrowIExceptionFromDiagnostic(vtsvCreateDiagnostic("Vantor:Variants:ExpressionParseError",
                                                            {std::string(text), std::move(pointer)}, std::move(reason),
@@ -71,13 +70,6 @@ SymbolicExprId SymbolicExprFromQParseTreeBlockVariants::answer(SymbolicExprId id
 
 bool SymbolicExprFromQParseTreeBlockVariants::shouldCreateIntValueNodeForIntegerValue() const {
     return true;
-}
-
-SymbolicExprId SymbolicExprFromQParseTreeBlockVariants::visitTerminal(const ParseTree& node, const char* text) {
-    if (node.code == static_cast<std::int32_t>(QuillToken::Identifier))
-        if (const auto known = names_.find({node.text, node.length}); known != invalidId)
-            return known;
-    return SymbolicExprFromQParseTree::visitTerminal(node, text);
 }
 
 SymbolicExprId SymbolicExprFromQParseTreeBlockVariants::resolveIdentifier(const std::string& name, const char* text,
@@ -134,10 +126,7 @@ SymbolicExprId SymbolicExprFromQParseTreeBlockVariants::visitNonTerminal(const P
     case QuillRule::AnonymousFunction:
         return visitAnonymousFunction(node, text);
     case QuillRule::Call:
-        if (node.childCount >= 3 && node.children[2].kind == ParseTree::nonTerminal &&
-            isFurtherCallee(node.children[0]))
-            return afterArguments(node, invalidId);
-        break;
+        return visitCallNode(node, text, true);
     default:
         if (const Rule* const rule = rules().find(node.code))
             return afterOperands(node, *rule, text);

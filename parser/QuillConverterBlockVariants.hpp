@@ -12,12 +12,13 @@ namespace VT {
 /// Turns the Quill text of a condition into one interned expression in C shape.
 ///
 /// What is welcome beyond SymbolicExprFromQParseTree: every operator of the language, ranges, matrices, cell arrays,
-/// anonymous functions, and any function with any number of arguments, be it a name, a field or what another call
-/// answers.  Indexing with braces, texts, imaginary numbers and function handles have no node.  An integral literal of
-/// 32 bits is an integer.  While the feature flag VariantKeywordsSimCodegen is above 0, (sim) and (codegen) are names.
+/// anonymous functions, and any function with any number of arguments, be it a name or any expression but a name in
+/// parentheses.  Indexing with braces, texts, imaginary numbers and function handles have no node.  An integral literal
+/// of 32 bits is an integer, with its minus -2147483648 too.  While the feature flag VariantKeywordsSimCodegen is above
+/// 0, (sim) and (codegen) are names.
 ///
-/// Names stand for themselves, whatever the validator says of them; it is asked once for each name in a converter's
-/// life, so that the host sees them.
+/// Names stand for themselves, whatever the validator says of them; resolveIdentifier() asks it once for each name in a
+/// converter's life, so that the host sees them.
 ///
 /// A text that is refused leaves one report in the checker, and is thrown as the host diagnostic
 /// "Vantor:Variants:ExpressionParseError" with two arguments, the text and a line of blanks that points below it with
@@ -35,7 +36,6 @@ public:
     SymbolicExprId operator()(const std::u16string& text);
 
     [[nodiscard]] bool shouldCreateIntValueNodeForIntegerValue() const override;
-    SymbolicExprId visitTerminal(const ParseTree& node, const char* text) override;
     SymbolicExprId resolveIdentifier(const std::string& name, const char* text, std::size_t position) override;
     bool supportFcn(SymbolicExprId functionNameId, std::size_t numArgs, const ParseTree& node,
                     const char* text) override;
@@ -52,6 +52,8 @@ public:
 
 private:
     static const RuleTable& rules();
+
+    static Request conditionRequest();
 
     SymbolicExprId convertOrThrow(std::string_view text, bool debug);
     SymbolicExprId visitAnonymousFunction(const ParseTree& node, const char* text);

@@ -67,7 +67,8 @@ SymbolicExprId SymbolicExprFromQParseTree::getNumberFromString(const std::string
         reportInvalidLiteralValue(literal, text, position);
         return invalidId;
     case NumberError::Overflow:
-        reportDiagnostic(symbolicDimsDiagnostic("UnsupportedLiteralValue", {literal, std::string(text)}, position));
+        reportDiagnostic(
+            symbolicDimsDiagnostic("UnsupportedLiteralValue", {literal, checker_.wholeText(text)}, position));
         return invalidId;
     case NumberError::None:
         break;
@@ -86,7 +87,7 @@ SymbolicExprId SymbolicExprFromQParseTree::getNumberFromValue(double value, cons
     if (!integerOnly)
         return factory_.make<SymbolicDoubleValue>(value);
     if (integral)
-        reportDiagnostic(symbolicDimsDiagnostic("IntegerOverflow", {literal, std::string(text)}, position));
+        reportDiagnostic(symbolicDimsDiagnostic("IntegerOverflow", {literal, checker_.wholeText(text)}, position));
     else if (isLiteral)
         reportNonIntegerLiteralValue(literal, text, position);
     else

@@ -16,7 +16,7 @@ class IdMap {
 public:
     /// The value of a key, or nullptr.  Valid until the next insertion.
     [[nodiscard]] Value* find(SymbolicExprId key) noexcept {
-        if (slots_.empty())
+        if (slots_.empty() || key == invalidId) // which marks a free slot
             return nullptr;
         Slot& slot = slots_[position(key)];
         return slot.key == key ? &slot.value : nullptr;

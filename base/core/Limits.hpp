@@ -14,9 +14,26 @@ inline constexpr std::uint64_t simplifyPasses = 10;
 /// beyond the bound the simplifier gives up the pass and returns what it was given.
 inline constexpr std::uint64_t chainOperands = 1000;
 
+/// Literals of all products that one call of the simplifier multiplies out, in all of its passes.  At most about half a
+/// second; real conditions take up to a hundred.  Beyond the bound the call gives up and returns what it was given.
+inline constexpr std::size_t multipliedLiterals = 50'000;
+
+/// Literals that the search for redundant parts of one sum of products looks at: so many, and so many more for each
+/// literal of the sum.  Beyond the bound the sum stays as it is.
+inline constexpr std::size_t coverSteps = 50'000;
+inline constexpr std::size_t coverStepsPerLiteral = 64;
+
+/// Nested case distinctions of that search.  Beyond the bound it counts as exhausted.
+inline constexpr std::size_t coverDepth = 200;
+
 /// Nesting of brackets and runs of prefix operators in a text: what the strictest common C compilers read.  One more is
 /// a parse error at that place.
 inline constexpr std::size_t nesting = 256;
+
+/// Visits of one rebuilding run whose results serve one occurrence of their node only: where a host's table leads in
+/// circles, or a host's visitor does not leave one result for a node.  Beyond the bound the first result of a node
+/// serves for all of its occurrences.
+inline constexpr std::size_t repeatedVisits = std::size_t{1} << 20U;
 
 /// Bytes of one printed text.  A shared graph of a few nodes can stand for more text than any memory holds; beyond the
 /// bound printing throws std::length_error.
@@ -39,6 +56,10 @@ inline constexpr std::size_t evaluatedElements = std::size_t{1} << 26U;
 /// some hundred thousand.  Beyond the bound the question is undecided.
 inline constexpr std::uint64_t decisionSteps = std::uint64_t{1} << 21U;
 
+/// Steps of the further questions of a comparison after one that used up its own, so that a hard pair costs little more
+/// than one question.
+inline constexpr std::uint64_t furtherSteps = std::uint64_t{1} << 17U;
+
 /// Edges of diagrams that are kept between questions, 16 bytes each.  When there are more, all are thrown away before
 /// the next question, which builds anew what it needs.
 inline constexpr std::size_t diagramEdges = std::size_t{1} << 22U;
@@ -50,8 +71,36 @@ inline constexpr std::size_t termCases = 64;
 /// undecided.
 inline constexpr std::size_t confirmations = 8192;
 
-/// Changes tried, each with a proof, and nodes interned on the way, to shorten one condition by what is known.  Beyond
-/// either bound the shortest form found so far stands.
+/// Steps that all proofs for one shorter condition may cost together: about an eighth of a second.  Beyond the bound
+/// the shortest form found so far stands.
+inline constexpr std::uint64_t shortenSteps = std::uint64_t{1} << 20U;
+
+/// Comparisons of a condition, each occurrence counted, up to which a shorter form is looked for.  A longer one keeps
+/// its form or takes its normal form.
+inline constexpr std::size_t shortenComparisons = 4096;
+
+/// Work of the algebra on one condition: operands looked at and products made.  Beyond the bound the forms found so far
+/// are left to choose from.
+inline constexpr std::size_t shortenWork = std::size_t{1} << 16U;
+
+/// Products of the sums that a shorter form is taken from, and steps of the search for redundant ones among them.  A
+/// larger sum is not looked at; what was not proven redundant stays.
+inline constexpr std::size_t shortenProducts = 128;
+inline constexpr std::size_t shortenCoverSteps = 4000;
+
+/// Rounds of taking out common operands, and of that together with judging constraints by those around them.  Real
+/// conditions take two or three; the latest form stands.
+inline constexpr std::size_t factorRounds = 32;
+inline constexpr std::size_t shortenRounds = 4;
+
+/// Intervals of a set up to which the shortest way to write it is looked for.  Those beyond are written one by one.
+inline constexpr std::size_t writtenIntervals = 64;
+
+/// Comparisons of a form up to which operands are taken away one by one, each with a proof.  A longer one stays.
+inline constexpr std::size_t shortenByProofs = 64;
+
+/// Changes tried, each with a proof, and nodes interned on the way, to take operands from one condition.  Beyond either
+/// bound the shortest form found so far stands.
 inline constexpr std::size_t impliedTries = 1000;
 inline constexpr std::size_t impliedNodes = std::size_t{1} << 16U;
 
@@ -64,5 +113,41 @@ inline constexpr std::size_t choiceOverlaps = 1000;
 
 /// Operands of a choice's condition up to which a redundant one is looked for.
 inline constexpr std::size_t choiceOperands = 64;
+
+/// Steps that decisions about the conditions of one source file may cost: so many for a file, and so many more for each
+/// condition as it is read.  Real conditions take some hundred, those of long chains over one macro some thousand.
+/// While they are used up, a condition is not decided, which is counted.
+inline constexpr std::uint64_t scanSteps = std::uint64_t{1} << 22U;
+inline constexpr std::uint64_t scanStepsPerBranch = std::uint64_t{1} << 13U;
+
+/// Steps of all decisions about one condition of a source file, and of each of them.  Beyond the first the shortest
+/// form found so far is reported; a decision beyond the second is given up.
+inline constexpr std::uint64_t branchSteps = std::uint64_t{1} << 20U;
+inline constexpr std::uint64_t branchDecisionSteps = std::uint64_t{1} << 16U;
+
+/// Nodes that a scanner keeps from file to file.  When there are more, the next file begins anew.
+inline constexpr std::size_t scanNodes = std::size_t{1} << 20U;
+
+/// Facts of branches around a condition that it is compared with: between one and two windows of those about one macro,
+/// and of all together what weighs so much, a fact about several macros as much as several.  Further ones are left out.
+inline constexpr std::size_t factWindow = 128;
+inline constexpr std::size_t factWeight = 256;
+inline constexpr std::size_t compoundFactWeight = 8;
+
+/// Tokens of a directive's condition that is looked into, and how often each of them may be written into the texts of
+/// unknowns (comparisons within comparisons repeat their operands).  Beyond either bound the condition is an unknown.
+inline constexpr std::size_t conditionTokens = 4096;
+inline constexpr std::size_t conditionTexts = 16;
+
+/// Macros that a macro is followed through to those that define it, and names in their definitions.  Beyond either
+/// bound nothing is known of the macro's value.
+inline constexpr std::size_t macrosFollowed = 64;
+inline constexpr std::size_t macroNamesFollowed = 1024;
+
+/// Raw strings without an end in one file that are searched to the end of the file.  Further ones are ordinary strings.
+inline constexpr unsigned endlessRawStrings = 8;
+
+/// Bytes of a directive that a finding quotes as a reason; what is longer is cut.
+inline constexpr std::size_t quotedBytes = 4096;
 
 } // namespace VT::limits

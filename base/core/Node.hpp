@@ -4,6 +4,7 @@
 #include "base/core/Operators.hpp"
 #include "host/Export.hpp"
 
+#include <concepts>
 #include <cstddef>
 #include <cstdint>
 
@@ -59,8 +60,9 @@ public:
     /// Number of arguments of a call, of operands behind the head of a cell array; 0 for other nodes.
     [[nodiscard]] virtual std::size_t getNumArgs() const;
     /// Visits every occurrence of a node below and including this one: operands first, or the node first where the
-    /// visitor's isBottomUpVistor() says so.  A shared operand is visited once for every path to it.  The stack does
-    /// not grow with depth.
+    /// visitor's isBottomUpVistor() says so.  A shared operand is visited once for every path to it, one that is
+    /// missing (SymbolicExprTable::hasOperand) not at all, nor a node as its own operand's operand.  The stack does not
+    /// grow with depth.
     virtual void accept(const SymbolicExprTable& table, SymbolicExprVisitor& visitor) const = 0;
     /// Calls the visit operation for this node's class and nothing else.
     virtual void invoke(SymbolicExprVisitor& visitor) const = 0;
@@ -72,5 +74,12 @@ protected:
     SymbolicExpr() = default;
     SymbolicExpr(const SymbolicExpr&) = default;
 };
+
+/// Structural equality of nodes of any two classes.  Fits both better than the virtual operation of either, which the
+/// language would also try with the sides exchanged.
+template <std::derived_from<SymbolicExpr> Left, std::derived_from<SymbolicExpr> Right>
+[[nodiscard]] bool operator==(const Left& left, const Right& right) {
+    return static_cast<const SymbolicExpr&>(left).operator==(static_cast<const SymbolicExpr&>(right));
+}
 
 } // namespace VT

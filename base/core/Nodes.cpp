@@ -180,7 +180,7 @@ std::uint64_t DoubleShape::hashOf(SymbolicOp) const noexcept {
     if (value_ == 0.0)
         return 0;
     if (std::isnan(value_))
-        return 0xfffffffffffffffdU;
+        return hashOfNaN;
     if (std::isinf(value_))
         return value_ > 0 ? 0xffffffffffffffffU : 0xfffffffffffffffeU;
     return std::bit_cast<std::uint64_t>(value_);
@@ -239,7 +239,7 @@ std::vector<SymbolicExprId> headed(SymbolicExprId head, const std::vector<Symbol
 } // namespace detail
 
 SymbolicExprId CallName::in(SymbolicExprTable& table) const {
-    return text_ != nullptr ? SymbolicString(table, *text_).getId(table) : operand_.in(table);
+    return isText_ ? SymbolicString(table, std::string(text_)).getId(table) : operand_.in(table);
 }
 
 // Dispatch.

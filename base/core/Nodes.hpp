@@ -11,6 +11,8 @@
 #include "base/core/Table.hpp"
 #include "base/core/Visitor.hpp"
 
+#include <concepts>
+#include <string_view>
 #include <utility>
 
 namespace VT {
@@ -42,7 +44,11 @@ public:
 
     CallName(const SymbolicExpr& node) : operand_(node) {}
 
-    CallName(const std::string& text) : operand_(invalidId), text_(&text) {}
+    /// A string or a literal; 0 is an identifier.
+    template <std::convertible_to<std::string_view> Text>
+    CallName(const Text& text) : operand_(invalidId),
+                                 text_(text),
+                                 isText_(true) {}
 
     // NOLINTEND(google-explicit-constructor)
 
@@ -50,7 +56,8 @@ public:
 
 private:
     Operand operand_;
-    const std::string* text_ = nullptr;
+    std::string_view text_;
+    bool isText_ = false;
 };
 
 namespace detail {

@@ -186,6 +186,8 @@ private:
 
 class VTSYM_API DoubleShape : public SymbolicExpr {
 public:
+    static constexpr std::uint64_t hashOfNaN = 0xfffffffffffffffdU;
+
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
 
     [[nodiscard]] bool isTermExpr() const override { return true; }

@@ -48,8 +48,13 @@ bool SymbolicExprTable::equalNodes(const SymbolicExpr& interned, const SymbolicE
     return &interned == &node || (interned == node && interned.getHash() == hash);
 }
 
+std::uint32_t SymbolicExprTable::tagOf(const SymbolicExpr& node, std::uint64_t hash) {
+    const bool isNaN = hash == SymbolicDoubleValue::hashOfNaN && node.op() == SymbolicOp::DoubleValue;
+    return isNaN ? addressTag(node) : tagOf(hash);
+}
+
 std::size_t SymbolicExprTable::probe(const SymbolicExpr& node, std::uint64_t hash) const {
-    return probe(tagOf(hash), [&](const NodeCell& cell) { return equalNodes(*cell.node(), node, hash); });
+    return probe(tagOf(node, hash), [&](const NodeCell& cell) { return equalNodes(*cell.node(), node, hash); });
 }
 
 /// Makes room for one more node, so that nothing but its own storage can fail once it is made.
@@ -91,7 +96,7 @@ void SymbolicExprTable::add(const SymbolicExpr* node) {
     const std::uint64_t hash = node->getHash();
     Slot& slot = index_[probe(*node, hash)];
     if (slot.cell == 0)
-        slot = {tagOf(hash), number};
+        slot = {tagOf(*node, hash), number};
     foreignNodes_.push_back(node);
     nodes_.push_back(owned.release());
 }
@@ -109,7 +114,7 @@ SymbolicExprId SymbolicExprTable::lookup(const SymbolicExpr* node) const {
 }
 
 const SymbolicExpr* SymbolicExprTable::get(SymbolicExprId id) const {
-    return has(id) ? nodes_[id] : nullptr;
+    return id < nodes_.size() ? nodes_[id] : nullptr;
 }
 
 SymbolicExprTable* SymbolicExprTable::CreateSymbolicExprTable() const {
@@ -118,6 +123,13 @@ SymbolicExprTable* SymbolicExprTable::CreateSymbolicExprTable() const {
 
 void SymbolicExprTable::lookup(const SymbolicOp& op, std::vector<SymbolicExprId>& out) const {
     out.clear();
+    if (!isPlain()) {
+        const SymbolicExpr* node = nullptr;
+        for (SymbolicExprId id = 0; (node = get(id)) != nullptr; ++id)
+            if (node->op() == op)
+                out.push_back(id);
+        return;
+    }
     if (out.capacity() < nodes_.size() / 10)
         out.reserve(nodes_.size() / 10);
     for (SymbolicExprId id = 0; id < nodes_.size(); ++id)

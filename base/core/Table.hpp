@@ -7,6 +7,7 @@
 
 #include <boost/unordered_map.hpp>
 
+#include <memory>
 #include <new>
 #include <string>
 #include <typeinfo>
@@ -24,8 +25,8 @@ class InternedNode;
 /// constants.
 ///
 /// A table holds up to 128 GiB of nodes, three thousand million at most, and throws std::length_error for one more.
-/// Nodes reach a derived class through its virtual operations: constructors call contains() and add(), getId() calls
-/// lookup().
+/// A derived class may keep its nodes elsewhere by overriding the virtual operations, through which all of the library
+/// reaches them: constructors call contains() and add(), getId() calls lookup(), everything else calls get().
 ///
 /// A table is used by one thread at a time; const operations may run concurrently while no thread interns.
 class VTSYM_API SymbolicExprTable {
@@ -44,19 +45,35 @@ public:
     /// The identifier of the interned node equal to this one, or the invalid identifier.  A node that is itself in the
     /// table is found even where it equals nothing (NaN).  O(1) on average.
     virtual SymbolicExprId lookup(const SymbolicExpr* node) const;
-    /// The node of an identifier; nullptr for an identifier that is not of this table.
+    /// The node of an identifier; nullptr for an identifier that is not of this table, which holds for every override
+    /// too.  The node stays where it is as long as the table lives.  O(1).
     virtual const SymbolicExpr* get(SymbolicExprId id) const;
     /// A new, empty table of the same kind, owned by the caller.
     virtual SymbolicExprTable* CreateSymbolicExprTable() const;
 
-    /// Fills `out` with the identifiers of all nodes of an operator, in increasing order.  Scans the whole table.
+    /// Fills `out` with the identifiers of all nodes of an operator, in increasing order.  Scans the whole table; a
+    /// derived class is asked for the nodes 0, 1, ... up to the first one that it does not have.
     void lookup(const SymbolicOp& op, std::vector<SymbolicExprId>& out) const;
 
-    /// Number of nodes; identifiers are the numbers below it.
+    /// Number of nodes in the table's own storage; where no derived class keeps nodes elsewhere, identifiers are the
+    /// numbers below it.
     [[nodiscard]] std::size_t size() const noexcept { return nodes_.size(); }
 
+    /// Whether the virtual operations are this class's own, so that they need not be called.
+    [[nodiscard]] bool isPlain() const { return typeid(*this) == typeid(SymbolicExprTable); }
+
     /// Whether an identifier is one of this table.
-    [[nodiscard]] bool has(SymbolicExprId id) const noexcept { return id < nodes_.size(); }
+    [[nodiscard]] bool has(SymbolicExprId id) const { return isPlain() ? id < nodes_.size() : get(id) != nullptr; }
+
+    /// Whether there is a node for `operand`, an operand of the node that stands under `id`.  In the table's own
+    /// storage operands are older than their nodes, so that nothing leads in a circle: an operand whose identifier is
+    /// not below its node's counts as missing.  Elsewhere, and for a node that is not interned and has the invalid
+    /// identifier, every node of the table will do.
+    [[nodiscard]] bool hasOperand(SymbolicExprId id, SymbolicExprId operand) const {
+        if (!isPlain() && (id >= nodes_.size() || nodes_[id] != get(id)))
+            return has(operand);
+        return operand < id && has(operand);
+    }
 
     /// Interns "false" and then "true" and remembers them as the truth constants.  A second call changes nothing.
     void addBoolSymbols();
@@ -90,6 +107,9 @@ public:
     /// The alias of an identifier, or the empty text.
     [[nodiscard]] std::string getAliasForSymbolicIdentifier(const std::string& identifier) const;
 
+    /// Number of identifiers with an alias.  Aliases neither change nor go, so equal numbers mean equal aliases.
+    [[nodiscard]] std::size_t aliasCount() const noexcept { return aliases_.size(); }
+
 private:
     template <class Node, SymbolicOp Op, class Payload>
     friend class detail::InternedNode;
@@ -114,13 +134,17 @@ private:
     template <class Node, class Payload>
     [[nodiscard]] SymbolicExprId idOf(const Payload& node) const;
 
-    /// Whether the virtual operations are this class's own, so that they need not be called.
-    [[nodiscard]] bool isPlain() const { return typeid(*this) == typeid(SymbolicExprTable); }
-
     [[nodiscard]] static std::uint32_t tagOf(std::uint64_t hash) noexcept {
         // Hashes of literals are their bits, so they are spread before the topmost bits choose the slot.
         return static_cast<std::uint32_t>((hash * spread) >> 32U);
     }
+
+    /// NaN literals have one hash and equal nothing, so each is found by its address alone.
+    [[nodiscard]] static std::uint32_t addressTag(const SymbolicExpr& node) noexcept {
+        return tagOf(reinterpret_cast<std::uintptr_t>(&node));
+    }
+
+    [[nodiscard]] static std::uint32_t tagOf(const SymbolicExpr& node, std::uint64_t hash);
 
     template <class Equal>
     [[nodiscard]] std::size_t probe(std::uint32_t tag, Equal equal) const;
@@ -166,8 +190,10 @@ std::size_t SymbolicExprTable::probe(std::uint32_t tag, Equal equal) const {
 template <class Node, class Payload>
 void SymbolicExprTable::intern(const Payload& candidate) {
     if (!isPlain()) {
-        if (!contains(&candidate))
-            add(new Node(candidate));
+        // The class of the candidate is not complete yet, and a host may do with a node what it likes.
+        std::unique_ptr<const Node> node(new Node(candidate));
+        if (!contains(node.get()))
+            add(node.release());
         return;
     }
     const std::uint64_t hash = candidate.hashOf(Node::code);
@@ -205,6 +231,12 @@ const NodeCell* SymbolicExprTable::place(const Payload& candidate, std::uint32_t
     }
     fresh->id = static_cast<std::uint32_t>(nodes_.size());
     fresh->code = static_cast<std::uint32_t>(Node::code);
+    if constexpr (Node::equalWithinTolerance) {
+        if (!candidate.hasParts(candidate)) {
+            tag = addressTag(*node);
+            position = probe(tag, [](const NodeCell&) { return false; });
+        }
+    }
     index_[position] = {tag, number};
     nodes_.push_back(node);
     return fresh;

@@ -22,8 +22,9 @@ public:
 #undef VTSYM_OPERATOR
 
     /// Visits every occurrence of a node below and including `id`, operands from left to right and then their node.  A
-    /// shared operand is visited once for every path to it.  The stack does not grow with depth; an identifier that is
-    /// not of the table is not visited.
+    /// shared operand is visited once for every path to it, one that is missing (SymbolicExprTable::hasOperand) not at
+    /// all, nor a node as its own operand's operand.  The stack does not grow with depth; an identifier that is not of
+    /// the table is not visited.
     void execute(const SymbolicExprTable& table, SymbolicExprId id);
 
 protected:

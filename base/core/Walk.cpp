@@ -1,59 +1,101 @@
 #include "base/core/Walk.hpp"
 
+#include "base/core/OperandStack.hpp"
+
 namespace VT {
 
-namespace {
+namespace detail {
 
-/// Identifiers below this bound may be followed from a node.  A temporary that is no node of the table may name any of
-/// them.
-struct Frame {
-    const SymbolicExpr* node;
-    SymbolicExprId bound;
-    std::size_t next;
-    std::size_t count;
-    bool visitAtEnd;
-};
+/// Visits the nodes below and including one, each as often as it occurs.
+template <class Path>
+class OccurrenceWalk {
+public:
+    OccurrenceWalk(const SymbolicExprTable& table, SymbolicExprVisitor& visitor)
+        : table_(table),
+          visitor_(visitor),
+          operands_(dynamic_cast<OperandStack*>(&visitor)),
+          path_(table) {}
 
-template <class BottomUp>
-void walkOccurrences(const SymbolicExprTable& table, const SymbolicExpr& root, SymbolicExprId bound,
-                     SymbolicExprVisitor& visitor, BottomUp bottomUp) {
-    std::vector<Frame> stack;
-    const auto enter = [&](const SymbolicExpr& node, SymbolicExprId below) {
+    /// `bottomUp` is asked at each node that has operands.
+    template <class BottomUp>
+    void run(SymbolicExprId id, const SymbolicExpr& root, BottomUp bottomUp) {
+        enter(id, root, bottomUp);
+        while (!stack_.empty()) {
+            Frame& top = stack_.back();
+            if (top.next < top.count) {
+                const SymbolicExprId operand = top.node->getInput(top.next++);
+                if (path_.hasOperand(top.id, operand) && path_.depthOf(operand) == 0)
+                    enter(operand, *table_.get(operand), bottomUp);
+                else if (operands_ != nullptr)
+                    operands_->push(invalidId);
+                continue;
+            }
+            const Frame done = top;
+            stack_.pop_back();
+            path_.leave(done.id);
+            if (done.visitAtEnd)
+                visit(done.id, *done.node);
+        }
+    }
+
+private:
+    struct Frame {
+        const SymbolicExpr* node;
+        SymbolicExprId id; ///< the invalid one for a root that is not interned
+        std::size_t next;
+        std::size_t count;
+        bool visitAtEnd;
+    };
+
+    template <class BottomUp>
+    void enter(SymbolicExprId id, const SymbolicExpr& node, const BottomUp& bottomUp) {
         const std::size_t count = node.getNumInputs();
         if (count == 0) {
-            node.invoke(visitor);
+            visit(id, node);
             return;
         }
         const bool operandsFirst = bottomUp();
         if (!operandsFirst)
-            node.invoke(visitor);
-        stack.push_back({&node, below, 0, count, operandsFirst});
-    };
-    enter(root, bound);
-    while (!stack.empty()) {
-        Frame& top = stack.back();
-        if (top.next < top.count) {
-            const SymbolicExprId operand = top.node->getInput(top.next++);
-            if (operand < top.bound)
-                enter(*table.get(operand), operand);
-            continue;
-        }
-        const Frame done = top;
-        stack.pop_back();
-        if (done.visitAtEnd)
-            done.node->invoke(visitor);
+            visit(id, node);
+        stack_.push_back({&node, id, 0, count, operandsFirst});
+        path_.enter(id);
     }
+
+    void visit(SymbolicExprId id, const SymbolicExpr& node) {
+        if (operands_ == nullptr) {
+            node.invoke(visitor_);
+            return;
+        }
+        const OperandStack::Visiting visiting(*operands_, table_, id, node);
+        node.invoke(visitor_);
+    }
+
+    const SymbolicExprTable& table_;
+    SymbolicExprVisitor& visitor_;
+    OperandStack* operands_;
+    Path path_;
+    std::vector<Frame> stack_;
+};
+
+/// `id` is that of the root, or the invalid one.
+template <class BottomUp>
+void visitOccurrences(const SymbolicExprTable& table, SymbolicExprId id, const SymbolicExpr& root,
+                      SymbolicExprVisitor& visitor, BottomUp bottomUp) {
+    if (table.isPlain())
+        OccurrenceWalk<PlainPath>(table, visitor).run(id, root, bottomUp);
+    else
+        OccurrenceWalk<WalkPath>(table, visitor).run(id, root, bottomUp);
 }
 
-} // namespace
+} // namespace detail
 
 void visitEveryOccurrence(const SymbolicExprTable& table, const SymbolicExpr& root, SymbolicExprVisitor& visitor) {
-    walkOccurrences(table, root, table.size(), visitor, [&] { return visitor.isBottomUpVistor(); });
+    detail::visitOccurrences(table, table.lookup(&root), root, visitor, [&] { return visitor.isBottomUpVistor(); });
 }
 
 void SymbolicExprVisitor::execute(const SymbolicExprTable& table, SymbolicExprId id) {
     if (table.has(id))
-        walkOccurrences(table, *table.get(id), id, *this, [] { return true; });
+        detail::visitOccurrences(table, id, *table.get(id), *this, [] { return true; });
 }
 
 } // namespace VT

@@ -5,6 +5,7 @@
 // diagrams. One step for each operand, plus those of the diagrams.
 #include "base/decide/ConditionReader.hpp"
 
+#include "base/core/Walk.hpp"
 #include "base/decide/Arithmetic.hpp"
 
 #include <algorithm>
@@ -41,8 +42,9 @@ ReadCondition ConditionReader::read(SymbolicExprId condition) {
     frames_.clear();
     operands_.clear();
     leaves_.clear();
-    missing_ = false;
-    if (!enter(condition)) {
+    whole_.clear();
+    missing_ = !table_.isPlain() && !isWhole(condition); // elsewhere nodes may lead in circles
+    if (!missing_ && !enter(condition)) {
         while (!frames_.empty() && !missing_) {
             Frame& top = frames_.back();
             if (top.next < operands_.size()) {
@@ -77,6 +79,10 @@ bool ConditionReader::enter(SymbolicExprId id) {
     if (read_.find(id) != nullptr)
         return true;
     if (const LeafMeaning meaning = leafReader_(id); meaning.kind != LeafMeaning::Kind::Compound) {
+        // A call or a member is known by its text, which needs all of its operands.
+        missing_ = !isWhole(meaning.kind == LeafMeaning::Kind::Free ? meaning.node : id);
+        if (missing_)
+            return true;
         store(id, leaf(id, meaning));
         return true;
     }
@@ -87,11 +93,28 @@ bool ConditionReader::enter(SymbolicExprId id) {
     } else {
         for (std::size_t i = 0; i < node->getNumInputs(); ++i) {
             operands_.push_back(node->getInput(i));
-            missing_ = missing_ || operands_.back() >= id;
+            missing_ = missing_ || !table_.hasOperand(id, operands_.back());
         }
     }
     frames_.push_back({id, node, first, first});
     return false;
+}
+
+/// Whether no operand is missing in a node and below it.
+bool ConditionReader::isWhole(SymbolicExprId id) {
+    if (table_.get(id)->getNumInputs() == 0)
+        return true;
+    bool whole = true;
+    std::vector<WalkFrame> stack;
+    walkUnknown(
+        table_, id, stack,
+        [&](SymbolicExprId met, const SymbolicExpr*) {
+            steps_.take();
+            return whole_.find(met) != nullptr;
+        },
+        [&](SymbolicExprId visited, const SymbolicExpr&, const SymbolicExpr*) { whole_.insert(visited, true); },
+        [&](SymbolicExprId, const SymbolicExpr*) { whole = false; });
+    return whole;
 }
 
 /// Appends the operands of a chain, each once, in the order of the tree.
@@ -112,7 +135,7 @@ void ConditionReader::collectChain(SymbolicOp op, SymbolicExprId root) {
         }
         for (std::size_t i : {1U, 0U}) {
             pending.push_back(node->getInput(i));
-            missing_ = missing_ || pending.back() >= id;
+            missing_ = missing_ || !table_.hasOperand(id, pending.back());
         }
         if (missing_)
             return;

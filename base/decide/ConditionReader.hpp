@@ -77,6 +77,7 @@ private:
     }
 
     bool enter(SymbolicExprId id);
+    bool isWhole(SymbolicExprId id);
     void collectChain(SymbolicOp op, SymbolicExprId root);
     void store(SymbolicExprId id, Value value);
     Value leaf(SymbolicExprId id, const LeafMeaning& meaning);
@@ -109,6 +110,7 @@ private:
     Diagrams& diagrams_;
     Steps& steps_;
     IdMap<std::uint32_t> read_; ///< node to position in values_
+    IdMap<bool> whole_;         ///< nodes below which no operand is missing
     std::vector<Value> values_;
     std::vector<Frame> frames_;
     std::vector<SymbolicExprId> operands_;

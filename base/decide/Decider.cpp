@@ -27,6 +27,7 @@ static_assert(limits::decisionSteps <= mostSteps);
 struct Decider::State {
     State(const SymbolicExprTable& symbols, const DecisionOptions& asked)
         : options{asked.keywordsInForce, asked.bits32, std::min(asked.steps, mostSteps)},
+          questionSteps(options.steps),
           printer(symbols, false),
           leafReader(symbols, asked.keywordsInForce),
           unknowns(symbols, printer, asked.bits32 ? std::numeric_limits<std::int32_t>::min() : minusInfinite,
@@ -50,6 +51,7 @@ struct Decider::State {
     void clear();
 
     DecisionOptions options;
+    std::uint64_t questionSteps; ///< that a question may cost
     SymbolicExprPrinter printer;
     LeafReader leafReader;
     Steps steps;
@@ -97,7 +99,7 @@ const Decider::State::Read& Decider::State::read(SymbolicExprId id) {
 }
 
 bool Decider::State::isReadable(SymbolicExprId id) {
-    steps.refill(options.steps);
+    steps.refill(questionSteps);
     try {
         return read(id).condition.bound == DecisionBound::None;
     } catch (const StepsUsedUp&) {
@@ -131,7 +133,7 @@ template <class Combine>
 Decision Decider::State::decide(std::span<const SymbolicExprId> ids, Combine combine) {
     if (diagrams.edgesHeld() > limits::diagramEdges)
         clear();
-    steps.refill(options.steps);
+    steps.refill(questionSteps);
     Decision decision;
     try {
         boost::container::small_vector<const Read*, 4> conditions;
@@ -157,7 +159,7 @@ Decision Decider::State::decide(std::span<const SymbolicExprId> ids, Combine com
         clear();
         throw;
     }
-    taken = options.steps - steps.left();
+    taken = questionSteps - steps.left();
     return decision;
 }
 
@@ -211,14 +213,18 @@ Decision Decider::equivalentGiven(SymbolicExprId a, SymbolicExprId b, SymbolicEx
 
 Relation Decider::classify(SymbolicExprId a, SymbolicExprId b) {
     std::uint64_t taken = 0;
+    const std::uint64_t allowed = state_->questionSteps;
     const auto counted = [&](Decision decision) {
         taken += state_->taken;
+        if (decision.bound == DecisionBound::Steps)
+            limitSteps(std::min(allowed, limits::furtherSteps));
         return decision;
     };
     Decision onlyA = counted(implies(a, b).opposite());
     Decision onlyB = counted(implies(b, a).opposite());
     Relation relation = Relation::of(std::move(onlyA), std::move(onlyB), counted(overlaps(a, b)));
     state_->taken = taken;
+    limitSteps(allowed);
     return relation;
 }
 
@@ -295,6 +301,10 @@ std::string Decider::nameOf(SymbolicExprId unknown) const {
 
 const DecisionOptions& Decider::options() const noexcept {
     return state_->options;
+}
+
+void Decider::limitSteps(std::uint64_t steps) noexcept {
+    state_->questionSteps = std::min(steps, state_->options.steps);
 }
 
 std::uint64_t Decider::stepsTaken() const noexcept {

@@ -53,7 +53,8 @@ public:
     Decision overlaps(SymbolicExprId a, SymbolicExprId b);
     /// Whether a and b agree wherever `known` holds; the witness of "no" is where they differ.
     Decision equivalentGiven(SymbolicExprId a, SymbolicExprId b, SymbolicExprId known);
-    /// How a and b stand to each other, with the three witnesses that there may be.
+    /// How a and b stand to each other, with the three witnesses that there may be.  Three questions; behind one that
+    /// gives up, the others may take limits::furtherSteps each.
     Relation classify(SymbolicExprId a, SymbolicExprId b);
 
     // A set, n log n in the number of similar conditions.
@@ -70,6 +71,8 @@ public:
     [[nodiscard]] std::string nameOf(SymbolicExprId unknown) const;
 
     [[nodiscard]] const DecisionOptions& options() const noexcept;
+    /// What a further question may cost, at most what the options say.
+    void limitSteps(std::uint64_t steps) noexcept;
     /// Steps that the latest question took.
     [[nodiscard]] std::uint64_t stepsTaken() const noexcept;
     /// Forgets everything that was read.

@@ -18,9 +18,9 @@ namespace {
 
 constexpr std::size_t firstSlots = 256;
 
-std::uint64_t mix(std::uint64_t hash, std::uint64_t value) noexcept {
-    hash = (hash ^ value) * spread;
-    return hash ^ (hash >> 29U);
+/// The slot for a hash: its upper half is the well mixed one.
+std::size_t slotFor(std::uint64_t hash, std::size_t slots) noexcept {
+    return static_cast<std::size_t>(hash >> 32U) & (slots - 1);
 }
 
 } // namespace
@@ -97,17 +97,17 @@ Diagram Diagrams::make(Quantity quantity, std::size_t scratch) {
         return only;
     }
     VTSYM_CHECK(isReduced(quantity, scratch));
-    std::uint64_t hash = quantity;
+    std::uint64_t hash = hashStep(0, quantity); // quantities and bounds often grow together
     for (std::size_t i = scratch; i < scratch_.size(); ++i) {
         scratch_[i].child ^= flip;
-        hash = mix(mix(hash, static_cast<std::uint64_t>(scratch_[i].high)), scratch_[i].child);
+        hash = hashStep(hashStep(hash, static_cast<std::uint64_t>(scratch_[i].high)), scratch_[i].child);
     }
     if ((nodes_.size() + 1) * 2 > index_.size())
         growIndex();
     const std::size_t mask = index_.size() - 1;
-    std::size_t at = (hash >> 20U) & mask;
+    std::size_t at = slotFor(hash, index_.size());
     const auto fresh = scratch_.begin() + static_cast<std::ptrdiff_t>(scratch);
-    for (; index_[at] != 0; at = (at + 1) & mask) {
+    for (; index_[at] != 0; at = (at + 1) & mask, ++probes_) {
         const Node& node = nodes_[index_[at]];
         if (node.quantity == quantity && node.count == count &&
             std::equal(fresh, scratch_.end(), edges_.begin() + static_cast<std::ptrdiff_t>(node.first))) {
@@ -134,12 +134,12 @@ void Diagrams::growIndex() {
     const std::size_t mask = index_.size() - 1;
     for (std::uint32_t number = 1; number < nodes_.size(); ++number) {
         const Node& node = nodes_[number];
-        std::uint64_t hash = node.quantity;
+        std::uint64_t hash = hashStep(0, node.quantity);
         for (std::uint32_t i = 0; i < node.count; ++i) {
             const Edge& edge = edges_[node.first + i];
-            hash = mix(mix(hash, static_cast<std::uint64_t>(edge.high)), edge.child);
+            hash = hashStep(hashStep(hash, static_cast<std::uint64_t>(edge.high)), edge.child);
         }
-        std::size_t at = (hash >> 20U) & mask;
+        std::size_t at = slotFor(hash, index_.size());
         while (index_[at] != 0)
             at = (at + 1) & mask;
         index_[at] = number;
@@ -158,7 +158,7 @@ std::size_t Diagrams::edgeOf(Diagram diagram, std::int64_t value) const {
 
 Diagrams::Known& Diagrams::slotOf(Diagram a, Diagram b) {
     const std::size_t mask = known_.size() - 1;
-    std::size_t at = (mix(mix(0, a), b) >> 20U) & mask;
+    std::size_t at = slotFor(hashStep(hashStep(0, a), b), known_.size());
     while (known_[at].question == question_ && (known_[at].a != a || known_[at].b != b))
         at = (at + 1) & mask;
     return known_[at];

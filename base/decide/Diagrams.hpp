@@ -74,6 +74,9 @@ public:
 
     [[nodiscard]] std::size_t edgesHeld() const noexcept { return edges_.size(); }
 
+    /// Other nodes that were met where one was looked for.
+    [[nodiscard]] std::uint64_t probes() const noexcept { return probes_; }
+
     void clear();
 
 private:
@@ -121,6 +124,7 @@ private:
     Steps& steps_;
     std::vector<Node> nodes_;
     std::vector<Edge> edges_;
+    std::uint64_t probes_ = 0;
     std::vector<std::uint32_t> index_; ///< of nodes by their edges; 0 is free
     std::vector<Known> known_;         ///< And of pairs in this question
     std::size_t knownCount_ = 0;

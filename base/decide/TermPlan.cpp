@@ -5,7 +5,7 @@
 // no recursion.
 #include "base/decide/TermPlan.hpp"
 
-#include "base/core/Nodes.hpp"
+#include "base/core/Walk.hpp"
 #include "base/decide/Arithmetic.hpp"
 
 #include <algorithm>
@@ -15,20 +15,24 @@ namespace VT {
 TermPlan::TermPlan(const LeafReader& leaves, Unknowns& unknowns, SymbolicExprId term) {
     const SymbolicExprTable& table = leaves.table();
     std::vector<SymbolicExprId> ids;
-    std::vector<SymbolicExprId> pending{term};
     IdMap<std::size_t> position;
-    while (!pending.empty()) {
-        const SymbolicExprId id = pending.back();
-        pending.pop_back();
-        if (position.find(id) != nullptr)
-            continue;
+    std::vector<WalkFrame> stack;
+    const auto add = [&](SymbolicExprId id) {
         position.insert(id, 0);
         ids.push_back(id);
-        if (leaves(id).kind == LeafMeaning::Kind::Compound)
-            for (std::size_t i = 0; i < table.get(id)->getNumInputs(); ++i)
-                pending.push_back(table.get(id)->getInput(i));
-    }
-    std::ranges::sort(ids); // operands before their operators
+    };
+    walkUnknown(
+        table, term, stack,
+        [&](SymbolicExprId id, const SymbolicExpr*) {
+            if (position.find(id) != nullptr)
+                return true;
+            const bool isLeaf = leaves(id).kind != LeafMeaning::Kind::Compound;
+            if (isLeaf)
+                add(id);
+            return isLeaf;
+        },
+        [&](SymbolicExprId id, const SymbolicExpr&, const SymbolicExpr*) { add(id); },
+        [](SymbolicExprId, const SymbolicExpr*) {});
     for (const SymbolicExprId id : ids) {
         const SymbolicExpr& node = *table.get(id);
         Node step{node.op(), leaves(id), noUnknown, 0, 0, 0};

@@ -10,6 +10,7 @@
 
 #include "base/core/Check.hpp"
 #include "base/core/Nodes.hpp"
+#include "base/decide/OrderLabels.hpp"
 
 #include <boost/container_hash/hash.hpp>
 
@@ -18,8 +19,6 @@
 namespace VT {
 
 namespace {
-
-constexpr std::uint64_t labelGap = std::uint64_t{1} << 32U;
 
 /// a - b for bounds that may be infinite: `infinite` where either is.
 std::int64_t boundDifference(std::int64_t a, std::int64_t b, std::int64_t infinite) {
@@ -99,27 +98,11 @@ Unknown Unknowns::add(UnknownInfo info) {
     quantities_.push_back({unknown, noUnknown, info.low, info.high});
     unknowns_.push_back(std::move(info));
     const auto at = order_.insert(unknown).first;
-    label(at);
+    labelInserted(order_.begin(), order_.end(), at,
+                  [&](Unknown each) -> std::uint64_t& { return unknowns_[each].label; });
     VTSYM_CHECK(at == order_.begin() || before(*std::prev(at), unknown));
     VTSYM_CHECK(std::next(at) == order_.end() || before(unknown, *std::next(at)));
     return unknown;
-}
-
-void Unknowns::label(std::set<Unknown, ByText>::const_iterator at) {
-    const std::uint64_t below = at == order_.begin() ? 0 : unknowns_[*std::prev(at)].label;
-    const auto next = std::next(at);
-    if (next == order_.end() && below < ~std::uint64_t{0} - labelGap) {
-        unknowns_[*at].label = below + labelGap;
-        return;
-    }
-    const std::uint64_t above = next == order_.end() ? ~std::uint64_t{0} : unknowns_[*next].label;
-    if (above - below > 1) {
-        unknowns_[*at].label = below + (above - below) / 2;
-        return;
-    }
-    std::uint64_t fresh = 0;
-    for (const Unknown unknown : order_)
-        unknowns_[unknown].label = fresh += labelGap;
 }
 
 Unknown Unknowns::simulation() {

@@ -2,8 +2,8 @@
 //
 // A diagram must not depend on what was interned or asked before, so quantities are ordered by text, never by number.
 // The order of unknowns is kept in a tree (one text comparison for each level when an unknown is met for the first
-// time) with labels of 64 bits that leave gaps, so that two quantities are compared as numbers; when a gap is full all
-// labels are dealt anew, which changes no order.
+// time) with labels of 64 bits that leave gaps, so that two quantities are compared as numbers; when a gap is full the
+// labels around it are dealt anew, which changes no order.
 #pragma once
 
 #include "base/core/IdMap.hpp"
@@ -107,7 +107,6 @@ private:
     [[nodiscard]] int compareSums(const LinearParts& a, const LinearParts& b) const;
     [[nodiscard]] LinearParts byText(const LinearParts& parts) const;
     Unknown add(UnknownInfo info);
-    void label(std::set<Unknown, ByText>::const_iterator at);
 
     const SymbolicExprTable& table_;
     const SymbolicExprPrinter& printer_;

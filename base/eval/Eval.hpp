@@ -13,7 +13,8 @@ public:
     explicit SymbolicExprEval(const SymbolicExprTable& table) : table_(table) {}
 
     /// The value of an expression under the values that are bound to symbols in the table.  Throws the host diagnostics
-    /// that SymbolicExprEvalImpl names, and std::length_error beyond limits::evaluatedElements.
+    /// that SymbolicExprEvalImpl names, and std::length_error beyond limits::evaluatedElements.  No operation on
+    /// scalars fails: integers wrap or saturate, doubles become infinities, or NaN as in IEEE 754 (see Values.hpp).
     ///
     /// Linear in the distinct nodes of the expression and of the values it needs, times the length of the vectors.
     [[nodiscard]] SymbolicValue eval(SymbolicExprId id) const;

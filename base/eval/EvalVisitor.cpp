@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <stdexcept>
+#include <utility>
 
 namespace VT {
 
@@ -13,35 +14,35 @@ using detail::Evaluation;
 
 namespace {
 
-/// Marks a symbol whose value is being evaluated.
+/// Marks a node whose value is being evaluated.
 const SymbolicValue::Elements open;
 
 } // namespace
 
 SymbolicValue SymbolicExprEvalImpl::evaluate(SymbolicExprId id) {
-    evaluateToStack(id);
-    return get();
+    return evaluateFrom([&] { enter(id, nullptr); });
 }
 
 SymbolicValue SymbolicExprEvalImpl::get() {
-    if (stack_.empty())
-        detail::throwMissingNode(table_, invalidId, nullptr);
-    const Entry& entry = values_[stack_.back()];
-    stack_.pop_back();
-    if (entry.elements == nullptr)
-        return visibleScalar(entry.scalar);
-    Elements elements(*entry.elements);
-    std::ranges::transform(elements, elements.begin(), visibleScalar);
-    return elements;
+    const SymbolicExprId id = std::exchange(visited_, invalidId);
+    if (visitedValue_)
+        return *std::exchange(visitedValue_, std::nullopt);
+    return evaluate(id);
 }
 
-/// Leaves the value of an expression on the stack.
-void SymbolicExprEvalImpl::evaluateToStack(SymbolicExprId id) {
-    const std::size_t depth = stack_.size();
-    const std::size_t bottom = frames_.size();
+void SymbolicExprEvalImpl::on(const SymbolicExpr& node) {
+    visitedValue_.reset();
+    visited_ = node.getId(table_);
+    if (visited_ == invalidId)
+        visitedValue_ = evaluateFrom([&] { enterNode(invalidId, node, node.op(), detail::evaluationOf(node.op())); });
+}
+
+/// The value of the expression that is put on the stack or the frames.
+template <class Enter>
+SymbolicValue SymbolicExprEvalImpl::evaluateFrom(Enter enterRoot) {
     try {
-        enter(id, nullptr);
-        while (frames_.size() > bottom) {
+        enterRoot();
+        while (!frames_.empty()) {
             Frame& top = frames_.back();
             if (top.next == top.count) {
                 leave();
@@ -51,19 +52,35 @@ void SymbolicExprEvalImpl::evaluateToStack(SymbolicExprId id) {
             const bool listed = top.rule == ScalarRuleIndex::None && !top.isSymbol;
             enter(listed ? top.node->getInput(at) : at == 0 ? top.first : top.second, &top);
         }
+        return takeValue();
     } catch (...) {
-        stack_.resize(depth);
-        frames_.resize(bottom);
+        frames_.clear();
+        stack_.clear();
         known_.clear(); // some symbols are open
+        values_.clear();
+        vectors_.clear();
+        elementCount_ = 0;
         throw;
     }
 }
 
+/// The value on the stack as it is handed out.
+SymbolicValue SymbolicExprEvalImpl::takeValue() {
+    const Entry& entry = values_[stack_.back()];
+    stack_.pop_back();
+    if (entry.elements == nullptr)
+        return visibleScalar(entry.scalar);
+    Elements elements(*entry.elements);
+    std::ranges::transform(elements, elements.begin(), visibleScalar);
+    return elements;
+}
+
 /// Puts the value of an expression on the stack, or its node on the frames.
 void SymbolicExprEvalImpl::enter(SymbolicExprId id, const Frame* parent) {
-    // An operand is older than its node; a value may be any node.
+    // A value may be any node; an operand may not.
+    const bool isOperand = parent != nullptr && !parent->isSymbol;
     const SymbolicExpr* const found = table_.get(id);
-    if (found == nullptr || (parent != nullptr && !parent->isSymbol && id >= parent->id))
+    if (found == nullptr || (isOperand && !table_.hasOperand(parent->id, id)))
         detail::throwMissingNode(table_, id, parent != nullptr ? parent->node : nullptr);
     const SymbolicExpr& node = *found;
     const SymbolicOp op = node.op();
@@ -73,17 +90,36 @@ void SymbolicExprEvalImpl::enter(SymbolicExprId id, const Frame* parent) {
         return;
     }
     if (const std::size_t* const known = known_.find(id); known != nullptr) {
-        if (values_[*known].elements == &open)
+        if (values_[*known].elements == &open) {
+            if (isOperand && way == Evaluation::Operands)
+                detail::throwMissingNode(table_, id, parent->node);
             detail::throwCyclicValue(table_, node);
+        }
         stack_.push_back(*known);
         return;
     }
+    enterNode(id, node, op, way);
+}
+
+/// The same for a node that is not known; the invalid identifier stands for a root that is not of the table.
+void SymbolicExprEvalImpl::enterNode(SymbolicExprId id, const SymbolicExpr& node, SymbolicOp op, Evaluation way) {
     if (way == Evaluation::None)
         detail::throwNotEvaluable(table_, node);
-    if (way == Evaluation::Operands)
+    if (way == Evaluation::Literal) {
+        push(detail::literalValue(node, op));
+    } else if (way == Evaluation::Operands) {
+        if (!table_.isPlain() && id != invalidId) // in a plain one operands lead in no circle
+            markOpen(id);
         enterOperands(id, node, op);
-    else
+    } else {
         enterSymbol(id, node, way == Evaluation::Member);
+    }
+}
+
+/// Marks a node as one whose value needs what is evaluated until it is left.
+void SymbolicExprEvalImpl::markOpen(SymbolicExprId id) {
+    known_.insert(id, values_.size());
+    values_.push_back({SymbolicScalar(), &open});
 }
 
 void SymbolicExprEvalImpl::enterOperands(SymbolicExprId id, const SymbolicExpr& node, SymbolicOp op) {
@@ -115,96 +151,32 @@ void SymbolicExprEvalImpl::enterSymbol(SymbolicExprId id, const SymbolicExpr& no
         known_.insert(id, stack_.back());
         return;
     }
-    known_.insert(id, values_.size());
-    values_.push_back({SymbolicScalar(), &open});
+    markOpen(id);
     frames_.push_back({&node, id, value, invalidId, 0, 1, ScalarRuleIndex::None, true});
 }
 
 /// Makes the value of the topmost frame's node from those of its operands, and remembers it.
 void SymbolicExprEvalImpl::leave() {
     const Frame& done = frames_.back();
-    if (done.isSymbol) {
+    if (done.rule != ScalarRuleIndex::None)
+        combine(*done.node, done.rule);
+    else if (!done.isSymbol)
+        pushList(*done.node);
+    if (done.id != invalidId)
         known_.insert(done.id, stack_.back());
-    } else {
-        if (done.rule != ScalarRuleIndex::None)
-            combine(*done.node, done.rule);
-        else
-            pushList(*done.node);
-        known_.insert(done.id, stack_.back());
-    }
     frames_.pop_back();
-}
-
-void SymbolicExprEvalImpl::on(const SymbolicString& node) {
-    pushSymbol(node);
-}
-
-void SymbolicExprEvalImpl::on(const SymbolicIntValue& node) {
-    push(SymbolicScalar(node.getValue()));
-}
-
-void SymbolicExprEvalImpl::on(const SymbolicDoubleValue& node) {
-    push(SymbolicScalar(node.getValue()));
-}
-
-void SymbolicExprEvalImpl::on(const SymbolicMemberValue& node) {
-    if (!stack_.empty()) // the owner's value, where the walk went there
-        stack_.pop_back();
-    pushSymbol(node);
-}
-
-/// The value of a symbol in a walk that does not follow bindings.
-void SymbolicExprEvalImpl::pushSymbol(const SymbolicExpr& node) {
-    const SymbolicExprId id = node.getId(table_);
-    if (!table_.has(id))
-        detail::throwUnboundSymbol(table_, node);
-    evaluateToStack(id);
-}
-
-void SymbolicExprEvalImpl::on(const Symbolic2DExpr& node) {
-    pushList(node);
-}
-
-void SymbolicExprEvalImpl::on(const Symbolic3DExpr& node) {
-    pushList(node);
-}
-
-void SymbolicExprEvalImpl::on(const SymbolicNDExpr& node) {
-    pushList(node);
 }
 
 void SymbolicExprEvalImpl::pushList(const SymbolicExpr& node) {
     Elements elements(node.getNumInputs());
     for (std::size_t i = elements.size(); i-- > 0;) {
-        const Entry& entry = values_[take(node)];
+        const Entry& entry = values_[stack_.back()];
+        stack_.pop_back();
         if (entry.elements != nullptr)
             detail::throwNotEvaluable(table_, node);
         elements[i] = entry.scalar;
     }
     push(std::move(elements));
-}
-
-void SymbolicExprEvalImpl::on(const SymbolicUnaryExpr& node) {
-    pushOperator(node);
-}
-
-void SymbolicExprEvalImpl::on(const SymbolicBinaryExpr& node) {
-    pushOperator(node);
-}
-
-void SymbolicExprEvalImpl::pushOperator(const SymbolicExpr& node) {
-    const ScalarRuleIndex rule = scalarRuleIndex(node.op());
-    if (rule == ScalarRuleIndex::None)
-        detail::throwNotEvaluable(table_, node);
-    combine(node, rule);
-}
-
-void SymbolicExprEvalImpl::on(const SymbolicTernaryExpr& node) {
-    detail::throwNotEvaluable(table_, node);
-}
-
-void SymbolicExprEvalImpl::on(const SymbolicMultiExpr& node) {
-    detail::throwNotEvaluable(table_, node);
 }
 
 void SymbolicExprEvalImpl::push(Elements elements) {
@@ -215,20 +187,9 @@ void SymbolicExprEvalImpl::push(Elements elements) {
     push({}, &vectors_.front());
 }
 
-/// The value of the last operand that was not taken.
-std::size_t SymbolicExprEvalImpl::take(const SymbolicExpr& node) {
-    if (stack_.empty()) // an operand that no node stands for was not visited
-        detail::throwNotEvaluable(table_, node);
-    const std::size_t value = stack_.back();
-    stack_.pop_back();
-    return value;
-}
-
 /// Takes the operands of an operator and leaves its value.
 void SymbolicExprEvalImpl::combine(const SymbolicExpr& node, ScalarRuleIndex index) {
     const ScalarRule& rule = scalarRules[static_cast<std::size_t>(index)];
-    if (stack_.size() < rule.operands) // an operand that no node stands for was not visited
-        detail::throwNotEvaluable(table_, node);
     const Entry& right = values_[stack_.back()];
     const Entry& left = values_[stack_[stack_.size() - rule.operands]];
     stack_.resize(stack_.size() - rule.operands);

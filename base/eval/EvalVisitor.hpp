@@ -9,11 +9,16 @@
 
 #include <cstddef>
 #include <forward_list>
+#include <optional>
 
 namespace VT {
 
-/// Computes the value of an expression bottom-up: each visit takes the values of its node's operands from a stack and
-/// leaves the value of the node.
+namespace detail {
+enum class Evaluation : std::uint8_t;
+}
+
+/// Computes the value of an expression bottom-up: the values of a node's operands are taken from a stack, and the value
+/// of the node is left there.
 ///
 /// Evaluable are literals, symbols, the operators of scalarRules and lists of dimensions, whose elements are scalars.
 /// A scalar and a vector combine element by element, and so do two vectors of one length.  "true" and "false" are truth
@@ -25,9 +30,15 @@ namespace VT {
 ///     Vantor:SymbolicDims:NotEvaluable    a node of another class, a list in a list, an identifier that is no node's
 ///     Vantor:SymbolicDims:SizeMismatch    two vectors of different lengths
 ///
-/// Either evaluate(), which visits each distinct node once in the visitor's life, or a run by node.accept(table,
-/// visitor) or visitor.execute(table, id), which visit a shared operand once for every path to it, and then get().
-/// What was evaluated is remembered: bindings are not to change during the visitor's life.
+/// Of several faults the one that is met first counts, where a node is met before its operands and these from left to
+/// right.  A node without a value is not looked into, and neither is the owner of a member.
+///
+/// Either evaluate(), or a run by node.accept(table, visitor) or visitor.execute(table, id) and then get().  Both
+/// answer the same and report the same.  Such a run visits what evaluate() passes over, such as the owner of a member,
+/// so its visits compute nothing: get() evaluates the node that was visited last, which is the root.
+///
+/// Each distinct node is evaluated once in the visitor's life and its value is remembered: bindings are not to change
+/// meanwhile.
 class VTSYM_API SymbolicExprEvalImpl : public RoutedVisitor<SymbolicExprEvalImpl> {
 public:
     /// `table` outlives the visitor.
@@ -41,25 +52,12 @@ public:
     /// on.
     SymbolicValue evaluate(SymbolicExprId id);
 
-    /// The value of the run that was completed last, taken from the stack.  Throws "Vantor:SymbolicDims:NotEvaluable"
-    /// where nothing was visited.
+    /// The value of the run that was completed last; it can be asked for once.  Throws like evaluate(), and
+    /// "Vantor:SymbolicDims:NotEvaluable" where nothing was visited.
     SymbolicValue get();
 
-    // One function for each way to a value.
-
-    void on(const SymbolicString& node);
-    void on(const SymbolicIntValue& node);
-    void on(const SymbolicDoubleValue& node);
-    void on(const SymbolicMemberValue& node);
-    void on(const Symbolic2DExpr& node);
-    void on(const Symbolic3DExpr& node);
-    void on(const SymbolicNDExpr& node);
-    /// An operator with a scalar rule.
-    void on(const SymbolicUnaryExpr& node);
-    void on(const SymbolicBinaryExpr& node);
-    /// Nodes without a value.
-    void on(const SymbolicTernaryExpr& node);
-    void on(const SymbolicMultiExpr& node);
+    /// Takes note of a node.  One that is not of the table is evaluated at once, because it need not live until get().
+    void on(const SymbolicExpr& node);
 
 private:
     using Elements = SymbolicValue::Elements;
@@ -82,15 +80,17 @@ private:
         bool isSymbol;
     };
 
-    void evaluateToStack(SymbolicExprId id);
+    template <class Enter>
+    SymbolicValue evaluateFrom(Enter enterRoot);
+    [[nodiscard]] SymbolicValue takeValue();
     void enter(SymbolicExprId id, const Frame* parent);
+    void enterNode(SymbolicExprId id, const SymbolicExpr& node, SymbolicOp op, detail::Evaluation way);
+    void markOpen(SymbolicExprId id);
     void enterOperands(SymbolicExprId id, const SymbolicExpr& node, SymbolicOp op);
     void enterSymbol(SymbolicExprId id, const SymbolicExpr& node, bool isMember);
     void leave();
 
-    void pushSymbol(const SymbolicExpr& node);
     void pushList(const SymbolicExpr& node);
-    void pushOperator(const SymbolicExpr& node);
 
     void push(const SymbolicScalar& scalar) { push(scalar, nullptr); }
 
@@ -100,7 +100,6 @@ private:
     }
 
     void push(Elements elements);
-    std::size_t take(const SymbolicExpr& node);
     void combine(const SymbolicExpr& node, ScalarRuleIndex index);
     void combineElements(const SymbolicExpr& node, const ScalarRule& rule, const Entry& left, const Entry& right);
 
@@ -112,6 +111,10 @@ private:
     IdMap<std::size_t> known_;            ///< the values of nodes but literals
     std::forward_list<Elements> vectors_; ///< of the entries
     std::size_t elementCount_ = 0;        ///< in them
+
+    // What get() answers: the value of a node of the table, or one that is known already.
+    SymbolicExprId visited_ = invalidId;
+    std::optional<SymbolicValue> visitedValue_;
 };
 
 } // namespace VT

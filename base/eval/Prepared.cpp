@@ -126,15 +126,35 @@ void PreparedExpr::setVector(std::size_t slot, const SymbolicValue::Elements& el
 }
 
 SymbolicValue PreparedExpr::run() {
-    if (!settled_)
+    if (!settled_) {
+        if (!complete_)
+            return runFirst();
         settle();
+    }
+    return compute();
+}
+
+/// A run in which slots that were not set take their values from the table, and keep them where it succeeds.
+SymbolicValue PreparedExpr::runFirst() {
+    const std::vector<std::size_t> taken = emptySlots();
+    try {
+        takeValues(taken);
+        settle();
+        SymbolicValue value = compute();
+        complete_ = true;
+        return value;
+    } catch (...) {
+        giveUpValues(taken);
+        throw;
+    }
+}
+
+SymbolicValue PreparedExpr::compute() {
     detail::execute(operations_.data(), cells_.data(), cells_.data() + firstResult_);
     return result();
 }
 
 void PreparedExpr::settle() {
-    if (!complete_)
-        takeMissingValues();
     if (!laidOut_) {
         PreparedExprLayout(*this).install(*this);
         laidOut_ = true;
@@ -143,13 +163,29 @@ void PreparedExpr::settle() {
     settled_ = true;
 }
 
-/// Gives the slots that were not set the values that their symbols have in the table.
-void PreparedExpr::takeMissingValues() {
-    SymbolicExprEvalImpl evaluator(*table_);
+std::vector<std::size_t> PreparedExpr::emptySlots() const {
+    std::vector<std::size_t> slots;
     for (std::size_t slot = 0; slot < slotCount(); ++slot)
         if (holdings_[slot] == Holding::Nothing)
-            set(slot, evaluator.evaluate(symbols_[slot]));
-    complete_ = true;
+            slots.push_back(slot);
+    return slots;
+}
+
+/// Gives slots the values that their symbols have in the table.
+void PreparedExpr::takeValues(const std::vector<std::size_t>& slots) {
+    SymbolicExprEvalImpl evaluator(*table_);
+    for (const std::size_t slot : slots)
+        set(slot, evaluator.evaluate(symbols_[slot]));
+}
+
+void PreparedExpr::giveUpValues(const std::vector<std::size_t>& slots) noexcept {
+    for (const std::size_t slot : slots) {
+        holdings_[slot] = Holding::Nothing;
+        if (!vectors_.empty())
+            vectors_[slot].clear();
+    }
+    laidOut_ = false;
+    settled_ = false;
 }
 
 /// Chooses the code of each operation by the types of its operands.

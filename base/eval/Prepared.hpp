@@ -55,7 +55,8 @@ public:
 
     /// The value of the expression.  Throws "Vantor:SymbolicDims:UnboundSymbol" or ":CyclicValue" for a slot that was
     /// not set and cannot take a value from the table, ":SizeMismatch" and ":NotEvaluable" where vectors do not fit,
-    /// and std::length_error beyond limits::evaluatedElements; the slots stay as they are then.
+    /// and std::length_error beyond limits::evaluatedElements.  The slots stay as they were then: those that were not
+    /// set ask the table again.  Of several faults it may name another one than SymbolicExprEval::eval().
     [[nodiscard]] SymbolicValue run();
 
 private:
@@ -99,7 +100,11 @@ private:
     void hold(std::size_t slot, Holding holding);
     void setVector(std::size_t slot, const SymbolicValue::Elements& elements);
     [[nodiscard]] Source sourceOf(SymbolicExprId id, const SymbolicExpr& node);
-    void takeMissingValues();
+    [[nodiscard]] std::vector<std::size_t> emptySlots() const;
+    void takeValues(const std::vector<std::size_t>& slots);
+    void giveUpValues(const std::vector<std::size_t>& slots) noexcept;
+    [[nodiscard]] SymbolicValue runFirst();
+    [[nodiscard]] SymbolicValue compute();
     void settle();
     void settleTypes();
     [[nodiscard]] SymbolicValue result() const;

@@ -1,5 +1,9 @@
 // Values of expressions and their arithmetic, which is total: every operator answers every pair of scalars.
 //
+// Sums, differences and products of doubles, and quotients by what does not count as zero, are those of IEEE 754:
+// infinity minus infinity, zero times infinity and infinity by infinity are NaN.  A divisor that counts as zero, or is
+// NaN, makes an infinity.
+//
 // The rules know nothing of nodes.  They are functions over bool, int and double, one for each operator; scalarRules
 // holds them for every pair of operand types, with the type of the result.
 #pragma once

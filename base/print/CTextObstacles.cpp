@@ -1,9 +1,14 @@
 #include "base/print/CTextObstacles.hpp"
 
+#include "base/core/IdMap.hpp"
 #include "base/core/Walk.hpp"
 #include "base/print/PreprocessorVCExpr.hpp"
+#include "base/variants/VariantKeywords.hpp"
 
 #include <algorithm>
+#include <array>
+#include <cmath>
+#include <string_view>
 
 namespace VT {
 
@@ -20,11 +25,38 @@ constexpr OperatorSet notInC = [] {
     return set;
 }();
 
+/// The keywords of C, sorted; `true` and `false` are constants here.
+// clang-format off
+constexpr auto keywordsOfC = std::to_array<std::string_view>({
+    "_Alignas", "_Alignof", "_Atomic", "_BitInt", "_Bool", "_Complex", "_Decimal128", "_Decimal32", "_Decimal64",
+    "_Generic", "_Imaginary", "_Noreturn", "_Static_assert", "_Thread_local", "alignas", "alignof", "auto",
+    "bool", "break", "case", "char", "const", "constexpr", "continue", "default", "do", "double", "else", "enum",
+    "extern", "float", "for", "goto", "if", "inline", "int", "long", "nullptr", "register", "restrict", "return",
+    "short", "signed", "sizeof", "static", "static_assert", "struct", "switch", "thread_local", "typedef",
+    "typeof", "typeof_unqual", "union", "unsigned", "void", "volatile", "while"
+});
+// clang-format on
+static_assert(std::ranges::is_sorted(keywordsOfC));
+
+constexpr std::string_view definedOperator = "defined";
+
+bool isWord(std::string_view text) {
+    return std::ranges::all_of(text, [](unsigned char c) {
+        return (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9') || c == '_' || c >= 0x80;
+    });
+}
+
+/// Letters beyond ASCII are left to the compiler.
+bool isIdentifier(std::string_view text) {
+    return !text.empty() && isWord(text) && (text.front() < '0' || text.front() > '9');
+}
+
 class Finder {
 public:
     Finder(const SymbolicExprTable& table, CTextUse use, const SymbolicExprPrinter::PredicateHandle& predicate)
         : table_(table),
           use_(use),
+          predicate_(predicate),
           printer_(table, false, true, predicate) {}
 
     std::vector<CTextFinding> find(SymbolicExprId root);
@@ -33,16 +65,35 @@ private:
     void look(SymbolicExprId id, const SymbolicExpr& node);
     void occurs(SymbolicExprId id, const SymbolicExpr* parent);
     void note(CTextObstacle obstacle, SymbolicExprId id, SymbolicExprId other = invalidId);
+    void lookAtName(SymbolicExprId id, const SymbolicString& name);
+    void lookAtMember(SymbolicExprId id, const SymbolicMemberValue& member);
+    void lookAtCall(SymbolicExprId id, const SymbolicExpr& call);
     void compareNames();
-    [[nodiscard]] bool isZeroOrOne(SymbolicExprId id) const;
+    [[nodiscard]] bool isZeroOrOne(SymbolicExprId id);
+    [[nodiscard]] bool isNamed(SymbolicExprId id);
+    [[nodiscard]] bool isReserved(std::string_view word) const;
+
+    [[nodiscard]] bool inDirective() const noexcept { return use_ == CTextUse::Directive; }
 
     [[nodiscard]] SymbolicOp op(SymbolicExprId id) const {
-        return table_.has(id) ? table_.get(id)->op() : SymbolicOp::None;
+        const SymbolicExpr* const node = table_.get(id);
+        return node != nullptr ? node->op() : SymbolicOp::None;
     }
+
+    /// What C makes of the text of an identifier; all false for any other node.
+    struct Words {
+        bool isTruth = false; ///< `true` or `false`
+        bool isIdentifier = false;
+        bool isReserved = false; ///< a word that C, or the preprocessor, keeps to itself
+    };
+
+    Words wordsOf(SymbolicExprId id);
 
     const SymbolicExprTable& table_;
     CTextUse use_;
+    const SymbolicExprPrinter::PredicateHandle& predicate_;
     PreprocessorVCExpr printer_;
+    IdMap<Words> looked_;               ///< at identifiers, which may be long and occur often
     std::vector<SymbolicExprId> names_; ///< what becomes a name in the text
     std::vector<CTextFinding> findings_;
 };
@@ -56,16 +107,14 @@ void Finder::note(CTextObstacle obstacle, SymbolicExprId id, SymbolicExprId othe
 }
 
 /// Whether & and | of an operand are the same bit by bit.
-bool Finder::isZeroOrOne(SymbolicExprId id) const {
+bool Finder::isZeroOrOne(SymbolicExprId id) {
     const SymbolicOp kind = op(id);
     if (kind == SymbolicOp::IntValue) {
         const int value = static_cast<const SymbolicIntValue&>(*table_.get(id)).getValue();
         return value == 0 || value == 1;
     }
-    if (kind == SymbolicOp::String) {
-        const std::string& name = static_cast<const SymbolicString&>(*table_.get(id)).getName();
-        return name == "true" || name == "false";
-    }
+    if (kind == SymbolicOp::String)
+        return wordsOf(id).isTruth;
     return booleanOps.contains(kind);
 }
 
@@ -79,25 +128,78 @@ void Finder::look(SymbolicExprId id, const SymbolicExpr& node) {
     // C's | binds weaker than its ^, unlike the element-wise one.
     if (kind == SymbolicOp::BitXOr && op(node.getInput(0)) == SymbolicOp::SingleOr)
         note(CTextObstacle::BitwiseLogic, node.getInput(0));
-    if (use_ == CTextUse::Program)
-        return;
-    if (kind == SymbolicOp::DoubleValue)
+    if (kind == SymbolicOp::DoubleValue &&
+        (inDirective() || !std::isfinite(static_cast<const SymbolicDoubleValue&>(node).getValue())))
         note(CTextObstacle::RealConstant, id);
-    if (kind == SymbolicOp::MemberValue) {
-        const SymbolicOp owner = op(node.getInput(0));
-        if (owner != SymbolicOp::MemberValue && owner != SymbolicOp::String)
-            note(CTextObstacle::MemberOfNoName, id);
-    }
-    if (callOps.contains(kind) && (node.getNumInputs() == 0 || op(node.getInput(0)) != SymbolicOp::String))
+    if (kind == SymbolicOp::String)
+        lookAtName(id, static_cast<const SymbolicString&>(node));
+    if (kind == SymbolicOp::MemberValue)
+        lookAtMember(id, static_cast<const SymbolicMemberValue&>(node));
+    if (callOps.contains(kind))
+        lookAtCall(id, node);
+}
+
+Finder::Words Finder::wordsOf(SymbolicExprId id) {
+    if (op(id) != SymbolicOp::String)
+        return {};
+    if (const Words* const known = looked_.find(id))
+        return *known;
+    const std::string text = predicate_.printIdentifier(static_cast<const SymbolicString&>(*table_.get(id)));
+    return looked_.insert(id, {text == "true" || text == "false", isIdentifier(text), isReserved(text)});
+}
+
+/// Whether what stands before a point or an argument list is written so that C can read it.  Members are looked at
+/// themselves.
+bool Finder::isNamed(SymbolicExprId id) {
+    const SymbolicOp kind = op(id);
+    if (kind == SymbolicOp::String)
+        return !wordsOf(id).isTruth && (!inDirective() || wordsOf(id).isIdentifier);
+    return kind == SymbolicOp::MemberValue || (!inDirective() && callOps.contains(kind));
+}
+
+/// Whether C, or the preprocessor, keeps a word to itself.
+bool Finder::isReserved(std::string_view word) const {
+    return inDirective() ? word == definedOperator : std::ranges::binary_search(keywordsOfC, word);
+}
+
+/// A text that a predicate has chosen is the host's.
+void Finder::lookAtName(SymbolicExprId id, const SymbolicString& name) {
+    const std::string text = predicate_.printIdentifier(name);
+    if (VariantKeywords::isVariantKeyword(text, false))
+        note(CTextObstacle::VariantKeyword, id);
+    else if (text == name.getName() && (!isIdentifier(text) || (!inDirective() && isReserved(text))))
+        note(CTextObstacle::NoSuchName, id);
+}
+
+void Finder::lookAtMember(SymbolicExprId id, const SymbolicMemberValue& member) {
+    if (!isNamed(member.getInput(0)))
+        note(CTextObstacle::MemberOfNoName, id);
+    const std::string& name = member.getMemberName();
+    const bool isField = isIdentifier(name) && !isReserved(name) && name != "true" && name != "false";
+    if (inDirective() ? !isWord(name) : !isField)
+        note(CTextObstacle::NoSuchName, id);
+}
+
+void Finder::lookAtCall(SymbolicExprId id, const SymbolicExpr& call) {
+    const SymbolicExprId callee = call.getNumInputs() > 0 ? call.getInput(0) : invalidId;
+    if (!isNamed(callee) || (inDirective() && op(callee) != SymbolicOp::String))
         note(CTextObstacle::CalledNoName, id);
+    if (!inDirective() || !wordsOf(callee).isReserved)
+        return;
+    if (call.getNumInputs() != 2 || !isNamed(call.getInput(1)) || wordsOf(call.getInput(1)).isReserved)
+        note(CTextObstacle::DefinedNoName, id);
 }
 
 /// Takes note of a name that stands for itself rather than for the owner of a member.
 void Finder::occurs(SymbolicExprId id, const SymbolicExpr* parent) {
     const SymbolicOp kind = op(id);
-    if ((kind == SymbolicOp::String || kind == SymbolicOp::MemberValue) &&
-        (parent == nullptr || parent->op() != SymbolicOp::MemberValue))
-        names_.push_back(id);
+    if ((kind != SymbolicOp::String && kind != SymbolicOp::MemberValue) ||
+        (parent != nullptr && parent->op() == SymbolicOp::MemberValue))
+        return;
+    names_.push_back(id);
+    const bool isCalled = parent != nullptr && callOps.contains(parent->op()) && parent->getInput(0) == id;
+    if (inDirective() && !isCalled && wordsOf(id).isReserved)
+        note(CTextObstacle::NoSuchName, id);
 }
 
 /// Looks for two parameters with one text.
@@ -135,7 +237,7 @@ std::vector<CTextFinding> Finder::find(SymbolicExprId root) {
             occurs(id, parent);
         },
         [&](SymbolicExprId id, const SymbolicExpr* parent) { occurs(id, parent); });
-    if (use_ == CTextUse::Directive)
+    if (inDirective())
         compareNames();
     return std::move(findings_);
 }

@@ -18,10 +18,13 @@ enum class CTextUse : std::uint8_t {
 enum class CTextObstacle : std::uint8_t {
     NoSuchOperator,  ///< power, transpose, element-wise or left division, range, list, function: C has none
     BitwiseLogic,    ///< element-wise & or | of what may be other than 0 and 1, which C combines bit by bit
-    RealConstant,    ///< a directive knows integers only
-    MemberOfNoName,  ///< a member of anything but a name is no macro
-    CalledNoName,    ///< only a name can be the name of a macro with arguments
+    RealConstant,    ///< a directive knows integers only; C has no infinities
+    MemberOfNoName,  ///< a member of anything but a name is no macro, and in C a number has none
+    CalledNoName,    ///< only a name can be that of a macro with arguments, and in C a number is no function
     SharedMacroName, ///< two parameters become one macro
+    VariantKeyword,  ///< "(sim)" and its like would be names in parentheses
+    NoSuchName,      ///< what a name is written as is no name in C, or a word that the language keeps to itself
+    DefinedNoName,   ///< `defined` of anything but one name
 };
 
 /// An obstacle and the node it is about; `other` is the second parameter of a shared macro name.
@@ -32,8 +35,8 @@ struct CTextFinding {
 };
 
 /// The obstacles in a condition, at most one of each kind and operator; none for an identifier that is not of the
-/// table.  Calls such as defined(X) are no obstacle.  `predicate` is that of the printer.  Linear in the number of
-/// distinct nodes, but for the sorting of names.
+/// table.  Calls such as defined(X) are no obstacle.  `predicate` is that of the printer; what it writes for a name
+/// that stands alone is taken to be C.  Linear in the number of distinct nodes, but for the sorting of names.
 [[nodiscard]] VTSYM_API std::vector<CTextFinding>
 findCTextObstacles(const SymbolicExprTable& table, SymbolicExprId id, CTextUse use,
                    const SymbolicExprPrinter::PredicateHandle& predicate = {});

@@ -17,6 +17,7 @@ struct SymbolicExprPrinter::State {
     State(const SymbolicExprTable& expressions, bool quillSyntax, bool spacedLogicalOperators,
           const PredicateHandle& predicate)
         : table(expressions),
+          names(predicate),
           plainNames(predicate.isPlain()),
           stringify(expressions, quillSyntax, spacedLogicalOperators, predicate) {}
 
@@ -31,10 +32,21 @@ struct SymbolicExprPrinter::State {
         return text;
     }
 
+    /// Drops what was printed under names that are others now.
+    void followNames() {
+        if (plainNames || names.version() == version)
+            return;
+        stringify.forget();
+        finished.clear();
+        version = names.version();
+    }
+
     const SymbolicExprTable& table;
+    PredicateHandle names;
     bool plainNames;
     StringifySymbolicExpr stringify;
     boost::unordered_map<SymbolicExprId, std::string> finished;
+    std::uint64_t version = 0; ///< of the names
 };
 
 SymbolicExprPrinter::SymbolicExprPrinter(const SymbolicExprTable& table, bool quillSyntax, bool spacedLogicalOperators,
@@ -54,6 +66,7 @@ std::string SymbolicExprPrinter::operator()(const SymbolicExpr& node) const {
 }
 
 std::string SymbolicExprPrinter::printIdUsingCache(SymbolicExprId id) const {
+    state_->followNames();
     const auto found = state_->finished.find(id);
     if (found != state_->finished.end())
         return found->second;
@@ -61,10 +74,12 @@ std::string SymbolicExprPrinter::printIdUsingCache(SymbolicExprId id) const {
 }
 
 std::uint64_t SymbolicExprPrinter::textLength(SymbolicExprId id) const {
+    state_->followNames();
     return state_->stringify.texts().length(state_->stringify.printed(id).text);
 }
 
 int SymbolicExprPrinter::compareUsingCache(SymbolicExprId left, SymbolicExprId right) const {
+    state_->followNames();
     const Text leftText = state_->stringify.printed(left).text;
     const Text rightText = state_->stringify.printed(right).text;
     if (left == right)

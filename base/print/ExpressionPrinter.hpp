@@ -26,6 +26,9 @@ public:
     public:
         [[nodiscard]] virtual std::string printIdentifier(const SymbolicString& node) const;
         virtual ~Predicate();
+        /// A number that is another one once texts have changed, so that printers drop those that they keep.  The base
+        /// answers 0: texts never change.
+        [[nodiscard]] virtual std::uint64_t version() const;
     };
 
     /// The predicate of a printer: one of the caller's, which outlives the printer, or a temporary, which is kept.
@@ -48,6 +51,7 @@ public:
         /// Whether every identifier is printed as its name.
         [[nodiscard]] bool isPlain() const;
         [[nodiscard]] std::string printIdentifier(const SymbolicString& node) const;
+        [[nodiscard]] std::uint64_t version() const;
 
     private:
         std::shared_ptr<const Predicate> predicate_;
@@ -66,8 +70,10 @@ public:
     [[nodiscard]] std::string operator()(SymbolicExprId id) const;
     /// The text of a node whose operands are of the table; it need not be there itself.
     [[nodiscard]] std::string operator()(const SymbolicExpr& node) const;
-    /// The same as printing the identifier, from a store of finished texts that lives as long as the printer.  A text
-    /// that is stored stays even where the predicate would now name an identifier differently.
+    /// The same as printing the identifier, from a store of finished texts that lives as long as the printer.  The
+    /// store is emptied when the predicate has another version, so that it follows new aliases.  Under a predicate that
+    /// names identifiers differently without another version a stored text stays, and so do the lengths and the order
+    /// below.
     [[nodiscard]] std::string printIdUsingCache(SymbolicExprId id) const;
 
     /// Bytes of the text of an expression, without writing it; numbers from 2^62 on are all 2^62.  Linear in the nodes

@@ -1,6 +1,7 @@
 // A sparse array over identifiers, for memos that live long.
 #pragma once
 
+#include "base/core/IdMap.hpp"
 #include "base/core/Node.hpp"
 #include "base/print/PlainVector.hpp"
 
@@ -12,7 +13,8 @@
 namespace VT {
 
 /// Values by identifier, in pages that come into being where an identifier is first stored.  Identifiers are dense and
-/// those of one expression lie close together, so pages fill well and neighbours share cache lines.
+/// those of one expression lie close together, so pages fill well and neighbours share cache lines.  Those that a
+/// host's table may have beyond any dense ones cost more, but no more memory.
 template <class Value>
 class IdPages {
 public:
@@ -22,9 +24,10 @@ public:
         if (id / pageSize == lastNumber_)
             return &pages_[lastPage_][id % pageSize];
         const SymbolicExprId outer = id / (pageSize * chapterSize);
-        if (outer >= root_.size() || root_[outer] == 0)
+        const std::uint32_t* const chapter = outer < root_.size() ? &root_[outer] : farRoot_.find(outer);
+        if (chapter == nullptr || *chapter == 0)
             return nullptr;
-        const std::uint32_t page = chapters_[root_[outer] - 1][id / pageSize % chapterSize];
+        const std::uint32_t page = chapters_[*chapter - 1][id / pageSize % chapterSize];
         return page == 0 ? nullptr : &pages_[page - 1][id % pageSize];
     }
 
@@ -43,6 +46,7 @@ public:
 
     void clear() noexcept {
         root_.clear();
+        farRoot_.clear();
         chapters_.clear();
         pages_.clear();
         lastNumber_ = none;
@@ -51,20 +55,31 @@ public:
 private:
     static constexpr std::size_t pageSize = 16;
     static constexpr std::size_t chapterSize = 64;
+    static constexpr SymbolicExprId denseChapters = SymbolicExprId{1} << 22U; ///< of as many nodes as a table can hold
     static constexpr SymbolicExprId none = std::numeric_limits<SymbolicExprId>::max();
 
     /// Makes the page of an identifier the last one, and makes it if it was not there.
     void turnTo(SymbolicExprId id) {
         const SymbolicExprId outer = id / (pageSize * chapterSize);
-        if (outer >= root_.size())
-            addZeros(root_, outer + 1 - root_.size());
-        if (root_[outer] == 0)
-            root_[outer] = addZeros(chapters_, 1);
-        std::uint32_t& page = chapters_[root_[outer] - 1][id / pageSize % chapterSize];
+        std::uint32_t& chapter = chapterOf(outer);
+        if (chapter == 0)
+            chapter = addZeros(chapters_, 1);
+        std::uint32_t& page = chapters_[chapter - 1][id / pageSize % chapterSize];
         if (page == 0)
             page = addZeros(pages_, 1);
         lastPage_ = page - 1;
         lastNumber_ = id / pageSize;
+    }
+
+    /// The number of a chapter, 0 for a new one.
+    std::uint32_t& chapterOf(SymbolicExprId outer) {
+        if (outer >= denseChapters) {
+            std::uint32_t* const known = farRoot_.find(outer);
+            return known != nullptr ? *known : farRoot_.insert(outer, 0);
+        }
+        if (outer >= root_.size())
+            addZeros(root_, outer + 1 - root_.size());
+        return root_[outer];
     }
 
     /// The number of elements behind the addition: the number of a page or chapter, from 1 on.
@@ -75,6 +90,7 @@ private:
     }
 
     PlainVector<std::uint32_t> root_;                              ///< numbers of chapters; 0 for none
+    IdMap<std::uint32_t> farRoot_;                                 ///< the same beyond the dense ones
     PlainVector<std::array<std::uint32_t, chapterSize>> chapters_; ///< numbers of pages; 0 for none
     PlainVector<std::array<Value, pageSize>> pages_;
     SymbolicExprId lastNumber_ = none; ///< id / pageSize of the page that at() wrote last

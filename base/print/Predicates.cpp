@@ -19,6 +19,10 @@ std::string SymbolicExprPrinter::Predicate::printIdentifier(const SymbolicString
 
 SymbolicExprPrinter::Predicate::~Predicate() = default;
 
+std::uint64_t SymbolicExprPrinter::Predicate::version() const {
+    return 0;
+}
+
 bool SymbolicExprPrinter::PredicateHandle::isPlain() const {
     const Predicate* const predicate = predicate_.get();
     return predicate == nullptr || typeid(*predicate) == typeid(Predicate);
@@ -28,12 +32,24 @@ std::string SymbolicExprPrinter::PredicateHandle::printIdentifier(const Symbolic
     return predicate_ == nullptr ? node.getName() : predicate_->printIdentifier(node);
 }
 
+std::uint64_t SymbolicExprPrinter::PredicateHandle::version() const {
+    return predicate_ == nullptr ? 0 : predicate_->version();
+}
+
 std::string SymbolicExprAliasPrinterPredicate::printIdentifier(const SymbolicString& node) const {
     return aliasOrName(*aliases_, node);
 }
 
+std::uint64_t SymbolicExprAliasPrinterPredicate::version() const {
+    return aliases_->aliasCount();
+}
+
 std::string InlineVariantParameterAliasPrinterPredicate::printIdentifier(const SymbolicString& node) const {
     return aliasOrName(*aliases_, node);
+}
+
+std::uint64_t InlineVariantParameterAliasPrinterPredicate::version() const {
+    return aliases_->aliasCount();
 }
 
 } // namespace VT

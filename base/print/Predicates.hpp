@@ -13,6 +13,8 @@ public:
     explicit SymbolicExprAliasPrinterPredicate(const SymbolicExprTable& aliases) : aliases_(&aliases) {}
 
     [[nodiscard]] std::string printIdentifier(const SymbolicString& node) const override;
+    /// The number of aliases.
+    [[nodiscard]] std::uint64_t version() const override;
 
 private:
     const SymbolicExprTable* aliases_;
@@ -25,6 +27,8 @@ public:
     explicit InlineVariantParameterAliasPrinterPredicate(const SymbolicExprTable& aliases) : aliases_(&aliases) {}
 
     [[nodiscard]] std::string printIdentifier(const SymbolicString& node) const override;
+    /// The number of aliases.
+    [[nodiscard]] std::uint64_t version() const override;
 
 private:
     const SymbolicExprTable* aliases_;

@@ -55,7 +55,7 @@ void StringifyImpliedCondition::learn(SymbolicExprId known) {
         const bool isNot = node.op() == SymbolicOp::Not;
         if (isNot || node.op() == (fact.holds ? SymbolicOp::And : SymbolicOp::Or)) {
             for (std::size_t i = node.getNumInputs(); i-- > 0;)
-                if (node.getInput(i) < fact.id)
+                if (table_.hasOperand(fact.id, node.getInput(i)))
                     pending.push_back({node.getInput(i), fact.holds != isNot});
         }
     }

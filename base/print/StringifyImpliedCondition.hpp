@@ -37,9 +37,10 @@ public:
 #undef VTSYM_OPERATOR
 
     /// The text of the condition that was visited last; throws like the base.
-    [[nodiscard]] std::string get() const;
+    [[nodiscard]] std::string get() const override;
+    using PreprocessorVCExpr::print;
     /// Prints a condition of the table; throws like the base.
-    [[nodiscard]] std::string print(SymbolicExprId id);
+    [[nodiscard]] std::string print(SymbolicExprId id) override;
     void forget() override;
 
 private:

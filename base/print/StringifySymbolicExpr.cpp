@@ -28,6 +28,8 @@ constexpr std::size_t firstNodes = 2048;
 /// Where a sign in front of a literal binds like a prefix operator.
 constexpr unsigned char signPrecedence = operatorInfo(SymbolicOp::UnaryMinus).precedence;
 
+constexpr unsigned char fieldPrecedence = operatorInfo(SymbolicOp::MemberValue).precedence;
+
 bool isLiteral(const StringifySymbolicExpr::Printed& printed) {
     return printed.op == SymbolicOp::IntValue || printed.op == SymbolicOp::DoubleValue;
 }
@@ -89,6 +91,16 @@ bool StringifySymbolicExpr::pushKnown(SymbolicExprId id) {
 }
 
 StringifySymbolicExpr::Printed StringifySymbolicExpr::printed(SymbolicExprId id) {
+    if (!plainNames_)
+        if (const std::uint64_t version = predicate_.version(); version != knownUnder_) {
+            known_.clear(); // texts stay, for those who hold them
+            knownUnder_ = version;
+        }
+    return printedOnce(id);
+}
+
+/// The same while a walk may be under way.
+StringifySymbolicExpr::Printed StringifySymbolicExpr::printedOnce(SymbolicExprId id) {
     const StackDepth depth(stack_);
     if (pushKnown(id))
         return stack_.back();
@@ -115,8 +127,12 @@ std::string StringifySymbolicExpr::print(SymbolicExprId id) {
 
 std::string StringifySymbolicExpr::print(const SymbolicExpr& node) {
     const StackDepth depth(stack_);
-    for (std::size_t i = 0; i < node.getNumInputs(); ++i)
+    const SymbolicExprId id = table_.lookup(&node);
+    for (std::size_t i = 0; i < node.getNumInputs(); ++i) {
+        if (!table_.hasOperand(id, node.getInput(i)))
+            throwNoSuchExpression();
         push(printed(node.getInput(i)));
+    }
     node.invoke(*this);
     return get();
 }
@@ -183,9 +199,13 @@ void StringifySymbolicExpr::appendDouble(double value) {
 
 // Operators.
 
-/// Whether what follows a negative literal would bind tighter than its sign.
-bool StringifySymbolicExpr::losesSign(const Printed& operand, unsigned char precedence) const {
-    return precedence < signPrecedence && isLiteral(operand) && texts_.beginsWith(operand.text, '-');
+/// Whether a literal needs parentheses before what follows it: that binds tighter than its sign, or is a field or
+/// arguments, which no number has.
+bool StringifySymbolicExpr::needsParentheses(const Printed& operand, unsigned char precedence) const {
+    if (!isLiteral(operand) || precedence >= signPrecedence)
+        return false;
+    const bool isWord = texts_.beginsWith(operand.text, 'I') || texts_.beginsWith(operand.text, 'N'); // Inf, NaN
+    return texts_.beginsWith(operand.text, '-') || (precedence <= fieldPrecedence && !isWord);
 }
 
 StringifySymbolicExpr::Delimiters
@@ -205,7 +225,7 @@ StringifySymbolicExpr::Printed StringifySymbolicExpr::createBinaryExpr(const Sym
     const std::string_view bare = spelling;
     // Two signs would join.
     const bool signBehindSign = !delimiters.spaced && bare.ends_with('-') && texts_.beginsWith(rhs.text, '-');
-    const Text left = delimiters.wrapLeft || losesSign(lhs, precedence) ? wrapped(lhs.text) : lhs.text;
+    const Text left = delimiters.wrapLeft || needsParentheses(lhs, precedence) ? wrapped(lhs.text) : lhs.text;
     const Text right = delimiters.wrapRight || signBehindSign ? wrapped(rhs.text) : rhs.text;
     if (!delimiters.spaced)
         return {op, texts_.infix(left, bare, right), precedence};
@@ -234,8 +254,8 @@ void StringifySymbolicExpr::appendBinary(const SymbolicOp& op, const char* spell
 StringifySymbolicExpr::Printed StringifySymbolicExpr::unary(SymbolicOp op, std::string_view spelling,
                                                             unsigned char precedence, bool prefix,
                                                             const Printed& operand) {
-    const bool sign =
-        prefix ? spelling.ends_with('-') && texts_.beginsWith(operand.text, '-') : losesSign(operand, precedence);
+    const bool sign = prefix ? spelling.ends_with('-') && texts_.beginsWith(operand.text, '-')
+                             : needsParentheses(operand, precedence);
     const bool minusZero = op == SymbolicOp::UnaryMinus && operand.op == SymbolicOp::IntValue &&
                            texts_.length(operand.text) == 1 && texts_.beginsWith(operand.text, '0');
     if (minusZero)
@@ -280,8 +300,9 @@ void StringifySymbolicExpr::appendCellArray(const SymbolicExpr& node) {
 
 StringifySymbolicExpr::Printed StringifySymbolicExpr::call(SymbolicOp op, const Printed& callee,
                                                            std::span<const Printed> arguments) {
-    const Text name =
-        callee.precedence > leafPrecedence || losesSign(callee, leafPrecedence) ? wrapped(callee.text) : callee.text;
+    const Text name = callee.precedence > leafPrecedence || needsParentheses(callee, leafPrecedence)
+                          ? wrapped(callee.text)
+                          : callee.text;
     if (arguments.empty())
         return {op, texts_.enclose("", name, "()"), leafPrecedence};
     const std::array<Text, 2> parts{name, list(arguments, "", ",", "")};
@@ -318,7 +339,7 @@ StringifySymbolicExpr::Printed StringifySymbolicExpr::shiftAmount(const Symbolic
     case ShiftAmount::Form::Expression:
         break;
     }
-    return converted.expression == shift.getInput(1) ? amount : insideCall(printed(converted.expression));
+    return converted.expression == shift.getInput(1) ? amount : insideCall(printedOnce(converted.expression));
 }
 
 void StringifySymbolicExpr::PrintQExprFromCExpr(const SymbolicExpr& node) {

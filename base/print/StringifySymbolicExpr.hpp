@@ -9,6 +9,7 @@
 
 #include <boost/container/small_vector.hpp>
 
+#include <cstdint>
 #include <span>
 #include <string>
 #include <string_view>
@@ -22,6 +23,9 @@ namespace VT {
 ///
 /// A visitor serves one print: node.accept(table, visitor) or visitor.execute(table, id), then get().  Those visit a
 /// shared operand once for every path to it; print() visits each distinct node once.
+///
+/// A derived printer overrides visits, the joining of operands and what is answered; all of it works through a
+/// reference to this class.
 class VTSYM_API StringifySymbolicExpr : public SymbolicExprVisitor {
 public:
     /// A printed expression: what the node is, its text, and how strongly the outermost operator binds (0 for what
@@ -56,13 +60,13 @@ public:
     /// The text of the expression that was visited last.  Throws std::out_of_range where nothing was visited, because
     /// the identifier was not of the table, and std::length_error for a text beyond the bound, before memory is taken
     /// for it.
-    [[nodiscard]] std::string get() const;
+    [[nodiscard]] virtual std::string get() const;
 
     /// Prints an expression of the table; visits each distinct node once, and none that an earlier print() or printed()
-    /// met. Throws like get().
-    [[nodiscard]] std::string print(SymbolicExprId id);
+    /// met under names of the same version. Throws like get().
+    [[nodiscard]] virtual std::string print(SymbolicExprId id);
     /// Prints a node whose operands are of the table.
-    [[nodiscard]] std::string print(const SymbolicExpr& node);
+    [[nodiscard]] virtual std::string print(const SymbolicExpr& node);
     /// The printed form of an expression of the table.  Throws std::out_of_range where the table has none.
     Printed printed(SymbolicExprId id);
     /// Forgets the nodes met by print() and printed(), and their texts.
@@ -79,7 +83,8 @@ public:
 
 protected:
     /// Takes the right operand, then the left one, from the stack and pushes the operation.
-    void appendBinary(const SymbolicOp& op, const char* spelling, unsigned char precedence, OpAssociativity assoc);
+    virtual void appendBinary(const SymbolicOp& op, const char* spelling, unsigned char precedence,
+                              OpAssociativity assoc);
     /// Takes the operand and pushes the operation.  Minus an integer literal 0 is that 0.
     void appendUnary(const SymbolicOp& op, const char* spelling, unsigned char precedence, OpAssociativity assoc,
                      bool prefix);
@@ -154,11 +159,12 @@ private:
     template <class Build>
     void replaceOperands(std::size_t count, Build build);
     [[nodiscard]] bool pushKnown(SymbolicExprId id);
+    [[nodiscard]] Printed printedOnce(SymbolicExprId id);
     [[nodiscard]] std::span<const Printed> operands(std::size_t count) const;
     [[nodiscard]] Printed insideCall(const Printed& printed) const;
     void setInsideCall(Printed& printed, const Printed& form);
 
-    [[nodiscard]] bool losesSign(const Printed& operand, unsigned char precedence) const;
+    [[nodiscard]] bool needsParentheses(const Printed& operand, unsigned char precedence) const;
     void appendInteger(int value);
     void appendDouble(double value);
     [[nodiscard]] Text integer(int value);
@@ -186,6 +192,7 @@ private:
     std::vector<Printed> stack_;
     std::vector<Printed> insideCalls_; ///< the forms that inCall numbers, from 1 on
     IdPages<Known> known_;             ///< what print() and printed() met
+    std::uint64_t knownUnder_ = 0;     ///< version of the names
     std::vector<WalkFrame> frames_;
 };
 

@@ -88,8 +88,12 @@ int compareStructure(const SymbolicExprTable& table, SymbolicExprId left, Symbol
             return nodes;
         if (one.getNumInputs() == 0 || !compared.emplace(a, b).second)
             continue;
-        for (std::size_t i = one.getNumInputs(); i-- > 0;)
-            stack.emplace_back(one.getInput(i), two.getInput(i));
+        for (std::size_t i = one.getNumInputs(); i-- > 0;) {
+            const auto operand = [&](SymbolicExprId id, const SymbolicExpr& node) {
+                return table.hasOperand(id, node.getInput(i)) ? node.getInput(i) : invalidId;
+            };
+            stack.emplace_back(operand(a, one), operand(b, two));
+        }
     }
     return 0;
 }

@@ -1,20 +1,11 @@
 #include "base/scan/BranchContext.hpp"
 
+#include "base/core/Limits.hpp"
+
 #include <algorithm>
 #include <tuple>
 
 namespace VT {
-
-namespace {
-
-/// Facts about one thing that are looked at: between one and two windows, so that neighbours in a long chain look at
-/// the same ones and share what was decided.
-constexpr std::size_t window = 128;
-/// What all facts of a question may weigh: those about one thing are cheap to decide with.
-constexpr std::size_t mostWeight = 2 * window;
-constexpr std::size_t compoundWeight = 8;
-
-} // namespace
 
 void BranchContext::push(BranchFact fact) {
     const auto at = static_cast<std::uint32_t>(facts_.size());
@@ -42,14 +33,21 @@ void BranchContext::pop(std::size_t size) {
 }
 
 std::vector<std::size_t> BranchContext::related(const DirectiveCondition& condition) {
+    // Between one and two windows, so that neighbours in a long chain look at the same facts and share what was
+    // decided.
+    constexpr std::size_t window = limits::factWindow;
     std::vector<std::size_t> result;
     std::size_t weight = 0;
     ++question_;
     const auto add = [&](std::size_t fact) {
         if (marks_[fact] == question_)
             return;
-        weight += facts_[fact].unknowns.size() == 1 ? 1 : compoundWeight;
         marks_[fact] = question_;
+        const std::size_t about = facts_[fact].unknowns.size();
+        const std::size_t own = about == 1 ? 1 : limits::compoundFactWeight + about / 4;
+        if (own > limits::factWeight - weight)
+            return;
+        weight += own;
         result.push_back(fact);
     };
     const auto addAbout = [&](const std::vector<MacroUnknownId>& unknowns) {
@@ -60,12 +58,12 @@ std::vector<std::size_t> BranchContext::related(const DirectiveCondition& condit
             groupMarks_[group] = question_;
             const std::vector<std::uint32_t>& about = byGroup_[group];
             const std::size_t first = about.size() > window ? (about.size() - window) / window * window : 0;
-            for (std::size_t i = about.size(); i-- > first && weight < mostWeight;)
+            for (std::size_t i = about.size(); i-- > first && weight < limits::factWeight;)
                 add(about[i]);
         }
     };
     addAbout(condition.unknowns);
-    for (std::size_t i = 0; i < result.size() && weight < mostWeight; ++i)
+    for (std::size_t i = 0; i < result.size() && weight < limits::factWeight; ++i)
         addAbout(facts_[result[i]].unknowns);
     std::ranges::sort(result);
     return result;

@@ -1,5 +1,7 @@
 #include "base/scan/DirectiveCondition.hpp"
 
+#include "base/core/Limits.hpp"
+
 #include <algorithm>
 #include <array>
 #include <utility>
@@ -8,7 +10,6 @@ namespace VT {
 
 namespace {
 
-constexpr std::size_t mostTokens = 4096; ///< of a condition that is looked into
 constexpr std::uint8_t loosest = 255;
 
 constexpr auto infixOperators = std::to_array<std::pair<std::string_view, SymbolicOp>>({
@@ -46,12 +47,18 @@ SymbolicOp infixOf(const DirectiveToken& token) {
 }
 
 /// The operator of a prefix; Plus for a plus, None for none.
-SymbolicOp prefixOf(std::string_view text) {
+SymbolicOp prefixOf(const DirectiveToken& token) {
+    const std::string_view text = token.text;
     return text == "!" || text == "not"     ? SymbolicOp::Not
            : text == "-"                    ? SymbolicOp::UnaryMinus
            : text == "~" || text == "compl" ? SymbolicOp::BitCompl
            : text == "+"                    ? SymbolicOp::Plus
                                             : SymbolicOp::None;
+}
+
+/// Whether a condition with the token means what nothing in the file tells: #machine(x), a name spelled in another way.
+bool isUncertain(const DirectiveToken& token) {
+    return token.text == "#" || isOddName(token);
 }
 
 bool isWord(const DirectiveToken& token) {
@@ -75,10 +82,13 @@ DirectiveCondition DirectiveConditionReader::read(const Directive& directive) {
     tokens_ = directive.tokens;
     condition_ = {};
     const bool isExpression = directive.kind == DirectiveKind::If || directive.kind == DirectiveKind::Elif;
-    if (isExpression) {
-        if (tokens_.size() > mostTokens || !parse())
+    if (tokens_.empty() || tokens_.size() > limits::conditionTokens || std::ranges::any_of(tokens_, isUncertain)) {
+        condition_.understood = false;
+        condition_.node = use(unknowns_.unique("?"));
+    } else if (isExpression) {
+        if (!parse())
             readAsWhole();
-    } else if (tokens_.empty() || tokens_[0].kind != DirectiveTokenKind::Name) {
+    } else if (tokens_[0].kind != DirectiveTokenKind::Name) {
         readAsWhole();
     } else {
         condition_.node = use(unknowns_.defined(states_.nameOf(tokens_[0].text)));
@@ -91,19 +101,12 @@ DirectiveCondition DirectiveConditionReader::read(const Directive& directive) {
     return std::move(condition_);
 }
 
-/// An unknown as a whole: equal conditions are still equal, but for those beyond the bound.
+/// An unknown as a whole: equal conditions are still equal.
 void DirectiveConditionReader::readAsWhole() {
     condition_ = {};
     condition_.understood = false;
-    bool unstable = tokens_.empty() || tokens_.size() > mostTokens;
-    if (unstable) {
-        condition_.node = use(unknowns_.unique("?"));
-        return;
-    }
     const auto last = static_cast<std::uint32_t>(tokens_.size() - 1);
-    const auto names = macros(0, last, unstable);
-    condition_.node =
-        use(unstable ? unknowns_.unique("?") : unknowns_.term(text(0, last, true), text(0, last, false), names));
+    condition_.node = use(unknowns_.term(text(0, last, true), text(0, last, false), macros(0, last)));
 }
 
 // Reading.
@@ -111,11 +114,16 @@ void DirectiveConditionReader::readAsWhole() {
 bool DirectiveConditionReader::parse() {
     operands_.clear();
     operations_.clear();
+    spelled_ = 0;
     bool operandExpected = true;
     for (std::uint32_t i = 0; i < tokens_.size(); ++i) {
         const DirectiveToken& token = tokens_[i];
+        if (spelled_ > limits::conditionTexts * tokens_.size())
+            return false;
         if (operandExpected) {
-            const SymbolicOp prefix = prefixOf(token.text);
+            const SymbolicOp prefix = prefixOf(token);
+            if (isWord(token) && prefix != SymbolicOp::None && isSign(i + 1)) // in C a name: not - 1
+                return false;
             if (token.text == "(")
                 operations_.push_back({SymbolicOp::None, true, loosest, i});
             else if (prefix != SymbolicOp::None)
@@ -159,14 +167,14 @@ bool DirectiveConditionReader::readOperand(std::uint32_t& token) {
     case DirectiveTokenKind::Name:
         if (read.text == "defined")
             return readDefined(token);
-        if (infixOf(read) != SymbolicOp::None)
+        if (infixOf(read) != SymbolicOp::None || states_.isOpen(states_.nameOf(read.text)))
             return false;
         if (token + 1 < tokens_.size() && tokens_[token + 1].text == "(")
             return readCall(token);
         if (read.text == "true" || read.text == "false") { // with a value though not defined, or a macro
             if (truthConstants_)
                 constant = DirectiveConstant{read.text == "true" ? 1U : 0U, false};
-        } else if (read.text != "__LINE__" && read.text != "__COUNTER__") {
+        } else {
             operand.kind = Operand::Kind::Value;
         }
         break;
@@ -179,6 +187,11 @@ bool DirectiveConditionReader::readOperand(std::uint32_t& token) {
     }
     operands_.push_back(operand);
     return true;
+}
+
+/// Whether a token begins an operand or follows one.
+bool DirectiveConditionReader::isSign(std::uint32_t token) const {
+    return token < tokens_.size() && (tokens_[token].text == "-" || tokens_[token].text == "+");
 }
 
 bool DirectiveConditionReader::readDefined(std::uint32_t& token) {
@@ -278,13 +291,10 @@ SymbolicExprId DirectiveConditionReader::truth(const Operand& operand) {
 SymbolicExprId DirectiveConditionReader::symbol(const Operand& operand) {
     if (operand.kind == Operand::Kind::Value)
         return use(unknowns_.value(states_.nameOf(tokens_[operand.innerFirst].text)));
-    bool unstable = false;
-    const auto names = macros(operand.innerFirst, operand.innerLast, unstable);
-    std::string shown = text(operand.innerFirst, operand.innerLast, false);
-    if (unstable)
-        return use(unknowns_.unique(std::move(shown)));
+    const std::string shown = text(operand.innerFirst, operand.innerLast, false);
     return use(unknowns_.term(text(operand.innerFirst, operand.innerLast, true),
-                              operand.compound ? "(" + shown + ")" : shown, names));
+                              operand.compound ? "(" + shown + ")" : shown,
+                              macros(operand.innerFirst, operand.innerLast)));
 }
 
 SymbolicExprId DirectiveConditionReader::use(MacroUnknownId unknown) {
@@ -294,20 +304,17 @@ SymbolicExprId DirectiveConditionReader::use(MacroUnknownId unknown) {
 
 // Texts.
 
-std::string DirectiveConditionReader::text(std::uint32_t first, std::uint32_t last, bool compact) const {
+std::string DirectiveConditionReader::text(std::uint32_t first, std::uint32_t last, bool compact) {
+    spelled_ += last - first + 1;
     return spelledTokens(tokens_.subspan(first, last - first + 1), compact);
 }
 
-/// The macros that a text names; `unstable` where it may change between any two directives.
-std::vector<MacroStates::Name> DirectiveConditionReader::macros(std::uint32_t first, std::uint32_t last,
-                                                                bool& unstable) {
+/// The macros that a text names.
+std::vector<MacroStates::Name> DirectiveConditionReader::macros(std::uint32_t first, std::uint32_t last) {
     std::vector<MacroStates::Name> names;
-    for (std::uint32_t i = first; i <= last; ++i) {
-        if (tokens_[i].kind != DirectiveTokenKind::Name)
-            continue;
-        names.push_back(states_.nameOf(tokens_[i].text));
-        unstable = unstable || tokens_[i].text == "__LINE__" || tokens_[i].text == "__COUNTER__";
-    }
+    for (std::uint32_t i = first; i <= last; ++i)
+        if (tokens_[i].kind == DirectiveTokenKind::Name)
+            names.push_back(states_.nameOf(tokens_[i].text));
     return names;
 }
 

@@ -5,7 +5,8 @@
 // negative, not unsigned where it is ordered, and no more than an int.  Any other comparison of two terms is an unknown
 // of its own that is negative, zero or positive, so that A < B and A >= B are opposites but nothing follows for a third
 // macro: one of them may be unsigned.  Other arithmetic is an unknown of its own, equal where its text is equal; so are
-// calls of macros, __has_include() and the like.  Constants are computed.
+// calls of macros, __has_include() and the like.  Constants are computed.  A condition with a macro that the file
+// defines as an expression without parentheses is an unknown as a whole.
 //
 // A constant that is a condition by itself (#if 0, #if 1 && A) is a switch set by hand: nothing follows from it.
 #pragma once
@@ -76,6 +77,7 @@ private:
     bool readOperand(std::uint32_t& token);
     bool readInfix(std::uint32_t token);
     bool closeParenthesis(std::uint32_t token);
+    [[nodiscard]] bool isSign(std::uint32_t token) const;
     bool readDefined(std::uint32_t& token);
     bool readCall(std::uint32_t& token);
     void reduceTo(std::uint8_t precedence);
@@ -90,8 +92,8 @@ private:
     SymbolicExprId use(MacroUnknownId unknown);
     void readAsWhole();
 
-    [[nodiscard]] std::string text(std::uint32_t first, std::uint32_t last, bool compact) const;
-    [[nodiscard]] std::vector<MacroStates::Name> macros(std::uint32_t first, std::uint32_t last, bool& unstable);
+    [[nodiscard]] std::string text(std::uint32_t first, std::uint32_t last, bool compact);
+    [[nodiscard]] std::vector<MacroStates::Name> macros(std::uint32_t first, std::uint32_t last);
 
     SymbolicExprTable& table_;
     MacroStates& states_;
@@ -101,6 +103,7 @@ private:
     DirectiveCondition condition_;
     std::vector<Operand> operands_;
     std::vector<Operation> operations_;
+    std::size_t spelled_ = 0; ///< tokens written into texts
 };
 
 } // namespace VT

@@ -86,14 +86,11 @@ DirectiveConditionReader::Operand DirectiveConditionReader::difference(SymbolicO
     const std::string keyA = key(a);
     const std::string keyB = key(b);
     const bool swapped = keyB < keyA;
-    bool unstable = false;
-    std::vector<MacroStates::Name> names = macros(a.first, a.last, unstable);
-    for (const MacroStates::Name name : macros(b.first, b.last, unstable))
+    std::vector<MacroStates::Name> names = macros(a.first, a.last);
+    for (const MacroStates::Name name : macros(b.first, b.last))
         names.push_back(name);
-    const MacroUnknownId unknown =
-        unstable ? unknowns_.unique("?")
-                 : unknowns_.comparison((swapped ? keyB : keyA) + "\n=\n" + (swapped ? keyA : keyB),
-                                        shown(swapped ? b : a), shown(swapped ? a : b), names);
+    const MacroUnknownId unknown = unknowns_.comparison((swapped ? keyB : keyA) + "\n=\n" + (swapped ? keyA : keyB),
+                                                        shown(swapped ? b : a), shown(swapped ? a : b), names);
     const SymbolicExprId node = compareWith(table_, swapped ? operatorInfo(op).mirrored : op, use(unknown), 0);
     return truthOf(node, std::min(a.first, b.first), std::max(a.last, b.last));
 }

@@ -1,5 +1,7 @@
 #include "base/scan/DirectiveReader.hpp"
 
+#include "base/core/Limits.hpp"
+
 #include <algorithm>
 #include <array>
 #include <utility>
@@ -40,7 +42,6 @@ bool isRawPrefix(std::string_view name) {
 }
 
 constexpr std::size_t longestRawDelimiter = 16;
-constexpr unsigned mostEndlessRawStrings = 8; ///< each is looked for up to the end of the text
 
 constexpr auto keywords = std::to_array<std::pair<std::string_view, DirectiveKind>>({
     {"if", DirectiveKind::If},
@@ -63,12 +64,28 @@ constexpr auto longOperators =
     std::to_array<std::string_view>({"&&", "||", "==", "!=", "<=", ">=", "<<", ">>", "##", "->"});
 constexpr std::string_view shortOperators = "()!~+-*/%<>&^|?:,=#.;[]{}";
 
-/// Whether a token of a definition can name a macro that its value hangs on.
-constexpr bool isKept(DirectiveKind kind, DirectiveTokenKind token) {
-    return kind != DirectiveKind::Define || token == DirectiveTokenKind::Name;
+/// Names in code that tell a pragma operator: a macro may make one from arguments with any of the others.
+bool tellsPragma(std::string_view name) {
+    return name == "_Pragma" || name == "__pragma" || name == "pop_macro" || name == "GCC" || name == "clang";
+}
+
+bool takesHeaderName(std::string_view name) {
+    return name == "__has_include" || name == "__has_include_next" || name == "__has_embed";
 }
 
 } // namespace
+
+bool hasManyReadings(std::string_view text) {
+    for (std::size_t at = 0; (at = text.find("?\?", at)) != std::string_view::npos; ++at)
+        if (at + 2 < text.size() && std::string_view("=/'").find(text[at + 2]) != std::string_view::npos)
+            return true;
+    for (std::size_t at = 0; (at = text.find('\r', at)) != std::string_view::npos;) {
+        at = text.find_first_not_of('\r', at);
+        if (at == std::string_view::npos || text[at] != '\n')
+            return at != std::string_view::npos;
+    }
+    return false;
+}
 
 DirectiveReader::DirectiveReader(std::string_view text) : text_(text) {
     if (text_.starts_with("\xEF\xBB\xBF"))
@@ -129,9 +146,17 @@ std::size_t DirectiveReader::behindQuoted(std::size_t place) const {
     return at(place) == quote ? place + 1 : std::min(place, text_.size());
 }
 
+/// The place behind a header's name in angle brackets; that of its beginning where it does not end on its line.
+std::size_t DirectiveReader::behindHeaderName(std::size_t place) const {
+    for (std::size_t at = place; at < text_.size() && text_[at] != '\n'; at = std::max(at + 1, behindSplices(at)))
+        if (text_[at] == '>')
+            return at + 1;
+    return place;
+}
+
 /// The place behind a raw string whose quote is given; the place of the quote where it is none.
 std::size_t DirectiveReader::behindRawString(std::size_t quote) {
-    if (endlessRawStrings_ == mostEndlessRawStrings)
+    if (endlessRawStrings_ == limits::endlessRawStrings)
         return quote;
     const std::size_t open = text_.substr(0, quote + 2 + longestRawDelimiter).find('(', quote + 1);
     if (open == std::string_view::npos)
@@ -163,13 +188,14 @@ bool DirectiveReader::skipBlanks() {
     return place_ != before;
 }
 
-/// Passes the rest of a logical line.
-void DirectiveReader::skipLine() {
+/// Passes the rest of a logical line; the place of the first name in it that tells a pragma operator, or npos.
+std::size_t DirectiveReader::skipLine() {
+    std::size_t pragma = std::string_view::npos;
     while (place_ < text_.size()) {
         switch (classOf(text_[place_])) {
         case Class::NewLine:
             ++place_;
-            return;
+            return pragma;
         case Class::Name:
         case Class::Digit: {
             const bool number = classOf(text_[place_]) == Class::Digit;
@@ -177,8 +203,15 @@ void DirectiveReader::skipLine() {
             while (place_ < text_.size() &&
                    (isOfName(text_[place_]) || (number && text_[place_] == '\'' && isOfName(at(place_ + 1)))))
                 ++place_;
-            if (at(place_) == '"' && isRawPrefix(text_.substr(begin, place_ - begin)))
+            std::string_view name = text_.substr(begin, place_ - begin);
+            if (behindSplices(place_) != place_) {
+                place_ = begin;
+                name = readRun(number);
+            }
+            if (at(place_) == '"' && isRawPrefix(name))
                 place_ = behindRawString(place_);
+            if (pragma == std::string_view::npos && tellsPragma(name))
+                pragma = begin;
             break;
         }
         case Class::Slash:
@@ -194,6 +227,7 @@ void DirectiveReader::skipLine() {
             ++place_;
         }
     }
+    return pragma;
 }
 
 /// A name, or what the preprocessor takes for a number; a text of its own where splices were inside.
@@ -223,14 +257,18 @@ std::string_view DirectiveReader::readRun(bool number) {
 }
 
 /// Reads a token of the line; false at its end.
-bool DirectiveReader::readToken(bool afterBlank, DirectiveToken& token) {
+bool DirectiveReader::readToken(bool afterBlank, bool mayBeHeader, DirectiveToken& token) {
     if (place_ >= text_.size() || text_[place_] == '\n')
         return false;
     const std::size_t begin = place_;
     const char c = text_[begin];
     token = {DirectiveTokenKind::Other, afterBlank, {}, begin, begin};
     const std::size_t next = behindSplices(begin + 1);
-    if (classOf(c) == Class::Digit || (c == '.' && classOf(at(next)) == Class::Digit)) {
+    if (const std::size_t header = mayBeHeader && c == '<' ? behindHeaderName(begin) : begin; header != begin) {
+        token.kind = DirectiveTokenKind::String;
+        token.text = text_.substr(begin, header - begin);
+        place_ = header;
+    } else if (classOf(c) == Class::Digit || (c == '.' && classOf(at(next)) == Class::Digit)) {
         token.kind = DirectiveTokenKind::Number;
         token.text = readRun(true);
     } else if (classOf(c) == Class::Name) {
@@ -296,36 +334,82 @@ bool DirectiveReader::readDirective(Directive& directive) {
     bool blank = skipBlanks();
     if (directive.kind == DirectiveKind::Include) { // a header's name is no token: <sys//types.h>
         if (at(place_) == '<')
-            place_ = std::min(text_.find_first_of(">\n", place_), text_.size());
+            place_ = behindHeaderName(place_);
         skipLine();
         return true;
     }
+    readTokens(directive, blank);
+    return true;
+}
+
+/// Reads the tokens up to the end of the line.
+void DirectiveReader::readTokens(Directive& directive, bool blank) {
+    const bool isCondition = directive.kind == DirectiveKind::If || directive.kind == DirectiveKind::Elif;
     DirectiveToken token{};
-    while (readToken(blank, token)) {
+    bool mayBeHeader = false;
+    while (readToken(blank, mayBeHeader, token)) {
         directive.end = token.end;
         directive.hasComment = commentPassed_; // up to this token
-        if (isKept(directive.kind, token.kind))
-            tokens_.push_back(token);
+        tokens_.push_back(token);
+        mayBeHeader = isCondition && ((mayBeHeader && token.text == "(") || takesHeaderName(token.text));
         blank = skipBlanks();
     }
     directive.tokens = tokens_;
+}
+
+/// Passes the beginning of an import declaration, import <a.h>;  Stays where there is none.
+bool DirectiveReader::skipImport() {
+    const std::size_t begin = place_;
+    const auto nextWord = [&] {
+        const std::string_view word = classOf(at(place_)) == Class::Name ? readRun(false) : std::string_view();
+        skipBlanks();
+        return word;
+    };
+    if (at(place_) == '@') // of a module
+        ++place_;
+    std::string_view word = nextWord();
+    if (word == "export")
+        word = nextWord();
+    const char next = at(place_);
+    if (word == "import" && (next == '<' || next == '"' || classOf(next) == Class::Name)) {
+        if (next == '<')
+            place_ = behindHeaderName(place_);
+        return true;
+    }
+    place_ = begin;
+    return false;
+}
+
+/// Reads a line of code; whether it is an import declaration or may hold a pragma operator.
+bool DirectiveReader::readCode(Directive& directive) {
+    const bool isImport = skipImport();
+    const std::size_t pragma = skipLine();
+    if (isImport) {
+        directive.kind = DirectiveKind::Include;
+        return true;
+    }
+    if (pragma == std::string_view::npos)
+        return false;
+    directive.kind = DirectiveKind::Pragma;
+    place_ = pragma;
+    readTokens(directive, false);
     return true;
 }
 
 bool DirectiveReader::next(Directive& directive) {
     while (place_ < text_.size()) {
         skipBlanks();
-        const std::size_t begin = place_;
-        const bool digraph = at(begin) == '%' && at(behindSplices(begin + 1)) == ':';
-        if (at(begin) != '#' && !digraph) {
-            skipLine();
-            continue;
-        }
-        place_ = digraph ? behindSplices(begin + 1) + 1 : begin + 1;
         tokens_.clear();
         joined_.clear();
         directive = {};
-        directive.begin = begin;
+        directive.begin = place_;
+        const bool digraph = at(place_) == '%' && at(behindSplices(place_ + 1)) == ':';
+        if (at(place_) != '#' && !digraph) {
+            if (readCode(directive))
+                return true;
+            continue;
+        }
+        place_ = digraph ? behindSplices(place_ + 1) + 1 : place_ + 1;
         if (readDirective(directive))
             return true;
         skipLine();

@@ -13,6 +13,10 @@
 
 namespace VT {
 
+/// Whether preprocessors read the lines of a text in different ways: where trigraphs stand for # or a backslash, or
+/// carriage returns end lines.  Linear in the text.
+[[nodiscard]] bool hasManyReadings(std::string_view text);
+
 enum class DirectiveTokenKind : std::uint8_t { Name, Number, Character, String, Operator, Other };
 
 struct DirectiveToken {
@@ -34,8 +38,8 @@ enum class DirectiveKind : std::uint8_t {
     Endif,
     Define,
     Undef,
-    Include,
-    Pragma,
+    Include, ///< and import declarations
+    Pragma,  ///< and lines of code with a pragma operator
 };
 
 struct Directive {
@@ -46,13 +50,17 @@ struct Directive {
     std::size_t keyword;
     std::size_t keywordEnd;
     std::size_t end;
-    std::span<const DirectiveToken> tokens; ///< behind the keyword; of a definition the names alone
+    std::span<const DirectiveToken> tokens; ///< behind the keyword; of code from the pragma operator on
 };
 
 /// Reads the directives of a text one by one, as a C preprocessor finds them: behind line splices and comments, not in
 /// comments, string literals, character constants and raw strings.  Blanks between a backslash and the end of its line
-/// are overlooked.  There are no trigraphs.  A literal that does not end on its line ends with it, as in prose that
-/// is left out; what looks like a raw string without an end is an ordinary string.
+/// are overlooked.  There are no trigraphs.  What follows `import` at the beginning of a line is an inclusion.  A
+/// literal that does not end on its line ends with it, as in prose that is left out; what looks like a raw string
+/// without an end is an ordinary string.
+///
+/// Code is read for what may be a pragma operator: _Pragma, __pragma, and names that arguments of a macro made of one
+/// hold.
 ///
 /// Linear in the text, which may be any bytes and outlives the reader.
 class VTSYM_API DirectiveReader {
@@ -70,10 +78,14 @@ private:
     [[nodiscard]] std::size_t behindComment(std::size_t place) const;
     [[nodiscard]] std::size_t behindQuoted(std::size_t place) const;
     [[nodiscard]] std::size_t behindRawString(std::size_t quote);
+    [[nodiscard]] std::size_t behindHeaderName(std::size_t place) const;
     bool skipBlanks();
-    void skipLine();
+    std::size_t skipLine();
+    bool skipImport();
+    bool readCode(Directive& directive);
+    void readTokens(Directive& directive, bool blank);
     std::string_view readRun(bool number);
-    bool readToken(bool afterBlank, DirectiveToken& token);
+    bool readToken(bool afterBlank, bool mayBeHeader, DirectiveToken& token);
     bool readDirective(Directive& directive);
     std::uint64_t lineOf(std::size_t place);
 

@@ -1,16 +1,11 @@
 #include "base/scan/MacroStates.hpp"
 
+#include "base/core/Limits.hpp"
+
 #include <algorithm>
 #include <functional>
 
 namespace VT {
-
-namespace {
-
-constexpr std::size_t mostReached = 64;    ///< names that one macro is followed through
-constexpr std::size_t mostFollowed = 1024; ///< times that one of them stands in a definition
-
-} // namespace
 
 MacroStates::Name MacroStates::nameOf(std::string_view text, bool lasting) {
     SymbolicExprId hash = std::hash<std::string_view>()(text);
@@ -26,19 +21,25 @@ MacroStates::Name MacroStates::nameOf(std::string_view text, bool lasting) {
         }
     }
     texts_.push_back(lasting ? text : copies_.emplace_back(text));
-    versions_.push_back(0);
-    bodies_.emplace_back();
+    macros_.push_back({.version = 0, .varies = variesByItself(text)});
     sameHash_.push_back(before);
     byHash_.insert(hash, name);
     return name;
 }
 
 void MacroStates::change(Name name) {
-    versions_[name] = ++latest_;
+    macros_[name].version = ++latest_;
 }
 
-void MacroStates::addBody(Name name, std::span<const Name> body) {
-    bodies_[name].insert(bodies_[name].end(), body.begin(), body.end());
+void MacroStates::addBody(Name name, const MacroBody& body, std::span<const Name> names) {
+    if (body.form == MacroBody::Form::Alias) {
+        const Name alias = nameOf(body.alias); // among the names, which are known
+        macros_[name].aliases.push_back(alias);
+    }
+    Macro& macro = macros_[name];
+    macro.names.insert(macro.names.end(), names.begin(), names.end());
+    macro.varies = macro.varies || body.varies;
+    macro.open = macro.open || body.form == MacroBody::Form::Open;
 }
 
 void MacroStates::open() {
@@ -59,24 +60,46 @@ void MacroStates::close() {
         include();
 }
 
-MacroStates::State MacroStates::stateOf(Name name) {
-    State state{std::max(versions_[name], floor_), epoch_, !bodies_[name].empty()};
-    if (!state.derived)
-        return state;
+/// Fills reached_ with a name and all that it leads to; false beyond the bounds.
+template <class Names>
+bool MacroStates::reach(Name name, Names namesOf) {
     reached_.assign(1, name);
     std::size_t followed = 0;
     for (std::size_t i = 0; i < reached_.size(); ++i) {
-        state.version = std::max(state.version, versions_[reached_[i]]);
-        for (const Name next : bodies_[reached_[i]]) {
-            if (++followed > mostFollowed || reached_.size() > mostReached) {
-                state.version = ++latest_;
-                return state;
-            }
+        for (const Name next : namesOf(macros_[reached_[i]])) {
+            if (++followed > limits::macroNamesFollowed || reached_.size() > limits::macrosFollowed)
+                return false;
             if (std::ranges::find(reached_, next) == reached_.end())
                 reached_.push_back(next);
         }
     }
+    return true;
+}
+
+MacroStates::State MacroStates::stateOf(Name name) {
+    const Macro& macro = macros_[name];
+    State state{std::max(macro.version, floor_), epoch_, !macro.names.empty(), macro.varies};
+    if (!state.derived)
+        return state;
+    if (!reach(
+            name, [](const Macro& each) -> const auto& { return each.names; })) {
+        state.version = ++latest_;
+        state.varies = true;
+        return state;
+    }
+    for (const Name each : reached_) {
+        state.version = std::max(state.version, macros_[each].version);
+        state.varies = state.varies || macros_[each].varies;
+    }
     return state;
+}
+
+bool MacroStates::isOpen(Name name) {
+    if (macros_[name].aliases.empty())
+        return macros_[name].open;
+    return !reach(
+               name, [](const Macro& each) -> const auto& { return each.aliases; }) ||
+           std::ranges::any_of(reached_, [&](Name each) { return macros_[each].open; });
 }
 
 } // namespace VT

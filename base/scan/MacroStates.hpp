@@ -4,12 +4,14 @@
 // nothing is known of readings in different states.
 //
 // A macro that the file defines or undefines is another one in all that follows, in the other branches of a chain too.
-// A macro that the file defines by other macros changes with them.  An included file may define what is not defined,
-// which is told apart by the epoch: one more for each #include, but in other branches of its chain, where it was not
-// included.
+// A macro that the file defines by other macros changes with them.  One that is made by joining tokens, or that hangs
+// on the line where it is read, changes between any two readings, and so does what is defined by it.  An included file
+// may define what is not defined, which is told apart by the epoch: one more for each #include, but in other branches
+// of its chain, where it was not included.
 #pragma once
 
 #include "base/core/IdMap.hpp"
+#include "base/scan/MacroBody.hpp"
 
 #include <cstddef>
 #include <cstdint>
@@ -29,6 +31,7 @@ public:
         std::uint64_t version; ///< new with every definition that concerns the macro
         std::uint64_t epoch;   ///< new with every #include
         bool derived;          ///< the file defines the macro by others
+        bool varies = false;   ///< the value may be another one with each reading
         bool operator==(const State&) const = default;
     };
 
@@ -39,8 +42,8 @@ public:
 
     /// The macro is defined or undefined here.
     void change(Name name);
-    /// The macro's definition holds these names.
-    void addBody(Name name, std::span<const Name> body);
+    /// The macro's definition is this and holds these names.
+    void addBody(Name name, const MacroBody& body, std::span<const Name> names);
 
     /// Any macro may be defined or undefined.
     void changeAll() { floor_ = latestFloor_ = ++latest_; }
@@ -53,8 +56,12 @@ public:
     void nextBranch();
     void close();
 
-    /// Linear in what the macro is defined by, up to a bound; beyond it every reading is a state of its own.
+    /// Linear in what the macro is defined by, up to a bound; beyond it the macro varies.
     State stateOf(Name name);
+
+    /// Whether the macro may stand for operators that those around it take apart: B || C in A == 1.  Costs the same;
+    /// beyond the bound it may.
+    bool isOpen(Name name);
 
 private:
     struct Chain { ///< what was in force where it began
@@ -64,14 +71,24 @@ private:
         std::uint64_t latestEpoch;
     };
 
+    struct Macro { ///< with all its definitions so far
+        std::uint64_t version;
+        std::vector<Name> names{};   ///< in definitions
+        std::vector<Name> aliases{}; ///< definitions as a whole
+        bool varies;                 ///< by itself
+        bool open = false;           ///< by itself
+    };
+
+    template <class Names>
+    bool reach(Name name, Names namesOf);
+
     IdMap<Name> byHash_;                  ///< the latest name of a hash
     std::vector<Name> sameHash_;          ///< by name: the one before of its hash, or itself
     std::vector<std::string_view> texts_; ///< by name
     std::deque<std::string> copies_;
-    std::vector<std::uint64_t> versions_;   ///< by name
-    std::vector<std::vector<Name>> bodies_; ///< by name: what stands in all its definitions so far
-    std::vector<Chain> chains_;             ///< open
-    std::vector<Name> reached_;             ///< by stateOf()
+    std::vector<Macro> macros_; ///< by name
+    std::vector<Chain> chains_; ///< open
+    std::vector<Name> reached_; ///< by reach()
     std::uint64_t latest_ = 0;
     std::uint64_t floor_ = 0; ///< the least version of any macro
     std::uint64_t latestFloor_ = 0;

@@ -59,7 +59,10 @@ MacroUnknownId MacroUnknowns::asked(MacroUnknown::Kind kind, MacroStates::Name m
 }
 
 MacroUnknownId MacroUnknowns::value(MacroStates::Name macro) {
-    return asked(MacroUnknown::Kind::Value, macro, states_.stateOf(macro));
+    const MacroStates::State state = states_.stateOf(macro);
+    if (state.varies)
+        return unique(std::string(states_.textOf(macro)));
+    return asked(MacroUnknown::Kind::Value, macro, state);
 }
 
 MacroUnknownId MacroUnknowns::defined(MacroStates::Name macro) {
@@ -67,30 +70,44 @@ MacroUnknownId MacroUnknowns::defined(MacroStates::Name macro) {
 }
 
 MacroStates::State MacroUnknowns::stateOf(const std::vector<MacroStates::Name>& macros) {
-    MacroStates::State all{0, 0, false};
+    MacroStates::State all{0, 0, false, false};
     for (const MacroStates::Name macro : macros) {
         const MacroStates::State state = states_.stateOf(macro);
         all.version = std::max(all.version, state.version);
         all.epoch = std::max(all.epoch, state.epoch);
         all.derived = all.derived || state.derived;
+        all.varies = all.varies || state.varies;
     }
     return all;
 }
 
+/// A subject that nothing else is about.
+MacroStates::Name MacroUnknowns::freshSubject(std::string_view text) {
+    return states_.nameOf(std::string(text).append("\n").append(std::to_string(++unique_)));
+}
+
 MacroUnknownId MacroUnknowns::comparison(const std::string& key, std::string left, std::string right,
                                          const std::vector<MacroStates::Name>& macros) {
-    return add({MacroUnknown::Kind::Comparison, states_.nameOf(key), stateOf(macros), 0, invalidId, std::move(left),
-                std::move(right)});
+    const MacroStates::State state = stateOf(macros);
+    return add({MacroUnknown::Kind::Comparison, state.varies ? freshSubject(key) : states_.nameOf(key), state, 0,
+                invalidId, std::move(left), std::move(right)});
 }
 
 MacroUnknownId MacroUnknowns::term(const std::string& key, std::string text,
                                    const std::vector<MacroStates::Name>& macros) {
-    return add({MacroUnknown::Kind::Term, states_.nameOf(key), stateOf(macros), 0, invalidId, std::move(text), {}});
+    const MacroStates::State state = stateOf(macros);
+    return add({MacroUnknown::Kind::Term,
+                state.varies ? freshSubject(key) : states_.nameOf(key),
+                state,
+                0,
+                invalidId,
+                std::move(text),
+                {}});
 }
 
 MacroUnknownId MacroUnknowns::unique(std::string text) {
-    const MacroStates::Name subject = states_.nameOf(text + "\n" + std::to_string(++unique_));
-    return add({MacroUnknown::Kind::Term, subject, {0, 0, false}, 0, invalidId, std::move(text), {}});
+    const MacroStates::Name subject = freshSubject(text);
+    return add({MacroUnknown::Kind::Term, subject, {0, 0, false, true}, 0, invalidId, std::move(text), {}});
 }
 
 const MacroUnknown* MacroUnknowns::find(SymbolicExprId node) const {

@@ -42,7 +42,8 @@ public:
     MacroUnknownId defined(MacroStates::Name macro);
     /// The same as value() or defined(), as it was asked in another state.
     MacroUnknownId asked(MacroUnknown::Kind kind, MacroStates::Name macro, const MacroStates::State& state);
-    /// What equals what has the same `key` and hangs on the same macros; the texts are how it is written.
+    /// What equals what has the same `key` and hangs on the same macros; the texts are how it is written.  Where one of
+    /// the macros varies, like nothing else.
     MacroUnknownId comparison(const std::string& key, std::string left, std::string right,
                               const std::vector<MacroStates::Name>& macros);
     MacroUnknownId term(const std::string& key, std::string text, const std::vector<MacroStates::Name>& macros);
@@ -71,6 +72,7 @@ private:
     };
 
     [[nodiscard]] MacroStates::State stateOf(const std::vector<MacroStates::Name>& macros);
+    MacroStates::Name freshSubject(std::string_view text);
     MacroUnknownId add(MacroUnknown unknown);
 
     SymbolicExprTable& table_;

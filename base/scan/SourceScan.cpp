@@ -1,6 +1,7 @@
 // One pass over the directives of a file.  What is open is on stacks: chains, and what holds inside them.
 #include "base/scan/SourceScan.hpp"
 
+#include "base/core/Limits.hpp"
 #include "base/scan/BranchContext.hpp"
 #include "base/scan/BranchVerdict.hpp"
 #include "base/scan/ConditionProposal.hpp"
@@ -11,12 +12,6 @@
 namespace VT {
 
 namespace {
-
-/// Nodes that are kept from file to file; with more, the next file begins anew.
-constexpr std::size_t mostNodes = std::size_t{1} << 20U;
-
-/// Bytes of a directive that a reason quotes.
-constexpr std::size_t mostQuoted = 4096;
 
 using Found = std::function<void(const BranchFinding&)>;
 
@@ -52,6 +47,13 @@ std::string directiveText(const Directive& directive) {
     if (directive.kind != DirectiveKind::Else && !directive.tokens.empty())
         text.append(" ").append(
             spelledTokens(isExpression(directive.kind) ? directive.tokens : directive.tokens.first(1)));
+    return text;
+}
+
+/// A directive as a reason quotes it.
+std::string quoted(std::string text) {
+    if (text.size() > limits::quotedBytes)
+        text.replace(limits::quotedBytes, std::string::npos, "...");
     return text;
 }
 
@@ -116,10 +118,13 @@ private:
     DirectiveConditionReader conditions_;
     BranchContext context_;
     std::vector<Chain> chains_;
-    std::vector<MacroStates::Name> body_; ///< of the definition that is read
+    std::vector<MacroStates::Name> names_; ///< in the definition that is read
+    bool expandsToPragma_ = false;         ///< any line of code may change macros by one of the file's
 };
 
 void FileScan::run() {
+    if (hasManyReadings(text_))
+        return;
     DirectiveReader reader(text_);
     for (Directive directive; reader.next(directive);) {
         switch (directive.kind) {
@@ -150,25 +155,38 @@ void FileScan::changeMacros(const Directive& directive) {
             states_.include();
         return;
     }
-    if (directive.tokens.empty() || directive.tokens.front().kind != DirectiveTokenKind::Name)
-        return;
     if (directive.kind == DirectiveKind::Pragma) {
-        if (directive.tokens.front().text == "pop_macro")
+        if (pragmaChangesMacros(directive.tokens))
             states_.changeAll();
+        return;
+    }
+    const std::span<const DirectiveToken> tokens = directive.tokens;
+    if (tokens.empty())
+        return;
+    const bool isCut = tokens.size() > 1 && isOddName(tokens[1]) && tokens[1].begin == tokens[0].end;
+    if (tokens[0].kind != DirectiveTokenKind::Name || isOddName(tokens[0]) || isCut) { // who knows which macro
+        states_.changeAll();
         return;
     }
     const auto nameOf = [&](const DirectiveToken& token) { // a text of the file, but for a token with splices inside
         return states_.nameOf(token.text, token.end - token.begin == token.text.size());
     };
-    const MacroStates::Name macro = nameOf(directive.tokens.front());
-    body_.clear();
-    for (const DirectiveToken& token : directive.tokens.subspan(1))
-        body_.push_back(nameOf(token));
-    states_.addBody(macro, body_);
+    const MacroStates::Name macro = nameOf(tokens[0]);
     states_.change(macro);
+    if (directive.kind == DirectiveKind::Undef)
+        return;
+    names_.clear();
+    for (const DirectiveToken& token : tokens.subspan(1))
+        if (token.kind == DirectiveTokenKind::Name)
+            names_.push_back(nameOf(token));
+    const MacroBody body = readMacroBody(tokens.subspan(1));
+    states_.addBody(macro, body, names_);
+    expandsToPragma_ = expandsToPragma_ || body.hasPragma;
 }
 
 void FileScan::beginBranch(const Directive& directive) {
+    if (expandsToPragma_)
+        states_.changeAll();
     if (opensChain(directive.kind)) {
         const bool silent = isSilent();
         states_.open();
@@ -228,7 +246,7 @@ bool FileScan::isSingle(SymbolicExprId condition) const {
 
 void FileScan::judgeBranch(const Directive& directive, const DirectiveCondition& condition) {
     const std::vector<std::size_t> related = context_.related(condition);
-    if (related.empty() && isSingle(condition.node))
+    if ((related.empty() && isSingle(condition.node)) || !judge_.beginBranch())
         return;
     BranchContext::Laws laws = context_.laws(condition, related);
     KnownConditions known{{}, std::move(laws.states), std::move(laws.undefined)};
@@ -253,17 +271,16 @@ void FileScan::judgeBranch(const Directive& directive, const DirectiveCondition&
     Chain& chain = chains_.back();
     chain.silent = verdict.kind == BranchVerdictKind::Dead;
     if (verdict.kind == BranchVerdictKind::AlwaysTrue)
-        chain.always = BranchReason{result.region, result.directive, true};
+        chain.always = BranchReason{result.region, quoted(result.directive), true};
     tell(std::move(result), directive, std::move(proposed));
 }
 
 BranchReason FileScan::reasonOf(const BranchFact& fact) const {
-    const std::string_view quoted = text_.substr(fact.begin, std::min(fact.end - fact.begin, mostQuoted));
-    DirectiveReader reader(quoted);
+    DirectiveReader reader(text_.substr(fact.begin, std::min(fact.end - fact.begin, 2 * limits::quotedBytes)));
     Directive directive{};
     BranchReason reason{regionOf(text_, fact.begin, fact.line, fact.begin, fact.end), {}, !fact.negated};
     if (reader.next(directive))
-        reason.directive = directiveText(directive);
+        reason.directive = quoted(directiveText(directive));
     return reason;
 }
 
@@ -304,7 +321,6 @@ struct SourceScanner::State {
 
     SourceScanOptions options;
     SourceScanCounts counts;
-    std::uint64_t undecidedBefore = 0; ///< by the judges before this one
     std::unique_ptr<SymbolicExprTable> table;
     std::unique_ptr<BranchJudge> judge;
 };
@@ -317,12 +333,15 @@ SourceScanner::~SourceScanner() = default;
 
 void SourceScanner::scan(std::string_view text, bool isCpp, const std::function<void(const BranchFinding&)>& found) {
     State& state = *state_;
-    if (state.table->size() > mostNodes) {
-        state.undecidedBefore = state.counts.undecided;
+    if (state.table->size() > limits::scanNodes)
         state.renew();
-    }
+    BranchJudge& judge = *state.judge;
+    const std::uint64_t stepsBefore = judge.steps();
+    const std::uint64_t givenUpBefore = judge.givenUp();
+    judge.beginFile();
     FileScan(*state.table, *state.judge, state.options, state.counts, text, isCpp, found).run();
-    state.counts.undecided = state.undecidedBefore + state.judge->undecided();
+    state.counts.undecided += judge.givenUp() - givenUpBefore;
+    state.counts.steps += judge.steps() - stepsBefore;
 }
 
 const SourceScanCounts& SourceScanner::counts() const noexcept {

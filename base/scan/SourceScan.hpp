@@ -54,7 +54,8 @@ struct SourceScanOptions {
 struct SourceScanCounts {
     std::uint64_t branches = 0;  ///< that begin with a condition or #else
     std::uint64_t unread = 0;    ///< conditions that were not understood as a whole
-    std::uint64_t undecided = 0; ///< decisions that took too many steps
+    std::uint64_t undecided = 0; ///< conditions about which a decision took too many steps and was given up
+    std::uint64_t steps = 0;     ///< that decisions took
 };
 
 /// Holds the condition of every #if, #ifdef, #ifndef, #elif, #elifdef and #elifndef against those around it and those
@@ -63,9 +64,11 @@ struct SourceScanCounts {
 /// What is found is true for every definition of the macros as integers of 64 bits, signed or unsigned, and for macros
 /// that are not defined.  A macro that is defined or undefined on the way to a branch is another one behind; so is one
 /// that the file defines by such a macro.  What other files define is taken to stand alone: in parentheses where it is
-/// an expression, not hanging on what this file changes.  An included file may define what is not defined.
+/// an expression, not hanging on what this file changes.  An included or imported file may define what is not defined.
+/// Macros that join tokens, or that hang on the place where they are read, are others with each reading.
 ///
-/// Nothing is told about #if 0 and #if 1, which are switches, nor about what they switch off, nor inside dead branches.
+/// Nothing is told of a file that preprocessors read in different ways (trigraphs, carriage returns that end lines),
+/// about #if 0 and #if 1, which are switches, nor about what they switch off, nor inside dead branches.
 /// That a defined(X) is not needed beside a use of X is no finding: X being 0 where it is not defined is used to find
 /// dead branches, not to shorten conditions.
 ///
@@ -77,7 +80,9 @@ public:
     SourceScanner& operator=(SourceScanner&&) noexcept;
     ~SourceScanner();
 
-    /// Tells the findings of a file in the order of its lines.  The text may be any bytes.  About linear in the text.
+    /// Tells the findings of a file in the order of its lines.  The text may be any bytes.  About linear in the text:
+    /// beyond limits::scanSteps for a file and limits::scanStepsPerBranch for each condition, conditions are given up.
+    /// What is told of a file does not depend on the files before it.
     ///
     /// @param isCpp  whether true and false are constants; either may be anything otherwise
     void scan(std::string_view text, bool isCpp, const std::function<void(const BranchFinding&)>& found);

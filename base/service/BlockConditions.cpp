@@ -2,6 +2,7 @@
 
 #include "base/VCService.hpp"
 #include "base/core/Table.hpp"
+#include "base/service/ParameterReplacement.hpp"
 #include "base/variants/VariantKeywords.hpp"
 
 #include <string>
@@ -27,7 +28,12 @@ VCSymbolicExprId BlockConditions::read(const VTBlock& block) {
     const std::string text(condition.text);
     if (VariantKeywords::isInheritVariantKeyword(text, true))
         return service_.table().getIdTRUE();
-    return condition.isQuill ? service_.parseQ(text) : service_.parseC(text);
+    const SymbolicExprId own = condition.isQuill ? service_.parseQ(text) : service_.parseC(text);
+    if (customizer_ == nullptr)
+        return own;
+    return replaceParameters(service_.table(), own, [&](const std::string& parameter) {
+        return customizer_->parameterOfBlock(&block, parameter);
+    });
 }
 
 VCSymbolicExprId BlockConditions::readDefault(const VTBlock& block) {
@@ -73,28 +79,30 @@ VCSymbolicExprId BlockConditions::of(const vtPort& port) {
 
 // The same, asked once.
 
-VCSymbolicExprId VCService::getQExprNetAAVCEIdx(const VTBlock* block, bool simplify) {
-    return block == nullptr ? VCSymbolicExprId() : combined(BlockConditions(*this).net(*block).id(), simplify);
+VCSymbolicExprId VCService::getQExprNetAAVCEIdx(const VTBlock* block, bool simplify, const VCCustomizer* customizer) {
+    return block == nullptr ? VCSymbolicExprId()
+                            : combined(BlockConditions(*this, customizer).net(*block).id(), simplify);
 }
 
-VCSymbolicExprId VCService::getQExprNetAAVCEIdx(const vtPort* port, bool simplify) {
-    return port == nullptr ? VCSymbolicExprId() : combined(BlockConditions(*this).of(*port).id(), simplify);
+VCSymbolicExprId VCService::getQExprNetAAVCEIdx(const vtPort* port, bool simplify, const VCCustomizer* customizer) {
+    return port == nullptr ? VCSymbolicExprId() : combined(BlockConditions(*this, customizer).of(*port).id(), simplify);
 }
 
-std::string VCService::getQExprNetAAVCEString(const VTBlock* block, bool simplify) {
-    return block == nullptr ? std::string() : printQExprWithConversion(getQExprNetAAVCEIdx(block, simplify));
+std::string VCService::getQExprNetAAVCEString(const VTBlock* block, bool simplify, const VCCustomizer* customizer) {
+    return block == nullptr ? std::string()
+                            : printQExprWithConversion(getQExprNetAAVCEIdx(block, simplify, customizer));
 }
 
-std::string VCService::getQExprNetAAVCEString(const vtPort* port, bool simplify) {
-    return port == nullptr ? std::string() : printQExprWithConversion(getQExprNetAAVCEIdx(port, simplify));
+std::string VCService::getQExprNetAAVCEString(const vtPort* port, bool simplify, const VCCustomizer* customizer) {
+    return port == nullptr ? std::string() : printQExprWithConversion(getQExprNetAAVCEIdx(port, simplify, customizer));
 }
 
-std::string VCService::getCExprNetAAVCEString(const VTBlock* block, bool simplify) {
-    return block == nullptr ? std::string() : printCExpr(getQExprNetAAVCEIdx(block, simplify));
+std::string VCService::getCExprNetAAVCEString(const VTBlock* block, bool simplify, const VCCustomizer* customizer) {
+    return block == nullptr ? std::string() : printCExpr(getQExprNetAAVCEIdx(block, simplify, customizer));
 }
 
-std::string VCService::getCExprNetAAVCEString(const vtPort* port, bool simplify) {
-    return port == nullptr ? std::string() : printCExpr(getQExprNetAAVCEIdx(port, simplify));
+std::string VCService::getCExprNetAAVCEString(const vtPort* port, bool simplify, const VCCustomizer* customizer) {
+    return port == nullptr ? std::string() : printCExpr(getQExprNetAAVCEIdx(port, simplify, customizer));
 }
 
 } // namespace VT

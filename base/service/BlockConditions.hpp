@@ -8,6 +8,7 @@
 
 namespace VT {
 
+class VCCustomizer;
 class VCService;
 
 /// Reads and combines the variant conditions of blocks, each once: a model with n blocks costs n conditions.  To be
@@ -16,7 +17,11 @@ class VCService;
 /// Reading a condition may be refused by the host diagnostics of its language.  What was read stays.
 class VTSYM_API BlockConditions {
 public:
-    explicit BlockConditions(VCService& service) : service_(service) {}
+    /// `customizer` says what the parameters of a block's condition stand for; nullptr for themselves.  It outlives the
+    /// object.
+    explicit BlockConditions(VCService& service, const VCCustomizer* customizer = nullptr)
+        : service_(service),
+          customizer_(customizer) {}
 
     /// Whether a block is the choice for where no other one is active.
     static bool isDefault(const VTBlock& block);
@@ -34,6 +39,7 @@ private:
     VCSymbolicExprId readDefault(const VTBlock& block);
 
     VCService& service_;
+    const VCCustomizer* customizer_;
     boost::unordered_map<const VTBlock*, SymbolicExprId> own_;
     boost::unordered_map<const VTBlock*, SymbolicExprId> net_;
 };

@@ -29,13 +29,16 @@ bool isName(const SymbolicExprTable& table, SymbolicExprId id) {
 }
 
 /// The range of a comparison of a name with an integer.
-std::optional<NameRange> rangeOf(const SymbolicExprTable& table, const SymbolicExpr& node) {
+std::optional<NameRange> rangeOf(const SymbolicExprTable& table, SymbolicExprId id) {
+    const SymbolicExpr& node = *table.get(id);
     const auto& row = operatorTable()[static_cast<std::size_t>(node.op())];
     if (row.mirrored == SymbolicOp::None)
         return std::nullopt;
     SymbolicOp op = node.op();
     SymbolicExprId name = node.getInput(0);
     SymbolicExprId literal = node.getInput(1);
+    if (!table.hasOperand(id, name) || !table.hasOperand(id, literal))
+        return std::nullopt;
     if (isName(table, literal)) {
         std::swap(name, literal);
         op = row.mirrored;
@@ -61,29 +64,31 @@ std::optional<NameRange> rangeOf(const SymbolicExprTable& table, const SymbolicE
 }
 
 /// The operands of a chain of one operator, as many as are looked at; nothing where there are more.
-std::vector<const SymbolicExpr*> operandsOf(const SymbolicExprTable& table, const SymbolicExpr& chain, SymbolicOp op) {
-    std::vector<const SymbolicExpr*> operands;
-    std::vector<const SymbolicExpr*> open{&chain};
+std::vector<SymbolicExprId> operandsOf(const SymbolicExprTable& table, SymbolicExprId chain, SymbolicOp op) {
+    std::vector<SymbolicExprId> operands;
+    std::vector<SymbolicExprId> open{chain};
     for (std::size_t seen = 0; !open.empty(); ++seen) {
-        const SymbolicExpr* const node = open.back();
+        const SymbolicExprId id = open.back();
         open.pop_back();
-        if (node == nullptr || seen > 2 * mostOperands)
-            return {};
-        if (node->op() != op) {
-            operands.push_back(node);
+        const SymbolicExpr& node = *table.get(id);
+        if (node.op() != op) {
+            operands.push_back(id);
             continue;
         }
-        open.push_back(table.get(node->getInput(1)));
-        open.push_back(table.get(node->getInput(0)));
+        for (const std::size_t i : {1U, 0U}) {
+            if (!table.hasOperand(id, node.getInput(i)) || seen > 2 * mostOperands)
+                return {};
+            open.push_back(node.getInput(i));
+        }
     }
     return operands;
 }
 
 /// The ranges of an And.
-NameRanges rangesOfProduct(const SymbolicExprTable& table, const SymbolicExpr& product) {
+NameRanges rangesOfProduct(const SymbolicExprTable& table, SymbolicExprId product) {
     NameRanges ranges;
-    for (const SymbolicExpr* const operand : operandsOf(table, product, SymbolicOp::And)) {
-        const std::optional<NameRange> range = rangeOf(table, *operand);
+    for (const SymbolicExprId operand : operandsOf(table, product, SymbolicOp::And)) {
+        const std::optional<NameRange> range = rangeOf(table, operand);
         if (!range)
             continue;
         const auto at = std::ranges::lower_bound(ranges, range->name, {}, &NameRange::name);
@@ -100,12 +105,11 @@ NameRanges rangesOfProduct(const SymbolicExprTable& table, const SymbolicExpr& p
 } // namespace
 
 NameRanges rangesOf(const SymbolicExprTable& table, SymbolicExprId condition) {
-    const SymbolicExpr* const node = table.get(condition);
-    if (node == nullptr)
+    if (!table.has(condition))
         return {};
     std::optional<NameRanges> ranges;
-    for (const SymbolicExpr* const product : operandsOf(table, *node, SymbolicOp::Or)) {
-        NameRanges next = rangesOfProduct(table, *product);
+    for (const SymbolicExprId product : operandsOf(table, condition, SymbolicOp::Or)) {
+        NameRanges next = rangesOfProduct(table, product);
         ranges = ranges ? joined(*ranges, next) : std::move(next);
     }
     return std::move(ranges).value_or(NameRanges());

@@ -6,10 +6,10 @@
 #include "base/core/Table.hpp"
 #include "base/decide/Decider.hpp"
 #include "base/service/ChoiceRanges.hpp"
+#include "base/service/ConditionProofs.hpp"
 #include "base/service/ImpliedCondition.hpp"
 #include "base/simplify/Simplify.hpp"
 #include "base/transform/QuillConversion.hpp"
-#include "base/variants/VariantKeywords.hpp"
 
 #include <algorithm>
 #include <limits>
@@ -21,7 +21,7 @@ struct ChoiceSetChecker::State {
         : service(theService),
           table(theService.table()),
           toC(table),
-          decider(table, {.keywordsInForce = isVariantKeywordsSimCodegenFeatureOn(), .bits32 = theOptions.bits32}),
+          decider(table, {.keywordsInForce = theService.areVariantKeywordsInForce(), .bits32 = theOptions.bits32}),
           options(theOptions),
           stepsLeft(theOptions.steps) {}
 
@@ -58,6 +58,7 @@ struct ChoiceSetChecker::State {
     Decider decider;
     ChoiceSetOptions options;
     std::uint64_t stepsLeft;
+    std::uint64_t questionSteps = limits::decisionSteps; ///< a quarter after each question of a set that gives up
 };
 
 ChoiceSetChecker::ChoiceSetChecker(VCService& service, const ChoiceSetOptions& options)
@@ -73,12 +74,15 @@ bool ChoiceSetChecker::stepsUsedUp() const noexcept {
 
 Decision ChoiceSetChecker::State::counted(Decision decision) {
     stepsLeft -= std::min(stepsLeft, decider.stepsTaken() + 1);
+    if (decision.bound == DecisionBound::Steps)
+        questionSteps = std::max(questionSteps / 4, limits::furtherSteps);
     return decision;
 }
 
 Decision ChoiceSetChecker::State::ask(Decision (Decider::*question)(SymbolicExprId), SymbolicExprId condition) {
     if (stepsLeft == 0)
         return {Answer::Undecided, DecisionBound::Steps, std::nullopt};
+    decider.limitSteps(questionSteps);
     return counted((decider.*question)(condition));
 }
 
@@ -86,6 +90,7 @@ Decision ChoiceSetChecker::State::ask(Decision (Decider::*question)(SymbolicExpr
                                       SymbolicExprId b) {
     if (stepsLeft == 0)
         return {Answer::Undecided, DecisionBound::Steps, std::nullopt};
+    decider.limitSteps(questionSteps);
     return counted((decider.*question)(a, b));
 }
 
@@ -98,14 +103,15 @@ std::size_t ChoiceSetChecker::State::operandsOf(SymbolicExprId condition) const 
     std::size_t count = 0;
     std::vector<SymbolicExprId> open{condition};
     while (!open.empty() && count + open.size() <= limits::choiceOperands) {
-        const SymbolicExpr& node = *table.get(open.back());
+        const SymbolicExpr* const node = table.get(open.back());
         open.pop_back();
-        const bool isChain = node.op() == SymbolicOp::And || node.op() == SymbolicOp::Or;
-        if (isChain || node.op() == SymbolicOp::Not)
-            open.push_back(node.getInput(0));
+        const SymbolicOp op = node != nullptr ? node->op() : SymbolicOp::None; // of an operand that is missing
+        const bool isChain = op == SymbolicOp::And || op == SymbolicOp::Or;
+        if (isChain || op == SymbolicOp::Not)
+            open.push_back(node->getInput(0));
         if (isChain)
-            open.push_back(node.getInput(1));
-        if (!isChain && node.op() != SymbolicOp::Not)
+            open.push_back(node->getInput(1));
+        if (!isChain && op != SymbolicOp::Not)
             ++count;
     }
     return count + open.size();
@@ -116,15 +122,13 @@ SymbolicExprId ChoiceSetChecker::State::shorten(SymbolicExprId parent, SymbolicE
     const std::size_t operands = operandsOf(condition);
     if (operands < 2 || operands > limits::choiceOperands)
         return condition;
-    const SymbolicExprId given = toC(condition);
-    const SymbolicExprId context = toC(parent);
     // Literals are taken from a context that is not large.
     const SymbolicExprId literals = operandsOf(parent) > limits::choiceOperands ? table.getIdTRUE() : parent;
-    const auto isEqual = [&](SymbolicExprId candidate) {
-        return stepsLeft != 0 && counted(decider.equivalentGiven(toC(candidate), given, context)).isYes();
-    };
+    ConditionProofs proofs(decider, toC, condition, parent, true, std::min(stepsLeft, limits::shortenSteps));
+    const auto isEqual = [&](SymbolicExprId candidate) { return proofs.isEqual(candidate); };
     const SymbolicExprId shorter =
         ImpliedCondition(table, service.simplifier().printer(), literals, isEqual).shorten(condition);
+    stepsLeft -= std::min(stepsLeft, proofs.stepsTaken());
     return operandsOf(shorter) < operands ? shorter : condition;
 }
 
@@ -287,6 +291,7 @@ ChoiceSetReport ChoiceSetChecker::check(SymbolicExprId parent, std::span<const S
         return report;
     }
     const SymbolicExprId context = state.toC(parent);
+    state.questionSteps = limits::decisionSteps;
     report.parentNeverHolds = state.ask(&Decider::canHold, context).isNo();
     if (report.parentNeverHolds || choices.empty())
         return report;
@@ -321,6 +326,7 @@ ChoiceSetReport ChoiceSetChecker::checkCondition(SymbolicExprId parent, Symbolic
         return report;
     }
     const SymbolicExprId context = state.toC(parent);
+    state.questionSteps = limits::decisionSteps;
     report.parentNeverHolds = state.ask(&Decider::canHold, context).isNo();
     if (!report.parentNeverHolds)
         state.checkOne(0, parent, condition, state.service.AND(context, state.toC(condition), false).id(), report);

@@ -1,5 +1,7 @@
 // Conditions put together, compared and asked.
 #include "base/VCService.hpp"
+#include "base/service/AliasText.hpp"
+#include "base/service/ParameterReplacement.hpp"
 #include "base/service/ServiceParts.hpp"
 
 namespace VT {
@@ -63,8 +65,14 @@ bool VCService::isEqual(const SymbolicExprId& a, const SymbolicExprId& b) {
     if (parts_->customizer == nullptr || !has(a) || !has(b))
         return false;
     const ParameterReplacements parameters = parts_->customizer->parameterReplacements();
-    const SymbolicExprId simplifiedA = simplify(replaceParameters(a, parameters), true).id();
-    return simplifiedA == simplify(replaceParameters(b, parameters), true).id();
+    const auto replaced = [&](SymbolicExprId condition) {
+        return replaceParameters(parts_->table, condition, [&](const std::string& name) {
+            const auto entry = parameters.find(name);
+            return entry == parameters.end() ? std::nullopt : std::optional(entry->second);
+        });
+    };
+    const SymbolicExprId simplifiedA = simplify(replaced(a), true).id();
+    return simplifiedA == simplify(replaced(b), true).id();
 }
 
 std::string VCService::getParameterAlias(const std::string& parameter) const {
@@ -73,7 +81,31 @@ std::string VCService::getParameterAlias(const std::string& parameter) const {
 }
 
 void VCService::addParameterAlias(const std::string& parameter, const std::string& alias) {
-    parts_->parameterAliases.emplace(parameter, alias);
+    parts_->parameterAliases.emplace(parameter, aliasText(alias));
+}
+
+void VCService::addParameterAlias(const VTBlock* block, SymbolicExprId condition, const VCCustomizer* customizer) {
+    if (customizer == nullptr)
+        return;
+    std::vector<std::pair<std::string, std::string>> aliases;
+    for (std::string& parameter : parametersOf(parts_->table, condition))
+        if (const auto replacement = customizer->parameterOfBlock(block, parameter)) {
+            const int* const value = std::get_if<int>(&*replacement);
+            std::string text = value != nullptr ? std::to_string(*value) : std::get<std::string>(*replacement);
+            aliases.emplace_back(std::move(parameter), aliasText(std::move(text)));
+        }
+    auto& known = parts_->parameterAliases;
+    std::vector<std::string> added;
+    added.reserve(aliases.size());
+    try {
+        for (const auto& [parameter, alias] : aliases)
+            if (std::string name = parameter; known.emplace(parameter, alias).second)
+                added.push_back(std::move(name));
+    } catch (...) {
+        for (const std::string& parameter : added)
+            known.erase(parameter);
+        throw;
+    }
 }
 
 SymbolicExprTable& VCService::table() noexcept {
@@ -82,6 +114,14 @@ SymbolicExprTable& VCService::table() noexcept {
 
 SymbolicExprSimplify& VCService::simplifier() noexcept {
     return parts_->simplifier;
+}
+
+SymbolRegistry& VCService::symbolRegistry() noexcept {
+    return parts_->registry;
+}
+
+bool VCService::areVariantKeywordsInForce() const {
+    return parts_->keywordsInForce();
 }
 
 } // namespace VT

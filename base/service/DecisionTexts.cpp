@@ -45,7 +45,23 @@ std::string VCService::getImpliedCExprFromCConditions(const std::string& conditi
 
 std::string VCService::getImpliedQExprFromQConditions(const std::string& condition, const std::string& known) {
     const SymbolicExprId given = parse(condition, true);
-    return printQExpr(getImpliedCondition(given, parse(known, true)));
+    return printQExpr(getImpliedCondition(given, parse(known, true), true));
+}
+
+std::string VCService::shortestCExprFromCCondition(const std::string& text) {
+    return printCExpr(shortestCondition(parse(text, false), false));
+}
+
+std::string VCService::shortestQExprFromCCondition(const std::string& text) {
+    return printQExpr(shortestCondition(parts_->toQuill(parse(text, false)), true));
+}
+
+std::string VCService::shortestCExprFromQCondition(const std::string& text) {
+    return printCExpr(shortestCondition(parse(text, true), false));
+}
+
+std::string VCService::shortestQExprFromQCondition(const std::string& text) {
+    return printQExpr(shortestCondition(parse(text, true), true));
 }
 
 std::vector<std::string> VCService::computeUniqueAndOperandsFromCCondition(const std::string& condition) {

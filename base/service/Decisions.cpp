@@ -1,6 +1,5 @@
 // How conditions stand to each other.
 #include "base/VCService.hpp"
-#include "base/service/ImpliedCondition.hpp"
 #include "base/service/ServiceParts.hpp"
 #include "base/variants/VariantKeywords.hpp"
 
@@ -30,7 +29,7 @@ SetDecision askAbout(ServiceParts& parts, SetDecision (Decider::*question)(std::
 } // namespace
 
 bool ServiceParts::keywordsInForce() const {
-    return simplifier.keywordsFlag() && isVariantKeywordsSimCodegenFeatureOn();
+    return keywordFlag && isVariantKeywordsSimCodegenFeatureOn();
 }
 
 unsigned ServiceParts::decisionMode() const {
@@ -46,7 +45,8 @@ Decider& ServiceParts::decider() {
 }
 
 /// The decision about a pair, from the cache where it is there.
-Decision VCService::ask(PairQuestion question, const VCSymbolicExprId& a, const VCSymbolicExprId& b) {
+Decision VCService::ask(PairQuestion question, const VCSymbolicExprId& a, const VCSymbolicExprId& b,
+                        std::uint64_t steps) {
     if (!has(a) || !has(b))
         return noCondition();
     const bool ordered = question == PairQuestion::FirstAlone;
@@ -58,10 +58,13 @@ Decision VCService::ask(PairQuestion question, const VCSymbolicExprId& a, const 
     const SymbolicExprId first = parts_->toC(key.a);
     const SymbolicExprId second = parts_->toC(key.b);
     Decider& decider = parts_->decider();
+    decider.limitSteps(steps);
     Decision decision = question == PairQuestion::Both         ? decider.overlaps(first, second)
                         : question == PairQuestion::FirstAlone ? decider.implies(first, second).opposite()
                                                                : decider.equivalent(first, second).opposite();
-    if (parts_->caching)
+    decider.limitSteps(limits::decisionSteps);
+    // What stays undecided with fewer steps may be decided with all.
+    if (parts_->caching && (steps == limits::decisionSteps || !decision.isUndecided()))
         parts_->decisions.insert(key, decision);
     return decision;
 }
@@ -103,8 +106,16 @@ Decision VCService::isTighterThan(const VCSymbolicExprId& a, const VCSymbolicExp
 }
 
 Relation VCService::compare(const VCSymbolicExprId& a, const VCSymbolicExprId& b) {
-    return Relation::of(ask(PairQuestion::FirstAlone, a, b), ask(PairQuestion::FirstAlone, b, a),
-                        ask(PairQuestion::Both, a, b));
+    std::uint64_t steps = limits::decisionSteps;
+    const auto next = [&](PairQuestion question, const VCSymbolicExprId& x, const VCSymbolicExprId& y) {
+        Decision decision = ask(question, x, y, steps);
+        if (decision.bound == DecisionBound::Steps)
+            steps = limits::furtherSteps;
+        return decision;
+    };
+    Decision onlyA = next(PairQuestion::FirstAlone, a, b);
+    Decision onlyB = next(PairQuestion::FirstAlone, b, a);
+    return Relation::of(std::move(onlyA), std::move(onlyB), next(PairQuestion::Both, a, b));
 }
 
 SetDecision VCService::covers(const std::vector<VCSymbolicExprId>& conditions) {
@@ -141,36 +152,6 @@ std::vector<VCSymbolicExprId> VCService::computeUniqueAndOperandsId(const VCSymb
 
 std::vector<VCSymbolicExprId> VCService::computeUniqueOrOperandsId(const VCSymbolicExprId& condition) {
     return uniqueOperands(condition, false);
-}
-
-// Conditions relative to others.
-
-VCSymbolicExprId VCService::getImpliedCondition(const VCSymbolicExprId& condition, const VCSymbolicExprId& known) {
-    if (!has(condition) || !has(known))
-        return invalidId;
-    SymbolicExprTable& table = parts_->table;
-    if (implies(known, condition).isYes())
-        return table.getIdTRUE();
-    if (isDisjoint(known, condition).isYes())
-        return table.getIdFALSE();
-    const SymbolicExprId given = parts_->toC(condition.id());
-    const SymbolicExprId context = parts_->toC(known.id());
-    const auto isEqual = [&](SymbolicExprId candidate) {
-        return parts_->decider().equivalentGiven(parts_->toC(candidate), given, context).isYes();
-    };
-    const SymbolicExprPrinter& printer = parts_->cPrinter;
-    ImpliedCondition implied(table, printer, known.id(), isEqual);
-    SymbolicExprId best = implied.shorten(condition.id());
-    // Another form may have operands to take away that this one hides.
-    const SymbolicExprId simple = simplify(condition, true).id();
-    for (const SymbolicExprId form : {simple, AND(known, condition, true).id()}) {
-        if (form == condition.id() || !isEqual(form))
-            continue;
-        const SymbolicExprId other = implied.shorten(form);
-        if (printer.textLength(other) < printer.textLength(best))
-            best = other;
-    }
-    return best;
 }
 
 std::string VCService::printWitness(const Witness& witness) {

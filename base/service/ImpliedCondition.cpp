@@ -17,22 +17,25 @@ constexpr std::size_t mostLiterals = 12; ///< that each of them is compared with
 
 } // namespace
 
-SymbolicExprId compareWith(SymbolicExprTable& table, SymbolicOp op, SymbolicExprId operand, int literal) {
-    const SymbolicIntValue value(table, literal);
+SymbolicExprId makeComparison(SymbolicExprTable& table, SymbolicOp op, SymbolicExprId left, SymbolicExprId right) {
     switch (op) {
     case SymbolicOp::Equal:
-        return SymbolicEqualExpr(table, operand, value).getId(table);
+        return SymbolicEqualExpr(table, left, right).getId(table);
     case SymbolicOp::NotEqual:
-        return SymbolicNotEqualExpr(table, operand, value).getId(table);
+        return SymbolicNotEqualExpr(table, left, right).getId(table);
     case SymbolicOp::LessThan:
-        return SymbolicLessThanExpr(table, operand, value).getId(table);
+        return SymbolicLessThanExpr(table, left, right).getId(table);
     case SymbolicOp::LessThanEqual:
-        return SymbolicLessThanEqualExpr(table, operand, value).getId(table);
+        return SymbolicLessThanEqualExpr(table, left, right).getId(table);
     case SymbolicOp::GreaterThan:
-        return SymbolicGreaterThanExpr(table, operand, value).getId(table);
+        return SymbolicGreaterThanExpr(table, left, right).getId(table);
     default:
-        return SymbolicGreaterThanEqualExpr(table, operand, value).getId(table);
+        return SymbolicGreaterThanEqualExpr(table, left, right).getId(table);
     }
+}
+
+SymbolicExprId compareWith(SymbolicExprTable& table, SymbolicOp op, SymbolicExprId operand, int literal) {
+    return makeComparison(table, op, operand, SymbolicIntValue(table, literal).getId(table));
 }
 
 ImpliedCondition::ImpliedCondition(SymbolicExprTable& table, const SymbolicExprPrinter& printer, SymbolicExprId context,

@@ -9,6 +9,9 @@
 
 namespace VT {
 
+/// Interns a comparison; any other operator gives >=.
+SymbolicExprId makeComparison(SymbolicExprTable& table, SymbolicOp op, SymbolicExprId left, SymbolicExprId right);
+
 /// Interns the comparison of an operand with an integer; any other operator gives >=.
 SymbolicExprId compareWith(SymbolicExprTable& table, SymbolicOp op, SymbolicExprId operand, int literal);
 

@@ -18,13 +18,19 @@ std::uint64_t generation = 0;  ///< of the latest service
 ServiceParts::ServiceParts()
     : cParser(table, true, true),
       quillParser(table, checker),
+      registry(table),
       simplifier(table),
+      keywordFlag(isVariantKeywordsSimCodegenFeatureOn()),
       toC(table),
       toQuill(table),
       quillPrinter(table, true, true),
       cPrinter(table, false, true),
       caching(cacheSymExprSimplifyResultsFeature().isOn()) {
     table.addBoolSymbols();
+    addSimCodegenVariantKeywordSymbols();
+}
+
+void ServiceParts::addSimCodegenVariantKeywordSymbols() {
     const SymbolicString sim(table, VariantKeywords::getSimVariantKeyword());
     const SymbolicString codegen(table, VariantKeywords::getCodegenVariantKeyword());
 }

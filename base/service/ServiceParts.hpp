@@ -5,6 +5,7 @@
 #include "base/print/ExpressionPrinter.hpp"
 #include "base/service/DecisionCache.hpp"
 #include "base/service/SimplifyCache.hpp"
+#include "base/service/SymbolRegistry.hpp"
 #include "base/simplify/Simplify.hpp"
 #include "base/simplify/VCCustomizer.hpp"
 #include "base/transform/QuillConversion.hpp"
@@ -27,13 +28,16 @@ struct CustomizerRelease {
 struct ServiceParts {
     ServiceParts();
 
+    /// Interns (sim) and (codegen) as identifiers, whether or not they are in force.
+    void addSimCodegenVariantKeywordSymbols();
+
     /// The cache of a language.
     template <class Cache>
     static Cache& of(std::array<Cache, 2>& caches, bool isQuill) {
         return caches[isQuill ? 0 : 1];
     }
 
-    /// Whether the variant keywords are in force at this moment.
+    /// Whether the variant keywords are in force at this moment: they were when the service was made, and are.
     [[nodiscard]] bool keywordsInForce() const;
     /// What decisions depend on beside their conditions: 1 for keywords in force, 2 for 32-bit unknowns.
     [[nodiscard]] unsigned decisionMode() const;
@@ -46,7 +50,9 @@ struct ServiceParts {
     SymbolicExprParser cParser;
     VTSymbolicExprErrorCheckerBlockVariants checker;
     SymbolicExprFromQParseTreeBlockVariants quillParser;
+    SymbolRegistry registry;
     SymbolicExprSimplify simplifier;
+    bool keywordFlag; ///< the keyword feature when the service was made
     SymbolicExprQ2C toC;
     SymbolicExprC2Q toQuill;
     SymbolicExprPrinter quillPrinter;

@@ -37,8 +37,8 @@ SymbolicExprId VCService::simplifyNow(SymbolicExprId condition, bool isQuill) {
     // Asked without a customizer the visitor would answer self-comparisons the wrong way round.
     const bool ask = isQuill && customizer != nullptr;
     const SymbolicExprSimplify& simplifier = parts_->simplifier;
-    SymbolicExprSimplifyVisitorBlockVariants visitor(parts_->table, simplifier.keywordsFlag(), simplifier.printer(),
-                                                     ask, customizer);
+    SymbolicExprSimplifyVisitorBlockVariants visitor(parts_->table, parts_->keywordFlag, simplifier.printer(), ask,
+                                                     customizer);
     std::uint64_t passes = 0;
     return simplifier.simplify(condition, passes, visitor);
 }

@@ -1,6 +1,7 @@
 #include "base/service/SymbolRegistry.hpp"
 
 #include "base/core/Hash.hpp"
+#include "base/service/AliasText.hpp"
 
 #include <algorithm>
 #include <cstdint>
@@ -72,7 +73,7 @@ std::string SymbolRegistry::identifierOf(const std::string& text) const {
 }
 
 std::string SymbolRegistry::registerExpression(const VTBlock* block, SymbolicExprId expression) {
-    if (!table_.has(expression))
+    if (table_.get(expression) == nullptr)
         return {};
     std::uint64_t passes = 0;
     const SymbolicExprId simplified = simplifier_.simplify(expression, passes);
@@ -80,7 +81,7 @@ std::string SymbolRegistry::registerExpression(const VTBlock* block, SymbolicExp
     std::string identifier = identifierOf(text);
     entries_.try_emplace(identifier, Entry{text, simplified});
     if (identifier != text)
-        table_.insertAliasInfo(identifier, table_.get(simplified)->isTermExpr() ? text : '(' + text + ')');
+        table_.insertAliasInfo(identifier, table_.get(simplified)->isTermExpr() ? aliasText(text) : '(' + text + ')');
     Registered& registered = blocks_[block];
     if (const auto [place, isNew] = registered.all.insert(identifier); isNew) {
         try {
@@ -108,7 +109,7 @@ SymbolicExprId SymbolRegistry::expressionOf(const std::string& identifier) const
 }
 
 void SymbolRegistry::insertAlias(const std::string& identifier, const std::string& alias) {
-    table_.insertAliasInfo(identifier, alias);
+    table_.insertAliasInfo(identifier, aliasText(alias));
 }
 
 std::string SymbolRegistry::aliasOf(const std::string& identifier) const {

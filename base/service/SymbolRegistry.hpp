@@ -45,7 +45,8 @@ public:
     /// The simplified expression of an identifier; the invalid identifier for one that is not registered.
     [[nodiscard]] SymbolicExprId expressionOf(const std::string& identifier) const;
 
-    /// Records an alias of an identifier in the table; the first alias stays.
+    /// Records an alias of an identifier in the table, that of a negative literal in parentheses; the first alias
+    /// stays.
     void insertAlias(const std::string& identifier, const std::string& alias);
     /// The alias of an identifier, or the empty text.
     [[nodiscard]] std::string aliasOf(const std::string& identifier) const;

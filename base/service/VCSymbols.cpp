@@ -38,11 +38,11 @@ void VCSymbolsOfSymbolicExpr::getSymbolIds(SymbolicExprId id, std::vector<Symbol
             continue;
         } else if (callOps.contains(node.op()) && node.getNumInputs() > 0) {
             first = 1;
-            if (wants(VCSymbolType::FunctionName) && node.getInput(0) < next)
+            if (wants(VCSymbolType::FunctionName) && table().hasOperand(next, node.getInput(0)))
                 found.push_back(node.getInput(0));
         }
         for (std::size_t i = node.getNumInputs(); i > first; --i)
-            if (node.getInput(i - 1) < next) // as in every walk: no other operand can be trusted
+            if (table().hasOperand(next, node.getInput(i - 1)))
                 open.push_back(node.getInput(i - 1));
     }
     ids.insert(ids.end(), found.begin(), found.end());

@@ -31,7 +31,8 @@ Constraint Atoms::readComparison(SymbolicExprId literal, const SymbolicBinaryExp
     const SymbolicOp op = comparison.op();
     const SymbolicExprId left = context_.resolve(comparison.left());
     const SymbolicExprId right = context_.resolve(comparison.right());
-    if (const std::optional<int> constant = context_.integer(right))
+    const std::optional<int> constant = context_.integer(right);
+    if (constant && !context_.mayBeReal(left))
         return enter({left, invalidId, SymbolicOp::None}, comparison.left(), invalidId,
                      IntegerSet::satisfying(op, *constant), literal);
     if (!context_.isNumber(right) && !context_.isNumber(left))

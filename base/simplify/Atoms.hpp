@@ -16,7 +16,7 @@ namespace VT {
 ///
 /// A comparison with an integer constant restricts its left operand to a set of integers; a comparison of two operands
 /// restricts their difference, compared with 0; any other operand of an And or Or is a value that is zero or not.  A
-/// comparison with a real constant is a truth value of its own, so that only its exact opposite meets it.  Atoms are
+/// comparison of or with a real value is a truth value of its own, so that only its exact opposite meets it.  Atoms are
 /// numbered in the order in which literals are read, which the caller keeps independent of how nodes are numbered.
 class Atoms {
 public:
@@ -34,7 +34,7 @@ public:
     SymbolicExprId write(const Cover& cover);
 
 private:
-    /// Identity of an atom: two operands, or one; `op` tells comparisons with a real constant apart.
+    /// Identity of an atom: two operands, or one; `op` tells comparisons of real values apart.
     using Key = std::tuple<SymbolicExprId, SymbolicExprId, SymbolicOp>;
 
     struct Entry {

@@ -150,7 +150,21 @@ constexpr NodeRule comparisonRules[] = {
     {{comparisonOps, "orientation", "3 < A", "A > 3"}, orientation},
 };
 
+constexpr RuleInfo truthValueAsNumber{
+    {SymbolicOp::And, SymbolicOp::Or}, "truth value as number", "-(A && 2)", "-(A ~= 0)"};
+
 } // namespace
+
+SymbolicExprId truthAsNumber(RuleContext& context, SymbolicExprId source, SymbolicExprId rebuilt) {
+    if (!context.table().has(source) || !context.isBoolean(source))
+        return rebuilt;
+    if (context.isBoolean(rebuilt) || context.isTrue(rebuilt) || context.isFalse(rebuilt))
+        return rebuilt;
+    const SymbolicExprId value =
+        simplifyComparison(context, SymbolicOp::NotEqual, rebuilt, context.make<SymbolicIntValue>(0));
+    context.fired(truthValueAsNumber, source, value);
+    return value;
+}
 
 SymbolicExprId simplifyNot(RuleContext& context, SymbolicExprId operand) {
     const RuleOperands operands{SymbolicOp::Not, operand, invalidId, context.resolve(operand), invalidId};
@@ -170,6 +184,7 @@ void appendNotRules(std::vector<const RuleInfo*>& out) {
 
 void appendComparisonRules(std::vector<const RuleInfo*>& out) {
     appendInfo<NodeRule>(comparisonRules, out);
+    out.push_back(&truthValueAsNumber);
 }
 
 } // namespace VT

@@ -1,9 +1,11 @@
 #include "base/simplify/Cover.hpp"
 
 #include "base/core/Hash.hpp"
+#include "base/core/Limits.hpp"
 
 #include <algorithm>
 #include <numeric>
+#include <utility>
 
 namespace VT {
 
@@ -83,6 +85,27 @@ std::size_t Cube::comparisons() const noexcept {
 std::size_t comparisons(const Cover& cover) noexcept {
     return std::accumulate(cover.begin(), cover.end(), std::size_t{0},
                            [](std::size_t sum, const Cube& cube) { return sum + cube.comparisons(); });
+}
+
+CoverBudget searchBudget(const Cover& cover) noexcept {
+    return {limits::coverSteps + limits::coverStepsPerLiteral * comparisons(cover)};
+}
+
+bool reduce(Cover& cover, CoverBudget& budget) {
+    const auto join = [](Cover& sum) {
+        while (joinCubes(sum) || absorb(sum)) {
+        }
+    };
+    join(cover);
+    if (budget.exhausted())
+        return false;
+    Cover smaller = cover;
+    while (dropComparisons(smaller, budget) || dropCubes(smaller, budget))
+        join(smaller);
+    if (budget.exhausted())
+        return false;
+    cover = std::move(smaller);
+    return true;
 }
 
 Cover complement(const Cube& cube) {

@@ -69,10 +69,22 @@ using Cover = std::vector<Cube>;
 /// The cubes that hold where one of `a` and one of `b` hold.  Sizes are the caller's to bound.
 [[nodiscard]] Cover product(const Cover& a, const Cover& b);
 
-/// Steps of the search for what other cubes cover; when they are used up, what was not proven stays.
+/// Steps of the search for what other cubes cover, one for each literal looked at; when they are used up, what was not
+/// proven stays.
 struct CoverBudget {
-    std::size_t steps;
+    std::size_t steps = 0;
+
+    [[nodiscard]] bool exhausted() const noexcept { return steps == 0; }
+
+    /// Takes steps away; false where none are left.
+    bool spend(std::size_t count) noexcept {
+        steps -= count < steps ? count : steps;
+        return steps != 0;
+    }
 };
+
+/// What the search through one cover may cost.
+[[nodiscard]] CoverBudget searchBudget(const Cover& cover) noexcept;
 
 // Each of these makes a cover smaller, if it can, and tells whether it did.
 
@@ -84,6 +96,10 @@ bool joinCubes(Cover& cover);
 bool dropComparisons(Cover& cover, CoverBudget& budget);
 /// Takes away cubes that hold only where the others together do.
 bool dropCubes(Cover& cover, CoverBudget& budget);
+
+/// Applies all of these until none makes the cover smaller.  A search that exhausts the budget leaves no trace: the
+/// cover is then joined and absorbed only, and the answer is false.
+bool reduce(Cover& cover, CoverBudget& budget);
 
 /// Whether the cover holds wherever the cube does; false also when the budget is used up.
 [[nodiscard]] bool covers(const Cover& cover, const Cube& cube, CoverBudget& budget);

@@ -1,4 +1,5 @@
 // Covers made smaller by what several cubes cover together.
+#include "base/core/Limits.hpp"
 #include "base/simplify/CoverOccurrences.hpp"
 
 #include <algorithm>
@@ -33,8 +34,6 @@ public:
     void remove(std::size_t index) { gone_[index] = true; }
 
 private:
-    static constexpr std::size_t depthBound = 200;
-
     /// What candidates say about each atom within a cube.
     using Reach = std::map<Atom, std::vector<Interval>>;
 
@@ -50,19 +49,28 @@ private:
 
     /// The cubes that may help: a cube that restricts an atom of which some value is out of reach helps only where the
     /// atom is restricted already.
-    std::vector<const Cube*> candidates(const Cube& cube, std::size_t skip) const {
-        std::vector<std::size_t> indices = everywhere_;
-        for (const Constraint& c : cube.constraints())
-            if (c.atom < occurrences_.atoms())
-                indices.insert(indices.end(), occurrences_.of(c.atom).begin(), occurrences_.of(c.atom).end());
-        std::ranges::sort(indices);
-        indices.erase(std::unique(indices.begin(), indices.end()), indices.end());
+    std::vector<const Cube*> candidates(const Cube& cube, std::size_t skip) {
+        std::vector<bool> near(cover_.size(), false);
+        for (const std::size_t i : everywhere_)
+            near[i] = true;
+        for (const Constraint& c : cube.constraints()) {
+            if (c.atom >= occurrences_.atoms())
+                continue;
+            if (!budget_.spend(occurrences_.of(c.atom).size()))
+                return {};
+            for (const std::size_t i : occurrences_.of(c.atom))
+                near[i] = true;
+        }
         std::vector<const Cube*> result;
-        for (const std::size_t i : indices) {
+        for (std::size_t i = 0; i < near.size(); ++i) {
+            if (!near[i] || i == skip || gone_[i])
+                continue;
+            if (!budget_.spend(1 + cover_[i].constraints().size()))
+                return {};
             const bool helps = std::ranges::all_of(cover_[i].constraints(), [&](const Constraint& c) {
                 return spanned_[c.atom] || cube.find(c.atom) != nullptr;
             });
-            if (i != skip && !gone_[i] && helps)
+            if (helps)
                 result.push_back(&cover_[i]);
         }
         return result;
@@ -71,10 +79,11 @@ private:
     // NOLINTNEXTLINE(misc-no-recursion): the depth has a bound
     bool search(const Cube& cube, const std::vector<const Cube*>& cubes, std::size_t depth) {
         std::vector<const Cube*> touching;
+        if (depth > limits::coverDepth)
+            budget_.steps = 0;
         for (const Cube* other : cubes) {
-            if (budget_.steps == 0 || depth > depthBound)
+            if (!budget_.spend(other->constraints().size()))
                 return false;
-            --budget_.steps;
             if (cube.isSubsetOf(*other))
                 return true;
             if (cube.intersects(*other))
@@ -99,6 +108,8 @@ private:
         for (bool again = true; again && !cubes.empty();) {
             Reach reach;
             for (const Cube* other : cubes) {
+                if (!budget_.spend(other->constraints().size()))
+                    return cubes.clear();
                 for (const Constraint& c : other->constraints())
                     if (restricts(cube, c))
                         reach[c.atom].insert(reach[c.atom].end(), c.set.intervals().begin(), c.set.intervals().end());
@@ -184,6 +195,8 @@ bool dropComparisons(Cover& cover, CoverBudget& budget) {
         const Cube::Constraints constraints = cover[i].constraints();
         for (const Constraint& c : constraints) {
             // Only a cube that allows the atom another value can make up for a comparison that goes.
+            if (!budget.spend(occurrences.of(c.atom).size()))
+                return any;
             const bool helped = std::ranges::any_of(occurrences.of(c.atom), [&](std::size_t j) {
                 const IntegerSet* other = j == i ? nullptr : cover[j].find(c.atom);
                 return other != nullptr && !other->isSubsetOf(c.set);

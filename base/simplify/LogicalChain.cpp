@@ -1,5 +1,7 @@
 #include "base/simplify/LogicalChain.hpp"
 
+#include "base/core/IdMap.hpp"
+#include "base/core/Limits.hpp"
 #include "base/simplify/Atoms.hpp"
 #include "base/simplify/RuleTables.hpp"
 
@@ -12,8 +14,6 @@
 namespace VT {
 
 namespace {
-
-constexpr std::size_t searchSteps = 20000;
 
 /// A chain on its way to a sum of products: first its operands, then covers whose product (And) or sum (Or) it is.
 struct Chain {
@@ -61,6 +61,14 @@ struct Chain {
         return false;
     }
 
+    /// Gives up where the call has multiplied out as much as it may.
+    bool affords(std::size_t literals) {
+        if (context.multiplies(literals))
+            return true;
+        decide(source);
+        return false;
+    }
+
     RuleContext& context;
     SymbolicOp op;
     SymbolicExprId source;
@@ -74,7 +82,7 @@ struct Chain {
     Cube common;                     ///< And: what they say together
     std::vector<Cover> alternatives; ///< And: operands that are sums
     Cover sum;                       ///< Or, and And once it is distributed
-    CoverBudget budget{searchSteps};
+    CoverBudget budget;              ///< of the rules that an explanation shows one by one
     SymbolicExprId result = invalidId;
 };
 
@@ -185,20 +193,17 @@ bool absorbedAlternative(Chain& chain) {
            }) > 0;
 }
 
-void makeSmaller(Cover& cover, CoverBudget& budget) {
-    bool changed = true;
-    while (changed)
-        changed = joinCubes(cover) || absorb(cover) || dropComparisons(cover, budget) || dropCubes(cover, budget);
-}
-
-/// Multiplies covers one after the other and keeps what comes out small.  False where the operand limit is exceeded.
+/// Multiplies covers one after the other and keeps what comes out small.  False where the operand limit or what a call
+/// may multiply out is exceeded.
 bool multiplyOut(Chain& chain, std::vector<Cover> factors) {
     std::ranges::stable_sort(factors, {}, &Cover::size);
+    CoverBudget budget{limits::coverSteps};
     for (const Cover& factor : factors) {
-        if (!chain.bounded(chain.sum.size() * factor.size()))
+        const std::size_t literals = chain.sum.size() * comparisons(factor) + factor.size() * comparisons(chain.sum);
+        if (!chain.bounded(chain.sum.size() * factor.size()) || !chain.affords(literals))
             return false;
         chain.sum = product(chain.sum, factor);
-        makeSmaller(chain.sum, chain.budget);
+        reduce(chain.sum, budget);
     }
     return true;
 }
@@ -269,6 +274,7 @@ constexpr ChainRule orRules[] = {
 constexpr ChainRule sumRules[] = {
     {{andOr, "joined range", "A == 3 || A > 3", "A >= 3"}, joinedRange},
     {{andOr, "absorbed product", "A || A && B", "A"}, absorbedProduct},
+    // A search that exhausts its budget is as if it had not been.
     {{andOr, "redundant comparison", "A == 1 || A ~= 1 && B == 2", "A == 1 || B == 2"}, redundantComparison},
     {{andOr, "redundant product", "A && B || ~A && C || B && C", "A && B || C && ~A"}, redundantProduct},
 };
@@ -298,8 +304,19 @@ bool decidedBy(std::span<const ChainRule> rules, Chain& chain) {
 SymbolicExprId reduceSum(Chain& chain) {
     if (!chain.isRead)
         chain.read();
-    const auto helped = [&](const ChainRule& rule) { return apply(rule, chain) || chain.result != invalidId; };
-    while (chain.result == invalidId && std::ranges::any_of(sumRules, helped)) {
+    const auto applyAll = [&](std::span<const ChainRule> rules) {
+        const auto helped = [&](const ChainRule& rule) { return apply(rule, chain) || chain.result != invalidId; };
+        while (chain.result == invalidId && std::ranges::any_of(rules, helped)) {
+        }
+    };
+    applyAll(std::span(sumRules).first(2));
+    CoverBudget budget = chain.budget = searchBudget(chain.sum);
+    Cover smaller = chain.sum;
+    if (chain.result == invalidId && reduce(smaller, budget)) {
+        if (chain.context.explaining())
+            applyAll(sumRules);
+        else
+            chain.sum = std::move(smaller);
     }
     if (chain.result == invalidId)
         apply(orderRule, chain);
@@ -307,6 +324,26 @@ SymbolicExprId reduceSum(Chain& chain) {
 }
 
 } // namespace
+
+bool chainIsWithin(const SymbolicExprTable& table, const SymbolicExpr& root, std::uint64_t limit) {
+    std::uint64_t operands = 0;
+    std::vector<SymbolicExprId> pending{root.getInput(1), root.getInput(0)};
+    IdMap<bool> seen;
+    while (!pending.empty() && operands <= limit) {
+        const SymbolicExprId id = pending.back();
+        pending.pop_back();
+        if (!table.has(id) || seen.find(id) != nullptr)
+            continue;
+        seen.insert(id, true);
+        const SymbolicExpr& node = *table.get(id);
+        if (node.op() != root.op())
+            ++operands;
+        else
+            for (const std::size_t side : {1, 0})
+                pending.push_back(node.getInput(side));
+    }
+    return operands <= limit;
+}
 
 SymbolicExprId simplifyChain(RuleContext& context, SymbolicExprId root) {
     Chain chain(context, context.op(root), root);

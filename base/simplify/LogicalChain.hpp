@@ -5,6 +5,10 @@
 
 namespace VT {
 
+/// Whether the And or Or chain rooted at a node has at most so many distinct operands.  Linear in the distinct nodes of
+/// the chain up to the one that is too many.
+bool chainIsWithin(const SymbolicExprTable& table, const SymbolicExpr& root, std::uint64_t limit);
+
 /// Simplifies the And or Or chain rooted at a node, whose operands are simplified already: to a truth constant, an
 /// operand or a sum of products in the order of texts.  Gives up, and answers the chain as it stands, where the operand
 /// limit is exceeded.

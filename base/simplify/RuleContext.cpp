@@ -52,6 +52,34 @@ std::optional<int> RuleContext::integer(SymbolicExprId id) const {
     return static_cast<const SymbolicIntValue&>(literal).getValue();
 }
 
+bool RuleContext::mayBeReal(SymbolicExprId id) {
+    static constexpr OperatorSet arithmetic{SymbolicOp::Plus, SymbolicOp::Minus, SymbolicOp::UnaryMinus,
+                                            SymbolicOp::Multiply, SymbolicOp::Divide};
+    std::vector<SymbolicExprId> pending{id};
+    while (!pending.empty()) {
+        const SymbolicExprId next = pending.back();
+        const SymbolicExpr& value = node(resolve(next));
+        const std::size_t before = pending.size();
+        bool real = value.op() == SymbolicOp::DoubleValue;
+        if (arithmetic.contains(value.op())) {
+            real = real || resolve(next) != next; // a bound value need not be below the node, so it is not entered
+            for (std::size_t i = 0; i < value.getNumInputs() && !real; ++i) {
+                const bool* const known = real_.find(value.getInput(i));
+                if (known == nullptr)
+                    pending.push_back(value.getInput(i));
+                real = known != nullptr && *known;
+            }
+        }
+        if (real)
+            pending.resize(before);
+        if (pending.size() > before)
+            continue;
+        real_.insert(next, real);
+        pending.pop_back();
+    }
+    return *real_.find(id);
+}
+
 bool RuleContext::isSimKeyword(SymbolicExprId id) const {
     return op(id) == SymbolicOp::String &&
            VariantKeywords::isSimVariantKeyword(static_cast<const SymbolicString&>(node(id)).getName(), keywordsOn_);

@@ -1,6 +1,7 @@
 // What every rule works with.
 #pragma once
 
+#include "base/core/IdMap.hpp"
 #include "base/core/Nodes.hpp"
 #include "base/print/ExpressionPrinter.hpp"
 #include "base/simplify/Rule.hpp"
@@ -23,6 +24,12 @@ public:
     virtual bool confirmRewrite(SymbolicExprId expression, SymbolicExprId replacement) = 0;
     /// Operands of a flattened chain and products of a distribution.
     [[nodiscard]] virtual std::uint64_t operandLimit() const = 0;
+    /// Takes note of literals that are about to be multiplied out; false, and gives up, where they are more than the
+    /// call may have.
+    virtual bool multiplies(std::size_t literals) = 0;
+    /// Whether the node at hand is below a comparison or a logical operator, where quotients are truncated; elsewhere
+    /// they are exact.
+    [[nodiscard]] virtual bool inCondition() const = 0;
     /// Tells that a chain or a distribution is beyond the limit: the pass will not be used.
     virtual void giveUp() = 0;
 
@@ -54,6 +61,10 @@ public:
 
     [[nodiscard]] bool isBoolean(SymbolicExprId id) const { return booleanOps.contains(op(id)); }
 
+    /// Whether an operand may have a value between two integers: a real literal takes part in its arithmetic.  Looks at
+    /// each node once in a pass.
+    [[nodiscard]] bool mayBeReal(SymbolicExprId id);
+
     [[nodiscard]] bool isSimKeyword(SymbolicExprId id) const;
     [[nodiscard]] bool isCodegenKeyword(SymbolicExprId id) const;
 
@@ -80,6 +91,7 @@ private:
     bool keywordsOn_;
     RuleListener* listener_ = nullptr;
     std::uint64_t pass_ = 0;
+    IdMap<bool> real_; ///< what mayBeReal() found
 };
 
 } // namespace VT

@@ -31,6 +31,9 @@ SymbolicExprId applyFirst(std::span<const NodeRule> rules, RuleContext& context,
 SymbolicExprId simplifyNot(RuleContext& context, SymbolicExprId operand);
 /// A comparison of simplified operands.
 SymbolicExprId simplifyComparison(RuleContext& context, SymbolicOp op, SymbolicExprId a, SymbolicExprId b);
+/// An operand of a parent that counts with it: `rebuilt`, or a comparison of it with 0 where it is no truth value and
+/// `source`, of which it was made, is one.
+SymbolicExprId truthAsNumber(RuleContext& context, SymbolicExprId source, SymbolicExprId rebuilt);
 /// A product, a quotient of simplified operands.
 SymbolicExprId simplifyMultiply(RuleContext& context, SymbolicExprId a, SymbolicExprId b);
 SymbolicExprId simplifyDivide(RuleContext& context, SymbolicExprId a, SymbolicExprId b);
@@ -51,6 +54,7 @@ void appendInfo(std::span<const Rule> rules, std::vector<const RuleInfo*>& out) 
 void appendNotRules(std::vector<const RuleInfo*>& out);
 void appendComparisonRules(std::vector<const RuleInfo*>& out);
 void appendLogicalRules(std::vector<const RuleInfo*>& out);
-void appendArithmeticRules(std::vector<const RuleInfo*>& out);
+void appendSumRules(std::vector<const RuleInfo*>& out);
+void appendProductRules(std::vector<const RuleInfo*>& out);
 
 } // namespace VT

@@ -12,7 +12,8 @@ std::span<const RuleInfo* const> simplificationRules() {
         appendNotRules(all);
         appendComparisonRules(all);
         appendLogicalRules(all);
-        appendArithmeticRules(all);
+        appendSumRules(all);
+        appendProductRules(all);
         return all;
     }();
     return rules;
@@ -79,6 +80,7 @@ SymbolicExprId SymbolicExprSimplify::simplify(SymbolicExprId id, std::uint64_t& 
     if (!table_.has(id))
         return invalidId;
     visitor.setListener(listener_);
+    visitor.renewBudget();
     IdMap<bool> seen;
     SymbolicExprId current = id;
     for (;;) {
@@ -92,10 +94,8 @@ SymbolicExprId SymbolicExprSimplify::simplify(SymbolicExprId id, std::uint64_t& 
         if (constant || seen.find(result) != nullptr || passes >= maxIterations_)
             break;
     }
-    // What an earlier pass reached before one gave up may be a half-finished expansion.
-    if (visitor.hasGivenUp() && printer_.textLength(current) > printer_.textLength(id))
-        return id;
-    return current;
+    // What an earlier pass reached might get further with a budget of its own, so that a second call would change it.
+    return visitor.hasExhaustedBudget() ? id : current;
 }
 
 void SymbolicExprSimplify::computeUniqueAndOperandsId(const SymbolicExpr& node,

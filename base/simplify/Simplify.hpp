@@ -13,7 +13,9 @@ namespace VT {
 
 /// Simplifies expressions of one table.  Conditions are over integers: every symbol stands for an integer, a truth
 /// value is an integer that is not zero.  A condition becomes a sum of products of comparisons, as far as the operand
-/// limit allows; the result has the same truth for every assignment of integers.
+/// limit allows; the result has the same truth for every assignment of integers.  What is no comparison and no logical
+/// operator is a dimension, and keeps its value: dimensions divide exactly, quotients below a comparison or a logical
+/// operator are truncated toward zero.
 ///
 /// Keeps the texts of operands that it has ordered, so that further calls need not print them again.
 class VTSYM_API SymbolicExprSimplify {

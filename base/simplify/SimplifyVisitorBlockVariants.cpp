@@ -4,6 +4,10 @@ namespace VT {
 
 VCCustomizer::~VCCustomizer() = default;
 
+std::optional<ParameterReplacement> VCCustomizer::parameterOfBlock(const VTBlock*, const std::string&) const {
+    return std::nullopt;
+}
+
 SymbolicExprSimplifyVisitorBlockVariants::SymbolicExprSimplifyVisitorBlockVariants(SymbolicExprTable& table,
                                                                                    bool keywordsFlag,
                                                                                    const SymbolicExprPrinter& printer,

@@ -2,15 +2,19 @@
 #pragma once
 
 #include "base/core/Table.hpp"
+#include "host/Model.hpp"
 
+#include <optional>
 #include <string>
 #include <unordered_map>
 #include <variant>
 
 namespace VT {
 
-/// What stands for parameters while conditions are compared: another parameter's name or a value.
-using ParameterReplacements = std::unordered_map<std::string, std::variant<std::string, int>>;
+/// What stands for a parameter: another parameter's name or a value.
+using ParameterReplacement = std::variant<std::string, int>;
+/// What stands for parameters while conditions are compared.
+using ParameterReplacements = std::unordered_map<std::string, ParameterReplacement>;
 
 /// A host's say in simplification.  Exceptions of the operations pass to whoever asked for the simplification, and
 /// nothing of its result is kept.
@@ -30,6 +34,12 @@ public:
     /// What to put in the place of parameters before two conditions are compared, all at once; nothing unless
     /// overridden.  Names that the conditions have not are ignored.
     virtual ParameterReplacements parameterReplacements() { return {}; }
+
+    /// What the conditions of a block mean by a parameter; nothing, as unless overridden, for the parameter itself.
+    /// Asked by queries on blocks and ports that are given this customizer, whether it is installed or not.  `block` is
+    /// nullptr for a condition of no block.
+    virtual std::optional<ParameterReplacement> parameterOfBlock(const VTBlock* block,
+                                                                 const std::string& parameter) const;
 
 protected:
     VCCustomizer() = default;

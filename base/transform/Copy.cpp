@@ -1,7 +1,5 @@
 #include "base/transform/Copy.hpp"
 
-#include "base/core/Walk.hpp"
-
 namespace VT {
 
 SymbolicExprCopyVisitor::SymbolicExprCopyVisitor(const SymbolicExprTable& source, SymbolicExprTable& target)
@@ -20,31 +18,20 @@ void SymbolicExprCopyVisitor::visit(const SymbolicString& node) {
 
 /// Copies the values that wait, one after the other: a chain of values is as long as the input makes it.
 void SymbolicExprCopyVisitor::bindValues() {
-    std::size_t next = 0;
-    while (next < bindings_.size()) {
-        const auto [name, sourceValue] = bindings_[next++];
-        table().registerValueId(name, copy(sourceValue));
+    try {
+        for (std::size_t next = 0; next < bindings_.size(); ++next) {
+            const auto [name, sourceValue] = bindings_[next];
+            table().registerValueId(name, copy(sourceValue));
+        }
+    } catch (...) {
+        bindings_.clear();
+        throw;
     }
     bindings_.clear();
 }
 
 SymbolicExprId SymbolicExprCopyVisitor::copy(SymbolicExprId id) {
-    const bool inPlace = &source_ == &table();
-    std::vector<WalkFrame> stack;
-    walkUnknown(
-        source_, id, stack,
-        [&](SymbolicExprId known, const SymbolicExpr*) {
-            const SymbolicExprId* const copied = copies_.find(known);
-            if (copied != nullptr)
-                push(*copied);
-            return copied != nullptr;
-        },
-        [&](SymbolicExprId visited, const SymbolicExpr& node, const SymbolicExpr*) {
-            visitAs(inPlace ? visited : invalidId, node);
-            copies_.insert(visited, top());
-        },
-        [&](SymbolicExprId, const SymbolicExpr*) { push(invalidId); });
-    return pop();
+    return rebuild(source_, id, copies_);
 }
 
 SymbolicExprId SymbolicExprCopy::operator()(SymbolicExprId id) const {

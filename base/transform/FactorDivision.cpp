@@ -15,7 +15,8 @@ SymbolicExprFactorDivisionVisitor::Fraction SymbolicExprFactorDivisionVisitor::f
     if (node == nullptr || node->op() != SymbolicOp::Divide)
         return {id};
     const auto& quotient = static_cast<const SymbolicDivideExpr&>(*node);
-    return {quotient.left(), quotient.right()};
+    const bool isWhole = table().hasOperand(id, quotient.left()) && table().hasOperand(id, quotient.right());
+    return isWhole ? Fraction{quotient.left(), quotient.right()} : Fraction{id};
 }
 
 SymbolicExprId SymbolicExprFactorDivisionVisitor::product(SymbolicExprId a, SymbolicExprId b) {
@@ -33,9 +34,11 @@ SymbolicExprId SymbolicExprFactorDivisionVisitor::divisor(const Fraction& a, con
 }
 
 /// Replaces the operands on the stack by the quotient that `combination(a, b)` makes of them; rebuilds the node where
-/// neither is a quotient.
+/// neither is a quotient, or one is missing.
 template <class Node, class Combine>
 void SymbolicExprFactorDivisionVisitor::combine(const Node& node, Combine combination) {
+    if (lacksOperand(node))
+        return SymbolicExprXFormVisitor::visit(node);
     const SymbolicExprId right = pop();
     const SymbolicExprId left = pop();
     const Fraction a = fraction(left);

@@ -7,7 +7,7 @@ namespace VT {
 
 /// Rebuilds an expression so that a sum, difference, remainder, product or quotient of quotients becomes one quotient:
 /// N/2 + M/3 becomes (N*3 + M*2)/(2*3).  Nothing is folded and nothing cancelled, and no divisor is looked at.
-/// Element-wise and left division are no quotients.
+/// Element-wise and left division are no quotients, nor is a division that lacks an operand.
 ///
 /// The result has the value of the original where quotients are exact: dimensions are meant, not the truncating
 /// division of integers.

@@ -13,15 +13,20 @@ std::optional<int> negated(int value) {
     return -value;
 }
 
+/// The negative of a number of places.  No integer has 2147483648 bits, so a shift by one place less says the same.
+int opposite(int places) {
+    return negated(places).value_or(std::numeric_limits<int>::max());
+}
+
 const SymbolicIntValue* asLiteral(const SymbolicExprTable& table, SymbolicExprId id) {
     const SymbolicExpr* const node = table.get(id);
     return node != nullptr && node->op() == SymbolicOp::IntValue ? static_cast<const SymbolicIntValue*>(node) : nullptr;
 }
 
-/// The operand of an unary minus, or nothing.
+/// The operand of an unary minus that has one, or nothing.
 std::optional<SymbolicExprId> operandOfMinus(const SymbolicExprTable& table, SymbolicExprId id) {
     const SymbolicExpr* const node = table.get(id);
-    if (node == nullptr || node->op() != SymbolicOp::UnaryMinus)
+    if (node == nullptr || node->op() != SymbolicOp::UnaryMinus || !table.hasOperand(id, node->getInput(0)))
         return std::nullopt;
     return node->getInput(0);
 }
@@ -68,16 +73,13 @@ CShift shiftOfQuillCall(const SymbolicExprTable& table, SymbolicExprId amount) {
     if (const SymbolicIntValue* const value = asLiteral(table, amount)) {
         if (value->getValue() >= 0)
             return {SymbolicOp::ShiftLeft, expression(amount)};
-        const std::optional<int> right = negated(value->getValue());
-        return right ? CShift{SymbolicOp::ShiftRight, literal(*right)} : CShift{SymbolicOp::None, expression(amount)};
+        return {SymbolicOp::ShiftRight, literal(opposite(value->getValue()))};
     }
     const std::optional<SymbolicExprId> operand = operandOfMinus(table, amount);
     if (!operand)
         return {SymbolicOp::ShiftLeft, expression(amount)};
-    if (const SymbolicIntValue* const value = asLiteral(table, *operand); value != nullptr && value->getValue() <= 0) {
-        const std::optional<int> left = negated(value->getValue());
-        return {SymbolicOp::ShiftLeft, left ? literal(*left) : expression(amount)};
-    }
+    if (const SymbolicIntValue* const value = asLiteral(table, *operand); value != nullptr && value->getValue() <= 0)
+        return {SymbolicOp::ShiftLeft, literal(opposite(value->getValue()))};
     return {SymbolicOp::ShiftRight, expression(*operand)};
 }
 

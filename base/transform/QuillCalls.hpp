@@ -60,13 +60,14 @@ struct ShiftAmount {
     SymbolicExprId expression;
 };
 
-/// A C shift.  `op` is None where no shift of 32 bits says the same, so that the call stays.
+/// A C shift.
 struct CShift {
     SymbolicOp op;
     ShiftAmount amount;
 };
 
-/// The C shift that says bitshift(a, amount): to the left by a positive amount, to the right by a negative one.
+/// The C shift that says bitshift(a, amount): to the left by a positive amount, to the right by a negative one.  Of
+/// 2147483648 places, which no literal has, one is left out.
 VTSYM_API CShift shiftOfQuillCall(const SymbolicExprTable& table, SymbolicExprId amount);
 
 /// The second argument of the bitshift() that says a C shift by `amount`.  A literal stays a literal where its negative

@@ -57,15 +57,16 @@ void SymbolicExprQ2CVisitor::visit(const SymbolicFcnCallExpr& node) {
 
 template <class Call>
 void SymbolicExprQ2CVisitor::convert(const Call& node) {
+    if (lacksOperand(node))
+        return SymbolicExprXFormVisitor::visit(node);
     boost::container::small_vector<SymbolicExprId, 4> inputs(node.getNumInputs());
     for (std::size_t i = inputs.size(); i-- > 0;)
         inputs[i] = pop();
     if (!inputs.empty()) {
         const std::span<const SymbolicExprId> arguments(inputs.data() + 1, inputs.size() - 1);
         const SymbolicOp op = operatorOf(inputs.front(), arguments.size());
-        const SymbolicExprId built = op == SymbolicOp::None ? invalidId : build(op, arguments);
-        if (built != invalidId) {
-            push(built);
+        if (op != SymbolicOp::None) {
+            push(build(op, arguments));
             return;
         }
     }
@@ -74,7 +75,7 @@ void SymbolicExprQ2CVisitor::convert(const Call& node) {
     SymbolicExprXFormVisitor::visit(node);
 }
 
-/// The C operator on the arguments, or the invalid identifier where the call has to stay.
+/// The C operator on the arguments.
 SymbolicExprId SymbolicExprQ2CVisitor::build(SymbolicOp op, std::span<const SymbolicExprId> arguments) {
     switch (op) {
     case SymbolicOp::Divide:
@@ -95,60 +96,61 @@ SymbolicExprId SymbolicExprQ2CVisitor::build(SymbolicOp op, std::span<const Symb
         return invalidId;
     }
     const CShift shift = shiftOfQuillCall(table(), arguments[1]);
-    switch (shift.op) {
-    case SymbolicOp::ShiftLeft:
-        return factory_.make<SymbolicShiftLeftExpr>(arguments[0], make(shift.amount));
-    case SymbolicOp::ShiftRight:
-        return factory_.make<SymbolicShiftRightExpr>(arguments[0], make(shift.amount));
-    default:
-        return invalidId;
-    }
+    return shift.op == SymbolicOp::ShiftLeft ? factory_.make<SymbolicShiftLeftExpr>(arguments[0], make(shift.amount))
+                                             : factory_.make<SymbolicShiftRightExpr>(arguments[0], make(shift.amount));
 }
 
 // C to Quill.
 
 void SymbolicExprC2QVisitor::visit(const SymbolicDivideExpr& node) {
-    callOfTwo(node.code);
+    callOfTwo(node);
 }
 
 void SymbolicExprC2QVisitor::visit(const SymbolicModuloExpr& node) {
-    callOfTwo(node.code);
+    callOfTwo(node);
 }
 
 void SymbolicExprC2QVisitor::visit(const SymbolicBitAndExpr& node) {
-    callOfTwo(node.code);
+    callOfTwo(node);
 }
 
 void SymbolicExprC2QVisitor::visit(const SymbolicBitOrExpr& node) {
-    callOfTwo(node.code);
+    callOfTwo(node);
 }
 
 void SymbolicExprC2QVisitor::visit(const SymbolicBitXOrExpr& node) {
-    callOfTwo(node.code);
+    callOfTwo(node);
 }
 
 void SymbolicExprC2QVisitor::visit(const SymbolicShiftLeftExpr& node) {
-    callOfShift(node.code);
+    callOfShift(node);
 }
 
 void SymbolicExprC2QVisitor::visit(const SymbolicShiftRightExpr& node) {
-    callOfShift(node.code);
+    callOfShift(node);
 }
 
 void SymbolicExprC2QVisitor::visit(const SymbolicBitComplExpr& node) {
+    if (lacksOperand(node))
+        return SymbolicExprXFormVisitor::visit(node);
     const SymbolicExprId operand = pop();
     push(factory_.make<SymbolicFcnCall1UExpr>(nameOf(node.code), operand));
 }
 
-void SymbolicExprC2QVisitor::callOfTwo(SymbolicOp op) {
+template <class Node>
+void SymbolicExprC2QVisitor::callOfTwo(const Node& node) {
+    if (lacksOperand(node))
+        return SymbolicExprXFormVisitor::visit(node);
     const SymbolicExprId right = pop();
     const SymbolicExprId left = pop();
-    push(factory_.make<SymbolicFcnCall2UExpr>(nameOf(op), left, right));
+    push(factory_.make<SymbolicFcnCall2UExpr>(nameOf(node.code), left, right));
 }
 
-void SymbolicExprC2QVisitor::callOfShift(SymbolicOp op) {
-    push(make(quillShiftAmount(table(), op, pop())));
-    callOfTwo(op);
+template <class Node>
+void SymbolicExprC2QVisitor::callOfShift(const Node& node) {
+    if (!lacksOperand(node))
+        push(make(quillShiftAmount(table(), node.code, pop())));
+    callOfTwo(node);
 }
 
 // Drivers.

@@ -10,7 +10,7 @@
 namespace VT {
 
 /// The base of both conversions: holds the identifiers of the function names, so that names are compared as
-/// identifiers.
+/// identifiers.  A node that lacks an operand is not converted.
 class VTSYM_API QuillCallVisitor : public SymbolicExprXFormVisitor {
 protected:
     /// Interns idivide, rem, bitand, bitor, bitxor, bitcmp and bitshift in this order.
@@ -64,8 +64,10 @@ public:
     void visit(const SymbolicShiftRightExpr& node) override;
 
 private:
-    void callOfTwo(SymbolicOp op);
-    void callOfShift(SymbolicOp op);
+    template <class Node>
+    void callOfTwo(const Node& node);
+    template <class Node>
+    void callOfShift(const Node& node);
 };
 
 /// Converts expressions of one table to C shape, in that table.

@@ -40,7 +40,7 @@ SymbolicExprReplacementVisitor::SymbolicExprReplacementVisitor(SymbolicExprTable
 
 SymbolicExprId SymbolicExprReplacementVisitor::replacementOf(SymbolicExprId operand) {
     const auto found = replacements_.find(operand);
-    if (found == replacements_.end() || !table().has(found->second))
+    if (operand == invalidId || found == replacements_.end() || !table().has(found->second))
         return operand;
     replaced_ = true;
     return found->second;

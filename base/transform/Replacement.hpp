@@ -15,8 +15,8 @@ using SymbolicExprReplacements = std::unordered_map<SymbolicExprId, SymbolicExpr
 /// operands, though not those further down: [f(x), 2] becomes [f(y), 2], but [x, 2] stays.
 ///
 /// An operand is looked up as it was rebuilt, once: what came in its place is not looked up again, so x and y can be
-/// exchanged.  The root is no operand and is never replaced.  A replacement that is not of the target when it is needed
-/// is ignored.
+/// exchanged.  The root is no operand and is never replaced, nor is an operand that is missing.  A replacement that is
+/// not of the target when it is needed is ignored.
 class VTSYM_API SymbolicExprReplacementVisitor : public SymbolicExprXFormVisitor {
 public:
     /// A visitor that builds in `target`; `replacements` outlives it.

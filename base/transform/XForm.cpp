@@ -1,7 +1,5 @@
 #include "base/transform/XForm.hpp"
 
-#include "base/core/Check.hpp"
-#include "base/core/IdMap.hpp"
 #include "base/core/Limits.hpp"
 #include "base/core/Walk.hpp"
 #include "base/variants/VariantKeywords.hpp"
@@ -11,6 +9,13 @@
 namespace VT {
 
 SymbolicExprFactory::~SymbolicExprFactory() = default;
+
+/// The NaN that was added last, if it stands where the table's own storage ends.
+SymbolicExprId SymbolicExprFactory::newestNaN() const {
+    const SymbolicExprId last = table_.size() - 1;
+    const SymbolicExpr* const node = table_.get(last);
+    return node != nullptr && std::isnan(node->getNumValue()) ? last : invalidId;
+}
 
 SymbolicExprXFormVisitor::SymbolicExprXFormVisitor(SymbolicExprTable& target)
     : keywordsOn(VT::isVariantKeywordsSimCodegenFeatureOn()),
@@ -32,67 +37,65 @@ SymbolicExprId SymbolicExprXFormVisitor::getCodegenVariantKeywordId() const {
     return SymbolicString(table_, VariantKeywords::getCodegenVariantKeyword()).getId(table_);
 }
 
-SymbolicExprId SymbolicExprXFormVisitor::pop() {
-    // An operand that no node stands for was not visited, so nothing was pushed for it.
-    if (stack_.empty())
-        return invalidId;
-    const SymbolicExprId id = stack_.back();
-    stack_.pop_back();
-    return id;
-}
-
 SymbolicExprId SymbolicExprXFormVisitor::get() {
-    if (stack_.size() != 1)
+    if (depth() != 1)
         return invalidId;
     return pop();
+}
+
+SymbolicExprId SymbolicExprXFormVisitor::makeReal(double value) {
+    const SymbolicExpr* const node = visitedNode();
+    const bool isVisited = std::isnan(value) && node != nullptr && std::isnan(node->getNumValue());
+    const SymbolicExprId own = isVisited ? visitedId(table_, node) : invalidId;
+    return own != invalidId ? own : factory_.make<SymbolicDoubleValue>(value);
 }
 
 void SymbolicExprXFormVisitor::visitAs(SymbolicExprId id, const SymbolicExpr& node) {
-    [[maybe_unused]] const std::size_t before = stack_.size();
-    current_ = id;
+    const Visiting visiting(*this, table_, id, node);
     node.invoke(*this);
-    current_ = invalidId;
-    VTSYM_CHECK(stack_.size() + node.getNumInputs() == before + 1);
-}
-
-void SymbolicExprXFormVisitor::unwind(std::size_t depth) noexcept {
-    if (depth < stack_.size())
-        stack_.resize(depth);
-    current_ = invalidId;
 }
 
 SymbolicExprId SymbolicExprXFormVisitor::rebuild(const SymbolicExprTable& source, SymbolicExprId id) {
-    if (!source.has(id))
-        return invalidId;
-    const std::size_t before = depth();
+    IdMap<SymbolicExprId> results;
+    return rebuild(source, id, results);
+}
+
+SymbolicExprId SymbolicExprXFormVisitor::rebuild(const SymbolicExprTable& source, SymbolicExprId id,
+                                                 IdMap<SymbolicExprId>& results) {
+    const OwnRun run(*this);
     const bool inPlace = &source == &table_;
-    IdMap<SymbolicExprId> rebuilt;
-    try {
-        walkDistinct(
-            source, id,
-            [&](SymbolicExprId visited, const SymbolicExpr& node) {
-                visitAs(inPlace ? visited : invalidId, node);
-                rebuilt.insert(visited, top());
-            },
-            [&](SymbolicExprId known) {
-                const SymbolicExprId* result = rebuilt.find(known);
-                push(result != nullptr ? *result : invalidId);
-            });
-    } catch (...) {
-        unwind(before);
-        throw;
-    }
-    return pop();
+    bool disciplined = true;
+    std::size_t repeatable = limits::repeatedVisits;
+    std::vector<WalkFrame> stack;
+    walkUnknown(
+        source, id, stack,
+        [&](SymbolicExprId known, const SymbolicExpr*) {
+            const SymbolicExprId* const result = results.find(known);
+            if (result != nullptr)
+                push(*result);
+            return result != nullptr;
+        },
+        [&](SymbolicExprId visited, const SymbolicExpr& node, const SymbolicExpr*, bool isInCircle) {
+            const auto visitNode = [&] { visitAs(inPlace ? visited : invalidId, node); };
+            disciplined = keepsDiscipline(node.getNumInputs(), visitNode) && disciplined;
+            if ((disciplined && !isInCircle) || repeatable == 0)
+                results.insert(visited, top());
+            else
+                --repeatable;
+        },
+        [&](SymbolicExprId, const SymbolicExpr*) { push(invalidId); });
+    return get();
 }
 
 /// The node rebuilt from the operands on the stack; its own identifier, without a probe, where nothing changed.
 template <class Node>
 SymbolicExprId SymbolicExprXFormVisitor::identity(const Node& node) {
-    const bool inPlace = current_ != invalidId;
+    const SymbolicExprId own = visitedId(table_, &node);
+    const bool inPlace = own != invalidId;
     if constexpr (std::is_base_of_v<SymbolicUnaryExpr, Node>) {
         const SymbolicExprId a = pop();
         if (inPlace && a == node.operand())
-            return current_;
+            return own;
         if constexpr (Node::code == SymbolicOp::MemberValue)
             return factory_.make<Node>(a, node.getMemberName());
         else
@@ -100,22 +103,22 @@ SymbolicExprId SymbolicExprXFormVisitor::identity(const Node& node) {
     } else if constexpr (std::is_base_of_v<SymbolicBinaryExpr, Node>) {
         const SymbolicExprId b = pop();
         const SymbolicExprId a = pop();
-        return inPlace && a == node.left() && b == node.right() ? current_ : factory_.make<Node>(a, b);
+        return inPlace && a == node.left() && b == node.right() ? own : factory_.make<Node>(a, b);
     } else if constexpr (std::is_base_of_v<SymbolicTernaryExpr, Node>) {
         const SymbolicExprId c = pop();
         const SymbolicExprId b = pop();
         const SymbolicExprId a = pop();
         const bool same = a == node.first() && b == node.second() && c == node.third();
-        return inPlace && same ? current_ : factory_.make<Node>(a, b, c);
+        return inPlace && same ? own : factory_.make<Node>(a, b, c);
     } else if constexpr (std::is_base_of_v<SymbolicMultiExpr, Node>) {
         std::vector<SymbolicExprId> inputs(node.getNumInputs());
         for (std::size_t i = inputs.size(); i-- > 0;)
             inputs[i] = pop();
-        return inPlace && inputs == node.inputs() ? current_ : factory_.make<Node>(std::move(inputs));
+        return inPlace && inputs == node.inputs() ? own : factory_.make<Node>(std::move(inputs));
     } else if constexpr (Node::code == SymbolicOp::String) {
-        return inPlace ? current_ : factory_.make<Node>(node.getName());
+        return inPlace ? own : factory_.make<Node>(node.getName());
     } else {
-        return inPlace ? current_ : factory_.make<Node>(node.getValue());
+        return inPlace ? own : factory_.make<Node>(node.getValue());
     }
 }
 

@@ -1,10 +1,12 @@
 // The bases of visitors that rebuild an expression bottom-up into a table.
 #pragma once
 
+#include "base/core/IdMap.hpp"
 #include "base/core/Nodes.hpp"
+#include "base/core/OperandStack.hpp"
 
+#include <cmath>
 #include <cstdint>
-#include <vector>
 
 namespace VT {
 
@@ -17,29 +19,32 @@ public:
     SymbolicExprFactory& operator=(const SymbolicExprFactory&) = delete;
     virtual ~SymbolicExprFactory();
 
-    /// The identifier of the node of class Node with these parts, interned if it was not there.
+    /// The identifier of the node of class Node with these parts, interned if it was not there.  A NaN is always a new
+    /// node; a table that keeps its nodes elsewhere and does not find it has the invalid identifier for it.
     template <class Node, class... Parts>
     SymbolicExprId make(Parts&&... parts) {
         const Node node(table_, std::forward<Parts>(parts)...);
-        SymbolicExprId id = node.getId(table_);
+        const SymbolicExprId id = node.getId(table_);
         if constexpr (Node::equalWithinTolerance)
-            if (id == invalidId) // NaN equals nothing, not even the copy that was added just now
-                id = table_.size() - 1;
+            return id == invalidId ? newestNaN() : id; // it equals nothing, not even the copy that was added just now
         return id;
     }
 
 private:
+    [[nodiscard]] SymbolicExprId newestNaN() const;
+
     SymbolicExprTable& table_;
 };
 
 /// Rebuilds every node as it is.  A subclass overrides the visits of the classes that it changes and keeps the
-/// discipline of the stack: a visit pops its node's operands, the last one first, and pushes exactly one identifier.
-class VTSYM_API SymbolicExprXFormVisitor : public SymbolicExprVisitor {
+/// discipline of the stack: a visit pops its node's operands, the last one first, and pushes exactly one identifier.  A
+/// visit of the base rebuilds the node that it is given, whichever node is visited.
+///
+/// For a missing operand the invalid identifier is on the stack, and the rebuilt node has that for its operand.
+class VTSYM_API SymbolicExprXFormVisitor : public SymbolicExprVisitor, public OperandStack {
 public:
     /// A visitor that builds in `target`.
     explicit SymbolicExprXFormVisitor(SymbolicExprTable& target);
-    SymbolicExprXFormVisitor(const SymbolicExprXFormVisitor&) = delete;
-    SymbolicExprXFormVisitor& operator=(const SymbolicExprXFormVisitor&) = delete;
     ~SymbolicExprXFormVisitor() override;
 
 #define VTSYM_OPERATOR(Code, Name, Class, ...) void visit(const Class& node) override;
@@ -51,8 +56,11 @@ public:
     SymbolicExprId get();
 
     /// Rebuilds the expression `id` of `source`: visits each distinct node once and hands its result to further
-    /// occurrences, so the work is in the number of nodes, not of paths.  An identifier that is not of the source gives
-    /// the invalid one.  When a visit throws, the visitor is as before the call and what was interned stays.
+    /// occurrences, so the work is in the number of nodes, not of paths.  The results are those of execute() and get():
+    /// the invalid identifier where `id` is not of the source, or where the run does not leave exactly one result.
+    /// Where a visit does not keep the discipline, or nodes of a host's table lead in a circle, nodes are visited again
+    /// as execute() does, up to limits::repeatedVisits.  Afterwards, also when a visit throws, the stack is as before
+    /// the call; what was interned stays.
     SymbolicExprId rebuild(const SymbolicExprTable& source, SymbolicExprId id);
 
     /// Whether the variant keywords are in force: the feature flag "VariantKeywordsSimCodegen" is greater than 0 now.
@@ -62,35 +70,24 @@ public:
     [[nodiscard]] SymbolicExprId getCodegenVariantKeywordId() const;
 
 protected:
-    void push(SymbolicExprId id) {
-        stack_.push_back(id);
-    }
-
-    SymbolicExprId pop();
-
     [[nodiscard]] SymbolicExprTable& table() const noexcept {
         return table_;
     }
+
+    /// The same for a subclass that keeps the results of several runs, by the source's identifiers.
+    SymbolicExprId rebuild(const SymbolicExprTable& source, SymbolicExprId id, IdMap<SymbolicExprId>& results);
 
     /// Visits one node that stands in the source under an identifier, for drivers of a subclass's own.  `id` is the
     /// invalid one unless source and target are one table.
     void visitAs(SymbolicExprId id, const SymbolicExpr& node);
 
-    [[nodiscard]] SymbolicExprId top() const noexcept {
-        return stack_.back();
+    /// Whether one of the topmost results, the operands of the node that is visited, is missing.
+    [[nodiscard]] bool lacksOperand(const SymbolicExpr& node) const noexcept {
+        return holdsInvalid(node.getNumInputs());
     }
 
-    [[nodiscard]] std::size_t depth() const noexcept {
-        return stack_.size();
-    }
-
-    /// Takes what a run that threw left on the stack away.
-    void unwind(std::size_t depth) noexcept;
-
-    /// The identifier in the target of the node that is being visited, where that is known to be the source too.
-    [[nodiscard]] SymbolicExprId current() const noexcept {
-        return current_;
-    }
+    /// The identifier of a real literal; a NaN that is visited in place is the literal itself.
+    SymbolicExprId makeReal(double value);
 
     bool keywordsOn;            ///< the keyword feature when the visitor was made
     std::uint64_t operandLimit; ///< operands that a subclass flattens from one chain
@@ -101,9 +98,7 @@ private:
     template <class Node>
     SymbolicExprId identity(const Node& node);
 
-    std::vector<SymbolicExprId> stack_;
     SymbolicExprTable& table_;
-    SymbolicExprId current_ = invalidId;
 };
 
 /// Tells the construction hooks of SymbolicExprXFormVisitor2 apart.
@@ -134,7 +129,7 @@ protected:
     }
 #define VTSYM_HOOK_Double(Class)                                                                                       \
     VTSYM_HOOK(Class, double value) {                                                                                  \
-        return factory_.make<Class>(value);                                                                            \
+        return makeReal(value);                                                                                        \
     }
 #define VTSYM_HOOK_Unary(Class)                                                                                        \
     VTSYM_HOOK(Class, SymbolicExprId a) {                                                                              \

@@ -183,6 +183,8 @@ QuillParser::State QuillParser::open(const QuillBracket& bracket) {
 
 QuillParser::State QuillParser::missingOperand() {
     const auto byte = static_cast<unsigned char>(lexer_.peek());
+    if (byte == ';' && !open_.back().bracket->semicolons)
+        return extraSemicolon();
     if (byte >= 0x80)
         return fail("characters outside ASCII stand only in quotes and comments");
     return fail(lexer_.atEnd() ? "the text ends where a value must follow" : "a value is missing");
@@ -306,12 +308,16 @@ QuillParser::State QuillParser::nextElement() {
 
 QuillParser::State QuillParser::nextRow() {
     if (!open_.back().bracket->semicolons)
-        return fail("a semicolon stands only between the rows of a matrix or of a cell array");
+        return extraSemicolon();
     reduceTo(QuillLevel::Expression);
     endRow();
     lexer_.skip(1);
     fresh_ = true;
     return State::Operand;
+}
+
+QuillParser::State QuillParser::extraSemicolon() {
+    return fail("this ; is extra: it stands only between the rows of a matrix or of a cell array");
 }
 
 QuillParser::State QuillParser::close() {

@@ -64,6 +64,7 @@ private:
     State readField();
     State nextElement();
     State nextRow();
+    State extraSemicolon();
     State close();
     State finish();
     State missingOperator();

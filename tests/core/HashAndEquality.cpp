@@ -156,14 +156,55 @@ TEST(Equality, RealsWithinTheTolerance) {
 }
 
 TEST(Equality, ANaNThatIsInTheTableIsFoundAndOthersAreNot) {
+    // As many as would take minutes if each had to be told from all others.
+    constexpr SymbolicExprId count = 300'000;
     SymbolicExprTable table;
-    const SymbolicDoubleValue temporary(table, nan);
-    SymbolicDoubleValue(table, nan);
-    ASSERT_EQ(table.size(), 2U);
-    EXPECT_EQ(temporary.getId(table), invalidId);
-    EXPECT_EQ(table.get(0)->getId(table), 0U);
-    EXPECT_EQ(table.get(1)->getId(table), 1U);
-    EXPECT_TRUE(table.contains(table.get(1)));
+    SymbolicExprTable other;
+    SymbolicString(table, "false"); // has the hash of NaN
+    for (SymbolicExprId i = 1; i < count; ++i) {
+        if (i % 3 == 0)
+            table.add(new SymbolicDoubleValue(other, -nan));
+        else
+            EXPECT_EQ(SymbolicDoubleValue(table, nan).getId(table), invalidId);
+    }
+    ASSERT_EQ(table.size(), count);
+    for (SymbolicExprId i = 0; i < count; ++i) {
+        ASSERT_EQ(table.get(i)->getId(table), i);
+        ASSERT_TRUE(table.contains(table.get(i)));
+    }
+    EXPECT_EQ(SymbolicString(table, "false").getId(table), 0U);
+    EXPECT_EQ(SymbolicIntValue(table, -3).getId(table), count) << "of the same hash too";
+}
+
+/// Every two classes, in both orders.
+template <class Left>
+std::size_t comparisonsThatHold(const SymbolicExprTable& table, const Left& left) {
+    std::size_t held = 0;
+#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                         \
+    {                                                                                                                  \
+        const auto& right = static_cast<const Class&>(*table.get(Code));                                               \
+        held += left == right ? 1U : 0U;                                                                               \
+        held += left != right ? 0U : 1U;                                                                               \
+        held += static_cast<const SymbolicExpr&>(left) == right ? 1U : 0U;                                             \
+        held += right == static_cast<const SymbolicExpr&>(left) ? 1U : 0U;                                             \
+    }
+#include "base/core/operators.def"
+#undef VTSYM_OPERATOR
+    return held;
+}
+
+TEST(Equality, NodesOfAnyTwoClassesCompare) {
+    SymbolicExprTable table;
+    for (int code = 0; code < operatorCount; ++code) {
+        const auto op = static_cast<SymbolicOp>(code);
+        const SymbolicExprId id =
+            makeAny(table, op, {"x", 1, 2, std::vector<SymbolicExprId>(operandCount(op).value_or(5), 0)});
+        ASSERT_EQ(id, static_cast<SymbolicExprId>(code));
+    }
+#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                         \
+    EXPECT_EQ(comparisonsThatHold(table, static_cast<const Class&>(*table.get(Code))), 4U) << #Class;
+#include "base/core/operators.def"
+#undef VTSYM_OPERATOR
 }
 
 RC_GTEST_PROP(Interning, AgreesWithAMapOfStructures, (std::uint64_t seed)) {

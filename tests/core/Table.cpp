@@ -1,6 +1,6 @@
 // The table: identifiers, lookups and what it keeps beside its nodes.
 #include "base/core/Nodes.hpp"
-#include "tests/support/AnyNode.hpp"
+#include "tests/support/HostTables.hpp"
 #include "tests/support/TreeText.hpp"
 
 #include <gmock/gmock.h>
@@ -49,7 +49,11 @@ TEST(Table, OperandsAreIdentifiersOrNodesInEveryCombination) {
     const SymbolicExprId call = SymbolicFcnCallExpr(table, std::string("f"), {idA, idB, idA}).getId(table);
     EXPECT_EQ(treeText(table, call), "FcnCall(f,a,1,a)");
     EXPECT_EQ(SymbolicFcnCallExpr(table, SymbolicString(table, "f"), {idA, idB, idA}).getId(table), call);
+    EXPECT_EQ(SymbolicFcnCallExpr(table, "f", {idA, idB, idA}).getId(table), call);
+    EXPECT_EQ(treeText(table, SymbolicFcnCall0UExpr(table, "g").getId(table)), "FcnCall0U(g)");
+    EXPECT_EQ(treeText(table, SymbolicFcnCall1UExpr(table, "g", a).getId(table)), "FcnCall1U(g,a)");
     EXPECT_EQ(treeText(table, SymbolicFcnCall2UExpr(table, std::string("g"), a, b).getId(table)), "FcnCall2U(g,a,1)");
+    EXPECT_EQ(treeText(table, SymbolicFcnCall2UExpr(table, 0, a, 1).getId(table)), "FcnCall2U(a,a,1)");
     EXPECT_EQ(treeText(table, SymbolicCellArrayExpr(table, idB, {idA, idA}).getId(table)), "CellArray(1,a,a)");
 }
 
@@ -148,6 +152,27 @@ TEST(Table, NodesReachADerivedTableThroughItsVirtualOperations) {
     EXPECT_EQ(SymbolicPlusExpr(table, x, x).getId(table), sum);
     EXPECT_EQ(table.calls, "?+=?+=?=");
     EXPECT_EQ(treeText(table, sum), "Plus(x,x)");
+}
+
+TEST(Table, NodesAreKeptWhereADerivedTableKeepsThem) {
+    for (const auto& numbered : tablesOfEachKind()) {
+        SymbolicExprTable& table = numbered->table();
+        table.addBoolSymbols();
+        EXPECT_EQ(table.getIdFALSE(), numbered->idAt(0));
+        EXPECT_EQ(table.getIdTRUE(), numbered->idAt(1));
+        table.registerValue("N", 3);
+        EXPECT_EQ(table.getValue("N"), 3);
+        const SymbolicExprId sum = SymbolicPlusExpr(table, table.getIdTRUE(), SymbolicString(table, "N")).getId(table);
+        EXPECT_EQ(treeText(table, sum), "Plus(true,N)");
+        EXPECT_TRUE(table.has(sum));
+        EXPECT_FALSE(table.has(invalidId));
+        EXPECT_EQ(numbered->count(), 5U);
+        if (numbered->idAt(1) == 1) {
+            std::vector<SymbolicExprId> names;
+            table.lookup(SymbolicOp::String, names);
+            EXPECT_THAT(names, testing::ElementsAre(0, 1, 3));
+        }
+    }
 }
 
 TEST(Table, ValuesOfNames) {

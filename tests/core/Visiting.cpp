@@ -1,82 +1,92 @@
 // The order of visits, shared nodes, depth, and nodes that name what is not there.
 #include "base/core/Nodes.hpp"
-#include "tests/support/AnyNode.hpp"
-#include "tests/support/RandomExpression.hpp"
+#include "tests/support/HostTables.hpp"
 
 #include <gmock/gmock.h>
+
+#include <optional>
+#include <set>
 
 namespace VT::Testing {
 namespace {
 
-using testing::ElementsAre;
 using testing::ElementsAreArray;
 using testing::IsEmpty;
 
-/// Writes the identifiers of the nodes that it visits down.
+using Nodes = std::vector<const SymbolicExpr*>;
+
+/// Writes down which nodes it visits.
 class Recorder final : public RoutedVisitor<Recorder> {
 public:
-    explicit Recorder(const SymbolicExprTable& table, bool bottomUp = true) : table_(table), bottomUp_(bottomUp) {}
+    explicit Recorder(bool bottomUp) : bottomUp_(bottomUp) {}
 
     [[nodiscard]] bool isBottomUpVistor() const override { return bottomUp_; }
 
     template <class Node>
     void on(const Node& node) {
         EXPECT_EQ(node.op(), Node::code) << "each class is visited as itself";
-        visited.push_back(node.getId(table_));
+        visited.push_back(&node);
     }
 
-    std::vector<SymbolicExprId> visited;
+    Nodes visited;
 
 private:
-    const SymbolicExprTable& table_;
     bool bottomUp_;
 };
 
-/// Counts visits, for graphs of many.
-class Counter final : public RoutedVisitor<Counter> {
-public:
-    void on(const SymbolicExpr&) { ++count; }
-
-    std::size_t count = 0;
-};
-
-std::vector<SymbolicExprId> visited(const SymbolicExprTable& table, SymbolicExprId id, bool accept, bool bottomUp) {
-    Recorder recorder(table, bottomUp);
-    accept ? table.get(id)->accept(table, recorder) : recorder.execute(table, id);
+Nodes accepted(const SymbolicExprTable& table, const SymbolicExpr& node, bool bottomUp = true) {
+    Recorder recorder(bottomUp);
+    node.accept(table, recorder);
     return recorder.visited;
 }
 
-std::vector<SymbolicExprId> executed(const SymbolicExprTable& table, SymbolicExprId id, bool bottomUp = true) {
-    return visited(table, id, false, bottomUp);
+Nodes executed(const SymbolicExprTable& table, SymbolicExprId id, bool bottomUp = true) {
+    Recorder recorder(bottomUp);
+    recorder.execute(table, id);
+    return recorder.visited;
 }
 
-TEST(Visiting, AgreesWithRecursionOverRandomGraphs) {
-    std::mt19937_64 random(5);
-    for (int round = 0; round < 40; ++round) {
-        SymbolicExprTable table;
-        while (table.size() < 25)
-            makeRandom(table, random);
-        for (SymbolicExprId root = 0; root < table.size(); ++root) {
-            std::vector<SymbolicExprId> after;
-            std::vector<SymbolicExprId> before;
-            const auto walk = [&](const auto& self, SymbolicExprId id) -> void {
-                before.push_back(id);
-                for (std::size_t i = 0; i < table.get(id)->getNumInputs(); ++i)
-                    self(self, table.get(id)->getInput(i));
-                after.push_back(id);
-            };
-            walk(walk, root);
-            if (after.size() > 10000)
+Nodes nodesOf(const SymbolicExprTable& table, const std::vector<SymbolicExprId>& ids) {
+    Nodes nodes;
+    for (const SymbolicExprId id : ids)
+        nodes.push_back(table.get(id));
+    return nodes;
+}
+
+/// The nodes below one, by recursion; nothing where there are very many.
+std::optional<Nodes> expected(NumberedTable& table, SymbolicExprId root, bool bottomUp) {
+    Nodes nodes;
+    Recursion recursion(
+        table, bottomUp, [&](const SymbolicExpr& node) { nodes.push_back(&node); }, [] {});
+    return recursion(root) ? std::optional(nodes) : std::nullopt;
+}
+
+TEST(Visiting, AgreesWithRecursionOverTablesOfEachKind) {
+    std::size_t compared = 0;
+    forBrokenGraphs(5, 120, 25, [&](NumberedTable& numbered, const std::vector<SymbolicExprId>& ids) {
+        const SymbolicExprTable& table = numbered.table();
+        for (const SymbolicExprId root : ids) {
+            const auto after = expected(numbered, root, true);
+            const auto before = expected(numbered, root, false);
+            if (!after || !before)
                 continue;
-            Recorder alone(table);
-            table.get(root)->invoke(alone);
-            ASSERT_THAT(alone.visited, ElementsAre(root));
-            ASSERT_THAT(executed(table, root), ElementsAreArray(after));
-            ASSERT_THAT(executed(table, root, false), ElementsAreArray(after)) << "execute() does not ask";
-            ASSERT_THAT(visited(table, root, true, true), ElementsAreArray(after));
-            ASSERT_THAT(visited(table, root, true, false), ElementsAreArray(before));
+            const SymbolicExpr& node = *table.get(root);
+            ASSERT_THAT(executed(table, root), ElementsAreArray(*after));
+            ASSERT_THAT(executed(table, root, false), ElementsAreArray(*after)) << "execute() does not ask";
+            ASSERT_THAT(accepted(table, node), ElementsAreArray(*after));
+            ASSERT_THAT(accepted(table, node, false), ElementsAreArray(*before));
+            compared += after->size();
+
+            std::vector<std::string> symbols;
+            table.getSymbolsFromExpression(root, symbols);
+            std::set<std::string> names;
+            for (const SymbolicExpr* each : *after)
+                if (each->op() == SymbolicOp::String)
+                    names.insert(static_cast<const SymbolicString&>(*each).getName());
+            ASSERT_THAT(symbols, testing::UnorderedElementsAreArray(names));
         }
-    }
+    });
+    EXPECT_GT(compared, 50'000U);
 }
 
 TEST(Visiting, WhatIsNotThereIsNotVisited) {
@@ -85,23 +95,16 @@ TEST(Visiting, WhatIsNotThereIsNotVisited) {
     EXPECT_THAT(executed(table, 1), IsEmpty());
     EXPECT_THAT(executed(table, invalidId), IsEmpty());
 
-    // Nodes built on identifiers that were not there yet: on itself, on the next one, on none.
-    const SymbolicExprId self = SymbolicPlusExpr(table, x, 1U).getId(table);
-    ASSERT_EQ(self, 1U);
-    const SymbolicExprId forward = SymbolicNotExpr(table, 3U).getId(table);
-    const SymbolicExprId back = SymbolicMinusExpr(table, forward, x).getId(table);
-    const SymbolicExprId dangling = SymbolicRowExpr(table, {invalidId, x, 1000U}).getId(table);
-    EXPECT_THAT(executed(table, self), ElementsAre(x, self));
-    EXPECT_THAT(executed(table, back), ElementsAre(forward, x, back));
-    EXPECT_THAT(executed(table, dangling), ElementsAre(x, dangling));
-    std::vector<std::string> symbols;
-    table.getSymbolsFromExpression(back, symbols);
-    EXPECT_THAT(symbols, ElementsAre("x"));
-    for (const SymbolicExprId id : {self, forward, back, dangling}) {
-        Counter counter;
-        table.get(id)->accept(table, counter);
-        EXPECT_LE(counter.count, 5U);
-    }
+    // A temporary that is in another table may name any node; one that is interned, here or there, may not.
+    SymbolicExprTable other;
+    const SymbolicPlusExpr stranger(other, x, 2U);
+    const SymbolicNotExpr forward(table, 2U);
+    SymbolicMinusExpr(table, x, x);
+    EXPECT_THAT(accepted(table, stranger),
+                ElementsAreArray(Nodes{table.get(x), table.get(x), table.get(x), table.get(2), &stranger}));
+    EXPECT_THAT(accepted(table, forward), ElementsAreArray(Nodes{&forward}));
+    EXPECT_THAT(accepted(table, SymbolicNotExpr(other, 2U)), testing::SizeIs(1));
+    EXPECT_EQ(executed(table, 1), nodesOf(table, {1}));
 }
 
 } // namespace

@@ -1,11 +1,17 @@
-// Every operator on every pair of corner values, against arithmetic written down again over wide integers.
+// Every operator on every pair of corner values, and expressions in every way of evaluation, against arithmetic written
+// down again over wide integers.
+#include "base/eval/EvalVisitor.hpp"
+#include "base/print/ExpressionPrinter.hpp"
 #include "tests/eval/Scalars.hpp"
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
 #include <functional>
 #include <map>
+#include <random>
+#include <set>
 
 namespace VT::Testing {
 namespace {
@@ -178,6 +184,190 @@ TEST(Arithmetic, AgreesWithWideIntegersOnEveryPairOfCornerValues) {
             }
     }
     EXPECT_EQ(operators, scalarRules.size());
+}
+
+/// What an expression is worth, or the key of what is reported about it.
+struct Outcome {
+    std::string error;
+    bool isVector = false;
+    std::vector<SymbolicScalar> values = {};
+
+    bool operator==(const Outcome&) const = default;
+};
+
+/// The value of an expression by recursion over the tree; expressions are small.
+class Model {
+public:
+    explicit Model(const SymbolicExprTable& table) : table_(table) {}
+
+    Outcome of(SymbolicExprId id) { // NOLINT(misc-no-recursion)
+        const SymbolicExpr& node = *table_.get(id);
+        const SymbolicOp op = node.op();
+        if (op == SymbolicOp::IntValue)
+            return scalar(static_cast<const SymbolicIntValue&>(node).getValue());
+        if (op == SymbolicOp::DoubleValue)
+            return scalar(static_cast<const SymbolicDoubleValue&>(node).getValue());
+        if (op == SymbolicOp::String || op == SymbolicOp::MemberValue)
+            return ofSymbol(id, node);
+        const bool isList = dimensionOps.contains(op);
+        if (!isList && scalarRuleIndex(op) == ScalarRuleIndex::None)
+            return {"NotEvaluable"};
+        std::vector<Outcome> operands;
+        for (std::size_t i = 0; i < node.getNumInputs(); ++i) {
+            if (node.getInput(i) >= id)
+                return {"NotEvaluable"};
+            operands.push_back(of(node.getInput(i)));
+            if (!operands.back().error.empty())
+                return operands.back();
+        }
+        return isList ? listed(operands) : combined(op, operands.front(), operands.back());
+    }
+
+private:
+    static Outcome scalar(SymbolicScalar value) { return {"", false, {value}}; }
+
+    Outcome ofSymbol(SymbolicExprId id, const SymbolicExpr& node) { // NOLINT(misc-no-recursion)
+        const bool isMember = node.op() == SymbolicOp::MemberValue;
+        const std::string name = isMember ? "" : static_cast<const SymbolicString&>(node).getName();
+        if (name == "true" || name == "false")
+            return scalar(name == "true");
+        const SymbolicExprId value = table_.getValueId(id);
+        if (value == invalidId)
+            return {isMember ? "NotEvaluable" : "UnboundSymbol"};
+        if (!open_.insert(id).second)
+            return {"CyclicValue"};
+        const Outcome outcome = of(value);
+        open_.erase(id);
+        return outcome;
+    }
+
+    static Outcome listed(const std::vector<Outcome>& elements) {
+        Outcome list{"", true, {}};
+        for (const Outcome& element : elements) {
+            if (element.isVector)
+                return {"NotEvaluable"};
+            list.values.push_back(element.values.front());
+        }
+        return list;
+    }
+
+    static Outcome combined(SymbolicOp op, const Outcome& a, const Outcome& b) {
+        if (a.isVector && b.isVector && a.values.size() != b.values.size())
+            return {"SizeMismatch"};
+        Outcome result{"", a.isVector || b.isVector, {}};
+        const std::size_t count = a.isVector ? a.values.size() : b.values.size();
+        for (std::size_t i = 0; i < count; ++i)
+            result.values.push_back(
+                expected(op, Wide(a.values[a.isVector ? i : 0]), Wide(b.values[b.isVector ? i : 0])));
+        return result;
+    }
+
+    const SymbolicExprTable& table_;
+    std::set<SymbolicExprId> open_;
+};
+
+template <class Evaluate>
+Outcome outcomeOf(Evaluate evaluate) {
+    try {
+        const SymbolicValue value = evaluate();
+        return value.isVector() ? Outcome{"", true, value.elements()} : Outcome{"", false, {value.scalar()}};
+    } catch (const HostDiagnostic& diagnostic) {
+        return {diagnostic.messageId().substr(diagnostic.messageId().rfind(':') + 1)};
+    }
+}
+
+/// Asks in every way; how the answers differ from the model's, in words.
+std::string differences(const SymbolicExprTable& table, SymbolicExprId id, bool& hasValue) {
+    Outcome wanted = Model(table).of(id);
+    std::ranges::transform(wanted.values, wanted.values.begin(), visibleScalar);
+    hasValue = wanted.error.empty();
+    SymbolicExprEvalImpl executed(table);
+    SymbolicExprEvalImpl accepted(table);
+    const SymbolicExprEval evaluator(table);
+    const std::vector<std::pair<std::string, Outcome>> answers{
+        {"eval", outcomeOf([&] { return evaluator.eval(id); })},
+        {"execute", outcomeOf([&] { return executed.execute(table, id), executed.get(); })},
+        {"accept", outcomeOf([&] { return table.get(id)->accept(table, accepted), accepted.get(); })},
+        {"prepare", outcomeOf([&] { return evaluator.prepare(id).run(); })},
+    };
+    std::string words;
+    for (const auto& [way, answer] : answers) {
+        // A prepared expression may come upon another fault first.
+        const bool same = way == "prepare" && !hasValue ? !answer.error.empty() : answer == wanted;
+        if (!same)
+            words += way + " of node " + std::to_string(id) + ": " + answer.error + ", not " + wanted.error + "; ";
+        for (std::size_t i = 0; !same && i < std::min(answer.values.size(), wanted.values.size()); ++i)
+            words += shown(answer.values[i]) + ", not " + shown(wanted.values[i]) + "; ";
+    }
+    return words;
+}
+
+TEST(Ways, AgreeWhereEveryOperatorIsUnderEveryOther) {
+    std::mt19937_64 random(6);
+    SymbolicExprTable table;
+    std::vector<SymbolicExprId> leaves;
+    for (const SymbolicScalar& value : corners())
+        leaves.push_back(literal(table, value));
+    const auto node = [&](SymbolicOp op, SymbolicExprId operand, std::size_t place) {
+        std::vector<SymbolicExprId> inputs(operandCount(op).value_or(2));
+        for (SymbolicExprId& input : inputs)
+            input = leaves[random() % leaves.size()];
+        inputs.at(std::min(place, inputs.size() - 1)) = operand;
+        return makeNode(table, op, inputs);
+    };
+    bool hasValue = false;
+    std::size_t values = 0;
+    for (const OperatorInfo& outer : operatorTable())
+        for (const OperatorInfo& inner : operatorTable())
+            for (const std::size_t place : {0U, 1U}) {
+                if (outer.op <= SymbolicOp::DoubleValue || inner.op <= SymbolicOp::DoubleValue)
+                    continue; // a leaf
+                for (int i = 0; i < 12; ++i) {
+                    const SymbolicExprId id =
+                        node(outer.op, node(inner.op, leaves[random() % leaves.size()], 0), place);
+                    ASSERT_EQ(differences(table, id, hasValue), "") << SymbolicExprPrinter(table, false)(id);
+                    values += hasValue ? 1 : 0;
+                }
+            }
+    EXPECT_GT(values, 8000U);
+}
+
+TEST(Ways, AgreeOnRandomGraphsOfBoundAndMissingParts) {
+    std::size_t values = 0, faults = 0;
+    for (unsigned seed = 0; seed < 400; ++seed) {
+        std::mt19937_64 random(seed);
+        SymbolicExprTable table;
+        const Trees tree{table};
+        std::vector<SymbolicExprId> symbols{tree.name("a"), tree.name("b"), tree.name("s"), tree.name("true")};
+        for (const std::size_t owner : {0U, 2U, 2U, 4U})
+            symbols.push_back(SymbolicMemberValue(table, symbols[owner], "x").getId(table));
+        std::vector<SymbolicExprId> nodes = symbols;
+        for (int i = 0; i < 8; ++i)
+            nodes.push_back(literal(table, corners()[random() % corners().size()]));
+        while (nodes.size() < 50) {
+            const auto any = [&] {
+                return nodes[nodes.size() - 1 - random() % std::min<std::size_t>(20, nodes.size())];
+            };
+            const auto operand = [&] {
+                return random() % 200 == 0 ? table.size() + random() % 3 : random() % 300 == 0 ? invalidId : any();
+            };
+            const SymbolicOp op = random() % 30 == 0   ? operatorTable()[random() % operatorTable().size()].op
+                                  : random() % 15 == 0 ? SymbolicOp::DimsND
+                                                       : scalarRules[random() % scalarRules.size()].op;
+            if (op > SymbolicOp::DoubleValue)
+                nodes.push_back(makeNode(table, op, {operand(), operand(), operand()}));
+        }
+        for (const SymbolicExprId symbol : symbols)
+            if (random() % 4 != 0)
+                table.registerValueId(symbol, nodes[random() % 3 == 0 ? random() % nodes.size() : symbols.size()]);
+        for (const SymbolicExprId id : nodes) {
+            bool hasValue = false;
+            ASSERT_EQ(differences(table, id, hasValue), "") << "seed " << seed;
+            ++(hasValue ? values : faults);
+        }
+    }
+    EXPECT_GT(values, 4000U);
+    EXPECT_GT(faults, 4000U);
 }
 
 } // namespace

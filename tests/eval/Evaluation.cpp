@@ -1,7 +1,9 @@
 // What expressions are worth, and prepared expressions: they answer what one evaluation answers, bit for bit.
 #include "base/eval/Eval.hpp"
 #include "base/eval/EvalVisitor.hpp"
+#include "base/transform/DimensionLists.hpp"
 #include "host/Messages.hpp"
+#include "parser/QuillConverterBlockVariants.hpp"
 #include "parser/SymbolicExprParser.hpp"
 #include "tests/eval/Scalars.hpp"
 #include "tests/support/AnyNode.hpp"
@@ -30,11 +32,9 @@ protected:
         const SymbolicExprId id = read(text);
         const SymbolicValue result = SymbolicExprEval(table).eval(id);
         EXPECT_EQ(SymbolicExprEval(table).prepare(id).run(), result) << text;
-        if (text.find('.') == std::string::npos) { // that one asks for the owners of members too
-            SymbolicExprEvalImpl visitor(table);
-            visitor.execute(table, id);
-            EXPECT_EQ(visitor.get(), result) << text;
-        }
+        SymbolicExprEvalImpl visitor(table);
+        visitor.execute(table, id);
+        EXPECT_EQ(visitor.get(), result) << text;
         return result;
     }
 
@@ -54,6 +54,10 @@ TEST_F(Evaluation, AnswersTexts) {
         // Arithmetic on numbers is judged in Arithmetic.cpp.
         {"N*2+1", 7},
         {"0.0 / 0.0", std::numeric_limits<double>::infinity()},
+        {"1 / 0.0 - 1 / 0.0", std::numeric_limits<double>::quiet_NaN()},
+        {"0 * (1 / 0.0)", std::numeric_limits<double>::quiet_NaN()},
+        {"(1 / 0.0) / (1 / 0.0)", std::numeric_limits<double>::quiet_NaN()},
+        {"-1 / 0.0 < 1 / 0.0 && 1 / 0.0 == 1 / 0.0", true},
         {"0.1 + 0.2 == 0.3 && 0.1 + 0.2 > 0.3", true},
         {"2147483647 + 1.0", 2147483648.0},
         {"!Rate || M < 9", false},
@@ -90,7 +94,12 @@ TEST_F(Evaluation, NamesWhatHasNoValue) {
         const SymbolicExprEval evaluator(table);
         for (const std::function<void()>& evaluate :
              std::vector<std::function<void()>>{[&] { static_cast<void>(evaluator.eval(id)); },
-                                                [&] { static_cast<void>(evaluator.prepare(id).run()); }})
+                                                [&] { static_cast<void>(evaluator.prepare(id).run()); },
+                                                [&] {
+                                                    SymbolicExprEvalImpl visitor(table);
+                                                    table.get(id)->accept(table, visitor);
+                                                    static_cast<void>(visitor.get());
+                                                }})
             try {
                 evaluate();
                 ADD_FAILURE() << "has a value";
@@ -114,9 +123,43 @@ TEST_F(Evaluation, AnswersIdentifiersThatAreNoNodes) {
     }
     SymbolicExprEvalImpl visitor(table);
     EXPECT_THROW(static_cast<void>(visitor.get()), HostDiagnostic);
-    EXPECT_THROW(table.get(onNothing)->invoke(visitor), HostDiagnostic);
+    table.get(onNothing)->invoke(visitor);
+    EXPECT_THROW(static_cast<void>(visitor.get()), HostDiagnostic);
     EXPECT_THROW(static_cast<void>(visitor.evaluate(onNothing)), HostDiagnostic);
-    EXPECT_EQ(visitor.evaluate(one), SymbolicValue(1)); // of use behind errors
+    visitor.execute(table, one);
+    EXPECT_EQ(visitor.get(), SymbolicValue(1));                     // of use behind errors
+    EXPECT_THROW(static_cast<void>(visitor.get()), HostDiagnostic); // once
+    SymbolicExprTable other;                                        // whose nodes are on the same numbers
+    const SymbolicExprId two = SymbolicIntValue(other, 2).getId(other);
+    other.get(two)->accept(table, visitor);
+    EXPECT_EQ(visitor.get(), SymbolicValue(2));
+    const SymbolicPlusExpr sum(other, two, two);
+    sum.accept(table, visitor);
+    EXPECT_EQ(visitor.get(), SymbolicValue(2)) << "1 + 1 in this table";
+}
+
+TEST_F(Evaluation, QuillWritesListsAsMatrices) {
+    VTSymbolicExprErrorCheckerBlockVariants checker;
+    SymbolicExprFromQParseTreeBlockVariants quill(table, checker);
+    const SymbolicExprDimensionLists lists(table);
+    bind("N", "3");
+    const std::vector<std::pair<const char*, SymbolicValue>> rows{
+        {"[1 2]*3", Vector{3, 6}}, {"[N, N*2] + [1 2]", Vector{4, 8}},
+        {"-[5]", Vector{-5}},      {"[1 2 3 N]", Vector{1, 2, 3, 3}},
+        {"[] * 2", Vector{}},      {"2 - (7 > [1 9])", Vector{1, 2}},
+    };
+    for (const auto& [text, wanted] : rows)
+        EXPECT_EQ(SymbolicExprEval(table).eval(lists(quill(text))), wanted) << text;
+    EXPECT_EQ(lists(quill("[1 2]*3")), read("[1, 2]*3"));
+    for (const char* text : {"[1; 2] + 1", "{1, 2}", "N + f(N)"}) {
+        const SymbolicExprId id = quill(text);
+        EXPECT_EQ(lists(id), id) << text;
+        EXPECT_THROW(static_cast<void>(SymbolicExprEval(table).eval(id)), HostDiagnostic) << text;
+    }
+    EXPECT_THROW(static_cast<void>(SymbolicExprEval(table).eval(lists(quill("[[1 2] 3]")))), HostDiagnostic);
+    EXPECT_EQ(lists(invalidId), invalidId);
+    const SymbolicExprId hollow = SymbolicMatrixExpr(table, std::vector<SymbolicExprId>{1000}).getId(table);
+    EXPECT_THROW(static_cast<void>(SymbolicExprEval(table).eval(lists(hollow))), HostDiagnostic);
 }
 
 TEST_F(Evaluation, EvaluatesSharedNodesOnce) {
@@ -236,11 +279,16 @@ Answer answer(Evaluate evaluate) {
 TEST(Prepared, AnswersWhatEvaluationAnswers) {
     std::size_t values = 0;
     std::size_t errors = 0;
+    std::size_t again = 0;
     for (unsigned seed = 0; seed < 3000; ++seed) {
         Game game(seed);
         const SymbolicExprEval evaluator(game.table);
         PreparedExpr prepared = evaluator.prepare(game.root);
-        std::optional<PreparedExpr> before;
+        PreparedExpr early = prepared;
+        for (std::size_t i = 0; i < symbolCount; ++i)
+            if (game.below(4) != 0)
+                game.rebind(i);
+        const bool failedEarly = !answer([&] { return early.run(); }).error.empty();
         for (int round = 0; round < 12; ++round) {
             for (std::size_t i = 0; i < symbolCount; ++i) {
                 if (round > 0 && game.below(2) == 0)
@@ -251,6 +299,10 @@ TEST(Prepared, AnswersWhatEvaluationAnswers) {
                     prepared.set(*slot, value);
             }
             const Answer wanted = answer([&] { return evaluator.eval(game.root); });
+            if (round == 0 && failedEarly) {
+                ASSERT_EQ(answer([&] { return early.run(); }), wanted) << "kept from a failed run, seed " << seed;
+                ++again;
+            }
             ASSERT_EQ(answer([&] { return prepared.run(); }), wanted) << "seed " << seed << ", round " << round;
             ASSERT_EQ(answer([&] { return prepared.run(); }), wanted) << "again, seed " << seed;
             ASSERT_EQ(answer([&] { return evaluator.prepare(game.root).run(); }), wanted) << "anew, seed " << seed;
@@ -266,6 +318,7 @@ TEST(Prepared, AnswersWhatEvaluationAnswers) {
     }
     EXPECT_GT(values, 10'000U);
     EXPECT_GT(errors, 1000U);
+    EXPECT_GT(again, 500U);
 }
 
 TEST(Prepared, HasASlotForEachSymbol) {

@@ -158,6 +158,8 @@ TEST(ShownText, EscapesWhatWouldSpoilATerminal) {
         {utf8(u8"gr\u00f6\u00dfe \u4e2d \U0001f600"), utf8(u8"gr\u00f6\u00dfe \u4e2d \U0001f600")},
         {std::string("a\0\n\x1b[31m\x7f", 9), "a\\x00\\x0a\\x1b[31m\\x7f"},
         {utf8(u8"\u0085\u202e\ufeff"), "\\xc2\\x85\\xe2\\x80\\xae\\xef\\xbb\\xbf"},
+        {utf8(u8"\u00ad\u061c\u2028\u2060\U000e0041"),
+         "\\xc2\\xad\\xd8\\x9c\\xe2\\x80\\xa8\\xe2\\x81\\xa0\\xf3\\xa0\\x81\\x81"},
         {"\xff\xc3", "\\xff\\xc3"},
         {"\xc0\x80\xe0\x80\x80\xed\xa0\x80\xf4\x90\x80\x80", // overlong, a surrogate, beyond the last character
          "\\xc0\\x80\\xe0\\x80\\x80\\xed\\xa0\\x80\\xf4\\x90\\x80\\x80"},

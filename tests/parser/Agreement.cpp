@@ -157,6 +157,20 @@ TEST(Agreement, OnEveryPairOfOperators) {
     }
 }
 
+TEST(Agreement, OnEveryShortTextOfTheCharactersOfNumbers) {
+    const std::string characters = "1.e+-";
+    for (std::vector<std::string> texts{""}; texts.front().size() < 6;) {
+        std::vector<std::string> longer;
+        for (const std::string& text : texts)
+            for (const char character : characters)
+                longer.push_back(text + character);
+        texts.swap(longer);
+        SymbolicExprTable table;
+        for (const std::string& text : texts)
+            ASSERT_EQ(difference(table, text, true, true), "");
+    }
+}
+
 TEST(Agreement, OnEveryByte) {
     for (int value = 0; value < 256; ++value) {
         const std::string byte(1, static_cast<char>(value));

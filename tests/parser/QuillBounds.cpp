@@ -2,11 +2,15 @@
 #include "base/core/Limits.hpp"
 #include "parser/ParseTreeDump.hpp"
 #include "tests/parser/QuillReading.hpp"
+#include "tests/support/Slots.hpp"
 #include "tests/support/Times.hpp"
 
 #include <gtest/gtest.h>
 
 #include <array>
+#include <cstddef>
+#include <iterator>
+#include <new>
 
 namespace VT::Testing {
 namespace {
@@ -68,6 +72,14 @@ TEST(QuillBounds, TreesOfOtherHosts) {
     const std::array<Tree, 3> enclosed{sign, a, sign};
     const auto dimension = [&](const Tree& tree) { return treeText(table, dimensions.visitNode(tree, "text")); };
     const auto condition = [&](const Tree& tree) { return treeText(table, conditions.visitNode(tree, "text")); };
+
+    // Roots in roots
+    const std::array<Tree, 1> root{rule(21, alone)};
+    const std::array<Tree, 1> roots{rule(21, root)};
+    EXPECT_EQ(dimension(rule(21, roots)), "a");
+    EXPECT_EQ(condition(rule(43, std::array<Tree, 3>{sign, rule(21, roots), sign})), "a");
+    EXPECT_EQ(condition(rule(44, std::array<Tree, 2>{sign, token(41, "2147483648")})), "-2147483648");
+    EXPECT_EQ(condition(rule(25, std::array<Tree, 2>{sign, token(41, "2147483648")})), "-2147483648");
 
     // The second forms of rules
     EXPECT_EQ(dimension(rule(67, enclosed)), "a");
@@ -136,6 +148,69 @@ TEST(QuillBounds, Dump) {
     // Depth is shown, but does not make the text grow with its square.
     const std::string deep = times(50'000, "A+") + "1";
     EXPECT_LT(dumpOf(deep.c_str()).size(), 200 * deep.size());
+}
+
+TEST(QuillSlots, AreWhereHostsCallThem) {
+    using Base = SymbolicExprFromQParseTree;
+    using Variants = SymbolicExprFromQParseTreeBlockVariants;
+    const std::ptrdiff_t slots[] = {slotOf(&Base::supportIntegerOnly),
+                                    slotOf(&Base::shouldCreateIntValueNodeForIntegerValue),
+                                    slotOf(&Base::supportLogicalValues),
+                                    slotOf(&Base::supportOperator),
+                                    4, // the destructor's two
+                                    5,
+                                    slotOf(&Base::enableDiagnostics),
+                                    slotOf(&Base::reportInvalidLiteralValue),
+                                    slotOf(&Base::reportNonScalarValue),
+                                    slotOf(&Base::reportComplexValue),
+                                    slotOf(&Base::reportLogicalValue),
+                                    slotOf(&Base::reportNonIntegerLiteralValue),
+                                    slotOf(&Base::reportNonIntegerValue),
+                                    slotOf(&Base::reportUnsupportedValue),
+                                    slotOf(&Base::reportDiagnostic),
+                                    slotOf(&Base::visitTerminal),
+                                    slotOf(&Base::getFunctionNameSymId),
+                                    slotOf(&Base::resolveIdentifier),
+                                    slotOf(&Base::supportFcn),
+                                    slotOf(&Base::getNumberFromQxArray),
+                                    slotOf(&Base::visitNonTerminal),
+                                    slotOf(&Base::reportUnhandledExpr),
+                                    slotOf(&Base::reportDivisionExpr),
+                                    slotOf(&Base::reportUnsupportedFcn),
+                                    slotOf(&Base::reportInvalidNumArgs),
+                                    slotOf(&Base::reportInvalidExpr),
+                                    slotOf(&Base::visitMatrixNode),
+                                    slotOf(&Base::visitMDot),
+                                    slotOf(&Base::destroy),
+                                    slotOf(&Base::destroyAndFree),
+                                    slotOf(&Variants::visitCellIndexNode),
+                                    slotOf(&Variants::visitCellArrayNode),
+                                    slotOf(&Variants::parseArrayBodyNode)};
+    for (std::ptrdiff_t slot = 0; slot < std::ssize(slots); ++slot)
+        EXPECT_EQ(slots[slot], slot);
+}
+
+TEST(QuillSlots, EndAConverter) {
+    struct Counted final : SymbolicExprFromQParseTreeBlockVariants {
+        Counted(SymbolicExprTable& table, VTSymbolicExprErrorChecker& checker, int& ends)
+            : SymbolicExprFromQParseTreeBlockVariants(table, checker),
+              ends_(ends) {}
+
+        ~Counted() override { ++ends_; }
+
+        int& ends_;
+    };
+
+    SymbolicExprTable table;
+    VTSymbolicExprErrorChecker checker;
+    int ends = 0;
+    SymbolicExprFromQParseTree* const onHeap = new Counted(table, checker, ends);
+    onHeap->destroyAndFree();
+    EXPECT_EQ(ends, 1);
+    alignas(Counted) std::array<std::byte, sizeof(Counted)> memory;
+    SymbolicExprFromQParseTree* const inPlace = new (memory.data()) Counted(table, checker, ends);
+    inPlace->destroy();
+    EXPECT_EQ(ends, 2);
 }
 
 } // namespace

@@ -16,8 +16,8 @@ TEST(QuillConstructs, Dimensions) {
         "0xffffffffffffffff => 1.8446744073709552e+19r", "123456789012345678 => 1.2345678901234568e+17r",
         "00012 => 12r",
         // Operators
-        "-a => UnaryMinus(a)", "-1 => UnaryMinus(1r)", "~a => Not(a)", "!a => Not(a)",
-        "a == b < c => Equal(a,LessThan(b,c))", "a - ... and so on\n  b % the rest => Minus(a,b)",
+        "-a => UnaryMinus(a)", "-1 => UnaryMinus(1r)", "-2147483648+N => Plus(-2147483648r,N)", "~a => Not(a)",
+        "!a => Not(a)", "a == b < c => Equal(a,LessThan(b,c))", "a - ... and so on\n  b % the rest => Minus(a,b)",
         // Fields
         "a.b.c => MemberValue(MemberValue(a,b),c)", "(a).b => MemberValue(a,b)",
         // Lists
@@ -38,6 +38,12 @@ TEST(QuillConstructs, Conditions) {
     const std::string cases[] = {
         // Integral literals of 32 bits are integers.
         "A == 1 => Equal(A,1)", "2147483648 => 2147483648r", "1e3 => 1000", "2.5 => 2.5r", "0x10 => 16", "1e-400 => 0",
+        // A minus before 2147483648 makes one with it.
+        "-2147483648 => -2147483648", "- 0x80000000 => -2147483648", "--2147483648. => UnaryMinus(-2147483648)",
+        "2^-2147483648 => Power(2,-2147483648)", "-(2147483648) => UnaryMinus(2147483648r)",
+        "-2147483648^2 => UnaryMinus(Power(2147483648r,2))", "-2147483648' => UnaryMinus(Transpose(2147483648r))",
+        "a-2147483648 => Minus(a,2147483648r)", "-2147483649 => UnaryMinus(2147483649r)",
+        "-02147483647 => UnaryMinus(2147483647)", "bitshift(a,-2147483648) => ShiftRight(a,2147483647)",
         // Every operator
         "2^-1 => Power(2,UnaryMinus(1))", "-a^2 => UnaryMinus(Power(a,2))", "a'' => Transpose(Transpose(a))",
         // Ranges
@@ -52,6 +58,8 @@ TEST(QuillConstructs, Conditions) {
         "f(g(x), @(p) h(p)) => FcnCall(f,FcnCall(g,x),AnonymousFunc(@(p),FcnCall(h,p)))",
         "a.b(2) => FcnCall(MemberValue(a,b),2)", "f(1)(2) => FcnCall(FcnCall(f,1),2)",
         "a(1).b(2).c => MemberValue(FcnCall(MemberValue(FcnCall(a,1),b),2),c)",
+        "((s.t)(1).u)(2) => FcnCall(MemberValue(FcnCall(MemberValue(s,t),1),u),2)", "(5)(1) => FcnCall(5,1)",
+        "[f](1) => FcnCall(Matrix(Row(f)),1)", "(@(p) p)(2) => FcnCall(AnonymousFunc(@(p),p),2)",
         // The seven functions, with their number of arguments and with another one
         "bitshift(a, 2) => ShiftLeft(a,2)", "bitshift(a, -3) => ShiftRight(a,3)", "rem(a,b,c) => FcnCall(rem,a,b,c)",
         "bitand(a) => FcnCall(bitand,a)"};
@@ -136,7 +144,7 @@ TEST(QuillConstructs, NeitherInDimensionsNorInConditions) {
             EXPECT_EQ(reportsText(readDimension(text)), unhandledIn(text, name, position));
         }
     }
-    for (const std::string text : {"(a)(1)", "[f](1)", "(f.g)(1)"})
+    for (const std::string text : {"(a)(1)", "((a))(1)", "(+a)(1)", "((sim))(1)"})
         EXPECT_EQ(reportsText(readCondition(text)), unhandledIn(text, "call", 0));
     EXPECT_EQ(reportsText(readCondition("v(end)")), unhandledIn("v(end)", "end", 2));
 }

@@ -4,6 +4,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <limits>
 #include <map>
 
@@ -122,6 +123,7 @@ TEST(QuillReports, Dimensions) {
 TEST(QuillReports, IntegerDimensions) {
     const std::string cases[] = {
         "2147483648 => IntegerOverflow(2147483648, 2147483648, 0)@0",
+        "-2147483648 => -2147483648",
         "A+1.5 => NonIntegerLiteralValue(1.5, A+1.5, 2)@2",
         "A+half => NonIntegerValue(half, A+half, 2)@2",
         "endless => NonIntegerValue(endless, endless, 0)@0",
@@ -145,6 +147,66 @@ TEST(QuillReports, InUtf16Text) {
               "NonASCIIText(A%\xef\xbf\xbd\xf4\x8f\xb0\x80, 2)@2");
     EXPECT_EQ(report(u"[A;B]"), "NonVectorValue([A;B], 0)@0");
     EXPECT_EQ(readCondition(std::u16string(1, char16_t{0xdc00})).thrown.value().offset(), 0U);
+}
+
+/// Refuses every call without a report, as an override may.
+class SilentConverter final : public SymbolicExprFromQParseTreeBlockVariants {
+public:
+    using SymbolicExprFromQParseTreeBlockVariants::SymbolicExprFromQParseTreeBlockVariants;
+
+    SymbolicExprId visitNonTerminal(const ParseTree& node, const char* text) override {
+        const bool isCall = node.code == static_cast<std::int32_t>(QuillRule::Call);
+        return isCall ? invalidId : SymbolicExprFromQParseTreeBlockVariants::visitNonTerminal(node, text);
+    }
+};
+
+TEST(QuillReports, ThoseOfAnEarlierTextExplainNothing) {
+    SymbolicExprTable table;
+    VTSymbolicExprErrorChecker checker; // collects
+    SilentConverter converter(table, checker);
+    const auto reason = [&](const auto& text) -> std::string {
+        try {
+            converter(text);
+        } catch (const HostDiagnostic& thrown) {
+            return thrown.additionalText() + "@" + std::to_string(thrown.offset().value());
+        }
+        return "none";
+    };
+    const std::u16string lone = std::u16string(u"b + ") + char16_t{0xd800};
+    for (int i = 0; i < 2; ++i) {
+        EXPECT_EQ(reason("A +"), "The text ends where a value must follow.@3");
+        EXPECT_EQ(reason(lone), "\"b + \xef\xbf\xbd\" holds no valid character at byte 5, before \"\xef\xbf\xbd\": "
+                                "replace it.@4");
+        EXPECT_EQ(reason("1 + f(x)"), "@0");
+        EXPECT_EQ(reason("2i"), "\"2i\" has no meaning where it stands in \"2i\": write the expression without it.@0");
+    }
+    EXPECT_EQ(checker.diagnostics().size(), 6U);
+}
+
+TEST(QuillReports, TextsWithNulAreQuotedWhole) {
+    const std::string nul(1, '\0');
+    for (const std::string& front : {"sqrt('a" + nul + "b')", "[1;2]%" + nul + "\n", "1e999 %" + nul, "'a" + nul + "'",
+                                     "rem(1)%" + nul, "A" + nul + "B", "[[1],2]%" + nul, "z%" + nul}) {
+        Workspace workspace;
+        for (const QuillAnswer& answer : {readDimension(front, &workspace),
+                                          readDimension(std::u16string(front.begin(), front.end()), &workspace)}) {
+            ASSERT_EQ(answer.reports.size(), 1U);
+            const std::vector<DiagnosticArgument>& arguments = answer.reports[0].arguments();
+            EXPECT_NE(std::ranges::find(arguments, DiagnosticArgument(front)), arguments.end()) << reportsText(answer);
+            EXPECT_EQ(answer.reports[0].offset(), front[0] == 'A' ? 1U : front[1] == '[' ? 1U : 0U);
+        }
+    }
+    // No text is longer than it is: not one whose characters follow another's that has been converted.
+    SymbolicExprTable table;
+    VTSymbolicExprErrorChecker checker;
+    std::string buffer("A +\0B", 5);
+    SymbolicExprFromQParseTree dimensions(table, checker);
+    EXPECT_EQ(dimensions(buffer), invalidId);
+    EXPECT_EQ(dimensions(buffer.c_str()), invalidId);
+    checker.reportInvalidExpr(buffer.c_str());
+    EXPECT_EQ(reportText(checker.diagnostics()[0]), "InvalidExpression(" + buffer + ", 3)@3");
+    EXPECT_EQ(reportText(checker.diagnostics()[1]), "InvalidExpression(A +, 3)@3");
+    EXPECT_EQ(reportText(checker.diagnostics()[2]), "InvalidExpression(A +, 0)@0");
 }
 
 TEST(QuillReports, AreSuppressedByTheCheckersFlag) {
@@ -215,6 +277,37 @@ TEST(QuillReports, ValidatorsAreAskedOnceForANameOfConditions) {
     EXPECT_EQ(workspace.asked, "text@0 unknown@7 S@37 ");
     converter("f + field + text"); // names of functions and fields have not been seen
     EXPECT_EQ(workspace.asked, "text@0 unknown@7 S@37 f@0 field@4 ");
+}
+
+/// Answers nodes of its own, in the shape of Quill calls.
+template <class Base>
+class HostNodes final : public Base {
+public:
+    using Base::Base;
+
+    SymbolicExprId resolveIdentifier(const std::string& name, const char* text, std::size_t position) override {
+        asked += name + "@" + std::to_string(position) + " ";
+        const SymbolicExprId id = Base::resolveIdentifier(name, text, position);
+        return name == "low" ? this->factory().template make<SymbolicFcnCall2UExpr>(
+                                   this->factory().template make<SymbolicString>("bitand"), id,
+                                   this->factory().template make<SymbolicIntValue>(255))
+                             : id;
+    }
+
+    std::string asked;
+};
+
+TEST(QuillReports, OverridesAreAskedForEveryNameAndMayAnswerCalls) {
+    const auto expect = [](auto&& converter, const SymbolicExprTable& table) {
+        EXPECT_EQ(treeText(table, converter("low + N + low + N")),
+                  "Plus(Plus(Plus(BitAnd(low,255),N),BitAnd(low,255)),N)");
+        EXPECT_EQ(treeText(table, converter("N")), "N");
+        EXPECT_EQ(converter.asked, "low@0 N@6 low@10 N@16 N@0 ");
+    };
+    SymbolicExprTable table;
+    VTSymbolicExprErrorChecker checker;
+    expect(HostNodes<SymbolicExprFromQParseTree>(table, checker), table);
+    expect(HostNodes<SymbolicExprFromQParseTreeBlockVariants>(table, checker), table);
 }
 
 TEST(QuillReports, ValidatorsThatFailLeaveAUsableConverter) {

@@ -2,6 +2,7 @@
 #include "parser/SyntaxConverter.hpp"
 
 #include "base/VTSymbolicExpr.hpp"
+#include "parser/SyntaxActions.hpp"
 #include "tests/support/TreeText.hpp"
 
 #include <gtest/gtest.h>
@@ -10,7 +11,7 @@
 namespace VT::Parser {
 namespace {
 
-TEST(SyntaxConverter, ValuesThatNoTextYields) {
+TEST(SyntaxConverter, ValuesOfActionsAndThoseThatNoTextYields) {
     SymbolicExprTable table;
     SyntaxArena arena;
     const expression_ast a = std::string_view("a");
@@ -21,6 +22,11 @@ TEST(SyntaxConverter, ValuesThatNoTextYields) {
     };
     EXPECT_EQ(convert(arena.binary(SymbolicOp::FcnCall2U, a, b)), "FcnCall1U(a,b)");
     EXPECT_EQ(Testing::treeText(table, 0), "a") << "the callee comes first";
+    const expression_list* const both = arena.append(arena.append(nullptr, a), b);
+    EXPECT_EQ(convert(negate_expr()(arena, not_expr()(arena, cmp_expr()(arena, a)))), "UnaryMinus(Not(BitCompl(a)))");
+    EXPECT_EQ(convert(modulo_expr()(arena, a, member_val()(arena, b, a))), "Modulo(a,MemberValue(b,a))");
+    EXPECT_EQ(convert(fcn_call_expr()(arena, a, both)), "FcnCall(a,a,b)");
+    EXPECT_EQ(convert(void_fcn_call_expr()(arena, b)), "FcnCall0U(b)");
     EXPECT_EQ(convert({}), "invalid");
     EXPECT_EQ(convert(&nested), "a");
     EXPECT_EQ(convert(arena.append(arena.append(nullptr, b), 1)), "DimsND(b,1)");

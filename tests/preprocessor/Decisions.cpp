@@ -12,6 +12,7 @@
 #include "tests/support/RandomExpression.hpp"
 
 #include <gtest/gtest.h>
+#include <limits>
 #include <random>
 #include <set>
 
@@ -49,8 +50,44 @@ public:
 private:
     SymbolicExprId name(const std::string& text) { return SymbolicString(table_, text).getId(table_); }
 
+    /// What reads like a name in C text without being one, and names that look odd.
+    SymbolicExprId oddLeaf() {
+        const auto call = [&](const char* function, SymbolicExprId argument) {
+            return SymbolicFcnCall1UExpr(table_, name(function), argument).getId(table_);
+        };
+        const auto member = [&](SymbolicExprId owner, const char* field) {
+            return SymbolicMemberValue(table_, owner, field).getId(table_);
+        };
+        const std::vector<SymbolicExprId> leaves{
+            name("(sim)"),
+            name("(codegen)"),
+            name("@default"),
+            name("while"),
+            member(name(below(2) == 0 ? "true" : "false"), "x"),
+            member(member(name("true"), "x"), "y"),
+            member(name("(sim)"), "x"),
+            member(name("S"), "int"),
+            call("true", name("A")),
+            call("(codegen)", name("A")),
+            SymbolicDoubleValue(table_, std::numeric_limits<double>::infinity()).getId(table_),
+            name("defined"), // from here on in directives alone
+            call("defined", name("true")),
+            call("defined", name("(sim)")),
+            call("defined", name("defined")),
+            call("defined", call("f", name("A"))),
+            call("defined", SymbolicIntValue(table_, 1).getId(table_)),
+            call("defined", member(name("S"), "x")),
+            SymbolicFcnCall0UExpr(table_, name("defined")).getId(table_),
+            SymbolicFcnCall2UExpr(table_, name("defined"), name("A"), name("B")).getId(table_),
+        };
+        const auto common = std::ranges::find(leaves, name("defined")) - leaves.begin();
+        return leaves[below(use_ == CTextUse::Directive ? leaves.size() : static_cast<std::size_t>(common))];
+    }
+
     SymbolicExprId leaf() {
         const bool directive = use_ == CTextUse::Directive;
+        if (below(20) == 0)
+            return oddLeaf();
         switch (below(directive ? 12 : 10)) {
         case 0:
         case 1:
@@ -121,6 +158,7 @@ TEST(Decisions, RandomConditionsInDirectives) {
             if (expressions.below(10) != 0)
                 values[name] = expressions.value();
         quiz.preprocessor.define(values);
+        values["(sim)"] = values["(codegen)"] = values["@default"] = 1; // which no definition can do
         for (const Asked& condition : conditions)
             if (const auto value = condition.truth.under(values))
                 quiz.ask(condition.text, *value != 0);

@@ -45,7 +45,7 @@ std::string preprocessed(const std::string& file, const std::string& header) {
     const Workplace place;
     place.write("file.c", file);
     place.write("header.h", header);
-    run(place, "cpp -P -undef -std=c2x file.c decided");
+    run(place, "cpp -P -w -undef -std=c2x file.c decided");
     return place.read("decided");
 }
 

@@ -8,6 +8,7 @@
 #include "tests/support/Truth.hpp"
 
 #include <array>
+#include <cmath>
 #include <gtest/gtest.h>
 
 namespace VT::Testing {
@@ -88,8 +89,11 @@ TEST_F(GeneratedCode, ConditionsUnderAKnownOne) {
         printer.forget();
         EXPECT_EQ(printer.print(condition), left);
         StringifyImpliedCondition visitor(table, false, true, known);
-        table.get(condition)->accept(table, visitor);
-        EXPECT_EQ(visitor.get(), left);
+        StringifySymbolicExpr& base = visitor;
+        table.get(condition)->accept(table, base);
+        EXPECT_EQ(base.get(), left);
+        EXPECT_EQ(base.print(condition), left);
+        EXPECT_EQ(base.print(*table.get(condition)), left);
     }
     EXPECT_EQ(StringifyImpliedCondition(table, true, true, read("A")).print(read("A || B")), "true");
 }
@@ -142,6 +146,31 @@ TEST_F(GeneratedCode, ObstaclesOfCText) {
         {read("A.B.C || A_B"), {}, {}},
         {tree(Op::MemberValue, call), {}, {MemberOfNoName}},
         {tree(Op::FcnCall1U, read("S.f"), b), {}, {CalledNoName}},
+        {read("true.B"), {MemberOfNoName}, {MemberOfNoName}},
+        {read("A.false.true"), {NoSuchName}, {}},
+        {read("true(x) || false()"), {CalledNoName}, {CalledNoName}},
+        {tree(Op::MemberValue, tree(Op::Plus, a, b)), {MemberOfNoName}, {MemberOfNoName}},
+        {tree(Op::FcnCall1U, tree.integer(1), b), {CalledNoName}, {CalledNoName}},
+        {read("(sim) && A"), {VariantKeyword}, {VariantKeyword}},
+        {read("(codegen)"), {VariantKeyword}, {VariantKeyword}},
+        {tree.name("(default)"), {VariantKeyword}, {VariantKeyword}},
+        {tree(Op::MemberValue, tree.name("(sim)")), {VariantKeyword}, {VariantKeyword, MemberOfNoName}},
+        {tree(Op::And, tree.name("@default"), a), {NoSuchName}, {NoSuchName}},
+        {tree(Op::FcnCall1U, tree.name("a b"), a), {NoSuchName}, {NoSuchName, CalledNoName}},
+        {tree.name(""), {NoSuchName}, {NoSuchName}},
+        {read("int == S.while"), {NoSuchName}, {}},
+        {read("S.int"), {NoSuchName}, {}},
+        {read("sizeof(A) == 4"), {NoSuchName}, {}},
+        {read("defined == 1 && defined(A)"), {}, {NoSuchName}},
+        {read("f(defined)"), {}, {NoSuchName}},
+        {read("defined.B && A.defined && defined(A.B)"), {}, {}},
+        {read("defined(true)"), {}, {DefinedNoName}},
+        {read("defined(A + 1)"), {}, {DefinedNoName}},
+        {read("defined(f(A))"), {}, {DefinedNoName}},
+        {read("defined(A, B)"), {}, {DefinedNoName}},
+        {read("defined()"), {}, {DefinedNoName}},
+        {read("defined(defined)"), {}, {DefinedNoName}},
+        {tree(Op::LessThan, a, tree.real(HUGE_VAL)), {RealConstant}, {RealConstant}},
         {invalidId, {}, {}},
     };
     const auto obstacles = [&](SymbolicExprId id, CTextUse use) {
@@ -156,6 +185,14 @@ TEST_F(GeneratedCode, ObstaclesOfCText) {
         EXPECT_EQ(obstacles(row.id, CTextUse::Program), row.inPrograms);
         EXPECT_EQ(obstacles(row.id, CTextUse::Directive), row.inDirectives);
     }
+    table.insertAliasInfo("int", "rows");
+    table.insertAliasInfo("a b", "(p+q)");
+    table.insertAliasInfo("Name", "true");
+    const SymbolicExprAliasPrinterPredicate aliases(table);
+    EXPECT_TRUE(findCTextObstacles(table, read("int == 1"), CTextUse::Program, aliases).empty());
+    EXPECT_TRUE(findCTextObstacles(table, tree.name("a b"), CTextUse::Directive, aliases).empty());
+    for (const SymbolicExprId id : {tree(Op::MemberValue, tree.name("a b")), read("Name.B")})
+        EXPECT_EQ(findCTextObstacles(table, id, CTextUse::Directive, aliases).front().obstacle, MemberOfNoName);
     for (const OperatorInfo& op : operatorTable()) {
         const bool onlyInQuill = op.op != Op::UnaryMinus && op.c.find_first_of(".\\':") != std::string_view::npos;
         if (onlyInQuill && op.op != Op::MemberValue) {

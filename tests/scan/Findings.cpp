@@ -85,6 +85,9 @@ TEST(Findings, NeverGoBeyondWhatEveryBuildHolds) {
         {"sums wrap around", within("A + 1 > A", "A > 0") + within("A > 5", "A + 1 > 5"), ""},
         {"lines and counters differ", within("__LINE__ > 1", "__LINE__ > 1") + within("__COUNTER__", "__COUNTER__"),
          ""},
+        {"so do levels", within("__INCLUDE_LEVEL__ == 1", "__INCLUDE_LEVEL__ == 1"), ""},
+        {"assertions", within("#machine(x)", "#machine(x)"), ""},
+        {"names of one compiler only", within("defined A\\u00e9", "defined A\\u00e9") + within("\u20ac", "\u20ac"), ""},
         {"not understood, but the same", within("A ? B : C", "A ? B : C") + within("A @", "A @ 1"),
          "2 always A ? B : C @1\n"},
         {"constants are computed", within("A >= (1 << 4) + 'a'", "A > 0x70 && B"),
@@ -96,17 +99,35 @@ TEST(Findings, NeverGoBeyondWhatEveryBuildHolds) {
 }
 
 TEST(Findings, FollowWhatTheFileDoesToMacros) {
-    const std::string onTheWay = "#ifndef A\n%\n#ifdef A\n#endif\n#endif";
+    const std::string onTheWay = "#ifndef A\n%\n#ifdef A\n#endif\n#endif\n";
     const auto with = [&](const std::string& line) { return std::string(onTheWay).replace(10, 1, line); };
     expectFound({
         {"guard", with("#define A"), ""},
         {"undefined", with("#undef A"), ""},
         {"another", with("#define B"), "3 dead defined(A) @1\n"},
         {"popped", with("#pragma pop_macro(\"A\")"), ""},
+        {"operators", with("f(); __pragma(pop_macro(\"A\"))") + with("_Pragma(\"GCC poison A\")"), ""},
+        {"poisoned", with("#pragma GCC poison A"), ""},
+        {"options", with("#pragma GCC target(\"avx2\")") + with("_Pragma(\"GCC pop_options\")"), ""},
+        {"other pragmas", with("#pragma GCC visibility push(default)") + with("_Pragma(\"once\") // GCC target"),
+         "3 dead defined(A) @1\n8 dead defined(A) @6\n"},
+        {"by a macro", "#define P DO(pop_macro(\"A\"))\n#ifndef A\nP\n#ifdef A\n#endif\n#endif", ""},
+        {"by another spelling", with("#undef A\xc2\xa0") + with("#define \\u0041"), ""},
+        {"imported",
+         with("import <a.h>;") + with("export import \"a//b.h\";") + with("imp\\\nort A;") + with("@import A;"), ""},
+        {"not imported", with("import(A);") + with("x import <a.h>"), "3 dead defined(A) @1\n8 dead defined(A) @6\n"},
         {"included", with("#include <a.h>"), ""},
         {"in a branch before", "#if A == 1\n#define A 2\n#elif A == 1\n#endif", ""},
         {"in a chain before", "#if A\n#ifdef B\n#undef A\n#endif\n#if A\n#endif\n#endif", ""},
         {"defined by what changes", "#define A (B + 1)\n#if A == 1\n#undef B\n#if A == 1\n#endif\n#endif", ""},
+        {"defined as an operand",
+         "#define A (B || C)\n#define D A\n#define E -D\n#define F(x) (x || C)\n#define G(x) F(x)\n" +
+             within("D == 1", "D == 2") + within("E < 1", "E > 1") + within("G(1) == 1", "G(1) != 1"),
+         "7 dead D == 2 @6\n11 dead E > 1 @10\n15 dead G(1) != 1 @14\n"},
+        {"as an expression",
+         "#define A B || C\n#define D A\n#define E -D\n#define F(x) x || C\n#define G(x) F(x)\n" +
+             within("D == 1", "D == 2") + within("E < 1", "E > 1") + within("G(1) == 1", "G(1) != 1"),
+         ""},
         {"what is defined stays so in an included file", "#if A > 2\n#include <a.h>\n#if A > 1\n#endif\n#endif",
          "3 always A > 1 @1\n"},
         {"but for strict readers", "#if A > 2\n#include <a.h>\n#if A > 1\n#endif\n#endif", "", false, true},
@@ -135,6 +156,10 @@ TEST(Findings, SeeTheDirectivesThatAPreprocessorSees) {
         {"no raw string", "R\"(\n" + again, "3 always defined(A) @2\n"},
         {"separators of digits", "1'0 /* ' */\n" + again, "3 always defined(A) @2\n"},
         {"names of headers", "#include <a//b/*c.h>\n" + again, "3 always defined(A) @2\n"},
+        {"names of headers that are tested", within("__has_include(<a//b/*c.h>) || A", "__has_include(<a//b/*c.h>)||B"),
+         ""},
+        {"trigraphs", "?\?=undef A\n" + again, ""},
+        {"carriage returns alone", "// \r#undef A\n" + again, ""},
         {"digraphs, form feeds", "%:ifdef A\n\f%\\\n:\vifdef A\n#endif\n#endif", "2 always defined(A) @1\n"},
         {"carriage returns, a mark, NUL", "\xEF\xBB\xBF#ifdef A\r\n\t#\tifdef\0 A\r\n#endif\r\n#endif\r\n"s,
          "2 always defined(A) @1\n"},

@@ -5,6 +5,7 @@
 #include "base/VTSymbolicExpr.hpp"
 #include "base/simplify/VCCustomizer.hpp"
 #include "base/variants/Features.hpp"
+#include "tests/support/FlagSetting.hpp"
 
 #include <functional>
 #include <string>
@@ -16,9 +17,12 @@ namespace VT::Testing {
 /// A service that nobody has used, made under a setting of the cache feature; gone with this object.
 class FreshService {
 public:
-    explicit FreshService(bool caching = true) : before_(cacheSymExprSimplifyResultsFeature().value()) {
+    /// The keyword feature is as `keywords` says while the service is made.
+    explicit FreshService(bool caching = true, bool keywords = true)
+        : before_(cacheSymExprSimplifyResultsFeature().value()) {
         VCService::clean();
         cacheSymExprSimplifyResultsFeature().setValue(caching ? 1 : 0);
+        const FlagSetting setting(*VTFEAT_VariantKeywordsSimCodegen, keywords ? 2 : 0);
         VCService::getInstance();
     }
 
@@ -31,6 +35,8 @@ public:
     }
 
     VCService* operator->() const { return &VCService::getInstance(); }
+
+    VCService& operator*() const { return VCService::getInstance(); }
 
 private:
     std::int32_t before_;
@@ -57,7 +63,13 @@ public:
 
     ParameterReplacements parameterReplacements() override { return parameters; }
 
+    std::optional<ParameterReplacement> parameterOfBlock(const VTBlock* block,
+                                                         const std::string& parameter) const override {
+        return onParameter ? onParameter(block, parameter) : std::nullopt;
+    }
+
     ParameterReplacements parameters;
+    std::function<std::optional<ParameterReplacement>(const VTBlock*, const std::string&)> onParameter;
     std::function<void()> onRelease;
     std::function<SymbolicExprId(SymbolicExprId, SymbolicExprTable&)> onRewrite;
     bool agrees = true;

@@ -188,6 +188,8 @@ TEST(ServiceAliases, FirstOneStays) {
     service->addParameterAlias("N", "N_2");
     EXPECT_EQ(service->getParameterAlias("N"), "N_1");
     EXPECT_EQ(service->getParameterAlias("n"), "");
+    service->addParameterAlias("M", "-5");
+    EXPECT_EQ(service->getParameterAlias("M"), "(-5)");
     EXPECT_EQ(service->printCExpr(service->parseC("N")), "N");
 }
 

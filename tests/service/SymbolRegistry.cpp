@@ -99,6 +99,21 @@ TEST_F(Registry, KeepsAliasesInTheTable) {
     registry.insertAlias("N", "rows");
     registry.insertAlias("N", "columns");
     EXPECT_EQ(registry.aliasOf("N"), "rows");
+    registry.registerExpression(&blocks[0], SymbolicIntValue(table, -7).getId(table));
+    EXPECT_EQ(registry.aliasOf("dim__2d7"), "(-7)");
+    int i = 0;
+    for (const char* text : {"-5", "-.5", " - 0x1p-3 ", "-1e+300", "-10U", "-Inf", "-NaN"}) {
+        const std::string name = "n" + std::to_string(i++);
+        registry.insertAlias(name, text);
+        EXPECT_EQ(registry.aliasOf(name), "(" + std::string(text) + ")");
+        table.insertAliasInfo("t" + name, text);
+        EXPECT_EQ(registry.aliasOf("t" + name), text);
+    }
+    for (const char* text : {"5", "", "-", "-5-4", "(-5)", "-.", "N-5", "-5 4", "-+5"}) {
+        const std::string name = "n" + std::to_string(i++);
+        registry.insertAlias(name, text);
+        EXPECT_EQ(registry.aliasOf(name), text);
+    }
 }
 
 } // namespace

@@ -3,6 +3,10 @@
 
 #include "base/core/Limits.hpp"
 #include "tests/support/AnyNode.hpp"
+#include "tests/support/Times.hpp"
+
+#include <functional>
+#include <random>
 
 namespace VT::Testing {
 namespace {
@@ -65,11 +69,106 @@ TEST(LongChains, AreReducedWhateverTheirLength) {
     std::string contradiction = "A==0";
     std::string range = "A>0";
     for (int i = 1; i < 20000; ++i) {
-        contradiction += "&&A==" + std::to_string(i);
-        range += "&&A>" + std::to_string(i);
+        contradiction += "&&A==" + std::to_string(i % limit);
+        range += "&&A>" + std::to_string(i % limit);
     }
     EXPECT_EQ(bench.simplified(contradiction), "false");
-    EXPECT_EQ(bench.simplified(range), "A>19999");
+    EXPECT_EQ(bench.simplified(range), "A>999");
+    // One operand more is one too many, although the pairs would merge.
+    EXPECT_TRUE(bench.simplified(range + "&&A>1000") == range + "&&A>1000");
+}
+
+/// What a family's text of size n is made of.
+struct Family {
+    const char* name;
+    std::size_t size; ///< the largest of three, each twice the one before
+    std::string (*text)(std::size_t n);
+};
+
+std::string joined(std::size_t n, const char* between, const std::function<std::string(const std::string&)>& part) {
+    std::string text;
+    for (std::size_t i = 0; i < n; ++i)
+        text += (i == 0 ? "" : between) + part(std::to_string(i));
+    return text;
+}
+
+/// Brackets within brackets: `open` before each, with the number of the bracket for every #.
+std::string nested(std::size_t n, const std::string& even, const std::string& odd) {
+    std::string text;
+    for (std::size_t i = 0; i < n; ++i)
+        for (const char c : i % 2 == 0 ? even : odd)
+            text += c == '#' ? std::to_string(i) : std::string(1, c);
+    return text + "Z" + times(n, ")");
+}
+
+/// Products of literals drawn at random from so many symbols.
+std::string products(std::size_t n, std::size_t literals, std::uint64_t symbols, const char* inner, const char* outer) {
+    std::mt19937_64 random(n);
+    return joined(n, outer, [&](const std::string&) {
+        return "(" +
+               joined(literals, inner,
+                      [&](const std::string&) {
+                          return (random() % 2 == 0 ? "!V" : "V") + std::to_string(random() % symbols);
+                      }) +
+               ")";
+    });
+}
+
+const Family families[] = {
+    {"alternation", 240, [](std::size_t n) { return nested(n, "A#&&(", "A#||("); }},
+    {"lexicographic", 240, [](std::size_t n) { return nested(n, "A#>#||A#==#&&(", "A#>#||A#==#&&("); }},
+    {"negations", 240, [](std::size_t n) { return nested(n, "!(A#&&", "!(A#||B#&&"); }},
+    {"truth values compared", 240, [](std::size_t n) { return nested(n, "A#==(B#&&C#||", "A#<(B#||"); }},
+    {"clauses", 400, [](std::size_t n) { return products(n, 3, n / 4, "||", "&&"); }},
+    {"few clauses", 24, [](std::size_t n) { return products(n, 2, 12, "||", "&&"); }},
+    {"sum over few symbols", 800, [](std::size_t n) { return products(n, 4, 8, "&&", "||"); }},
+    {"sum over some symbols", 800, [](std::size_t n) { return products(n, 4, 20, "&&", "||"); }},
+    {"sum over many symbols", 800, [](std::size_t n) { return products(n, 4, n, "&&", "||"); }},
+    {"negated sum", 400, [](std::size_t n) { return "!(" + products(n, 3, 40, "&&", "||") + ")"; }},
+    {"negated ranges", 900,
+     [](std::size_t n) {
+         return "!(" + joined(n, "||", [](const std::string& i) { return "A>=4*" + i + "&&A<=4*" + i + "+1"; }) + ")";
+     }},
+    {"ranges", 900,
+     [](std::size_t n) {
+         return joined(n, "&&", [](const std::string& i) { return "(A<" + i + "00||A>" + i + "01)"; });
+     }},
+    {"products of sums", 3000,
+     [](std::size_t n) { return joined(n, "*", [](const std::string& i) { return "(N+" + i + ")"; }); }},
+    {"long sum", 6000,
+     [](std::size_t n) { return joined(n, "+", [](const std::string& i) { return i + "*A" + i; }) + ">0"; }},
+    {"sums in calls", 100,
+     [](std::size_t n) {
+         return joined(n, "+",
+                       [](const std::string& i) { return "f(" + products(9 + i.size(), 2, 12, "||", "&&") + ")"; });
+     }},
+    {"comparisons of long texts", 160,
+     [](std::size_t n) {
+         const std::string sum = joined(30, "+", [](const std::string& i) { return "LONG_NAME_" + i; });
+         return joined(n, "||", [&](const std::string& i) { return sum + ">" + i + "&&B" + i; });
+     }},
+};
+
+// The nodes that a call makes are bounded by those that it is given and by what it may multiply out, and what it
+// returns stays as it is, also where a bound was met.
+TEST(GrowingFamilies, MakeNoMoreNodesThanTheirBoundAndStayAsTheyAre) {
+    for (const Family& family : families) {
+        for (const std::size_t n : {family.size / 4, family.size / 2, family.size}) {
+            SCOPED_TRACE(family.name + std::to_string(n));
+            Workbench bench;
+            const SymbolicExprId condition = bench.parse(family.text(n));
+            const std::size_t given = bench.table.size();
+            const SymbolicExprId result = bench.simplify(condition);
+            EXPECT_LE(bench.table.size(), 4 * given + limits::multipliedLiterals);
+            EXPECT_LT(bench.passes, limits::simplifyPasses);
+            EXPECT_EQ(bench.simplify(result), result);
+            if (n == family.size)
+                continue;
+            Workbench used; // in which names and parts have other identifiers
+            used.simplify(used.parse(family.text(n / 2 + 1)));
+            EXPECT_TRUE(used.simplified(family.text(n)) == SymbolicExprPrinter(bench.table, false)(result));
+        }
+    }
 }
 
 // Each graph has few nodes and more paths than could be walked.

@@ -1,8 +1,11 @@
 // Properties over random and over real conditions.
+#include "tests/simplify/Meaning.hpp"
 #include "tests/simplify/Workbench.hpp"
+#include "tests/support/AnyNode.hpp"
 #include "tests/support/Corpus.hpp"
 #include "tests/support/Parsing.hpp"
 #include "tests/support/RandomCondition.hpp"
+#include "tests/support/RandomExpression.hpp"
 
 #include <array>
 
@@ -48,6 +51,53 @@ RC_GTEST_PROP(Simplify, DoesNotDependOnWhatWasInternedBefore, ()) {
     for (std::uint64_t other = 0; other < 3; ++other)
         used.simplify(used.parse(condition(seed + other, shapes[0])));
     RC_ASSERT(fresh.simplified(text) == used.simplified(text));
+}
+
+/// A leaf for trees in which integers, reals and truth values are operands of each other.
+SymbolicExprId anyLeaf(const Trees& tree, std::mt19937_64& random) {
+    static const std::vector<std::string> names{"A", "B", "C", "A", "B", "C", "true", "false"};
+    const std::uint64_t kind = random() % 12;
+    return kind < 7    ? tree.name(names[random() % names.size()])
+           : kind < 11 ? tree.integer(static_cast<int>(random() % 7) - 3)
+                       : tree.real((static_cast<double>(random() % 9) - 4) * 0.5);
+}
+
+// Every operator below every other, most of all And and Or where their value counts, and quotients in both contexts.
+TEST(Simplify, KeepsTheValueOfMixedExpressions) {
+    using Op = SymbolicOp;
+    static const std::vector<Op> operators{
+        Op::Plus,      Op::Minus,     Op::UnaryMinus, Op::Multiply, Op::Multiply,      Op::Divide,
+        Op::Divide,    Op::Equal,     Op::NotEqual,   Op::LessThan, Op::GreaterThan,   Op::GreaterThanEqual,
+        Op::And,       Op::And,       Op::Or,         Op::Not,      Op::LessThanEqual, Op::Or,
+        Op::FcnCall1U, Op::SingleAnd, Op::SingleOr,   Op::Plus,     Op::Modulo,        Op::BitXOr};
+    std::mt19937_64 random(29);
+    std::size_t judged = 0;
+    for (int round = 0; round < 20000; ++round) {
+        Workbench bench;
+        const Trees tree{bench.table};
+        const SymbolicExprId before =
+            randomTree(bench.table, random, operators, 2 + round % 4, [&] { return anyLeaf(tree, random); });
+        const SymbolicExprId after = bench.simplify(before);
+        const auto text = [&](SymbolicExprId id) { return SymbolicExprPrinter(bench.table, true)(id); };
+        ASSERT_EQ(bench.simplify(after), after) << text(before) << " became " << text(after);
+        const bool asTruth = booleanOps.contains(bench.table.get(before)->op());
+        for (int trial = 0; trial < 20; ++trial) {
+            Assignment assignment;
+            for (const std::string& symbol : symbols)
+                assignment[symbol] = static_cast<std::int64_t>(random() % 11) - 4;
+            const Meaning meaning(bench.table, assignment);
+            const std::optional<double> expected = meaning.of(before);
+            if (!expected)
+                continue;
+            ++judged;
+            const std::optional<double> value = meaning.of(after);
+            ASSERT_TRUE(value) << text(before) << " became " << text(after);
+            ASSERT_EQ(asTruth ? *value != 0 : *value, asTruth ? *expected != 0 : *expected)
+                << text(before) << " became " << text(after) << " with A=" << assignment["A"]
+                << " B=" << assignment["B"] << " C=" << assignment["C"];
+        }
+    }
+    EXPECT_GT(judged, 150000U);
 }
 
 /// A sum or product as text.

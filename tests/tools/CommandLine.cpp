@@ -47,8 +47,13 @@ void expectRows(const std::vector<Row>& rows) {
 
 TEST(Program, AnswersTexts) {
     expectRows({
-        {{"simplify", "--", "-x", "-5 < A"}, "", "-x\nA>-5\n"},
+        {{"simplify", "--", "-x", "-5 < A"}, "", "-x\n-5<A\n"},
         {{"simplify", "[1,2] == tree", "{}"}, "", "[1,2]==tree\n\n", {"line 2:"}, 1},
+        {{"simplify", "--from=quill", "tree", "[A]", "[1,B]"}, "", "tree\n[A]\n[1,B]\n"},
+        {{"simplify", "%%", "++", "A", "[", "{}", ""}, "", "\n\nA\n\n\ntrue\n", {"line 1:", "line 5:"}, 1},
+        {{"eval", "-D", "A=[1,2]", "A", "--", "-1"}, "", "[1,2]\n-1\n"},
+        {{"pp", "--given", "[A]", "--", "-A"}, "", "-A\n"},
+        {{"symbols", "--kinds", "functions,members", "--kinds", "identifiers", "--", "f(A.b)", "-C"}, "", "f A.b\nC\n"},
         {{"simplify", "--from", "quill", "~(A < 3) | B"}, "", "A>=3 | B\n"},
         {{"convert", "--from", "quill", "--to", "c", "bitshift(a, -3) ~= 0"}, "", "a>>3!=0\n"},
         {{"convert", "--from", "quill", "A = 1"}, "", "\n", {"line 1:", "A = 1\n    ^"}, 1},
@@ -92,7 +97,7 @@ TEST(Program, ComparesConditions) {
         {{"compare"},
          "A==1||A==2\tA>=1 && A<=2\nA\n\tA\nA\tB +\nA\tB\tC",
          "equivalent\n\nimplied by; first alone: A=0\n\n\n",
-         {"line 2: Two conditions are separated by one tab.", "line 4: ", "  A\\x09B +\n         ^", "line 5: Two"},
+         {"line 2: Two conditions are separated by one tab.", "line 4: ", "  B +\n    ^", "line 5: Two"},
          1},
         {{"compare", "--json", "-"},
          "A==1\tA==2\n1\tA<=A\nA<A\tB\nA+\tB\n",
@@ -111,16 +116,32 @@ TEST(Program, ComparesConditions) {
          "{\"line\":2,\"known\":\"A\",\"condition\":\"A && B\",\"result\":\"B\"}\n",
          {},
          0},
-        {{"simplify", "--strong", "A<B && B<C && A<C", "A<B && B<C && C<A", "A<=3 || A>=0 && A!=1"},
+        {{"simplify", "A<B && B<C && A<C", "A<B && B<C && C<A", "A<=3 || A>=0 && A!=1"},
          "",
          "A<B && B<C\nfalse\ntrue\n",
          {},
          0},
-        {{"simplify", "--explain", "--strong", "A<B && A<C && B<C"},
+        {{"simplify", "--explain", "A<B && A<C && B<C"},
          "",
-         "A<B && A<C && B<C\n  no rule applies\nproven equal  A<B && A<C && B<C  =>  A<B && B<C\n= A<B && B<C\n",
+         "A<B && A<C && B<C\n  no rule applies\nshortest form\n"
+         "  operands taken away, each with a proof         A<B && B<C  2 comparisons, 10 bytes, proven equal\n"
+         "  comparisons joined, common operands taken out  A<B && A<C && B<C  3 comparisons, 17 bytes\n"
+         "= A<B && B<C\n",
          {},
          0},
+        {{"compare", "A +", "B\t+"},
+         "",
+         "\n",
+         {"line 1: The condition \"A +\"", "\n  A +\n    ^\nline 1: The condition \"B +\"", "\n  B +\n    ^\n"},
+         1},
+        {{"compare", "--json", "A +", "B +"},
+         "",
+         R"json({"line":1,"input":"A +\tB +","error":{"id":"Vantor:Variants:ExpressionParseError","message":"The condition \"A +\" cannot be read at byte 3, before \"+\".","offset":2,"further":[{"id":"Vantor:Variants:ExpressionParseError","message":"The condition \"B +\" cannot be read at byte 3, before \"+\".","offset":6}]}}
+)json",
+         {},
+         1},
+        {{"compare", "", "A"}, "B\tB", "implied by; first alone: A=0\n"},
+        {{"given", "--", "-A", "-A && B"}, "", "B\n"},
         {{"compare", "A"}, "", "", {"two conditions are needed", "Try 'vtsym compare --help'"}, 2},
         {{"given", "A", "B", "C"}, "", "", {"'C' is one argument too many"}, 2},
         {{"compare", "--bits", "16", "A", "B"}, "", "", {"--bits: '16' is not offered; 32 is"}, 2},
@@ -130,8 +151,10 @@ TEST(Program, ComparesConditions) {
 TEST(Program, KeepsASession) {
     const std::string dialogue = "A>2 && A<4\nans || A>3\n:let N=A+1\n:let A=2\nN*2==6\n:quill\nB ~= A\n:c\n"
                                  ":tree A+1\n:explain 1 && B\n:symbols\n:pp !A.b || B && 2.5 < C\n";
-    const std::string answers = "A==3\nA>=3\nN = A+1\nA = 2\n(A+1)*2==6\n(A+1)*2==6\nB~=2\nB!=2\n"
-                                "Plus +\n├─ 2\n└─ 1\n1 && B\npass 1\n  number in And  1 && B  =>  B\n= B\nB\n"
+    const std::string answers = "A==3\nA>=3\nN = A+1\nA = 2\nA==2\nA==2\nB~=2\nB!=2\n"
+                                "Plus +\n├─ 2\n└─ 1\n1 && B\npass 1\n  number in And  1 && B  =>  B\n"
+                                "normal form\n  B\nshortest form\n  comparisons joined, common operands taken out  B  "
+                                "1 comparison, 1 byte, proven equal\n= B\nB\n"
                                 "!A_b || (B && 2.5 < C)\nwarning: a preprocessor has no real constants: 2.5\n";
     expectRows({
         {{"repl"}, dialogue, answers},
@@ -213,10 +236,16 @@ TEST(Program, Evaluates) {
 TEST(Program, ExplainsSimplification) {
     expectRows({
         {{"simplify", "--explain", "A"}, "", "A\n  no rule applies\n= A\n"},
+        {{"simplify", "--normal-form", "(A || B) && C", "2+3", "A<A"}, "", "A && C || B && C\n5\nfalse\n"},
+        {{"simplify", "(A || B) && C", "2+3", "A<A", "!0", "A==A"}, "", "(A || B) && C\n5\n0\n1\ntrue\n"},
+        {{"simplify", "--to", "quill", "A/B==1 && A/B>0"}, "", "idivide(A,B)==1\n"},
+        {{"simplify", "--strong", "A"}, "", "", {"there is no option '--strong'"}, 2},
         {{"simplify", "--explain", "--json", "A && true"},
          "",
          "{\"line\":1,\"input\":\"A && true\",\"result\":\"A\",\"passes\":2,\"steps\":[{\"pass\":1,\"rule\":"
-         "\"true operand of And\",\"before\":\"A && true\",\"after\":\"A\"}]}\n"},
+         "\"true operand of And\",\"before\":\"A && true\",\"after\":\"A\"},{\"form\":\"A\",\"way\":\"comparisons "
+         "joined, common operands "
+         "taken out\",\"comparisons\":1,\"bytes\":1,\"chosen\":true}]}\n"},
     });
 }
 
@@ -256,7 +285,7 @@ TEST(Program, WorksOnDimensions) {
          {},
          1},
         {{"dims", "N^2"}, "", "\n", {"line 1: ", "power"}, 1},
-        {{"dims", "-D", "3=N", "N"}, "", "", {"'3' is no name"}, 2},
+        {{"dims", "-D", "3=N", "N"}, "", "", {"'3' is not a name"}, 2},
     });
 }
 
@@ -316,13 +345,29 @@ TEST(Program, RefusesWrongUsageWithAHint) {
     expectRows({
         {{}, "", "", {"a command is missing", "Usage: vtsym"}, 2},
         {{"simplfy", "a"}, "", "", {"there is no command 'simplfy'; did you mean simplify?", "Try 'vtsym --help'"}, 2},
-        {{"simplify", "-x"}, "", "", {"there is no option '-x'", "goes behind --", "Try 'vtsym simplify --help'"}, 2},
+        {{"simplify", "-x"},
+         "",
+         "",
+         {"there is no option '-x'", "that begins with - after --", "Try 'vtsym simplify --help'"},
+         2},
         {{"operators", "x"}, "", "", {"'x' is one argument too many", "Try 'vtsym operators --help'"}, 2},
         {{"convert", "--to", "basic", "a"}, "", "", {"--to: 'basic' is not offered; c, quill or pp is"}, 2},
         {{"tree", "--json", "--dot", "a"}, "", "", {"--json", "--dot"}, 2},
+        {{""}, "", "", {"vtsym: there is no command ''\nTry"}, 2},
+        {{"xy"}, "", "", {"vtsym: there is no command 'xy'\nTry"}, 2},
+        {{"--", "simplify", "A"}, "", "", {"there is no command '--'"}, 2},
+        {{"check"}, "", "", {"MODEL is required", "Try 'vtsym check --help'"}, 2},
+        {{"check", "--", "m.json"}, "", "", {"vtsym: m.json: cannot be read"}, 2},
+        {{"check", "[m]"}, "", "", {"vtsym: [m]: cannot be read"}, 2},
+        {{"check", "--html", "[p]", "m.json"}, "", "", {"vtsym: m.json: cannot be read"}, 2},
+        {{"check", "--html", "--", "m.json"}, "", "", {"--html: 1 required FILE missing"}, 2},
+        {{"scan", "--", "-a.c", "{}"}, "", "", {"vtsym: -a.c: cannot be read", "vtsym: {}: cannot"}, 2},
+        {{"eval", "-D", "[1]"}, "", "", {"-D: '[1]' is not NAME=VALUE"}, 2},
+        {{"eval", "-D", "{}"}, "", "", {"-D: '{}' is not NAME=VALUE"}, 2},
+        {{"symbols", "--kinds", "[members]"}, "", "", {"'[members]' is not offered"}, 2},
         {{"eval", "-D", "N"}, "", "", {"'N' is not NAME=VALUE", "Try 'vtsym eval --help'"}, 2},
         {{"eval", "-D", "N="}, "", "", {"'N=' gives no value"}, 2},
-        {{"eval", "-D", "N+1=2"}, "", "", {"'N+1' is no name that can be given a value"}, 2},
+        {{"eval", "-D", "N+1=2"}, "", "", {"'N+1' is not a name that can be given a value"}, 2},
         {{"eval", "-D", "a b=1"}, "", "", {"the name 'a b' cannot be read"}, 2},
         {{"simplify", "--feature", "Nope=1", "a"}, "", "", {"there is no feature flag \"Nope\""}, 2},
     });

@@ -102,17 +102,41 @@ TEST_F(Scan, EndsAsItWent) {
     const ProgramResult unread = scan({"--sarif", (directory_ / "gone.c").string()});
     EXPECT_EQ(unread.status, 2);
     EXPECT_THAT(unread.words, HasSubstr("gone.c: cannot be read: No such file"));
-    EXPECT_THAT(unread.words, HasSubstr("binary.c: is no text"));
+    EXPECT_THAT(unread.words, HasSubstr("binary.c: is not a text"));
     const Json schema = Json::parse(std::ifstream(VTSYM_TEST_DATA "/sarif-2.1.0.json"));
     EXPECT_EQ(schemaErrors(schema, schema, Json::parse(unread.output)), "");
     EXPECT_THAT(unread.output, HasSubstr("\"executionSuccessful\":false"));
 
     write("some.h",
           "#ifndef A\n#include <a.h>\n#ifdef A\n#if B\n#include <b.h>\n#if B == 0\n#endif\n#endif\n#endif\n#endif");
-    EXPECT_EQ(scan({"--strict-includes"}).status, 0);
     const ProgramResult some = scan({"--summary"});
-    EXPECT_EQ(some.status, 1);
+    EXPECT_EQ(some.status, 2); // for the binary
     EXPECT_THAT(some.words, HasSubstr("1 files, 4 branches, 1 findings"));
+    fs::remove(directory_ / "binary.c");
+    EXPECT_EQ(scan().status, 1);
+    EXPECT_EQ(scan({"--strict-includes"}).status, 0);
+    // Ten pigeons in nine holes.
+    std::string condition = "1";
+    for (int pigeon = 0; pigeon < 10; ++pigeon) {
+        std::string somewhere = "0";
+        for (int hole = 0; hole < 9; ++hole) {
+            const auto at = [hole](int each) { return "P" + std::to_string(each) + "_" + std::to_string(hole); };
+            somewhere += " || " + at(pigeon);
+            for (int other = 0; other < pigeon; ++other)
+                condition += " && !(" + at(pigeon) + " && " + at(other) + ")";
+        }
+        condition += " && (" + somewhere + ")";
+    }
+    const std::string odd = write("odd.c", "#if X\n#if X && B('\xff')\n#endif\n#endif\n").string();
+    const std::string unfixed = runProgram({{"scan", "--sarif", odd}, {}, {}, {}}).output;
+    EXPECT_THAT(unfixed, HasSubstr("\"removable\",\"ruleIndex\""));
+    EXPECT_THAT(unfixed, ::testing::Not(HasSubstr("fixes"))); // which would not be the bytes of the file
+    const std::string hard = write("hard.c", "#if " + condition + "\n#endif\n").string();
+    const ProgramResult givenUp = runProgram({{"scan", "--sarif", hard}, {}, {}, {}});
+    EXPECT_EQ(givenUp.status, 0);
+    EXPECT_THAT(givenUp.words, ::testing::MatchesRegex("vtsym: [1-9][0-9]* decisions were given up: .*\n"));
+    EXPECT_EQ(schemaErrors(schema, schema, Json::parse(givenUp.output)), "");
+    EXPECT_THAT(givenUp.output, HasSubstr("\"level\":\"note\""));
     EXPECT_EQ(runProgram({{"scan"}, {}, {}, {}}).status, 2);
     EXPECT_EQ(scan({"--json", "--sarif"}).status, 2);
 }

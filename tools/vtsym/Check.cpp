@@ -1,16 +1,13 @@
 // vtsym check
+#include "tools/vtsym/Arguments.hpp"
 #include "tools/vtsym/Commands.hpp"
+#include "tools/vtsym/Files.hpp"
 #include "tools/vtsym/Findings.hpp"
 #include "tools/vtsym/ModelCheck.hpp"
 #include "tools/vtsym/ModelPage.hpp"
 #include "tools/vtsym/Texts.hpp"
 
 #include "host/embedded/ModelFile.hpp"
-
-#include <cerrno>
-#include <cstring>
-#include <fstream>
-#include <iterator>
 
 namespace vtsym {
 
@@ -20,8 +17,8 @@ constexpr const char* examples =
     R"(A model is a JSON file of blocks in blocks; the choices of a block are alternatives, each with a condition of its own.
 docs/model.schema.json describes it.  Every finding is proven; conditions are over integers without bounds.
 
-The exit status is 0 where nothing was found, 1 where something was, and 2 where the model could not be read or something
-could not be decided.
+The exit status is 0 where nothing was found, 1 where something was, and 2 where the model could not be read, something
+could not be decided, or the page could not be written.
 
 Examples:
   vtsym check model.json
@@ -47,41 +44,32 @@ struct CheckOptions {
     std::string file;
     std::string page;
     FindingForm form = FindingForm::Compiler;
+    std::size_t mostBytes = vtsym::mostBytes;
     bool bits32 = false;
 };
 
-/// The bytes of a file; an exception with the reason where it cannot be read.
-std::string contentOf(const std::string& path) {
-    errno = 0;
-    std::ifstream stream(path, std::ios::binary);
-    std::string content;
-    if (stream)
-        content.assign(std::istreambuf_iterator<char>(stream), {});
-    if (!stream || stream.bad())
-        throw std::runtime_error(std::string("The file cannot be read: ") + std::strerror(errno != 0 ? errno : EISDIR) +
-                                 ".");
-    return content;
-}
-
-void writePage(const std::string& path, const std::string& page) {
-    errno = 0;
-    std::ofstream stream(path, std::ios::binary);
-    stream << page;
-    stream.close();
-    if (!stream)
-        throw std::runtime_error("The page " + path + " cannot be written: " + std::strerror(errno) + ".");
+void writePage(const std::string& path, const std::string& page, FindingWriter& writer) {
+    try {
+        writeFile(path, page);
+    } catch (const FileError& error) {
+        writer.problem({path, 0, 0, 0, 0, {}}, error.what());
+    }
 }
 
 SearchResult check(const CheckOptions& options, Console& console) {
     const std::unique_ptr<FindingWriter> writer = makeFindingWriter(options.form, console, rules);
+    if (!options.page.empty() && isSameFile(options.page, options.file)) {
+        writer->problem({options.page, 0, 0, 0, 0, {}}, "is the model: name another file for the page");
+        return writer->finish();
+    }
     try {
         console.working(1);
         VTRootBD model;
-        VT::Embedded::readModel(contentOf(options.file), model);
+        VT::Embedded::readModel(readFile(options.file, options.mostBytes), model);
         ModelCheck modelCheck(model, options.file, options.bits32);
         modelCheck.run(*writer);
         if (!options.page.empty())
-            writePage(options.page, modelPage(model, modelCheck));
+            writePage(options.page, modelPage(model, modelCheck), *writer);
     } catch (const VT::Embedded::ModelError& error) {
         writer->problem({options.file, error.place().line, error.place().column, 0, 0, {}}, error.what());
     } catch (const std::runtime_error& error) {
@@ -95,9 +83,10 @@ SearchResult check(const CheckOptions& options, Console& console) {
 Command addCheck(CLI::App& program) {
     CLI::App* const command = program.add_subcommand("check", "Check the choices of a model against each other");
     const auto options = std::make_shared<CheckOptions>();
-    command->add_option("MODEL", options->file, "File of the model")->required()->type_name("");
-    command->add_option("--html", options->page, "Write a page that shows how the choices stand to each other")
+    addArgument(*command, "MODEL", options->file, "File of the model")->required();
+    addArgument(*command, "--html", options->page, "Write a page that shows how the choices stand to each other")
         ->type_name("FILE");
+    addSizeOption(*command, options->mostBytes);
     addFormOptions(*command, options->form);
     addBitsOption(*command, options->bits32);
     command->footer(examples);

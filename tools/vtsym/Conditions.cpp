@@ -47,6 +47,47 @@ VT::SymbolicExprId Conditions::simplify(const TextOptions& options, const std::s
     return (options.fromQuill() ? service().simplifyFromQCondition(text) : service().simplifyFromCCondition(text)).id();
 }
 
+VT::SymbolicExprId Conditions::inAnswerShape(const TextOptions& options, VT::SymbolicExprId condition) const {
+    VT::SymbolicExprTable& table = service().table();
+    if (!options.toQuill())
+        return VT::SymbolicExprQ2C(table)(condition);
+    return options.fromQuill() ? condition : VT::SymbolicExprC2Q(table)(condition);
+}
+
+VT::SymbolicExprId Conditions::shortest(const TextOptions& options, VT::SymbolicExprId condition,
+                                        std::vector<VT::ShortForm>* forms) const {
+    const VT::SymbolicExprId given = inAnswerShape(options, condition);
+    return notLonger(options, service().shortestCondition(given, options.toQuill(), forms).id(), given);
+}
+
+VT::SymbolicExprId Conditions::shortestGiven(const TextOptions& options, VT::SymbolicExprId condition,
+                                             VT::SymbolicExprId known) const {
+    const VT::SymbolicExprId given = inAnswerShape(options, condition);
+    const VT::SymbolicExprId context = inAnswerShape(options, known);
+    return notLonger(options, service().getImpliedCondition(given, context, options.toQuill()).id(), given);
+}
+
+/// A shorter form, unless the brackets that directives have of their own make it longer.
+VT::SymbolicExprId Conditions::notLonger(const TextOptions& options, VT::SymbolicExprId result,
+                                         VT::SymbolicExprId condition) const {
+    const VT::SymbolicExprTable& table = service().table();
+    const bool isTruth = result == table.getIdTRUE() || result == table.getIdFALSE();
+    const bool grew =
+        options.toDirective() && !isTruth && print(options, result).size() > print(options, condition).size();
+    return grew ? condition : result;
+}
+
+std::string Conditions::printShortest(const TextOptions& options, VT::SymbolicExprId shortest,
+                                      VT::SymbolicExprId condition) const {
+    std::string text = print(options, shortest);
+    const VT::SymbolicExprTable& table = service().table();
+    const bool holds = shortest == table.getIdTRUE();
+    const bool isTruth = holds || shortest == table.getIdFALSE();
+    if (isTruth && text.size() > print(options, inAnswerShape(options, condition)).size())
+        text = holds ? "1" : "0";
+    return text;
+}
+
 std::vector<std::string> Conditions::symbols(VT::SymbolicExprId condition, const VT::VCSymbolTypes& kinds) const {
     std::vector<std::string> all;
     service().getSymbolsFromExpression(condition, all, kinds);

@@ -90,7 +90,8 @@ void Console::words(std::string_view lines) {
     flush();
     const std::lock_guard lock(mutex_);
     eraseProgress();
-    writeAll(STDERR_FILENO, lines); // nobody is left to be told when that fails
+    const int error = writeAll(STDERR_FILENO, lines); // nobody is left to be told, but for the exit status
+    wordsLost_ = wordsLost_ || (error != 0 && error != EBADF);
 }
 
 void Console::working(std::uint64_t line) {

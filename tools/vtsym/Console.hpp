@@ -60,6 +60,10 @@ public:
     void flush();
     /// Writes whole lines to standard error, behind the data before them.
     void words(std::string_view lines);
+
+    /// Whether standard error did not take all of them; one that is closed is not meant to.
+    [[nodiscard]] bool wordsLost() const noexcept { return wordsLost_; }
+
     /// Tells the progress line that the work on a line of input begins, or that there is none while the program waits.
     void working(std::uint64_t line);
     void waiting();
@@ -76,6 +80,7 @@ private:
     Style wordStyle_;
     bool dataToTerminal_;
     bool wordsToTerminal_;
+    bool wordsLost_ = false;
     std::string buffer_;
 
     std::mutex mutex_; ///< of what follows, and of standard error

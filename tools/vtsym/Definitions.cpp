@@ -1,6 +1,7 @@
 #include "tools/vtsym/Definitions.hpp"
 
 #include "base/core/Nodes.hpp"
+#include "tools/vtsym/Arguments.hpp"
 #include "tools/vtsym/ErrorText.hpp"
 
 namespace vtsym {
@@ -11,7 +12,7 @@ namespace {
 Definition definitionOf(const std::string& assignment) {
     const std::size_t equals = assignment.find('=');
     if (equals == std::string::npos || equals == 0)
-        throw CLI::ValidationError("-D", "'" + assignment + "' is not NAME=VALUE");
+        throw CLI::ValidationError("-D", quotedArgument(assignment) + " is not NAME=VALUE");
     return {assignment.substr(0, equals), assignment.substr(equals + 1)};
 }
 
@@ -26,30 +27,28 @@ VT::SymbolicExprId readSide(const ReadExpression& read, const std::string& text,
 } // namespace
 
 void addDefinitions(CLI::App& command, Definitions& definitions) {
-    command
-        .add_option_function<std::vector<std::string>>(
-            "-D",
-            [&definitions](const std::vector<std::string>& assignments) {
-                for (const std::string& assignment : assignments)
-                    definitions.push_back(definitionOf(assignment));
-            },
-            "Give a symbol, or a member such as A.B, a value, which is an expression in the language of the texts")
-        ->allow_extra_args(false)
-        ->multi_option_policy(CLI::MultiOptionPolicy::TakeAll)
+    const auto take = [&definitions](const std::vector<std::string>& assignments) {
+        for (const std::string& assignment : assignments)
+            definitions.push_back(definitionOf(assignment));
+    };
+    addArguments(command, "-D", take,
+                 "Give a symbol, or a member such as A.B, a value, which is an expression in the language of the texts")
         ->type_name("NAME=VALUE");
 }
 
 void bindDefinitions(VT::SymbolicExprTable& table, const Definitions& definitions, const ReadExpression& read) {
     for (const Definition& definition : definitions) {
-        const VT::SymbolicExprId name = readSide(read, definition.name, "the name '" + definition.name + "'");
+        const VT::SymbolicExprId name = readSide(read, definition.name, "the name " + quotedArgument(definition.name));
         const VT::SymbolicExpr* const node = table.get(name);
         const bool isSymbol =
             node != nullptr && (node->op() == VT::SymbolicOp::String || node->op() == VT::SymbolicOp::MemberValue);
         if (!isSymbol || name == table.getIdTRUE() || name == table.getIdFALSE())
-            throw CLI::ValidationError("-D", "'" + definition.name + "' is no name that can be given a value");
+            throw CLI::ValidationError("-D",
+                                       quotedArgument(definition.name) + " is not a name that can be given a value");
         if (definition.value.empty())
-            throw CLI::ValidationError("-D", "'" + definition.name + "=' gives no value");
-        table.registerValueId(name, readSide(read, definition.value, "the value of " + definition.name));
+            throw CLI::ValidationError("-D", quotedArgument(definition.name + "=") + " gives no value");
+        table.registerValueId(name,
+                              readSide(read, definition.value, "the value of " + quotedArgument(definition.name)));
     }
 }
 

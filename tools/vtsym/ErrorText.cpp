@@ -5,7 +5,6 @@
 #include "tools/vtsym/Json.hpp"
 
 #include <algorithm>
-#include <limits>
 #include <new>
 
 namespace vtsym {
@@ -28,24 +27,24 @@ std::size_t characterAt(std::string_view text, std::size_t offset) {
     return begin < text.size() && continuesCharacter(text[begin]) ? offset : begin;
 }
 
-std::string shown(std::string_view text) {
-    return VT::shownText(text, std::numeric_limits<std::size_t>::max());
-}
-
 } // namespace
 
-TextError currentTextError() {
+std::vector<TextError> currentTextErrors() {
     try {
         throw;
     } catch (const VT::HostDiagnostic& diagnostic) {
-        return {diagnostic.messageId(), diagnostic.what(), diagnostic.offset()};
+        return {{diagnostic.messageId(), diagnostic.what(), diagnostic.offset()}};
     } catch (const CommandError& error) {
-        return error.error();
+        return error.errors();
     } catch (const std::length_error&) {
-        return {"vtsym:TextTooLong", "The answer is longer than a text may be.", std::nullopt};
+        return {{"vtsym:TextTooLong", "The answer is longer than a text may be.", std::nullopt}};
     } catch (const std::bad_alloc&) {
-        return {"vtsym:OutOfMemory", "There is not enough memory for the answer.", std::nullopt};
+        return {{"vtsym:OutOfMemory", "There is not enough memory for the answer.", std::nullopt}};
     }
+}
+
+TextError currentTextError() {
+    return currentTextErrors().front();
 }
 
 std::string withCaret(std::string_view text, std::size_t offset, const Style& style) {
@@ -53,8 +52,8 @@ std::string withCaret(std::string_view text, std::size_t offset, const Style& st
     const std::size_t begin = characterAt(text, offset > shownBefore ? offset - shownBefore : 0);
     const std::size_t end = characterAt(text, std::min(text.size() - offset, shownBehind) + offset);
     std::string before = begin > 0 ? "..." : "";
-    before += shown(text.substr(begin, offset - begin));
-    std::string behind = shown(text.substr(offset, end - offset));
+    before += VT::shownText(text.substr(begin, offset - begin));
+    std::string behind = VT::shownText(text.substr(offset, end - offset));
     if (end < text.size())
         behind += "...";
     const auto columns = std::ranges::count_if(before, [](char byte) { return !continuesCharacter(byte); });
@@ -66,23 +65,36 @@ std::string withCaret(std::string_view text, std::size_t offset, const Style& st
 std::string errorText(std::string_view text, const TextError& error, const Style& style) {
     std::string lines = error.message + "\n";
     if (error.offset)
-        lines += withCaret(text, *error.offset, style);
+        lines += withCaret(text.substr(error.begin, error.end - error.begin), *error.offset - error.begin, style);
     return lines;
 }
 
-std::string errorLines(std::uint64_t line, std::string_view text, const TextError& error, const Style& style) {
-    return style.strong("line " + std::to_string(line) + ":") + " " + errorText(text, error, style);
+std::string errorLines(std::uint64_t line, std::string_view text, std::span<const TextError> errors,
+                       const Style& style) {
+    std::string lines;
+    for (const TextError& error : errors)
+        lines += style.strong("line " + std::to_string(line) + ":") + " " + errorText(text, error, style);
+    return lines;
 }
 
 std::string warningLine(std::uint64_t line, std::string_view warning, const Style& style) {
     return style.strong("line " + std::to_string(line) + ":").append(" warning: ").append(warning).append("\n");
 }
 
-std::string jsonOf(const TextError& error) {
-    std::string json = "{\"id\":" + jsonString(error.id);
-    appendMember(json, "message", jsonString(error.message));
-    if (error.offset)
-        appendMember(json, "offset", std::to_string(*error.offset));
+std::string jsonOf(std::span<const TextError> errors) {
+    const auto members = [](const TextError& error) {
+        std::string json = "{\"id\":" + jsonString(error.id);
+        appendMember(json, "message", jsonString(error.message));
+        if (error.offset)
+            appendMember(json, "offset", std::to_string(*error.offset));
+        return json;
+    };
+    std::string further;
+    for (const TextError& error : errors.subspan(1))
+        further.append(further.empty() ? "" : ",").append(members(error)).append("}");
+    std::string json = members(errors.front());
+    if (!further.empty())
+        appendMember(json, "further", "[" + further + "]");
     return json + "}";
 }
 

@@ -1,5 +1,6 @@
 // vtsym eval
 #include "base/eval/Eval.hpp"
+#include "base/transform/DimensionLists.hpp"
 #include "tools/vtsym/Commands.hpp"
 #include "tools/vtsym/Conditions.hpp"
 #include "tools/vtsym/Definitions.hpp"
@@ -37,19 +38,23 @@ public:
 private:
     [[nodiscard]] VT::SymbolicExprTable& table() const { return conditions_.service().table(); }
 
+    /// Quill writes a list as a matrix.
+    [[nodiscard]] VT::SymbolicExprId read(const std::string& text) const {
+        return VT::SymbolicExprDimensionLists(table())(conditions_.parse(options_, text));
+    }
+
     const EvalOptions& options_;
     Conditions conditions_;
 };
 
 void Evaluator::define() {
-    bindDefinitions(table(), options_.definitions,
-                    [this](const std::string& text) { return conditions_.parse(options_, text); });
+    bindDefinitions(table(), options_.definitions, [this](const std::string& text) { return read(text); });
 }
 
 void Evaluator::answer(const std::string& text, std::string& out) {
     if (conditions_.makeRoomFor(text))
         define();
-    const VT::SymbolicValue value = VT::SymbolicExprEval(table()).eval(conditions_.parse(options_, text));
+    const VT::SymbolicValue value = VT::SymbolicExprEval(table()).eval(read(text));
     if (options_.json) {
         appendMember(out, "type", jsonString(typeText(value)));
         appendMember(out, "value", valueText(value, true));

@@ -35,6 +35,10 @@ private:
     std::vector<VT::RuleFiring>& firings_;
 };
 
+std::string counted(std::uint64_t count, const char* what) {
+    return std::to_string(count) + " " + what + (count == 1 ? "" : "s");
+}
+
 } // namespace
 
 Explanation::Explanation(const Conditions& conditions, const TextOptions& options, VT::SymbolicExprId condition,
@@ -47,7 +51,15 @@ Explanation::Explanation(const Conditions& conditions, const TextOptions& option
     if (withRules)
         listener.emplace(simplifier, firings_);
     result_ = simplifier.simplify(condition, passes_);
-    proven_ = result_;
+}
+
+void Explanation::shorten() {
+    shortest_ = conditions_.shortest(options_, condition_, &forms_);
+}
+
+std::string Explanation::resultText() const {
+    return shortest_ ? conditions_.printShortest(options_, *shortest_, condition_)
+                     : conditions_.print(options_, result_);
 }
 
 /// A condition on the way; the beginning of a long one.
@@ -65,9 +77,29 @@ void Explanation::appendText(const Style& style, std::string& out) const {
         out.append("  no rule applies\n");
     else if (result_ == condition_)
         out.append("  what this leads to is longer or beyond a limit, so the condition stays\n");
-    if (proven_ != result_)
-        out.append("proven equal  ").append(step(result_)).append(style.faint("  =>  ")).append(step(proven_)) += '\n';
-    out.append("= ").append(style.good(conditions_.print(options_, proven_)));
+    if (shortest_)
+        appendForms(style, out);
+    out.append("= ").append(style.good(resultText()));
+}
+
+/// What the rules lead to, and the forms that were looked at instead, the shortest first.
+void Explanation::appendForms(const Style& style, std::string& out) const {
+    if (result_ != condition_)
+        out.append(style.faint("normal form")).append("\n  ").append(step(result_)) += '\n';
+    if (!forms_.empty())
+        out.append(style.faint("shortest form")) += '\n';
+    std::size_t width = 0;
+    for (const VT::ShortForm& form : forms_)
+        width = std::max(width, form.way.size());
+    for (const VT::ShortForm& form : forms_) {
+        out.append("  ").append(style.name(form.way)).append(width - form.way.size() + 2, ' ').append(step(form.form));
+        out.append(style.faint("  " + counted(form.comparisons, "comparison") + ", " + counted(form.bytes, "byte") +
+                               (form.chosen ? ", proven equal" : "")));
+        out += '\n';
+    }
+    const bool isChosen = std::ranges::any_of(forms_, &VT::ShortForm::chosen);
+    if (!isChosen && *shortest_ != result_)
+        out.append("  nothing shorter is proven, so the condition stays\n");
 }
 
 void Explanation::appendSteps(const Style& style, std::string& out) const {
@@ -95,10 +127,12 @@ std::string Explanation::json() const {
         appendMember(steps, "after", jsonString(step(firing.after)));
         steps.append("}");
     }
-    if (proven_ != result_) {
-        steps.append(steps.empty() ? R"({"rule":"proven equal")" : R"(,{"rule":"proven equal")");
-        appendMember(steps, "before", jsonString(step(result_)));
-        appendMember(steps, "after", jsonString(step(proven_)));
+    for (const VT::ShortForm& form : forms_) {
+        steps.append(steps.empty() ? "{" : ",{").append(R"("form":)").append(jsonString(step(form.form)));
+        appendMember(steps, "way", jsonString(std::string(form.way)));
+        appendMember(steps, "comparisons", std::to_string(form.comparisons));
+        appendMember(steps, "bytes", std::to_string(form.bytes));
+        appendMember(steps, "chosen", form.chosen ? "true" : "false");
         steps.append("}");
     }
     return "[" + steps + "]";

@@ -1,5 +1,6 @@
 #include "tools/vtsym/Findings.hpp"
 
+#include "host/Text.hpp"
 #include "tools/vtsym/Json.hpp"
 
 #include <algorithm>
@@ -8,22 +9,8 @@ namespace vtsym {
 
 namespace {
 
-/// Control characters as \xNN, so that a finding stays on its line and a terminal takes no orders from a file.
-std::string shown(std::string_view text) {
-    static constexpr char digits[] = "0123456789abcdef";
-    std::string result;
-    for (const char c : text) {
-        const auto byte = static_cast<unsigned char>(c);
-        if (byte < 0x20 || byte == 0x7f)
-            result.append("\\x").append({digits[byte >> 4U], digits[byte & 15U]});
-        else
-            result.push_back(c);
-    }
-    return result;
-}
-
 std::string placeText(const Place& place) {
-    std::string text = shown(place.file);
+    std::string text = VT::shownText(place.file);
     if (place.line != 0)
         text.append(":").append(std::to_string(place.line));
     return text;
@@ -35,8 +22,8 @@ public:
 
 private:
     void add(const Finding& finding) override {
-        console().data(console().dataStyle().strong(placeText(finding.place) + ":") + " " + shown(finding.message) +
-                       "\n");
+        console().data(console().dataStyle().strong(placeText(finding.place) + ":") + " " +
+                       VT::shownText(finding.message) + "\n");
     }
 };
 
@@ -98,8 +85,10 @@ public:
 
 private:
     void add(const Finding& finding) override;
-    void addProblem(const Place& place, const std::string& sentence, bool fails) override;
+    void addProblem(const Place& place, const std::string& sentence) override;
+    void addNote(const std::string& sentence) override;
     void end() override;
+    void addNotification(std::string_view level, const std::string& sentence, const std::string& further);
 
     std::span<const FindingRule> rules_;
     std::string notifications_;
@@ -182,13 +171,20 @@ void SarifWriter::add(const Finding& finding) {
     console().data(out + "}");
 }
 
-void SarifWriter::addProblem(const Place& place, const std::string& sentence, bool fails) {
-    successful_ = successful_ && !fails;
-    notifications_.append(notifications_.empty() ? "\n{" : ",\n{").append("\"level\":");
-    notifications_.append(fails ? "\"error\"" : "\"note\"");
+void SarifWriter::addProblem(const Place& place, const std::string& sentence) {
+    successful_ = false;
+    addNotification("error", sentence, ",\"locations\":[" + jsonLocation(place) + "]");
+}
+
+void SarifWriter::addNote(const std::string& sentence) {
+    addNotification("note", sentence, {});
+}
+
+/// `further` are members beside the level and the message.
+void SarifWriter::addNotification(std::string_view level, const std::string& sentence, const std::string& further) {
+    notifications_.append(notifications_.empty() ? "\n{" : ",\n{").append("\"level\":").append(jsonString(level));
     appendMember(notifications_, "message", jsonMessage(sentence));
-    appendMember(notifications_, "locations", "[" + jsonLocation(place) + "]");
-    notifications_.push_back('}');
+    notifications_.append(further).append("}");
 }
 
 void SarifWriter::end() {
@@ -207,17 +203,14 @@ void FindingWriter::write(const Finding& finding) {
 }
 
 void FindingWriter::problem(const Place& place, const std::string& sentence) {
-    tell(place, sentence, true);
+    console_.words("vtsym: " + placeText(place) + ": " + VT::shownText(sentence) + "\n");
+    addProblem(place, sentence);
+    failed_ = true;
 }
 
-void FindingWriter::note(const Place& place, const std::string& sentence) {
-    tell(place, sentence, false);
-}
-
-void FindingWriter::tell(const Place& place, const std::string& sentence, bool fails) {
-    console_.words("vtsym: " + placeText(place) + ": " + shown(sentence) + "\n");
-    addProblem(place, sentence, fails);
-    failed_ = failed_ || fails;
+void FindingWriter::note(const std::string& sentence) {
+    console_.words("vtsym: " + VT::shownText(sentence) + "\n");
+    addNote(sentence);
 }
 
 SearchResult FindingWriter::finish() {

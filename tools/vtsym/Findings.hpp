@@ -67,14 +67,17 @@ public:
     virtual ~FindingWriter() = default;
 
     void write(const Finding& finding);
-    /// Tells on standard error that something could not be searched, or not to its end.
+    /// Tells on standard error that something could not be searched, or not to its end: the search fails.
     void problem(const Place& place, const std::string& sentence);
-    /// The same where the search is none the worse for it: it does not fail.
-    void note(const Place& place, const std::string& sentence);
+    /// Tells on standard error something about the whole search, which does not fail.
+    void note(const std::string& sentence);
     /// Ends the output: nothing may follow.  What the search ends with.
     SearchResult finish();
 
     [[nodiscard]] std::uint64_t found() const noexcept { return found_; }
+
+    /// Whether a problem was told.
+    [[nodiscard]] bool failed() const noexcept { return failed_; }
 
 protected:
     explicit FindingWriter(Console& console) : console_(console) {}
@@ -84,11 +87,11 @@ protected:
 private:
     virtual void add(const Finding& finding) = 0;
 
-    virtual void addProblem(const Place&, const std::string&, bool /*fails*/) {}
+    virtual void addProblem(const Place&, const std::string&) {}
+
+    virtual void addNote(const std::string&) {}
 
     virtual void end() {}
-
-    void tell(const Place& place, const std::string& sentence, bool fails);
 
     Console& console_;
     std::uint64_t found_ = 0;

@@ -29,8 +29,7 @@ Command addGiven(CLI::App& program) {
                 const auto answer = [&](const std::string& text, std::string& out) {
                     conditions.makeRoomFor(text);
                     const ConditionPair pair = readPair(conditions, *options, text);
-                    const VT::SymbolicExprId result =
-                        conditions.service().getImpliedCondition(pair.second, pair.first).id();
+                    const VT::SymbolicExprId result = conditions.shortestGiven(*options, pair.second, pair.first);
                     const std::string printed = conditions.print(*options, result);
                     warnings = conditions.warnings(*options, result);
                     if (!options->json) {

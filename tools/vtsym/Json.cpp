@@ -1,15 +1,55 @@
 #include "tools/vtsym/Json.hpp"
 
 #include "host/Numbers.hpp"
+#include "host/Text.hpp"
 
+#include <array>
 #include <cmath>
+#include <cstdio>
 #include <nlohmann/json.hpp>
 
 namespace vtsym {
 
+namespace {
+
+/// Takes the character at the front of a text that is UTF-8.
+char32_t takeCharacter(std::string_view& text) {
+    const auto byte = [&text](std::size_t at) { return static_cast<unsigned char>(text[at]); };
+    const std::size_t length = byte(0) < 0x80 ? 1 : byte(0) < 0xe0 ? 2 : byte(0) < 0xf0 ? 3 : 4;
+    char32_t point = length == 1 ? byte(0) : byte(0) & (0x7fU >> length);
+    for (std::size_t at = 1; at < length; ++at)
+        point = point << 6U | (byte(at) & 0x3fU);
+    text.remove_prefix(length);
+    return point;
+}
+
+void appendEscaped(std::string& json, char32_t point) {
+    const auto append = [&json](unsigned unit) {
+        std::array<char, 8> digits{};
+        std::snprintf(digits.data(), digits.size(), "\\u%04x", unit);
+        json.append(digits.data());
+    };
+    if (point > 0xffff)
+        append(0xd800U + ((point - 0x10000U) >> 10U));
+    append(point > 0xffff ? 0xdc00U + (point & 0x3ffU) : point);
+}
+
+} // namespace
+
 std::string jsonString(std::string_view text) {
     using Json = nlohmann::json;
-    return Json(text).dump(-1, ' ', false, Json::error_handler_t::replace);
+    const std::string json = Json(text).dump(-1, ' ', false, Json::error_handler_t::replace);
+    std::string shown;
+    shown.reserve(json.size());
+    for (std::string_view rest = json; !rest.empty();) {
+        if (const std::size_t plain = VT::plainCharacter(rest); plain > 0) {
+            shown.append(rest.substr(0, plain));
+            rest.remove_prefix(plain);
+        } else {
+            appendEscaped(shown, takeCharacter(rest));
+        }
+    }
+    return shown;
 }
 
 std::string jsonNumber(double value) {

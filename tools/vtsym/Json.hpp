@@ -6,7 +6,8 @@
 
 namespace vtsym {
 
-/// A text as a JSON string; bytes that are no UTF-8 become U+FFFD.
+/// A text as a JSON string.  What a terminal would not show as a character is written as \uNNNN; bytes that are not
+/// UTF-8 become U+FFFD.
 std::string jsonString(std::string_view text);
 
 /// A number; infinities and NaN, which JSON has not, become the texts "Infinity", "-Infinity" and "NaN".

@@ -48,9 +48,11 @@ std::string counted(std::size_t count, const std::string& noun) {
     return std::to_string(count) + " " + noun + (count == 1 ? "" : "s");
 }
 
-std::string cell(const std::string& kind, const std::string& mark, const std::string& tip) {
-    return "<span class=\"cell " + kind + "\" tabindex=\"0\" role=\"img\" title=\"" + escaped(tip) + "\">" + mark +
-           "</span>";
+/// A cell with a tip of one line or two.
+std::string cell(const std::string& kind, const std::string& mark, const std::string& tip,
+                 const std::string& second = {}) {
+    const std::string title = escaped(tip) + (second.empty() ? "" : "&#10;" + escaped(second));
+    return "<span class=\"cell " + kind + "\" tabindex=\"0\" role=\"img\" title=\"" + title + "\">" + mark + "</span>";
 }
 
 /// One choice set.
@@ -123,13 +125,13 @@ std::string SetPage::pairCell(std::size_t row, std::size_t column) const {
     const bool columnCovered = row == pair.first ? finding.secondCovered : finding.firstCovered;
     const std::string tip = names + " are both active for " + check_.witnessText(finding.witness);
     if (rowCovered && columnCovered)
-        return cell("covered", "=", tip + "\nNeither is ever active without the other.");
+        return cell("covered", "=", tip, "Neither is ever active without the other.");
     if (rowCovered)
-        return cell("covered", "&#8834;",
-                    tip + "\n" + choice(row).name() + " is never active without " + choice(column).name() + ".");
+        return cell("covered", "&#8834;", tip,
+                    choice(row).name() + " is never active without " + choice(column).name() + ".");
     if (columnCovered)
-        return cell("covered", "&#8835;",
-                    tip + "\n" + choice(column).name() + " is never active without " + choice(row).name() + ".");
+        return cell("covered", "&#8835;", tip,
+                    choice(column).name() + " is never active without " + choice(row).name() + ".");
     return cell("overlap", "&#8745;", tip);
 }
 

@@ -1,6 +1,7 @@
 #include "tools/vtsym/Pairs.hpp"
 
 #include "host/Diagnostics.hpp"
+#include "tools/vtsym/Arguments.hpp"
 #include "tools/vtsym/ErrorText.hpp"
 #include "tools/vtsym/Json.hpp"
 
@@ -10,12 +11,19 @@ namespace vtsym {
 
 namespace {
 
-VT::SymbolicExprId readPart(const Conditions& conditions, const TextOptions& options, const std::string& text,
-                            std::size_t begin) {
+/// Reads the part of a text from begin to end; keeps the error where it cannot be read.
+VT::SymbolicExprId readPart(const Conditions& conditions, const TextOptions& options, const std::string& part,
+                            std::size_t begin, std::vector<TextError>& errors) {
     try {
-        return conditions.parse(options, text);
+        return conditions.parse(options, part);
     } catch (const VT::HostDiagnostic&) {
-        throw CommandError(currentTextError(), begin);
+        TextError error = currentTextError();
+        if (error.offset)
+            *error.offset += begin;
+        error.begin = begin;
+        error.end = begin + part.size();
+        errors.push_back(std::move(error));
+        return VT::invalidId;
     }
 }
 
@@ -26,24 +34,23 @@ std::string nameOf(const Conditions& conditions, const TextOptions& options, VT:
 
 /// Makes one text of two arguments, in which a tab is a blank like any other.
 void joinArguments(PairOptions& options) {
-    if (options.first.empty() || (options.first == "-" && options.second.empty()))
+    if (!options.first || (options.first == "-" && !options.second))
         return;
-    if (options.second.empty())
+    if (!options.second)
         throw CLI::ValidationError("two conditions are needed; the one that always holds is true");
-    std::ranges::replace(options.first, '\t', ' ');
-    std::ranges::replace(options.second, '\t', ' ');
-    options.texts = {options.first + "\t" + options.second};
+    std::ranges::replace(*options.first, '\t', ' ');
+    std::ranges::replace(*options.second, '\t', ' ');
+    options.texts = {*options.first + "\t" + *options.second};
 }
 
 } // namespace
 
 void addPairOptions(CLI::App& command, PairOptions& options, const std::string& first, const std::string& second) {
-    command
-        .add_option(first, options.first,
-                    "Two conditions; without any, or with -, every line of standard input is two, separated by a tab")
-        ->transform(withoutMark, "")
-        ->type_name("");
-    command.add_option(second, options.second)->transform(withoutMark, "")->type_name("");
+    addArgument(
+        command, first, [&options](const std::string& text) { options.first = text; },
+        "Two conditions; without any, or with -, every line of standard input is two, separated by a tab");
+    addArgument(
+        command, second, [&options](const std::string& text) { options.second = text; }, "");
     addSourceOption(command, options);
     command.add_flag("--json", options.json, "Answer with one JSON object per pair");
     addBitsOption(command, options.bits32);
@@ -55,8 +62,11 @@ ConditionPair readPair(const Conditions& conditions, const TextOptions& options,
     if (tab == std::string::npos || text.find('\t', tab + 1) != std::string::npos)
         throw CommandError("Two conditions are separated by one tab.");
     ConditionPair pair{text.substr(0, tab), text.substr(tab + 1), VT::invalidId, VT::invalidId};
-    pair.first = readPart(conditions, options, pair.firstText, 0);
-    pair.second = readPart(conditions, options, pair.secondText, tab + 1);
+    std::vector<TextError> errors;
+    pair.first = readPart(conditions, options, pair.firstText, 0, errors);
+    pair.second = readPart(conditions, options, pair.secondText, tab + 1, errors);
+    if (!errors.empty())
+        throw CommandError(std::move(errors));
     return pair;
 }
 

@@ -1,6 +1,7 @@
 // vtsym pp
 #include "base/print/StringifyImpliedCondition.hpp"
 #include "base/transform/QuillConversion.hpp"
+#include "tools/vtsym/Arguments.hpp"
 #include "tools/vtsym/Commands.hpp"
 #include "tools/vtsym/Conditions.hpp"
 #include "tools/vtsym/ErrorText.hpp"
@@ -75,8 +76,7 @@ Command addPreprocess(CLI::App& program) {
     const auto options = std::make_shared<PreprocessOptions>();
     options->to = "pp";
     addTextOptions(*command, *options);
-    command->add_option("--given", options->given, "A condition that is known to hold; what it decides is left out")
-        ->transform(withoutMark, "")
+    addArgument(*command, "--given", options->given, "A condition that is known to hold; what it decides is left out")
         ->type_name("CONDITION");
     command->footer(examples);
     return {command, [options](Console& console) {

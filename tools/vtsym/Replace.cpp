@@ -1,4 +1,5 @@
 // vtsym replace
+#include "tools/vtsym/Arguments.hpp"
 #include "tools/vtsym/Commands.hpp"
 #include "tools/vtsym/Conditions.hpp"
 #include "tools/vtsym/Json.hpp"
@@ -31,7 +32,7 @@ Names takeNames(std::vector<std::string>& arguments) {
             break;
         const std::string name = next->substr(0, equals);
         if (!names.emplace(name, next->substr(equals + 1)).second)
-            throw CLI::ValidationError("replace", "'" + name + "' is replaced twice");
+            throw CLI::ValidationError("replace", quotedArgument(name) + " is replaced twice");
     }
     if (names.empty())
         throw CLI::ValidationError("replace", "a replacement NAME=NAME is missing before the texts");

@@ -1,10 +1,14 @@
 // vtsym scan
 #include "base/scan/SourceScan.hpp"
+#include "host/Text.hpp"
+#include "tools/vtsym/Arguments.hpp"
 #include "tools/vtsym/Commands.hpp"
+#include "tools/vtsym/Files.hpp"
 #include "tools/vtsym/Findings.hpp"
 #include "tools/vtsym/SourceFiles.hpp"
 
 #include <array>
+#include <utility>
 
 namespace vtsym {
 
@@ -16,7 +20,7 @@ it in its chain, and tells which branches are never entered, which are always en
 shorter text.  Directories are searched for C and C++ files.  A macro that a file defines or undefines on the way is
 another one behind; an included file may define what is not defined.  #if 0 and #if 1 are left alone.
 
-Exit status: 0 nothing was found, 1 something was, 2 nothing could be read.
+Exit status: 0 nothing was found, 1 something was, 2 a path could not be read, whatever was found in others.
 
 Examples:
   vtsym scan src include
@@ -36,6 +40,7 @@ constexpr auto rules = std::to_array<FindingRule>({
 
 struct ScanOptions {
     std::vector<std::string> paths;
+    std::size_t mostBytes = vtsym::mostBytes;
     bool strictIncludes = false;
     bool summary = false;
     FindingForm form = FindingForm::Compiler;
@@ -85,7 +90,7 @@ Finding findingOf(const std::string& file, const VT::BranchFinding& found) {
         finding.proposed = found.proposed;
     for (const VT::BranchReason& reason : found.reasons)
         finding.follows.push_back({placeOf(file, reason.region), reason.directive});
-    if (found.replaced)
+    if (found.replaced && VT::shownText(found.replacement) == found.replacement) // logs hold UTF-8 alone
         finding.fix = Fix{"Write the condition that is left.", placeOf(file, *found.replaced), found.replacement};
     return finding;
 }
@@ -93,20 +98,26 @@ Finding findingOf(const std::string& file, const VT::BranchFinding& found) {
 SearchResult scan(const ScanOptions& options, Console& console) {
     const auto writer = makeFindingWriter(options.form, console, rules);
     const FileProblem problem = [&](const std::string& path, const std::string& sentence) {
-        writer->note(placeOf(path, {}), sentence);
+        writer->problem(placeOf(path, {}), sentence);
     };
     VT::SourceScanner scanner({.strictIncludes = options.strictIncludes});
     std::uint64_t files = 0;
     for (const std::string& path : sourceFiles(options.paths, problem)) {
-        const auto text = readSource(path, problem);
-        if (!text)
+        std::string text;
+        try {
+            text = readFile(path, options.mostBytes);
+        } catch (const FileError& error) {
+            problem(path, error.what());
             continue;
+        }
         ++files;
-        scanner.scan(*text, isCppPath(path),
+        scanner.scan(text, isCppPath(path),
                      [&](const VT::BranchFinding& found) { writer->write(findingOf(path, found)); });
     }
-    if (files == 0)
-        writer->problem(placeOf(options.paths.front(), {}), "no C or C++ file could be read");
+    if (files == 0 && !writer->failed())
+        problem(options.paths.front(), "there is no C or C++ file");
+    if (const std::uint64_t undecided = scanner.counts().undecided; undecided > 0)
+        writer->note(std::to_string(undecided) + " decisions were given up: what depends on them is not reported");
     const SearchResult result = writer->finish();
     if (options.summary) {
         const VT::SourceScanCounts& counts = scanner.counts();
@@ -123,8 +134,10 @@ Command addScan(CLI::App& program) {
     CLI::App* const command =
         program.add_subcommand("scan", "Find dead, redundant and shortenable preprocessor conditions in C and C++");
     const auto options = std::make_shared<ScanOptions>();
-    command->add_option("PATH", options->paths, "Files and directories")->required()->type_name("");
+    const auto take = [options](std::vector<std::string> paths) { options->paths = std::move(paths); };
+    addArguments(*command, "PATH", take, "Files and directories")->required();
     addFormOptions(*command, options->form);
+    addSizeOption(*command, options->mostBytes);
     command->add_flag("--strict-includes", options->strictIncludes, "Take it that an included file changes any macro");
     command->add_flag("--summary", options->summary, "Tell on standard error how much was read");
     command->footer(examples);

@@ -2,6 +2,7 @@
 
 #include "base/core/Nodes.hpp"
 #include "host/Diagnostics.hpp"
+#include "host/Text.hpp"
 #include "tools/vtsym/ErrorText.hpp"
 #include "tools/vtsym/Explanation.hpp"
 #include "tools/vtsym/TreeWriters.hpp"
@@ -13,6 +14,7 @@ namespace vtsym {
 namespace {
 
 constexpr const char* lastResult = "ans";
+constexpr std::size_t shownBytes = 80; ///< of a word
 
 std::string_view trimmed(std::string_view text) {
     constexpr const char* blanks = " \t\r";
@@ -40,7 +42,7 @@ const Session::CommandRow Session::commands[] = {
      [](Session& session, std::string_view text, std::string& out) { session.showDirective(text, out); }},
     {":tree", "[TEXT]", "draw as a tree",
      [](Session& session, std::string_view text, std::string& out) { session.showTree(text, out); }},
-    {":explain", "[TEXT]", "show the rules that simplify it",
+    {":explain", "[TEXT]", "show how it is simplified",
      [](Session& session, std::string_view text, std::string& out) { session.explain(text, out); }},
     {":symbols", "[TEXT]", "list its symbols",
      [](Session& session, std::string_view text, std::string& out) { session.listSymbols(text, out); }},
@@ -74,7 +76,7 @@ const Session::CommandRow& Session::commandOf(std::string_view word) {
     for (const CommandRow& command : commands)
         if (word == command.word)
             return command;
-    throw CommandError("There is no command " + std::string(word) + "; :help lists them.");
+    throw CommandError("There is no command " + VT::shownText(word, shownBytes) + "; :help lists them.");
 }
 
 /// The condition of a part of the line.
@@ -107,9 +109,9 @@ VT::SymbolicExprId Session::subject(std::string_view text) {
 }
 
 void Session::show(std::string_view text, TextOptions options, std::string& out) {
-    const VT::SymbolicExprId result =
-        conditions_.service().simplify(VT::VCSymbolicExprId(subject(text)), options_.fromQuill()).id();
-    out.append(style_.good(conditions_.print(options, result)));
+    const VT::SymbolicExprId condition = subject(text);
+    const VT::SymbolicExprId result = conditions_.shortest(options, condition);
+    out.append(style_.good(conditions_.printShortest(options, result, condition)));
     keep(result);
 }
 
@@ -148,7 +150,8 @@ void Session::showTree(std::string_view text, std::string& out) {
 }
 
 void Session::explain(std::string_view text, std::string& out) {
-    const Explanation explanation(conditions_, options_, subject(text), true);
+    Explanation explanation(conditions_, options_, subject(text), true);
+    explanation.shorten();
     explanation.appendText(style_, out);
     keep(explanation.result());
 }
@@ -174,7 +177,7 @@ void Session::let(std::string_view assignment, std::string& out) {
 }
 
 void Session::help(std::string& out) const {
-    out.append("A condition is answered by its simplification, which is `ans` from then on.");
+    out.append("A condition is answered by its shortest form, which is `ans` from then on.");
     for (const CommandRow& command : commands) {
         std::string usage = std::string(command.word) + " " + command.argument;
         usage.resize(std::max<std::size_t>(usage.size(), 18), ' ');

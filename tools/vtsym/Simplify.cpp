@@ -11,17 +11,23 @@ namespace {
 
 constexpr const char* examples =
     R"(Conditions are over integers: every name stands for an integer, and what is not zero is true.
+Quotients of a condition are truncated, as in C; dimensions, such as N/2*2, divide exactly.
+
+The answer is the shortest form found that is proven equal: fewest comparisons, then fewest bytes, and never longer than
+the condition as printed.  With --normal-form it is the library's sum of products.  What is no condition, such as 2+3,
+is a number and stays one.
 
 Examples:
   vtsym simplify 'Mode == 1 && Mode == 2'
-  vtsym simplify --strong 'A<B && B<C && A<C'
+  vtsym simplify 'A<B && B<C && A<C'
   vtsym simplify --explain '!(A < 3) || A == 2'
+  vtsym simplify --normal-form '(A || B) && C'
   vtsym simplify --to quill 'a / b == 1 && x != 2'
   vtsym simplify --json < conditions.txt)";
 
 struct SimplifyOptions : TextOptions {
     bool explain = false;
-    bool strong = false;
+    bool normalForm = false;
     bool bits32 = false;
 };
 
@@ -37,7 +43,6 @@ public:
     [[nodiscard]] const std::vector<std::string>& warnings() const noexcept { return warnings_; }
 
 private:
-    [[nodiscard]] VT::SymbolicExprId strengthened(VT::SymbolicExprId result) const;
     VT::SymbolicExprId answerInDetail(const std::string& text, std::string& out) const;
 
     const SimplifyOptions& options_;
@@ -52,27 +57,25 @@ void Simplifier::answer(const std::string& text, std::string& out) {
     if (options_.json || options_.explain) {
         result = answerInDetail(text, out);
     } else {
-        result = strengthened(conditions_.simplify(options_, text));
-        out.append(conditions_.print(options_, result));
+        const VT::SymbolicExprId condition =
+            options_.normalForm ? conditions_.simplify(options_, text) : conditions_.parse(options_, text);
+        result = options_.normalForm ? condition : conditions_.shortest(options_, condition);
+        out.append(options_.normalForm ? conditions_.print(options_, result)
+                                       : conditions_.printShortest(options_, result, condition));
     }
     warnings_ = conditions_.warnings(options_, result);
-}
-
-/// With --strong: true, false or a shorter form that is proven equal, where there is one.
-VT::SymbolicExprId Simplifier::strengthened(VT::SymbolicExprId result) const {
-    VT::VCService& service = conditions_.service();
-    return options_.strong ? service.getImpliedCondition(result, service.table().getIdTRUE()).id() : result;
 }
 
 /// Past the service's caches, which know results only.
 VT::SymbolicExprId Simplifier::answerInDetail(const std::string& text, std::string& out) const {
     Explanation explanation(conditions_, options_, conditions_.parse(options_, text), options_.explain);
-    explanation.prove(strengthened(explanation.result()));
+    if (!options_.normalForm)
+        explanation.shorten();
     if (!options_.json) {
         explanation.appendText(style_, out);
         return explanation.result();
     }
-    appendMember(out, "result", jsonString(conditions_.print(options_, explanation.result())));
+    appendMember(out, "result", jsonString(explanation.resultText()));
     appendMember(out, "passes", std::to_string(explanation.passes()));
     if (options_.explain)
         appendMember(out, "steps", explanation.json());
@@ -86,9 +89,9 @@ Command addSimplify(CLI::App& program) {
     const auto options = std::make_shared<SimplifyOptions>();
     addTextOptions(*command, *options);
     addLanguageOption(*command, *options);
-    command->add_flag("--explain", options->explain, "Show the rules that fired, pass by pass");
-    command->add_flag("--strong", options->strong,
-                      "Then decide: answer true, false or a shorter condition where it is proven equal");
+    command->add_flag("--explain", options->explain,
+                      "Show the rules that fired, pass by pass, and how the shortest form was reached");
+    command->add_flag("--normal-form", options->normalForm, "Answer with the sum of products that the rules lead to");
     addBitsOption(*command, options->bits32);
     command->footer(examples);
     return {

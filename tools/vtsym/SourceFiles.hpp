@@ -2,7 +2,6 @@
 #pragma once
 
 #include <functional>
-#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -16,10 +15,8 @@ bool isCppPath(std::string_view path);
 using FileProblem = std::function<void(const std::string& path, const std::string& sentence)>;
 
 /// The files that paths stand for, each once, in the order of their names: a path to a file is that file, a path to a
-/// directory all C and C++ files below.  Symbolic links are followed where they are given, not below a directory.
+/// directory all C and C++ files below that are regular files.  Symbolic links are followed where they are given, not
+/// below a directory.
 std::vector<std::string> sourceFiles(const std::vector<std::string>& paths, const FileProblem& problem);
-
-/// What a file holds; nothing, and a problem, where it cannot be read or is no text.
-std::optional<std::string> readSource(const std::string& path, const FileProblem& problem);
 
 } // namespace vtsym

@@ -1,4 +1,5 @@
 // vtsym symbols
+#include "tools/vtsym/Arguments.hpp"
 #include "tools/vtsym/Commands.hpp"
 #include "tools/vtsym/Conditions.hpp"
 #include "tools/vtsym/Json.hpp"
@@ -6,6 +7,7 @@
 
 #include <algorithm>
 #include <array>
+#include <sstream>
 #include <utility>
 
 namespace vtsym {
@@ -40,6 +42,19 @@ std::vector<std::string> kindNames() {
     return names;
 }
 
+/// The words of lists with commas.
+std::vector<std::string> kindsIn(const std::vector<std::string>& lists) {
+    std::vector<std::string> kinds;
+    for (const std::string& list : lists) {
+        std::istringstream words(list + ",");
+        for (std::string word; std::getline(words, word, ',');) {
+            requireOneOf("--kinds", word, kindNames());
+            kinds.push_back(word);
+        }
+    }
+    return kinds;
+}
+
 VT::VCSymbolTypes kindsOf(const SymbolsOptions& options) {
     VT::VCSymbolTypes kinds;
     for (const auto& [word, kind] : kindWords)
@@ -54,12 +69,9 @@ Command addSymbols(CLI::App& program) {
     CLI::App* const command = program.add_subcommand("symbols", "List the symbols of conditions");
     const auto options = std::make_shared<SymbolsOptions>();
     addTextOptions(*command, *options);
-    command
-        ->add_option("--kinds", options->kinds,
-                     "Kinds to list, with commas between: identifiers, members, functions (the first two unless given)")
-        ->delimiter(',')
-        ->allow_extra_args(false)
-        ->check(oneOf(kindNames()))
+    const auto take = [options](const std::vector<std::string>& lists) { options->kinds = kindsIn(lists); };
+    addArguments(*command, "--kinds", take,
+                 "Kinds to list, with commas between: identifiers, members, functions (the first two unless given)")
         ->type_name("KIND,...");
     command->footer(examples);
     return {command, [options](Console& console) {

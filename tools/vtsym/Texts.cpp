@@ -1,6 +1,8 @@
 #include "tools/vtsym/Texts.hpp"
 
+#include "tools/vtsym/Arguments.hpp"
 #include "tools/vtsym/ErrorText.hpp"
+#include "tools/vtsym/Files.hpp"
 #include "tools/vtsym/Json.hpp"
 
 #include <algorithm>
@@ -16,8 +18,8 @@ namespace vtsym {
 
 namespace {
 
-/// What no argument of a command line holds.
-constexpr char textMark = '\0';
+/// Bytes of a line that is too long that are kept, to tell which one it is.
+constexpr std::size_t shownOfLong = 80;
 
 /// Answers one text after another.
 class Answerer {
@@ -27,7 +29,8 @@ public:
           console_(console),
           answering_(answering) {}
 
-    void answer(const std::string& text);
+    /// @param isWhole  whether the text is not the beginning of one that is too long
+    void answer(const std::string& text, bool isWhole = true);
 
     [[nodiscard]] bool allAnswered() const noexcept { return allAnswered_; }
 
@@ -42,7 +45,7 @@ private:
     std::string out_;
 };
 
-void Answerer::answer(const std::string& text) {
+void Answerer::answer(const std::string& text, bool isWhole) {
     console_.working(++line_);
     out_.clear();
     if (answering_.inBlocks && line_ > 1)
@@ -54,17 +57,19 @@ void Answerer::answer(const std::string& text) {
     if (json_ && !answering_.tellsInput)
         appendMember(out_, "input", jsonString(text));
     try {
+        if (!isWhole)
+            throw CommandError("The line is longer than " + sizeText(mostBytes) + ".");
         answering_.answer(text, out_);
         words = warnings();
     } catch (...) {
-        const TextError error = currentTextError();
+        const std::vector<TextError> errors = currentTextErrors();
         allAnswered_ = false;
         out_.resize(begin);
         if (json_) {
             appendMember(out_, "input", jsonString(text));
-            appendMember(out_, "error", jsonOf(error));
+            appendMember(out_, "error", jsonOf(errors));
         } else {
-            words = errorLines(line_, text, error, console_.wordStyle());
+            words = errorLines(line_, text, errors, console_.wordStyle());
         }
     }
     out_ += json_ ? "}\n" : "\n";
@@ -81,13 +86,34 @@ std::string Answerer::warnings() const {
     return lines;
 }
 
+/// The line of standard input that is being read.
+struct InputLine {
+    std::string text;
+    bool begun = false;
+    bool isWhole = true;
+
+    void clear() {
+        text.clear();
+        begun = false;
+        isWhole = true;
+    }
+
+    void append(std::string_view part) {
+        begun = true;
+        isWhole = isWhole && part.size() <= mostBytes - text.size();
+        if (isWhole)
+            text.append(part);
+        else if (text.size() > shownOfLong)
+            text = text.substr(0, shownOfLong);
+    }
+};
+
 /// Calls `use` with every line of standard input; 0, or the error that ended reading.  Before it waits for more input,
 /// it lets the answers so far out.
 template <class Use>
 int forEachLine(Console& console, Use&& use) {
     std::array<char, 65536> buffer{};
-    std::string line;
-    bool open = false; // a line has begun
+    InputLine line;
     for (;;) {
         console.flush();
         console.waiting();
@@ -102,40 +128,20 @@ int forEachLine(Console& console, Use&& use) {
         for (std::size_t end = rest.find('\n'); end != std::string_view::npos; end = rest.find('\n')) {
             line.append(rest.substr(0, end));
             rest.remove_prefix(end + 1);
-            if (line.ends_with('\r'))
-                line.pop_back();
+            if (line.text.ends_with('\r'))
+                line.text.pop_back();
             use(line);
             line.clear();
-            open = false;
         }
-        line.append(rest);
-        open = open || !rest.empty();
+        if (!rest.empty())
+            line.append(rest);
     }
-    if (open)
+    if (line.begun)
         use(line);
     return 0;
 }
 
 } // namespace
-
-void markTexts(std::vector<std::string>& arguments) {
-    const auto isList = [](const std::string& text) { return text.starts_with('[') && text.ends_with(']'); };
-    bool behind = false;
-    for (auto text = arguments.begin(); text != arguments.end();) {
-        if (!behind && *text == "--") {
-            behind = true;
-            text = arguments.erase(text);
-            continue;
-        }
-        if (behind || isList(*text))
-            text->insert(text->begin(), textMark);
-        ++text;
-    }
-}
-
-std::string withoutMark(const std::string& argument) {
-    return argument.starts_with(textMark) ? argument.substr(1) : argument;
-}
 
 bool isName(std::string_view text) {
     const auto isLetter = [](char c) { return c == '_' || (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z'); };
@@ -145,46 +151,31 @@ bool isName(std::string_view text) {
            std::string_view::npos;
 }
 
-CLI::Validator oneOf(std::vector<std::string> words) {
-    return {[words = std::move(words)](const std::string& value) -> std::string {
-                if (std::ranges::find(words, value) != words.end())
-                    return {};
-                std::string choice = words.front();
-                for (std::size_t i = 1; i < words.size(); ++i)
-                    choice += (i + 1 < words.size() ? ", " : " or ") + words[i];
-                return "'" + value + "' is not offered; " + choice + " is";
-            },
-            ""};
-}
-
 void addTextOptions(CLI::App& command, TextOptions& options) {
-    command.add_option("TEXT", options.texts, "Texts to work on; without any, or with -, every line of standard input")
-        ->transform(withoutMark, "")
-        ->type_name("");
+    const auto take = [&options](std::vector<std::string> texts) { options.texts = std::move(texts); };
+    addArguments(command, "TEXT", take, "Texts to work on; without any, or with -, every line of standard input");
     addSourceOption(command, options);
     command.add_flag("--json", options.json, "Answer with one JSON object per text");
 }
 
 void addSourceOption(CLI::App& command, TextOptions& options) {
-    command.add_option("--from", options.from, "Language of the texts: c or quill")
+    addArgument(command, "--from", options.from, "Language of the texts: c or quill")
         ->check(oneOf({"c", "quill"}))
         ->type_name("LANGUAGE");
 }
 
 void addLanguageOption(CLI::App& command, TextOptions& options) {
-    command
-        .add_option("--to", options.to,
-                    "Language of the answers: c, quill or pp, the condition of a preprocessor directive (as --from "
-                    "unless given)")
+    addArgument(command, "--to", options.to,
+                "Language of the answers: c, quill or pp, the condition of a preprocessor directive (as --from unless "
+                "given)")
         ->check(oneOf({"c", "quill", "pp"}))
         ->type_name("LANGUAGE");
 }
 
 void addBitsOption(CLI::App& command, bool& bits32) {
-    command
-        .add_option_function<std::string>(
-            "--bits", [&bits32](const std::string&) { bits32 = true; },
-            "Take names for signed integers of 32 bits; for integers without bounds unless given")
+    const auto take = [&bits32](const std::string&) { bits32 = true; };
+    addArgument(command, "--bits", take,
+                "Take names for signed integers of 32 bits; for integers without bounds unless given")
         ->check(oneOf({"32"}))
         ->type_name("BITS");
 }
@@ -193,7 +184,8 @@ bool answerTexts(const TextOptions& options, Console& console, const Answering& 
     Answerer answerer(options, console, answering);
     bool allRead = true;
     const auto readInput = [&] {
-        if (const int error = forEachLine(console, [&](const std::string& line) { answerer.answer(line); })) {
+        if (const int error =
+                forEachLine(console, [&](const InputLine& line) { answerer.answer(line.text, line.isWhole); })) {
             console.words(std::string("vtsym: standard input cannot be read: ") + std::strerror(error) + "\n");
             allRead = false;
         }

@@ -40,11 +40,6 @@ struct Answering {
     bool tellsInput = false;
 };
 
-/// Marks arguments that the parser of the command line would not take for texts: those behind `--`, unless they are the
-/// first texts, and lists such as `[1,2]`.  Options for texts take the mark off by withoutMark().
-void markTexts(std::vector<std::string>& arguments);
-std::string withoutMark(const std::string& argument);
-
 /// Gives a command the texts, --json and --from.
 void addTextOptions(CLI::App& command, TextOptions& options);
 /// Gives a command --from alone.
@@ -57,9 +52,6 @@ void addBitsOption(CLI::App& command, bool& bits32);
 
 /// Whether a text is one name.
 bool isName(std::string_view text);
-
-/// Accepts the words of a list.
-CLI::Validator oneOf(std::vector<std::string> words);
 
 /// Answers all texts in order.  True when every one had an answer and all input could be read.
 bool answerTexts(const TextOptions& options, Console& console, const Answering& answering);

@@ -15,7 +15,8 @@ class Wording {
 public:
     Wording(const VT::SymbolicExprTable& table, VT::CTextUse use)
         : table_(table),
-          where_(use == VT::CTextUse::Directive ? "a preprocessor" : "C"),
+          inDirective_(use == VT::CTextUse::Directive),
+          where_(inDirective_ ? "a preprocessor" : "C"),
           printer_(table, false) {}
 
     [[nodiscard]] std::string of(const VT::CTextFinding& finding) const;
@@ -24,13 +25,14 @@ private:
     [[nodiscard]] std::string text(VT::SymbolicExprId id) const;
 
     const VT::SymbolicExprTable& table_;
+    bool inDirective_;
     const char* where_;
     VT::SymbolicExprPrinter printer_;
 };
 
 /// The beginning of an expression; the number of its bytes where it is very long.
 std::string Wording::text(VT::SymbolicExprId id) const {
-    if (!table_.has(id))
+    if (table_.get(id) == nullptr)
         return "(nothing)";
     if (const std::uint64_t bytes = printer_.textLength(id); bytes > printedBytes)
         return "(" + std::to_string(bytes) + " bytes of text)";
@@ -45,14 +47,22 @@ std::string Wording::of(const VT::CTextFinding& finding) const {
     case VT::CTextObstacle::BitwiseLogic:
         return "C reads the " + std::string(row.meaning) + " as a bitwise one: " + text(finding.id);
     case VT::CTextObstacle::RealConstant:
-        return "a preprocessor has no real constants: " + text(finding.id);
+        return std::string(where_) + (inDirective_ ? " has no real constants: " : " has no such constant: ") +
+               text(finding.id);
     case VT::CTextObstacle::MemberOfNoName:
-        return "only a member of a name is a macro: " + text(finding.id);
+        return (inDirective_ ? "only a member of a name is a macro: " : "a number has no members: ") + text(finding.id);
     case VT::CTextObstacle::CalledNoName:
-        return "only a name is a macro with arguments: " + text(finding.id);
+        return (inDirective_ ? "only a name is a macro with arguments: " : "a number cannot be called: ") +
+               text(finding.id);
     case VT::CTextObstacle::SharedMacroName:
         return text(finding.id) + " and " + text(finding.other) + " are both written " +
                VT::shownText(VT::PreprocessorVCExpr(table_, false).print(finding.id), shownBytes);
+    case VT::CTextObstacle::VariantKeyword:
+        return std::string(where_) + " does not know the variant keyword " + text(finding.id);
+    case VT::CTextObstacle::NoSuchName:
+        return std::string(where_) + " has no such name: " + text(finding.id);
+    case VT::CTextObstacle::DefinedNoName:
+        return "'defined' takes one name: " + text(finding.id);
     }
     return {};
 }

@@ -1,11 +1,14 @@
 // vtsym: symbolic expressions and variant conditions on the command line.
 #include "host/Feature.hpp"
+#include "host/Text.hpp"
+#include "tools/vtsym/Arguments.hpp"
 #include "tools/vtsym/Commands.hpp"
-#include "tools/vtsym/Texts.hpp"
+#include "tools/vtsym/Files.hpp"
 
 #include <algorithm>
 #include <csignal>
 #include <numeric>
+#include <span>
 #include <sstream>
 #include <string>
 #include <string_view>
@@ -50,10 +53,10 @@ std::size_t distance(std::string_view a, std::string_view b) {
 
 /// What is wrong with arguments that nothing takes.
 std::string unexpected(const std::vector<std::string>& arguments) {
-    const std::string first = arguments.empty() ? std::string() : withoutMark(arguments.front());
-    if (first.starts_with('-'))
-        return "there is no option '" + first + "'; a text that begins with - goes behind --";
-    return "'" + first + "' is one argument too many";
+    const std::string first = arguments.empty() ? std::string() : arguments.front();
+    if (first.starts_with('-') && first != "-")
+        return "there is no option " + quotedArgument(first) + "; write a text that begins with - after --";
+    return quotedArgument(unmarked(first)) + " is one argument too many";
 }
 
 class Program {
@@ -65,6 +68,7 @@ public:
 private:
     void addFeatures(CLI::App& app);
     int fail(Console& console, const std::string& problem);
+    void markArguments(std::vector<std::string>& arguments) const;
     [[nodiscard]] std::string unknownCommand(const std::string& word) const;
 
     CLI::App app_{description, "vtsym"};
@@ -88,39 +92,47 @@ void Program::addFeatures(CLI::App& app) {
     std::string flags;
     for (const VtFeature* feature : VtFeature::all())
         flags += (flags.empty() ? "" : ", ") + feature->name();
-    app.add_option_function<std::vector<std::string>>(
-           "--feature",
-           [](const std::vector<std::string>& assignments) {
-               for (const std::string& assignment : assignments)
-                   if (const std::string error = VtFeature::assign(assignment); !error.empty())
-                       throw CLI::ValidationError("--feature", error);
-           },
-           "Set a feature flag: " + flags)
-        ->allow_extra_args(false)
-        ->multi_option_policy(CLI::MultiOptionPolicy::TakeAll)
-        ->type_name("NAME=VALUE");
+    const auto take = [](const std::vector<std::string>& assignments) {
+        for (const std::string& assignment : assignments)
+            if (const std::string error = VtFeature::assign(assignment); !error.empty())
+                throw CLI::ValidationError("--feature", error);
+    };
+    addArguments(app, "--feature", take, "Set a feature flag: " + flags)->type_name("NAME=VALUE");
 }
 
-/// What is wrong with a first word that is no command; empty where nothing is.
+/// What is wrong with a first word that is not a command; empty where nothing is.
 std::string Program::unknownCommand(const std::string& word) const {
     const auto nearer = [&word](const Command& a, const Command& b) {
         return distance(word, a.app->get_name()) < distance(word, b.app->get_name());
     };
     const std::string& nearest = std::ranges::min_element(commands_, nearer)->app->get_name();
     const std::size_t changes = distance(word, nearest);
-    if (word.starts_with('-') || changes == 0)
+    if ((word.starts_with('-') && word != "--") || changes == 0)
         return {};
-    return "there is no command '" + word + "'" + (changes <= 2 ? "; did you mean " + nearest + "?" : "");
+    const bool isNear = changes <= 2 && changes < word.size();
+    return "there is no command " + quotedArgument(word) + (isNear ? "; did you mean " + nearest + "?" : "");
 }
 
 int Program::fail(Console& console, const std::string& problem) {
     std::string command = "vtsym";
     for (const CLI::App* const chosen : app_.get_subcommands())
         command += " " + chosen->get_name();
-    std::string shown = problem;
-    std::erase(shown, '\0'); // a guard of lists
-    console.words("vtsym: " + shown + "\nTry '" + command + " --help'.\n");
+    console.words("vtsym: " + VT::shownText(problem) + "\nTry '" + command + " --help'.\n");
     return wrongUsage;
+}
+
+/// Marks the arguments after the command.
+void Program::markArguments(std::vector<std::string>& arguments) const {
+    const auto isCommand = [this](const std::string& word) {
+        return std::ranges::any_of(commands_, [&](const Command& each) { return each.app->get_name() == word; });
+    };
+    const auto word = std::ranges::find_if(arguments, isCommand);
+    if (word == arguments.end())
+        return;
+    const auto first = static_cast<std::size_t>(word - arguments.begin()) + 1;
+    const std::vector<std::string> marked = markedArguments(std::span(arguments).subspan(first));
+    arguments.resize(first);
+    arguments.insert(arguments.end(), marked.begin(), marked.end());
 }
 
 int Program::run(Console& console, std::vector<std::string> arguments, ExitStatus& onError) {
@@ -134,7 +146,7 @@ int Program::run(Console& console, std::vector<std::string> arguments, ExitStatu
     }
     if (const std::string problem = unknownCommand(arguments.front()); !problem.empty())
         return fail(console, problem);
-    markTexts(arguments);
+    markArguments(arguments);
     try {
         std::ranges::reverse(arguments); // the order that CLI11 takes
         app_.parse(std::move(arguments));
@@ -146,15 +158,16 @@ int Program::run(Console& console, std::vector<std::string> arguments, ExitStatu
         return success;
     } catch (const CLI::ExtrasError&) {
         return fail(console, unexpected(app_.remaining(true)));
-    } catch (const CLI::RequiredError&) {
+    } catch (const CLI::RequiredError& missing) {
         const std::vector<std::string> rest = app_.remaining(true);
-        return fail(console, rest.empty() ? "a command is missing" : unexpected(rest));
+        return fail(console, rest.empty() ? missing.what() : unexpected(rest));
     } catch (const CLI::ParseError& error) {
         return fail(console, error.what());
     }
     const auto chosen = std::ranges::find_if(commands_, [](const Command& command) { return command.app->parsed(); });
     onError = chosen->onError;
-    return chosen->run(console).value();
+    const int status = chosen->run(console).value();
+    return console.wordsLost() ? std::max(status, onError.value()) : status;
 }
 
 int runOn(Console& console, std::vector<std::string> arguments) {
@@ -163,9 +176,9 @@ int runOn(Console& console, std::vector<std::string> arguments) {
         return Program().run(console, std::move(arguments), onError);
     } catch (const OutputError& error) {
         if (!error.readerIsGone())
-            console.words(std::string("vtsym: ") + error.what() + "\n");
+            console.words("vtsym: " + VT::shownText(error.what()) + "\n");
     } catch (const std::exception& error) {
-        console.words(std::string("vtsym: ") + error.what() + "\n");
+        console.words("vtsym: " + VT::shownText(error.what()) + "\n");
     }
     return onError.value();
 }
@@ -175,6 +188,7 @@ int runOn(Console& console, std::vector<std::string> arguments) {
 } // namespace vtsym
 
 int main(int argc, char** argv) {
+    vtsym::holdStandardStreams();
     std::signal(SIGPIPE, SIG_IGN); // a reader that left is an error of writing, not the end of the process
     vtsym::Console console;
     return vtsym::runOn(console, std::vector<std::string>(argv + (argc > 0 ? 1 : 0), argv + argc));

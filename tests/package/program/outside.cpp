@@ -11,6 +11,10 @@ int main() {
     const auto sum = VT::SymbolicPlusExpr(table, a, b).getId(table);
     if (VT::SymbolicPlusExpr(table, a, b).getId(table) != sum || table.size() != 5)
         return 1;
+    const VT::SymbolicFcnCall1UExpr call(table, "f", a);
+    if (call == VT::SymbolicFcnCallExpr(table, "g", {a}) ||
+        VT::SymbolicString(table, "f") != *table.get(call.getInput(0)))
+        return 1;
     const VT::VCServiceHandle service;
     if (service->simplifyCExprFromCCondition("A == 1 && A == 2") != "false")
         return 1;

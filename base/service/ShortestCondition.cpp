@@ -1,0 +1,48 @@
+// Conditions made shorter: everywhere, or where another one is known to hold.
+#include "base/VCService.hpp"
+#include "base/service/ConditionProofs.hpp"
+#include "base/service/ServiceParts.hpp"
+#include "base/service/ShortestForm.hpp"
+
+namespace VT {
+
+VCSymbolicExprId VCService::shortestCondition(const VCSymbolicExprId& condition, bool isQuill,
+                                              std::vector<ShortForm>* forms) {
+    if (forms != nullptr)
+        forms->clear();
+    if (!has(condition))
+        return invalidId;
+    const SymbolicExprId given = isQuill ? condition.id() : parts_->toC(condition.id());
+    const SymbolicExprPrinter& printer = isQuill ? parts_->quillPrinter : parts_->cPrinter;
+    SymbolicExprTable& table = parts_->table;
+    const auto normalForm = [&] { return simplify(given, isQuill).id(); };
+    // A number is no condition: its value counts, not whether it is 0.
+    if (!booleanOps.contains(table.get(given)->op())) {
+        const SymbolicExprId simple = normalForm();
+        return printer.textLength(simple) <= printer.textLength(given) ? simple : given;
+    }
+    ConditionProofs proofs(parts_->decider(), parts_->toC, given, table.getIdTRUE(), false);
+    ShortestForm search(table, printer, parts_->keywordsInForce(), proofs);
+    // Bounds of the unknowns are something to know.
+    const SymbolicExprId result = search.find(given, parts_->bits32 ? table.getIdTRUE() : invalidId, normalForm);
+    if (forms != nullptr)
+        *forms = search.forms();
+    return result;
+}
+
+VCSymbolicExprId VCService::getImpliedCondition(const VCSymbolicExprId& condition, const VCSymbolicExprId& known,
+                                                bool isQuill) {
+    if (!has(condition) || !has(known))
+        return invalidId;
+    SymbolicExprTable& table = parts_->table;
+    const SymbolicExprId given = isQuill ? condition.id() : parts_->toC(condition.id());
+    const SymbolicExprId context = isQuill ? known.id() : parts_->toC(known.id());
+    ConditionProofs proofs(parts_->decider(), parts_->toC, given, context, true);
+    if (const auto decided = proofs.decided(given))
+        return *decided ? table.getIdTRUE() : table.getIdFALSE();
+    const SymbolicExprPrinter& printer = isQuill ? parts_->quillPrinter : parts_->cPrinter;
+    const auto normalForm = [&] { return simplify(given, isQuill).id(); };
+    return ShortestForm(table, printer, parts_->keywordsInForce(), proofs).find(given, context, normalForm);
+}
+
+} // namespace VT
