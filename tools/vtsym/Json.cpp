@@ -3,9 +3,7 @@
 #include "host/Numbers.hpp"
 #include "host/Text.hpp"
 
-#include <array>
 #include <cmath>
-#include <cstdio>
 #include <nlohmann/json.hpp>
 
 namespace vtsym {
@@ -25,9 +23,9 @@ char32_t takeCharacter(std::string_view& text) {
 
 void appendEscaped(std::string& json, char32_t point) {
     const auto append = [&json](unsigned unit) {
-        std::array<char, 8> digits{};
-        std::snprintf(digits.data(), digits.size(), "\\u%04x", unit);
-        json.append(digits.data());
+        json += "\\u";
+        for (const unsigned shift : {12U, 8U, 4U, 0U})
+            json += "0123456789abcdef"[(unit >> shift) & 0xfU];
     };
     if (point > 0xffff)
         append(0xd800U + ((point - 0x10000U) >> 10U));
