@@ -5,8 +5,8 @@
 #include "base/service/ComparedTerms.hpp"
 
 #include "base/core/Limits.hpp"
+#include "base/core/Make.hpp"
 #include "base/core/Nodes.hpp"
-#include "base/service/ImpliedCondition.hpp"
 
 #include <algorithm>
 #include <cstdlib>
@@ -173,7 +173,7 @@ SymbolicExprId ComparedTerms::literal(Atom atom, const IntegerSet& set) {
         return isTruth ? invalidId : compose(atom, set, false);
     const SymbolicExpr& node = *table_.get(opposite);
     if (comparisonOps.contains(node.op()) && !isTruth)
-        return makeComparison(table_, operatorInfo(node.op()).negated, node.getInput(0), node.getInput(1));
+        return makeBinary(table_, operatorInfo(node.op()).negated, node.getInput(0), node.getInput(1));
     const SymbolicExprId negated = SymbolicNotExpr(table_, opposite).getId(table_);
     const SymbolicExprId composed = isTruth ? invalidId : compose(atom, set, false);
     return composed != invalidId && printer_.textLength(composed) < printer_.textLength(negated) ? composed : negated;
@@ -206,7 +206,7 @@ SymbolicExprId ComparedTerms::compose(Atom atom, const IntegerSet& set, bool str
     const bool moves = difference && right < 0;
     const SymbolicExprId left = side(parts, 1, moves ? -right : 0);
     const SymbolicExprId other = side(parts, -1, moves ? 0 : right);
-    return left == invalidId || other == invalidId ? invalidId : makeComparison(table_, op, left, other);
+    return left == invalidId || other == invalidId ? invalidId : makeBinary(table_, op, left, other);
 }
 
 /// The sum of the parts with a sign and of a constant, which stands alone or where it is not 0.

@@ -1,5 +1,6 @@
 #include "base/service/FormulaWriter.hpp"
 
+#include "base/core/Make.hpp"
 #include "base/core/Nodes.hpp"
 
 #include <algorithm>
@@ -31,23 +32,8 @@ std::vector<Formula> FormulaWriter::byHeight(Formula formula, bool withOpposites
 
 SymbolicExprId FormulaWriter::fold(SymbolicOp op, const std::vector<SymbolicExprId>& operands) {
     SymbolicExprId chain = operands.front();
-    for (std::size_t i = 1; i < operands.size(); ++i) {
-        const SymbolicExprId next = operands[i];
-        switch (op) {
-        case SymbolicOp::And:
-            chain = SymbolicAndExpr(table_, chain, next).getId(table_);
-            break;
-        case SymbolicOp::Or:
-            chain = SymbolicOrExpr(table_, chain, next).getId(table_);
-            break;
-        case SymbolicOp::SingleAnd:
-            chain = SymbolicSingleAndExpr(table_, chain, next).getId(table_);
-            break;
-        default:
-            chain = SymbolicSingleOrExpr(table_, chain, next).getId(table_);
-            break;
-        }
-    }
+    for (std::size_t i = 1; i < operands.size(); ++i)
+        chain = makeBinary(table_, op, chain, operands[i]);
     return chain;
 }
 

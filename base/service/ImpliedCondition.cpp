@@ -1,6 +1,7 @@
 #include "base/service/ImpliedCondition.hpp"
 
 #include "base/core/Limits.hpp"
+#include "base/core/Make.hpp"
 #include "base/core/Nodes.hpp"
 #include "base/core/Walk.hpp"
 
@@ -17,25 +18,8 @@ constexpr std::size_t mostLiterals = 12; ///< that each of them is compared with
 
 } // namespace
 
-SymbolicExprId makeComparison(SymbolicExprTable& table, SymbolicOp op, SymbolicExprId left, SymbolicExprId right) {
-    switch (op) {
-    case SymbolicOp::Equal:
-        return SymbolicEqualExpr(table, left, right).getId(table);
-    case SymbolicOp::NotEqual:
-        return SymbolicNotEqualExpr(table, left, right).getId(table);
-    case SymbolicOp::LessThan:
-        return SymbolicLessThanExpr(table, left, right).getId(table);
-    case SymbolicOp::LessThanEqual:
-        return SymbolicLessThanEqualExpr(table, left, right).getId(table);
-    case SymbolicOp::GreaterThan:
-        return SymbolicGreaterThanExpr(table, left, right).getId(table);
-    default:
-        return SymbolicGreaterThanEqualExpr(table, left, right).getId(table);
-    }
-}
-
 SymbolicExprId compareWith(SymbolicExprTable& table, SymbolicOp op, SymbolicExprId operand, int literal) {
-    return makeComparison(table, op, operand, SymbolicIntValue(table, literal).getId(table));
+    return makeBinary(table, op, operand, SymbolicIntValue(table, literal).getId(table));
 }
 
 ImpliedCondition::ImpliedCondition(SymbolicExprTable& table, const SymbolicExprPrinter& printer, SymbolicExprId context,

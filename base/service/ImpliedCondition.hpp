@@ -9,10 +9,7 @@
 
 namespace VT {
 
-/// Interns a comparison; any other operator gives >=.
-SymbolicExprId makeComparison(SymbolicExprTable& table, SymbolicOp op, SymbolicExprId left, SymbolicExprId right);
-
-/// Interns the comparison of an operand with an integer; any other operator gives >=.
+/// Interns the comparison of an operand with an integer.
 SymbolicExprId compareWith(SymbolicExprTable& table, SymbolicOp op, SymbolicExprId operand, int literal);
 
 /// Shortens a condition by what keeps it equal in a context: operands of && and || taken away, the longest first, and

@@ -2,8 +2,6 @@
 
 #include "base/variants/VariantKeywords.hpp"
 
-#include <type_traits>
-
 namespace VT {
 
 RuleListener::~RuleListener() = default;
@@ -12,31 +10,6 @@ RuleContext::RuleContext(SymbolicExprTable& table, const SymbolicExprPrinter& pr
     : table_(table),
       printer_(printer),
       keywordsOn_(keywordsOn) {}
-
-namespace {
-
-template <class Node>
-SymbolicExprId makeIfBinary(RuleContext& context, SymbolicExprId a, SymbolicExprId b) {
-    if constexpr (std::is_base_of_v<SymbolicBinaryExpr, Node>)
-        return context.make<Node>(a, b);
-    else
-        return invalidId;
-}
-
-} // namespace
-
-SymbolicExprId RuleContext::makeBinary(SymbolicOp op, SymbolicExprId a, SymbolicExprId b) {
-    switch (op) {
-#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                         \
-    case SymbolicOp::Name:                                                                                             \
-        return makeIfBinary<Class>(*this, a, b);
-#include "base/core/operators.def"
-#undef VTSYM_OPERATOR
-    case SymbolicOp::None:
-        break;
-    }
-    return invalidId;
-}
 
 SymbolicExprId RuleContext::resolve(SymbolicExprId id) const {
     if (op(id) != SymbolicOp::MemberValue)

@@ -2,6 +2,7 @@
 #pragma once
 
 #include "base/core/IdMap.hpp"
+#include "base/core/Make.hpp"
 #include "base/core/Nodes.hpp"
 #include "base/print/ExpressionPrinter.hpp"
 #include "base/simplify/Rule.hpp"
@@ -42,8 +43,10 @@ public:
         return Node(table_, std::forward<Parts>(parts)...).getId(table_);
     }
 
-    /// The node of an operator with two operands; the invalid identifier for other operators.
-    SymbolicExprId makeBinary(SymbolicOp op, SymbolicExprId a, SymbolicExprId b);
+    /// The node of an operator with two operands.
+    SymbolicExprId makeBinary(SymbolicOp op, SymbolicExprId a, SymbolicExprId b) {
+        return VT::makeBinary(table_, op, a, b);
+    }
 
     [[nodiscard]] SymbolicExprId truth(bool value) const { return value ? table_.getIdTRUE() : table_.getIdFALSE(); }
 

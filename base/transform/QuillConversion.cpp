@@ -1,5 +1,7 @@
 #include "base/transform/QuillConversion.hpp"
 
+#include "base/core/Make.hpp"
+
 #include <algorithm>
 #include <boost/container/small_vector.hpp>
 #include <string>
@@ -77,27 +79,12 @@ void SymbolicExprQ2CVisitor::convert(const Call& node) {
 
 /// The C operator on the arguments.
 SymbolicExprId SymbolicExprQ2CVisitor::build(SymbolicOp op, std::span<const SymbolicExprId> arguments) {
-    switch (op) {
-    case SymbolicOp::Divide:
-        return factory_.make<SymbolicDivideExpr>(arguments[0], arguments[1]);
-    case SymbolicOp::Modulo:
-        return factory_.make<SymbolicModuloExpr>(arguments[0], arguments[1]);
-    case SymbolicOp::BitAnd:
-        return factory_.make<SymbolicBitAndExpr>(arguments[0], arguments[1]);
-    case SymbolicOp::BitOr:
-        return factory_.make<SymbolicBitOrExpr>(arguments[0], arguments[1]);
-    case SymbolicOp::BitXOr:
-        return factory_.make<SymbolicBitXOrExpr>(arguments[0], arguments[1]);
-    case SymbolicOp::BitCompl:
-        return factory_.make<SymbolicBitComplExpr>(arguments[0]);
-    case SymbolicOp::ShiftLeft:
-        break;
-    default:
-        return invalidId;
-    }
+    if (op == SymbolicOp::BitCompl)
+        return makeUnary(table(), op, arguments[0]);
+    if (op != SymbolicOp::ShiftLeft)
+        return makeBinary(table(), op, arguments[0], arguments[1]);
     const CShift shift = shiftOfQuillCall(table(), arguments[1]);
-    return shift.op == SymbolicOp::ShiftLeft ? factory_.make<SymbolicShiftLeftExpr>(arguments[0], make(shift.amount))
-                                             : factory_.make<SymbolicShiftRightExpr>(arguments[0], make(shift.amount));
+    return makeBinary(table(), shift.op, arguments[0], make(shift.amount));
 }
 
 // C to Quill.
