@@ -153,60 +153,6 @@ TEST(BruteForce, RandomSets) {
     }
 }
 
-/// A term of any arithmetic that has values, truth values among it.
-std::string randomTerm(std::mt19937_64& random, int depth) {
-    static const char* const leaves[] = {"A", "B", "C", "0", "1", "2", "3", "7"};
-    static const char* const operators[] = {"+", "-", "*", "/", "%", "&", "|", "^", "+", "-", "==", "<", "&&"};
-    if (depth == 0 || random() % 4 == 0)
-        return leaves[random() % std::size(leaves)];
-    if (random() % 8 == 0)
-        return (random() % 2 == 0 ? "- (" : "~(") + randomTerm(random, depth - 1) + ")";
-    return "(" + randomTerm(random, depth - 1) + operators[random() % std::size(operators)] +
-           randomTerm(random, depth - 1) + ")";
-}
-
-/// Where arithmetic is not understood an answer may stay away, but it is never wrong.
-TEST(BruteForce, RandomArithmetic) {
-    std::mt19937_64 random(23);
-    std::size_t decided = 0;
-    constexpr int rounds = 2000;
-    for (int round = 0; round < rounds; ++round) {
-        DecisionBench bench;
-        static const char* const comparisons[] = {"==", "<", ">=", "!="};
-        const auto comparison = [&] {
-            return randomTerm(random, 2) + comparisons[random() % 4] + randomTerm(random, 2);
-        };
-        const std::string text = comparison() + (random() % 2 == 0 ? " && " : " || ") + comparison();
-        const SymbolicExprId id = bench.parse(text);
-        const Decision can = bench.decider.canHold(id);
-        const Decision must = bench.decider.mustHold(id);
-        SCOPED_TRACE(text + "\ncan: " + bench.text(can) + "\nmust: " + bench.text(must));
-        decided += (can.isUndecided() ? 0U : 1U) + (must.isUndecided() ? 0U : 1U);
-        // A quotient that has no value for the witness says nothing, neither here nor there.
-        const auto confirm = [&](const Decision& decision, bool truth) {
-            const std::optional<bool> holds = bench.decider.holds(id, *decision.witness);
-            ASSERT_EQ(holds.value_or(truth), truth);
-            if (holds) {
-                ASSERT_EQ(bench.holdsFor(id, decision), truth);
-            }
-        };
-        if (can.isYes())
-            confirm(can, true);
-        if (must.isNo())
-            confirm(must, false);
-        forEachAssignment({"A", "B", "C"}, -3, 4, [&](const Assignment& assignment) {
-            try {
-                const bool truth = holds(bench.table, id, assignment);
-                ASSERT_FALSE(truth && can.isNo());
-                ASSERT_FALSE(!truth && must.isYes());
-            } catch (const NoValue&) { // nothing holds or fails where a quotient has no value
-            }
-        });
-        ASSERT_FALSE(HasFatalFailure());
-    }
-    EXPECT_GT(decided, std::size_t{2 * rounds * 8 / 10});
-}
-
 /// Another order of interning and other questions before change nothing, not even the steps.
 TEST(BruteForce, AnswersDoNotDependOnHistory) {
     std::mt19937_64 random(21);

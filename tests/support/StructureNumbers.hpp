@@ -13,7 +13,8 @@
 namespace VT::Testing {
 
 /// Numbers structures: equal trees, in whichever tables, have equal numbers, and others do not.  Reals are compared by
-/// their bits, but for the sign of zero.  A class with any number of operands and its twin with a fixed number are one structure.
+/// their bits, but for the sign of zero.  A class with any number of operands and its twin with a fixed number are one
+/// structure.
 class StructureNumbers {
 public:
     /// The number of a node with these operands; that of an invalid operand is `none`.

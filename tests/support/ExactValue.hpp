@@ -1,0 +1,57 @@
+// The value of an expression where all arithmetics agree on it.
+#pragma once
+
+#include "base/VTSymbolicExpr.hpp"
+#include "tests/support/Truth.hpp"
+
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace VT::Testing {
+
+/// A number: an integer, which a truth value is too, or a real.
+struct ExactNumber {
+    double real = 0; ///< the value, exactly, also of an integer
+    bool isReal = false;
+    bool isTruth = false;
+
+    [[nodiscard]] bool holds() const noexcept { return real != 0; }
+};
+
+/// An expression as a list of steps, for many assignments.
+///
+/// Evaluation wraps at 32 bits, decisions are over unbounded integers, and C leaves much undefined.  There is a value
+/// only where none of that matters: every integer on the way fits 32 bits, no real is rounded, infinite, NaN or within
+/// the zero threshold of what it is compared with, nothing divides by zero and shifts are from 0 to 31.  What a name
+/// stands for comes from the assignment.  A call is a function of its arguments' values: equal arguments, equal value.
+class ExactValue {
+public:
+    ExactValue(const SymbolicExprTable& table, SymbolicExprId root);
+
+    [[nodiscard]] std::optional<ExactNumber> under(const Assignment& assignment) const;
+
+    /// Whether the latest value took a quotient with a remainder, which only a dimension takes for exact.
+    [[nodiscard]] bool tookRemainder() const noexcept { return tookRemainder_; }
+
+    /// Names of symbols other than the truth constants.
+    [[nodiscard]] const std::vector<std::string>& names() const noexcept { return names_; }
+
+private:
+    struct Step {
+        SymbolicOp op;
+        ExactNumber literal;
+        std::string name;
+        std::vector<std::size_t> inputs;
+    };
+
+    [[nodiscard]] std::optional<ExactNumber> compute(const Step& step, const std::vector<ExactNumber>& values) const;
+    [[nodiscard]] std::optional<ExactNumber> ofIntegers(SymbolicOp op, std::int64_t a, std::int64_t b) const;
+
+    std::vector<Step> steps_; ///< operands before their operators
+    std::vector<std::string> names_;
+    mutable bool tookRemainder_ = false;
+};
+
+} // namespace VT::Testing
