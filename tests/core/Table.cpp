@@ -58,8 +58,7 @@ TEST(Table, OperandsAreIdentifiersOrNodesInEveryCombination) {
 }
 
 TEST(Table, LookupsOfWhatIsNotThere) {
-    SymbolicExprTable table;
-    SymbolicExprTable other;
+    SymbolicExprTable table, other;
     const SymbolicString node(other, "a");
     EXPECT_EQ(node.getId(table), invalidId);
     EXPECT_FALSE(table.contains(&node));
@@ -76,40 +75,30 @@ TEST(Table, LookupsOfWhatIsNotThere) {
 
 TEST(Table, AnAnswerIsNotRememberedForAnotherNodeAtTheSamePlace) {
     // Temporaries take turns in one place of the stack, between two tables and classes.
-    SymbolicExprTable table;
-    SymbolicExprTable other;
+    SymbolicExprTable table, other;
     alignas(SymbolicPlusExpr) std::byte place[sizeof(SymbolicPlusExpr)];
-    const auto inPlace = [&]<class Node>(std::type_identity<Node>, SymbolicExprTable& into, auto... parts) {
-        return std::unique_ptr<Node, void (*)(Node*)>(new (place) Node(into, parts...),
-                                                      [](Node* node) { node->~Node(); });
+    using Ids = std::pair<SymbolicExprId, SymbolicExprId>; // in the one and in the other
+    const auto ids = [&]<class Node>(std::type_identity<Node>, SymbolicExprTable& into, SymbolicExprId a,
+                                     SymbolicExprId b) {
+        const Node* const node = new (place) Node(into, a, b);
+        const Ids answers{node->getId(table), node->getId(other)};
+        const SymbolicExpr& base = *node;
+        EXPECT_EQ(answers, Ids(base.getId(table), base.getId(other)));
+        EXPECT_EQ(table.contains(node), answers.first != invalidId);
+        node->~Node();
+        return answers;
     };
-    inPlace(std::type_identity<SymbolicPlusExpr>(), table, 7U, 8U);
-    {
-        const auto sum = inPlace(std::type_identity<SymbolicPlusExpr>(), other, 8U, 7U);
-        EXPECT_EQ(sum->getId(table), invalidId);
-        EXPECT_EQ(sum->getId(other), 0U);
-    }
-    {
-        const auto difference = inPlace(std::type_identity<SymbolicMinusExpr>(), other, 7U, 8U);
-        EXPECT_EQ(difference->getId(table), invalidId);
-    }
-    {
-        const auto sum = inPlace(std::type_identity<SymbolicPlusExpr>(), other, 7U, 8U);
-        EXPECT_EQ(sum->getId(table), 0U);
-        EXPECT_EQ(static_cast<const SymbolicExpr&>(*sum).getId(other), 2U);
-    }
-    {
-        // A miss must not be remembered either.
-        const auto product = inPlace(std::type_identity<SymbolicMultiplyExpr>(), other, 7U, 8U);
-        EXPECT_FALSE(table.contains(product.get()));
-    }
-    inPlace(std::type_identity<SymbolicMinusExpr>(), table, 7U, 8U);
-    EXPECT_EQ(SymbolicMinusExpr(other, 7U, 8U).getId(table), 1U);
+    constexpr std::type_identity<SymbolicPlusExpr> plus;
+    constexpr std::type_identity<SymbolicMinusExpr> minus;
+    EXPECT_EQ(ids(plus, table, 7, 8), Ids(0, invalidId));
+    EXPECT_EQ(ids(plus, other, 8, 7), Ids(invalidId, 0));
+    EXPECT_EQ(ids(minus, other, 7, 8), Ids(invalidId, 1)) << "a miss is not remembered either";
+    EXPECT_EQ(ids(plus, other, 7, 8), Ids(0, 2));
+    EXPECT_EQ(ids(minus, table, 7, 8), Ids(1, 1));
 }
 
 TEST(Table, AddKeepsWhatItIsGivenAndFindsTheFirst) {
-    SymbolicExprTable table;
-    SymbolicExprTable source;
+    SymbolicExprTable table, source;
     table.add(new SymbolicIntValue(source, 5));
     table.add(new SymbolicIntValue(source, 5));
     EXPECT_EQ(table.size(), 2U);
@@ -117,41 +106,13 @@ TEST(Table, AddKeepsWhatItIsGivenAndFindsTheFirst) {
     EXPECT_EQ(table.get(1)->getId(table), 0U);
     EXPECT_EQ(SymbolicNotExpr(table, 1).getId(table), 2U) << "identifiers go on";
     // Foreign nodes between the table's own, through several enlargements.
-    for (int i = 0; i < 1000; ++i) {
+    for (int i = 0; i < 1000; ++i)
         if (i % 3 == 0)
             table.add(new SymbolicIntValue(source, 100 + i));
         else
             SymbolicIntValue(table, 100 + i);
-    }
     for (int i = 0; i < 1000; ++i)
         EXPECT_EQ(SymbolicIntValue(table, 100 + i).getId(table), static_cast<SymbolicExprId>(3 + i));
-    EXPECT_EQ(table.size(), 1003U);
-}
-
-/// A host's table that keeps its nodes elsewhere.
-class CountingTable final : public SymbolicExprTable {
-public:
-    void add(const SymbolicExpr* node) override { calls += '+', SymbolicExprTable::add(node); }
-
-    bool contains(const SymbolicExpr* node) const override { return calls += '?', SymbolicExprTable::contains(node); }
-
-    SymbolicExprId lookup(const SymbolicExpr* node) const override {
-        return calls += '=', SymbolicExprTable::lookup(node);
-    }
-
-    using SymbolicExprTable::lookup;
-
-    mutable std::string calls;
-};
-
-TEST(Table, NodesReachADerivedTableThroughItsVirtualOperations) {
-    CountingTable table;
-    const SymbolicExprId x = SymbolicString(table, "x").getId(table);
-    EXPECT_EQ(table.calls, "?+=");
-    const SymbolicExprId sum = SymbolicPlusExpr(table, x, x).getId(table);
-    EXPECT_EQ(SymbolicPlusExpr(table, x, x).getId(table), sum);
-    EXPECT_EQ(table.calls, "?+=?+=?=");
-    EXPECT_EQ(treeText(table, sum), "Plus(x,x)");
 }
 
 TEST(Table, NodesAreKeptWhereADerivedTableKeepsThem) {
@@ -176,16 +137,13 @@ TEST(Table, NodesAreKeptWhereADerivedTableKeepsThem) {
 }
 
 TEST(Table, ValuesOfNames) {
-    constexpr double infinity = std::numeric_limits<double>::infinity();
     SymbolicExprTable table;
     for (const auto& [real, expected] :
          std::vector<std::pair<double, int>>{{2.7, 2},
                                              {-2.7, -2},
                                              {2147483646.5, 2147483646},
                                              {2147483648.0, noValue},
-                                             {-2147483648.9, std::numeric_limits<int>::min()},
-                                             {infinity, noValue},
-                                             {-infinity, std::numeric_limits<int>::min()}}) {
+                                             {-2147483648.9, std::numeric_limits<int>::min()}}) {
         table.registerValueId("R", SymbolicDoubleValue(table, real).getId(table));
         EXPECT_EQ(table.getValue("R"), expected) << real;
     }

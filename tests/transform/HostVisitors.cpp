@@ -78,20 +78,12 @@ std::optional<std::string> run(NumberedTable& table, SymbolicExprId root, const 
     return stack.size() == 1 ? stack.back() : noResult;
 }
 
-/// The tree that an identifier stands for.
 std::string textOf(NumberedTable& table, SymbolicExprId id) {
     return table.table().has(id) ? run(table, id, Model()).value_or("large") : noResult;
 }
 
-class Rebuild : public SymbolicExprXFormVisitor {
-public:
-    using SymbolicExprXFormVisitor::SymbolicExprXFormVisitor;
-};
-
-class HookedRebuild : public SymbolicExprXFormVisitor2 {
-public:
-    using SymbolicExprXFormVisitor2::SymbolicExprXFormVisitor2;
-};
+using Rebuild = SymbolicExprXFormVisitor;
+using HookedRebuild = SymbolicExprXFormVisitor2;
 
 class TopDown final : public Rebuild {
 public:

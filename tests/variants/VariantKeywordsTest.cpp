@@ -63,24 +63,13 @@ TEST(VariantKeywords, AnyKeywordIsRecognisedExactly) {
     }
 }
 
-/// Counts '#' as white space, as some locale might.
-struct HashIsBlank : std::ctype<char> {
-    HashIsBlank() : std::ctype<char>(rows().data()) {}
-
-    static std::array<mask, table_size>& rows() {
-        static std::array<mask, table_size> rows = [] {
-            std::array<mask, table_size> changed{};
-            std::copy_n(classic_table(), table_size, changed.begin());
-            changed[static_cast<unsigned char>('#')] = space;
-            return changed;
-        }();
-        return rows;
-    }
-};
-
 TEST(VariantKeywords, WhiteSpaceIsWhatTheLocaleSays) {
+    using Letters = std::ctype<char>;
+    std::array<Letters::mask, Letters::table_size> rows{};
+    std::copy_n(Letters::classic_table(), rows.size(), rows.begin());
+    rows['#'] = Letters::space;
     EXPECT_FALSE(VariantKeywords::isSimVariantKeyword("#(sim)#", true));
-    const std::locale before = std::locale::global(std::locale(std::locale(), new HashIsBlank));
+    const std::locale before = std::locale::global(std::locale(std::locale(), new Letters(rows.data())));
     const bool recognised = VariantKeywords::isSimVariantKeyword("#(sim)#", true);
     std::locale::global(before);
     EXPECT_TRUE(recognised);
