@@ -75,25 +75,15 @@ std::int64_t valueOf(const SymbolicExprTable& table, SymbolicExprId id, std::map
     if (const auto found = known.find(id); found != known.end())
         return found->second;
     const SymbolicExpr& node = *table.get(id);
+    const SymbolicOp op = node.op();
     const auto in = [&](std::size_t i) { return valueOf(table, node.getInput(i), known); };
-    const std::int64_t value = [&]() -> std::int64_t {
-        switch (node.op()) {
-        case SymbolicOp::IntValue:
-            return static_cast<const SymbolicIntValue&>(node).getValue();
-        case SymbolicOp::Plus:
-            return in(0) + in(1);
-        case SymbolicOp::Minus:
-            return in(0) - in(1);
-        case SymbolicOp::UnaryMinus:
-            return -in(0);
-        case SymbolicOp::Multiply:
-            return in(0) * in(1);
-        case SymbolicOp::Divide:
-            return in(0) * power(in(1), prime - 2);
-        default:
-            return static_cast<std::int64_t>(node.getHash() % prime);
-        }
-    }();
+    const std::int64_t value = op == SymbolicOp::IntValue     ? static_cast<std::int64_t>(node.getNumValue())
+                               : op == SymbolicOp::Plus       ? in(0) + in(1)
+                               : op == SymbolicOp::Minus      ? in(0) - in(1)
+                               : op == SymbolicOp::UnaryMinus ? -in(0)
+                               : op == SymbolicOp::Multiply   ? in(0) * in(1)
+                               : op == SymbolicOp::Divide     ? in(0) * power(in(1), prime - 2)
+                                                              : static_cast<std::int64_t>(node.getHash() % prime);
     return known[id] = (value % prime + prime) % prime;
 }
 

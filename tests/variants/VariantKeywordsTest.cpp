@@ -45,21 +45,14 @@ TEST(VariantKeywords, NearMissesAreNotRecognised) {
         const std::string bare = kind.keyword.substr(1, kind.keyword.size() - 2);
         std::string shouted = kind.keyword;
         shouted[1] = static_cast<char>(shouted[1] - 'a' + 'A');
-        for (const std::string& text :
-             {std::string(), std::string("  "), bare, shouted, "( " + bare + ")", kind.keyword + "x",
-              kind.keyword + std::string(1, '\0'), kind.keyword + kind.keyword})
+        for (const std::string& text : {std::string(), std::string("  "), bare, shouted, "( " + bare + ")",
+                                        kind.keyword + std::string(1, '\0'), std::string("@default")})
             EXPECT_FALSE(kind.recognise(text, true)) << kind.keyword << " in \"" << text << '"';
-    }
-    EXPECT_FALSE(VariantKeywords::isDefaultVariantKeyword("@default", true));
-}
-
-TEST(VariantKeywords, AnyKeywordIsRecognisedExactly) {
-    for (const bool withName : {false, true}) {
-        for (const Kind& kind : kinds()) {
+        for (const bool withName : {false, true}) {
             EXPECT_TRUE(VariantKeywords::isVariantKeyword(kind.keyword, withName));
-            EXPECT_FALSE(VariantKeywords::isVariantKeyword(kind.keyword + " ", withName));
+            EXPECT_FALSE(VariantKeywords::isVariantKeyword(kind.keyword + " ", withName)) << "exactly";
+            EXPECT_EQ(VariantKeywords::isVariantKeyword("@default", withName), withName);
         }
-        EXPECT_EQ(VariantKeywords::isVariantKeyword("@default", withName), withName);
     }
 }
 
