@@ -46,13 +46,6 @@ Nodes executed(const SymbolicExprTable& table, SymbolicExprId id, bool bottomUp 
     return recorder.visited;
 }
 
-Nodes nodesOf(const SymbolicExprTable& table, const std::vector<SymbolicExprId>& ids) {
-    Nodes nodes;
-    for (const SymbolicExprId id : ids)
-        nodes.push_back(table.get(id));
-    return nodes;
-}
-
 /// The nodes below one, by recursion; nothing where there are very many.
 std::optional<Nodes> expected(NumberedTable& table, SymbolicExprId root, bool bottomUp) {
     Nodes nodes;
@@ -104,7 +97,7 @@ TEST(Visiting, WhatIsNotThereIsNotVisited) {
                 ElementsAreArray(Nodes{table.get(x), table.get(x), table.get(x), table.get(2), &stranger}));
     EXPECT_THAT(accepted(table, forward), ElementsAreArray(Nodes{&forward}));
     EXPECT_THAT(accepted(table, SymbolicNotExpr(other, 2U)), testing::SizeIs(1));
-    EXPECT_EQ(executed(table, 1), nodesOf(table, {1}));
+    EXPECT_EQ(executed(table, 1), Nodes{table.get(1)});
 }
 
 } // namespace

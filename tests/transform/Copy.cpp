@@ -1,7 +1,6 @@
 // Copies of expressions with the values of their symbols, and expressions in the place of others.
 #include "base/transform/Copy.hpp"
 #include "base/transform/Replacement.hpp"
-#include "tests/support/AnyNode.hpp"
 #include "tests/support/Parsing.hpp"
 #include "tests/support/RandomExpression.hpp"
 #include "tests/support/StructureNumbers.hpp"
