@@ -19,14 +19,19 @@ using Op = SymbolicOp;
 const std::vector<Op> operators{Op::Plus, Op::Minus,  Op::Divide,    Op::Power, Op::And,     Op::Equal,
                                 Op::Not,  Op::Modulo, Op::Transpose, Op::Or,    Op::FcnCall, Op::DimsND};
 
+class PrintBounds : public testing::Test {
+protected:
+    SymbolicExprTable table;
+    Trees tree{table};
+    SymbolicExprPrinter printer{table, true};
+};
+
 int sign(int order) {
     return (order > 0) - (order < 0);
 }
 
-TEST(PrintOrder, AgreesWithTheTextsAndIsAnOrder) {
+TEST_F(PrintBounds, AgreesWithTheTextsAndIsAnOrder) {
     std::mt19937_64 random(3);
-    SymbolicExprTable table;
-    const Trees tree{table};
     std::vector<SymbolicExprId> ids;
     for (int i = 0; i < 150; ++i) {
         ids.push_back(randomTree(table, random, operators, 1 + i % 6));
@@ -42,7 +47,6 @@ TEST(PrintOrder, AgreesWithTheTextsAndIsAnOrder) {
     std::ranges::sort(ids);
     ids.erase(std::unique(ids.begin(), ids.end()), ids.end());
 
-    const SymbolicExprPrinter printer(table, true);
     for (const SymbolicExprId a : ids) {
         for (const SymbolicExprId b : ids) {
             const int order = sign(printer.compareUsingCache(a, b));
@@ -59,7 +63,7 @@ TEST(PrintOrder, AgreesWithTheTextsAndIsAnOrder) {
             ASSERT_LT(printer.compareUsingCache(ids[i], ids[j]), 0);
 }
 
-TEST(PrintOrder, DoesNotDependOnWhatWasInternedWhen) {
+TEST(PrintHistory, DoesNotDependOnWhatWasInternedWhen) {
     const auto sorted = [](unsigned history) {
         SymbolicExprTable table;
         const Trees tree{table};
@@ -93,10 +97,8 @@ TEST(PrintOrder, DoesNotDependOnWhatWasInternedWhen) {
         EXPECT_EQ(sorted(history), once);
 }
 
-TEST(PrintOrder, StructureDecidesBeyondTheBound) {
+TEST_F(PrintBounds, StructureDecidesBeyondTheBound) {
     for (const std::size_t length : {limits::orderedTextBytes - 1, limits::orderedTextBytes}) {
-        SymbolicExprTable table;
-        const Trees tree{table};
         const SymbolicExprId name = tree.name(std::string(length, 'n'));
         const SymbolicExprId product =
             tree(Op::Multiply, name, name); // '*' is before '+', addition before multiplication
@@ -106,9 +108,7 @@ TEST(PrintOrder, StructureDecidesBeyondTheBound) {
     }
 }
 
-TEST(PrintOrder, GiantTexts) {
-    SymbolicExprTable table;
-    const Trees tree{table};
+TEST_F(PrintBounds, GiantTexts) {
     const auto doubled = [&](SymbolicExprId id) { return tree.doubled(Op::Plus, id); };
     const auto sum = [&](int changed) {
         SymbolicExprId id = tree.name("x");
@@ -121,7 +121,6 @@ TEST(PrintOrder, GiantTexts) {
             id = tree(Op::Power, tree.name("x"), id);
         return id;
     };
-    const SymbolicExprPrinter printer(table, true);
     const auto expectLess = [&](SymbolicExprId a, SymbolicExprId b) {
         EXPECT_LT(printer.compareUsingCache(a, b), 0);
         EXPECT_GT(printer.compareUsingCache(b, a), 0);
@@ -144,11 +143,8 @@ TEST(PrintOrder, GiantTexts) {
 
 constexpr int deep = 1'000'000;
 
-TEST(PrintBounds, TextAtTheBoundAndOneByteBeyond) {
-    SymbolicExprTable table;
-    const Trees tree{table};
+TEST_F(PrintBounds, TextAtTheBoundAndOneByteBeyond) {
     const SymbolicExprId id = tree.doubled(Op::FcnCall1U, tree.name("x"), 10);
-    SymbolicExprPrinter printer(table, true);
     const std::string text = printer(id);
     EXPECT_EQ(text.size(), printer.textLength(id));
     printer.setTextBound(text.size());
@@ -161,11 +157,8 @@ TEST(PrintBounds, TextAtTheBoundAndOneByteBeyond) {
     EXPECT_EQ(printer(tree.name("x")), "x") << "usable after the error";
 }
 
-TEST(PrintBounds, DoublingGraphsAreMeasuredByTheirNodes) {
-    SymbolicExprTable table;
-    const Trees tree{table};
+TEST_F(PrintBounds, DoublingGraphsAreMeasuredByTheirNodes) {
     const SymbolicExprId quotient = tree(Op::Divide, tree.name("x"), tree.name("y"));
-    const SymbolicExprPrinter printer(table, true);
     // x/y&&x/y is 8 bytes; each further level doubles and adds && and two parentheses.
     EXPECT_EQ(printer.textLength(tree.doubled(Op::And, quotient, 55)), (std::uint64_t{6} << 55U) - 4);
     for (const Op op : {Op::And, Op::BitAnd, Op::ShiftRight}) {
@@ -177,7 +170,7 @@ TEST(PrintBounds, DoublingGraphsAreMeasuredByTheirNodes) {
     }
 }
 
-TEST(PrintBounds, DeepSpines) {
+TEST(PrintDepth, DeepSpines) {
     for (const Op op : {Op::Plus, Op::Modulo}) {
         for (const bool right : {false, true}) {
             SymbolicExprTable table;
@@ -205,9 +198,7 @@ TEST(PrintBounds, DeepSpines) {
     EXPECT_GT(SymbolicExprPrinter(table, true)(id).size(), std::size_t{3} * deep);
 }
 
-TEST(PrintBounds, WideNodesAndLongNames) {
-    SymbolicExprTable table;
-    const Trees tree{table};
+TEST_F(PrintBounds, WideNodesAndLongNames) {
     const std::string name(3'000'000, 'n');
     const std::vector<SymbolicExprId> inputs(200'000, tree.name("x"));
     EXPECT_EQ(SymbolicExprPrinter(table, false)(tree.name(name)), name);
@@ -219,13 +210,10 @@ TEST(PrintBounds, WideNodesAndLongNames) {
     EXPECT_EQ(SymbolicExprPrinter(table, true)(tree(Op::FcnCall, std::vector<SymbolicExprId>{})), "()");
 }
 
-TEST(PrintBounds, IdentifiersThatAreNotOfTheTable) {
-    SymbolicExprTable table;
-    const Trees tree{table};
+TEST_F(PrintBounds, IdentifiersThatAreNotOfTheTable) {
     const SymbolicExprId x = tree.name("x");
     const SymbolicExprId half = tree(Op::Plus, x, SymbolicExprId{77}); // its operand comes later, if ever
     const SymbolicExprId whole = tree(Op::And, x, half);
-    const SymbolicExprPrinter printer(table, true);
     for (const SymbolicExprId id : {invalidId, SymbolicExprId{table.size()}, half, whole}) {
         EXPECT_THROW(static_cast<void>(printer(id)), std::out_of_range);
         EXPECT_THROW(static_cast<void>(printer.printIdUsingCache(id)), std::out_of_range);

@@ -165,22 +165,13 @@ TEST_F(Texts, EveryAnswerFollowsNewAliases) {
                                       std::string(1 + random() % 3, "mnyz"[random() % 4]));
             const SymbolicExprId one = ids[random() % ids.size()], two = ids[random() % ids.size()];
             const SymbolicExprPrinter fresh(table, quill, false, InlineVariantParameterAliasPrinterPredicate(other));
-            switch (random() % 5) {
-            case 0:
-                ASSERT_EQ(printer.printIdUsingCache(one), fresh(one));
-                break;
-            case 1:
-                ASSERT_EQ(printer.textLength(one), fresh(one).size());
-                break;
-            case 2:
-                ASSERT_EQ(printer.compareUsingCache(one, two), fresh.compareUsingCache(one, two));
-                break;
-            case 3:
-                ASSERT_EQ(printer(one), fresh(one));
-                break;
-            default:
-                ASSERT_EQ(visitor.print(one), fresh(one));
-            }
+            const std::uint64_t way = random() % 5;
+            ASSERT_TRUE(way == 0   ? printer.printIdUsingCache(one) == fresh(one)
+                        : way == 1 ? printer.textLength(one) == fresh(one).size()
+                        : way == 2 ? printer.compareUsingCache(one, two) == fresh.compareUsingCache(one, two)
+                        : way == 3 ? printer(one) == fresh(one)
+                                   : visitor.print(one) == fresh(one))
+                << way << " " << fresh(one);
             ASSERT_EQ(plain.printIdUsingCache(a), "a");
         }
     }
