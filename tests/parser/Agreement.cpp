@@ -1,8 +1,10 @@
 // The grammar against an independent hand-written parser.
 #include "base/VTSymbolicExpr.hpp"
+#include "base/print/ExpressionPrinter.hpp"
 #include "benchmarks/ConditionReader.hpp"
 #include "tests/support/Corpus.hpp"
 #include "tests/support/Parsing.hpp"
+#include "tests/support/RandomExpression.hpp"
 #include "tests/support/TreeText.hpp"
 
 #include <gtest/gtest.h>
@@ -98,47 +100,46 @@ std::string tokens(std::mt19937_64& random) {
     return text;
 }
 
-// NOLINTBEGIN(misc-no-recursion): six levels
-
-/// A text of every construct that is a condition in C.
-std::string condition(std::mt19937_64& random, unsigned depth) {
-    const auto below = [&](std::size_t bound) { return static_cast<std::size_t>(random() % bound); };
-    const auto inner = [&] { return condition(random, depth - 1); };
-    const auto list = [&] { return inner() + (below(2) == 0 ? ", " + inner() : ""); };
-    switch (below(depth == 0 ? 4 : 11)) {
-    case 0:
-        return std::to_string(static_cast<std::int32_t>(random()));
-    case 1:
-        return std::to_string(below(256)) + ".5";
-    case 2:
-        return "m.field . field2";
-    case 3:
-        return std::string(1, static_cast<char>('a' + below(6)));
-    case 4:
-        return std::string(1, "-!~+"[below(4)]) + inner();
-    case 5:
-        return "(" + inner() + ")";
-    case 6:
-        return "f(" + (below(3) == 0 ? " " : list()) + ")";
-    case 7:
-        return "[" + list() + "]";
-    default:
-        return inner() + " " + infixes[below(infixes.size())] + inner();
+/// Compares a text and then one that has lost, doubled or exchanged a few of its bytes.
+void expectAgreement(SymbolicExprTable& table, std::string text, std::mt19937_64& random) {
+    const auto pick = [&](std::size_t count) { return static_cast<std::size_t>(random() % count); };
+    EXPECT_EQ(difference(table, text, true, true), "");
+    for (std::size_t edits = 1 + pick(3); edits > 0 && !text.empty(); --edits) {
+        const std::size_t at = pick(text.size());
+        switch (pick(3)) {
+        case 0:
+            text.erase(at, 1 + pick(3));
+            break;
+        case 1:
+            text.insert(at, text.substr(pick(text.size()), 1 + pick(4)));
+            break;
+        default:
+            text[at] = "()!-~&|=<.,1a+ "[pick(15)];
+        }
     }
+    EXPECT_EQ(difference(table, text, true, true) + difference(table, text, false, false), "");
 }
-
-// NOLINTEND(misc-no-recursion)
 
 TEST(Agreement, OnConditions) {
     std::mt19937_64 random(8);
-    std::size_t whole = 0;
-    for (unsigned round = 0; round < 4000; ++round) {
-        const std::string text = condition(random, round % 7);
-        ASSERT_EQ(difference(text), "");
+    std::vector<SymbolicOp> operators{SymbolicOp::FcnCall, SymbolicOp::MemberValue, SymbolicOp::DimsND};
+    for (const OperatorInfo& row : operatorTable())
+        if (row.op < SymbolicOp::Power && (row.form == OperatorForm::Prefix || row.form == OperatorForm::Infix))
+            operators.push_back(row.op);
+    for (int round = 0; round < 4000; ++round) {
+        SymbolicExprTable printed;
         SymbolicExprTable table;
-        whole += parse(table, text, false, false).error ? 0U : 1U;
+        const SymbolicExprId id =
+            randomTree(printed, random, operators, round % 7, [&] { // zeros of either sign are one
+                const auto value = static_cast<int>(random());
+                return value % 3 == 0   ? SymbolicIntValue(printed, value).getId(printed)
+                       : value % 3 == 1 ? SymbolicDoubleValue(printed, value * 0.25 + 0.125).getId(printed)
+                                        : SymbolicString(printed, value % 2 == 0 ? "a" : "b1").getId(printed);
+            });
+        const std::string text = SymbolicExprPrinter(printed, false, round % 2 == 0)(id);
+        ASSERT_FALSE(parse(table, text).error) << text;
+        expectAgreement(table, text, random);
     }
-    EXPECT_GT(whole, 3500U);
 }
 
 TEST(Agreement, OnTokens) {
@@ -179,30 +180,14 @@ TEST(Agreement, OnEveryByte) {
     }
 }
 
-/// Real conditions and, from each of them, one that has lost, doubled or exchanged a few bytes.
 TEST(Agreement, OnRealConditions) {
-    std::minstd_rand random(1);
-    const auto pick = [&](std::size_t count) { return static_cast<std::size_t>(random()) % count; };
+    std::mt19937_64 random(1);
     for (const CorpusFile& file : corpusFiles) {
         SymbolicExprTable table;
         std::size_t readable = 0;
-        for (std::string line : corpusLines(file.name)) {
-            EXPECT_EQ(difference(table, line, true, true), "");
+        for (const std::string& line : corpusLines(file.name)) {
+            expectAgreement(table, line, random);
             readable += parse(table, line).error ? 0U : 1U;
-            for (std::size_t edits = 1 + pick(3); edits > 0 && !line.empty(); --edits) {
-                const std::size_t at = pick(line.size());
-                switch (pick(3)) {
-                case 0:
-                    line.erase(at, 1 + pick(3));
-                    break;
-                case 1:
-                    line.insert(at, line.substr(pick(line.size()), 1 + pick(4)));
-                    break;
-                default:
-                    line[at] = "()!-~&|=<.,1a "[pick(14)];
-                }
-            }
-            EXPECT_EQ(difference(table, line, true, true) + difference(table, line, false, false), "");
         }
         EXPECT_EQ(readable, file.readable) << file.name;
     }

@@ -35,27 +35,20 @@ Tree rule(std::int32_t code, const std::array<Tree, Size>& children) {
 TEST(QuillBounds, DeepAndBroadTrees) {
     constexpr std::size_t count = 200'000;
 
-    const struct {
-        std::string text;
-        std::size_t nodes; ///< that the table holds then
-    } cases[] = {
+    const std::pair<std::string, std::size_t> cases[] = {
+        // a text and the number of nodes that the table holds then
         {times(count, "A+") + "1", count + 2},  {times(count, "A && ") + "B", count + 2},
         {"A" + times(count, ".b"), count + 2},  {"A" + times(count, ".b(1)"), 2 * count + 3},
         {"f" + times(count, "(1)"), count + 2}, {"A" + times(count, "'"), count + 1},
         {"f(" + times(count, "A,") + "B)", 4},  {"[" + times(count, "A ") + "]", 3},
-        {"{" + times(count, "A;") + "}", 4},
-    };
+        {"{" + times(count, "A;") + "}", 4}};
 
     for (const auto& [text, nodes] : cases) {
         SymbolicExprTable table;
         VTSymbolicExprErrorChecker checker;
-        const SymbolicExprId id = SymbolicExprFromQParseTreeBlockVariants(table, checker)(text);
-        EXPECT_TRUE(table.has(id)) << text.substr(0, 20);
+        EXPECT_TRUE(table.has(SymbolicExprFromQParseTreeBlockVariants(table, checker)(text))) << text.substr(0, 20);
         EXPECT_EQ(table.size(), nodes) << text.substr(0, 20);
     }
-}
-
-TEST(QuillBounds, Nesting) {
     EXPECT_FALSE(readCondition(times(limits::nesting, "(") + "A" + times(limits::nesting, ")")).thrown);
     EXPECT_TRUE(readCondition(times(limits::nesting + 1, "(") + "A" + times(limits::nesting + 1, ")")).thrown);
 }
@@ -153,63 +146,43 @@ TEST(QuillBounds, Dump) {
 TEST(QuillSlots, AreWhereHostsCallThem) {
     using Base = SymbolicExprFromQParseTree;
     using Variants = SymbolicExprFromQParseTreeBlockVariants;
-    const std::ptrdiff_t slots[] = {slotOf(&Base::supportIntegerOnly),
-                                    slotOf(&Base::shouldCreateIntValueNodeForIntegerValue),
-                                    slotOf(&Base::supportLogicalValues),
-                                    slotOf(&Base::supportOperator),
-                                    4, // the destructor's two
-                                    5,
-                                    slotOf(&Base::enableDiagnostics),
-                                    slotOf(&Base::reportInvalidLiteralValue),
-                                    slotOf(&Base::reportNonScalarValue),
-                                    slotOf(&Base::reportComplexValue),
-                                    slotOf(&Base::reportLogicalValue),
-                                    slotOf(&Base::reportNonIntegerLiteralValue),
-                                    slotOf(&Base::reportNonIntegerValue),
-                                    slotOf(&Base::reportUnsupportedValue),
-                                    slotOf(&Base::reportDiagnostic),
-                                    slotOf(&Base::visitTerminal),
-                                    slotOf(&Base::getFunctionNameSymId),
-                                    slotOf(&Base::resolveIdentifier),
-                                    slotOf(&Base::supportFcn),
-                                    slotOf(&Base::getNumberFromQxArray),
-                                    slotOf(&Base::visitNonTerminal),
-                                    slotOf(&Base::reportUnhandledExpr),
-                                    slotOf(&Base::reportDivisionExpr),
-                                    slotOf(&Base::reportUnsupportedFcn),
-                                    slotOf(&Base::reportInvalidNumArgs),
-                                    slotOf(&Base::reportInvalidExpr),
-                                    slotOf(&Base::visitMatrixNode),
-                                    slotOf(&Base::visitMDot),
-                                    slotOf(&Base::destroy),
-                                    slotOf(&Base::destroyAndFree),
-                                    slotOf(&Variants::visitCellIndexNode),
-                                    slotOf(&Variants::visitCellArrayNode),
-                                    slotOf(&Variants::parseArrayBodyNode)};
+    const std::ptrdiff_t slots[] = {
+        slotOf(&Base::supportIntegerOnly), slotOf(&Base::shouldCreateIntValueNodeForIntegerValue),
+        slotOf(&Base::supportLogicalValues), slotOf(&Base::supportOperator),
+        // 4 and 5 are the destructor's.
+        4, 5, slotOf(&Base::enableDiagnostics), slotOf(&Base::reportInvalidLiteralValue),
+        slotOf(&Base::reportNonScalarValue), slotOf(&Base::reportComplexValue), slotOf(&Base::reportLogicalValue),
+        slotOf(&Base::reportNonIntegerLiteralValue), slotOf(&Base::reportNonIntegerValue),
+        slotOf(&Base::reportUnsupportedValue), slotOf(&Base::reportDiagnostic), slotOf(&Base::visitTerminal),
+        slotOf(&Base::getFunctionNameSymId), slotOf(&Base::resolveIdentifier), slotOf(&Base::supportFcn),
+        slotOf(&Base::getNumberFromQxArray), slotOf(&Base::visitNonTerminal), slotOf(&Base::reportUnhandledExpr),
+        slotOf(&Base::reportDivisionExpr), slotOf(&Base::reportUnsupportedFcn), slotOf(&Base::reportInvalidNumArgs),
+        slotOf(&Base::reportInvalidExpr), slotOf(&Base::visitMatrixNode), slotOf(&Base::visitMDot),
+        slotOf(&Base::destroy), slotOf(&Base::destroyAndFree), slotOf(&Variants::visitCellIndexNode),
+        slotOf(&Variants::visitCellArrayNode), slotOf(&Variants::parseArrayBodyNode)};
     for (std::ptrdiff_t slot = 0; slot < std::ssize(slots); ++slot)
         EXPECT_EQ(slots[slot], slot);
 }
 
 TEST(QuillSlots, EndAConverter) {
     struct Counted final : SymbolicExprFromQParseTreeBlockVariants {
-        Counted(SymbolicExprTable& table, VTSymbolicExprErrorChecker& checker, int& ends)
-            : SymbolicExprFromQParseTreeBlockVariants(table, checker),
-              ends_(ends) {}
+        using SymbolicExprFromQParseTreeBlockVariants::SymbolicExprFromQParseTreeBlockVariants;
 
-        ~Counted() override { ++ends_; }
+        ~Counted() override { ++*ends; }
 
-        int& ends_;
+        int* ends = nullptr;
     };
 
     SymbolicExprTable table;
     VTSymbolicExprErrorChecker checker;
     int ends = 0;
-    SymbolicExprFromQParseTree* const onHeap = new Counted(table, checker, ends);
-    onHeap->destroyAndFree();
-    EXPECT_EQ(ends, 1);
     alignas(Counted) std::array<std::byte, sizeof(Counted)> memory;
-    SymbolicExprFromQParseTree* const inPlace = new (memory.data()) Counted(table, checker, ends);
-    inPlace->destroy();
+    Counted* const converters[] = {new Counted(table, checker), new (memory.data()) Counted(table, checker)};
+    for (Counted* const converter : converters)
+        converter->ends = &ends;
+    static_cast<SymbolicExprFromQParseTree*>(converters[0])->destroyAndFree();
+    EXPECT_EQ(ends, 1);
+    static_cast<SymbolicExprFromQParseTree*>(converters[1])->destroy();
     EXPECT_EQ(ends, 2);
 }
 

@@ -5,6 +5,7 @@
 
 #include <gtest/gtest.h>
 #include <random>
+#include <tuple>
 
 namespace VT::Testing {
 namespace {
@@ -12,14 +13,19 @@ namespace {
 constexpr std::size_t bound = 256;
 constexpr std::size_t mebibyte = std::size_t{1} << 20U;
 
-TEST(QuillBounds, NestingAtTheBoundAndOneBeyond) {
-    struct Nest {
-        std::string open;
-        std::string close;
-        std::size_t place; ///< of the bracket in `open` that is one too many
-    };
+/// Whether the text has a tree.
+bool expectSoundAnswer(QuillReading& reading, const std::string& text) {
+    const QuillNode* const tree = reading.read(text);
+    const auto& [position, reason] = reading.failure();
+    EXPECT_EQ(tree == nullptr ? "" : shapeError(*tree, text), "") << text.substr(0, 200);
+    EXPECT_EQ(reason.empty(), tree != nullptr) << text.substr(0, 200);
+    EXPECT_TRUE(tree != nullptr || position <= text.size()) << text.substr(0, 200);
+    return tree != nullptr;
+}
 
-    const std::vector<Nest> nests = {
+TEST(QuillBounds, NestingAtTheBoundAndOneBeyond) {
+    // What opens, what closes, and the place of the bracket that is one too many.
+    const std::vector<std::tuple<std::string, std::string, std::size_t>> nests = {
         {"(", ")", 0},      {"[", "]", 0},     {"{", "}", 0},    {"f(", ")", 1},           {"c{", "}", 1},
         {"a || (", ")", 5}, {"a^(b+", ")", 2}, {"@(x) ", "", 0}, {"2^-@(x, y) x*", "", 3}, {"1:(", ")", 2}};
     for (const std::size_t nesting : {std::size_t{1}, std::size_t{7}, bound}) {
@@ -50,14 +56,8 @@ TEST(QuillBounds, NestingAtTheBoundAndOneBeyond) {
 }
 
 TEST(QuillBounds, LongTexts) {
-    struct Shape {
-        std::string front;
-        std::string piece;
-        std::string back;
-        bool read;
-    };
-
-    const std::vector<Shape> shapes = {
+    // The beginning, what is repeated, the end, and whether it is read.
+    const std::vector<std::tuple<std::string, std::string, std::string, bool>> shapes = {
         {"a", "+a", "", true},     {"a", "^-a", "", true},    {"a", "'", "", true},        {"a", ".b", "", true},
         {"f", "()", "", true},     {"c", "{1}", "", true},    {"1", ":1", "", true},       {"[", "1 ", "]", true},
         {"[", ";", "]", true},     {"f(", "1,", "1)", true},  {"", "n", "", true},         {"1.", "7", "", true},
@@ -69,16 +69,8 @@ TEST(QuillBounds, LongTexts) {
         {"", "1e", "", false},     {"a", "+%\n", "", false},  {"", "\xFF", "", false},     {"a...", "a", "+", true}};
     QuillReading reading;
     for (const auto& [front, piece, back, isRead] : shapes) {
-        std::string text = front;
-        text += times((mebibyte - front.size() - back.size()) / piece.size(), piece);
-        text += back;
-        const QuillNode* const tree = reading.read(text);
-        EXPECT_EQ(tree != nullptr, isRead) << piece << reading.failure().reason;
-        if (tree == nullptr) {
-            EXPECT_LE(reading.failure().position, text.size()) << piece;
-            continue;
-        }
-        EXPECT_EQ(shapeError(*tree, text), "") << piece;
+        const std::size_t count = (mebibyte - front.size() - back.size()) / piece.size();
+        EXPECT_EQ(expectSoundAnswer(reading, front + times(count, piece) + back), isRead) << piece;
     }
 }
 
@@ -86,9 +78,11 @@ TEST(QuillBounds, LongTexts) {
 TEST(QuillBounds, TreesOfOneParser) {
     const auto parser = PARSER_T<char>::create(bound);
     const std::string longText = times(100000, "a+") + "a";
-    const QuillNode* const first = parser->generate_parse_tree("a == 1");
+    const char upToNul[] = "a == 1\0 )";
+    const QuillNode* const first = parser->generate_parse_tree(upToNul);
     const QuillNode* const second = parser->generate_parse_tree(longText.data(), longText.size());
-    EXPECT_EQ(parser->generate_parse_tree("a +"), nullptr);
+    EXPECT_EQ(parser->generate_parse_tree(upToNul, sizeof upToNul - 1), nullptr);
+    EXPECT_EQ(parser->failure().position, 6U);
     const QuillNode* const third = parser->generate_parse_tree("b'");
     parser->delete_parse_tree(second);
     EXPECT_EQ(treeText(*first), "(103 a 1)");
@@ -96,20 +90,8 @@ TEST(QuillBounds, TreesOfOneParser) {
     const QuillNode* const fourth = parser->generate_parse_tree("[c d]");
     EXPECT_EQ(treeText(*third), "(78 b)");
     EXPECT_EQ(treeText(*fourth), "(27 (302 c d))");
-    parser->delete_parse_tree(third);
-    parser->delete_parse_tree(fourth);
-}
-
-/// Whether the text has a tree.
-bool expectSoundAnswer(QuillReading& reading, const std::string& text) {
-    if (const QuillNode* const tree = reading.read(text)) {
-        EXPECT_EQ(shapeError(*tree, text), "") << text;
-        EXPECT_EQ(reading.failure().reason, "") << text;
-        return true;
-    }
-    EXPECT_LE(reading.failure().position, text.size()) << text;
-    EXPECT_NE(reading.failure().reason, "") << text;
-    return false;
+    for (const QuillNode* const tree : {third, fourth, static_cast<const QuillNode*>(nullptr)})
+        parser->delete_parse_tree(tree);
 }
 
 const std::vector<std::string> pieces = {

@@ -19,88 +19,96 @@ void expectTrees(const std::vector<std::string>& cases, const std::vector<std::s
 }
 
 TEST(QuillConstructs, Operands) {
-    std::vector<std::string> cases = {"(x) => (43 x)", "((x)) => (43 (43 x))"};
-    const auto addLeaves = [&cases](const std::vector<std::string>& texts) {
-        for (const std::string& text : texts)
-            cases.push_back(text + " => " + text);
-    };
-    addLeaves({"x", "_x9_Y", "endx"});
-    addLeaves({"12", "1.5", ".5", "5.", "1e3", "1.5E-3", "5.e+3", "0x1F", "0", "2i", "1.5e3j"});
-    addLeaves({"'it''s'", R"("it's ""so""")", "''", "''''", "'% no comment ...'", "'\xC3\xA4'"});
+    std::vector<std::string> cases = {"(x) => (43 x)", "((x)) => (43 (43 x))",
+                                      // What a dot belongs to
+                                      "5.^2 => (77 5 2)", "5.*2 => (91 5 2)", "5./2 => (93 5 2)", R"(5.\2 => (95 5 2))",
+                                      "5.' => (79 5)", "5..^2 => (77 5. 2)", "5..' => (79 5.)", "1.5.*2 => (91 1.5 2)",
+                                      "5...\n+1 => (49 5 1)", "5....\n+1 => (49 5 1)"};
+    for (const std::string leaf :
+         {"x", "_x9_Y", "endx", "12", "1.5", ".5", "5.", "1e3", "1.5E-3", "5.e+3", "0x1F", "0", "2i", "1.5e3j",
+          // Quoted
+          "'it''s'", R"("it's ""so""")", "''", "''''", "'% no comment ...'", "'\xC3\xA4'"})
+        cases.push_back(leaf + " => " + leaf);
     expectTrees(cases);
-    // What a dot belongs to.
-    expectTrees({"5.^2 => (77 5 2)", "5.*2 => (91 5 2)", "5./2 => (93 5 2)", R"(5.\2 => (95 5 2))", "5.' => (79 5)",
-                 "5..^2 => (77 5. 2)", "5..' => (79 5.)", "1.5.*2 => (91 1.5 2)", "5...\n+1 => (49 5 1)",
-                 "5....\n+1 => (49 5 1)"});
 }
 
-// Infix operators and white space around them are compared with another reading in Precedence.cpp.
-TEST(QuillConstructs, Operators) {
-    expectTrees({"-a^2 => (44 (76 a 2))", "a || b && c || d => (130 (130 a (136 b c)) d)",
-                 "2^-~+a' => (78 (76 2 (44 (46 a))))", "-2^-a*b => (90 (44 (76 2 (44 a))) b)",
+/// Printed trees of operators in operators are read back in tests/print.
+TEST(QuillConstructs, EveryPairOfOperators) {
+    struct Operator {
+        std::string text;
+        int code; ///< 0 for the plus sign, which leaves no rule
+        int level = 0;
+    };
+
+    constexpr int power = 9;
+    constexpr int range = 304;
+    const std::vector<Operator> infixes = {
+        {"||", 130, 0}, {"&&", 136, 1}, {"|", 132, 2},    {"&", 134, 3},    {"==", 103, 4}, {"~=", 104, 4},
+        {"!=", 104, 4}, {"<", 99, 5},   {"<=", 100, 5},   {">", 101, 5},    {">=", 102, 5}, {":", range, 6},
+        {"+", 49, 7},   {"-", 50, 7},   {"*", 90, 8},     {"/", 92, 8},     {"\\", 94, 8},  {".*", 91, 8},
+        {"./", 93, 8},  {".\\", 95, 8}, {"^", 76, power}, {".^", 77, power}};
+    const auto rule = [](const Operator& op, const std::string& inputs) {
+        return op.code == 0 ? inputs : "(" + std::to_string(op.code) + " " + inputs + ")";
+    };
+    std::vector<std::string> cases;
+    for (const std::string blank : {"", " ", "\t", "\n", "% c\n", "... c\n", "  "})
+        for (const Operator& first : infixes) {
+            const std::string open = "a" + blank + first.text + blank;
+            for (const Operator& second : infixes)
+                cases.push_back(open + "b" + blank + second.text + blank + "c => " +
+                                (first.code == range && second.code == range ? "(305 a b c)"
+                                 : second.level > first.level                ? rule(first, "a " + rule(second, "b c"))
+                                                              : rule(second, rule(first, "a b") + " c")));
+            for (const Operator& prefix : {Operator{"-", 44}, {"~", 46}, {"!", 46}, {"+", 0}}) {
+                cases.push_back(open + prefix.text + blank + "b => " + rule(first, "a " + rule(prefix, "b")));
+                cases.push_back(
+                    prefix.text + blank + open + "b => " +
+                    (first.level == power ? rule(prefix, rule(first, "a b")) : rule(first, rule(prefix, "a") + " b")));
+            }
+            for (const Operator& postfix : {Operator{"'", 78}, {".'", 79}}) {
+                cases.push_back(open + "b" + postfix.text + " => " +
+                                (first.level == power ? rule(postfix, rule(first, "a b"))
+                                                      : rule(first, "a " + rule(postfix, "b"))));
+                cases.push_back("a" + postfix.text + blank + first.text + blank + "b => " +
+                                rule(first, rule(postfix, "a") + " b"));
+            }
+        }
+    expectTrees(cases);
+    expectTrees({"2^-~+a' => (78 (76 2 (44 (46 a))))", "-2^-a*b => (90 (44 (76 2 (44 a))) b)",
                  "a.b'^c.d(1) => (76 (78 (83 a b)) (85 (83 c d) (303 1)))", "a:b:c:d:e => (305 (305 a b c) d e)",
-                 "a == 1:2:3 && b => (136 (103 a (305 1 2 3)) b)"});
+                 "a:b:c:d => (304 (305 a b c) d)", "1 -a'.' => (50 1 (79 (78 a)))",
+                 "(@(p)p)+[1] => (49 (43 (306 (307 p) p)) (27 (302 1)))"});
 }
 
-// Calls, matrices and functions of any operands are compared there too.
 TEST(QuillConstructs, CallsListsAndFunctions) {
-    expectTrees({"f() => (85 f (303))",
-                 "f (a) => (85 f (303 a))",
-                 "(a)(1) => (85 (43 a) (303 1))",
-                 "[1 2](1) => (85 (27 (302 1 2)) (303 1))",
-                 "f(x).y => (83 (85 f (303 x)) y)",
-                 "c{} => (300 c (303))",
-                 "a . b(2).c{1} => (300 (83 (85 (83 a b) (303 2)) c) (303 1))",
+    expectTrees({// Calls and fields
+                 "f() => (85 f (303))", "f (a) => (85 f (303 a))", "(a)(1) => (85 (43 a) (303 1))",
+                 "[1 2](1) => (85 (27 (302 1 2)) (303 1))", "f(x).y => (83 (85 f (303 x)) y)", "c{} => (300 c (303))",
+                 "a . b(2).c{1} => (300 (83 (85 (83 a b) (303 2)) c) (303 1))", "c{end} => (300 c (303 end))",
                  "a(end - 1, [end end']) => (85 a (303 (50 end 1) (27 (302 end (78 end)))))",
-                 "c{end} => (300 c (303 end))",
-                 "[ ] => (27 (302))",
-                 "{} => (301 (302))",
-                 "[1;] => (27 (302 1) (302))",
-                 "{;} => (301 (302) (302))",
+                 // Lists
+                 "[ ] => (27 (302))", "{} => (301 (302))", "[1;] => (27 (302 1) (302))", "{;} => (301 (302) (302))",
                  "{1}{1} => (300 (301 (302 1)) (303 1))",
-                 "@ ( p, q ) p => (306 (307 p q) p)",
-                 "@() 1 => (306 (307) 1)",
+                 // Functions
+                 "@ ( p, q ) p => (306 (307 p q) p)", "@() 1 => (306 (307) 1)", "@f == @g => (103 (308 f) (308 g))",
                  "a + @(x) @(y) x + b => (49 a (306 (307 x) (306 (307 y) (49 x b))))",
-                 "@f == @g => (103 (308 f) (308 g))",
-                 " \t\n\v\f\ra\n => a",
-                 "a % rest ) ( ' => a",
-                 "a...\r\n+ b => (49 a b)",
-                 "a + % one\r b % two => (49 a b)",
-                 "%\xFF\n a => a",
-                 "a ... => a",
-                 "...\n...\n%\n%\na => a"});
+                 // White space, comments and continuations
+                 " \t\n\v\f\ra\n => a", "a % rest ) ( ' => a", "a...\r\n+ b => (49 a b)",
+                 "a + % one\r b % two => (49 a b)", "%\xFF\n a => a", "a ... => a", "...\n...\n%\n%\na => a"});
 }
 
 TEST(QuillConstructs, WhiteSpaceInBrackets) {
-    const std::vector<std::string> cases = {"1 2 => 1 2",
-                                            "1 -2 => 1 (44 2)",
-                                            "1 - 2 => (50 1 2)",
-                                            "1-2 => (50 1 2)",
-                                            "1 -%c\n2 => (50 1 2)",
-                                            "1...\n-2 => 1 (44 2)",
-                                            "1 - -2 => (50 1 (44 2))",
-                                            "1 --2 => 1 (44 (44 2))",
-                                            "a' b' => (78 a) (78 b)",
-                                            "a 'b' => a 'b'",
-                                            "a .' b => (79 a) b",
-                                            "a ~b => a (46 b)",
-                                            "a ~ b => a (46 b)",
-                                            "a ~= b => (104 a b)",
-                                            "a *b => (90 a b)",
-                                            "a .*b => (91 a b)",
-                                            "a (1) => a (43 1)",
-                                            "a(1) => (85 a (303 1))",
-                                            "a {1} => a (301 (302 1))",
-                                            "a .b => (83 a b)",
-                                            "a .5 => a .5",
-                                            "1,...\n2 => 1 2",
-                                            "(1 -2) 3 => (43 (50 1 2)) 3",
-                                            "f(a {1}) => (85 f (303 (300 a (303 1))))",
-                                            "@f 1 => (308 f) 1",
-                                            "1 @f => 1 (308 f)",
-                                            "@(x) x 1 => (306 (307 x) x) 1",
-                                            "@(x) - x => (306 (307 x) (44 x))",
-                                            "[1 -2] 3 => (27 (302 1 (44 2))) 3"};
+    const std::vector<std::string> cases = {
+        // Signs
+        "1 2 => 1 2", "1 -2 => 1 (44 2)", "1 - 2 => (50 1 2)", "1-2 => (50 1 2)", "1 -%c\n2 => (50 1 2)",
+        "1...\n-2 => 1 (44 2)", "1 - -2 => (50 1 (44 2))", "1 --2 => 1 (44 (44 2))", "1,...\n2 => 1 2",
+        // Quotes and other operators
+        "a' b' => (78 a) (78 b)", "a 'b' => a 'b'", "a .' b => (79 a) b", "a ~b => a (46 b)", "a ~ b => a (46 b)",
+        "a ~= b => (104 a b)", "a *b => (90 a b)", "a .*b => (91 a b)", "a .b => (83 a b)", "a .5 => a .5",
+        // Brackets and functions
+        "a (1) => a (43 1)", "a(1) => (85 a (303 1))", "a {1} => a (301 (302 1))", "(1 -2) 3 => (43 (50 1 2)) 3",
+        "f(a {1}) => (85 f (303 (300 a (303 1))))", "@f 1 => (308 f) 1", "1 @f => 1 (308 f)",
+        "@(x) x 1 => (306 (307 x) x) 1", "@(x) - x => (306 (307 x) (44 x))", "[1 -2] 3 => (27 (302 1 (44 2))) 3"};
     std::vector<std::string> all;
     for (const std::string& each : cases) {
         const auto& [text, elements] = sides(each);
@@ -193,18 +201,6 @@ TEST(QuillFailures, PlaceAndReason) {
     }
     EXPECT_NE(reading.read("a"), nullptr);
     EXPECT_EQ(reading.failure().reason, "");
-}
-
-TEST(QuillFailures, ATextUpToNul) {
-    const auto parser = PARSER_T<char>::create(256);
-    const char text[] = "a + b\0 )";
-    const QuillNode* const tree = parser->generate_parse_tree(text);
-    ASSERT_NE(tree, nullptr);
-    EXPECT_EQ(treeText(*tree), "(49 a b)");
-    parser->delete_parse_tree(tree);
-    EXPECT_EQ(parser->generate_parse_tree(text, sizeof text - 1), nullptr);
-    EXPECT_EQ(parser->failure().position, 5U);
-    parser->delete_parse_tree(nullptr);
 }
 
 } // namespace
