@@ -15,6 +15,8 @@
 namespace VT::Testing {
 namespace {
 
+using QuillBounds = QuillTest;
+
 using Tree = _Q_parse_tree_T<char>;
 
 Tree token(std::int32_t code, const char* text, std::uint32_t start = 0) {
@@ -32,7 +34,7 @@ Tree rule(std::int32_t code, const std::array<Tree, Size>& children) {
     return node;
 }
 
-TEST(QuillBounds, DeepAndBroadTrees) {
+TEST_F(QuillBounds, DeepAndBroadTrees) {
     constexpr std::size_t count = 200'000;
 
     const std::pair<std::string, std::size_t> cases[] = {
@@ -44,20 +46,15 @@ TEST(QuillBounds, DeepAndBroadTrees) {
         {"{" + times(count, "A;") + "}", 4}};
 
     for (const auto& [text, nodes] : cases) {
-        SymbolicExprTable table;
-        VTSymbolicExprErrorChecker checker;
-        EXPECT_TRUE(table.has(SymbolicExprFromQParseTreeBlockVariants(table, checker)(text))) << text.substr(0, 20);
-        EXPECT_EQ(table.size(), nodes) << text.substr(0, 20);
+        SymbolicExprTable fresh;
+        EXPECT_TRUE(fresh.has(SymbolicExprFromQParseTreeBlockVariants(fresh, checker)(text))) << text.substr(0, 20);
+        EXPECT_EQ(fresh.size(), nodes) << text.substr(0, 20);
     }
     EXPECT_FALSE(readCondition(times(limits::nesting, "(") + "A" + times(limits::nesting, ")")).thrown);
     EXPECT_TRUE(readCondition(times(limits::nesting + 1, "(") + "A" + times(limits::nesting + 1, ")")).thrown);
 }
 
-TEST(QuillBounds, TreesOfOtherHosts) {
-    SymbolicExprTable table;
-    VTSymbolicExprErrorChecker checker;
-    SymbolicExprFromQParseTree dimensions(table, checker);
-    SymbolicExprFromQParseTreeBlockVariants conditions(table, checker);
+TEST_F(QuillBounds, TreesOfOtherHosts) {
     const Tree a = token(40, "a");
     const Tree sign = token(1, "?");
     const std::array<Tree, 1> alone{a};
@@ -111,14 +108,11 @@ TEST(QuillBounds, TreesOfOtherHosts) {
     expectOneReport(condition, rule(301, alone), "UnhandledExpression(a, text, 0)@0");
 }
 
-TEST(QuillBounds, Dump) {
-    SymbolicExprTable table;
-    VTSymbolicExprErrorChecker checker;
-    SymbolicExprFromQParseTreeBlockVariants converter(table, checker);
+TEST_F(QuillBounds, Dump) {
     checker.disableDiagnostics();
     const auto dumpOf = [&](const char* text) {
         testing::internal::CaptureStdout();
-        converter(text, true);
+        conditions(text, true);
         return testing::internal::GetCapturedStdout();
     };
     EXPECT_EQ(dumpOf("f(A)+1"), "========Q-Parse tree for expression 'f(A)+1'\n"
@@ -135,7 +129,7 @@ TEST(QuillBounds, Dump) {
                                 "======================================================\n");
     EXPECT_EQ(dumpOf("A +"), "======Q-Parse tree not found for expression 'A +'\n");
     testing::internal::CaptureStdout();
-    converter("A");
+    conditions("A");
     EXPECT_EQ(testing::internal::GetCapturedStdout(), "");
 
     // Depth is shown, but does not make the text grow with its square.
@@ -143,7 +137,7 @@ TEST(QuillBounds, Dump) {
     EXPECT_LT(dumpOf(deep.c_str()).size(), 200 * deep.size());
 }
 
-TEST(QuillSlots, AreWhereHostsCallThem) {
+TEST_F(QuillBounds, SlotsAreWhereHostsCallThem) {
     using Base = SymbolicExprFromQParseTree;
     using Variants = SymbolicExprFromQParseTreeBlockVariants;
     const std::ptrdiff_t slots[] = {
@@ -164,7 +158,7 @@ TEST(QuillSlots, AreWhereHostsCallThem) {
         EXPECT_EQ(slots[slot], slot);
 }
 
-TEST(QuillSlots, EndAConverter) {
+TEST_F(QuillBounds, SlotsEndAConverter) {
     struct Counted final : SymbolicExprFromQParseTreeBlockVariants {
         using SymbolicExprFromQParseTreeBlockVariants::SymbolicExprFromQParseTreeBlockVariants;
 
@@ -173,8 +167,6 @@ TEST(QuillSlots, EndAConverter) {
         int* ends = nullptr;
     };
 
-    SymbolicExprTable table;
-    VTSymbolicExprErrorChecker checker;
     int ends = 0;
     alignas(Counted) std::array<std::byte, sizeof(Counted)> memory;
     Counted* const converters[] = {new Counted(table, checker), new (memory.data()) Counted(table, checker)};

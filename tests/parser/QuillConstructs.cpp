@@ -9,6 +9,8 @@
 namespace VT::Testing {
 namespace {
 
+using QuillConstructs = QuillTest;
+
 void expectTrees(bool isDimension, std::initializer_list<const char*> cases) { // a text => its tree
     for (const std::string each : cases) {
         const auto& [text, tree] = sides(each);
@@ -18,7 +20,7 @@ void expectTrees(bool isDimension, std::initializer_list<const char*> cases) { /
     }
 }
 
-TEST(QuillConstructs, Dimensions) {
+TEST_F(QuillConstructs, Dimensions) {
     expectTrees(true,
                 {// Leaves
                  "true => true", "1.5E-3 => 0.0015r", "0x1F => 31r", "0X1p => invalid",
@@ -37,7 +39,7 @@ TEST(QuillConstructs, Dimensions) {
 }
 
 // Operators, lists, calls and functions of each other are printed and read back in tests/print.
-TEST(QuillConstructs, Conditions) {
+TEST_F(QuillConstructs, Conditions) {
     expectTrees(
         false,
         {// Integral literals of 32 bits are integers.
@@ -71,7 +73,7 @@ void expectUnhandled(const std::string& each, bool inDimensions, bool inConditio
     EXPECT_EQ(inConditions ? reportsText(readCondition(text)) : report, report);
 }
 
-TEST(QuillConstructs, OperatorsOfBoth) {
+TEST_F(QuillConstructs, OperatorsOfBoth) {
     for (const OperatorInfo& row : operatorTable()) {
         const std::string call(row.quillCall), infix(row.quill), name(row.name);
         if (row.op >= SymbolicOp::Power || row.shape != "Binary" || row.form != OperatorForm::Infix)
@@ -88,7 +90,7 @@ TEST(QuillConstructs, OperatorsOfBoth) {
     }
 }
 
-TEST(QuillConstructs, ConditionsOnly) {
+TEST_F(QuillConstructs, ConditionsOnly) {
     for (const std::string each :
          {"1+`a^2 => power", "`a.^b => element-wise power", "`a' => transpose", "`a.' => plain transpose",
           "1 - `a.*b => element-wise multiply", "`a./b => element-wise divide", "`a\\b => left divide",
@@ -104,7 +106,7 @@ TEST(QuillConstructs, ConditionsOnly) {
                         "a:s:b => QColon3(a,s,b)"});
 }
 
-TEST(QuillConstructs, NeitherInDimensionsNorInConditions) {
+TEST_F(QuillConstructs, NeitherInDimensionsNorInConditions) {
     for (const std::string each :
          {"1 + `'it''s' => 'it''s'", "`\"text\" => \"text\"", "`2i => 2i", "`@sin => function handle",
           // Without a name to be called or indexed
@@ -114,14 +116,10 @@ TEST(QuillConstructs, NeitherInDimensionsNorInConditions) {
         expectUnhandled(each, false, true);
 }
 
-TEST(QuillConstructs, VariantKeywords) {
-    SymbolicExprTable table;
-    VTSymbolicExprErrorChecker checker;
-    SymbolicExprFromQParseTreeBlockVariants converter(table, checker);
-    SymbolicExprFromQParseTree dimensions(table, checker);
+TEST_F(QuillConstructs, VariantKeywords) {
     for (const int value : {1, 0, 1}) {
         const FlagSetting setting(*VTFEAT_VariantKeywordsSimCodegen, value);
-        EXPECT_EQ(treeText(table, converter("(sim) || x && (codegen)")),
+        EXPECT_EQ(treeText(table, conditions("(sim) || x && (codegen)")),
                   value == 1 ? "Or((sim),And(x,(codegen)))" : "Or(sim,And(x,codegen))");
         EXPECT_EQ(treeText(table, dimensions("(sim)")), "sim");
     }

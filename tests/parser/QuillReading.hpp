@@ -50,6 +50,15 @@ QuillAnswer readCondition(const Text& text, SymbolValidator* validator = nullptr
     return readQuill<SymbolicExprFromQParseTreeBlockVariants>(text, validator);
 }
 
+/// Converters of one table.
+class QuillTest : public testing::Test {
+protected:
+    SymbolicExprTable table;
+    VTSymbolicExprErrorChecker checker; // collects
+    SymbolicExprFromQParseTree dimensions{table, checker};
+    SymbolicExprFromQParseTreeBlockVariants conditions{table, checker};
+};
+
 /// A diagnostic in one line: the key, the arguments, the offset.  Its sentence must have room for the arguments and
 /// quote the text.
 inline std::string reportText(const HostDiagnostic& report) {

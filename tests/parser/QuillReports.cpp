@@ -12,6 +12,8 @@
 namespace VT::Testing {
 namespace {
 
+using QuillReports = QuillTest;
+
 constexpr double infinity = std::numeric_limits<double>::infinity();
 
 QxArray scalar(QxArray::Type type, double value, bool complex = false) {
@@ -83,7 +85,7 @@ void expectAnswers(std::span<const std::string> cases) { // a text => a tree or 
     }
 }
 
-TEST(QuillReports, Dimensions) {
+TEST_F(QuillReports, Dimensions) {
     const std::string digits = "0x" + std::string(260, 'f');
     const std::string cases[] = {
         // Functions
@@ -113,7 +115,7 @@ TEST(QuillReports, Dimensions) {
     expectAnswers<SymbolicExprFromQParseTree>(cases);
 }
 
-TEST(QuillReports, IntegerDimensions) {
+TEST_F(QuillReports, IntegerDimensions) {
     const std::string cases[] = {"2147483648 => IntegerOverflow(2147483648, 2147483648, 0)@0",
                                  "-2147483648 => -2147483648", "A+1.5 => NonIntegerLiteralValue(1.5, A+1.5, 2)@2",
                                  "idivide(A,2) => Divide(A,2)", "1+A/2 => UnsupportedDivision(1+A/2, 2)@2",
@@ -125,7 +127,7 @@ TEST(QuillReports, IntegerDimensions) {
     expectAnswers<IntegerConverter>(cases);
 }
 
-TEST(QuillReports, InUtf16Text) {
+TEST_F(QuillReports, InUtf16Text) {
     const auto report = [](const std::u16string& text) { return reportsText(readDimension(text)); };
     EXPECT_EQ(report(u"\u00e9"), "InvalidExpression(\xc3\xa9, 0)@0");
     EXPECT_EQ(report(std::u16string(u"A%\u00e9") + char16_t{0xd800} + u"x"),
@@ -148,9 +150,7 @@ public:
     }
 };
 
-TEST(QuillReports, ThoseOfAnEarlierTextExplainNothing) {
-    SymbolicExprTable table;
-    VTSymbolicExprErrorChecker checker; // collects
+TEST_F(QuillReports, ThoseOfAnEarlierTextExplainNothing) {
     SilentConverter converter(table, checker);
     const auto reason = [&](const auto& text) -> std::string {
         try {
@@ -171,7 +171,7 @@ TEST(QuillReports, ThoseOfAnEarlierTextExplainNothing) {
     EXPECT_EQ(checker.diagnostics().size(), 6U);
 }
 
-TEST(QuillReports, TextsWithNulAreQuotedWhole) {
+TEST_F(QuillReports, TextsWithNulAreQuotedWhole) {
     const std::string nul(1, '\0');
     for (const std::string& front : {"sqrt('a" + nul + "b')", "[1;2]%" + nul + "\n", "1e999 %" + nul, "'a" + nul + "'",
                                      "rem(1)%" + nul, "A" + nul + "B", "[[1],2]%" + nul, "z%" + nul}) {
@@ -185,10 +185,7 @@ TEST(QuillReports, TextsWithNulAreQuotedWhole) {
         }
     }
     // No text is longer than it is: not one whose characters follow another's that has been converted.
-    SymbolicExprTable table;
-    VTSymbolicExprErrorChecker checker;
     std::string buffer("A +\0B", 5);
-    SymbolicExprFromQParseTree dimensions(table, checker);
     EXPECT_EQ(dimensions(buffer), invalidId);
     EXPECT_EQ(dimensions(buffer.c_str()), invalidId);
     checker.reportInvalidExpr(buffer.c_str());
@@ -197,11 +194,7 @@ TEST(QuillReports, TextsWithNulAreQuotedWhole) {
     EXPECT_EQ(reportText(checker.diagnostics()[2]), "InvalidExpression(A +, 0)@0");
 }
 
-TEST(QuillReports, AreSuppressedByTheCheckersFlag) {
-    SymbolicExprTable table;
-    VTSymbolicExprErrorChecker checker;
-    SymbolicExprFromQParseTree dimensions(table, checker);
-    SymbolicExprFromQParseTreeBlockVariants conditions(table, checker);
+TEST_F(QuillReports, AreSuppressedByTheCheckersFlag) {
     checker.disableDiagnostics();
     for (const std::string text : {"A +", "sqrt(1)", "rem(1)", "x{1}", "[1;2]", "1e999", "'t'"}) {
         EXPECT_EQ(dimensions(text), invalidId) << text;
@@ -215,7 +208,7 @@ TEST(QuillReports, AreSuppressedByTheCheckersFlag) {
     EXPECT_EQ(checker.diagnostics().size(), 2U) << "they are collected";
 }
 
-TEST(QuillReports, RefusedConditionsAreThrown) {
+TEST_F(QuillReports, RefusedConditionsAreThrown) {
     const std::tuple<std::string, std::size_t, std::string> cases[] = {
         {"A ==", 4, "The condition \"A ==\" cannot be read at its end. The text ends where a value must follow."},
         {"A + x{1}", 5,
@@ -236,21 +229,18 @@ TEST(QuillReports, RefusedConditionsAreThrown) {
     }
 }
 
-TEST(QuillReports, TheCheckerOfConditionsKeepsThoseOfTheLatestText) {
-    SymbolicExprTable table;
-    VTSymbolicExprErrorCheckerBlockVariants checker;
-    SymbolicExprFromQParseTreeBlockVariants converter(table, checker);
+TEST_F(QuillReports, TheCheckerOfConditionsKeepsThoseOfTheLatestText) {
+    VTSymbolicExprErrorCheckerBlockVariants latest;
+    SymbolicExprFromQParseTreeBlockVariants converter(table, latest);
     EXPECT_THROW(converter("A +"), HostDiagnostic);
     EXPECT_THROW(converter("'text'"), HostDiagnostic);
-    ASSERT_EQ(checker.diagnostics().size(), 1U);
-    EXPECT_EQ(reportText(checker.diagnostics().front()), "UnhandledExpression('text', 'text', 0)@0");
+    ASSERT_EQ(latest.diagnostics().size(), 1U);
+    EXPECT_EQ(reportText(latest.diagnostics().front()), "UnhandledExpression('text', 'text', 0)@0");
     converter("A");
-    EXPECT_TRUE(checker.diagnostics().empty());
+    EXPECT_TRUE(latest.diagnostics().empty());
 }
 
-TEST(QuillReports, ValidatorsAreAskedOnceForANameOfConditions) {
-    SymbolicExprTable table;
-    VTSymbolicExprErrorChecker checker;
+TEST_F(QuillReports, ValidatorsAreAskedOnceForANameOfConditions) {
     Workspace workspace;
     SymbolicExprFromQParseTreeBlockVariants converter(table, checker, &workspace);
     EXPECT_EQ(treeText(table, converter("text + unknown + text + f(unknown) + S.field")),
@@ -278,30 +268,26 @@ public:
     std::string asked;
 };
 
-TEST(QuillReports, OverridesAreAskedForEveryNameAndMayAnswerCalls) {
-    const auto expect = [](auto&& converter, const SymbolicExprTable& table) {
+TEST_F(QuillReports, OverridesAreAskedForEveryNameAndMayAnswerCalls) {
+    const auto expect = [&](auto&& converter) {
         EXPECT_EQ(treeText(table, converter("low + N + low + N")),
                   "Plus(Plus(Plus(BitAnd(low,255),N),BitAnd(low,255)),N)");
         EXPECT_EQ(treeText(table, converter("N")), "N");
         EXPECT_EQ(converter.asked, "low@0 N@6 low@10 N@16 N@0 ");
     };
-    SymbolicExprTable table;
-    VTSymbolicExprErrorChecker checker;
-    expect(HostNodes<SymbolicExprFromQParseTree>(table, checker), table);
-    expect(HostNodes<SymbolicExprFromQParseTreeBlockVariants>(table, checker), table);
+    expect(HostNodes<SymbolicExprFromQParseTree>(table, checker));
+    expect(HostNodes<SymbolicExprFromQParseTreeBlockVariants>(table, checker));
 }
 
-TEST(QuillReports, ValidatorsThatFailLeaveAUsableConverter) {
-    SymbolicExprTable table;
-    VTSymbolicExprErrorChecker checker;
+TEST_F(QuillReports, ValidatorsThatFailLeaveAUsableConverter) {
     Workspace workspace;
-    SymbolicExprFromQParseTree dimensions(table, checker, &workspace);
-    SymbolicExprFromQParseTreeBlockVariants conditions(table, checker, &workspace);
+    SymbolicExprFromQParseTree failing(table, checker, &workspace);
+    SymbolicExprFromQParseTreeBlockVariants failingToo(table, checker, &workspace);
     for (int i = 0; i < 2; ++i) {
-        EXPECT_THROW(dimensions("[A, (B+fails)*2]"), std::runtime_error);
-        EXPECT_EQ(treeText(table, dimensions("[A, B]")), "Dims2D(A,B)");
-        EXPECT_THROW(conditions("f(A, (B+fails)*2)"), std::runtime_error);
-        EXPECT_EQ(treeText(table, conditions("f(A, B)")), "FcnCall(f,A,B)");
+        EXPECT_THROW(failing("[A, (B+fails)*2]"), std::runtime_error);
+        EXPECT_EQ(treeText(table, failing("[A, B]")), "Dims2D(A,B)");
+        EXPECT_THROW(failingToo("f(A, (B+fails)*2)"), std::runtime_error);
+        EXPECT_EQ(treeText(table, failingToo("f(A, B)")), "FcnCall(f,A,B)");
     }
     EXPECT_TRUE(checker.diagnostics().empty());
 }

@@ -41,7 +41,6 @@ TEST_F(GeneratedCode, ConditionsOfDirectives) {
                                 {read("A || (B || C)"), "A || (B || C)", "", ""},
                                 {read("a == b == c"), "(a == b) == c", "", ""},
                                 {read("a == (b == c)"), "a == (b == c)", "", ""},
-                                {read("(a < b) >= c"), "(a < b) >= c", "", ""},
                                 {read("!(a - -3 * -b)"), "!(a - -3 * -b)", "", "~(a - -3 * -b)"},
                                 {read("defined(A.B) || f(a, b + 1) != 0"), "defined(A_B) || f(a,b + 1) != 0", "",
                                  "defined(A.B) || f(a,b + 1) ~= 0"},
