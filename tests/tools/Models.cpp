@@ -1,14 +1,14 @@
 // vtsym check: what it finds in models, against brute force too, and what it says of files that are none.
-#include "tests/support/Workplace.hpp"
+#include "tests/support/Parsing.hpp"
+#include "tests/support/RandomCondition.hpp"
+#include "tests/support/Truth.hpp"
 #include "tests/tools/Program.hpp"
 
-#include <algorithm>
-#include <array>
+#include <bitset>
 #include <gmock/gmock.h>
 #include <nlohmann/json.hpp>
 #include <random>
 #include <set>
-#include <sstream>
 
 namespace VT::Testing {
 namespace {
@@ -17,20 +17,10 @@ using ::testing::HasSubstr;
 using ::testing::Not;
 using Json = nlohmann::json;
 
-ProgramResult checked(const std::string& model, std::vector<std::string> options = {}) {
-    const Workplace folder;
-    options.insert(options.begin(), "check");
-    const std::string file = folder.write("m", model);
-    options.push_back(file);
-    ProgramResult result = runProgram({options, "", {}, {}});
-    for (std::string* text : {&result.output, &result.words}) {
-        std::string shown;
-        std::size_t from = 0;
-        for (std::size_t at = 0; (at = text->find(file, from)) != std::string::npos; from = at + file.size())
-            shown.append(*text, from, at - from).append("m");
-        *text = shown.append(*text, from);
-    }
-    return result;
+ProgramResult checked(const std::string& model, const std::string& options = {}) {
+    const Workplace place;
+    place.write("m", model);
+    return runScript(place, "vtsym check " + options + " m");
 }
 
 std::string set(const std::string& parent, const std::vector<std::string>& conditions) {
@@ -41,17 +31,15 @@ std::string set(const std::string& parent, const std::vector<std::string>& condi
 }
 
 TEST(Check, TellsWhatIsWrongWithChoices) {
-    struct Row {
+    struct Set {
         std::string parent;
         std::vector<std::string> choices;
         std::string output;
         int status;
     };
 
-    for (const Row& row : std::initializer_list<Row>{
-             {"", {"A==1", "A!=1"}, "", 0},
+    for (const Set& row : std::initializer_list<Set>{
              {"", {"A==1", "A==2", "(default)"}, "", 0},
-             {"A>0 && A<3", {"A==1", "A==2"}, "", 0},
              {"", {"(sim)", "(codegen)"}, "", 0},
              {"A", {""}, "", 0},
              {"A", {"(default)"}, "", 0},
@@ -82,7 +70,7 @@ TEST(Check, TellsWhatIsWrongWithChoices) {
         EXPECT_EQ(result.words, "");
         EXPECT_EQ(result.status, row.status);
     }
-    EXPECT_EQ(checked(set("", {"A<2147483647", "A==2147483647"}), {"--bits", "32"}).status, 0);
+    EXPECT_EQ(checked(set("", {"A<2147483647", "A==2147483647"}), "--bits 32").status, 0);
     EXPECT_EQ(checked(set("", {"A<2147483647", "A==2147483647"})).status, 1);
     const ProgramResult open = checked(set("", {"A*A==2", "A*A!=2 || B"}));
     EXPECT_EQ(open.status, 2);
@@ -111,25 +99,18 @@ TEST(Check, FollowsBlocksAndPorts) {
         "m:6: Top/Gone is never active: A == 0 cannot hold where Top is active\n"
         "m:9: Top/Set/é: B & 1 == 1 && A >= 1 can be written B & 1==1 where Top/Set is active\n"
         "m:12: the port p is never active: Top/Set/other is never active together with a block that it goes to\n");
-    std::istringstream lines(checked(nested, {"--json"}).output);
-    std::string line;
-    std::getline(lines, line);
-    EXPECT_EQ(line, R"json({"file":"m","line":5,"kind":"always-active","name":"Top/In","condition":"A ~= 0",)json"
-                    R"json("witness":"A=1","follows":[{"line":4,"name":"Top","text":"A > 0"}]})json");
+    EXPECT_EQ(linesOf(checked(nested, "--json").output).at(0),
+              R"json({"file":"m","line":5,"kind":"always-active","name":"Top/In","condition":"A ~= 0",)json"
+              R"json("witness":"A=1","follows":[{"line":4,"name":"Top","text":"A > 0"}]})json");
     // A fix is the text of the file that is to go, and what comes in its place.
-    const Json log = Json::parse(checked(nested, {"--sarif"}).output);
+    const Json log = Json::parse(checked(nested, "--sarif").output);
     const Json change = log["runs"][0]["results"][2]["fixes"][0]["artifactChanges"][0]["replacements"][0];
     EXPECT_EQ(change, Json::parse(R"({"deletedRegion":{"startLine":9,"startColumn":36,"endLine":9,"endColumn":58},)"
                                   R"("insertedContent":{"text":"\"B & 1==1\""}})"));
 }
 
 TEST(Check, SaysWhatToChangeInAFile) {
-    struct Row {
-        std::string model;
-        std::string words;
-    };
-
-    for (const Row& row : std::initializer_list<Row>{
+    for (const auto& [model, words] : std::initializer_list<std::pair<std::string, std::string>>{
              {"", "m:1: This is no JSON: "},
              {"{\"blocks\": [\n}", "m:2: This is no JSON: syntax error"},
              {"[]", "m:1: the model: a model is an object: write {"},
@@ -154,129 +135,78 @@ TEST(Check, SaysWhatToChangeInAFile) {
              {set("", {"(default)", "(default)"}), "m:1: S/c1: There is another \"(default)\" choice"},
              {set("(default)", {"A", "!A"}), "m:1: S: \"(default)\" is for choices alone"},
          }) {
-        const ProgramResult result = checked(row.model);
+        const ProgramResult result = checked(model);
         EXPECT_EQ(result.output, "");
-        EXPECT_THAT(result.words, HasSubstr(row.words));
+        EXPECT_THAT(result.words, HasSubstr(words));
         EXPECT_EQ(result.status, 2);
     }
 }
 
 TEST(Check, WritesAPageThatStandsAlone) {
     const Workplace folder;
-    const std::string model =
-        Json({{"name", "</title><script>x"},
-              {"blocks",
-               {{{"name", "<b>&\"'"},
-                 {"choices", {{{"name", "<i>"}, {"condition", "A<3&&B"}}, {{"name", "j"}, {"condition", "A>1"}}}}}}}})
-            .dump();
-    const std::string page = folder.path("page.html");
-    EXPECT_EQ(runProgram({{"check", "--html", page, folder.write("m", model)}, "", {}, {}}).status, 1);
-    const std::string html = folder.read("page.html");
+    const Json choices{{{"name", "<i>"}, {"condition", "A<3&&B"}}, {{"name", "j"}, {"condition", "A>1"}}};
+    const Json block{{"name", "<b>&\"'"}, {"choices", choices}};
+    folder.write("m", Json({{"name", "</title><script>x"}, {"blocks", {block}}}).dump());
+    EXPECT_EQ(runScript(folder, "vtsym check --html page m").status, 1);
+    const std::string html = folder.read("page");
     EXPECT_THAT(html, HasSubstr("title=\"&lt;i&gt; and j are both active for A=2, B=1\""));
     EXPECT_THAT(html, HasSubstr("<h2>&lt;b&gt;&amp;&quot;&#39;</h2>"));
     for (const char* outside : {"<b>&\"", "<i>", "</title><script>x", "http:", "https:", "src=", "url("})
         EXPECT_THAT(html, Not(HasSubstr(outside)));
-    EXPECT_EQ(runProgram({{"check", "--html", "/nowhere/page", folder.path("m")}, "", {}, {}}).status, 2);
-    const std::string covered = set("", {"A>=3", "A==3", "A<3"});
-    runProgram({{"check", "--html", page, folder.write("m", covered)}, "", {}, {}});
-    EXPECT_THAT(folder.read("page.html"), HasSubstr("active for A=3&#10;c1 is never active without c0.\""));
-}
-
-// Random sets over three names with small constants.  Conditions change their value next to constants only, so the
-// values from -1 to 4 stand for all integers.
-
-struct Atom {
-    int name;
-    int comparison;
-    int constant;
-};
-
-constexpr std::array<const char*, 6> comparisons{"==", "!=", "<", "<=", ">", ">="};
-
-bool holds(const Atom& atom, const std::array<int, 3>& values) {
-    const int value = values.at(static_cast<std::size_t>(atom.name));
-    const std::array<bool, 6> results{value == atom.constant, value != atom.constant,
-                                      value<atom.constant, value <= atom.constant, value> atom.constant,
-                                      value >= atom.constant};
-    return results.at(static_cast<std::size_t>(atom.comparison));
-}
-
-/// An Or of Ands.
-using Sum = std::vector<std::vector<Atom>>;
-
-bool holds(const Sum& sum, const std::array<int, 3>& values) {
-    return std::ranges::any_of(sum, [&](const std::vector<Atom>& product) {
-        return std::ranges::all_of(product, [&](const Atom& atom) { return holds(atom, values); });
-    });
-}
-
-std::string textOf(const Sum& sum) {
-    std::string text;
-    for (const std::vector<Atom>& product : sum) {
-        text += text.empty() ? "" : " || ";
-        for (const Atom& atom : product)
-            text += std::string(&atom == product.data() ? "" : " && ") + "ABC"[atom.name] +
-                    comparisons.at(static_cast<std::size_t>(atom.comparison)) + std::to_string(atom.constant);
-    }
-    return text;
+    EXPECT_EQ(runScript(folder, "vtsym check --html /nowhere/page m").status, 2);
+    folder.write("m", set("", {"A>=3", "A==3", "A<3"}));
+    runScript(folder, "vtsym check --html page m");
+    EXPECT_THAT(folder.read("page"), HasSubstr("active for A=3&#10;c1 is never active without c0.\""));
 }
 
 TEST(Check, AgreesWithBruteForce) {
-    std::mt19937 random(7);
-    const auto below = [&](int bound) { return static_cast<int>(random() % static_cast<unsigned>(bound)); };
-    const auto randomSum = [&](int products) {
-        Sum sum(static_cast<std::size_t>(1 + below(products)));
-        for (std::vector<Atom>& product : sum)
-            for (int i = below(2); i >= 0; --i)
-                product.push_back({below(3), below(6), below(4)});
-        return sum;
+    std::mt19937_64 random(7);
+    const ConditionShape shape{.lowest = 0};
+    using Truths = std::bitset<216>; // at the values from -1 to 4, which stand for all integers
+    const auto truthsOf = [](const std::string& condition) {
+        SymbolicExprTable table;
+        const Truth truth(table, read(table, condition));
+        Truths truths;
+        std::size_t at = 0;
+        forEachAssignment(ConditionShape().symbols, -1, 4,
+                          [&](const Assignment& values) { truths[at++] = truth.under(values) != 0; });
+        return truths;
     };
     Json blocks = Json::array();
     std::set<std::string> expected;
+    const auto expectUsed = [&](const std::string& name, const Truths& truths, const Truths& around) {
+        if (truths.none() || truths == around)
+            expected.insert((truths.none() ? "dead " : "always-active ") + name);
+    };
     for (int n = 0; n < 400; ++n) {
-        const Sum parent = randomSum(3);
-        std::vector<Sum> choices;
-        Json members = Json::array();
-        for (int i = 0; i < 2 + below(4); ++i) {
-            choices.push_back(randomSum(2));
-            members.push_back({{"name", std::to_string(i)}, {"condition", textOf(choices.back())}});
-        }
         const std::string name = "S" + std::to_string(n);
-        blocks.push_back({{"name", name}, {"condition", textOf(parent)}, {"choices", members}});
-        std::vector<std::set<std::size_t>> patterns; // of the choices that are active
-        bool isAlways = true;
-        for (int values = 0; values < 216; ++values) {
-            const std::array<int, 3> at{values % 6 - 1, values / 6 % 6 - 1, values / 36 - 1};
-            isAlways = isAlways && holds(parent, at);
-            if (!holds(parent, at))
+        const std::string condition = randomCondition(random, 1 + random() % 6, shape);
+        const Truths parent = truthsOf(condition);
+        expectUsed(name, parent, Truths().set());
+        Json choices = Json::array();
+        std::vector<Truths> active;
+        Truths missing = parent;
+        for (std::size_t left = 2 + random() % 4; left > 0; --left) {
+            const std::string choice = std::to_string(active.size());
+            const std::string text = randomCondition(random, 1 + random() % 4, shape);
+            choices.push_back({{"name", choice}, {"condition", text}});
+            active.push_back(parent & truthsOf(text));
+            missing &= ~active.back();
+            if (parent.none())
                 continue;
-            patterns.emplace_back();
-            for (std::size_t i = 0; i < choices.size(); ++i)
-                if (holds(choices[i], at))
-                    patterns.back().insert(i);
+            expectUsed(name + "/" + choice, active.back(), parent);
+            for (std::size_t i = 0; i + 1 < active.size(); ++i)
+                if ((active[i] & active.back()).any())
+                    expected.insert("overlapping " + name + "/" + std::to_string(i) + " " + name + "/" + choice);
         }
-        if (patterns.empty() || isAlways)
-            expected.insert((patterns.empty() ? "dead " : "always-active ") + name);
-        if (patterns.empty())
-            continue;
-        if (std::ranges::any_of(patterns, [](const auto& active) { return active.empty(); }))
+        if (missing.any())
             expected.insert("missing " + name);
-        for (std::size_t i = 0; i < choices.size(); ++i) {
-            const auto active =
-                std::ranges::count_if(patterns, [&](const auto& pattern) { return pattern.contains(i); });
-            if (active == 0 || active == std::ssize(patterns))
-                expected.insert((active == 0 ? "dead " : "always-active ") + name + "/" + std::to_string(i));
-            for (std::size_t j = i + 1; j < choices.size(); ++j)
-                if (std::ranges::any_of(patterns, [&](const auto& a) { return a.contains(i) && a.contains(j); }))
-                    expected.insert("overlapping " + name + "/" + std::to_string(i) + " " + name + "/" +
-                                    std::to_string(j));
-        }
+        blocks.push_back({{"name", name}, {"condition", condition}, {"choices", choices}});
     }
     std::set<std::string> found;
     std::string shortened;
     std::string equivalent;
-    std::istringstream lines(checked(Json({{"blocks", blocks}}).dump(), {"--json"}).output);
-    for (std::string line; std::getline(lines, line);) {
+    for (const std::string& line : linesOf(checked(Json({{"blocks", blocks}}).dump(), "--json").output)) {
         const Json finding = Json::parse(line);
         const std::string kind = finding["kind"];
         if (kind == "redundant") {
@@ -292,7 +222,7 @@ TEST(Check, AgreesWithBruteForce) {
     EXPECT_EQ(found, expected);
     EXPECT_GT(found.size(), 1000U);
     EXPECT_GT(equivalent.size(), 1000U);
-    EXPECT_EQ(runProgram({{"compare"}, shortened, {}, {}}).output, equivalent);
+    EXPECT_EQ(runProgram({"compare"}, shortened).output, equivalent);
 }
 
 TEST(Check, BoundsItsWork) {

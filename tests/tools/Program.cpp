@@ -1,8 +1,7 @@
 #include "tests/tools/Program.hpp"
 
-#include "tests/support/Workplace.hpp"
-
 #include <array>
+#include <gtest/gtest.h>
 #include <pty.h>
 #include <unistd.h>
 
@@ -17,47 +16,43 @@ std::string quoted(const std::string& text) {
     return result + "'";
 }
 
-/// The program with its arguments in an environment of little else.
-std::string commandOf(const ProgramInput& input) {
-    std::string command = "env -i";
-    for (const std::string name : {"PATH", "ASAN_OPTIONS", "UBSAN_OPTIONS"})
-        if (const char* const value = std::getenv(name.c_str()))
-            command += " " + quoted(name + "=" + value);
-    for (const std::string& setting : input.environment)
-        command += " " + quoted(setting);
-    command += " " + quoted(VTSYM_PROGRAM);
-    for (const std::string& argument : input.arguments)
+std::string commandOf(const std::string& program, const Strings& arguments) {
+    std::string command = program;
+    for (const std::string& argument : arguments)
         command += " " + quoted(argument);
     return command;
 }
 
-} // namespace
-
-ProgramResult runProgram(const ProgramInput& input) {
-    const Workplace place;
-    place.write("in", input.input);
-    const std::string command = commandOf(input) + " <in 2>words";
-    ProgramResult result;
-    if (input.output != OutputTo::ClosedPipe) {
-        result.status = place.run(command + (input.output == OutputTo::Result ? " >out" : " >/dev/full"));
-    } else { // the reader is gone before the program starts
-        place.run("{ sleep 0.2; " + command + "; echo $? >status; } | :");
-        result.status = std::stoi(place.read("status"));
-    }
-    result.output = place.read("out");
-    result.words = place.read("words");
-    return result;
+std::string inEnvironment(Strings settings, const std::string& command) {
+    for (const std::string name : {"PATH", "ASAN_OPTIONS", "UBSAN_OPTIONS"})
+        if (const char* const value = std::getenv(name.c_str()))
+            settings.push_back(name + "=" + value);
+    return commandOf("env -i", settings) + " " + command;
 }
 
-ProgramResult runOnTerminal(const ProgramInput& input) {
-    const std::string command = "exec " + commandOf(input);
+} // namespace
+
+ProgramResult runScript(const Workplace& place, const std::string& script, const std::string& input,
+                        const Strings& environment) {
+    place.write("in", input);
+    place.write("script", "vtsym() { '" VTSYM_PROGRAM "' \"$@\"; }\n" + script);
+    const int status = place.run(inEnvironment(environment, "sh ./script <in >out 2>words"));
+    return {place.read("out"), place.read("words"), status};
+}
+
+ProgramResult runProgram(const Strings& arguments, const std::string& input, const Strings& environment) {
+    return runScript(Workplace(), commandOf("vtsym", arguments), input, environment);
+}
+
+ProgramResult runOnTerminal(const Strings& arguments, const std::string& input, const Strings& environment) {
+    const std::string command = "exec " + inEnvironment(environment, commandOf(VTSYM_PROGRAM, arguments));
     int terminal = -1;
     const pid_t child = forkpty(&terminal, nullptr, nullptr, nullptr);
     if (child == 0) {
         execl("/bin/sh", "sh", "-c", command.c_str(), nullptr);
         _exit(127);
     }
-    if (write(terminal, input.input.data(), input.input.size()) != static_cast<ssize_t>(input.input.size()))
+    if (write(terminal, input.data(), input.size()) != static_cast<ssize_t>(input.size()))
         throw std::runtime_error("the terminal takes no input");
     ProgramResult result;
     std::array<char, 4096> part{};
@@ -68,6 +63,36 @@ ProgramResult runOnTerminal(const ProgramInput& input) {
     result.status = WIFEXITED(status) ? WEXITSTATUS(status) : -1;
     close(terminal);
     return result;
+}
+
+void expectRows(const std::vector<Row>& rows, const std::map<std::string, std::string>& files) {
+    for (const Row& row : rows) {
+        SCOPED_TRACE(row.script);
+        const Workplace place;
+        for (const auto& [name, content] : files)
+            place.write(name, content);
+        const std::size_t line = std::min(row.script.find('\n'), row.script.size());
+        const ProgramResult result =
+            runScript(place, row.script.substr(0, line), row.script.substr(std::min(line + 1, row.script.size())));
+        EXPECT_EQ(result.output, row.output);
+        EXPECT_EQ(result.status, row.status);
+        EXPECT_EQ(result.words.empty(), row.words.empty()) << result.words;
+        std::size_t at = 0;
+        for (std::size_t from = 0, end = 0; end < row.words.size(); from = end + 3) {
+            end = std::min(row.words.find("...", from), row.words.size());
+            end += row.words.substr(end).starts_with("....") ? 1 : 0; // behind a full stop
+            at = result.words.find(row.words.substr(from, end - from), at);
+            EXPECT_NE(at, std::string::npos) << result.words;
+        }
+    }
+}
+
+std::vector<std::string> linesOf(const std::string& text) {
+    std::vector<std::string> lines;
+    std::istringstream stream(text);
+    for (std::string line; std::getline(stream, line);)
+        lines.push_back(line);
+    return lines;
 }
 
 } // namespace VT::Testing
