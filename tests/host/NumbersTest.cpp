@@ -4,33 +4,17 @@
 #include <rapidcheck/gtest.h>
 
 #include <bit>
-#include <clocale>
 #include <cmath>
 #include <cstdlib>
-#include <limits>
 
 namespace {
 
 using VT::NumberError;
 
-constexpr double infinity = std::numeric_limits<double>::infinity();
-
 TEST(Dtoa, Notation) {
-    for (const auto& [value, text] : std::vector<std::pair<double, const char*>>{{0.0, "0"},
-                                                                                 {-0.0, "-0"},
-                                                                                 {-2.5, "-2.5"},
-                                                                                 {1e20, "100000000000000000000"},
-                                                                                 {1e21, "1e+21"},
-                                                                                 {9.9e20, "990000000000000000000"},
-                                                                                 {1e-5, "0.00001"},
-                                                                                 {1.25e-5, "0.0000125"},
-                                                                                 {9.99e-6, "9.99e-06"},
-                                                                                 {-1e100, "-1e+100"},
-                                                                                 {5e-324, "5e-324"},
-                                                                                 {infinity, "Inf"},
-                                                                                 {-infinity, "-Inf"},
-                                                                                 {std::nan(""), "NaN"}})
-        EXPECT_EQ(vtsv_dtoa(value, true), text);
+    for (const char* text : {"0", "-0", "-2.5", "100000000000000000000", "1e+21", "990000000000000000000", "0.00001",
+                             "0.0000125", "9.99e-06", "-1e+100", "5e-324", "Inf", "-Inf", "NaN"})
+        EXPECT_EQ(vtsv_dtoa(std::strtod(text, nullptr), true), text);
     EXPECT_EQ(vtsv_dtoa(0.1, false), "0.10000000000000001");
     EXPECT_EQ(vtsv_dtoa(2.0, false), "2");
     EXPECT_EQ(vtsv_dtoa(-1e22, false), "-1e+22");
@@ -92,8 +76,6 @@ TEST(Strtod, CornersOfTheRange) {
              {"0." + zeros + "1e401", 1},
              {"1" + zeros + "e-400", 1},
              {"0." + zeros + "1", 0},
-             {"2.", 2},
-             {".5", 0.5},
              {"0." + digits, 1},
              {digits + "e-3000000", 1},
              {"9007199254740993", 9007199254740992.0}, // a tie goes to even

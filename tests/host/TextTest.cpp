@@ -37,18 +37,11 @@ TEST(Diagnostics, CarryWhatTheyWereMadeOf) {
 }
 
 TEST(Diagnostics, ParseErrorsSayWhereAndWhat) {
-    const struct {
-        std::string text;
-        std::size_t offset;
-        std::string sentence;
-    } cases[] = {
-        {"A === 3", 4, R"(The condition "A === 3" cannot be read at byte 5, before "= 3".)"},
-        {"A\n\x1b[2J", 1, R"(The condition "A\x0a\x1b[2J" cannot be read at byte 2, before "\x0a\x1b[2J".)"},
-        {"A", 7, R"(The condition "A" cannot be read at byte 8.)"},
-    };
-
-    for (const auto& [text, offset, sentence] : cases)
-        EXPECT_EQ(parseErrorOf(text, offset).what(), sentence);
+    EXPECT_STREQ(parseErrorOf("A === 3", 4).what(),
+                 R"(The condition "A === 3" cannot be read at byte 5, before "= 3".)");
+    EXPECT_STREQ(parseErrorOf("A\n\x1b[2J", 1).what(),
+                 R"(The condition "A\x0a\x1b[2J" cannot be read at byte 2, before "\x0a\x1b[2J".)");
+    EXPECT_STREQ(parseErrorOf("A", 7).what(), R"(The condition "A" cannot be read at byte 8.)");
     EXPECT_STREQ(vtsvCreateDiagnostic(parseError, {std::int64_t{3}}, "").what(), // a misfit is shown
                  "Vantor:Variants:ExpressionParseError: 3");
     const VT::HostDiagnostic nowhere = vtsvCreateDiagnostic(parseError, {std::string("A"), std::string("^")}, "");
@@ -129,44 +122,42 @@ std::string utf8(std::u8string_view text) {
 }
 
 TEST(Utf16, BecomesUtf8) {
-    const struct {
-        std::u16string units;
-        std::string text;
-    } cases[] = {
-        {u"", ""},
-        {u"N*2+1", "N*2+1"},
-        {u"\u007f\u0080\u07ff\u0800\uffff", utf8(u8"\u007f\u0080\u07ff\u0800\uffff")},
-        {u"\U00010000\U0001f600\U0010ffff", utf8(u8"\U00010000\U0001f600\U0010ffff")},
-        {std::u16string(u"a\0b", 3), std::string("a\0b", 3)},
-        {{0xd800}, utf8(u8"\ufffd")},
-        {{0xdc00, u'x'}, utf8(u8"\ufffdx")},
-        {{0xd800, u'x'}, utf8(u8"\ufffdx")},
-        {{0xdc00, 0xd800}, utf8(u8"\ufffd\ufffd")},
-        {{0xd800, 0xd83d, 0xde00}, utf8(u8"\ufffd\U0001f600")},
-    };
+    for (const auto& [units, text] : std::initializer_list<std::pair<std::u16string, std::u8string>>{
+             {u"", u8""},
+             {u"\u007f\u0080\u07ff\u0800\uffff", u8"\u007f\u0080\u07ff\u0800\uffff"},
+             {u"\U00010000\U0001f600\U0010ffff", u8"\U00010000\U0001f600\U0010ffff"},
+             {std::u16string(u"a\0b", 3), std::u8string(u8"a\0b", 3)},
+             {{0xd800}, u8"\ufffd"},
+             {{0xdc00, u'x'}, u8"\ufffdx"},
+             {{0xd800, u'x'}, u8"\ufffdx"},
+             {{0xdc00, 0xd800}, u8"\ufffd\ufffd"},
+             {{0xd800, 0xd83d, 0xde00}, u8"\ufffd\U0001f600"},
+         })
+        EXPECT_EQ(cvt_ustring_string(units), utf8(text));
+}
 
-    for (const auto& [units, text] : cases)
-        EXPECT_EQ(cvt_ustring_string(units), text);
+/// The UTF-8 of one character, as the escapes of its bytes.
+std::string escaped(const std::string& text) {
+    std::string shown;
+    for (const char c : text) {
+        char escape[5];
+        std::snprintf(escape, sizeof escape, "\\x%02x", static_cast<unsigned>(static_cast<unsigned char>(c)));
+        shown += escape;
+    }
+    return shown;
 }
 
 TEST(ShownText, EscapesWhatWouldSpoilATerminal) {
-    const struct {
-        std::string text;
-        std::string shown;
-    } cases[] = {
-        {"A == 1", "A == 1"},
-        {utf8(u8"gr\u00f6\u00dfe \u4e2d \U0001f600"), utf8(u8"gr\u00f6\u00dfe \u4e2d \U0001f600")},
-        {std::string("a\0\n\x1b[31m\x7f", 9), "a\\x00\\x0a\\x1b[31m\\x7f"},
-        {utf8(u8"\u0085\u202e\ufeff"), "\\xc2\\x85\\xe2\\x80\\xae\\xef\\xbb\\xbf"},
-        {utf8(u8"\u00ad\u061c\u2028\u2060\U000e0041"),
-         "\\xc2\\xad\\xd8\\x9c\\xe2\\x80\\xa8\\xe2\\x81\\xa0\\xf3\\xa0\\x81\\x81"},
-        {"\xff\xc3", "\\xff\\xc3"},
-        {"\xc0\x80\xe0\x80\x80\xed\xa0\x80\xf4\x90\x80\x80", // overlong, a surrogate, beyond the last character
-         "\\xc0\\x80\\xe0\\x80\\x80\\xed\\xa0\\x80\\xf4\\x90\\x80\\x80"},
-    };
-
-    for (const auto& [text, shown] : cases)
-        EXPECT_EQ(VT::shownText(text, 1000), shown);
+    for (const std::string& plain : {std::string(" ~A == 1"), utf8(u8"gr\u00f6\u00dfe \u4e2d \U0001f600"),
+                                     utf8(u8"\u00a0\u00ac\u00ae\u061b\u200a\u2010\u2027\u202f\u205f\u2070\ufffc\ufffd"),
+                                     utf8(u8"\ud7ff\ue000\U000dffff\U000e0080\U0010ffff")})
+        EXPECT_EQ(VT::shownText(plain, 1000), plain);
+    for (const std::string& spoiling :
+         {std::string("\0\t\n\x1b\x1f\x7f", 6), utf8(u8"\u0080\u009f\u00ad\u061c\u180e\u200b\u200e\u200f\u2028\u202e"),
+          utf8(u8"\u2060\u2066\u206f\ufeff\ufff9\ufffb\U000e0000\U000e0041\U000e007f"), std::string("\xff\xc3"),
+          std::string("\xc0\x80\xe0\x80\x80\xed\xa0\x80\xf4\x90\x80\x80")}) // overlong, a surrogate, beyond the last
+        EXPECT_EQ(VT::shownText(spoiling, 1000), escaped(spoiling));
+    EXPECT_EQ(VT::shownText("a\n\x1b[31m"), "a\\x0a\\x1b[31m");
 }
 
 TEST(ShownText, IsCutBetweenCharacters) {
