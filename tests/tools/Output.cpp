@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <array>
+#include <boost/algorithm/string/replace.hpp>
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
 
@@ -24,9 +25,12 @@ std::string spoiled(const std::string& text) {
     return at == lines.end() ? "" : *at;
 }
 
-void expectSafe(const Strings& arguments, const std::string& input = {}, const std::string& flags = {}) {
-    const ProgramResult result = runProgram(arguments, input, {"VTSYM_LOG=debug", "VTSYM_FEATURES=" + flags});
-    SCOPED_TRACE(Json(arguments).dump(-1, ' ', true, Json::error_handler_t::replace));
+/// Runs `vtsym` with the words of a command, in which @ stands for a text.
+void expectSafe(const Workplace& place, const std::string& command, const std::string& text,
+                const std::string& input = {}, const std::string& flags = {}) {
+    const std::string script = "vtsym " + boost::replace_all_copy(command, "@", "'" + text + "'");
+    const ProgramResult result = runScript(place, script, input, {"VTSYM_LOG=debug", "VTSYM_FEATURES=" + flags});
+    SCOPED_TRACE(Json(script).dump(-1, ' ', true, Json::error_handler_t::replace));
     EXPECT_LE(result.status, 2); // a signal is above
     EXPECT_EQ(spoiled(result.output), "");
     EXPECT_EQ(spoiled(result.words), "");
@@ -34,57 +38,36 @@ void expectSafe(const Strings& arguments, const std::string& input = {}, const s
 }
 
 TEST(Output, IsSafeForTerminalsWhateverTheArguments) {
+    const Workplace place;
+    place.write("m", "{}");
     for (const std::string& text : hostileTexts) {
-        for (const Strings& arguments : std::initializer_list<Strings>{
-                 {text},
-                 {"-" + text},
-                 {"--" + text},
-                 {"help", text},
-                 {"operators", text},
-                 {"simplify", "-" + text},
-                 {"simplify", "--" + text + "=1"},
-                 {"simplify", "--from", text, "A"},
-                 {"simplify", "--bits", text, "A"},
-                 {"simplify", "--feature", text, "A"},
-                 {"simplify", "--feature", text + "=" + text, "A"},
-                 {"--feature", "VariantKeywordsSimCodegen=" + text, "simplify", "A"},
-                 {"convert", "--to", text, "A"},
-                 {"symbols", "--kinds", text, "A"},
-                 {"eval", "-D", text, "A"},
-                 {"eval", "-D", text + "=1", "A"},
-                 {"eval", "-D", "A=" + text, "A"},
-                 {"eval", "--from", "quill", "-D", "A='" + text + "'", "A"},
-                 {"dims", "-D", text + "=1", "A"},
-                 {"pp", "--given", text, "A"},
-                 {"replace", "A=" + text, "A"},
-                 {"compare", text},
-                 {"compare", text, "A" + text},
-                 {"given", "--json", text, "A" + text},
-                 {"check", text},
-                 {"check", "--html", text},
-                 {"check", "--html", text + "/page", VTSYM_TEST_DATA "/../../examples/model.json"},
-                 {"scan", text},
-                 {"scan", "--max-size", text, "."},
-             })
-            expectSafe(arguments);
-        expectSafe({"simplify", "A"}, {}, text + "=1," + text + ",CacheSymExprSimplifyResults=" + text);
+        for (const std::string& command :
+             linesOf("@\n-@\n--@\nhelp @\noperators @\nsimplify -@\nsimplify --@=1\nsimplify --from @ A\n"
+                     "simplify --bits @ A\nsimplify --feature @ A\nsimplify --feature @=@ A\n"
+                     "--feature VariantKeywordsSimCodegen=@ simplify A\nconvert --to @ A\nsymbols --kinds @ A\n"
+                     "eval -D @ A\neval -D @=1 A\neval -D A=@ A\neval --from quill -D A=\\'@\\' A\ndims -D @=1 A\n"
+                     "pp --given @ A\nreplace A=@ A\ncompare @\ncompare @ A@\ngiven --json @ A@\ncheck @\n"
+                     "check --html @\ncheck --html @/page m\nscan @\nscan --max-size @ ."))
+            expectSafe(place, command, text);
+        expectSafe(place, "simplify A", {}, {}, text + "=1," + text + ",CacheSymExprSimplifyResults=" + text);
     }
 }
 
 TEST(Output, IsSafeForTerminalsWhateverTheTexts) {
+    const Workplace place;
     for (const std::string& text : hostileTexts) {
         const std::string lines = text + "\nA" + text + "\nA == '" + text + "'\nf(\"" + text + "\") % {" + text +
                                   "\n/*" + text + "*/A\nA%" + text + "\n";
-        for (const char* command : {"simplify", "convert", "pp", "tree", "symbols", "eval", "dims", "compare", "given"})
-            for (const char* option : {"--json", "--from=quill", "--from=c"})
-                expectSafe({command, option}, lines);
-        for (const Strings& arguments :
-             std::initializer_list<Strings>{{"simplify", "--explain"}, {"tree", "--dot"}, {"replace", "A=B"}})
-            expectSafe(arguments, lines);
+        for (const std::string command :
+             {"simplify", "convert", "pp", "tree", "symbols", "eval", "dims", "compare", "given"})
+            for (const char* option : {" --json", " --from=quill", " --from=c"})
+                expectSafe(place, command + option, {}, lines);
+        for (const char* command : {"simplify --explain", "tree --dot", "replace A=B"})
+            expectSafe(place, command, {}, lines);
         std::string dialogue = lines;
         for (const char* word : {":", ":let ", ":let A=", ":tree ", ":pp ", ":quill ", ":explain "})
             dialogue += word + text + "\n";
-        expectSafe({"repl"}, dialogue);
+        expectSafe(place, "repl", {}, dialogue);
     }
     // Texts in JSON are the texts that were given.
     for (const std::string& text : {hostileTexts[0], hostileTexts[1], hostileTexts[3], hostileTexts[4]})
@@ -96,12 +79,12 @@ TEST(Output, IsSafeForTerminalsWhateverTheFiles) {
         const Workplace place;
         place.run("mkdir sources");
         const std::string name = "X" + text;
-        const std::string source = place.write(
-            "sources/" + text + ".c", "#ifdef " + name + "\n#ifdef " + name + "\n#elif A && defined " + name +
-                                          "\n#endif\n#if A /*" + text + "*/ && A == '" + text + "'\n#elif A\n" +
-                                          "#endif\n#endif\n#if B\n#if B && " + text + "\n#elif B\n#endif\n#endif");
-        for (const char* option : {"--summary", "--json", "--sarif"})
-            expectSafe({"scan", option, place.path("sources"), source + text});
+        place.write("sources/" + text + ".c", "#ifdef " + name + "\n#ifdef " + name + "\n#elif A && defined " + name +
+                                                  "\n#endif\n#if A /*" + text + "*/ && A == '" + text + "'\n#elif A\n" +
+                                                  "#endif\n#endif\n#if B\n#if B && " + text +
+                                                  "\n#elif B\n#endif\n#endif");
+        for (const std::string option : {"--summary", "--json", "--sarif"})
+            expectSafe(place, "scan " + option + " sources sources/@.c@", text);
         const auto named = [&](const std::string& suffix) { return name + suffix; };
         const Json choices = {{{"name", named("1")}, {"condition", "A<3"}},
                               {{"name", named("2")}, {"condition", "A>1"}},
@@ -123,9 +106,9 @@ TEST(Output, IsSafeForTerminalsWhateverTheFiles) {
              })
             models.push_back(model.dump(-1, ' ', true, Json::error_handler_t::replace));
         for (const std::string& model : models) {
-            const std::string file = place.write("m", model);
-            for (const char* option : {"--json", "--sarif", "--bits=32"})
-                expectSafe({"check", option, "--html", place.path("page"), file});
+            place.write("m", model);
+            for (const std::string option : {"--json", "--sarif", "--bits=32"})
+                expectSafe(place, "check --html page m " + option, text);
             EXPECT_EQ(spoiled(place.read("page")), "");
         }
         EXPECT_NE(place.read("page"), "");
