@@ -24,57 +24,40 @@ TEST(DecisionOfOne, Condition) {
     constexpr OneRow rows[] = {
         // Constants and numbers where a truth value is asked for.
         {"true", "yes:", "yes"},
-        {"2", "yes:", "yes"},
         {"0.0", "no", "no:"},
         {"0.5 && A", "yes: A=1", "no: A=0"},
-        {"!A || A == 0", "yes: A=0", "no: A=1"},
         {"true == 1 && false < 1", "yes:", "yes"},
         // One unknown.
-        {"A<=3 || A>=0 && A!=1", "yes: A=0", "yes"},
-        {"2*A+1==5", "yes: A=2", "no: A=0"},
         {"3-2*A>=8", "yes: A=-3", "no: A=0"},
         {"A<=2147483647 && A>=-2147483648", "yes: A=0", "no: A=2147483648"},
         {"A-2147483647-2147483647>2147483647", "yes: A=6442450942", "no: A=0"},
-        {"-(-2147483648)==A", "yes: A=2147483648", "no: A=0"},
         // Real literals.
         {"A<2.5 && A>1.5", "yes: A=2", "no: A=0"},
         {"-0.5<=A && A<0.5 && A", "no", "no: A=0"},
-        {"A>=-2.5 && A<=-1.5", "yes: A=-2", "no: A=0"},
         {"A<1.0e300", "yes: A=0", "undecided terms"},
         {"A*0.5<1 && !(A*0.5<1)", "no", "no: A=0"},
         {"A*0.5<1", "undecided terms", "undecided terms"},
         // Two and three unknowns.
-        {"A<B && B<C && C<A", "no", "no: A=0 B=0 C=0"},
         {"C+1<B && B<A-3", "yes: A=0 B=-4 C=-6", "no: A=0 B=0 C=0"},
-        {"2*A-2*B==3", "no", "no: A=0 B=0"},
-        {"A-B<2 && B-A<-4 && A", "no", "no: A=0 B=0"},
         {"A!=B && B!=C && A!=C && A>=0 && A<=1 && B>=0 && B<=1 && C>=0 && C<=1", "no", "no: A=0 B=0 C=0"},
         {"A-2147483647>B && B>2147483647", "yes: A=4294967296 B=2147483648", "no: A=0 B=0"},
         // Truth values as numbers.
-        {"(A==1)==(B==2) && A==1", "yes: A=1 B=2", "no: A=0 B=0"},
         {"A+(B==1)>3 && A<=3", "yes: A=3 B=1", "no: A=0 B=0"},
-        {"(A>0)+(A>1)+(A>2)==2", "yes: A=2", "no: A=0"},
         {"(A>0)*(B>0)*5==5", "yes: A=1 B=1", "no: A=0 B=0"},
         // Calls and members are unknowns, whatever their arguments.
         {"A==B && defined(A) && !defined(B)", "yes: A=0 B=0 defined(A)=1 defined(B)=0",
          "no: A=0 B=0 defined(A)=0 defined(B)=0"},
         {"f(x,1)>f(x,2) && s.m>2", "yes: f(x,1)=0 f(x,2)=-1 s.m=3", "no: f(x,1)=0 f(x,2)=0 s.m=0"},
         // The variant keywords.
-        {"(sim) && (codegen)", "no", "no: (codegen)=1 (sim)=0"},
         {"!(sim) && (codegen) == 1", "yes: (codegen)=1 (sim)=0", "no: (codegen)=0 (sim)=1"},
         // Arithmetic that is not understood.
-        {"A*B==6 && A*B==7", "no", "no: A=0 B=0"},
         {"A*B==391 && A>17 && A<391", "yes: A=23 B=17", "no: A=0 B=0"},
-        {"(A|B) && !A && !B", "no", "no: A=0 B=0"},
         {"A%16==20 || (A&3)>3 || (A&3)<0", "no", "no: A=0"},
-        {"(A&8)==1 || (A&6)!=0 && !A", "no", "no: A=0"},
         {"(A&5)-B==2 && B==2", "yes: A=4 B=2", "no: A=0 B=0"},
         {"A%B>0 && !(A%C>0)", "yes: A=1 B=2 C=1", "no: A=1 B=1 C=1"},
         {"A+B>64 && A==5", "yes: A=5 B=60", "no: A=0 B=0"},
-        {"A>5 && B>5 && A+B<3", "no", "no: A=0 B=0"},
         {"X>>4 > Y && Y>100", "yes: X=1632 Y=101", "no: X=0 Y=0"},
         {"1/A==2", "undecided terms", "no: A=1"},
-        {"A*A==2", "undecided terms", "no: A=0"},
     };
     expectRows(rows);
 }
@@ -135,7 +118,6 @@ TEST(DecisionOfSets, CoverAndOverlap) {
 
     const Row rows[] = {
         {{}, "no:", "yes", std::nullopt},
-        {{"A==1", "A==2", "A<1", "A>2"}, "yes", "yes", std::nullopt},
         {{"A==1", "A==2", "A<1", "A>3"}, "no: A=3", "yes", std::nullopt},
         {{"A==1", "B", "A<0", "A<3 && A>1", "A==2 && !B"}, "no: A=0 B=0", "no: A=1 B=1", {{0, 1}}},
         {{"A<B", "A>B", "B==A+1"}, "no: A=0 B=0", "no: A=0 B=1", {{0, 2}}},

@@ -96,68 +96,50 @@ private:
     std::string change() {
         const std::string name = oneOf(macro(), macro(), "D", "E", "VAL", "VAL");
         const std::string pop = "pop_macro(\\\"" + name + "\\\")\")";
-        switch (theme_ != Theme::None && below(2) == 0 ? static_cast<std::size_t>(theme_) - below(3) : below(15)) {
-        case 0:
-            return "#undef " + name;
-        case 1:
-        case 2:
-            return "#undef " + name + "\n#define " + name + " " + body(name);
-        case 3:
-            return "#\\\nun\\\ndef /* */ " + name;
-        case 4:
-            return "#include \"header.h\"";
-        case 5:
-            return oneOf("import \"header.h\";", "export import \"header.h\";");
-        case 6:
-            return "#pragma push_macro(\"" + name + "\")\n#define " + name + " 7";
-        case 7:
-            return "#pragma pop_macro(\"" + name + "\")";
-        case 8:
-            return "x; _Pragma(\"" + pop;
-        case 9:
-            return "_Pra\\\ngma\n(\"" + pop;
-        case 10:
-            return text.find("define POP") != std::string::npos ? "POP" : "DO(pop_macro(\"" + macro() + "\"))";
-        case 11:
-            return oneOf("#define \u00e9 1", "#undef \\u00e9", "#undef " + macro() + "\u00a0");
-        case 12:
-        case 13:
-            return oneOf("#assert m(x)", "#unassert m");
-        default:
-            return oneOf("/*\n#undef " + name + " */", "s = '\"'; // \\\n#undef " + name);
-        }
+        const std::string changes[] = {
+            "#undef " + name,
+            "#undef " + name + "\n#define " + name + " " + body(name),
+            "#undef " + name + "\n#define " + name + " " + body(name),
+            "#\\\nun\\\ndef /* */ " + name,
+            "#include \"header.h\"",
+            oneOf("import \"header.h\";", "export import \"header.h\";"),
+            "#pragma push_macro(\"" + name + "\")\n#define " + name + " 7",
+            "#pragma pop_macro(\"" + name + "\")",
+            "x; _Pragma(\"" + pop,
+            "_Pra\\\ngma\n(\"" + pop,
+            text.find("define POP") != std::string::npos ? "POP" : "DO(pop_macro(\"" + macro() + "\"))",
+            oneOf("#define \u00e9 1", "#undef \\u00e9", "#undef " + macro() + "\u00a0"),
+            oneOf("#assert m(x)", "#unassert m"),
+            oneOf("#assert m(x)", "#unassert m"),
+            oneOf("/*\n#undef " + name + " */", "s = '\"'; // \\\n#undef " + name),
+        };
+        return changes[theme_ != Theme::None && below(2) == 0 ? static_cast<std::size_t>(theme_) - below(3)
+                                                              : below(15)];
     }
 
     std::string atom() {
         const std::string op = oneOf("==", "!=", "<", "<=", ">", ">=");
-        switch (below(plain_ ? 6 : 13)) {
-        case 0:
-            return "defined(" + name() + ")";
-        case 1:
-            return "defined " + name();
-        case 2:
-            return name();
-        case 6:
-            return name() + " " + op + " " + name();
-        case 7:
-            return name() + op + oneOf("-1", "1u", "0xFFFFFFFFFFFFFFFF", "'\\3'");
-        case 8:
-            return "(" + macro() + " & 1) " + op + " " + oneOf("0", "1");
-        case 9:
-            return macro() + "+1 " + op + " " + oneOf("2", macro() + "*2");
-        case 10:
-            return oneOf("F(" + macro() + ")", "F(AL)", "JOIN(V, AL)") + oneOf("", " " + op + " 1");
-        case 11:
-            if (theme_ == Theme::Odd)
-                return oneOf("#m(x)", "defined \u00e9", "defined(\\u00e9)");
-            return oneOf("__has_include(<no//t.h>)", "__has_include ( <header//.h> )", "#m(x)", "defined \u00e9",
-                         "defined(\\u00e9)", "not -" + macro(), "-" + macro());
-        case 12:
-            return derived[below(derived.size())] + op + "1";
-        default:
-            return below(4) == 0 ? oneOf("0", "1", "2") + " " + op + macro()
-                                 : macro() + " " + op + " " + oneOf("0", "0x1", "1L", "02", "0b10");
-        }
+        const std::string common = below(4) == 0 ? oneOf("0", "1", "2") + " " + op + macro()
+                                                 : macro() + " " + op + " " + oneOf("0", "0x1", "1L", "02", "0b10");
+        const std::string odd = oneOf("#m(x)", "defined \u00e9", "defined(\\u00e9)");
+        const std::string atoms[] = {
+            "defined(" + name() + ")",
+            "defined " + name(),
+            name(),
+            common,
+            common,
+            common,
+            name() + " " + op + " " + name(), // from here on not in plain conditions
+            name() + op + oneOf("-1", "1u", "0xFFFFFFFFFFFFFFFF", "'\\3'"),
+            "(" + macro() + " & 1) " + op + " " + oneOf("0", "1"),
+            macro() + "+1 " + op + " " + oneOf("2", macro() + "*2"),
+            oneOf("F(" + macro() + ")", "F(AL)", "JOIN(V, AL)") + oneOf("", " " + op + " 1"),
+            theme_ == Theme::Odd ? odd
+                                 : oneOf("__has_include(<no//t.h>)", "__has_include ( <header//.h> )", odd, odd, odd,
+                                         "not -" + macro(), "-" + macro()),
+            derived[below(derived.size())] + op + "1",
+        };
+        return atoms[below(plain_ ? 6 : 13)];
     }
 
     std::string condition(std::size_t depth) {

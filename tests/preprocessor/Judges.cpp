@@ -3,6 +3,7 @@
 #include "tests/support/Workplace.hpp"
 
 #include <algorithm>
+#include <iterator>
 
 namespace VT::Testing {
 
@@ -13,10 +14,9 @@ void run(const Workplace& place, const std::string& command) {
         throw std::runtime_error(command + ": " + place.read("words").substr(0, 2000));
 }
 
-std::string macroName(std::string name) {
-    for (char& c : name)
-        c = c == '.' ? '_' : c;
-    return name;
+std::vector<std::int64_t> numbers(const std::string& text) {
+    std::istringstream stream(text);
+    return {std::istream_iterator<std::int64_t>(stream), {}};
 }
 
 } // namespace
@@ -26,19 +26,18 @@ void Preprocessor::define(const Assignment& values, const std::vector<std::strin
         file_ += "#undef " + name + "\n";
     defined_.clear();
     for (const auto& [name, value] : values) {
-        defined_.push_back(macroName(name));
+        defined_.push_back(name);
+        std::ranges::replace(defined_.back(), '.', '_');
         const bool isFunction = std::ranges::find(functions, name) != functions.end();
         file_ += "#define " + defined_.back() + (isFunction ? "(...) " : " ") + std::to_string(value) + "\n";
     }
 }
 
-std::string Preprocessor::decide() const {
+std::vector<std::int64_t> Preprocessor::decide() const {
     const Workplace place;
     place.write("conditions.h", file_);
     run(place, "cpp -P -undef conditions.h decided");
-    std::string answers = place.read("decided");
-    std::erase_if(answers, [](char c) { return c != '0' && c != '1'; });
-    return answers;
+    return numbers(place.read("decided"));
 }
 
 std::string preprocessed(const std::string& file, const std::string& header) {
@@ -50,17 +49,7 @@ std::string preprocessed(const std::string& file, const std::string& header) {
 }
 
 std::string Compiler::program() const {
-    std::string text = "#include <stdbool.h>\n#include <stdio.h>\n";
-    std::map<std::string, std::string> fields;
-    for (const std::string& variable : variables_) {
-        const std::size_t point = variable.find('.');
-        if (point == std::string::npos)
-            text += "int " + variable + ";\n";
-        else
-            fields[variable.substr(0, point)] += "int " + variable.substr(point + 1) + "; ";
-    }
-    for (const auto& [name, members] : fields)
-        text += "struct { " + members + "} " + name + ";\n";
+    std::string text = "#include <stdbool.h>\n#include <stdio.h>\n" + declarations_;
     std::string addresses;
     for (const std::string& variable : variables_)
         addresses += "&" + variable + ", ";
@@ -89,11 +78,7 @@ std::vector<std::int64_t> Compiler::compute(const std::vector<Question>& questio
     }
     place.write("questions", input.str());
     run(place, "gcc -w -O0 -o program program.c && ./program <questions >answers");
-    std::istringstream answers(place.read("answers"));
-    std::vector<std::int64_t> values;
-    for (std::int64_t value = 0; answers >> value;)
-        values.push_back(value);
-    return values;
+    return numbers(place.read("answers"));
 }
 
 } // namespace VT::Testing

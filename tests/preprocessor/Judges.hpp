@@ -18,7 +18,7 @@ public:
     void ask(const std::string& condition) { file_ += "#if " + condition + "\n1\n#else\n0\n#endif\n"; }
 
     /// A 1 or 0 for each condition, in order; throws std::runtime_error with the preprocessor's words.
-    [[nodiscard]] std::string decide() const;
+    [[nodiscard]] std::vector<std::int64_t> decide() const;
 
 private:
     std::string file_;
@@ -37,8 +37,10 @@ public:
         std::vector<std::int64_t> values; ///< of the variables
     };
 
-    /// Declares variables of type int; S.x is a field.
-    explicit Compiler(std::vector<std::string> variables) : variables_(std::move(variables)) {}
+    /// The variables are of type int.
+    Compiler(std::string declarations, std::vector<std::string> variables)
+        : declarations_(std::move(declarations)),
+          variables_(std::move(variables)) {}
 
     void add(const std::string& expression) { expressions_.push_back(expression); }
 
@@ -47,6 +49,7 @@ public:
 private:
     [[nodiscard]] std::string program() const;
 
+    std::string declarations_;
     std::vector<std::string> variables_;
     std::vector<std::string> expressions_;
 };

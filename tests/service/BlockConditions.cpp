@@ -29,43 +29,7 @@ constexpr const char* model = R"json({"blocks": [
     {"name": "split", "from": "Free", "to": ["Engine/Petrol", "Engine/Diesel"]},
     {"name": "open", "from": "Engine/Petrol"}]})json";
 
-TEST(BlockConditions, AreThoseOfTheBlockAndAllAroundIt) {
-    VTRootBD root;
-    Embedded::readModel(model, root);
-    const VCServiceHandle service;
-
-    struct Row {
-        const char* path;
-        const char* condition;
-        const char* simplified;
-    };
-
-    for (const Row& row : std::initializer_list<Row>{
-             {"Engine", "P>0", "P>0"},
-             {"Engine/Petrol", "P>0 && F==1", "F==1 && P>0"},
-             {"Engine/Diesel", "P>0 && (F==2 && P>0)", "F==2 && P>0"},
-             {"Engine/Diesel/Filter", "P>0 && (F==2 && P>0)", "F==2 && P>0"},
-             {"Engine/Other", "P>0 && !(F==1 || F==2 && P>0)", "F!=1 && F!=2 && P>0"},
-             {"Free", "", ""},
-             {"Sim", "(sim)", "(sim)"},
-         }) {
-        SCOPED_TRACE(row.path);
-        const VTBlock* const block = root.find(row.path);
-        ASSERT_NE(block, nullptr);
-        EXPECT_EQ(service->getCExprNetAAVCEString(block, false), row.condition);
-        EXPECT_EQ(service->getCExprNetAAVCEString(block, true), row.simplified);
-        EXPECT_EQ(service->printCExpr(service->getQExprNetAAVCEIdx(block, false)), row.condition);
-    }
-    EXPECT_EQ(service->getQExprNetAAVCEString(root.find("Engine/Other"), true), "F~=1 && F~=2 && P>0");
-    EXPECT_EQ(service->getCExprNetAAVCEString(&root.ports()[0], true), "F==1 && P>0");
-    EXPECT_EQ(service->getQExprNetAAVCEString(&root.ports()[1], true), "F==1 && P>0 || F==2 && P>0");
-    EXPECT_EQ(service->getCExprNetAAVCEString(&root.ports()[2], true), "F==1 && P>0");
-    EXPECT_EQ(service->getQExprNetAAVCEIdx(static_cast<const VTBlock*>(nullptr), true), invalidId);
-    EXPECT_THROW(service->getQExprNetAAVCEIdx(root.find("Bad"), false), HostDiagnostic);
-    EXPECT_EQ(root.find("Engine/Filter"), nullptr);
-}
-
-TEST(BlockConditions, ACustomizerSaysWhatParametersMeanInEachBlock) {
+TEST(BlockConditions, AreThoseOfTheBlockAndAllAroundItAsACustomizerSaysThere) {
     VTRootBD root;
     Embedded::readModel(model, root);
     TestCustomizer customizer; // outlives the service
@@ -79,20 +43,35 @@ TEST(BlockConditions, ACustomizerSaysWhatParametersMeanInEachBlock) {
             return "Fuel";
         return std::nullopt;
     };
-    for (const auto& [path, condition] : std::initializer_list<std::pair<const char*, const char*>>{
-             {"Engine", "Power>0"},
-             {"Engine/Petrol", "Power>0 && Fuel==1"},
-             {"Engine/Diesel/Filter", "Power>0 && (F==2 && -5>0)"},
-             {"Engine/Other", "Power>0 && !(Fuel==1 || F==2 && -5>0)"},
-             {"Free", ""},
-             {"Sim", "(sim)"}}) {
+    const std::array<const char*, 4> rows[] = {
+        // a block; its condition as it stands, simplified and customized
+        {"Engine", "P>0", "P>0", "Power>0"},
+        {"Engine/Petrol", "P>0 && F==1", "F==1 && P>0", "Power>0 && Fuel==1"},
+        {"Engine/Diesel/Filter", "P>0 && (F==2 && P>0)", "F==2 && P>0", "Power>0 && (F==2 && -5>0)"},
+        {"Engine/Other", "P>0 && !(F==1 || F==2 && P>0)", "F!=1 && F!=2 && P>0",
+         "Power>0 && !(Fuel==1 || F==2 && -5>0)"},
+        {"Free", "", "", ""},
+        {"Sim", "(sim)", "(sim)", "(sim)"},
+    };
+    for (const auto& [path, condition, simplified, customized] : rows) {
+        SCOPED_TRACE(path);
         const VTBlock* const block = root.find(path);
-        EXPECT_EQ(service->getCExprNetAAVCEString(block, false, &customizer), condition);
-        EXPECT_EQ(service->printCExpr(service->getQExprNetAAVCEIdx(block, false, &customizer)), condition);
-        EXPECT_EQ(service->getCExprNetAAVCEString(block, true, nullptr), service->getCExprNetAAVCEString(block, true));
+        ASSERT_NE(block, nullptr);
+        EXPECT_EQ(service->getCExprNetAAVCEString(block, false), condition);
+        EXPECT_EQ(service->getCExprNetAAVCEString(block, true), simplified);
+        EXPECT_EQ(service->getCExprNetAAVCEString(block, true, nullptr), simplified);
+        EXPECT_EQ(service->printCExpr(service->getQExprNetAAVCEIdx(block, false)), condition);
+        EXPECT_EQ(service->getCExprNetAAVCEString(block, false, &customizer), customized);
+        EXPECT_EQ(service->printCExpr(service->getQExprNetAAVCEIdx(block, false, &customizer)), customized);
     }
+    EXPECT_EQ(service->getQExprNetAAVCEString(root.find("Engine/Other"), true), "F~=1 && F~=2 && P>0");
+    EXPECT_EQ(service->getCExprNetAAVCEString(&root.ports()[0], true), "F==1 && P>0");
     EXPECT_EQ(service->getQExprNetAAVCEString(&root.ports()[1], true, &customizer), "Fuel==1 && Power>0");
-    EXPECT_EQ(service->getCExprNetAAVCEString(&root.ports()[1], true), "F==1 && P>0 || F==2 && P>0");
+    EXPECT_EQ(service->getQExprNetAAVCEString(&root.ports()[1], true), "F==1 && P>0 || F==2 && P>0");
+    EXPECT_EQ(service->getCExprNetAAVCEString(&root.ports()[2], true), "F==1 && P>0");
+    EXPECT_EQ(service->getQExprNetAAVCEIdx(static_cast<const VTBlock*>(nullptr), true), invalidId);
+    EXPECT_THROW(service->getQExprNetAAVCEIdx(root.find("Bad"), false), HostDiagnostic);
+    EXPECT_EQ(root.find("Engine/Filter"), nullptr);
     EXPECT_EQ(customizer.rewrites, 0) << "it is not installed";
 
     const SymbolicExprId condition = service->parseC("P > 0 && F == 1 && (sim) && true && f(S.F) && P(1)");

@@ -16,6 +16,14 @@ auto rewriteTo(const std::string& text) {
     return [text](SymbolicExprId, SymbolicExprTable&) { return VCService::getInstance().parseC(text); };
 }
 
+/// A service with a customizer, which outlives it.
+struct Customized : testing::Test {
+    Customized() { service->setVCCustomizer(&customizer); }
+
+    TestCustomizer customizer;
+    const FreshService service;
+};
+
 TEST(Customizer, IsReleasedOnceItsSuccessorIsInPlace) {
     TestCustomizer first;
     TestCustomizer second;
@@ -69,20 +77,14 @@ TEST(Customizer, RewriteCountsWhereItDecides) {
     }
 }
 
-TEST(Customizer, RewriteToNoConditionIsNone) {
-    TestCustomizer customizer; // outlives the service
-    const FreshService service;
-    service->setVCCustomizer(&customizer);
+TEST_F(Customized, RewriteToNoConditionIsNone) {
     for (const SymbolicExprId bad : {invalidId, SymbolicExprId{1} << 40U}) {
         customizer.onRewrite = [bad](SymbolicExprId, SymbolicExprTable&) { return bad; };
         EXPECT_EQ(service->printCExpr(service->simplify(service->parseC("A>=3 && A<=3"), bad == invalidId)), "A==3");
     }
 }
 
-TEST(Customizer, ExceptionsPassAndNothingIsKept) {
-    TestCustomizer customizer; // outlives the service
-    const FreshService service;
-    service->setVCCustomizer(&customizer);
+TEST_F(Customized, ExceptionsPassAndNothingIsKept) {
     customizer.onRewrite = [](SymbolicExprId, SymbolicExprTable&) -> SymbolicExprId { throw std::domain_error("no"); };
     const VCSymbolicExprId condition = service->parseC("A==1");
     EXPECT_THROW(service->simplify(condition, true), std::domain_error);
@@ -120,28 +122,28 @@ TEST(Customizer, CachesKeepTheirAnswersByLanguage) {
 }
 
 TEST(Customizer, ConfirmsSelfComparisonsInQuillMode) {
-    for (const std::string op : {"<", "==", ">=", "!=", ">", "<="}) {
-        const std::string text = "P" + op + "P";
-        SCOPED_TRACE(text);
-        const bool truth = op.ends_with('=') && op != "!=";
-        const std::string agreed = truth ? "" : "false", refused = truth ? "false" : "";
+    for (const std::string op : {"<", "==", ">=", "!=", ">", "<="})
         for (const bool agrees : {true, false}) {
             TestCustomizer customizer; // outlives the service
             const FreshService service;
-            const VCSymbolicExprId condition = service->parseC(text);
+            const VCSymbolicExprId condition = service->parseC("P" + op + "P");
+            const auto simplified = [&](bool isQuill) {
+                return service->printCExpr(service->simplify(condition, isQuill));
+            };
+            const bool truth = op.ends_with('=') && op != "!=";
+            const std::string agreed = truth ? "" : "false", refused = truth ? "false" : "";
+            SCOPED_TRACE(op);
             customizer.agrees = agrees;
             service->setVCCustomizer(&customizer);
-            EXPECT_EQ(service->printCExpr(service->simplify(condition, false)), agreed);
+            EXPECT_EQ(simplified(false), agreed);
             EXPECT_TRUE(customizer.questions.empty());
-            EXPECT_EQ(service->printCExpr(service->simplify(condition, true)), agrees ? agreed : refused);
+            EXPECT_EQ(simplified(true), agrees ? agreed : refused);
             ASSERT_FALSE(customizer.questions.empty());
             EXPECT_EQ(customizer.questions.front().first, service->printQExpr(condition));
             EXPECT_EQ(customizer.questions.front().second, truth ? "true" : "false");
-            service->setVCCustomizer(nullptr);
+            const FreshService alone;
+            EXPECT_EQ(alone->printCExpr(alone->simplify(alone->parseC("P" + op + "P"), true)), agreed);
         }
-        const FreshService alone;
-        EXPECT_EQ(alone->printCExpr(alone->simplify(alone->parseC(text), true)), agreed);
-    }
 }
 
 TEST(Customizer, VisitorWithNobodyToAskAnswersTheOtherWayRound) {
@@ -160,11 +162,8 @@ TEST(Customizer, VisitorWithNobodyToAskAnswersTheOtherWayRound) {
     EXPECT_EQ(simplified("P<P || P>2 && P>3", true, &agreeing), "P>3");
 }
 
-TEST(Customizer, ReplacesParametersToCompare) {
-    TestCustomizer customizer;
+TEST_F(Customized, ReplacesParametersToCompare) {
     customizer.parameters = {{"P", "Q"}, {"Q", "P"}, {"N", 3}, {"true", "Q"}};
-    const FreshService service;
-    service->setVCCustomizer(&customizer);
     const std::vector<std::tuple<const char*, const char*, bool>> cases{
         {"P==1", "Q==1", false},      {"P", "P && P", true},        {"P==N", "P==3", true},
         {"P>N", "!(P<=3)", true},     {"f(N)==Q", "f(3)==Q", true}, {"N==3", "true", true},

@@ -9,7 +9,6 @@
 
 #include <array>
 #include <gtest/gtest.h>
-#include <map>
 #include <optional>
 #include <rapidcheck/gtest.h>
 
@@ -69,10 +68,8 @@ TEST(ServiceTexts, AreReadAndPrinted) {
     const std::vector<std::array<std::string, 5>> rows{
         // a text, in C and in Quill, simplified in C and in Quill
         {"", "", "", "", ""},
-        {"false", "false", "false", "false", "false"},
         {"A==1&&A==2", "A==1 && A==2", "A==1 && A==2", "false", "false"},
         {"!(A<3)", "!(A<3)", "~(A<3)", "A>=3", "A>=3"},
-        {"(a/b)%c", "a/b%c", "rem(idivide(a,b),c)", "a/b%c", "rem(idivide(a,b),c)"},
         {"F & 4 || x >> 2", "F&4 || x>>2", "bitand(F,4) || bitshift(x,-2)", "F&4 || x>>2",
          "bitand(F,4) || bitshift(x,-2)"},
         {"(sim) && (codegen)", "(sim) && (codegen)", "(sim) && (codegen)", "false", "false"},
@@ -120,14 +117,11 @@ TEST(ServiceTexts, ThatAreNoConditionAreRefused) {
 TEST(ServiceCombinations, OfConstantsAndConditions) {
     const std::vector<std::array<std::string, 6>> rows{
         // two conditions; both of them, not simplified and simplified; either of them
-        {"true", "", "", "", "", ""},
         {"true", "false", "false", "false", "", ""},
         {"false", "false", "false", "false", "false", "false"},
         {"true", "!(x<1)", "!(x<1)", "x>=1", "", ""},
         {"false", "!(x<1)", "false", "false", "!(x<1)", "x>=1"},
         {"!(x<1)", "false", "false", "false", "!(x<1)", "x>=1"},
-        {"!(x<1)", "true", "!(x<1)", "x>=1", "", ""},
-        {"x==1", "x==2", "x==1 && x==2", "false", "x==1 || x==2", "x==1 || x==2"},
         {"x<3", "x>3", "x<3 && x>3", "false", "x<3 || x>3", "x!=3"},
         {"y", "x", "y && x", "x && y", "y || x", "x || y"},
     };
@@ -145,15 +139,15 @@ TEST(ServiceCombinations, OfConstantsAndConditions) {
 
 TEST(ServiceCombinations, NegateAtOnceOrInFull) {
     const FreshService service;
-    const auto negated = [&](const char* text, bool simplify) {
-        return service->printCExpr(service->NOT(service->parseC(text), simplify));
-    };
-    EXPECT_EQ(negated("true", false), "false");
-    EXPECT_EQ(negated("false", false), "");
-    EXPECT_EQ(negated("!(x==1)", false), "!(!(x==1))");
-    EXPECT_EQ(negated("!(x==1)", true), "x==1");
-    EXPECT_EQ(negated("!x", true), "!(!x)"); // a truth value, which x need not be
-    EXPECT_EQ(negated("x==1 && y>2", true), "x!=1 || y<=2");
+    for (const auto& [text, negated, simplified] : std::initializer_list<std::array<const char*, 3>>{
+             {"true", "false", "false"},
+             {"false", "", ""},
+             {"!(x==1)", "!(!(x==1))", "x==1"},
+             {"!x", "!(!x)", "!(!x)"}, // a truth value, which x need not be
+             {"x==1 && y>2", "!(x==1 && y>2)", "x!=1 || y<=2"}}) {
+        EXPECT_EQ(service->printCExpr(service->NOT(service->parseC(text), false)), negated);
+        EXPECT_EQ(service->printCExpr(service->NOT(service->parseC(text), true)), simplified);
+    }
 }
 
 TEST(ServiceIds, ThatAreNotOfTheTableAreAnswered) {
@@ -193,26 +187,11 @@ TEST(ServiceAliases, FirstOneStays) {
     EXPECT_EQ(service->printCExpr(service->parseC("N")), "N");
 }
 
-TEST(QuillService, ConvertsBothWays) {
-    const VCServiceHandle service;
-    for (const auto& [quill, c] : std::map<std::string, std::string>{{"bitand(F,4)~=0", "(F&4)!=0"},
-                                                                     {"bitshift(a,-3)", "a>>3"},
-                                                                     {"rem(idivide(a,b),2)==1", "a/b%2==1"},
-                                                                     {"bitxor(a,bitor(b,bitcmp(c)))", "a^(b|~c)"},
-                                                                     {"~A || B && C~=1", "!A || B && C!=1"},
-                                                                     {"f(A,2)<=P.x", "f(A,2)<=P.x"},
-                                                                     {"(sim) && A", "(sim) && A"}}) {
-        EXPECT_EQ(service->parseQ(quill), service->parseC(c));
-        EXPECT_EQ(service->convertExprBetweenQandC(quill, true, false), c);
-        EXPECT_EQ(service->convertExprBetweenQandC(c, false, true), quill);
-    }
-}
-
 TEST(QuillService, SimplifiesAndPrintsInEitherLanguage) {
     const VCServiceHandle service;
-    EXPECT_EQ(service->simplifyQExprFromQCondition("A == 1 && A == 2"), "false");
     EXPECT_EQ(service->simplifyQExprFromQCondition("A ~= 1 || A ~= 2"), "");
     EXPECT_EQ(service->simplifyCExprFromQCondition("~(A < 3) && bitand(F, 4) ~= 0"), "A>=3 && (F&4)!=0");
+    EXPECT_EQ(service->convertExprBetweenQandC("bitand(F,4)~=0", true, false), "(F&4)!=0");
     EXPECT_EQ(service->simplifyExpressionWithoutEvalChecks("~(A < 3)", true, false), "A>=3");
     EXPECT_EQ(service->simplifyExpressionWithoutEvalChecks("A != 3 && true", false, true), "A~=3");
     for (const char* const constant : {"", "true"})
@@ -233,7 +212,6 @@ TEST(QuillService, ListsAndReplacesSymbols) {
     EXPECT_THROW(service->getSymbolsFromExpression(condition, names, static_cast<VCSymbolType>(4)), std::out_of_range);
     const auto swapped = service->replaceSymbolsInExpression(condition, {{"Mode", "Gear"}, {"Gear", "Mode"}});
     EXPECT_EQ(service->printQExpr(swapped), "Gear==1 && f(Mode)>P.x");
-    EXPECT_EQ(service->printQExpr(service->replaceSymbolsInExpression(service->parseC("A"), {{"A", "B"}})), "B");
     const std::size_t nodes = service->table().size();
     EXPECT_EQ(service->replaceSymbolsInExpression(condition, {{"NotThere", "Nowhere"}}), condition);
     EXPECT_EQ(service->table().size(), nodes);
@@ -246,9 +224,8 @@ RC_GTEST_PROP(QuillService, ReadsWhatCReads, ()) {
     shape.lowest = 0; // a sign belongs to a literal in C alone
     shape.symbolPairs = shape.truthValues = true;
     const std::string c = randomCondition(random, 1 + random() % 8, shape);
-    std::string quill;
-    for (std::size_t i = 0; i < c.size(); ++i)
-        quill += c[i] == '!' ? '~' : c[i];
+    std::string quill = c;
+    std::ranges::replace(quill, '!', '~');
     RC_ASSERT(service->parseQ(quill) == service->parseC(c));
     RC_ASSERT(service->simplifyFromQCondition(quill).id() == service->simplifyFromCCondition(c).id());
     RC_ASSERT(service->parseQ(service->printQExpr(service->parseC(c))) == service->parseC(c));

@@ -17,31 +17,17 @@ namespace {
 using Names = std::vector<std::string>;
 
 TEST(VCSymbols, ByKind) {
-    struct Case {
-        std::string text;
-        unsigned kinds;
-        Names expected;
-    };
-
-    const std::vector<Case> cases{
-        {"A == 1 && B > A", 1, {"A", "B"}},
-        {"A && true", 1, {"A", "true"}},
-        {"bound.m + free.m + x", 2, {"bound.m"}},
-        {"bound.m + free.m + x", 4, {"free.m"}},
-        {"free.m + x + bound.m + free.m", 7, {"free.m", "x", "bound.m"}},
-        {"a.m.n < x", 15, {"a.m.n", "x"}},          // no look into the owner
-        {"f + f(f) + f(f(g))", 8, {"f", "f", "f"}}, // once for each call
-        {"f + f(f) + f(f(g))", 1, {"f", "g"}},
-        {"f(g(x), y)", 9, {"f", "g", "x", "y"}}, // the name comes first
-        {"x + f(bound.m)", 0, {}},
+    const std::tuple<const char*, unsigned, Names> cases[] = {
+        {"bound.m + free.m + x", 2, {"before", "bound.m"}},
+        {"free.m + x + bound.m + free.m", 7, {"before", "free.m", "x", "bound.m"}},
+        {"a.m.n < x && true", 15, {"before", "a.m.n", "x", "true"}},        // no look into the owner
+        {"f(g(x), y) + f(f)", 9, {"before", "f", "g", "x", "y", "f", "f"}}, // once for each call, its name first
     };
     for (const auto& [text, kinds, expected] : cases) {
         SymbolicExprTable table;
         table.registerValueId(read(table, "bound.m"), read(table, "4"));
         Names names{"before"};
         VCSymbolsOfSymbolicExpr(table, kinds).getSymbols(read(table, text), names);
-        ASSERT_EQ(names.front(), "before");
-        names.erase(names.begin());
         EXPECT_EQ(names, expected) << text << " kinds " << kinds;
     }
 }
