@@ -5,12 +5,10 @@
 #include "base/variants/VariantKeywords.hpp"
 #include "host/Diagnostics.hpp"
 #include "tests/service/Customizers.hpp"
-#include "tests/support/RandomCondition.hpp"
 
 #include <array>
 #include <gtest/gtest.h>
 #include <optional>
-#include <rapidcheck/gtest.h>
 
 namespace VT::Testing {
 namespace {
@@ -215,20 +213,6 @@ TEST(QuillService, ListsAndReplacesSymbols) {
     const std::size_t nodes = service->table().size();
     EXPECT_EQ(service->replaceSymbolsInExpression(condition, {{"NotThere", "Nowhere"}}), condition);
     EXPECT_EQ(service->table().size(), nodes);
-}
-
-RC_GTEST_PROP(QuillService, ReadsWhatCReads, ()) {
-    const VCServiceHandle service;
-    std::mt19937_64 random(*rc::gen::arbitrary<std::uint64_t>());
-    ConditionShape shape;
-    shape.lowest = 0; // a sign belongs to a literal in C alone
-    shape.symbolPairs = shape.truthValues = true;
-    const std::string c = randomCondition(random, 1 + random() % 8, shape);
-    std::string quill = c;
-    std::ranges::replace(quill, '!', '~');
-    RC_ASSERT(service->parseQ(quill) == service->parseC(c));
-    RC_ASSERT(service->simplifyFromQCondition(quill).id() == service->simplifyFromCCondition(c).id());
-    RC_ASSERT(service->parseQ(service->printQExpr(service->parseC(c))) == service->parseC(c));
 }
 
 } // namespace
