@@ -1,14 +1,15 @@
 // Every operator on every pair of corner values, and expressions in every way of evaluation, against arithmetic written
 // down again over wide integers.
+#include "base/eval/Eval.hpp"
 #include "base/eval/EvalVisitor.hpp"
-#include "base/print/ExpressionPrinter.hpp"
-#include "tests/eval/Scalars.hpp"
+#include "tests/support/AnyNode.hpp"
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
 #include <cmath>
 #include <functional>
+#include <limits>
 #include <map>
 #include <random>
 #include <set>
@@ -20,6 +21,33 @@ constexpr double infinity = std::numeric_limits<double>::infinity();
 constexpr double threshold = 1.4901161193847656e-08;
 constexpr std::int64_t greatest = 2147483647;
 constexpr std::int64_t least = -2147483648;
+
+/// Values at which something changes: bounds of int, of shifts and of the tolerance, signs, halves, what is no number.
+const std::vector<SymbolicScalar>& corners() {
+    static const std::vector<SymbolicScalar> all = [] {
+        std::vector<SymbolicScalar> values{false, true, std::numeric_limits<double>::quiet_NaN()};
+        for (const int value :
+             {-2147483647 - 1, -2147483647, -33, -32, -31, -7, -1, 0, 1, 2, 31, 32, 33, 46341, 2147483646, 2147483647})
+            values.emplace_back(value);
+        for (const double value : {threshold, std::nextafter(threshold, 0.0), std::nextafter(threshold, 1.0), 0.0, 0.5,
+                                   0.3, 0.1 + 0.2, 1.0, 1.0 + threshold, 31.9, 32.0, 2147483647.5, 2147483648.0,
+                                   2147483648.5, 2147483649.0, 1e300, 5e-324, infinity})
+            values.insert(values.end(), {value, -value});
+        return values;
+    }();
+    return all;
+}
+
+SymbolicExprId literal(SymbolicExprTable& table, const SymbolicScalar& value) {
+    if (value.type() == ScalarType::Bool)
+        return SymbolicString(table, value.getBool() ? "true" : "false").getId(table);
+    if (value.type() == ScalarType::Int)
+        return SymbolicIntValue(table, value.getInt()).getId(table);
+    if (value == SymbolicScalar(-0.0)) // as a literal it is that of 0
+        return SymbolicUnaryMinusExpr(table, literal(table, 0.0)).getId(table);
+    const SymbolicExprId found = SymbolicDoubleValue(table, value.getDouble()).getId(table);
+    return found != invalidId ? found : table.size() - 1; // NaN is not found
+}
 
 /// A scalar in the oracle's hands: an integer without bounds, or a real.
 struct Wide {
@@ -155,16 +183,16 @@ TEST(Arithmetic, AgreesWithWideIntegersOnEveryPairOfCornerValues) {
         literals.push_back(literal(table, value));
     std::size_t operators = 0;
     for (const OperatorInfo& row : operatorTable()) {
-        if (row.shape != "Unary" && row.shape != "Binary")
+        if (row.op <= SymbolicOp::DoubleValue || row.op == SymbolicOp::MemberValue || dimensionOps.contains(row.op))
             continue;
-        const std::size_t operands = operandCount(row.op).value();
-        const SymbolicExprId id = makeAny(table, row.op, {"", 0, 0, {a, b}});
+        const SymbolicExprId id = makeNode(table, row.op, {a, b, b});
         const SymbolicExprEval evaluator(table);
         if (scalarRuleIndex(row.op) == ScalarRuleIndex::None) {
             EXPECT_THROW(static_cast<void>(evaluator.eval(id)), HostDiagnostic) << row.name;
             EXPECT_THROW(static_cast<void>(evaluator.prepare(id)), HostDiagnostic) << row.name;
             continue;
         }
+        const std::size_t operands = operandCount(row.op).value();
         ++operators;
         PreparedExpr prepared = evaluator.prepare(id);
         for (std::size_t i = 0; i < corners().size(); ++i)
@@ -193,6 +221,12 @@ struct Outcome {
     std::vector<SymbolicScalar> values = {};
 
     bool operator==(const Outcome&) const = default;
+
+    friend std::ostream& operator<<(std::ostream& stream, const Outcome& outcome) {
+        for (const SymbolicScalar& value : outcome.values)
+            stream << shown(value) << " ";
+        return stream << outcome.error;
+    }
 };
 
 /// The value of an expression by recursion over the tree; expressions are small.
@@ -276,98 +310,136 @@ Outcome outcomeOf(Evaluate evaluate) {
     }
 }
 
-/// Asks in every way; how the answers differ from the model's, in words.
-std::string differences(const SymbolicExprTable& table, SymbolicExprId id, bool& hasValue) {
-    Outcome wanted = Model(table).of(id);
-    std::ranges::transform(wanted.values, wanted.values.begin(), visibleScalar);
-    hasValue = wanted.error.empty();
-    SymbolicExprEvalImpl executed(table);
-    SymbolicExprEvalImpl accepted(table);
-    const SymbolicExprEval evaluator(table);
-    const std::vector<std::pair<std::string, Outcome>> answers{
-        {"eval", outcomeOf([&] { return evaluator.eval(id); })},
-        {"execute", outcomeOf([&] { return executed.execute(table, id), executed.get(); })},
-        {"accept", outcomeOf([&] { return table.get(id)->accept(table, accepted), accepted.get(); })},
-        {"prepare", outcomeOf([&] { return evaluator.prepare(id).run(); })},
-    };
-    std::string words;
-    for (const auto& [way, answer] : answers) {
-        // A prepared expression may come upon another fault first.
-        const bool same = way == "prepare" && !hasValue ? !answer.error.empty() : answer == wanted;
-        if (!same)
-            words += way + " of node " + std::to_string(id) + ": " + answer.error + ", not " + wanted.error + "; ";
-        for (std::size_t i = 0; !same && i < std::min(answer.values.size(), wanted.values.size()); ++i)
-            words += shown(answer.values[i]) + ", not " + shown(wanted.values[i]) + "; ";
+/// The model's outcome with what of it is visible.
+Outcome modelled(const SymbolicExprTable& table, SymbolicExprId id) {
+    Outcome outcome = Model(table).of(id);
+    std::ranges::transform(outcome.values, outcome.values.begin(), visibleScalar);
+    return outcome;
+}
+
+/// Operators over corner values, symbols and members.  In a wild graph some operators have no value and some operands
+/// are missing.
+class Graph {
+public:
+    Graph(unsigned seed, bool isWild) : random_(seed) {
+        for (const char* name : {"a", "b", "s", "true"})
+            symbols.push_back(SymbolicString(table, name).getId(table));
+        for (const std::size_t owner : {0U, 2U, 4U})
+            symbols.push_back(SymbolicMemberValue(table, symbols[owner], "x").getId(table));
+        nodes = symbols;
+        for (int i = 0; i < 8; ++i)
+            nodes.push_back(literal(table, anyScalar()));
+        while (nodes.size() < 50) {
+            const SymbolicOp op = isWild && below(30) == 0 ? operatorTable()[below(operatorTable().size())].op
+                                  : below(15) == 0         ? SymbolicOp::DimsND
+                                                           : scalarRules[below(scalarRules.size())].op;
+            std::vector<SymbolicExprId> inputs(operandCount(op).value_or(below(4)));
+            for (SymbolicExprId& input : inputs)
+                input = isWild && below(200) == 0 ? table.size() + below(3)
+                        : isWild && below(300) == 0
+                            ? invalidId
+                            : nodes[nodes.size() - 1 - below(std::min<std::size_t>(20, nodes.size()))];
+            if (op > SymbolicOp::DoubleValue)
+                nodes.push_back(makeNode(table, op, inputs));
+        }
     }
-    return words;
-}
 
-TEST(Ways, AgreeWhereEveryOperatorIsUnderEveryOther) {
-    std::mt19937_64 random(6);
+    std::size_t below(std::size_t bound) { return random_() % bound; }
+
+    SymbolicScalar anyScalar() { return corners()[below(corners().size())]; }
+
+    /// Gives a symbol a number or a list of numbers, and answers it.
+    SymbolicValue rebind(SymbolicExprId symbol) {
+        SymbolicValue::Elements elements;
+        std::vector<SymbolicExprId> literals;
+        for (std::size_t i = below(2) == 0 ? 2 : below(4); i > 0; --i) {
+            elements.push_back(anyScalar());
+            literals.push_back(literal(table, elements.back()));
+        }
+        const bool isList = elements.empty() || below(6) == 0;
+        table.registerValueId(symbol, isList ? SymbolicNDExpr(table, literals).getId(table) : literals.front());
+        return isList ? SymbolicValue(elements) : SymbolicValue(elements.front());
+    }
+
     SymbolicExprTable table;
-    std::vector<SymbolicExprId> leaves;
-    for (const SymbolicScalar& value : corners())
-        leaves.push_back(literal(table, value));
-    const auto node = [&](SymbolicOp op, SymbolicExprId operand, std::size_t place) {
-        std::vector<SymbolicExprId> inputs(operandCount(op).value_or(2));
-        for (SymbolicExprId& input : inputs)
-            input = leaves[random() % leaves.size()];
-        inputs.at(std::min(place, inputs.size() - 1)) = operand;
-        return makeNode(table, op, inputs);
-    };
-    bool hasValue = false;
-    std::size_t values = 0;
-    for (const OperatorInfo& outer : operatorTable())
-        for (const OperatorInfo& inner : operatorTable())
-            for (const std::size_t place : {0U, 1U}) {
-                if (outer.op <= SymbolicOp::DoubleValue || inner.op <= SymbolicOp::DoubleValue)
-                    continue; // a leaf
-                for (int i = 0; i < 12; ++i) {
-                    const SymbolicExprId id =
-                        node(outer.op, node(inner.op, leaves[random() % leaves.size()], 0), place);
-                    ASSERT_EQ(differences(table, id, hasValue), "") << SymbolicExprPrinter(table, false)(id);
-                    values += hasValue ? 1 : 0;
-                }
-            }
-    EXPECT_GT(values, 8000U);
-}
+    std::vector<SymbolicExprId> symbols, nodes;
 
+private:
+    std::mt19937_64 random_;
+};
+
+// Every way of asking answers what the model does.
 TEST(Ways, AgreeOnRandomGraphsOfBoundAndMissingParts) {
     std::size_t values = 0, faults = 0;
-    for (unsigned seed = 0; seed < 400; ++seed) {
-        std::mt19937_64 random(seed);
-        SymbolicExprTable table;
-        const Trees tree{table};
-        std::vector<SymbolicExprId> symbols{tree.name("a"), tree.name("b"), tree.name("s"), tree.name("true")};
-        for (const std::size_t owner : {0U, 2U, 2U, 4U})
-            symbols.push_back(SymbolicMemberValue(table, symbols[owner], "x").getId(table));
-        std::vector<SymbolicExprId> nodes = symbols;
-        for (int i = 0; i < 8; ++i)
-            nodes.push_back(literal(table, corners()[random() % corners().size()]));
-        while (nodes.size() < 50) {
-            const auto any = [&] {
-                return nodes[nodes.size() - 1 - random() % std::min<std::size_t>(20, nodes.size())];
-            };
-            const auto operand = [&] {
-                return random() % 200 == 0 ? table.size() + random() % 3 : random() % 300 == 0 ? invalidId : any();
-            };
-            const SymbolicOp op = random() % 30 == 0   ? operatorTable()[random() % operatorTable().size()].op
-                                  : random() % 15 == 0 ? SymbolicOp::DimsND
-                                                       : scalarRules[random() % scalarRules.size()].op;
-            if (op > SymbolicOp::DoubleValue)
-                nodes.push_back(makeNode(table, op, {operand(), operand(), operand()}));
-        }
-        for (const SymbolicExprId symbol : symbols)
-            if (random() % 4 != 0)
-                table.registerValueId(symbol, nodes[random() % 3 == 0 ? random() % nodes.size() : symbols.size()]);
-        for (const SymbolicExprId id : nodes) {
-            bool hasValue = false;
-            ASSERT_EQ(differences(table, id, hasValue), "") << "seed " << seed;
-            ++(hasValue ? values : faults);
+    for (unsigned seed = 0; seed < 800; ++seed) {
+        Graph graph(seed, true);
+        for (const SymbolicExprId symbol : graph.symbols)
+            if (graph.below(4) != 0)
+                graph.table.registerValueId(
+                    symbol, graph.nodes[graph.below(3) == 0 ? graph.below(graph.nodes.size()) : graph.symbols.size()]);
+        for (const SymbolicExprId id : graph.nodes) {
+            const SymbolicExprTable& table = graph.table;
+            const Outcome wanted = modelled(table, id);
+            SymbolicExprEvalImpl executed(table);
+            SymbolicExprEvalImpl accepted(table);
+            const SymbolicExprEval evaluator(table);
+            ASSERT_EQ(outcomeOf([&] { return evaluator.eval(id); }), wanted) << seed;
+            ASSERT_EQ(outcomeOf([&] { return executed.execute(table, id), executed.get(); }), wanted) << seed;
+            ASSERT_EQ(outcomeOf([&] { return table.get(id)->accept(table, accepted), accepted.get(); }), wanted)
+                << seed;
+            const Outcome prepared = outcomeOf([&] { return evaluator.prepare(id).run(); });
+            if (wanted.error.empty())
+                ASSERT_EQ(prepared, wanted) << seed;
+            else // it may come upon another fault first
+                ASSERT_NE(prepared.error, "") << seed;
+            ++(wanted.error.empty() ? values : faults);
         }
     }
-    EXPECT_GT(values, 4000U);
-    EXPECT_GT(faults, 4000U);
+    EXPECT_GT(values, 8000U);
+    EXPECT_GT(faults, 8000U);
+}
+
+TEST(Prepared, AnswersWhateverItsSlotsAndTheTableHold) {
+    std::size_t values = 0, faults = 0, again = 0;
+    for (unsigned seed = 0; seed < 2000; ++seed) {
+        Graph graph(seed, false);
+        const SymbolicExprEval evaluator(graph.table);
+        const SymbolicExprId root = graph.nodes.back();
+        PreparedExpr prepared = evaluator.prepare(root);
+        PreparedExpr early = prepared;
+        for (const SymbolicExprId symbol : graph.symbols)
+            if (graph.below(4) != 0)
+                graph.rebind(symbol);
+        const bool failedEarly = !outcomeOf([&] { return early.run(); }).error.empty();
+        for (int round = 0; round < 10; ++round) {
+            for (const SymbolicExprId symbol : graph.symbols) {
+                if (round > 0 && graph.below(2) == 0)
+                    continue;
+                const SymbolicValue value = graph.rebind(symbol);
+                // In the first round some are left to be taken from the table.
+                if (const auto slot = prepared.slotOf(symbol); slot && (round > 0 || graph.below(2) == 0))
+                    prepared.set(*slot, value);
+            }
+            const Outcome wanted = modelled(graph.table, root);
+            if (round == 0 && failedEarly) {
+                ASSERT_EQ(outcomeOf([&] { return early.run(); }), wanted) << "kept from a failed run, seed " << seed;
+                ++again;
+            }
+            for (int time = 0; time < 2; ++time)
+                ASSERT_EQ(outcomeOf([&] { return prepared.run(); }), wanted) << "seed " << seed << ", round " << round;
+            ++(wanted.error.empty() ? values : faults);
+            if (graph.below(3) == 0) { // a copy goes on alone
+                PreparedExpr copy = prepared;
+                prepared = copy;
+                if (copy.slotCount() > 0)
+                    copy.set(0, SymbolicValue::Elements{1, 2, 3});
+                static_cast<void>(outcomeOf([&] { return copy.run(); }));
+            }
+        }
+    }
+    EXPECT_GT(values, 8000U);
+    EXPECT_GT(faults, 1000U);
+    EXPECT_GT(again, 300U);
 }
 
 } // namespace
