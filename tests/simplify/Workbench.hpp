@@ -7,24 +7,8 @@
 #include "tests/support/Truth.hpp"
 
 #include <string>
-#include <vector>
 
 namespace VT::Testing {
-
-/// Remembers the rules that fired.
-class FiredRules final : public RuleListener {
-public:
-    void fired(const RuleFiring& firing) override { firings.push_back(firing); }
-
-    [[nodiscard]] bool has(std::string_view name) const {
-        for (const RuleFiring& firing : firings)
-            if (firing.rule->name == name)
-                return true;
-        return false;
-    }
-
-    std::vector<RuleFiring> firings;
-};
 
 struct Workbench {
     Workbench() { table.addBoolSymbols(); }

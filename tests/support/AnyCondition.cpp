@@ -21,21 +21,9 @@ Op anyOperator(std::mt19937_64& random) {
     static const std::vector<Op> comparisons{Op::Equal,         Op::NotEqual,    Op::LessThan,
                                              Op::LessThanEqual, Op::GreaterThan, Op::GreaterThanEqual};
     static const std::vector<Op> sums{Op::Plus, Op::Minus, Op::Multiply, Op::Divide, Op::UnaryMinus};
-    const auto one = [&](const std::vector<Op>& all) { return all[below(random, all.size())]; };
-    switch (below(random, 8)) {
-    case 0:
-    case 1:
-    case 2:
-        return one(logic);
-    case 3:
-    case 4:
-        return one(comparisons);
-    case 5:
-    case 6:
-        return one(sums);
-    default:
-        return one(valueOperators());
-    }
+    const std::size_t kind = below(random, 8);
+    const std::vector<Op>& all = kind < 3 ? logic : kind < 5 ? comparisons : kind < 7 ? sums : valueOperators();
+    return all[below(random, all.size())];
 }
 
 } // namespace
@@ -55,23 +43,14 @@ SymbolicExprId anyLeaf(SymbolicExprTable& table, std::mt19937_64& random, const 
     static constexpr std::array integers{0, 1, -1, 2, 3, 7, 31, greatest, least};
     static constexpr std::array reals{0.0, -0.0, 0.5, 1.0, 2.0, -1.5, 0.1, 1e300, 2147483648.0};
     const Trees tree{table};
-    switch (below(random, 16)) {
-    case 0:
-        return tree.name(below(random, 2) == 0 ? "true" : "false");
-    case 1:
-        return tree.name(below(random, 2) == 0 ? "(sim)" : "(codegen)");
-    case 2:
-    case 3:
-    case 4:
-    case 5:
+    const std::size_t kind = below(random, 16);
+    if (kind < 2)
+        return tree.name(below(random, 2) == 0 ? (kind == 0 ? "true" : "(sim)") : (kind == 0 ? "false" : "(codegen)"));
+    if (kind < 6)
         return tree.integer(integers[below(random, integers.size())]);
-    case 6:
-        if (world.reals)
-            return tree.real(reals[below(random, reals.size())]);
-        [[fallthrough]];
-    default:
-        return tree.name(world.names[below(random, world.names.size())]);
-    }
+    if (kind == 6 && world.reals)
+        return tree.real(reals[below(random, reals.size())]);
+    return tree.name(world.names[below(random, world.names.size())]);
 }
 
 SymbolicExprId anyCondition(SymbolicExprTable& table, std::mt19937_64& random, std::size_t operators,

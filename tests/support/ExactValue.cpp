@@ -18,10 +18,6 @@ std::optional<ExactNumber> integer(std::int64_t value) {
     return ExactNumber{static_cast<double>(value)};
 }
 
-ExactNumber truth(bool value) {
-    return {value ? 1.0 : 0.0, false, true};
-}
-
 std::optional<ExactNumber> realIf(bool exact, double value) {
     return exact && std::isfinite(value) ? std::optional(ExactNumber{value, true}) : std::nullopt;
 }
@@ -47,109 +43,63 @@ std::optional<ExactNumber> ofReals(Op op, double a, double b) { // NOLINT(misc-n
 
 } // namespace
 
-ExactValue::ExactValue(const SymbolicExprTable& table, SymbolicExprId root) {
-    std::map<SymbolicExprId, std::size_t> known; // operands have smaller identifiers than their node
-    std::vector<SymbolicExprId> pending{root};
-    while (!pending.empty()) {
-        const SymbolicExprId id = pending.back();
-        pending.pop_back();
-        if (known.emplace(id, 0).second)
-            for (std::size_t i = 0; i < table.get(id)->getNumInputs(); ++i)
-                pending.push_back(table.get(id)->getInput(i));
-    }
-    for (auto& [id, position] : known) {
-        const SymbolicExpr& node = *table.get(id);
-        position = steps_.size();
-        Step step{node.op(), {}, {}, {}};
-        for (std::size_t i = 0; i < node.getNumInputs(); ++i)
-            step.inputs.push_back(known.at(node.getInput(i)));
-        if (node.isNumValue())
-            step.literal = {node.getNumValue(), node.op() == Op::DoubleValue};
-        if (node.op() == Op::String) {
-            step.name = static_cast<const SymbolicString&>(node).getName();
-            if (step.name == "true" || step.name == "false")
-                step = {Op::IntValue, truth(step.name == "true"), {}, {}};
-            else
-                names_.push_back(step.name);
+ExactValue::ExactValue(const SymbolicExprTable& table, SymbolicExprId root, Quotients quotients)
+    : steps_(stepsOf(table, root, false, quotients == Quotients::ByContext)) {
+    for (Step& step : steps_) {
+        if (step.op != Op::String)
+            continue;
+        const std::string name = static_cast<const SymbolicString&>(*table.get(step.id)).getName();
+        if (name == "true" || name == "false") {
+            step.op = Op::IntValue;
+            step.literal = name == "true" ? 1 : 0;
+        } else {
+            step.name = name;
+            names_.push_back(name);
         }
-        steps_.push_back(std::move(step));
-    }
-}
-
-std::optional<ExactNumber> ExactValue::ofIntegers(Op op, std::int64_t a, std::int64_t b) const {
-    switch (op) {
-    case Op::Plus:
-        return integer(a + b);
-    case Op::Minus:
-        return integer(a - b);
-    case Op::Multiply:
-        return integer(a * b);
-    case Op::Divide:
-        if (b == 0)
-            return std::nullopt;
-        tookRemainder_ = tookRemainder_ || a % b != 0;
-        return integer(a / b);
-    case Op::Modulo:
-        return b == 0 ? std::nullopt : integer(a % b);
-    case Op::BitAnd:
-        return integer(a & b);
-    case Op::BitOr:
-        return integer(a | b);
-    case Op::BitXOr:
-        return integer(a ^ b);
-    case Op::ShiftLeft:
-        return b < 0 || b > 31 ? std::nullopt : integer(a * (std::int64_t{1} << b));
-    case Op::ShiftRight:
-        return b < 0 || b > 31 ? std::nullopt : integer(a >> b);
-    default:
-        return std::nullopt;
     }
 }
 
 std::optional<ExactNumber> ExactValue::compute(const Step& step, const std::vector<ExactNumber>& values) const {
-    const auto input = [&](std::size_t i) { return values[step.inputs[i]]; };
-    const ExactNumber a = step.inputs.empty() ? step.literal : input(0);
-    const ExactNumber b = step.inputs.size() < 2 ? ExactNumber{} : input(1);
-    const auto compared = [&](bool result) -> std::optional<ExactNumber> {
-        const bool near = a.real != b.real && std::fabs(a.real - b.real) < limits::zeroThreshold;
-        return near ? std::nullopt : std::optional(truth(result));
+    const auto input = [&](std::size_t i) { return i < step.inputs.size() ? values[step.inputs[i]] : ExactNumber{}; };
+    const ExactNumber a = input(0);
+    const ExactNumber b = input(1);
+    const auto ofIntegers = [&](std::int64_t x, std::int64_t y) -> std::optional<ExactNumber> {
+        const std::optional<std::int64_t> value = computed(step.op, x, y);
+        return value ? integer(*value) : std::nullopt;
     };
+    if (comparisonOps.contains(step.op)) {
+        const bool near = a.real != b.real && std::fabs(a.real - b.real) < limits::zeroThreshold;
+        return near ? std::nullopt : ofIntegers(a.real < b.real ? -1 : a.real > b.real ? 1 : 0, 0);
+    }
     switch (step.op) {
     case Op::IntValue:
+        return integer(static_cast<std::int64_t>(step.literal));
     case Op::DoubleValue:
-        return std::isfinite(a.real) ? std::optional(a) : std::nullopt;
-    case Op::Equal:
-        return compared(a.real == b.real);
-    case Op::NotEqual:
-        return compared(a.real != b.real);
-    case Op::LessThan:
-        return compared(a.real < b.real);
-    case Op::LessThanEqual:
-        return compared(a.real <= b.real);
-    case Op::GreaterThan:
-        return compared(a.real > b.real);
-    case Op::GreaterThanEqual:
-        return compared(a.real >= b.real);
+        return realIf(true, step.literal);
     case Op::And:
     case Op::SingleAnd:
-        return truth(a.holds() && b.holds());
     case Op::Or:
     case Op::SingleOr:
-        return truth(a.holds() || b.holds());
     case Op::Not:
-        return truth(!a.holds());
-    case Op::UnaryMinus:
-        return a.isReal ? realIf(true, -a.real) : integer(-static_cast<std::int64_t>(a.real));
-    case Op::BitCompl:
-        return a.isReal ? std::nullopt : integer(~static_cast<std::int64_t>(a.real));
+        return ofIntegers(a.holds() ? 1 : 0, b.holds() ? 1 : 0);
     case Op::FcnCall1U:
     case Op::FcnCall:
         return integer(static_cast<std::int64_t>(std::fmod(b.real * 7 + 3, 5)));
     default:
-        if (a.isReal || b.isReal)
-            return ofReals(step.op, a.real, b.real);
-        return ofIntegers(step.op, static_cast<std::int64_t>(a.real), static_cast<std::int64_t>(b.real));
+        break;
     }
+    if (step.op == Op::UnaryMinus && a.isReal)
+        return realIf(true, -a.real);
+    if (a.isReal || b.isReal)
+        return ofReals(step.op, a.real, b.real);
+    if ((step.op == Op::ShiftLeft || step.op == Op::ShiftRight) && b.real > 31)
+        return std::nullopt;
+    if (step.op == Op::Divide && b.real != 0 && std::fmod(a.real, b.real) != 0) {
+        if (!step.inTruth)
+            return ofReals(Op::Divide, a.real, b.real);
+        tookRemainder_ = true;
+    }
+    return ofIntegers(static_cast<std::int64_t>(a.real), static_cast<std::int64_t>(b.real));
 }
 
 std::optional<ExactNumber> ExactValue::under(const Assignment& assignment) const {

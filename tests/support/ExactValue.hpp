@@ -15,12 +15,14 @@ namespace VT::Testing {
 struct ExactNumber {
     double real = 0; ///< the value, exactly, also of an integer
     bool isReal = false;
-    bool isTruth = false;
 
     [[nodiscard]] bool holds() const noexcept { return real != 0; }
 };
 
-/// An expression as a list of steps, for many assignments.
+/// What a quotient of integers is worth: always without its remainder, or so only below operators of truth values.
+enum class Quotients : bool { Truncated, ByContext };
+
+/// An expression for many assignments.
 ///
 /// Evaluation wraps at 32 bits, decisions are over unbounded integers, and C leaves much undefined.  There is a value
 /// only where none of that matters: every integer on the way fits 32 bits, no real is rounded, infinite, NaN or within
@@ -28,7 +30,7 @@ struct ExactNumber {
 /// stands for comes from the assignment.  A call is a function of its arguments' values: equal arguments, equal value.
 class ExactValue {
 public:
-    ExactValue(const SymbolicExprTable& table, SymbolicExprId root);
+    ExactValue(const SymbolicExprTable& table, SymbolicExprId root, Quotients quotients = Quotients::Truncated);
 
     [[nodiscard]] std::optional<ExactNumber> under(const Assignment& assignment) const;
 
@@ -39,17 +41,9 @@ public:
     [[nodiscard]] const std::vector<std::string>& names() const noexcept { return names_; }
 
 private:
-    struct Step {
-        SymbolicOp op;
-        ExactNumber literal;
-        std::string name;
-        std::vector<std::size_t> inputs;
-    };
-
     [[nodiscard]] std::optional<ExactNumber> compute(const Step& step, const std::vector<ExactNumber>& values) const;
-    [[nodiscard]] std::optional<ExactNumber> ofIntegers(SymbolicOp op, std::int64_t a, std::int64_t b) const;
 
-    std::vector<Step> steps_; ///< operands before their operators
+    std::vector<Step> steps_;
     std::vector<std::string> names_;
     mutable bool tookRemainder_ = false;
 };

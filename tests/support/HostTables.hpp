@@ -22,11 +22,14 @@ class NumberedTable {
 public:
     virtual ~NumberedTable() = default;
     virtual SymbolicExprTable& table() = 0;
+
     /// The identifier of the node that was or will be added at a position.
-    [[nodiscard]] virtual SymbolicExprId idAt(std::size_t position) const = 0;
+    [[nodiscard]] virtual SymbolicExprId idAt(std::size_t position) const { return position; }
+
     [[nodiscard]] virtual std::size_t count() const = 0;
+
     /// Whether the library keeps the nodes.
-    [[nodiscard]] virtual bool isOrdered() const = 0;
+    [[nodiscard]] virtual bool isOrdered() const { return true; }
 };
 
 /// A table that keeps its nodes itself, under identifiers of its own making; the base's storage stays empty.
@@ -84,39 +87,30 @@ private:
 };
 
 /// A table derived from the library's that leaves the storage to it.
-class DerivedTable final : public SymbolicExprTable, public NumberedTable {
+class DerivedTable final : public SymbolicExprTable {
 public:
     const SymbolicExpr* get(SymbolicExprId id) const override { return SymbolicExprTable::get(id); }
-
-    SymbolicExprTable& table() override { return *this; }
-
-    [[nodiscard]] SymbolicExprId idAt(std::size_t position) const override { return position; }
-
-    [[nodiscard]] std::size_t count() const override { return size(); }
-
-    [[nodiscard]] bool isOrdered() const override { return true; }
 };
 
-/// The library's own table.
-class PlainTable final : public NumberedTable {
+/// A table whose nodes the library keeps.
+template <class Table>
+class LibraryTable final : public NumberedTable {
 public:
     SymbolicExprTable& table() override { return table_; }
 
-    [[nodiscard]] SymbolicExprId idAt(std::size_t position) const override { return position; }
-
     [[nodiscard]] std::size_t count() const override { return table_.size(); }
 
-    [[nodiscard]] bool isOrdered() const override { return true; }
-
 private:
-    SymbolicExprTable table_;
+    Table table_;
 };
+
+using PlainTable = LibraryTable<SymbolicExprTable>;
 
 /// One empty table of each kind.
 inline std::vector<std::unique_ptr<NumberedTable>> tablesOfEachKind() {
     std::vector<std::unique_ptr<NumberedTable>> tables;
     tables.push_back(std::make_unique<PlainTable>());
-    tables.push_back(std::make_unique<DerivedTable>());
+    tables.push_back(std::make_unique<LibraryTable<DerivedTable>>());
     for (const auto numbering :
          {HostTable::Numbering::Dense, HostTable::Numbering::Descending, HostTable::Numbering::Far})
         tables.push_back(std::make_unique<HostTable>(numbering));

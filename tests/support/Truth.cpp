@@ -7,51 +7,68 @@
 
 namespace VT::Testing {
 
-Truth::Truth(const SymbolicExprTable& table, SymbolicExprId root, Arithmetic arithmetic) : arithmetic_(arithmetic) {
-    const SymbolicExprPrinter printer(table, false);
-    const auto isNamed = [](SymbolicOp op) {
-        return op == SymbolicOp::String || op == SymbolicOp::MemberValue || callOps.contains(op);
-    };
-    std::map<SymbolicExprId, std::size_t> known; // operands have smaller identifiers than their node
-    std::vector<SymbolicExprId> pending{root};
+namespace {
+
+bool isNamed(SymbolicOp op) {
+    return op == SymbolicOp::String || op == SymbolicOp::MemberValue || callOps.contains(op);
+}
+
+} // namespace
+
+std::vector<Step> stepsOf(const SymbolicExprTable& table, SymbolicExprId root, bool namesAreLeaves, bool byContext) {
+    using Place = std::pair<SymbolicExprId, bool>; // operands have smaller identifiers than their node
+    std::map<Place, std::vector<Place>> inputs;
+    std::vector<Place> pending{{root, !byContext || booleanOps.contains(table.get(root)->op())}};
     while (!pending.empty()) {
-        const SymbolicExprId id = pending.back();
+        const Place place = pending.back();
         pending.pop_back();
-        if (known.emplace(id, 0).second && !isNamed(table.get(id)->op()))
-            for (std::size_t i = 0; i < table.get(id)->getNumInputs(); ++i)
-                pending.push_back(table.get(id)->getInput(i));
-    }
-    for (auto& [id, position] : known) {
-        const SymbolicExpr& node = *table.get(id);
-        position = steps_.size();
-        if (isNamed(node.op())) {
-            steps_.push_back(named(node.op(), printer(id)));
+        const auto [entry, isNew] = inputs.try_emplace(place);
+        const SymbolicExpr& node = *table.get(place.first);
+        if (!isNew || (namesAreLeaves && isNamed(node.op())))
             continue;
+        for (std::size_t i = 0; i < node.getNumInputs(); ++i) {
+            const SymbolicExprId input = node.getInput(i);
+            entry->second.emplace_back(input, place.second || booleanOps.contains(table.get(input)->op()));
+            pending.push_back(entry->second.back());
         }
-        Step step{node.op()};
-        for (std::size_t i = 0; i < node.getNumInputs(); ++i)
-            step.inputs.push_back(known.at(node.getInput(i)));
-        if (node.op() == SymbolicOp::IntValue)
-            step.literal = static_cast<const SymbolicIntValue&>(node).getValue();
-        steps_.push_back(std::move(step));
     }
+    std::map<Place, std::size_t> known;
+    std::vector<Step> steps;
+    for (const auto& [place, operands] : inputs) {
+        known.emplace(place, steps.size());
+        const SymbolicExpr& node = *table.get(place.first);
+        steps.push_back({node.op(), place.first, place.second, node.isNumValue() ? node.getNumValue() : 0});
+        for (const Place& operand : operands)
+            steps.back().inputs.push_back(known.at(operand));
+    }
+    return steps;
 }
 
-Truth::Step Truth::named(SymbolicOp op, std::string text) {
-    if (arithmetic_ == Arithmetic::C && callOps.contains(op)) {
+Truth::Truth(const SymbolicExprTable& table, SymbolicExprId root, Arithmetic arithmetic)
+    : arithmetic_(arithmetic),
+      steps_(stepsOf(table, root, true, false)) {
+    for (Step& step : steps_)
+        if (isNamed(step.op))
+            name(step, SymbolicExprPrinter(table, false)(step.id));
+}
+
+void Truth::name(Step& step, const std::string& text) {
+    step.name = text;
+    if (arithmetic_ == Arithmetic::C && callOps.contains(step.op)) {
         const std::size_t open = text.find('(');
-        const std::string function = text.substr(0, open);
-        names_.push_back(function == "defined" ? text.substr(open + 1, text.size() - open - 2) : function);
-        if (function == "defined")
-            return {op, 0, "defined " + names_.back()};
-        functions_.push_back(function);
-        return {op, 0, function};
+        step.name = text.substr(0, open);
+        if (step.name != "defined") {
+            functions_.push_back(step.name);
+        } else {
+            names_.push_back(text.substr(open + 1, text.size() - open - 2));
+            step.name = "defined " + names_.back();
+            return;
+        }
     }
-    names_.push_back(text);
-    return {op, 0, std::move(text)};
+    names_.push_back(step.name);
 }
 
-std::optional<std::int64_t> Truth::compute(SymbolicOp op, std::int64_t a, std::int64_t b) const {
+std::optional<std::int64_t> computed(SymbolicOp op, std::int64_t a, std::int64_t b) {
     using Op = SymbolicOp;
     using I = std::int64_t;
     using U = std::uint64_t;
@@ -80,13 +97,11 @@ std::optional<std::int64_t> Truth::compute(SymbolicOp op, std::int64_t a, std::i
         {Op::ShiftLeft, [](I x, I y) { return y > 63 ? 0 : static_cast<I>(static_cast<U>(x) << y); }},
         {Op::ShiftRight, [](I x, I y) { return x >> std::min(y, I{63}); }},
     };
-    const bool inC = arithmetic_ == Arithmetic::C;
-    if ((op == Op::ShiftLeft || op == Op::ShiftRight) && (b < 0 || (inC && b >= 32)))
+    const bool isShift = op == Op::ShiftLeft || op == Op::ShiftRight;
+    const auto rule = values.find(op);
+    if (rule == values.end() || (isShift && b < 0) || ((op == Op::Divide || op == Op::Modulo) && b == 0))
         return std::nullopt;
-    if ((op == Op::Divide || op == Op::Modulo) && // a % b is undefined with a / b
-        (b == 0 || (inC && a / b > std::numeric_limits<std::int32_t>::max())))
-        return std::nullopt;
-    return values.at(op)(a, b);
+    return rule->second(a, b);
 }
 
 std::optional<std::int64_t> Truth::under(const Assignment& assignment) const {
@@ -98,7 +113,7 @@ std::optional<std::int64_t> Truth::under(const Assignment& assignment) const {
         const bool decides = step.op == SymbolicOp::Or;
         std::optional<std::int64_t> value;
         if (step.op == SymbolicOp::IntValue) {
-            value = step.literal;
+            value = static_cast<std::int64_t>(step.literal);
         } else if (step.name.starts_with("defined ")) {
             value = assignment.contains(step.name.substr(8)) ? 1 : 0;
         } else if (!step.name.empty()) {
@@ -107,7 +122,12 @@ std::optional<std::int64_t> Truth::under(const Assignment& assignment) const {
         } else if (inC && (decides || step.op == SymbolicOp::And) && in(0) && (*in(0) != 0) == decides) {
             value = decides ? 1 : 0;
         } else if (in(0) && (in(1) || step.inputs.size() == 1)) {
-            value = compute(step.op, *in(0), in(1).value_or(0));
+            const std::int64_t a = *in(0), b = in(1).value_or(0);
+            const bool isShift = step.op == SymbolicOp::ShiftLeft || step.op == SymbolicOp::ShiftRight;
+            const bool isQuotient = step.op == SymbolicOp::Divide || step.op == SymbolicOp::Modulo;
+            // In C also a % b is undefined with a / b.
+            if (!inC || !((isShift && b >= 32) || (isQuotient && b == -1 && -a > std::numeric_limits<int>::max())))
+                value = computed(step.op, a, b);
         }
         if (inC && value && *value != static_cast<std::int32_t>(*value))
             value.reset();

@@ -15,6 +15,23 @@ namespace VT::Testing {
 
 using Assignment = std::map<std::string, std::int64_t>;
 
+/// One operator of an expression in a list in which operands come first.
+struct Step {
+    SymbolicOp op;
+    SymbolicExprId id;
+    bool inTruth; ///< whether it is, or is below, an operator of truth values
+    double literal = 0;
+    std::string name = {}; ///< what is looked up
+    std::vector<std::size_t> inputs = {};
+};
+
+/// An expression as a list, each node once, or once in truth values and once elsewhere.  Where so asked, members and
+/// calls have no inputs.
+std::vector<Step> stepsOf(const SymbolicExprTable& table, SymbolicExprId root, bool namesAreLeaves, bool byContext);
+
+/// What an operator makes of integers of 64 bits; nothing where it divides by zero or shifts by less than zero.
+std::optional<std::int64_t> computed(SymbolicOp op, std::int64_t a, std::int64_t b);
+
 /// Integers without bounds (sums and products are right modulo 2^64), where calls and members are worth what the
 /// assignment says of their text; or C, where a call is looked up by the name of its function, `defined(X)` tells
 /// whether the assignment names X, and the right operands of && and || count only where C computes them.
@@ -35,19 +52,10 @@ public:
     [[nodiscard]] const std::vector<std::string>& functions() const noexcept { return functions_; }
 
 private:
-    struct Step {
-        SymbolicOp op;
-        std::int64_t literal = 0;
-        std::string name = {}; ///< what is looked up
-        std::vector<std::size_t> inputs = {};
-    };
-
-    [[nodiscard]] std::optional<std::int64_t> compute(SymbolicOp op, std::int64_t a, std::int64_t b) const;
-
-    [[nodiscard]] Step named(SymbolicOp op, std::string text);
+    void name(Step& step, const std::string& text);
 
     Arithmetic arithmetic_;
-    std::vector<Step> steps_; ///< operands before their operators
+    std::vector<Step> steps_;
     std::vector<std::string> names_;
     std::vector<std::string> functions_;
 };
