@@ -5,7 +5,6 @@
 #include "tests/support/AnyNode.hpp"
 #include "tests/support/Times.hpp"
 
-#include <functional>
 #include <random>
 
 namespace VT::Testing {
@@ -22,6 +21,21 @@ SymbolicExprId chain(SymbolicExprTable& table, SymbolicOp op, std::size_t count,
         sum = leftDeep ? tree(op, sum, symbol) : tree(op, symbol, sum);
     }
     return sum;
+}
+
+/// So many copies of two texts in turn, with the number of the copy for every #.
+std::string joined(std::size_t n, const std::string& between, const std::string& even, const std::string& odd) {
+    std::string text;
+    for (std::size_t i = 0; i < n; ++i) {
+        text += i == 0 ? "" : between;
+        for (const char c : i % 2 == 0 ? even : odd)
+            text += c == '#' ? std::to_string(i) : std::string(1, c);
+    }
+    return text;
+}
+
+std::string joined(std::size_t n, const std::string& between, const std::string& each) {
+    return joined(n, between, each, each);
 }
 
 TEST(OperandLimit, HoldsAtTheBoundAndGivesUpOneBeyond) {
@@ -51,15 +65,9 @@ TEST(OperandLimit, HoldsAtTheBoundAndGivesUpOneBeyond) {
 }
 
 TEST(OperandLimit, BoundsDistribution) {
-    const auto alternatives = [](const std::string& name, std::size_t count) {
-        std::string text = name + "0";
-        for (std::size_t i = 1; i < count; ++i)
-            text += "||" + name + std::to_string(i);
-        return "(" + text + ")";
-    };
     Workbench bench;
-    const std::string within = alternatives("A", 25) + "&&" + alternatives("B", 40);
-    const std::string beyond = alternatives("A", 25) + "&&" + alternatives("B", 41);
+    const std::string within = "(" + joined(25, "||", "A#") + ")&&(" + joined(40, "||", "B#") + ")";
+    const std::string beyond = "(" + joined(25, "||", "A#") + ")&&(" + joined(41, "||", "B#") + ")";
     EXPECT_EQ(countComparisons(bench.table, bench.simplify(bench.parse(within))), 2000U);
     EXPECT_EQ(bench.simplified(beyond), beyond);
 }
@@ -85,33 +93,22 @@ struct Family {
     std::string (*text)(std::size_t n);
 };
 
-std::string joined(std::size_t n, const char* between, const std::function<std::string(const std::string&)>& part) {
-    std::string text;
-    for (std::size_t i = 0; i < n; ++i)
-        text += (i == 0 ? "" : between) + part(std::to_string(i));
-    return text;
-}
-
-/// Brackets within brackets: `open` before each, with the number of the bracket for every #.
+/// Brackets within brackets.
 std::string nested(std::size_t n, const std::string& even, const std::string& odd) {
-    std::string text;
-    for (std::size_t i = 0; i < n; ++i)
-        for (const char c : i % 2 == 0 ? even : odd)
-            text += c == '#' ? std::to_string(i) : std::string(1, c);
-    return text + "Z" + times(n, ")");
+    return joined(n, "", even, odd) + "Z" + times(n, ")");
 }
 
 /// Products of literals drawn at random from so many symbols.
-std::string products(std::size_t n, std::size_t literals, std::uint64_t symbols, const char* inner, const char* outer) {
+std::string products(std::size_t n, int literals, std::uint64_t symbols, const char* inner, const char* outer) {
     std::mt19937_64 random(n);
-    return joined(n, outer, [&](const std::string&) {
-        return "(" +
-               joined(literals, inner,
-                      [&](const std::string&) {
-                          return (random() % 2 == 0 ? "!V" : "V") + std::to_string(random() % symbols);
-                      }) +
-               ")";
-    });
+    std::string text;
+    for (std::size_t i = 0; i < n; ++i) {
+        text += i == 0 ? "(" : std::string(outer) + "(";
+        for (int j = 0; j < literals; ++j)
+            text += (j == 0 ? "" : inner) + std::string(random() % 2, '!') + "V" + std::to_string(random() % symbols);
+        text += ")";
+    }
+    return text;
 }
 
 const Family families[] = {
@@ -125,28 +122,17 @@ const Family families[] = {
     {"sum over some symbols", 800, [](std::size_t n) { return products(n, 4, 20, "&&", "||"); }},
     {"sum over many symbols", 800, [](std::size_t n) { return products(n, 4, n, "&&", "||"); }},
     {"negated sum", 400, [](std::size_t n) { return "!(" + products(n, 3, 40, "&&", "||") + ")"; }},
-    {"negated ranges", 900,
-     [](std::size_t n) {
-         return "!(" + joined(n, "||", [](const std::string& i) { return "A>=4*" + i + "&&A<=4*" + i + "+1"; }) + ")";
-     }},
-    {"ranges", 900,
-     [](std::size_t n) {
-         return joined(n, "&&", [](const std::string& i) { return "(A<" + i + "00||A>" + i + "01)"; });
-     }},
-    {"products of sums", 3000,
-     [](std::size_t n) { return joined(n, "*", [](const std::string& i) { return "(N+" + i + ")"; }); }},
-    {"long sum", 6000,
-     [](std::size_t n) { return joined(n, "+", [](const std::string& i) { return i + "*A" + i; }) + ">0"; }},
+    {"negated ranges", 900, [](std::size_t n) { return "!(" + joined(n, "||", "A>=4*#&&A<=4*#+1") + ")"; }},
+    {"ranges", 900, [](std::size_t n) { return joined(n, "&&", "(A<#00||A>#01)"); }},
+    {"products of sums", 3000, [](std::size_t n) { return joined(n, "*", "(N+#)"); }},
+    {"long sum", 6000, [](std::size_t n) { return joined(n, "+", "#*A#") + ">0"; }},
     {"sums in calls", 100,
      [](std::size_t n) {
-         return joined(n, "+",
-                       [](const std::string& i) { return "f(" + products(9 + i.size(), 2, 12, "||", "&&") + ")"; });
+         return joined(n, "+", "f(" + products(10, 2, 12, "||", "&&") + ")",
+                       "f(" + products(11, 2, 12, "||", "&&") + ")");
      }},
     {"comparisons of long texts", 160,
-     [](std::size_t n) {
-         const std::string sum = joined(30, "+", [](const std::string& i) { return "LONG_NAME_" + i; });
-         return joined(n, "||", [&](const std::string& i) { return sum + ">" + i + "&&B" + i; });
-     }},
+     [](std::size_t n) { return joined(n, "||", joined(30, "+", "LONG_NAME_#") + ">#&&B#"); }},
 };
 
 // The nodes that a call makes are bounded by those that it is given and by what it may multiply out, and what it

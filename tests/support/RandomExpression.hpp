@@ -19,9 +19,8 @@ std::vector<SymbolicExprId> randomGraph(std::mt19937_64& random, SymbolicExprTab
 /// nodes are met again; no real is NaN.
 SymbolicExprId makeRandom(SymbolicExprTable& table, std::mt19937_64& random);
 
-/// A random tree of these operators; what is called or has a member "field" is
-/// the name "f".  Its leaves are what the function makes, else a few
-/// names and numbers.
+/// A random tree of these operators; what is called or has a member "field" is the name "f".  Its leaves are what the
+/// function makes, else a few names and numbers.
 SymbolicExprId randomTree(SymbolicExprTable& table, std::mt19937_64& random, const std::vector<SymbolicOp>& operators,
                           int depth, const std::function<SymbolicExprId()>& leaf = nullptr);
 

@@ -4,7 +4,6 @@
 #include "base/VTSymbolicExpr.hpp"
 
 #include <cstdint>
-#include <exception>
 #include <functional>
 #include <map>
 #include <optional>
@@ -60,12 +59,9 @@ private:
     std::vector<std::string> functions_;
 };
 
-/// A quotient by zero.
-struct NoValue : std::exception {};
-
+/// The value, which there must be.
 inline std::int64_t valueOf(const SymbolicExprTable& table, SymbolicExprId id, const Assignment& assignment) {
-    const std::optional<std::int64_t> value = Truth(table, id).under(assignment);
-    return value ? *value : throw NoValue();
+    return Truth(table, id).under(assignment).value();
 }
 
 inline bool holds(const SymbolicExprTable& table, SymbolicExprId id, const Assignment& assignment) {
