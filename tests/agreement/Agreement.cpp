@@ -42,19 +42,21 @@ public:
 
     enum class Kept : bool { Truth, Value };
 
-    /// Both are as true, or as large, wherever the known condition holds.
+    /// Both are as true, or as large, wherever the known condition holds.  A number is a dimension, whose quotients are
+    /// exact.
     void expectSame(const char* what, SymbolicExprId other, Kept kept, SymbolicExprId known) const {
         SCOPED_TRACE(std::string(what) + ": " + text(other) + " instead of " + text(id));
         ASSERT_TRUE(table.has(other));
-        const ExactValue otherValue(table, other);
+        const Quotients quotients = kept == Kept::Value ? Quotients::ByContext : Quotients::Truncated;
+        const ExactValue value(table, id, quotients);
+        const ExactValue otherValue(table, other, quotients);
         const ExactValue knownValue(table, known);
         const bool isTruth = kept == Kept::Truth || booleanOps.contains(table.get(id)->op());
         for (const Assignment& assignment : assignments) {
-            const auto before = exact.under(assignment);
-            const bool remainder = exact.tookRemainder();
+            const auto before = value.under(assignment);
             const auto after = otherValue.under(assignment);
             const auto holds = knownValue.under(assignment);
-            if (!before || !after || !holds || !holds->holds() || (!isTruth && remainder))
+            if (!before || !after || !holds || !holds->holds())
                 continue;
             if (isTruth ? before->holds() != after->holds() : before->real != after->real)
                 FAIL() << before->real << " became " << after->real << describe(assignment);

@@ -2,12 +2,15 @@
 //
 // Pairs of a condition and values count where C defines what is computed: no division by zero, no shift out of range,
 // nothing outside an int.
+#include "base/VCService.hpp"
 #include "base/print/CTextObstacles.hpp"
 #include "base/print/PreprocessorVCExpr.hpp"
 #include "base/simplify/Simplify.hpp"
 #include "tests/preprocessor/Judges.hpp"
+#include "tests/support/AnyCondition.hpp"
 #include "tests/support/AnyNode.hpp"
 #include "tests/support/Corpus.hpp"
+#include "tests/support/ExactValue.hpp"
 #include "tests/support/Parsing.hpp"
 #include "tests/support/RandomExpression.hpp"
 
@@ -168,6 +171,49 @@ TEST(Decisions, RandomConditionsInDirectives) {
         askAll(preprocessor, quiz, conditions, values);
     }
     EXPECT_GE(quiz.asked.size(), 100'000U);
+    quiz.expectRight(preprocessor.decide());
+}
+
+/// What the library makes of a condition, the preprocessor decides as it decides the condition.
+TEST(Decisions, AnyConditionsSimplifiedAndShortened) {
+    struct Form {
+        ExactValue condition;
+        ExactValue form;
+        std::string text;
+    };
+
+    const VCServiceHandle service;
+    SymbolicExprTable& table = service->table();
+    const ConditionWorld world{.reals = false, .calls = false};
+    std::mt19937_64 random(41);
+    std::vector<Form> forms;
+    while (forms.size() < 4000) {
+        const SymbolicExprId id = anyCondition(table, random, 2 + random() % 10, world);
+        if (!booleanOps.contains(table.get(id)->op()))
+            continue;
+        for (const SymbolicExprId form :
+             {service->simplify(id, false).id(), service->shortestCondition(id, false).id()})
+            if (findCTextObstacles(table, form, CTextUse::Directive).empty())
+                forms.push_back({ExactValue(table, id), ExactValue(table, form),
+                                 PreprocessorVCExpr(table, false, true).print(form)});
+    }
+    Preprocessor preprocessor;
+    Quiz quiz;
+    for (int round = 0; round < 30; ++round) {
+        const Assignment values = anyAssignment(random, world);
+        Assignment definitions;
+        for (const std::string& name : world.names)
+            definitions[name] = values.at(name);
+        preprocessor.define(definitions);
+        for (const Form& each : forms) {
+            const auto right = each.condition.under(values);
+            if (!right || !each.form.under(values))
+                continue;
+            preprocessor.ask(each.text);
+            quiz.ask(each.text, right->holds() ? 1 : 0);
+        }
+    }
+    EXPECT_GE(quiz.asked.size(), 40'000U);
     quiz.expectRight(preprocessor.decide());
 }
 

@@ -41,15 +41,27 @@ SymbolicExprId anyLeaf(SymbolicExprTable& table, std::mt19937_64& random, const 
     constexpr int least = std::numeric_limits<int>::min();
     constexpr int greatest = std::numeric_limits<int>::max();
     static constexpr std::array integers{0, 1, -1, 2, 3, 7, 31, greatest, least};
-    static constexpr std::array reals{0.0, -0.0, 0.5, 1.0, 2.0, -1.5, 0.1, 1e300, 2147483648.0};
+    static constexpr std::array reals{0.0,
+                                      -0.0,
+                                      0.5,
+                                      1.0,
+                                      2.0,
+                                      -1.5,
+                                      0.1,
+                                      1e300,
+                                      2147483648.0,
+                                      std::numeric_limits<double>::infinity(),
+                                      std::numeric_limits<double>::quiet_NaN()};
     const Trees tree{table};
     const std::size_t kind = below(random, 16);
     if (kind < 2)
         return tree.name(below(random, 2) == 0 ? (kind == 0 ? "true" : "(sim)") : (kind == 0 ? "false" : "(codegen)"));
     if (kind < 6)
         return tree.integer(integers[below(random, integers.size())]);
-    if (kind == 6 && world.reals)
-        return tree.real(reals[below(random, reals.size())]);
+    if (kind == 6 && world.reals) {
+        const SymbolicExprId id = tree.real(reals[below(random, reals.size())]);
+        return id == invalidId ? table.size() - 1 : id; // no look-up finds a NaN
+    }
     return tree.name(world.names[below(random, world.names.size())]);
 }
 
