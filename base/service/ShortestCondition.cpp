@@ -3,8 +3,22 @@
 #include "base/service/ConditionProofs.hpp"
 #include "base/service/ServiceParts.hpp"
 #include "base/service/ShortestForm.hpp"
+#include "base/simplify/ConditionRoot.hpp"
 
 namespace VT {
+
+namespace {
+
+/// The shortened form as a condition of its own, or the given one where that would be longer.
+SymbolicExprId noLonger(SymbolicExprTable& table, const SymbolicExprPrinter& printer, SymbolicExprId shortened,
+                        SymbolicExprId given) {
+    if (shortened == given || !booleanOps.contains(table.get(given)->op()))
+        return shortened;
+    const SymbolicExprId condition = asConditionOfItsOwn(table, shortened);
+    return condition == shortened || printer.textLength(condition) <= printer.textLength(given) ? condition : given;
+}
+
+} // namespace
 
 VCSymbolicExprId VCService::shortestCondition(const VCSymbolicExprId& condition, bool isQuill,
                                               std::vector<ShortForm>* forms) {
@@ -27,7 +41,7 @@ VCSymbolicExprId VCService::shortestCondition(const VCSymbolicExprId& condition,
     const SymbolicExprId result = search.find(given, parts_->bits32 ? table.getIdTRUE() : invalidId, normalForm);
     if (forms != nullptr)
         *forms = search.forms();
-    return result;
+    return noLonger(table, printer, result, given);
 }
 
 VCSymbolicExprId VCService::getImpliedCondition(const VCSymbolicExprId& condition, const VCSymbolicExprId& known,
@@ -42,7 +56,8 @@ VCSymbolicExprId VCService::getImpliedCondition(const VCSymbolicExprId& conditio
         return *decided ? table.getIdTRUE() : table.getIdFALSE();
     const SymbolicExprPrinter& printer = isQuill ? parts_->quillPrinter : parts_->cPrinter;
     const auto normalForm = [&] { return simplify(given, isQuill).id(); };
-    return ShortestForm(table, printer, parts_->keywordsInForce(), proofs).find(given, context, normalForm);
+    ShortestForm search(table, printer, parts_->keywordsInForce(), proofs);
+    return noLonger(table, printer, search.find(given, context, normalForm), given);
 }
 
 } // namespace VT

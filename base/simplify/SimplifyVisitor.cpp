@@ -1,6 +1,7 @@
 #include "base/simplify/SimplifyVisitor.hpp"
 
 #include "base/core/Walk.hpp"
+#include "base/simplify/ConditionRoot.hpp"
 #include "base/simplify/LogicalChain.hpp"
 #include "base/simplify/RuleTables.hpp"
 
@@ -173,22 +174,7 @@ SymbolicExprId SymbolicExprSimplifyVisitor::pass(SymbolicExprId id) {
 SymbolicExprId SymbolicExprSimplifyVisitor::finishRoot(SymbolicExprId source, SymbolicExprId rebuilt) {
     if (!isWhole(rebuilt) || !rules_->isBoolean(source) || rules_->isBoolean(rebuilt))
         return rebuilt;
-    std::vector<SymbolicExprId> pending{rebuilt};
-    IdMap<bool> seen;
-    while (!pending.empty()) {
-        const SymbolicExprId id = pending.back();
-        pending.pop_back();
-        const SymbolicOp op = rules_->op(id);
-        if (op == SymbolicOp::Divide)
-            return truthAsNumber(*rules_, source, rebuilt);
-        if (booleanOps.contains(op) || seen.find(id) != nullptr)
-            continue;
-        seen.insert(id, true);
-        const SymbolicExpr& node = *table().get(id);
-        for (std::size_t i = 0; i < node.getNumInputs(); ++i)
-            pending.push_back(node.getInput(i));
-    }
-    return rebuilt;
+    return hasQuotientOfItsOwn(table(), rebuilt) ? truthAsNumber(*rules_, source, rebuilt) : rebuilt;
 }
 
 bool SymbolicExprSimplifyVisitor::isWhole(SymbolicExprId id) const {
