@@ -21,7 +21,8 @@ struct DecisionOptions {
 ///
 /// Conditions are over integers: every symbol stands for an integer, a truth value is an integer that is not zero, a
 /// truth value in arithmetic is 1 or 0.  Comparisons of linear terms with integers, with real literals (exactly:
-/// A < 2.5 is A <= 2) and with a symbol plus a constant are understood, and so is everything that && || ! make of them.
+/// A < 2.5 is A <= 2) and with a symbol plus a constant are understood, sums of several unknowns are solved, and so is
+/// everything that && || ! make of them.
 /// A call is an unknown of its own, whatever its arguments; so is a member, unless a value is bound to it.  Any other
 /// arithmetic is an unknown for each node: equal nodes are equal, and nothing else is known of it but the range of %
 /// and & with a literal.  Quotients are cut toward zero, and bits and shifts are of 32-bit values, where a witness is

@@ -32,8 +32,8 @@ struct UnknownValue {
 /// Every witness was confirmed.  It is the smallest: the first unknown is as near to 0 as it can be, then the second,
 /// and so on; of two values equally near the positive one is the smaller.  Two exceptions: where the steps ran out
 /// after a witness was found it may not be the smallest, and where the conditions hold arithmetic that is not
-/// understood (products, quotients, bits, sums of several unknowns) it is the first that was confirmed.  Either way it
-/// does not depend on what was interned or asked before.
+/// understood (products, quotients, bits) or sums of several unknowns it is the first that was confirmed.  Either way
+/// it does not depend on what was interned or asked before.
 using Witness = std::vector<UnknownValue>;
 
 struct Decision {

@@ -5,6 +5,7 @@
 // differences and products) and ask again.
 //
 // Cost: at most limits::confirmations trials in one question; each costs the nodes of the terms and one path.
+#include "base/decide/LinearSolver.hpp"
 #include "base/decide/WitnessSearch.hpp"
 
 #include <algorithm>
@@ -92,6 +93,41 @@ bool WitnessSearch::isExcluded() {
             return true;
     }
     return false;
+}
+
+/// Solves the bounds of the path together with the sums that it restricts, exactly; terms are unknowns like any other.
+/// A solution counts when evaluation confirms it; the values are in trial_ then.
+WitnessSearch::SumsOnPath WitnessSearch::solveSums() {
+    if (std::ranges::none_of(terms_, [](const Term& term) { return term.plan == nullptr; }))
+        return SumsOnPath::Open;
+    using Compared = LinearConstraint::Relation;
+    const std::size_t variables = order_.size(); // by number - 1
+    std::vector<LinearConstraint> constraints;
+    for (const DifferenceSystem::Bound& bound : system_.bounds()) { // x - y <= most
+        constraints.push_back({std::vector<BigInteger>(variables), bound.most, Compared::NotNegative});
+        if (bound.x != 0)
+            constraints.back().factors[bound.x - 1] -= 1;
+        if (bound.y != 0)
+            constraints.back().factors[bound.y - 1] += 1;
+    }
+    for (const Term& term : terms_) {
+        if (term.plan != nullptr)
+            continue;
+        constraints.push_back({std::vector<BigInteger>(variables), 0, Compared::Zero});
+        constraints.back().factors[term.number - 1] = -1;
+        for (const LinearPart& part : unknowns_[order_[term.number - 1]].sum)
+            constraints.back().factors[numberOf(part.unknown) - 1] += part.factor;
+    }
+    const auto solution = LinearSolver(steps_).solveSmallest(constraints, variables);
+    if (!solution)
+        return SumsOnPath::Unsolvable;
+    std::vector<std::int64_t> values(variables + 1);
+    for (std::size_t i = 0; i < variables; ++i) {
+        if (abs((*solution)[i]) > largestNumber)
+            return SumsOnPath::Open;
+        values[i + 1] = static_cast<std::int64_t>((*solution)[i]);
+    }
+    return confirm(values) ? SumsOnPath::Solved : SumsOnPath::Open;
 }
 
 /// Values that the literals of the path and of the terms suggest, and small ones; smallest first.

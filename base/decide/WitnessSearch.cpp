@@ -238,9 +238,22 @@ void WitnessSearch::reachedTruth() {
         best_ = solutions_.back();
         return;
     }
-    if (confirm(solutions_.back()))
+    if (confirm(solutions_.back())) {
         best_ = trial_;
-    else if (!isExcluded() && !confirmNear(solutions_.back()))
+        return;
+    }
+    if (isExcluded())
+        return;
+    switch (solveSums()) {
+    case SumsOnPath::Unsolvable:
+        return;
+    case SumsOnPath::Solved:
+        best_ = trial_;
+        return;
+    case SumsOnPath::Open:
+        break;
+    }
+    if (!confirmNear(solutions_.back()))
         unconfirmed_ = true;
 }
 

@@ -11,7 +11,8 @@
 // Where it branches on values of terms that are not understood, a path says what those values have to be but not
 // whether they can.  Such a witness counts when evaluation confirms it.  If the smallest solution is not confirmed,
 // other values for one or two of the symbols in those terms are tried: small ones and what the literals suggest, at
-// most limits::confirmations in all.  A path whose sums lie outside what the bounds of their parts allow is excluded.
+// most limits::confirmations in all.  A path whose sums lie outside what the bounds of their parts allow is excluded;
+// otherwise the sums of a path are solved together with its bounds as a system of linear constraints (LinearSolver).
 #pragma once
 
 #include "base/decide/ConditionReader.hpp"
@@ -80,6 +81,8 @@ private:
     bool confirmWith(std::span<const Change> changes);
     bool confirmNear(const std::vector<std::int64_t>& solution);
     bool isExcluded();
+    enum class SumsOnPath : std::uint8_t { Unsolvable, Solved, Open };
+    SumsOnPath solveSums();
     [[nodiscard]] std::vector<std::int64_t> candidates(const std::vector<std::int64_t>& solution) const;
 
     const LeafReader& leafReader_;
