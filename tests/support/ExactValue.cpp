@@ -35,7 +35,7 @@ std::optional<ExactNumber> ofReals(Op op, double a, double b) { // NOLINT(misc-n
     case Op::Multiply:
         return realIf(std::fma(a, b, -(a * b)) == 0, a * b);
     case Op::Divide:
-        return realIf(std::fabs(b) >= limits::zeroThreshold && std::fma(a / b, b, -a) == 0, a / b);
+        return std::fabs(b) < limits::zeroThreshold ? std::nullopt : realIf(std::fma(a / b, b, -a) == 0, a / b);
     default: // bits of reals, remainders
         return std::nullopt;
     }
