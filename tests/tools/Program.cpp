@@ -30,6 +30,21 @@ std::string inEnvironment(Strings settings, const std::string& command) {
     return commandOf("env -i", settings) + " " + command;
 }
 
+/// Whether a text is that of the pattern, where … stands for anything.
+bool isLike(const std::string& text, const std::string& pattern) {
+    const std::string any = "\u2026";
+    std::size_t at = 0;
+    std::size_t from = 0;
+    for (std::size_t end = 0; (end = pattern.find(any, from)) != std::string::npos; from = end + any.size()) {
+        const std::string part = pattern.substr(from, end - from);
+        const std::size_t found = text.find(part, at);
+        if (found == std::string::npos || (from == 0 && found != 0))
+            return false;
+        at = found + part.size();
+    }
+    return from == 0 ? text == pattern : text.substr(at).ends_with(pattern.substr(from));
+}
+
 } // namespace
 
 ProgramResult runScript(const Workplace& place, const std::string& script, const std::string& input,
@@ -65,25 +80,43 @@ ProgramResult runOnTerminal(const Strings& arguments, const std::string& input, 
     return result;
 }
 
-void expectRows(const std::vector<Row>& rows, const std::map<std::string, std::string>& files) {
-    for (const Row& row : rows) {
-        SCOPED_TRACE(row.script);
+void expectTranscript(const std::string& file, const std::map<std::string, std::string>& files) {
+    struct Command {
+        std::string script;
+        std::string input = {};
+        ProgramResult expected = {{}, {}, 0};
+    };
+
+    std::vector<Command> commands;
+    std::ifstream stream(VTSYM_TEST_DATA "/cases/" + file);
+    for (std::string line; std::getline(stream, line);) {
+        if (line.empty() || line.starts_with('#'))
+            continue;
+        const std::string text = line.substr(std::min<std::size_t>(line.size(), 2));
+        if (line.starts_with('$')) {
+            commands.push_back({text});
+            continue;
+        }
+        Command& command = commands.at(commands.size() - 1);
+        if (line.starts_with('<'))
+            command.input += text + "\n";
+        else if (line.starts_with('!'))
+            command.expected.words += text + "\n";
+        else if (line.starts_with('='))
+            command.expected.status = std::stoi(text);
+        else
+            command.expected.output += line.substr(line.starts_with('\\') ? 1 : 0) + "\n";
+    }
+    EXPECT_FALSE(commands.empty()) << file;
+    for (const auto& [script, input, expected] : commands) {
+        SCOPED_TRACE(file + ": " + script + "\n" + input);
         const Workplace place;
         for (const auto& [name, content] : files)
             place.write(name, content);
-        const std::size_t line = std::min(row.script.find('\n'), row.script.size());
-        const ProgramResult result =
-            runScript(place, row.script.substr(0, line), row.script.substr(std::min(line + 1, row.script.size())));
-        EXPECT_EQ(result.output, row.output);
-        EXPECT_EQ(result.status, row.status);
-        EXPECT_EQ(result.words.empty(), row.words.empty()) << result.words;
-        std::size_t at = 0;
-        for (std::size_t from = 0, end = 0; end < row.words.size(); from = end + 3) {
-            end = std::min(row.words.find("...", from), row.words.size());
-            end += row.words.substr(end).starts_with("....") ? 1 : 0; // behind a full stop
-            at = result.words.find(row.words.substr(from, end - from), at);
-            EXPECT_NE(at, std::string::npos) << result.words;
-        }
+        const ProgramResult result = runScript(place, script, input);
+        EXPECT_EQ(result.output, expected.output);
+        EXPECT_EQ(result.status, expected.status);
+        EXPECT_TRUE(isLike(result.words, expected.words)) << result.words << "is not\n" << expected.words;
     }
 }
 

@@ -26,15 +26,11 @@ ProgramResult runProgram(const Strings& arguments, const std::string& input = {}
 /// What a terminal shows when the program runs on it and the input is typed.
 ProgramResult runOnTerminal(const Strings& arguments, const std::string& input, const Strings& environment);
 
-struct Row {
-    std::string script; ///< one line; what follows it is standard input
-    std::string output;
-    std::string words = {}; ///< parts of standard error, in order and with "..." between them; none for silence
-    int status = 0;
-};
-
-/// Runs each row where the files are, and tells what is not as expected.
-void expectRows(const std::vector<Row>& rows, const std::map<std::string, std::string>& files = {});
+/// Runs the commands of a file of tests/data/cases, each where the given files are, and tells what is not as written.
+/// Lines say by their first character what they are; the others, and what is behind a \, are lines of the output:
+///     $ a script of a shell in which vtsym is the program      < a line of its standard input
+///     ! a line of standard error; … stands for anything        = its status unless it is 0        # a comment
+void expectTranscript(const std::string& file, const std::map<std::string, std::string>& files = {});
 
 std::vector<std::string> linesOf(const std::string& text);
 
