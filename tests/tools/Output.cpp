@@ -1,5 +1,6 @@
 // Whatever the program is given, a terminal takes no orders from what it writes.
 #include "host/Text.hpp"
+#include "tests/support/Cases.hpp"
 #include "tests/tools/Program.hpp"
 
 #include <algorithm>
@@ -41,14 +42,8 @@ TEST(Output, IsSafeForTerminalsWhateverTheArguments) {
     const Workplace place;
     place.write("m", "{}");
     for (const std::string& text : hostileTexts) {
-        for (const std::string& command :
-             linesOf("@\n-@\n--@\nhelp @\noperators @\nsimplify -@\nsimplify --@=1\nsimplify --from @ A\n"
-                     "simplify --bits @ A\nsimplify --feature @ A\nsimplify --feature @=@ A\n"
-                     "--feature VariantKeywordsSimCodegen=@ simplify A\nconvert --to @ A\nsymbols --kinds @ A\n"
-                     "eval -D @ A\neval -D @=1 A\neval -D A=@ A\neval --from quill -D A=\\'@\\' A\ndims -D @=1 A\n"
-                     "pp --given @ A\nreplace A=@ A\ncompare @\ncompare @ A@\ngiven --json @ A@\ncheck @\n"
-                     "check --html @\ncheck --html @/page m\nscan @\nscan --max-size @ ."))
-            expectSafe(place, command, text);
+        for (const CaseRow& row : casesOf("program-hostile.txt", "arguments", 1))
+            expectSafe(place, row[0], text);
         expectSafe(place, "simplify A", {}, {}, text + "=1," + text + ",CacheSymExprSimplifyResults=" + text);
     }
 }
