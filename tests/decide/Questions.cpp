@@ -1,136 +1,56 @@
 // Answers and witnesses, as they are told.
 #include "tests/decide/Bench.hpp"
+#include "tests/support/Cases.hpp"
 
 namespace VT::Testing {
 namespace {
 
-struct OneRow {
-    const char* condition;
-    const char* canHold;
-    const char* mustHold;
-};
-
-void expectRows(std::span<const OneRow> rows, const DecisionOptions& options = {}) {
-    for (const OneRow& row : rows) {
-        SCOPED_TRACE(row.condition);
-        DecisionBench bench(options);
-        const SymbolicExprId id = bench.parse(row.condition);
-        EXPECT_EQ(bench.text(bench.decider.canHold(id)), row.canHold);
-        EXPECT_EQ(bench.text(bench.decider.mustHold(id)), row.mustHold);
-    }
+TEST(DecisionOfOne, CanAndMustHold) {
+    for (const bool bits32 : {false, true})
+        for (const CaseRow& row : casesOf("decide.txt", bits32 ? "of one, in 32 bits" : "of one", 3)) {
+            SCOPED_TRACE(row[0]);
+            DecisionBench bench({.bits32 = bits32});
+            const SymbolicExprId id = bench.parse(row[0]);
+            EXPECT_EQ(bench.text(bench.decider.canHold(id)), row[1]);
+            EXPECT_EQ(bench.text(bench.decider.mustHold(id)), row[2]);
+        }
 }
 
-TEST(DecisionOfOne, Condition) {
-    constexpr OneRow rows[] = {
-        // Constants and numbers where a truth value is asked for.
-        {"true", "yes:", "yes"},
-        {"0.0", "no", "no:"},
-        {"0.5 && A", "yes: A=1", "no: A=0"},
-        {"true == 1 && false < 1", "yes:", "yes"},
-        // One unknown.
-        {"3-2*A>=8", "yes: A=-3", "no: A=0"},
-        {"A<=2147483647 && A>=-2147483648", "yes: A=0", "no: A=2147483648"},
-        {"A-2147483647-2147483647>2147483647", "yes: A=6442450942", "no: A=0"},
-        // Real literals.
-        {"A<2.5 && A>1.5", "yes: A=2", "no: A=0"},
-        {"-0.5<=A && A<0.5 && A", "no", "no: A=0"},
-        {"A<1.0e300", "yes: A=0", "undecided terms"},
-        {"A*0.5<1 && !(A*0.5<1)", "no", "no: A=0"},
-        {"A*0.5<1", "undecided terms", "undecided terms"},
-        // Two and three unknowns.
-        {"C+1<B && B<A-3", "yes: A=0 B=-4 C=-6", "no: A=0 B=0 C=0"},
-        {"A!=B && B!=C && A!=C && A>=0 && A<=1 && B>=0 && B<=1 && C>=0 && C<=1", "no", "no: A=0 B=0 C=0"},
-        {"A-2147483647>B && B>2147483647", "yes: A=4294967296 B=2147483648", "no: A=0 B=0"},
-        // Truth values as numbers.
-        {"A+(B==1)>3 && A<=3", "yes: A=3 B=1", "no: A=0 B=0"},
-        {"(A>0)*(B>0)*5==5", "yes: A=1 B=1", "no: A=0 B=0"},
-        // Calls and members are unknowns, whatever their arguments.
-        {"A==B && defined(A) && !defined(B)", "yes: A=0 B=0 defined(A)=1 defined(B)=0",
-         "no: A=0 B=0 defined(A)=0 defined(B)=0"},
-        {"f(x,1)>f(x,2) && s.m>2", "yes: f(x,1)=0 f(x,2)=-1 s.m=3", "no: f(x,1)=0 f(x,2)=0 s.m=0"},
-        // The variant keywords.
-        {"!(sim) && (codegen) == 1", "yes: (codegen)=1 (sim)=0", "no: (codegen)=0 (sim)=1"},
-        // Arithmetic that is not understood.
-        {"A*B==391 && A>17 && A<391", "yes: A=23 B=17", "no: A=0 B=0"},
-        {"A%16==20 || (A&3)>3 || (A&3)<0", "no", "no: A=0"},
-        {"(A&5)-B==2 && B==2", "yes: A=4 B=2", "no: A=0 B=0"},
-        {"A%B>0 && !(A%C>0)", "yes: A=1 B=2 C=1", "no: A=1 B=1 C=1"},
-        {"A+B>64 && A==5", "yes: A=5 B=60", "no: A=0 B=0"},
-        {"X>>4 > Y && Y>100", "yes: X=1632 Y=101", "no: X=0 Y=0"},
-        {"1/A==2", "undecided terms", "no: A=1"},
-    };
-    expectRows(rows);
-}
-
-TEST(DecisionOfOne, UnderOptions) {
+TEST(DecisionOfTwo, KeywordsAreOppositesWhileInForce) {
     for (const bool inForce : {false, true}) {
         DecisionBench bench({.keywordsInForce = inForce});
         const SymbolicExprId sim = SymbolicString(bench.table, "(sim)").getId(bench.table);
         const SymbolicExprId codegen = SymbolicString(bench.table, " (codegen) ").getId(bench.table);
         EXPECT_EQ(bench.decider.overlaps(sim, codegen).isYes(), !inForce);
     }
-    constexpr OneRow narrow[] = {
-        {"A<=2147483647 && A>=-2147483648", "yes: A=0", "yes"},
-        {"A>2147483646", "yes: A=2147483647", "no: A=0"},
-        {"A-2147483647>B && B>0", "no", "no: A=0 B=0"},
-        {"A+B>2147483647", "yes: A=1 B=2147483647", "no: A=0 B=0"},
-    };
-    expectRows(narrow, {.bits32 = true});
 }
 
 TEST(DecisionOfTwo, RelationAndWitnesses) {
-    struct Row {
-        const char* a;
-        const char* b;
-        RelationKind kind;
-        const char* onlyA;
-        const char* onlyB;
-        const char* both;
-    };
-
-    constexpr Row rows[] = {
-        {"a&&b || !a&&c || b&&c", "a&&b || !a&&c", RelationKind::Equivalent, "no", "no", "yes: a=0 b=0 c=1"},
-        {"A<A", "B!=B", RelationKind::Equivalent, "no", "no", "no"},
-        {"A<A", "B", RelationKind::Disjoint, "no", "yes: A=0 B=1", "no"},
-        {"A==1", "A>0", RelationKind::Implies, "no", "yes: A=2", "yes: A=1"},
-        {"A<B", "B<C", RelationKind::Overlaps, "yes: A=0 B=1 C=0", "yes: A=0 B=0 C=1", "yes: A=0 B=1 C=2"},
-        {"A*A==2", "A*A>1", RelationKind::Undecided, "no", "yes: A=2", "undecided terms"},
-    };
-    for (const Row& row : rows) {
-        SCOPED_TRACE(std::string(row.a) + " with " + row.b);
+    const char* const kinds[] = {"equivalent", "disjoint", "implies", "implied by", "overlaps", "undecided"};
+    for (const CaseRow& row : casesOf("decide.txt", "of two", 6)) {
+        SCOPED_TRACE(row[0] + " with " + row[1]);
         DecisionBench bench;
-        const Relation relation = bench.decider.classify(bench.parse(row.a), bench.parse(row.b));
-        EXPECT_EQ(relation.kind, row.kind);
-        EXPECT_EQ(bench.text(relation.onlyA), row.onlyA);
-        EXPECT_EQ(bench.text(relation.onlyB), row.onlyB);
-        EXPECT_EQ(bench.text(relation.both), row.both);
-        EXPECT_EQ(relation.bound == DecisionBound::None, row.kind != RelationKind::Undecided);
+        const Relation relation = bench.decider.classify(bench.parse(row[0]), bench.parse(row[1]));
+        EXPECT_EQ(kinds[static_cast<std::size_t>(relation.kind)], row[2]);
+        EXPECT_EQ(bench.text(relation.onlyA), row[3]);
+        EXPECT_EQ(bench.text(relation.onlyB), row[4]);
+        EXPECT_EQ(bench.text(relation.both), row[5]);
+        EXPECT_EQ(relation.bound == DecisionBound::None, relation.kind != RelationKind::Undecided);
     }
 }
 
 TEST(DecisionOfSets, CoverAndOverlap) {
-    struct Row {
-        std::vector<const char*> conditions;
-        const char* covers;
-        const char* disjoint;
-        std::optional<std::pair<std::size_t, std::size_t>> members;
-    };
-
-    const Row rows[] = {
-        {{}, "no:", "yes", std::nullopt},
-        {{"A==1", "A==2", "A<1", "A>3"}, "no: A=3", "yes", std::nullopt},
-        {{"A==1", "B", "A<0", "A<3 && A>1", "A==2 && !B"}, "no: A=0 B=0", "no: A=1 B=1", {{0, 1}}},
-        {{"A<B", "A>B", "B==A+1"}, "no: A=0 B=0", "no: A=0 B=1", {{0, 2}}},
-    };
-    for (const Row& row : rows) {
+    for (const CaseRow& row : casesOf("decide.txt", "of sets", 8)) {
+        SCOPED_TRACE(testing::PrintToString(row));
         DecisionBench bench;
         std::vector<SymbolicExprId> ids;
-        for (const char* text : row.conditions)
-            ids.push_back(bench.parse(text));
-        EXPECT_EQ(bench.text(bench.decider.covers(ids)), row.covers);
+        for (std::size_t i = 3; i < row.size() && !row[i].empty(); ++i)
+            ids.push_back(bench.parse(row[i]));
+        EXPECT_EQ(bench.text(bench.decider.covers(ids)), row[0]);
         const SetDecision disjoint = bench.decider.disjoint(ids);
-        EXPECT_EQ(bench.text(disjoint), row.disjoint);
-        EXPECT_EQ(disjoint.members, row.members);
+        EXPECT_EQ(bench.text(disjoint), row[1]);
+        const auto members = disjoint.members;
+        EXPECT_EQ(members ? std::to_string(members->first) + " " + std::to_string(members->second) : "", row[2]);
     }
 }
 
