@@ -8,6 +8,7 @@
 #include "host/Diagnostics.hpp"
 #include "host/embedded/ModelFile.hpp"
 #include "tests/service/Customizers.hpp"
+#include "tests/support/Cases.hpp"
 
 #include <array>
 #include <gtest/gtest.h>
@@ -16,21 +17,11 @@
 namespace VT::Testing {
 namespace {
 
-constexpr const char* model = R"json({"blocks": [
-    {"name": "Engine", "condition": "P > 0", "choices": [
-        {"name": "Petrol", "condition": "F == 1"},
-        {"name": "Diesel", "condition": "F == 2 && P > 0", "blocks": [{"name": "Filter", "condition": "(inherit)"}]},
-        {"name": "Other", "condition": " (default) "}]},
-    {"name": "Free"},
-    {"name": "Sim", "condition": "(sim)"},
-    {"name": "Bad", "condition": "F ==="}],
-  "ports": [
-    {"name": "joined", "from": "Engine/Petrol", "to": ["Free", "Sim"]},
-    {"name": "split", "from": "Free", "to": ["Engine/Petrol", "Engine/Diesel"]},
-    {"name": "open", "from": "Engine/Petrol"}]})json";
-
 TEST(BlockConditions, AreThoseOfTheBlockAndAllAroundItAsACustomizerSaysThere) {
     VTRootBD root;
+    std::string model;
+    for (const CaseRow& row : casesOf("service.txt", "model of the blocks", 1))
+        model += row[0];
     Embedded::readModel(model, root);
     TestCustomizer customizer; // outlives the service
     const FreshService service;
@@ -43,26 +34,16 @@ TEST(BlockConditions, AreThoseOfTheBlockAndAllAroundItAsACustomizerSaysThere) {
             return "Fuel";
         return std::nullopt;
     };
-    const std::array<const char*, 4> rows[] = {
-        // a block; its condition as it stands, simplified and customized
-        {"Engine", "P>0", "P>0", "Power>0"},
-        {"Engine/Petrol", "P>0 && F==1", "F==1 && P>0", "Power>0 && Fuel==1"},
-        {"Engine/Diesel/Filter", "P>0 && (F==2 && P>0)", "F==2 && P>0", "Power>0 && (F==2 && -5>0)"},
-        {"Engine/Other", "P>0 && !(F==1 || F==2 && P>0)", "F!=1 && F!=2 && P>0",
-         "Power>0 && !(Fuel==1 || F==2 && -5>0)"},
-        {"Free", "", "", ""},
-        {"Sim", "(sim)", "(sim)", "(sim)"},
-    };
-    for (const auto& [path, condition, simplified, customized] : rows) {
-        SCOPED_TRACE(path);
-        const VTBlock* const block = root.find(path);
+    for (const CaseRow& row : casesOf("service.txt", "blocks", 4)) {
+        SCOPED_TRACE(row[0]);
+        const VTBlock* const block = root.find(row[0]);
         ASSERT_NE(block, nullptr);
-        EXPECT_EQ(service->getCExprNetAAVCEString(block, false), condition);
-        EXPECT_EQ(service->getCExprNetAAVCEString(block, true), simplified);
-        EXPECT_EQ(service->getCExprNetAAVCEString(block, true, nullptr), simplified);
-        EXPECT_EQ(service->printCExpr(service->getQExprNetAAVCEIdx(block, false)), condition);
-        EXPECT_EQ(service->getCExprNetAAVCEString(block, false, &customizer), customized);
-        EXPECT_EQ(service->printCExpr(service->getQExprNetAAVCEIdx(block, false, &customizer)), customized);
+        EXPECT_EQ(service->getCExprNetAAVCEString(block, false), row[1]);
+        EXPECT_EQ(service->getCExprNetAAVCEString(block, true), row[2]);
+        EXPECT_EQ(service->getCExprNetAAVCEString(block, true, nullptr), row[2]);
+        EXPECT_EQ(service->printCExpr(service->getQExprNetAAVCEIdx(block, false)), row[1]);
+        EXPECT_EQ(service->getCExprNetAAVCEString(block, false, &customizer), row[3]);
+        EXPECT_EQ(service->printCExpr(service->getQExprNetAAVCEIdx(block, false, &customizer)), row[3]);
     }
     EXPECT_EQ(service->getQExprNetAAVCEString(root.find("Engine/Other"), true), "F~=1 && F~=2 && P>0");
     EXPECT_EQ(service->getCExprNetAAVCEString(&root.ports()[0], true), "F==1 && P>0");

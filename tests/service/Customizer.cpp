@@ -2,9 +2,7 @@
 #include "base/simplify/Simplify.hpp"
 #include "base/simplify/SimplifyVisitorBlockVariants.hpp"
 #include "tests/service/Customizers.hpp"
-
-#include <array>
-#include <tuple>
+#include "tests/support/Cases.hpp"
 
 #include <stdexcept>
 
@@ -58,21 +56,14 @@ TEST(Customizer, MayUseTheServiceWhileOneEnds) {
 }
 
 TEST(Customizer, RewriteCountsWhereItDecides) {
-    const std::vector<std::array<std::string, 4>> rows{
-        // condition, rewritten, result, and past the customizer
-        {"A==1", "true", "", "A==1"},         {"A==1", "B==1 && B==2", "false", "A==1"},
-        {"A==1", "B==1 || B!=1", "", "A==1"}, {"A==1", "B==1", "A==1", "A==1"},
-        {"A>2 && A>5", "B", "A>5", "A>5"},    {"true", "false", "", ""},
-        {"false", "true", "false", "false"},
-    };
-    for (const auto& [condition, rewritten, result, unasked] : rows) {
+    for (const CaseRow& row : casesOf("service.txt", "rewritten", 4)) {
         for (const bool isQuill : {false, true}) {
             TestCustomizer customizer; // outlives the service
             const FreshService service;
-            customizer.onRewrite = rewriteTo(rewritten);
+            customizer.onRewrite = rewriteTo(row[1]);
             service->setVCCustomizer(&customizer);
-            EXPECT_EQ(service->printCExpr(service->simplify(service->parseC(condition), isQuill)), result) << rewritten;
-            EXPECT_EQ(service->simplifyExpressionWithoutEvalChecks(condition, false, false), unasked) << rewritten;
+            EXPECT_EQ(service->printCExpr(service->simplify(service->parseC(row[0]), isQuill)), row[2]) << row[1];
+            EXPECT_EQ(service->simplifyExpressionWithoutEvalChecks(row[0], false, false), row[3]) << row[1];
         }
     }
 }
@@ -122,57 +113,43 @@ TEST(Customizer, CachesKeepTheirAnswersByLanguage) {
 }
 
 TEST(Customizer, ConfirmsSelfComparisonsInQuillMode) {
-    for (const std::string op : {"<", "==", ">=", "!=", ">", "<="})
+    for (const CaseRow& row : casesOf("service.txt", "self-comparisons", 4))
         for (const bool agrees : {true, false}) {
+            SCOPED_TRACE(row[0]);
             TestCustomizer customizer; // outlives the service
             const FreshService service;
-            const VCSymbolicExprId condition = service->parseC("P" + op + "P");
-            const auto simplified = [&](bool isQuill) {
-                return service->printCExpr(service->simplify(condition, isQuill));
-            };
-            const bool truth = op.ends_with('=') && op != "!=";
-            const std::string agreed = truth ? "" : "false", refused = truth ? "false" : "";
-            SCOPED_TRACE(op);
+            const VCSymbolicExprId condition = service->parseC(row[0]);
             customizer.agrees = agrees;
             service->setVCCustomizer(&customizer);
-            EXPECT_EQ(simplified(false), agreed);
+            EXPECT_EQ(service->printCExpr(service->simplify(condition, false)), row[1]);
             EXPECT_TRUE(customizer.questions.empty());
-            EXPECT_EQ(simplified(true), agrees ? agreed : refused);
+            EXPECT_EQ(service->printCExpr(service->simplify(condition, true)), row[agrees ? 1 : 2]);
             ASSERT_FALSE(customizer.questions.empty());
-            EXPECT_EQ(customizer.questions.front().first, service->printQExpr(condition));
-            EXPECT_EQ(customizer.questions.front().second, truth ? "true" : "false");
+            EXPECT_EQ(customizer.questions.front(), std::pair(service->printQExpr(condition), row[3]));
             const FreshService alone;
-            EXPECT_EQ(alone->printCExpr(alone->simplify(alone->parseC("P" + op + "P"), true)), agreed);
+            EXPECT_EQ(alone->printCExpr(alone->simplify(alone->parseC(row[0]), true)), row[1]);
         }
 }
 
 TEST(Customizer, VisitorWithNobodyToAskAnswersTheOtherWayRound) {
     const FreshService service;
     const SymbolicExprSimplify& simplifier = service->simplifier();
-    const auto simplified = [&](const char* text, bool ask, VCCustomizer* customizer) {
-        SymbolicExprSimplifyVisitorBlockVariants visitor(service->table(), true, simplifier.printer(), ask, customizer);
-        std::uint64_t passes = 0;
-        return service->printCExpr(simplifier.simplify(service->parseC(text), passes, visitor));
-    };
     TestCustomizer agreeing;
-    EXPECT_EQ(simplified("P==P", true, nullptr), "false");
-    EXPECT_EQ(simplified("P<P", true, nullptr), "");
-    EXPECT_EQ(simplified("P==P", false, nullptr), "");
-    EXPECT_EQ(simplified("P==P", true, &agreeing), "");
-    EXPECT_EQ(simplified("P<P || P>2 && P>3", true, &agreeing), "P>3");
+    for (const CaseRow& row : casesOf("service.txt", "visited", 3)) {
+        SymbolicExprSimplifyVisitorBlockVariants visitor(service->table(), true, simplifier.printer(),
+                                                         row[1] != "no question",
+                                                         row[1] == "agreeing" ? &agreeing : nullptr);
+        std::uint64_t passes = 0;
+        EXPECT_EQ(service->printCExpr(simplifier.simplify(service->parseC(row[0]), passes, visitor)), row[2]) << row[0];
+    }
 }
 
 TEST_F(Customized, ReplacesParametersToCompare) {
     customizer.parameters = {{"P", "Q"}, {"Q", "P"}, {"N", 3}, {"true", "Q"}};
-    const std::vector<std::tuple<const char*, const char*, bool>> cases{
-        {"P==1", "Q==1", false},      {"P", "P && P", true},        {"P==N", "P==3", true},
-        {"P>N", "!(P<=3)", true},     {"f(N)==Q", "f(3)==Q", true}, {"N==3", "true", true},
-        {"N==4", "false", true},      {"true", "Q", false},         {"N", "3", true},
-        {"f(N)==Q", "f(3)==P", false}};
-    for (const auto& [a, b, equal] : cases) {
-        EXPECT_EQ(service->isEqual(service->parseC(a), service->parseC(b)), equal) << a << ", " << b;
-        EXPECT_EQ(VCSymbolicExprId(service->parseC(b)) == VCSymbolicExprId(service->parseC(a)), equal)
-            << a << ", " << b;
+    for (const CaseRow& row : casesOf("service.txt", "compared", 3)) {
+        const SymbolicExprId a = service->parseC(row[0]), b = service->parseC(row[1]);
+        EXPECT_EQ(service->isEqual(a, b), row[2] == "yes") << row[0] << ", " << row[1];
+        EXPECT_EQ(VCSymbolicExprId(b) == VCSymbolicExprId(a), row[2] == "yes") << row[0] << ", " << row[1];
     }
     service->setVCCustomizer(nullptr);
     EXPECT_FALSE(service->isEqual(service->parseC("P==N"), service->parseC("P==3")));

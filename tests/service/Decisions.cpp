@@ -1,64 +1,120 @@
 // Decisions through the service: the operations, their texts, and conditions relative to others.
 #include "host/Diagnostics.hpp"
 #include "tests/service/Customizers.hpp"
+#include "tests/support/Cases.hpp"
 
-#include <array>
-#include <gmock/gmock.h>
+#include <boost/algorithm/string.hpp>
+#include <gtest/gtest.h>
+#include <map>
 #include <random>
 
 namespace VT::Testing {
 namespace {
 
-std::string told(VCService& service, const Decision& decision) {
+using Texts = std::vector<std::string>;
+
+std::string told(const std::string& text) {
+    return text;
+}
+
+std::string told(const Texts& texts) {
+    return texts.empty() ? "none" : boost::algorithm::join(texts, "; ");
+}
+
+std::string told(const Decision& decision) {
     static const char* const answers[] = {"no", "yes", "undecided"};
     const std::string answer = answers[static_cast<std::size_t>(decision.answer)];
-    return decision.witness ? answer + ": " + service.printWitness(*decision.witness) : answer;
+    if (!decision.witness)
+        return answer;
+    const std::string witness = VCService::getInstance().printWitness(*decision.witness);
+    return answer + (witness.empty() ? ":" : ": ") + witness;
+}
+
+/// What a function of the service answers to texts.
+template <auto function>
+std::string answer(VCService& service, const Texts& texts) {
+    if constexpr (std::is_invocable_v<decltype(function), VCService&, Texts>)
+        return told(std::invoke(function, service, texts));
+    else if constexpr (std::is_invocable_v<decltype(function), VCService&, std::string, std::string>)
+        return told(std::invoke(function, service, texts.at(0), texts.at(1)));
+    else if constexpr (std::is_invocable_v<decltype(function), VCService&, std::string, bool, bool>)
+        return told(std::invoke(function, service, texts.at(0), texts.at(1) == "Quill", texts.at(2) == "Quill"));
+    else if constexpr (std::is_invocable_v<decltype(function), VCService&, std::string>)
+        return told(std::invoke(function, service, texts.at(0)));
+    else
+        return told(std::invoke(function, service, service.parseC(texts.at(0))));
+}
+
+TEST(ServiceCalls, AnswerTexts) {
+    using S = VCService;
+    const std::map<std::string, std::string (*)(VCService&, const Texts&)> functions{
+        {"computeUniqueAndOperandsFromCCondition", answer<&S::computeUniqueAndOperandsFromCCondition>},
+        {"computeUniqueAndOperandsFromQCondition", answer<&S::computeUniqueAndOperandsFromQCondition>},
+        {"computeUniqueOrOperandsFromCCondition", answer<&S::computeUniqueOrOperandsFromCCondition>},
+        {"computeUniqueOrOperandsFromQCondition", answer<&S::computeUniqueOrOperandsFromQCondition>},
+        {"containsFromQConditions", answer<&S::containsFromQConditions>},
+        {"convertExprBetweenQandC", answer<&S::convertExprBetweenQandC>},
+        {"coversFromCConditions", answer<&S::coversFromCConditions>},
+        {"coversFromQConditions", answer<&S::coversFromQConditions>},
+        {"getImpliedCExprFromCConditions", answer<&S::getImpliedCExprFromCConditions>},
+        {"getImpliedQExprFromQConditions", answer<&S::getImpliedQExprFromQConditions>},
+        {"impliesFromCConditions", answer<&S::impliesFromCConditions>},
+        {"impliesFromQConditions", answer<&S::impliesFromQConditions>},
+        {"isDisjointFromQConditions", answer<&S::isDisjointFromQConditions>},
+        {"isEquivalentFromQConditions", answer<&S::isEquivalentFromQConditions>},
+        {"isTighterThanFromQConditions", answer<&S::isTighterThanFromQConditions>},
+        {"printCExpr", answer<&S::printCExpr>},
+        {"printCExprNoConversion", answer<&S::printCExprNoConversion>},
+        {"printQExpr", answer<&S::printQExpr>},
+        {"printQExprWithConversion", answer<&S::printQExprWithConversion>},
+        {"shortestCExprFromCCondition", answer<&S::shortestCExprFromCCondition>},
+        {"shortestCExprFromQCondition", answer<&S::shortestCExprFromQCondition>},
+        {"shortestQExprFromCCondition", answer<&S::shortestQExprFromCCondition>},
+        {"shortestQExprFromQCondition", answer<&S::shortestQExprFromQCondition>},
+        {"simplifyCExprFromQCondition", answer<&S::simplifyCExprFromQCondition>},
+        {"simplifyExpressionWithoutEvalChecks", answer<&S::simplifyExpressionWithoutEvalChecks>},
+        {"simplifyQExprFromQCondition", answer<&S::simplifyQExprFromQCondition>},
+    };
+    const FreshService service;
+    for (const CaseRow& row : casesOf("service.txt", "calls", 3)) {
+        SCOPED_TRACE(row[0] + " of " + row[1]);
+        Texts texts;
+        boost::algorithm::iter_split(texts, row[1], boost::algorithm::first_finder("; "));
+        try {
+            EXPECT_EQ(functions.at(row[0])(*service, texts), row[2]);
+        } catch (const HostDiagnostic&) {
+            EXPECT_EQ("refused", row[2]);
+        }
+    }
 }
 
 TEST(ServiceDecisions, OfPairs) {
-    const std::vector<std::array<std::string, 6>> rows{
-        // two conditions; implied, equivalent, disjoint, tighter
-        {"A<B && B<C", "A<C", "yes", "no: A=0, B=0, C=1", "no: A=0, B=1, C=2", "yes: A=0, B=0, C=1"},
-        {"false", "true", "yes", "no: ", "yes", "yes: "},
-        // Operators that Quill writes as calls.
-        {"rem(n,2)==1", "n%2!=0", "yes", "no: n=-1", "no: n=1", "yes: n=-1"},
-        {"(sim)", "!(codegen)", "yes", "yes", "no: (codegen)=0, (sim)=1", "no"},
-    };
-    for (const auto& [a, b, implies, equivalent, disjoint, tighter] : rows) {
+    for (const CaseRow& row : casesOf("service.txt", "pairs", 6)) {
+        const std::string &a = row[0], &b = row[1];
         SCOPED_TRACE(a + " with " + b);
         for (const bool caching : {false, true}) {
             const FreshService service(caching);
             VCService& s = VCService::getInstance();
             for (int again = 0; again < 2; ++again) {
-                EXPECT_EQ(told(s, s.impliesFromCConditions(a, b)), implies);
-                EXPECT_EQ(told(s, s.containsFromCConditions(b, a)), implies);
-                EXPECT_EQ(told(s, s.isEquivalentFromCConditions(a, b)), equivalent);
-                EXPECT_EQ(told(s, s.isEquivalentFromCConditions(b, a)), equivalent);
-                EXPECT_EQ(told(s, s.isDisjointFromCConditions(a, b)), disjoint);
-                EXPECT_EQ(told(s, s.isTighterThanFromCConditions(a, b)), tighter);
+                EXPECT_EQ(told(s.impliesFromCConditions(a, b)), row[2]);
+                EXPECT_EQ(told(s.containsFromCConditions(b, a)), row[2]);
+                EXPECT_EQ(told(s.isEquivalentFromCConditions(a, b)), row[3]);
+                EXPECT_EQ(told(s.isEquivalentFromCConditions(b, a)), row[3]);
+                EXPECT_EQ(told(s.isDisjointFromCConditions(a, b)), row[4]);
+                EXPECT_EQ(told(s.isTighterThanFromCConditions(a, b)), row[5]);
                 const Relation relation = s.compare(s.parseC(a), s.parseC(b));
-                EXPECT_EQ(relation.kind == RelationKind::Equivalent, equivalent == "yes");
-                EXPECT_EQ(relation.onlyA.isNo(), implies == "yes");
+                EXPECT_EQ(relation.kind == RelationKind::Equivalent, row[3] == "yes");
+                EXPECT_EQ(relation.onlyA.isNo(), row[2] == "yes");
             }
         }
     }
 }
 
-TEST(ServiceDecisions, OfQuillTextsAndSets) {
+TEST(ServiceDecisions, OfSetsAndOfWhatIsNoCondition) {
     const FreshService service;
-    EXPECT_TRUE(service->impliesFromQConditions("A ~= 1 && A > 0", "A >= 2").isYes());
-    EXPECT_TRUE(service->isEquivalentFromQConditions("rem(n,2) == 0", "~rem(n,2)").isYes());
-    EXPECT_TRUE(service->isDisjointFromQConditions("A", "~A").isYes());
-    EXPECT_TRUE(service->containsFromQConditions("A | B", "B").isYes());
-    EXPECT_TRUE(service->isTighterThanFromQConditions("A == 1", "A").isYes());
-    EXPECT_TRUE(service->coversFromQConditions({"A < 3", "A == 3", "A > 3"}).isYes());
-    const SetDecision gap = service->coversFromCConditions({"A < 3", "A > 3"});
-    EXPECT_EQ(told(VCService::getInstance(), gap), "no: A=3");
     const VCSymbolicExprId a = service->parseC("A>1");
     const VCSymbolicExprId b = service->parseC("A<5");
     EXPECT_EQ(service->isDisjoint({a, b}).members, std::pair(std::size_t{0}, std::size_t{1}));
-    EXPECT_THROW(service->impliesFromCConditions("A", "B ="), HostDiagnostic);
-    EXPECT_THROW(service->coversFromQConditions({"A", "B &&"}), HostDiagnostic);
     for (const SymbolicExprId bad : {invalidId, SymbolicExprId{service->table().size() + 100}}) {
         EXPECT_EQ(service->implies(a, bad).bound, DecisionBound::NoCondition);
         EXPECT_EQ(service->compare(bad, a).bound, DecisionBound::NoCondition);
@@ -68,37 +124,10 @@ TEST(ServiceDecisions, OfQuillTextsAndSets) {
     }
 }
 
-TEST(ServiceSums, OfProducts) {
-    using testing::ElementsAre;
-    using testing::IsEmpty;
-    const FreshService service;
-    EXPECT_THAT(service->computeUniqueOrOperandsFromCCondition("c && (b==1 || A<2) || b==1 && c"),
-                ElementsAre("A<2 && c", "b==1 && c"));
-    EXPECT_THAT(service->computeUniqueAndOperandsFromCCondition("b && A!=1 && b"), ElementsAre("A!=1", "b"));
-    EXPECT_THAT(service->computeUniqueAndOperandsFromQCondition("b && A~=1"), ElementsAre("A~=1", "b"));
-    EXPECT_THAT(service->computeUniqueOrOperandsFromQCondition("b && A~=1"), ElementsAre("A~=1 && b"));
-    EXPECT_THAT(service->computeUniqueOrOperandsFromCCondition("A<1 && A>1"), IsEmpty());
-    EXPECT_THAT(service->computeUniqueAndOperandsFromCCondition("A<1 || A>=1"), IsEmpty());
-    EXPECT_THAT(service->computeUniqueOrOperandsFromCCondition("true"), ElementsAre(""));
-    EXPECT_THAT(service->computeUniqueAndOperandsFromCCondition("false"), ElementsAre("false"));
-}
-
 TEST(ImpliedConditions, AreShortest) {
-    const std::vector<std::array<std::string, 3>> rows{
-        // a condition, what is known, what is left
-        {"A", "A>3", ""},
-        {"B", "A && !A", ""},
-        {"A && (B || C)", "A && !C", "B"},
-        {"A==1 || A==2 || A==3", "A>0", "A<=3"},
-        {"A<B && B<C && A<C", "B<D", "A<B && B<C"},
-        {"A==1 || B", "true", "A==1 || B"},
-        {"A*B>3 && A*B>2", "C", "A*B>3"},
-    };
     const FreshService service;
-    for (const auto& [condition, known, result] : rows)
-        EXPECT_EQ(service->getImpliedCExprFromCConditions(condition, known), result) << condition << " given " << known;
-    EXPECT_EQ(service->getImpliedQExprFromQConditions("A ~= 1 && B", "B | C & B"), "A~=1");
-    EXPECT_THROW(service->getImpliedCExprFromCConditions("A &&", "B"), HostDiagnostic);
+    for (const CaseRow& row : casesOf("service.txt", "implied", 3))
+        EXPECT_EQ(service->getImpliedCExprFromCConditions(row[0], row[1]), row[2]) << row[0] << " given " << row[1];
 }
 
 TEST(ImpliedConditions, AreNoLongerThanTheGivenOneInTheirLanguage) {

@@ -5,8 +5,8 @@
 #include "base/variants/VariantKeywords.hpp"
 #include "host/Diagnostics.hpp"
 #include "tests/service/Customizers.hpp"
+#include "tests/support/Cases.hpp"
 
-#include <array>
 #include <gtest/gtest.h>
 #include <optional>
 
@@ -63,89 +63,56 @@ TEST(ServiceLifetime, ReadsTheCacheFeatureOnce) {
 }
 
 TEST(ServiceTexts, AreReadAndPrinted) {
-    const std::vector<std::array<std::string, 5>> rows{
-        // a text, in C and in Quill, simplified in C and in Quill
-        {"", "", "", "", ""},
-        {"A==1&&A==2", "A==1 && A==2", "A==1 && A==2", "false", "false"},
-        {"!(A<3)", "!(A<3)", "~(A<3)", "A>=3", "A>=3"},
-        {"F & 4 || x >> 2", "F&4 || x>>2", "bitand(F,4) || bitshift(x,-2)", "F&4 || x>>2",
-         "bitand(F,4) || bitshift(x,-2)"},
-        {"(sim) && (codegen)", "(sim) && (codegen)", "(sim) && (codegen)", "false", "false"},
-    };
     const FreshService service;
-    for (const auto& [text, c, quill, simpleC, simpleQuill] : rows) {
+    for (const CaseRow& row : casesOf("service.txt", "texts", 5)) {
+        const std::string& text = row[0];
         SCOPED_TRACE(text);
-        EXPECT_EQ(service->convertExprBetweenQandC(text, false, false), c);
-        EXPECT_EQ(service->convertExprBetweenQandC(text, false, true), quill);
+        EXPECT_EQ(service->convertExprBetweenQandC(text, false, false), row[1]);
+        EXPECT_EQ(service->convertExprBetweenQandC(text, false, true), row[2]);
         for (int again = 0; again < 2; ++again) {
-            EXPECT_EQ(service->simplifyCExprFromCCondition(text), simpleC);
-            EXPECT_EQ(service->simplifyQExprFromCCondition(text), simpleQuill);
+            EXPECT_EQ(service->simplifyCExprFromCCondition(text), row[3]);
+            EXPECT_EQ(service->simplifyQExprFromCCondition(text), row[4]);
         }
-        EXPECT_EQ(service->simplifyExpressionWithoutEvalChecks(text, false, true), simpleQuill);
-        EXPECT_EQ(service->getBoolean(service->simplifyFromCCondition(text).id()), simpleC.empty());
+        EXPECT_EQ(service->simplifyExpressionWithoutEvalChecks(text, false, true), row[4]);
+        EXPECT_EQ(service->getBoolean(service->simplifyFromCCondition(text).id()), row[3].empty());
         EXPECT_EQ(VCService::isTRUEOrFALSEString(text), text == "true" || text == "false");
     }
-}
-
-TEST(ServiceTexts, PrintTheTreeAsItStandsUnlessAskedToConvert) {
-    const FreshService service;
-    const VCSymbolicExprId quotient = service->parseC("a/b == bitand(c,4)");
-    EXPECT_EQ(service->printQExpr(quotient), "a/b==bitand(c,4)");
-    EXPECT_EQ(service->printQExprWithConversion(quotient), "idivide(a,b)==bitand(c,4)");
-    EXPECT_EQ(service->printCExprNoConversion(quotient), "a/b==bitand(c,4)");
-    EXPECT_EQ(service->printCExpr(quotient), "a/b==(c&4)");
-    EXPECT_EQ(service->simplifyExpressionWithoutEvalChecks("bitand(c,4)", false, false), "bitand(c,4)");
 }
 
 TEST(ServiceTexts, ThatAreNoConditionAreRefused) {
     const FreshService service;
     const std::size_t nodes = service->table().size();
-    for (const char* text : {"a b", " ", "a ==", "1e5", "2147483648", "(sim", "a && \x80"}) {
+    for (const CaseRow& row : casesOf("service.txt", "refused", 2)) {
+        const std::string& text = row[1];
         SCOPED_TRACE(text);
+        if (row[0] == "Quill") {
+            EXPECT_THROW(service->parseQ(text), HostDiagnostic);
+            continue;
+        }
         EXPECT_THROW(service->parseC(text), HostDiagnostic);
         EXPECT_THROW(service->simplifyFromCCondition(text), HostDiagnostic);
         EXPECT_THROW(service->simplifyCExprFromCCondition(text), HostDiagnostic);
         EXPECT_THROW(service->convertExprBetweenQandC(text, false, true), HostDiagnostic);
     }
-    for (const char* text : {"A == ", "A = 1", "1 +", "c{2}", "'text'"})
-        EXPECT_THROW(service->parseQ(text), HostDiagnostic) << text;
     EXPECT_EQ(service->table().size(), nodes);
 }
 
 TEST(ServiceCombinations, OfConstantsAndConditions) {
-    const std::vector<std::array<std::string, 6>> rows{
-        // two conditions; both of them, not simplified and simplified; either of them
-        {"true", "false", "false", "false", "", ""},
-        {"false", "false", "false", "false", "false", "false"},
-        {"true", "!(x<1)", "!(x<1)", "x>=1", "", ""},
-        {"false", "!(x<1)", "false", "false", "!(x<1)", "x>=1"},
-        {"!(x<1)", "false", "false", "false", "!(x<1)", "x>=1"},
-        {"x<3", "x>3", "x<3 && x>3", "false", "x<3 || x>3", "x!=3"},
-        {"y", "x", "y && x", "x && y", "y || x", "x || y"},
-    };
-    for (const auto& [textA, textB, both, simpleBoth, either, simpleEither] : rows) {
-        SCOPED_TRACE(textA + " with " + textB);
+    for (const CaseRow& row : casesOf("service.txt", "both and either", 6)) {
+        SCOPED_TRACE(row[0] + " with " + row[1]);
         const FreshService service;
-        const VCSymbolicExprId a = service->parseC(textA);
-        const VCSymbolicExprId b = service->parseC(textB);
-        EXPECT_EQ(service->printCExpr(service->AND(a, b, false)), both);
-        EXPECT_EQ(service->printCExpr(service->AND(a, b, true)), simpleBoth);
-        EXPECT_EQ(service->printCExpr(service->OR(a, b, false)), either);
-        EXPECT_EQ(service->printCExpr(service->OR(a, b, true)), simpleEither);
+        const VCSymbolicExprId a = service->parseC(row[0]);
+        const VCSymbolicExprId b = service->parseC(row[1]);
+        for (const bool simplify : {false, true}) {
+            EXPECT_EQ(service->printCExpr(service->AND(a, b, simplify)), row[simplify ? 3 : 2]);
+            EXPECT_EQ(service->printCExpr(service->OR(a, b, simplify)), row[simplify ? 5 : 4]);
+        }
     }
-}
-
-TEST(ServiceCombinations, NegateAtOnceOrInFull) {
     const FreshService service;
-    for (const auto& [text, negated, simplified] : std::initializer_list<std::array<const char*, 3>>{
-             {"true", "false", "false"},
-             {"false", "", ""},
-             {"!(x==1)", "!(!(x==1))", "x==1"},
-             {"!x", "!(!x)", "!(!x)"}, // a truth value, which x need not be
-             {"x==1 && y>2", "!(x==1 && y>2)", "x!=1 || y<=2"}}) {
-        EXPECT_EQ(service->printCExpr(service->NOT(service->parseC(text), false)), negated);
-        EXPECT_EQ(service->printCExpr(service->NOT(service->parseC(text), true)), simplified);
-    }
+    for (const CaseRow& row : casesOf("service.txt", "negated", 3))
+        for (const bool simplify : {false, true})
+            EXPECT_EQ(service->printCExpr(service->NOT(service->parseC(row[0]), simplify)), row[simplify ? 2 : 1])
+                << row[0];
 }
 
 TEST(ServiceIds, ThatAreNotOfTheTableAreAnswered) {
@@ -185,13 +152,8 @@ TEST(ServiceAliases, FirstOneStays) {
     EXPECT_EQ(service->printCExpr(service->parseC("N")), "N");
 }
 
-TEST(QuillService, SimplifiesAndPrintsInEitherLanguage) {
+TEST(QuillService, ReadsConstants) {
     const VCServiceHandle service;
-    EXPECT_EQ(service->simplifyQExprFromQCondition("A ~= 1 || A ~= 2"), "");
-    EXPECT_EQ(service->simplifyCExprFromQCondition("~(A < 3) && bitand(F, 4) ~= 0"), "A>=3 && (F&4)!=0");
-    EXPECT_EQ(service->convertExprBetweenQandC("bitand(F,4)~=0", true, false), "(F&4)!=0");
-    EXPECT_EQ(service->simplifyExpressionWithoutEvalChecks("~(A < 3)", true, false), "A>=3");
-    EXPECT_EQ(service->simplifyExpressionWithoutEvalChecks("A != 3 && true", false, true), "A~=3");
     for (const char* const constant : {"", "true"})
         EXPECT_EQ(service->parseQ(constant), service->table().getIdTRUE());
     EXPECT_EQ(service->parseQ("false"), service->table().getIdFALSE());

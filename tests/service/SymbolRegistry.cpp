@@ -1,6 +1,7 @@
 // Blocks that register dimension expressions.
 #include "base/service/SymbolRegistry.hpp"
 #include "parser/SymbolicExprParser.hpp"
+#include "tests/support/Cases.hpp"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -27,17 +28,9 @@ protected:
 };
 
 TEST_F(Registry, NamesExpressions) {
-    const std::map<std::string, std::string> names{
-        {"N_1", "N_1"},
-        {"_N", "dim___N"},
-        {"N*2+1", "dim_N_2a2_2b1"},
-        {"dim_N", "dim_dim__N"},
-        {"[N, 3]", "dim__5bN_2c3_5d"},
-        {"s.f", "dim_s_2ef"},
-    };
-    for (const auto& [text, name] : names) {
-        EXPECT_EQ(registered(text), name) << text;
-        EXPECT_EQ(registry.expressionOf(name), read(text)) << text;
+    for (const CaseRow& row : casesOf("service.txt", "names", 2)) {
+        EXPECT_EQ(registered(row[0]), row[1]) << row[0];
+        EXPECT_EQ(registry.expressionOf(row[1]), read(row[0])) << row[0];
     }
     EXPECT_EQ(registry.expressionOf("M"), invalidId);
     EXPECT_EQ(registry.registerExpression(&blocks[0], invalidId), "");
@@ -99,17 +92,12 @@ TEST_F(Registry, KeepsAliasesInTheTable) {
     registry.registerExpression(&blocks[0], SymbolicIntValue(table, -7).getId(table));
     EXPECT_EQ(registry.aliasOf("dim__2d7"), "(-7)");
     int i = 0;
-    for (const char* text : {"-5", "-.5", " - 0x1p-3 ", "-1e+300", "-10U", "-Inf", "-NaN"}) {
+    for (const CaseRow& row : casesOf("service.txt", "aliases", 2)) {
         const std::string name = "n" + std::to_string(i++);
-        registry.insertAlias(name, text);
-        EXPECT_EQ(registry.aliasOf(name), "(" + std::string(text) + ")");
-        table.insertAliasInfo("t" + name, text);
-        EXPECT_EQ(registry.aliasOf("t" + name), text);
-    }
-    for (const char* text : {"5", "", "-", "-5-4", "(-5)", "-.", "N-5", "-5 4", "-+5"}) {
-        const std::string name = "n" + std::to_string(i++);
-        registry.insertAlias(name, text);
-        EXPECT_EQ(registry.aliasOf(name), text);
+        registry.insertAlias(name, row[0]);
+        EXPECT_EQ(registry.aliasOf(name), row[1]);
+        table.insertAliasInfo("t" + name, row[0]);
+        EXPECT_EQ(registry.aliasOf("t" + name), row[0]);
     }
 }
 

@@ -2,12 +2,14 @@
 #include "base/transform/Symbols.hpp"
 #include "base/service/VCSymbols.hpp"
 #include "tests/support/AnyNode.hpp"
+#include "tests/support/Cases.hpp"
 #include "tests/support/Parsing.hpp"
 #include "tests/support/RandomExpression.hpp"
 
 #include <gmock/gmock.h>
 
 #include <algorithm>
+#include <boost/algorithm/string/join.hpp>
 #include <set>
 #include <stdexcept>
 
@@ -17,18 +19,12 @@ namespace {
 using Names = std::vector<std::string>;
 
 TEST(VCSymbols, ByKind) {
-    const std::tuple<const char*, unsigned, Names> cases[] = {
-        {"bound.m + free.m + x", 2, {"before", "bound.m"}},
-        {"free.m + x + bound.m + free.m", 7, {"before", "free.m", "x", "bound.m"}},
-        {"a.m.n < x && true", 15, {"before", "a.m.n", "x", "true"}},        // no look into the owner
-        {"f(g(x), y) + f(f)", 9, {"before", "f", "g", "x", "y", "f", "f"}}, // once for each call, its name first
-    };
-    for (const auto& [text, kinds, expected] : cases) {
+    for (const CaseRow& row : casesOf("service.txt", "symbols by kind", 3)) {
         SymbolicExprTable table;
         table.registerValueId(read(table, "bound.m"), read(table, "4"));
         Names names{"before"};
-        VCSymbolsOfSymbolicExpr(table, kinds).getSymbols(read(table, text), names);
-        EXPECT_EQ(names, expected) << text << " kinds " << kinds;
+        VCSymbolsOfSymbolicExpr(table, static_cast<unsigned>(std::stoi(row[1]))).getSymbols(read(table, row[0]), names);
+        EXPECT_EQ(boost::algorithm::join(names, "; "), "before; " + row[2]) << row[0] << " kinds " << row[1];
     }
 }
 
