@@ -1,10 +1,8 @@
 // Conditions of blocks and ports: texts, keywords, errors, depth.
 #include "base/service/BlockConditions.hpp"
-#include "base/VCService.hpp"
 #include "base/core/Table.hpp"
 #include "base/service/ChoiceSet.hpp"
 #include "base/service/SymbolRegistry.hpp"
-#include "base/service/VCServiceHandle.hpp"
 #include "host/Diagnostics.hpp"
 #include "host/embedded/ModelFile.hpp"
 #include "tests/service/Customizers.hpp"
@@ -75,7 +73,8 @@ TEST(BlockConditions, AreThoseOfTheBlockAndAllAroundItAsACustomizerSaysThere) {
 
 TEST(ChoiceSets, KeywordsAreInForceWhereTheyWereWhenTheServiceWasMade) {
     for (const bool keywords : {true, false}) {
-        const FreshService service(true, keywords);
+        const FlagSetting before(*VTFEAT_VariantKeywordsSimCodegen, keywords ? 2 : 0);
+        const FreshService service;
         for (const bool now : {true, false}) {
             const FlagSetting setting(*VTFEAT_VariantKeywordsSimCodegen, now ? 2 : 0);
             const bool inForce = keywords && now;

@@ -17,29 +17,22 @@ namespace VT::Testing {
 /// A service that nobody has used, made under a setting of the cache feature; gone with this object.
 class FreshService {
 public:
-    /// The keyword feature is as `keywords` says while the service is made.
-    explicit FreshService(bool caching = true, bool keywords = true)
-        : before_(cacheSymExprSimplifyResultsFeature().value()) {
+    explicit FreshService(bool caching = true) : caching_(cacheSymExprSimplifyResultsFeature(), caching ? 1 : 0) {
         VCService::clean();
-        cacheSymExprSimplifyResultsFeature().setValue(caching ? 1 : 0);
-        const FlagSetting setting(*VTFEAT_VariantKeywordsSimCodegen, keywords ? 2 : 0);
         VCService::getInstance();
     }
 
     FreshService(const FreshService&) = delete;
     FreshService& operator=(const FreshService&) = delete;
 
-    ~FreshService() {
-        cacheSymExprSimplifyResultsFeature().setValue(before_);
-        VCService::clean();
-    }
+    ~FreshService() { VCService::clean(); }
 
     VCService* operator->() const { return &VCService::getInstance(); }
 
     VCService& operator*() const { return VCService::getInstance(); }
 
 private:
-    std::int32_t before_;
+    FlagSetting caching_;
 };
 
 /// Does what its functions say and takes note of what it is told.

@@ -1,8 +1,4 @@
 // The service without a customizer: lifetime, texts in both languages, combinations, queries.
-#include "base/VCService.hpp"
-#include "base/service/TruthTexts.hpp"
-#include "base/simplify/Simplify.hpp"
-#include "base/variants/VariantKeywords.hpp"
 #include "host/Diagnostics.hpp"
 #include "tests/service/Customizers.hpp"
 #include "tests/support/Cases.hpp"

@@ -5,7 +5,6 @@
 #include "tests/service/Customizers.hpp"
 #include "tests/support/Cases.hpp"
 #include "tests/support/Corpus.hpp"
-#include "tests/support/FlagSetting.hpp"
 #include "tests/support/RandomCondition.hpp"
 #include "tests/support/Truth.hpp"
 
