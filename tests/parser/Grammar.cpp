@@ -3,10 +3,10 @@
 #include "base/core/Limits.hpp"
 #include "base/variants/Features.hpp"
 #include "parser/SyntaxConverter.hpp"
+#include "tests/support/Cases.hpp"
 #include "tests/support/FlagSetting.hpp"
 #include "tests/support/Locales.hpp"
 #include "tests/support/Parsing.hpp"
-#include "tests/support/Sides.hpp"
 #include "tests/support/Times.hpp"
 #include "tests/support/TreeText.hpp"
 
@@ -18,111 +18,58 @@
 namespace VT::Testing {
 namespace {
 
-/// "TEXT => TREE"
-void expectTrees(const std::vector<std::string>& readings, bool cOperators = true, bool variantKeywords = true) {
-    for (const std::string& reading : readings) {
-        const auto& [text, tree] = sides(reading);
+/// A row is a text, and its tree or where reading stops.
+void expectReadings(const std::string& section, bool cOperators = true, bool variantKeywords = true) {
+    for (const CaseRow& row : casesOf("conditions.txt", section, 2)) {
+        SCOPED_TRACE(row[0]);
         SymbolicExprTable table;
-        const ParseAnswer answer = parse(table, text, cOperators, variantKeywords);
-        EXPECT_EQ(treeText(table, answer.id), tree) << text;
-    }
-}
-
-/// Texts in which a ` stands where reading stops.
-void expectStops(const std::vector<std::string>& texts, bool cOperators = true) {
-    for (std::string text : texts) {
-        const std::size_t offset = text.find('`');
-        text.erase(offset, 1);
-        SymbolicExprTable table;
-        const ParseAnswer answer = parse(table, text, cOperators);
-        ASSERT_TRUE(answer.error.has_value()) << text << " is " << treeText(table, answer.id);
-        EXPECT_EQ(answer.error->offset(), offset) << text;
+        const ParseAnswer answer = parse(table, row[0], cOperators, variantKeywords);
+        const std::size_t stop = answer.stop(row[0]);
+        EXPECT_EQ(answer.error ? "stops at " + std::to_string(stop) : treeText(table, answer.id), row[1]);
+        if (!answer.error)
+            continue;
         EXPECT_EQ(answer.error->messageId(), "Vantor:Variants:ExpressionParseError");
-        const std::vector<DiagnosticArgument> arguments{text, std::string(offset + 1, ' ') + "^"};
+        const std::vector<DiagnosticArgument> arguments{row[0], std::string(stop + 1, ' ') + "^"};
         EXPECT_EQ(answer.error->arguments(), arguments) << "the text, and a pointer below it";
         EXPECT_EQ(answer.error->additionalText(), "");
-        EXPECT_EQ(table.size(), 0U) << text << ": an error interns nothing";
+        EXPECT_EQ(table.size(), 0U) << "an error interns nothing";
     }
 }
 
 // Trees of operators, calls and lists, and where reading stops, are compared with another parser in Agreement.cpp; here
 // is what that one does not tell.
-TEST(Grammar, Literals) {
-    expectTrees({"007 => 7", "2---.5 => Minus(2,UnaryMinus(-0.5r))", "2147483647 => 2147483647",
-                 "-2147483648 => -2147483648", "0000000000000000000000000000000000000012 => 12", "+5. => 5r",
-                 "-0.0 => -0r", "1.0e+0005 => 100000r",
-                 // Halfway and hard cases of correct rounding; an accumulated product of powers of ten misses them.
-                 "9007199254740993.00000000000000000000000000001 => 9007199254740994r",
-                 "6929495644600919.5 => 6929495644600920r", "8.41e21 => 8.4099999999999995e+21r",
-                 "4.9e-324 => 4.9406564584124654e-324r", "1.7976931348623157e308 => 1.7976931348623157e+308r",
-                 "-1.e-99999999999999999999 => -0r", "0.e99999999999 => 0r", "nan => nan", "inf => inf"});
-}
-
-TEST(Grammar, HostOperators) {
-    expectTrees({"~x => BitCompl(x)", "!x => Not(x)"}, true);
-    expectTrees({"!x => Not(x)", "~a~=~b => NotEqual(Not(a),Not(b))"}, false);
-    expectStops({"x `~= 1"}, true);
-    expectStops({"x `~ = 1", "`~= 1"}, false);
+TEST(Grammar, ReadingsInEveryLocale) {
+    inEveryLocale([] {
+        expectReadings("C operators");
+        expectReadings("host operators", false);
+    });
 }
 
 TEST(Grammar, VariantKeywords) {
-    const std::vector<std::string> keywords = {"(sim) => (sim)", "(codegen) => (codegen)",
-                                               " (sim) && !(codegen) => And((sim),Not((codegen)))", "((sim)) => (sim)",
-                                               "f((sim)) => FcnCall(f,(sim))",
-                                               // No keyword: a blank inside, a longer name, arguments, other words.
-                                               "( sim ) => sim", "(simx) => simx", "f(sim) => FcnCall(f,sim)",
-                                               "(SIM) => SIM", "(inherit) => inherit", "(default) => default"};
-    const std::vector<std::string> names = {"(sim) => sim", "(codegen) => codegen", "((sim)) => sim"};
-    {
-        const FlagSetting on(*VTFEAT_VariantKeywordsSimCodegen, 1);
-        expectTrees(keywords);
-        expectTrees(keywords, false, true);
-        expectTrees(names, true, false);
+    for (const std::int32_t value : {1, 0, -1}) {
+        const FlagSetting setting(*VTFEAT_VariantKeywordsSimCodegen, value);
+        for (const bool cOperators : {true, false}) {
+            expectReadings(value == 1 ? "keywords" : "no keywords", cOperators);
+            expectReadings("no keywords", cOperators, false);
+        }
     }
-    for (const std::int32_t off : {0, -1}) {
-        const FlagSetting setting(*VTFEAT_VariantKeywordsSimCodegen, off);
-        expectTrees(names);
-        expectTrees(names, false, false);
-    }
-}
-
-TEST(Grammar, ReadingStopsBehindTheLastCompleteOutermostOperand) {
-    expectStops({"`", "`   ", "`(a", "`[1,", "`\"a\"", "a `&& (b == )", "(a) `b", "f`(x,)", "a.b`.1", "(sim)`x",
-                 // Numbers out of range
-                 "`2147483648", "-`2147483649", "- `2147483648", "a - +`99999999999999999999", "f(1, [`2147483648])",
-                 "((`4294967296) + ", "a == `2147483648 == 2147483649", "`99999999999.e999", "a `b 2147483648",
-                 "1`.e999999999", "a == 1`.7976931348623159e308", "-1`.e999999999999999999999999", "`.5e999",
-                 "a `+ .5e999"});
 }
 
 TEST(Grammar, RightOperandsAreInternedFirst) {
-    for (const std::string order :
-         {"a + b => b a Plus(a,b)", "a - b * c => c b Multiply(b,c) a Minus(a,Multiply(b,c))",
-          "f(x, y + z) => f x z y Plus(y,z) FcnCall(f,x,Plus(y,z))", "[a, b, a] => a b DimsND(a,b,a)",
-          "a.b.c => a b MemberValue(a,b) c MemberValue(MemberValue(a,b),c)",
-          // Prefix operators and calls of no argument
-          "-!a => a Not(a) UnaryMinus(Not(a))", "f() + g => g f FcnCall0U(f) Plus(FcnCall0U(f),g)"}) {
-        const auto& [text, nodes] = sides(order);
+    for (const CaseRow& row : casesOf("conditions.txt", "order", 2)) {
         SymbolicExprTable table;
-        const SymbolicExprId id = parse(table, text).id;
-        EXPECT_EQ(id, table.size() - 1) << text;
+        const SymbolicExprId id = parse(table, row[0]).id;
+        EXPECT_EQ(id, table.size() - 1) << row[0];
         std::string all;
         for (SymbolicExprId each = 0; each < table.size(); ++each)
             all += (each > 0 ? " " : "") + treeText(table, each);
-        EXPECT_EQ(all, nodes) << text;
+        EXPECT_EQ(all, row[1]) << row[0];
     }
     // A call takes the class that was interned first.
     SymbolicExprTable table;
     const SymbolicExprId call =
         SymbolicFcnCall1UExpr(table, SymbolicString(table, "f"), SymbolicString(table, "x")).getId(table);
     EXPECT_EQ(parse(table, "f(x)").id, call);
-}
-
-TEST(Grammar, LocalesChangeNothing) {
-    inEveryLocale([] {
-        expectTrees({"1.5 + I => Plus(1.5r,I)"});
-        expectStops({"1`,5", "`\xe4", "a`\xa0"});
-    });
 }
 
 TEST(Grammar, SyntaxValuesThatNoTextYields) {

@@ -1,13 +1,11 @@
 // What is refused: the key, the arguments and the place of every report, and what the host may change about it.
 #include "tests/parser/QuillReading.hpp"
-#include "tests/support/Sides.hpp"
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
 #include <limits>
 #include <map>
-#include <tuple>
 
 namespace VT::Testing {
 namespace {
@@ -74,57 +72,10 @@ public:
     }
 };
 
-template <class Converter>
-void expectAnswers(std::span<const std::string> cases) { // a text => a tree or a report
-    for (const std::string& each : cases) {
-        const auto& [text, expected] = sides(each);
-        Workspace workspace;
-        const QuillAnswer answer = readQuill<Converter>(text, &workspace);
-        EXPECT_EQ(answer.tree == "invalid" ? reportsText(answer) : answer.tree, expected) << text;
-        EXPECT_FALSE(answer.thrown);
-    }
-}
-
-TEST_F(QuillReports, Dimensions) {
-    const std::string digits = "0x" + std::string(260, 'f');
-    const std::string cases[] = {
-        // Functions
-        "1+sqrt(A) => UnsupportedFunction(sqrt, 1+sqrt(A), 2)@2",
-        "bitshift(A) => InvalidNumFcnArgs(bitshift, bitshift(A), 0, 2, 1)@0",
-        "1 + rem(a, b, c) => InvalidNumFcnArgs(rem, 1 + rem(a, b, c), 4, 2, 3)@4",
-        "(A)(1) => UnhandledExpression(call, (A)(1), 0)@0",
-        "A + B{1} => UnhandledExpression(cell index, A + B{1}, 4)@4",
-        // Lists
-        "2*[A;B] => NonVectorValue(2*[A;B], 2)@2", "[A, [B, C]] => NonVectorValue([A, [B, C]], 4)@4",
-        "[row, A] => NonVectorValue([row, A], 1)@1",
-        // Texts that are no expressions
-        " => InvalidExpression(, 0)@0", "A + => InvalidExpression(A +, 3)@3",
-        "A + \xc3\xa9 => InvalidExpression(A + \xc3\xa9, 4)@4",
-        // Numbers
-        "A*1e309 => UnsupportedLiteralValue(1e309, A*1e309, 2)@2",
-        "1+" + digits + " => UnsupportedLiteralValue(" + digits + ", 1+" + digits + ", 2)@2",
-        // Names
-        "A+eight => Plus(A,8r)", "row => Dims3D(2r,3r,4r)", "A+unknown => NonNumericValue(unknown, A+unknown, 2)@2",
-        "z => ComplexValue(z, z, 0)@0", "(column) => NonScalarValue(column, (column), 1)@1",
-        "block => NonScalarValue(block, block, 0)@0", "lying => NonScalarValue(lying, lying, 0)@0",
-        // The first one only
-        "[unknown text] => NonNumericValue(unknown, [unknown text], 1)@1",
-        "sqrt(unknown) => UnsupportedFunction(sqrt, sqrt(unknown), 0)@0",
-        // Fields are no names that stand for anything; owners are.
-        "S.unknown => MemberValue(S,unknown)", "unknown.f => NonNumericValue(unknown, unknown.f, 0)@0"};
-    expectAnswers<SymbolicExprFromQParseTree>(cases);
-}
-
-TEST_F(QuillReports, IntegerDimensions) {
-    const std::string cases[] = {"2147483648 => IntegerOverflow(2147483648, 2147483648, 0)@0",
-                                 "-2147483648 => -2147483648", "A+1.5 => NonIntegerLiteralValue(1.5, A+1.5, 2)@2",
-                                 "idivide(A,2) => Divide(A,2)", "1+A/2 => UnsupportedDivision(1+A/2, 2)@2",
-                                 // Values of names
-                                 "A+half => NonIntegerValue(half, A+half, 2)@2",
-                                 "endless => NonIntegerValue(endless, endless, 0)@0",
-                                 "big => IntegerOverflow(big, big, 0)@0", "least => -2147483648",
-                                 "mixed => NonIntegerValue(mixed, mixed, 0)@0", "A*on => LogicalValue(on, A*on, 2)@2"};
-    expectAnswers<IntegerConverter>(cases);
+TEST_F(QuillReports, OfDimensionsInAWorkspace) {
+    Workspace workspace;
+    expectMeanings<SymbolicExprFromQParseTree>("workspace", &workspace);
+    expectMeanings<IntegerConverter>("integers", &workspace);
 }
 
 TEST_F(QuillReports, InUtf16Text) {
@@ -209,22 +160,15 @@ TEST_F(QuillReports, AreSuppressedByTheCheckersFlag) {
 }
 
 TEST_F(QuillReports, RefusedConditionsAreThrown) {
-    const std::tuple<std::string, std::size_t, std::string> cases[] = {
-        {"A ==", 4, "The condition \"A ==\" cannot be read at its end. The text ends where a value must follow."},
-        {"A + x{1}", 5,
-         "The condition \"A + x{1}\" cannot be read at byte 6, before \"{1}\". \"{\" has no meaning where it stands in "
-         "\"A + x{1}\": write the expression without it."},
-        {std::string("A\0B", 3), 1,
-         "The condition \"A\\x00B\" cannot be read at byte 2, before \"\\x00B\". An operator is missing."}};
-
-    for (const auto& [text, offset, sentence] : cases) {
-        const QuillAnswer answer = readCondition(text);
-        ASSERT_TRUE(answer.thrown) << text;
+    for (const CaseRow& row : casesOf("quill-meaning.txt", "refusals", 3)) {
+        const QuillAnswer answer = readCondition(row[0]);
+        const std::size_t offset = std::stoul(row[1]);
+        ASSERT_TRUE(answer.thrown) << row[0];
         EXPECT_EQ(answer.thrown->messageId(), "Vantor:Variants:ExpressionParseError");
-        const std::vector<DiagnosticArgument> arguments{text, std::string(offset + 1, ' ') + "^"};
+        const std::vector<DiagnosticArgument> arguments{row[0], std::string(offset + 1, ' ') + "^"};
         EXPECT_EQ(answer.thrown->arguments(), arguments);
         EXPECT_EQ(answer.thrown->offset(), offset);
-        EXPECT_EQ(answer.thrown->what(), sentence);
+        EXPECT_EQ(answer.thrown->what(), row[2]);
         EXPECT_EQ(answer.reports.size(), 1U);
     }
 }

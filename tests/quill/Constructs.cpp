@@ -66,7 +66,7 @@ TEST(QuillConstructs, EveryPairOfOperators) {
             }
             for (const Operator& postfix : {Operator{"'", 78}, {".'", 79}}) {
                 expect(open + "b" + postfix.text, (first.level == power ? rule(postfix, rule(first, "a b"))
-                                                                             : rule(first, "a " + rule(postfix, "b"))));
+                                                                        : rule(first, "a " + rule(postfix, "b"))));
                 expect("a" + postfix.text + blank + first.text + blank + "b", rule(first, rule(postfix, "a") + " b"));
             }
         }
