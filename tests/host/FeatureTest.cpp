@@ -1,14 +1,17 @@
 #include "host/Feature.hpp"
+#include "tests/support/Cases.hpp"
 
 #include <gmock/gmock.h>
 #include <rapidcheck.h>
 #include <rapidcheck/gtest.h>
 
 #include <cstdlib>
-#include <map>
 #include <memory>
 
 namespace {
+
+using VT::Testing::CaseRow;
+using VT::Testing::casesOf;
 
 VtFeature::ChangeCallback nothing = nullptr;
 int changes = 0;
@@ -50,17 +53,8 @@ TEST(Feature, AssignmentsAreCarriedOutOrExplained) {
     EXPECT_EQ(VtFeature::assign("  TestFlag = -7 "), "");
     EXPECT_EQ(flag.value(), -7);
     EXPECT_EQ(VtFeature::assign("TestFlag=-2147483648"), "");
-    for (const auto& [assignment, complaint] :
-         std::map<std::string, std::string>{{"TestFlag=2147483648", "32 bits"},
-                                            {"TestFlag=", "32 bits"},
-                                            {"TestFlag=1x", "\"1x\""},
-                                            {"TestFlag", "NAME=VALUE"},
-                                            {"=1", "NAME=VALUE"},
-                                            {"", "NAME=VALUE"},
-                                            {"testflag=1", "no feature flag \"testflag\""},
-                                            {"Test\nFlag=1", "Test\\x0aFlag"},
-                                            {"Other=1", "TestFlag"}}) // the flags there are, are listed
-        EXPECT_THAT(VtFeature::assign(assignment), testing::HasSubstr(complaint)) << assignment;
+    for (const CaseRow& row : casesOf("features.txt", "assignments", 2))
+        EXPECT_THAT(VtFeature::assign(row[0]), testing::HasSubstr(row[1])) << row[0];
     EXPECT_EQ(flag.value(), -2147483647 - 1);
 }
 
@@ -72,25 +66,15 @@ TEST(Feature, AssignmentsAreCarriedOutOrExplained) {
 
 // The first flag of a process reads the environment, so that each case runs in a process of its own.
 TEST(FeatureEnvironment, StartsFlagsAndReportsWhatItCannotUse) {
-    const std::map<std::string, std::vector<std::string>> cases{
-        {"", {"[CacheSymExprSimplifyResults=1]", "[VariantKeywordsSimCodegen=2]"}},
-        {" VariantKeywordsSimCodegen = -5 ,, CacheSymExprSimplifyResults=0,",
-         {"[CacheSymExprSimplifyResults=0]", "[VariantKeywordsSimCodegen=-5]"}},
-        {"NoSuchFlag=1,VariantKeywordsSimCodegen=0",
-         {"warning: VTSYM_FEATURES: there is no feature flag \"NoSuchFlag\"", "[VariantKeywordsSimCodegen=0]"}},
-        {"VariantKeywordsSimCodegen=on",
-         {"warning: VTSYM_FEATURES: the value of VariantKeywordsSimCodegen is an integer",
-          "[VariantKeywordsSimCodegen=2]"}},
-        {"\x1b[31m\xff" + std::string(100000, 'x'), {"\\x1b[31m\\xffxxx", "[VariantKeywordsSimCodegen=2]"}},
-    };
-
     GTEST_FLAG_SET(death_test_style, "threadsafe");
-    for (const auto& [variable, said] : cases) {
-        setenv("VTSYM_FEATURES", variable.c_str(), 1);
-        testing::Matcher<const std::string&> output = testing::SizeIs(testing::Lt(2000));
-        for (const std::string& words : said)
-            output = testing::AllOf(output, testing::HasSubstr(words));
-        EXPECT_EXIT(tellFlags(), testing::ExitedWithCode(0), output) << variable.substr(0, 80);
+    std::vector<CaseRow> rows = casesOf("features.txt", "environment", 3);
+    rows.push_back({"\x1b[31m\xff" + std::string(100000, 'x'), "\\x1b[31m\\xffxxx", "[VariantKeywordsSimCodegen=2]"});
+    for (const CaseRow& row : rows) {
+        setenv("VTSYM_FEATURES", row[0].c_str(), 1);
+        EXPECT_EXIT(
+            tellFlags(), testing::ExitedWithCode(0),
+            testing::AllOf(testing::SizeIs(testing::Lt(2000)), testing::HasSubstr(row[1]), testing::HasSubstr(row[2])))
+            << row[0].substr(0, 80);
     }
     unsetenv("VTSYM_FEATURES");
 }

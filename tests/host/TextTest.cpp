@@ -3,14 +3,19 @@
 #include "host/Diagnostics.hpp"
 #include "host/Log.hpp"
 #include "host/Messages.hpp"
+#include "tests/support/Cases.hpp"
 
 #include <array>
 #include <gtest/gtest.h>
 #include <rapidcheck/gtest.h>
 #include <set>
+#include <sstream>
 #include <type_traits>
 
 namespace {
+
+using VT::Testing::CaseRow;
+using VT::Testing::casesOf;
 
 constexpr const char* parseError = "Vantor:Variants:ExpressionParseError";
 
@@ -37,11 +42,8 @@ TEST(Diagnostics, CarryWhatTheyWereMadeOf) {
 }
 
 TEST(Diagnostics, ParseErrorsSayWhereAndWhat) {
-    EXPECT_STREQ(parseErrorOf("A === 3", 4).what(),
-                 R"(The condition "A === 3" cannot be read at byte 5, before "= 3".)");
-    EXPECT_STREQ(parseErrorOf("A\n\x1b[2J", 1).what(),
-                 R"(The condition "A\x0a\x1b[2J" cannot be read at byte 2, before "\x0a\x1b[2J".)");
-    EXPECT_STREQ(parseErrorOf("A", 7).what(), R"(The condition "A" cannot be read at byte 8.)");
+    for (const CaseRow& row : casesOf("host-texts.txt", "parse errors", 3))
+        EXPECT_EQ(parseErrorOf(row[0], std::stoul(row[1])).what(), row[2]) << row[0];
     EXPECT_STREQ(vtsvCreateDiagnostic(parseError, {std::int64_t{3}}, "").what(), // a misfit is shown
                  "Vantor:Variants:ExpressionParseError: 3");
     const VT::HostDiagnostic nowhere = vtsvCreateDiagnostic(parseError, {std::string("A"), std::string("^")}, "");
@@ -117,55 +119,19 @@ TEST(Logger, ALineStaysALineWhateverIsInIt) {
     EXPECT_LT(written.size(), 5000U);
 }
 
-std::string utf8(std::u8string_view text) {
-    return {text.begin(), text.end()};
-}
-
 TEST(Utf16, BecomesUtf8) {
-    for (const auto& [units, text] : std::initializer_list<std::pair<std::u16string, std::u8string>>{
-             {u"", u8""},
-             {u"\u007f\u0080\u07ff\u0800\uffff", u8"\u007f\u0080\u07ff\u0800\uffff"},
-             {u"\U00010000\U0001f600\U0010ffff", u8"\U00010000\U0001f600\U0010ffff"},
-             {std::u16string(u"a\0b", 3), std::u8string(u8"a\0b", 3)},
-             {{0xd800}, u8"\ufffd"},
-             {{0xdc00, u'x'}, u8"\ufffdx"},
-             {{0xd800, u'x'}, u8"\ufffdx"},
-             {{0xdc00, 0xd800}, u8"\ufffd\ufffd"},
-             {{0xd800, 0xd83d, 0xde00}, u8"\ufffd\U0001f600"},
-         })
-        EXPECT_EQ(cvt_ustring_string(units), utf8(text));
-}
-
-/// The UTF-8 of one character, as the escapes of its bytes.
-std::string escaped(const std::string& text) {
-    std::string shown;
-    for (const char c : text) {
-        char escape[5];
-        std::snprintf(escape, sizeof escape, "\\x%02x", static_cast<unsigned>(static_cast<unsigned char>(c)));
-        shown += escape;
+    for (const CaseRow& row : casesOf("host-texts.txt", "utf-16", 2)) {
+        std::istringstream listed(row[0]);
+        std::u16string units;
+        for (std::uint32_t unit = 0; listed >> std::hex >> unit;)
+            units += static_cast<char16_t>(unit);
+        EXPECT_EQ(cvt_ustring_string(units), row[1]) << row[0];
     }
-    return shown;
 }
 
-TEST(ShownText, EscapesWhatWouldSpoilATerminal) {
-    for (const std::string& plain : {std::string(" ~A == 1"), utf8(u8"gr\u00f6\u00dfe \u4e2d \U0001f600"),
-                                     utf8(u8"\u00a0\u00ac\u00ae\u061b\u200a\u2010\u2027\u202f\u205f\u2070\ufffc\ufffd"),
-                                     utf8(u8"\ud7ff\ue000\U000dffff\U000e0080\U0010ffff")})
-        EXPECT_EQ(VT::shownText(plain, 1000), plain);
-    for (const std::string& spoiling :
-         {std::string("\0\t\n\x1b\x1f\x7f", 6), utf8(u8"\u0080\u009f\u00ad\u061c\u180e\u200b\u200e\u200f\u2028\u202e"),
-          utf8(u8"\u2060\u2066\u206f\ufeff\ufff9\ufffb\U000e0000\U000e0041\U000e007f"), std::string("\xff\xc3"),
-          std::string("\xc0\x80\xe0\x80\x80\xed\xa0\x80\xf4\x90\x80\x80")}) // overlong, a surrogate, beyond the last
-        EXPECT_EQ(VT::shownText(spoiling, 1000), escaped(spoiling));
-    EXPECT_EQ(VT::shownText("a\n\x1b[31m"), "a\\x0a\\x1b[31m");
-}
-
-TEST(ShownText, IsCutBetweenCharacters) {
-    EXPECT_EQ(VT::shownText("abcdef", 6), "abcdef");
-    EXPECT_EQ(VT::shownText("abcdefg", 6), "abcdef...");
-    EXPECT_EQ(VT::shownText(utf8(u8"abcd\u4e2d"), 6), "abcd...");
-    EXPECT_EQ(VT::shownText("abc", 0), "...");
-    EXPECT_EQ(VT::shownText("", 0), "");
+TEST(ShownText, SpoilsNoTerminalAndIsCutBetweenCharacters) {
+    for (const CaseRow& row : casesOf("host-texts.txt", "shown", 3))
+        EXPECT_EQ(VT::shownText(row[0], std::stoul(row[1])), row[2]) << row[0];
 }
 
 RC_GTEST_PROP(ShownText, IsBoundedAndPrintableWhateverTheBytes, (const std::string& bytes)) {
