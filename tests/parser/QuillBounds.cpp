@@ -2,6 +2,7 @@
 #include "base/core/Limits.hpp"
 #include "parser/ParseTreeDump.hpp"
 #include "tests/parser/QuillReading.hpp"
+#include "tests/support/Cases.hpp"
 #include "tests/support/Slots.hpp"
 #include "tests/support/Times.hpp"
 

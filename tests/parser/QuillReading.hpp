@@ -5,7 +5,6 @@
 #include "host/Messages.hpp"
 #include "host/Text.hpp"
 #include "parser/QuillConverterBlockVariants.hpp"
-#include "tests/support/Cases.hpp"
 #include "tests/support/TreeText.hpp"
 
 #include <gtest/gtest.h>
@@ -91,19 +90,6 @@ inline std::string reportsText(const QuillAnswer& answer) {
     for (const HostDiagnostic& report : answer.reports)
         text += (text.empty() ? "" : " ") + reportText(report);
     return text;
-}
-
-/// Each row of a section of quill-meaning.txt is a text, and its tree or the only report of it.
-template <class Converter>
-void expectMeanings(const std::string& section, SymbolValidator* validator = nullptr) {
-    constexpr bool throws = std::is_base_of_v<SymbolicExprFromQParseTreeBlockVariants, Converter>;
-    for (const CaseRow& row : casesOf("quill-meaning.txt", section, 2)) {
-        const QuillAnswer answer = readQuill<Converter>(row[0], validator);
-        const bool refused = answer.tree == "invalid";
-        EXPECT_EQ(refused ? reportsText(answer) : answer.tree, row[1]) << row[0];
-        EXPECT_EQ(answer.reports.size(), refused ? 1U : 0U) << row[0];
-        EXPECT_EQ(answer.thrown.has_value(), refused && throws) << row[0];
-    }
 }
 
 } // namespace VT::Testing

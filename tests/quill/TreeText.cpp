@@ -35,30 +35,14 @@ std::string QuillReading::answer(std::string_view text) {
     return std::to_string(failure().position) + ": " + std::string(failure().reason);
 }
 
-std::string treeText(const QuillNode& root) {
-    std::string result;
-    std::vector<const QuillNode*> pending{root.children}; // nullptr closes a rule
-    while (!pending.empty()) {
-        const QuillNode* const node = pending.back();
-        pending.pop_back();
-        if (node == nullptr) {
-            result += ')';
-            continue;
-        }
-        if (node->kind == 0 && !isOperand(node->code))
-            continue;
-        if (!result.empty() && result.back() != '(')
-            result += ' ';
-        if (node->kind == 0) {
-            result.append(node->text, node->length);
-            continue;
-        }
-        result += "(" + std::to_string(node->code);
-        pending.push_back(nullptr);
-        for (std::int32_t i = node->childCount; i-- > 0;)
-            pending.push_back(node->children + i);
-    }
-    return result;
+std::string treeText(const QuillNode& node) { // NOLINT(misc-no-recursion): as deep as the text of a case
+    if (node.kind == QuillNode::terminal)
+        return isOperand(node.code) ? std::string(node.text, node.length) : "";
+    std::string inputs;
+    for (std::int32_t i = 0; i < node.childCount; ++i)
+        if (const std::string input = treeText(node.children[i]); !input.empty())
+            inputs += " " + input;
+    return node.code == 21 ? inputs.substr(1) : "(" + std::to_string(node.code) + inputs + ")";
 }
 
 std::string shapeError(const QuillNode& root, std::string_view text) {

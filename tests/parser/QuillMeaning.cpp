@@ -1,5 +1,9 @@
-// What is refused: the key, the arguments and the place of every report, and what the host may change about it.
+// What Quill texts become, in dimensions and in conditions: trees, or the key, the arguments and the place of a report,
+// and what the host may change about it.
+#include "base/variants/Features.hpp"
 #include "tests/parser/QuillReading.hpp"
+#include "tests/support/Cases.hpp"
+#include "tests/support/FlagSetting.hpp"
 
 #include <gtest/gtest.h>
 
@@ -10,6 +14,7 @@
 namespace VT::Testing {
 namespace {
 
+using QuillMeaning = QuillTest;
 using QuillReports = QuillTest;
 
 constexpr double infinity = std::numeric_limits<double>::infinity();
@@ -72,10 +77,47 @@ public:
     }
 };
 
-TEST_F(QuillReports, OfDimensionsInAWorkspace) {
+/// Each row of a section of quill-meaning.txt is a text, its tree or the only report of it, and for some refused
+/// conditions the sentence.
+template <class Converter>
+void expectMeanings(const std::string& section, SymbolValidator* validator = nullptr) {
+    constexpr bool throws = std::is_base_of_v<SymbolicExprFromQParseTreeBlockVariants, Converter>;
+    for (const CaseRow& row : casesOf("quill-meaning.txt", section, 3)) {
+        SCOPED_TRACE(row[0]);
+        const QuillAnswer answer = readQuill<Converter>(row[0], validator);
+        const bool refused = answer.tree == "invalid";
+        EXPECT_EQ(refused ? reportsText(answer) : answer.tree, row[1]);
+        ASSERT_EQ(answer.reports.size(), refused ? 1U : 0U);
+        ASSERT_EQ(answer.thrown.has_value(), refused && throws);
+        if (!answer.thrown)
+            continue;
+        EXPECT_EQ(answer.thrown->messageId(), "Vantor:Variants:ExpressionParseError");
+        EXPECT_EQ(answer.thrown->offset(), answer.reports[0].offset());
+        const std::vector<DiagnosticArgument> arguments{row[0],
+                                                        std::string(answer.thrown->offset().value() + 1, ' ') + "^"};
+        EXPECT_EQ(answer.thrown->arguments(), arguments);
+        EXPECT_TRUE(row[2].empty() || row[2] == answer.thrown->what()) << answer.thrown->what();
+    }
+}
+
+// Operators, lists, calls and functions of each other are printed and read back in tests/print.
+TEST_F(QuillMeaning, Cases) {
     Workspace workspace;
+    for (const std::string section : {"both", "dimensions"})
+        expectMeanings<SymbolicExprFromQParseTree>(section);
+    for (const std::string section : {"both", "conditions"})
+        expectMeanings<SymbolicExprFromQParseTreeBlockVariants>(section);
     expectMeanings<SymbolicExprFromQParseTree>("workspace", &workspace);
     expectMeanings<IntegerConverter>("integers", &workspace);
+}
+
+TEST_F(QuillMeaning, VariantKeywords) {
+    for (const int value : {1, 0, 1}) {
+        const FlagSetting setting(*VTFEAT_VariantKeywordsSimCodegen, value);
+        EXPECT_EQ(treeText(table, conditions("(sim) || x && (codegen)")),
+                  value == 1 ? "Or((sim),And(x,(codegen)))" : "Or(sim,And(x,codegen))");
+        EXPECT_EQ(treeText(table, dimensions("(sim)")), "sim");
+    }
 }
 
 TEST_F(QuillReports, InUtf16Text) {
@@ -157,20 +199,6 @@ TEST_F(QuillReports, AreSuppressedByTheCheckersFlag) {
     for (const std::string text : {"A +", "sqrt(1)"})
         EXPECT_EQ(dimensions(text), invalidId);
     EXPECT_EQ(checker.diagnostics().size(), 2U) << "they are collected";
-}
-
-TEST_F(QuillReports, RefusedConditionsAreThrown) {
-    for (const CaseRow& row : casesOf("quill-meaning.txt", "refusals", 3)) {
-        const QuillAnswer answer = readCondition(row[0]);
-        const std::size_t offset = std::stoul(row[1]);
-        ASSERT_TRUE(answer.thrown) << row[0];
-        EXPECT_EQ(answer.thrown->messageId(), "Vantor:Variants:ExpressionParseError");
-        const std::vector<DiagnosticArgument> arguments{row[0], std::string(offset + 1, ' ') + "^"};
-        EXPECT_EQ(answer.thrown->arguments(), arguments);
-        EXPECT_EQ(answer.thrown->offset(), offset);
-        EXPECT_EQ(answer.thrown->what(), row[2]);
-        EXPECT_EQ(answer.reports.size(), 1U);
-    }
 }
 
 TEST_F(QuillReports, TheCheckerOfConditionsKeepsThoseOfTheLatestText) {
