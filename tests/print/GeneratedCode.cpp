@@ -2,14 +2,14 @@
 #include "base/print/CTextObstacles.hpp"
 #include "base/print/Predicates.hpp"
 #include "base/print/StringifyImpliedCondition.hpp"
-#include "tests/support/AnyNode.hpp"
+#include "tests/print/TreeReader.hpp"
+#include "tests/support/Cases.hpp"
 #include "tests/support/Parsing.hpp"
 #include "tests/support/RandomCondition.hpp"
 #include "tests/support/Truth.hpp"
 
-#include <array>
-#include <cmath>
 #include <gtest/gtest.h>
+#include <map>
 
 namespace VT::Testing {
 namespace {
@@ -25,60 +25,31 @@ protected:
 };
 
 TEST_F(GeneratedCode, ConditionsOfDirectives) {
-    struct Row {
-        SymbolicExprId id;
-        std::string clarified;
-        std::string bare;  ///< empty: as clarified
-        std::string quill; ///< of the clarified text; empty: as in C
-    };
-
-    const SymbolicExprId a = tree.name("a"), b = tree.name("b"), c = tree.name("c");
-    const SymbolicExprId both = tree(Op::SingleAnd, a, b), either = tree(Op::SingleOr, a, b);
-    const std::vector<Row> rows{{read("true && Mode == 1"), "1 && Mode == 1", "", "true && Mode == 1"},
-                                {read("false"), "0", "", "false"},
-                                {read("A.B.C+1"), "A_B_C + 1", "", "A.B.C + 1"},
-                                {read("A || B && C"), "A || (B && C)", "A || B && C", ""},
-                                {read("A || (B || C)"), "A || (B || C)", "", ""},
-                                {read("a == b == c"), "(a == b) == c", "", ""},
-                                {read("a == (b == c)"), "a == (b == c)", "", ""},
-                                {read("!(a - -3 * -b)"), "!(a - -3 * -b)", "", "~(a - -3 * -b)"},
-                                {read("defined(A.B) || f(a, b + 1) != 0"), "defined(A_B) || f(a,b + 1) != 0", "",
-                                 "defined(A.B) || f(a,b + 1) ~= 0"},
-                                {tree(Op::And, both, either), "(a & b) && (a | b)", "a & b && a | b", ""},
-                                {tree(Op::Or, both, either), "(a & b) || (a | b)", "a & b || a | b", ""},
-                                {tree(Op::SingleOr, both, c), "(a & b) | c", "a & b | c", ""},
-                                {tree(Op::SingleOr, c, both), "c | (a & b)", "c | a & b", ""},
-                                {tree(Op::SingleAnd, either, c), "(a | b) & c", "", ""}};
-    for (const Row& row : rows) {
-        EXPECT_EQ(PreprocessorVCExpr(table, false, true).print(row.id), row.clarified);
-        EXPECT_EQ(PreprocessorVCExpr(table, false).print(row.id), row.bare.empty() ? row.clarified : row.bare);
-        PreprocessorVCExpr visitor(table, true, true);
-        visitor.execute(table, row.id);
-        EXPECT_EQ(visitor.get(), row.quill.empty() ? row.clarified : row.quill);
-        StringifyImpliedCondition nothingKnown(table, false, true, invalidId);
-        EXPECT_EQ(nothingKnown.print(row.id), row.clarified);
-    }
+    for (const bool trees : {false, true})
+        for (const CaseRow& row : casesOf("print.txt", trees ? "directives of trees" : "directives", 4)) {
+            SCOPED_TRACE(row[0]);
+            const SymbolicExprId id = trees ? readTree(table, row[0]) : read(row[0]);
+            EXPECT_EQ(PreprocessorVCExpr(table, false, true).print(id), row[1]);
+            EXPECT_EQ(PreprocessorVCExpr(table, false).print(id), row[2]);
+            PreprocessorVCExpr visitor(table, true, true);
+            visitor.execute(table, id);
+            EXPECT_EQ(visitor.get(), row[3]);
+            StringifyImpliedCondition nothingKnown(table, false, true, invalidId);
+            EXPECT_EQ(nothingKnown.print(id), row[1]);
+        }
     table.insertAliasInfo("Mode", "true");
     PreprocessorVCExpr aliased(table, false, true, SymbolicExprAliasPrinterPredicate(table));
     EXPECT_EQ(aliased.print(read("Mode == 1")), "1 == 1");
 }
 
 TEST_F(GeneratedCode, ConditionsUnderAKnownOne) {
-    // What is known, a condition, what is left of it.
-    const std::vector<std::array<std::string, 3>> rows{{"A == 1 && B", "C && (D || B) && A == 1", "C"},
-                                                       {"A == 1", "1 == A && !(A != 1) && B", "B"},
-                                                       {"A < B", "B > A && A >= B", "0"},
-                                                       {"!(A || B)", "A || C && !B", "C"},
-                                                       {"!(A && B)", "A && C", "A && C"},
-                                                       {"A", "!(A && B) || C", "!B || C"},
-                                                       {"A", "(A && B) + 1 == 2 && (A && B)", "(A && B) + 1 == 2 && B"},
-                                                       {"A", "(B && (A && C)) == 1", "(B && C) == 1"},
-                                                       {"A == 1 && A == 2", "A == 1", "1"}};
-    for (const auto& [given, text, left] : rows) {
+    for (const CaseRow& row : casesOf("print.txt", "implied", 3)) {
+        const std::string &given = row[0], &text = row[1], &left = row[2];
+        SCOPED_TRACE(given + "; " + text);
         const SymbolicExprId known = read(given);
         const SymbolicExprId condition = read(text);
         StringifyImpliedCondition printer(table, false, true, known);
-        EXPECT_EQ(printer.print(condition), left) << text << " given " << given;
+        EXPECT_EQ(printer.print(condition), left);
         printer.forget();
         EXPECT_EQ(printer.print(condition), left);
         StringifyImpliedCondition visitor(table, false, true, known);
@@ -118,54 +89,27 @@ TEST_F(GeneratedCode, WhatIsLeftIsTrueExactlyWhereTheConditionIs) {
 }
 
 TEST_F(GeneratedCode, ObstaclesOfCText) {
-    struct Row {
-        std::vector<CTextObstacle> inPrograms;
-        std::vector<CTextObstacle> inDirectives;
-        std::vector<SymbolicExprId> ids;
-    };
-
-    using enum CTextObstacle;
-    const SymbolicExprId a = tree.name("a"), b = tree.name("b"), truth = read("a > 1");
-    const SymbolicExprId call = tree(Op::FcnCall1U, a, b);
-    const std::vector<Row> rows{
-        {{},
-         {},
-         {read("defined(A) && f(A, B) + ~(A % 2 << B / 3 ^ C) == -S.x.y"), read("A.B.C || A_B"), invalidId,
-          tree(Op::SingleAnd, truth, tree(Op::Not, a)), read("defined.B && A.defined && defined(A.B)")}},
-        {{BitwiseLogic},
-         {BitwiseLogic},
-         {tree(Op::SingleOr, truth, a), tree(Op::BitXOr, tree(Op::SingleOr, truth, truth), a)}},
-        {{NoSuchOperator}, {NoSuchOperator}, {tree(Op::Equal, tree(Op::Power, a, b), tree(Op::Power, b, a))}},
-        {{}, {RealConstant}, {read("a > .5")}},
-        {{RealConstant}, {RealConstant}, {tree(Op::LessThan, a, tree.real(HUGE_VAL))}},
-        {{}, {SharedMacroName}, {read("A.B_C && A.B == A_B.C"), read("A.B || A_B")}},
-        {{}, {MemberOfNoName}, {tree(Op::MemberValue, call)}},
-        {{MemberOfNoName}, {MemberOfNoName}, {read("true.B"), tree(Op::MemberValue, tree(Op::Plus, a, b))}},
-        {{}, {CalledNoName}, {tree(Op::FcnCall1U, read("S.f"), b)}},
-        {{CalledNoName}, {CalledNoName}, {read("true(x) || false()"), tree(Op::FcnCall1U, tree.integer(1), b)}},
-        {{VariantKeyword}, {VariantKeyword}, {read("(sim) && A"), read("(codegen)"), tree.name("(default)")}},
-        {{VariantKeyword}, {VariantKeyword, MemberOfNoName}, {tree(Op::MemberValue, tree.name("(sim)"))}},
-        {{NoSuchName}, {NoSuchName}, {tree(Op::And, tree.name("@default"), a), tree.name("")}},
-        {{NoSuchName}, {NoSuchName, CalledNoName}, {tree(Op::FcnCall1U, tree.name("a b"), a)}},
-        {{NoSuchName}, {}, {read("int == S.while"), read("S.int"), read("sizeof(A) == 4"), read("A.false.true")}},
-        {{}, {NoSuchName}, {read("defined == 1 && defined(A)"), read("f(defined)")}},
-        {{},
-         {DefinedNoName},
-         {read("defined(true)"), read("defined(A + 1)"), read("defined(f(A))"), read("defined(A, B)"),
-          read("defined()"), read("defined(defined)")}}};
+    static const std::map<CTextObstacle, std::string> names{
+        {CTextObstacle::NoSuchOperator, "NoSuchOperator"}, {CTextObstacle::BitwiseLogic, "BitwiseLogic"},
+        {CTextObstacle::RealConstant, "RealConstant"},     {CTextObstacle::MemberOfNoName, "MemberOfNoName"},
+        {CTextObstacle::CalledNoName, "CalledNoName"},     {CTextObstacle::SharedMacroName, "SharedMacroName"},
+        {CTextObstacle::VariantKeyword, "VariantKeyword"}, {CTextObstacle::NoSuchName, "NoSuchName"},
+        {CTextObstacle::DefinedNoName, "DefinedNoName"}};
     const auto obstacles = [&](SymbolicExprId id, CTextUse use) {
-        std::vector<CTextObstacle> found;
+        std::string found;
         for (const CTextFinding& finding : findCTextObstacles(table, id, use))
-            if (found.empty() || found.back() != finding.obstacle)
-                found.push_back(finding.obstacle);
+            if (const std::string& name = names.at(finding.obstacle); !found.ends_with(name))
+                found += (found.empty() ? "" : " ") + name;
         return found;
     };
-    for (const Row& row : rows)
-        for (const SymbolicExprId id : row.ids) {
-            SCOPED_TRACE(table.has(id) ? SymbolicExprPrinter(table, false)(id) : "");
-            EXPECT_EQ(obstacles(id, CTextUse::Program), row.inPrograms);
-            EXPECT_EQ(obstacles(id, CTextUse::Directive), row.inDirectives);
+    for (const bool trees : {false, true})
+        for (const CaseRow& row : casesOf("print.txt", trees ? "obstacles of trees" : "obstacles", 3)) {
+            SCOPED_TRACE(row[0]);
+            const SymbolicExprId id = trees ? readTree(table, row[0]) : read(row[0]);
+            EXPECT_EQ(obstacles(id, CTextUse::Program), row[1]);
+            EXPECT_EQ(obstacles(id, CTextUse::Directive), row[2]);
         }
+    const SymbolicExprId a = tree.name("a");
     table.insertAliasInfo("int", "rows");
     table.insertAliasInfo("a b", "(p+q)");
     table.insertAliasInfo("Name", "true");
@@ -173,13 +117,13 @@ TEST_F(GeneratedCode, ObstaclesOfCText) {
     EXPECT_TRUE(findCTextObstacles(table, read("int == 1"), CTextUse::Program, aliases).empty());
     EXPECT_TRUE(findCTextObstacles(table, tree.name("a b"), CTextUse::Directive, aliases).empty());
     for (const SymbolicExprId id : {tree(Op::MemberValue, tree.name("a b")), read("Name.B")})
-        EXPECT_EQ(findCTextObstacles(table, id, CTextUse::Directive, aliases).front().obstacle, MemberOfNoName);
+        EXPECT_EQ(findCTextObstacles(table, id, CTextUse::Directive, aliases).front().obstacle,
+                  CTextObstacle::MemberOfNoName);
     for (const OperatorInfo& op : operatorTable()) {
         const bool onlyInQuill = op.op != Op::UnaryMinus && op.c.find_first_of(".\\':") != std::string_view::npos;
         if (onlyInQuill && op.op != Op::MemberValue) {
             const std::vector<SymbolicExprId> inputs(*operandCount(op.op), a);
-            EXPECT_EQ(obstacles(makeNode(table, op.op, inputs), CTextUse::Program), std::vector{NoSuchOperator})
-                << op.name;
+            EXPECT_EQ(obstacles(makeNode(table, op.op, inputs), CTextUse::Program), "NoSuchOperator") << op.name;
         }
     }
 }
