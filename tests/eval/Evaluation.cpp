@@ -6,8 +6,11 @@
 #include "parser/QuillConverterBlockVariants.hpp"
 #include "parser/SymbolicExprParser.hpp"
 #include "tests/support/AnyNode.hpp"
+#include "tests/support/Cases.hpp"
 
 #include <gmock/gmock.h>
+#include <iterator>
+#include <sstream>
 
 namespace VT::Testing {
 namespace {
@@ -28,20 +31,10 @@ protected:
 using Vector = SymbolicValue::Elements;
 
 TEST_F(Evaluation, NamesWhatHasNoValue) {
-    for (const auto& [symbol, bound] : std::vector<std::pair<const char*, const char*>>{
-             {"A", "B + 1"}, {"B", "C * 2"}, {"C", "A"}, {"Self", "Self"}, {"N", "3"}, {"Open", "Missing"}})
-        bind(symbol, bound);
-    const std::vector<std::array<std::string, 3>> rows{
-        {"N + Nope", "UnboundSymbol", "Nope"},
-        {"Open", "UnboundSymbol", "Missing"},
-        {"N * A", "CyclicValue", "A"},
-        {"Self", "CyclicValue", "Self"},
-        {"N + f(Nope)", "NotEvaluable", "f(Nope)"},
-        {"1 + s.x", "NotEvaluable", "s.x"},
-        {"[[1, 2], 3]", "NotEvaluable", "[[1,2],3]"},
-        {"[1, 2] + ([1, 2, 3] - 1)", "SizeMismatch", "[1,2]+([1,2,3]-1)"},
-    };
-    for (const auto& [text, key, named] : rows) {
+    for (const CaseRow& row : casesOf("eval.txt", "bound", 2))
+        bind(row[0], row[1]);
+    for (const CaseRow& row : casesOf("eval.txt", "no value", 3)) {
+        const std::string &key = row[0], &named = row[1], &text = row[2];
         SCOPED_TRACE(text);
         const SymbolicExprId id = read(text);
         const SymbolicExprEval evaluator(table);
@@ -92,18 +85,17 @@ TEST_F(Evaluation, QuillWritesListsAsMatrices) {
     SymbolicExprFromQParseTreeBlockVariants quill(table, checker);
     const SymbolicExprDimensionLists lists(table);
     bind("N", "3");
-    const std::vector<std::pair<const char*, SymbolicValue>> rows{
-        {"[1 2]*3", Vector{3, 6}}, {"[N, N*2] + [1 2]", Vector{4, 8}},
-        {"-[5]", Vector{-5}},      {"[1 2 3 N]", Vector{1, 2, 3, 3}},
-        {"[] * 2", Vector{}},      {"2 - (7 > [1 9])", Vector{1, 2}},
-    };
-    for (const auto& [text, wanted] : rows)
-        EXPECT_EQ(SymbolicExprEval(table).eval(lists(quill(text))), wanted) << text;
+    for (const CaseRow& row : casesOf("eval.txt", "lists of Quill", 2)) {
+        std::istringstream numbers(row[1]);
+        const SymbolicValue wanted(Vector(std::istream_iterator<int>(numbers), {}));
+        EXPECT_TRUE(numbers.eof()) << row[1];
+        EXPECT_EQ(SymbolicExprEval(table).eval(lists(quill(row[0]))), wanted) << row[0];
+    }
     EXPECT_EQ(lists(quill("[1 2]*3")), read("[1, 2]*3"));
-    for (const char* text : {"[1; 2] + 1", "{1, 2}", "N + f(N)"}) {
-        const SymbolicExprId id = quill(text);
-        EXPECT_EQ(lists(id), id) << text;
-        EXPECT_THROW(static_cast<void>(SymbolicExprEval(table).eval(id)), HostDiagnostic) << text;
+    for (const CaseRow& row : casesOf("eval.txt", "no lists of Quill", 1)) {
+        const SymbolicExprId id = quill(row[0]);
+        EXPECT_EQ(lists(id), id) << row[0];
+        EXPECT_THROW(static_cast<void>(SymbolicExprEval(table).eval(id)), HostDiagnostic) << row[0];
     }
     EXPECT_THROW(static_cast<void>(SymbolicExprEval(table).eval(lists(quill("[[1 2] 3]")))), HostDiagnostic);
     EXPECT_EQ(lists(invalidId), invalidId);
