@@ -116,7 +116,7 @@ TEST_F(GeneratedCode, ObstaclesOfCText) {
     const SymbolicExprAliasPrinterPredicate aliases(table);
     EXPECT_TRUE(findCTextObstacles(table, read("int == 1"), CTextUse::Program, aliases).empty());
     EXPECT_TRUE(findCTextObstacles(table, tree.name("a b"), CTextUse::Directive, aliases).empty());
-    for (const SymbolicExprId id : {tree(Op::MemberValue, tree.name("a b")), read("Name.B")})
+    for (const SymbolicExprId id : {readTree(table, "MemberValue(a b,field)"), read("Name.B")})
         EXPECT_EQ(findCTextObstacles(table, id, CTextUse::Directive, aliases).front().obstacle,
                   CTextObstacle::MemberOfNoName);
     for (const OperatorInfo& op : operatorTable()) {

@@ -9,55 +9,47 @@
 
 namespace VT::Testing {
 
-/// Reads what treeText writes; what stands in quotes is a name.  Recurses; for small expressions only.
-class TreeReader {
-public:
-    TreeReader(SymbolicExprTable& table, const std::string& text) : make_{table}, rest_(text) {}
+/// Takes what is in quotes, or what is before a bracket or a comma.
+inline std::string takeWord(std::string_view& rest) {
+    const bool isQuoted = rest.starts_with('"');
+    rest.remove_prefix(isQuoted ? 1 : 0);
+    const std::string word(rest.substr(0, rest.find_first_of(isQuoted ? "\"" : "(,)")));
+    rest.remove_prefix(word.size() + (isQuoted ? 1 : 0));
+    return word;
+}
 
-    SymbolicExprId operator()() { // NOLINT(misc-no-recursion)
-        const bool isQuoted = rest_.starts_with('"');
-        const std::string text = word();
-        if (rest_.starts_with('(') && !isQuoted)
-            return compound(text);
+inline SymbolicExprId takeTree(SymbolicExprTable& table, std::string_view& rest) { // NOLINT(misc-no-recursion)
+    const Trees tree{table};
+    const bool isQuoted = rest.starts_with('"');
+    const std::string word = takeWord(rest);
+    if (isQuoted || !rest.starts_with('(')) {
         char* end = nullptr;
-        const double number = std::strtod(text.c_str(), &end);
-        if (isQuoted || text.empty() || (*end != '\0' && std::string_view(end) != "r") || end == text.c_str())
-            return text == "invalid" ? invalidId : make_.name(text);
-        return *end == 'r' ? make_.real(number) : make_.integer(static_cast<int>(number));
+        const double number = std::strtod(word.c_str(), &end);
+        if (isQuoted || end == word.c_str() || (*end != '\0' && std::string_view(end) != "r"))
+            return word == "invalid" ? invalidId : tree.name(word);
+        return *end == 'r' ? tree.real(number) : tree.integer(static_cast<int>(number));
     }
+    const auto* const row = std::ranges::find(operatorTable(), word, &OperatorInfo::name);
+    if (row == std::ranges::end(operatorTable()))
+        throw std::runtime_error("no operator " + word);
+    NodeParts parts;
+    do {
+        rest.remove_prefix(1);
+        if (row->op == SymbolicOp::MemberValue && !parts.inputs.empty())
+            parts.text = takeWord(rest);
+        else if (!rest.starts_with(')'))
+            parts.inputs.push_back(takeTree(table, rest));
+    } while (rest.starts_with(','));
+    rest.remove_prefix(1);
+    return makeAny(table, row->op, parts);
+}
 
-private:
-    /// Up to a bracket, a comma or the closing quote.
-    std::string word() {
-        const std::size_t quotes = rest_.starts_with('"') ? 1 : 0;
-        const std::size_t end = std::min(rest_.find_first_of(quotes != 0 ? "\"" : "(,)", quotes), rest_.size());
-        std::string text(rest_.substr(quotes, end - quotes));
-        rest_.erase(0, end + quotes);
-        return text;
-    }
-
-    SymbolicExprId compound(const std::string& name) { // NOLINT(misc-no-recursion)
-        const auto* const row = std::ranges::find(operatorTable(), name, &OperatorInfo::name);
-        if (row == std::ranges::end(operatorTable()))
-            throw std::runtime_error("no operator " + name);
-        NodeParts parts;
-        while (!rest_.starts_with(')') && !rest_.empty()) {
-            rest_.erase(0, 1);
-            if (row->op == SymbolicOp::MemberValue && !parts.inputs.empty())
-                parts.text = word();
-            else if (!rest_.starts_with(')'))
-                parts.inputs.push_back((*this)());
-        }
-        rest_.erase(0, 1);
-        return makeAny(make_.table, row->op, parts);
-    }
-
-    Trees make_;
-    std::string rest_;
-};
-
-inline SymbolicExprId readTree(SymbolicExprTable& table, const std::string& text) {
-    return TreeReader(table, text)();
+/// Reads what treeText writes; what stands in quotes is a name.  Recurses; for small expressions only.
+inline SymbolicExprId readTree(SymbolicExprTable& table, std::string_view text) {
+    const SymbolicExprId id = takeTree(table, text);
+    if (!text.empty())
+        throw std::runtime_error("more than a tree");
+    return id;
 }
 
 } // namespace VT::Testing

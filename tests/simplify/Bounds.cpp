@@ -3,6 +3,7 @@
 
 #include "base/core/Limits.hpp"
 #include "tests/support/AnyNode.hpp"
+#include "tests/support/Cases.hpp"
 #include "tests/support/Times.hpp"
 
 #include <random>
@@ -23,19 +24,20 @@ SymbolicExprId chain(SymbolicExprTable& table, SymbolicOp op, std::size_t count,
     return sum;
 }
 
-/// So many copies of two texts in turn, with the number of the copy for every #.
-std::string joined(std::size_t n, const std::string& between, const std::string& even, const std::string& odd) {
+/// So many copies of two texts in turn, with the number of the copy for every # and a literal of so many symbols, drawn
+/// at random, for every @.
+std::string joined(std::size_t n, const std::string& between, const std::string& even, const std::string& odd = "",
+                   std::uint64_t symbols = 0) {
+    std::mt19937_64 random(n);
     std::string text;
     for (std::size_t i = 0; i < n; ++i) {
         text += i == 0 ? "" : between;
-        for (const char c : i % 2 == 0 ? even : odd)
-            text += c == '#' ? std::to_string(i) : std::string(1, c);
+        for (const char c : i % 2 == 0 || odd.empty() ? even : odd)
+            text += c == '#'   ? std::to_string(i)
+                    : c == '@' ? std::string(random() % 2, '!') + "V" + std::to_string(random() % symbols)
+                               : std::string(1, c);
     }
     return text;
-}
-
-std::string joined(std::size_t n, const std::string& between, const std::string& each) {
-    return joined(n, between, each, each);
 }
 
 TEST(OperandLimit, HoldsAtTheBoundAndGivesUpOneBeyond) {
@@ -86,73 +88,32 @@ TEST(LongChains, AreReducedWhateverTheirLength) {
     EXPECT_TRUE(bench.simplified(range + "&&A>1000") == range + "&&A>1000");
 }
 
-/// What a family's text of size n is made of.
-struct Family {
-    const char* name;
-    std::size_t size; ///< the largest of three, each twice the one before
-    std::string (*text)(std::size_t n);
-};
-
-/// Brackets within brackets.
-std::string nested(std::size_t n, const std::string& even, const std::string& odd) {
-    return joined(n, "", even, odd) + "Z" + times(n, ")");
+/// The condition of a family with so many parts.
+std::string grown(const CaseRow& family, std::size_t n) {
+    const std::string& symbols = family[8];
+    const std::size_t count = symbols.starts_with("n/") ? n / std::stoul(symbols.substr(2)) : std::stoul("0" + symbols);
+    return family[5] + joined(n, family[2], family[3], family[4], count) + family[6] + times(n, family[7]);
 }
-
-/// Products of literals drawn at random from so many symbols.
-std::string products(std::size_t n, int literals, std::uint64_t symbols, const char* inner, const char* outer) {
-    std::mt19937_64 random(n);
-    std::string text;
-    for (std::size_t i = 0; i < n; ++i) {
-        text += i == 0 ? "(" : std::string(outer) + "(";
-        for (int j = 0; j < literals; ++j)
-            text += (j == 0 ? "" : inner) + std::string(random() % 2, '!') + "V" + std::to_string(random() % symbols);
-        text += ")";
-    }
-    return text;
-}
-
-const Family families[] = {
-    {"alternation", 240, [](std::size_t n) { return nested(n, "A#&&(", "A#||("); }},
-    {"lexicographic", 240, [](std::size_t n) { return nested(n, "A#>#||A#==#&&(", "A#>#||A#==#&&("); }},
-    {"negations", 240, [](std::size_t n) { return nested(n, "!(A#&&", "!(A#||B#&&"); }},
-    {"truth values compared", 240, [](std::size_t n) { return nested(n, "A#==(B#&&C#||", "A#<(B#||"); }},
-    {"clauses", 400, [](std::size_t n) { return products(n, 3, n / 4, "||", "&&"); }},
-    {"few clauses", 24, [](std::size_t n) { return products(n, 2, 12, "||", "&&"); }},
-    {"sum over few symbols", 800, [](std::size_t n) { return products(n, 4, 8, "&&", "||"); }},
-    {"sum over some symbols", 800, [](std::size_t n) { return products(n, 4, 20, "&&", "||"); }},
-    {"sum over many symbols", 800, [](std::size_t n) { return products(n, 4, n, "&&", "||"); }},
-    {"negated sum", 400, [](std::size_t n) { return "!(" + products(n, 3, 40, "&&", "||") + ")"; }},
-    {"negated ranges", 900, [](std::size_t n) { return "!(" + joined(n, "||", "A>=4*#&&A<=4*#+1") + ")"; }},
-    {"ranges", 900, [](std::size_t n) { return joined(n, "&&", "(A<#00||A>#01)"); }},
-    {"products of sums", 3000, [](std::size_t n) { return joined(n, "*", "(N+#)"); }},
-    {"long sum", 6000, [](std::size_t n) { return joined(n, "+", "#*A#") + ">0"; }},
-    {"sums in calls", 100,
-     [](std::size_t n) {
-         return joined(n, "+", "f(" + products(10, 2, 12, "||", "&&") + ")",
-                       "f(" + products(11, 2, 12, "||", "&&") + ")");
-     }},
-    {"comparisons of long texts", 160,
-     [](std::size_t n) { return joined(n, "||", joined(30, "+", "LONG_NAME_#") + ">#&&B#"); }},
-};
 
 // The nodes that a call makes are bounded by those that it is given and by what it may multiply out, and what it
 // returns stays as it is, also where a bound was met.
 TEST(GrowingFamilies, MakeNoMoreNodesThanTheirBoundAndStayAsTheyAre) {
-    for (const Family& family : families) {
-        for (const std::size_t n : {family.size / 4, family.size / 2, family.size}) {
-            SCOPED_TRACE(family.name + std::to_string(n));
+    for (const CaseRow& family : casesOf("simplify.txt", "growing families", 9)) {
+        const std::size_t size = std::stoul(family[1]);
+        for (const std::size_t n : {size / 4, size / 2, size}) {
+            SCOPED_TRACE(family[0] + std::to_string(n));
             Workbench bench;
-            const SymbolicExprId condition = bench.parse(family.text(n));
+            const SymbolicExprId condition = bench.parse(grown(family, n));
             const std::size_t given = bench.table.size();
             const SymbolicExprId result = bench.simplify(condition);
             EXPECT_LE(bench.table.size(), 4 * given + limits::multipliedLiterals);
             EXPECT_LT(bench.passes, limits::simplifyPasses);
             EXPECT_EQ(bench.simplify(result), result);
-            if (n == family.size)
+            if (n == size)
                 continue;
             Workbench used; // in which names and parts have other identifiers
-            used.simplify(used.parse(family.text(n / 2 + 1)));
-            EXPECT_TRUE(used.simplified(family.text(n)) == SymbolicExprPrinter(bench.table, false)(result));
+            used.simplify(used.parse(grown(family, n / 2 + 1)));
+            EXPECT_TRUE(used.simplified(grown(family, n)) == SymbolicExprPrinter(bench.table, false)(result));
         }
     }
 }

@@ -3,6 +3,7 @@
 
 #include "base/variants/Features.hpp"
 #include "base/variants/VariantKeywords.hpp"
+#include "tests/print/TreeReader.hpp"
 #include "tests/support/HostTables.hpp"
 #include "tests/support/Slots.hpp"
 #include "tests/support/TreeText.hpp"
@@ -169,11 +170,7 @@ private:
 
 TEST(XForm, HooksDecideWhatIsBuilt) {
     SymbolicExprTable source;
-    const SymbolicString x(source, "x");
-    const SymbolicMinusExpr difference(source, x, SymbolicDoubleValue(source, 2.5));
-    const SymbolicMemberValue member(source, x, "m");
-    const SymbolicQColon3Expr range(source, difference, member, x);
-    const SymbolicExprId row = SymbolicRowExpr(source, {range.getId(source), difference.getId(source)}).getId(source);
+    const SymbolicExprId row = readTree(source, "Row(QColon3(Minus(x,2.5r),MemberValue(x,m),x),Minus(x,2.5r))");
     SymbolicExprTable target;
     Hooks visitor(target);
     EXPECT_EQ(treeText(target, visitor.rebuild(source, row)),
