@@ -51,7 +51,7 @@ std::vector<CaseRow> casesOf(const std::string& file, const std::string& section
     std::vector<CaseRow> rows;
     bool inside = false;
     for (std::string line; std::getline(input, line);) {
-        if (line.starts_with('[') && line.ends_with(']'))
+        if (line.starts_with('[') && line.ends_with(']') && line.find('\t') == std::string::npos)
             inside = line == "[" + section + "]";
         else if (inside && !line.empty() && !line.starts_with('#'))
             rows.push_back(rowOf(line));

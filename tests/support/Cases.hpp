@@ -2,7 +2,7 @@
 //
 // A file of tests/data/cases is a list of sections, each with a heading in brackets and one case a line.  Columns are
 // separated by tabs, further tabs make no further columns, and lines that begin with # or hold nothing say nothing.
-// \n, \t, \\ and \xHH stand for what they do in C; \e is an empty column.
+// \n, \t, \\ and \xHH stand for what they do in C; \e is an empty column.  A heading holds no tab.
 #pragma once
 
 #include <string>
