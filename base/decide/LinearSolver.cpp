@@ -277,6 +277,14 @@ private:
 
     // Inequalities.
 
+    /// The factors of the opposite direction; a constant behind them is left out.
+    [[nodiscard]] Line oppositeFactors(const Line& row) const {
+        Line opposite(variables_);
+        for (std::size_t i = 0; i < variables_; ++i)
+            opposite[i] = -row[i];
+        return opposite;
+    }
+
     /// Divides by common factors, keeps the tightest of parallel ones and turns opposite ones that leave one value into
     /// an equality; false where two contradict each other.
     bool tighten(Problem<Number>& problem, bool& foundEquality) {
@@ -299,9 +307,7 @@ private:
         }
         problem.inequalities.clear();
         for (auto& [factors, constant] : tightest) {
-            Line opposite(factors.size());
-            for (std::size_t i = 0; i < factors.size(); ++i)
-                opposite[i] = -factors[i];
+            const Line opposite = oppositeFactors(factors);
             Line line(factors);
             line.push_back(constant);
             if (const auto other = tightest.find(opposite); other != tightest.end()) {
@@ -434,9 +440,7 @@ private:
         const Line* narrowest = nullptr;
         Number width(0);
         for (const Line& line : problem.inequalities) {
-            Line opposite(line.size() - 1);
-            for (std::size_t i = 0; i + 1 < line.size(); ++i)
-                opposite[i] = -line[i];
+            const Line opposite = oppositeFactors(line);
             if (const auto other = byFactors.find(opposite); other != byFactors.end()) {
                 const Number between = line.back() + other->second->back();
                 if (narrowest == nullptr || between < width) {

@@ -83,10 +83,8 @@ SymbolicExprId ImpliedCondition::build() {
             const SymbolicExprId right = built_[operand];
             if (built_[i] == invalidId)
                 built_[i] = right;
-            else if (item.op == SymbolicOp::And)
-                built_[i] = SymbolicAndExpr(table_, built_[i], right).getId(table_);
             else
-                built_[i] = SymbolicOrExpr(table_, built_[i], right).getId(table_);
+                built_[i] = makeBinary(table_, item.op, built_[i], right);
             nodesLeft_ -= std::min<std::size_t>(nodesLeft_, 1);
         }
     }
