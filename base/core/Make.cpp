@@ -52,6 +52,15 @@ SymbolicExprId makeTernary(SymbolicExprTable& table, SymbolicOp op, SymbolicExpr
     return makeIfShaped<SymbolicTernaryExpr>(table, op, first, second, third);
 }
 
+SymbolicExprId makeChain(SymbolicExprTable& table, SymbolicOp op, std::span<const SymbolicExprId> operands) {
+    if (operands.empty())
+        return invalidId;
+    SymbolicExprId chain = operands.front();
+    for (const SymbolicExprId next : operands.subspan(1))
+        chain = makeBinary(table, op, chain, next);
+    return chain;
+}
+
 SymbolicExprId makeMulti(SymbolicExprTable& table, SymbolicOp op, std::vector<SymbolicExprId> operands) {
     return makeIfShaped<SymbolicMultiExpr>(table, op, std::move(operands));
 }

@@ -7,6 +7,7 @@
 #include "base/core/Operators.hpp"
 #include "base/core/Table.hpp"
 
+#include <span>
 #include <vector>
 
 namespace VT {
@@ -21,5 +22,8 @@ VTSYM_API SymbolicExprId makeTernary(SymbolicExprTable& table, SymbolicOp op, Sy
                                      SymbolicExprId second, SymbolicExprId third);
 /// The same for the classes that take any number of operands; a call's name comes first.
 VTSYM_API SymbolicExprId makeMulti(SymbolicExprTable& table, SymbolicOp op, std::vector<SymbolicExprId> operands);
+/// A chain of an operator with two operands, folded from the left; a single operand is its own chain, and no operands
+/// yield the invalid identifier.
+VTSYM_API SymbolicExprId makeChain(SymbolicExprTable& table, SymbolicOp op, std::span<const SymbolicExprId> operands);
 
 } // namespace VT

@@ -30,13 +30,6 @@ std::vector<Formula> FormulaWriter::byHeight(Formula formula, bool withOpposites
     return all;
 }
 
-SymbolicExprId FormulaWriter::fold(SymbolicOp op, const std::vector<SymbolicExprId>& operands) {
-    SymbolicExprId chain = operands.front();
-    for (std::size_t i = 1; i < operands.size(); ++i)
-        chain = makeBinary(table_, op, chain, operands[i]);
-    return chain;
-}
-
 /// The form of an operand that makes a chain shortest.
 SymbolicExprId FormulaWriter::shorter(const Written& written, bool inBrackets) const {
     if (written.negation == invalidId || written.plain == invalidId)
@@ -57,7 +50,7 @@ bool FormulaWriter::append(Kind kind, Formula operand, std::vector<SymbolicExprI
     if (comparisons.size() < 2 || own == kind)
         out.insert(out.end(), comparisons.begin(), comparisons.end());
     else
-        out.push_back(fold(opOf(own), comparisons));
+        out.push_back(makeChain(table_, opOf(own), comparisons));
     return !comparisons.empty();
 }
 
@@ -71,7 +64,7 @@ void FormulaWriter::drawTogether(Kind kind, std::vector<SymbolicExprId>& operand
         if (isNot(operand))
             inner.push_back(table_.get(operand)->getInput(0));
     const auto first = std::ranges::find_if(operands, isNot);
-    *first = SymbolicNotExpr(table_, fold(opOf(Formulas::opposite(kind)), inner)).getId(table_);
+    *first = SymbolicNotExpr(table_, makeChain(table_, opOf(Formulas::opposite(kind)), inner)).getId(table_);
     operands.erase(std::remove_if(first + 1, operands.end(), isNot), operands.end());
 }
 
@@ -83,7 +76,8 @@ SymbolicExprId FormulaWriter::writeOne(Formula formula, bool together) {
     if (kind == Kind::Leaf) {
         const WrittenSet set = terms_.write(formulas_.constraint(formula));
         operands.assign(set.operands.begin(), set.operands.end());
-        return operands.empty() ? invalidId : fold(opOf(set.op == SymbolicOp::Or ? Kind::Or : Kind::And), operands);
+        return operands.empty() ? invalidId
+                                : makeChain(table_, opOf(set.op == SymbolicOp::Or ? Kind::Or : Kind::And), operands);
     }
     const Formulas::Operands parts = formulas_.operands(formula);
     for (const Formula part : parts)
@@ -91,7 +85,7 @@ SymbolicExprId FormulaWriter::writeOne(Formula formula, bool together) {
             return invalidId;
     if (together)
         drawTogether(kind, operands);
-    return fold(opOf(kind), operands);
+    return makeChain(table_, opOf(kind), operands);
 }
 
 std::uint32_t FormulaWriter::countNegations(Formula formula) const {

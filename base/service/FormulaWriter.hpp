@@ -46,7 +46,6 @@ private:
     [[nodiscard]] SymbolicOp opOf(Kind kind) const { return kind == Kind::And ? ops_.conjunction : ops_.disjunction; }
 
     std::vector<Formula> byHeight(Formula formula, bool withOpposites);
-    SymbolicExprId fold(SymbolicOp op, const std::vector<SymbolicExprId>& operands);
     bool append(Kind kind, Formula operand, std::vector<SymbolicExprId>& out);
     void drawTogether(Kind kind, std::vector<SymbolicExprId>& operands);
     SymbolicExprId writeOne(Formula formula, bool together);

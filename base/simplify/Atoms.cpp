@@ -189,10 +189,7 @@ std::vector<SymbolicExprId> chainOperands(const RuleContext& context, SymbolicOp
 }
 
 SymbolicExprId foldLeft(RuleContext& context, SymbolicOp op, const std::vector<SymbolicExprId>& operands) {
-    SymbolicExprId result = operands.front();
-    for (auto next = operands.begin() + 1; next != operands.end(); ++next)
-        result = context.makeBinary(op, result, *next);
-    return result;
+    return makeChain(context.table(), op, operands);
 }
 
 void sortByText(const RuleContext& context, std::vector<SymbolicExprId>& operands) {
