@@ -1,5 +1,5 @@
-// Front door of the expression core: operator codes, node classes with their interning constructors, the table that owns the
-// nodes and the visitor interface.
+// Front door of the expression core: operator codes, node classes with their interning constructors, the table that
+// owns the nodes and the visitor interface.
 #pragma once
 
 #include "base/core/Nodes.hpp"

@@ -1,7 +1,7 @@
 #include "benchmarks/FloorText.hpp"
 
 #include "base/core/Operators.hpp"
-#include "benchmarks/ConditionReader.hpp"
+#include "benchmarks/FloorConditionReader.hpp"
 
 #include <bit>
 #include <charconv>

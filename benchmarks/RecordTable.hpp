@@ -1,8 +1,8 @@
 // The floor of interning: an open-addressing table over records of 32 bytes.
 #pragma once
 
-#include "base/core/Hash.hpp"
 #include "base/core/Node.hpp"
+#include "base/core/NodeHash.hpp"
 
 #include <array>
 #include <cstring>

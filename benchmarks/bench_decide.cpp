@@ -1,9 +1,9 @@
 // Decisions about pairs of real conditions beside a general solver, and how the cost grows with atoms and choices.
 // Both sides answer with an assignment where there is one; that of the library is the smallest.
 #include "base/decide/Decider.hpp"
+#include "benchmarks/BenchmarkCorpus.hpp"
 #include "benchmarks/Comparison.hpp"
-#include "benchmarks/Corpus.hpp"
-#include "tests/support/Solver.hpp"
+#include "tests/support/oracles/Solver.hpp"
 
 #include <cstdio>
 #include <map>

@@ -2,8 +2,8 @@
 // the length of a chain.
 #include "base/scan/DirectiveReader.hpp"
 #include "base/scan/SourceScan.hpp"
+#include "benchmarks/BenchmarkCorpus.hpp"
 #include "benchmarks/Comparison.hpp"
-#include "benchmarks/Corpus.hpp"
 
 #include <random>
 

@@ -4,8 +4,8 @@
 #include "base/simplify/Simplify.hpp"
 #include "base/transform/QuillConversion.hpp"
 #include "base/transform/XForm.hpp"
+#include "benchmarks/BenchmarkCorpus.hpp"
 #include "benchmarks/Comparison.hpp"
-#include "benchmarks/Corpus.hpp"
 #include "benchmarks/FloorText.hpp"
 
 #include <functional>

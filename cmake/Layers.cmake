@@ -4,10 +4,7 @@ find_package(Boost 1.74 REQUIRED)
 
 # The sources of a layer; folders are searched on every build, so that a new file needs no edit here.
 function(vtsym_sources layer result)
-  set(patterns ${VTSYM_FOLDER_${layer}}/*.cpp)
-  if(VTSYM_DOOR_${layer})
-    list(APPEND patterns ${VTSYM_DOOR_${layer}}*.cpp)
-  endif()
+  list(TRANSFORM VTSYM_FOLDERS_${layer} APPEND /*.cpp OUTPUT_VARIABLE patterns)
   file(GLOB sources CONFIGURE_DEPENDS ${patterns})
   set(${result} ${sources} PARENT_SCOPE)
 endfunction()
@@ -72,9 +69,13 @@ if(VTSYM_EMBEDDED_HOST AND NOT VTSYM_SANITIZE)
   target_link_options(vtsym PRIVATE -Wl,--no-undefined)
 endif()
 
-# The program stands on the embedded host.
-file(GLOB program_sources CONFIGURE_DEPENDS tools/vtsym/*.cpp)
-if(program_sources AND VTSYM_EMBEDDED_HOST)
+# The program needs the embedded host.
+if(VTSYM_EMBEDDED_HOST)
+  set(program_sources)
+  foreach(layer IN LISTS VTSYM_PROGRAM_LAYERS)
+    vtsym_sources(${layer} sources)
+    list(APPEND program_sources ${sources})
+  endforeach()
   find_package(CLI11 REQUIRED)
   find_library(VTSYM_EDIT_LIBRARY edit REQUIRED)
   add_executable(vtsym_program ${program_sources})

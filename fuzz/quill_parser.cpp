@@ -1,6 +1,6 @@
 // Fuzz target: any bytes as Quill text.  The first byte chooses the nesting bound and whether there are keywords.
 //
-//   clang++ -std=c++20 -g -O1 -fsanitize=fuzzer,address,undefined -I. fuzz/quill_parser.cpp host/embedded/Quill*.cpp
+//   clang++ -std=c++20 -g -O1 -fsanitize=fuzzer,address,undefined -I. fuzz/quill_parser.cpp host/embedded/*Quill*.cpp
 #include "host/QuillParser.hpp"
 
 #include <array>

@@ -1,8 +1,8 @@
 // What the condition grammar reads a text as, before it becomes nodes.
 #pragma once
 
-#include "base/core/Arena.hpp"
 #include "base/core/Operators.hpp"
+#include "base/util/Arena.hpp"
 
 #include <cstddef>
 #include <cstdint>

@@ -1,8 +1,8 @@
 // Storage of a table's nodes, addressed by numbers of 32 bits, so that the slots of its index are small.
 #pragma once
 
-#include "base/core/LargePages.hpp"
 #include "base/core/Node.hpp"
+#include "base/util/LargePages.hpp"
 
 #include <algorithm>
 #include <cstdint>

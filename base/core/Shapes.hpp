@@ -4,8 +4,8 @@
 // its parts as operands of an operator: interning knows the class and needs no virtual call.
 #pragma once
 
-#include "base/core/Hash.hpp"
 #include "base/core/Node.hpp"
+#include "base/core/NodeHash.hpp"
 
 #include <string>
 #include <vector>

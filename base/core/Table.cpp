@@ -1,8 +1,8 @@
 #include "base/core/Table.hpp"
 
-#include "base/core/LargePages.hpp"
 #include "base/core/Nodes.hpp"
 #include "base/core/Walk.hpp"
+#include "base/util/LargePages.hpp"
 
 #include <algorithm>
 #include <bit>

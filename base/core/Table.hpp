@@ -2,8 +2,8 @@
 #pragma once
 
 #include "base/core/Cells.hpp"
-#include "base/core/Hash.hpp"
 #include "base/core/Node.hpp"
+#include "base/util/Hash.hpp"
 
 #include <boost/unordered_map.hpp>
 

@@ -4,8 +4,8 @@
 // that the walk is inside of: in a table of a host, nodes may lead in a circle.  A walk passes over missing operands.
 #pragma once
 
-#include "base/core/IdMap.hpp"
 #include "base/core/Nodes.hpp"
+#include "base/util/IdMap.hpp"
 
 #include <algorithm>
 #include <limits>

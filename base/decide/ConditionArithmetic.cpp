@@ -4,8 +4,8 @@
 // computed. What remains becomes an unknown with the bounds that its operator implies (`a % 8` lies in -7..7, `a & 6`
 // is made of the bits 6) and with what its operands say about 0.
 #include "base/core/Limits.hpp"
-#include "base/decide/Arithmetic.hpp"
 #include "base/decide/ConditionReader.hpp"
+#include "base/integer/ExactArithmetic.hpp"
 
 #include <algorithm>
 #include <cstdlib>

@@ -6,7 +6,7 @@
 #include "base/decide/ConditionReader.hpp"
 
 #include "base/core/Walk.hpp"
-#include "base/decide/Arithmetic.hpp"
+#include "base/integer/ExactArithmetic.hpp"
 
 #include <algorithm>
 #include <cmath>

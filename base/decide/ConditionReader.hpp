@@ -12,8 +12,8 @@
 
 #include "base/core/Nodes.hpp"
 #include "base/decide/Decision.hpp"
-#include "base/decide/Diagrams.hpp"
-#include "base/decide/Leaves.hpp"
+#include "base/decide/LeafReader.hpp"
+#include "base/decide/diagram/Diagrams.hpp"
 
 #include <boost/container/small_vector.hpp>
 

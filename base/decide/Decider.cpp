@@ -6,7 +6,7 @@
 #include "base/decide/Decider.hpp"
 
 #include "base/decide/ConditionReader.hpp"
-#include "base/decide/WitnessSearch.hpp"
+#include "base/decide/witness/WitnessSearch.hpp"
 
 #include <boost/container/small_vector.hpp>
 

@@ -1,9 +1,9 @@
 // The visitor that computes values.
 #pragma once
 
-#include "base/core/IdMap.hpp"
 #include "base/core/Nodes.hpp"
 #include "base/eval/Values.hpp"
+#include "base/util/IdMap.hpp"
 
 #include <boost/container/small_vector.hpp>
 

@@ -1,12 +1,12 @@
 #include "base/eval/Prepared.hpp"
 
-#include "base/core/IdMap.hpp"
 #include "base/core/Limits.hpp"
 #include "base/core/Walk.hpp"
 #include "base/eval/EvalReports.hpp"
 #include "base/eval/EvalVisitor.hpp"
 #include "base/eval/Evaluation.hpp"
 #include "base/eval/PreparedLayout.hpp"
+#include "base/util/IdMap.hpp"
 
 #include <algorithm>
 #include <stdexcept>

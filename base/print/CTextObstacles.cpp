@@ -1,8 +1,8 @@
 #include "base/print/CTextObstacles.hpp"
 
-#include "base/core/IdMap.hpp"
 #include "base/core/Walk.hpp"
 #include "base/print/PreprocessorVCExpr.hpp"
+#include "base/util/IdMap.hpp"
 #include "base/variants/VariantKeywords.hpp"
 
 #include <algorithm>

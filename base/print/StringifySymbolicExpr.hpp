@@ -4,8 +4,8 @@
 #include "base/core/Limits.hpp"
 #include "base/core/Walk.hpp"
 #include "base/print/ExpressionPrinter.hpp"
-#include "base/print/IdPages.hpp"
-#include "base/print/TextPool.hpp"
+#include "base/text/TextPool.hpp"
+#include "base/util/IdPages.hpp"
 
 #include <boost/container/small_vector.hpp>
 

@@ -2,7 +2,7 @@
 
 #include "base/core/Limits.hpp"
 #include "base/core/Walk.hpp"
-#include "base/service/ImpliedCondition.hpp"
+#include "base/decide/shorten/ImpliedCondition.hpp"
 
 #include <boost/container_hash/hash.hpp>
 

@@ -1,6 +1,6 @@
 #include "base/scan/ConstantArithmetic.hpp"
 
-#include "base/decide/Arithmetic.hpp"
+#include "base/integer/ExactArithmetic.hpp"
 
 #include <limits>
 #include <string>

@@ -1,6 +1,6 @@
 // What operators of directives' conditions make of their operands.
+#include "base/decide/shorten/ImpliedCondition.hpp"
 #include "base/scan/DirectiveCondition.hpp"
-#include "base/service/ImpliedCondition.hpp"
 
 #include <algorithm>
 #include <limits>

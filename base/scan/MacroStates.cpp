@@ -8,8 +8,8 @@
 namespace VT {
 
 MacroStates::Name MacroStates::nameOf(std::string_view text, bool lasting) {
-    SymbolicExprId hash = std::hash<std::string_view>()(text);
-    hash -= hash == invalidId ? 1U : 0U; // which is no key
+    std::uint64_t hash = std::hash<std::string_view>()(text);
+    hash -= hash == IdMap<Name>::noId ? 1U : 0U; // which is not a key
     const auto name = static_cast<Name>(texts_.size());
     Name before = name;
     if (const Name* latest = byHash_.find(hash)) {

@@ -10,8 +10,8 @@
 // of its chain, where it was not included.
 #pragma once
 
-#include "base/core/IdMap.hpp"
 #include "base/scan/MacroBody.hpp"
+#include "base/util/IdMap.hpp"
 
 #include <cstddef>
 #include <cstdint>

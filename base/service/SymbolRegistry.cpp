@@ -1,7 +1,7 @@
 #include "base/service/SymbolRegistry.hpp"
 
-#include "base/core/Hash.hpp"
 #include "base/service/AliasText.hpp"
+#include "base/util/Hash.hpp"
 
 #include <algorithm>
 #include <cstdint>

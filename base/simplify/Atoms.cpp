@@ -1,6 +1,6 @@
 #include "base/simplify/Atoms.hpp"
 
-#include "base/core/IdMap.hpp"
+#include "base/util/IdMap.hpp"
 
 #include <algorithm>
 

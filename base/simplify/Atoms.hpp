@@ -1,7 +1,7 @@
 // Conditions as sums of products: from nodes to covers and back.
 #pragma once
 
-#include "base/simplify/Cover.hpp"
+#include "base/cover/Cover.hpp"
 #include "base/simplify/RuleContext.hpp"
 
 #include <boost/unordered_map.hpp>

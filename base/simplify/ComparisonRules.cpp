@@ -1,5 +1,5 @@
 // Rules for Not and the comparisons.
-#include "base/simplify/IntegerSet.hpp"
+#include "base/integer/IntegerSet.hpp"
 #include "base/simplify/LogicalChain.hpp"
 #include "base/simplify/RuleTables.hpp"
 

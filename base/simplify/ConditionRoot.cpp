@@ -1,8 +1,8 @@
 // Looks for quotients with a walk that stops at truth values; no recursion.
 #include "base/simplify/ConditionRoot.hpp"
 
-#include "base/core/IdMap.hpp"
 #include "base/core/Nodes.hpp"
+#include "base/util/IdMap.hpp"
 
 #include <vector>
 

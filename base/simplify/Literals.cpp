@@ -1,7 +1,7 @@
 #include "base/simplify/Literals.hpp"
 
 #include "base/core/Limits.hpp"
-#include "base/simplify/IntegerSet.hpp"
+#include "base/integer/IntegerSet.hpp"
 
 #include <cmath>
 

@@ -1,9 +1,9 @@
 #include "base/simplify/LogicalChain.hpp"
 
-#include "base/core/IdMap.hpp"
 #include "base/core/Limits.hpp"
 #include "base/simplify/Atoms.hpp"
 #include "base/simplify/RuleTables.hpp"
+#include "base/util/IdMap.hpp"
 
 #include <algorithm>
 #include <iterator>

@@ -1,11 +1,11 @@
 // What every rule works with.
 #pragma once
 
-#include "base/core/IdMap.hpp"
 #include "base/core/Make.hpp"
 #include "base/core/Nodes.hpp"
 #include "base/print/ExpressionPrinter.hpp"
 #include "base/simplify/Rule.hpp"
+#include "base/util/IdMap.hpp"
 
 #include <cstdint>
 #include <optional>

@@ -1,7 +1,7 @@
 #include "base/simplify/Simplify.hpp"
 
-#include "base/core/IdMap.hpp"
 #include "base/simplify/RuleTables.hpp"
+#include "base/util/IdMap.hpp"
 #include "base/variants/VariantKeywords.hpp"
 
 namespace VT {

@@ -1,11 +1,11 @@
 // One pass of the simplifier.
 #pragma once
 
-#include "base/core/IdMap.hpp"
 #include "base/core/Limits.hpp"
 #include "base/print/ExpressionPrinter.hpp"
 #include "base/simplify/Rule.hpp"
 #include "base/transform/XForm.hpp"
+#include "base/util/IdMap.hpp"
 
 #include <memory>
 #include <vector>

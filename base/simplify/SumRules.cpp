@@ -1,8 +1,8 @@
 // Rules for sums: chains of +, - and unary minus.
-#include "base/core/IdMap.hpp"
 #include "base/core/Walk.hpp"
-#include "base/simplify/IntegerSet.hpp"
+#include "base/integer/IntegerSet.hpp"
 #include "base/simplify/Literals.hpp"
+#include "base/util/IdMap.hpp"
 
 #include <algorithm>
 #include <ranges>

@@ -1,8 +1,8 @@
 // Copies expressions from one table into another, together with the values bound to their symbols.
 #pragma once
 
-#include "base/core/IdMap.hpp"
 #include "base/transform/XForm.hpp"
+#include "base/util/IdMap.hpp"
 
 #include <vector>
 

@@ -1,8 +1,8 @@
 // The symbols that an expression mentions.
 #pragma once
 
-#include "base/core/IdMap.hpp"
 #include "base/core/Nodes.hpp"
+#include "base/util/IdMap.hpp"
 
 #include <string>
 #include <vector>

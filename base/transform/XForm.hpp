@@ -1,9 +1,9 @@
 // The bases of visitors that rebuild an expression bottom-up into a table.
 #pragma once
 
-#include "base/core/IdMap.hpp"
 #include "base/core/Nodes.hpp"
 #include "base/core/OperandStack.hpp"
+#include "base/util/IdMap.hpp"
 
 #include <cmath>
 #include <cstdint>

@@ -1,7 +1,7 @@
 // Models in files.
 #pragma once
 
-#include "host/embedded/Model.hpp"
+#include "host/embedded/EmbeddedModel.hpp"
 
 #include <stdexcept>
 #include <string>

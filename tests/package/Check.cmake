@@ -20,7 +20,7 @@ function(expect_greeting how)
 endfunction()
 
 run(${CMAKE_COMMAND} --install ${BUILD} --prefix ${prefix}/tree)
-foreach(private IN ITEMS base/core/Table.cpp base/simplify/Cover.hpp host/embedded tests)
+foreach(private IN ITEMS base/core/Table.cpp base/cover/Cover.hpp host/embedded tests)
   if(EXISTS ${prefix}/tree/include/vtsym/${private})
     message(FATAL_ERROR "installed, but private: ${private}")
   endif()

@@ -1,6 +1,6 @@
 #include "tests/preprocessor/Judges.hpp"
 
-#include "tests/support/Workplace.hpp"
+#include "tests/support/TemporaryFolder.hpp"
 
 #include <algorithm>
 #include <iterator>

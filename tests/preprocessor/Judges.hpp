@@ -1,7 +1,7 @@
 // The real preprocessor and the real compiler.
 #pragma once
 
-#include "tests/support/Truth.hpp"
+#include "tests/support/oracles/Truth.hpp"
 
 #include <string>
 #include <vector>

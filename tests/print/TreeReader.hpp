@@ -1,7 +1,7 @@
 // Expressions from prefix text, for tables of cases.
 #pragma once
 
-#include "tests/support/AnyNode.hpp"
+#include "tests/support/generators/AnyNode.hpp"
 
 #include <algorithm>
 #include <cstdlib>

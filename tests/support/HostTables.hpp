@@ -3,7 +3,7 @@
 #pragma once
 
 #include "base/core/Nodes.hpp"
-#include "tests/support/AnyNode.hpp"
+#include "tests/support/generators/AnyNode.hpp"
 
 #include <gtest/gtest.h>
 

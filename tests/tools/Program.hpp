@@ -1,7 +1,7 @@
 // Runs the program.
 #pragma once
 
-#include "tests/support/Workplace.hpp"
+#include "tests/support/TemporaryFolder.hpp"
 
 #include <map>
 #include <string>

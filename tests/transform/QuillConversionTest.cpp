@@ -1,9 +1,9 @@
 // The two shapes of one operation: C operators and calls of Quill functions.
 #include "base/transform/QuillConversion.hpp"
-#include "tests/support/AnyNode.hpp"
 #include "tests/support/Cases.hpp"
 #include "tests/support/Parsing.hpp"
 #include "tests/support/TreeText.hpp"
+#include "tests/support/generators/AnyNode.hpp"
 
 #include <gtest/gtest.h>
 

@@ -1,9 +1,9 @@
 // vtsym: symbolic expressions and variant conditions on the command line.
 #include "host/Feature.hpp"
 #include "host/Text.hpp"
-#include "tools/vtsym/Arguments.hpp"
-#include "tools/vtsym/Commands.hpp"
-#include "tools/vtsym/Files.hpp"
+#include "tools/vtsym/commands/Commands.hpp"
+#include "tools/vtsym/io/Arguments.hpp"
+#include "tools/vtsym/io/Files.hpp"
 
 #include <algorithm>
 #include <csignal>

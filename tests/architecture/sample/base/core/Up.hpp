@@ -1,7 +1,7 @@
 #include "base/core/Table.hpp"
 #include "base/print/Printer.hpp"
+#include "elsewhere/Main.hpp"
 #include "host/Log.hpp"
 #include "host/embedded/Log.hpp"
-#include "tools/vtsym/Main.hpp"
 #include <spdlog/spdlog.h>
 #include <vector>

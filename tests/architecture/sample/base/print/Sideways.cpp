@@ -2,5 +2,5 @@
 #include "base/VCService.hpp"
 #include "base/VTSymbolicExpr.hpp"
 #include "base/variants/Features.hpp"
-  #  include "parser/SymbolicExprParser.hpp"
+#include "parser/SymbolicExprParser.hpp"
 #include <boost/spirit/include/qi.hpp>

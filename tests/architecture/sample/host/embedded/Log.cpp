@@ -1,3 +1,3 @@
-#include "base/core/Table.hpp"
 #include "host/Log.hpp"
+#include "base/core/Table.hpp"
 #include <spdlog/spdlog.h>

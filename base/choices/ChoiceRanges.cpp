@@ -1,0 +1,162 @@
+#include "base/choices/ChoiceRanges.hpp"
+
+#include "base/core/Nodes.hpp"
+#include "base/core/Operators.hpp"
+#include "base/variants/VariantKeywords.hpp"
+
+#include <boost/unordered_map.hpp>
+
+#include <algorithm>
+#include <limits>
+#include <numeric>
+#include <optional>
+
+namespace VT {
+
+namespace {
+
+constexpr std::size_t mostOperands = 64; ///< that one condition is taken apart into
+
+constexpr std::int64_t lowest = std::numeric_limits<std::int64_t>::min();
+constexpr std::int64_t highest = std::numeric_limits<std::int64_t>::max();
+
+/// A name that stands for an integer and nothing else.
+bool isName(const SymbolicExprTable& table, SymbolicExprId id) {
+    const SymbolicExpr* const node = table.get(id);
+    if (node == nullptr || node->op() != SymbolicOp::String || id == table.getIdTRUE() || id == table.getIdFALSE())
+        return false;
+    return !VariantKeywords::isVariantKeyword(static_cast<const SymbolicString*>(node)->getName(), false);
+}
+
+/// The range of a comparison of a name with an integer.
+std::optional<NameRange> rangeOf(const SymbolicExprTable& table, SymbolicExprId id) {
+    const SymbolicExpr& node = *table.get(id);
+    const auto& row = operatorTable()[static_cast<std::size_t>(node.op())];
+    if (row.mirrored == SymbolicOp::None)
+        return std::nullopt;
+    SymbolicOp op = node.op();
+    SymbolicExprId name = node.getInput(0);
+    SymbolicExprId literal = node.getInput(1);
+    if (!table.hasOperand(id, name) || !table.hasOperand(id, literal))
+        return std::nullopt;
+    if (isName(table, literal)) {
+        std::swap(name, literal);
+        op = row.mirrored;
+    }
+    const SymbolicExpr* const number = table.get(literal);
+    if (!isName(table, name) || number == nullptr || number->op() != SymbolicOp::IntValue)
+        return std::nullopt;
+    const std::int64_t value = static_cast<const SymbolicIntValue*>(number)->getValue();
+    switch (op) {
+    case SymbolicOp::Equal:
+        return NameRange{name, value, value};
+    case SymbolicOp::LessThan:
+        return NameRange{name, lowest, value - 1};
+    case SymbolicOp::LessThanEqual:
+        return NameRange{name, lowest, value};
+    case SymbolicOp::GreaterThan:
+        return NameRange{name, value + 1, highest};
+    case SymbolicOp::GreaterThanEqual:
+        return NameRange{name, value, highest};
+    default:
+        return std::nullopt;
+    }
+}
+
+/// The operands of a chain of one operator, as many as are looked at; nothing where there are more.
+std::vector<SymbolicExprId> operandsOf(const SymbolicExprTable& table, SymbolicExprId chain, SymbolicOp op) {
+    std::vector<SymbolicExprId> operands;
+    std::vector<SymbolicExprId> open{chain};
+    for (std::size_t seen = 0; !open.empty(); ++seen) {
+        const SymbolicExprId id = open.back();
+        open.pop_back();
+        const SymbolicExpr& node = *table.get(id);
+        if (node.op() != op) {
+            operands.push_back(id);
+            continue;
+        }
+        for (const std::size_t i : {1U, 0U}) {
+            if (!table.hasOperand(id, node.getInput(i)) || seen > 2 * mostOperands)
+                return {};
+            open.push_back(node.getInput(i));
+        }
+    }
+    return operands;
+}
+
+/// The ranges of an And.
+NameRanges rangesOfProduct(const SymbolicExprTable& table, SymbolicExprId product) {
+    NameRanges ranges;
+    for (const SymbolicExprId operand : operandsOf(table, product, SymbolicOp::And)) {
+        const std::optional<NameRange> range = rangeOf(table, operand);
+        if (!range)
+            continue;
+        const auto at = std::ranges::lower_bound(ranges, range->name, {}, &NameRange::name);
+        if (at == ranges.end() || at->name != range->name) {
+            ranges.insert(at, *range);
+            continue;
+        }
+        at->low = std::max(at->low, range->low);
+        at->high = std::min(at->high, range->high);
+    }
+    return ranges;
+}
+
+} // namespace
+
+NameRanges rangesOf(const SymbolicExprTable& table, SymbolicExprId condition) {
+    if (!table.has(condition))
+        return {};
+    std::optional<NameRanges> ranges;
+    for (const SymbolicExprId product : operandsOf(table, condition, SymbolicOp::Or)) {
+        NameRanges next = rangesOfProduct(table, product);
+        ranges = ranges ? joined(*ranges, next) : std::move(next);
+    }
+    return std::move(ranges).value_or(NameRanges());
+}
+
+NameRanges joined(const NameRanges& a, const NameRanges& b) {
+    NameRanges result;
+    auto other = b.begin();
+    for (const NameRange& range : a) {
+        other = std::find_if(other, b.end(), [&](const NameRange& each) { return each.name >= range.name; });
+        if (other != b.end() && other->name == range.name)
+            result.push_back({range.name, std::min(range.low, other->low), std::max(range.high, other->high)});
+    }
+    return result;
+}
+
+bool areApart(const NameRanges& a, const NameRanges& b) {
+    auto other = b.begin();
+    for (const NameRange& range : a) {
+        other = std::find_if(other, b.end(), [&](const NameRange& each) { return each.name >= range.name; });
+        if (other != b.end() && other->name == range.name && (range.high < other->low || other->high < range.low))
+            return true;
+    }
+    return false;
+}
+
+std::vector<std::size_t> sortedByRange(const std::vector<NameRanges>& ranges) {
+    boost::unordered_map<SymbolicExprId, std::size_t> uses;
+    for (const NameRanges& each : ranges)
+        for (const NameRange& range : each)
+            ++uses[range.name];
+    SymbolicExprId key = invalidId;
+    std::size_t most = 0;
+    for (const auto& [name, count] : uses) {
+        if (count > most || (count == most && name < key)) {
+            key = name;
+            most = count;
+        }
+    }
+    const auto lowOf = [&](std::size_t position) {
+        const auto at = std::ranges::lower_bound(ranges[position], key, {}, &NameRange::name);
+        return at == ranges[position].end() || at->name != key ? highest : at->low;
+    };
+    std::vector<std::size_t> sorted(ranges.size());
+    std::iota(sorted.begin(), sorted.end(), std::size_t{0});
+    std::ranges::stable_sort(sorted, {}, lowOf);
+    return sorted;
+}
+
+} // namespace VT

@@ -1,0 +1,125 @@
+// Covers made smaller by comparing cubes with each other.
+#include "base/cover/CoverOccurrences.hpp"
+
+#include <boost/unordered_map.hpp>
+
+#include <algorithm>
+
+namespace VT {
+
+bool absorb(Cover& cover) {
+    const auto always = std::ranges::find_if(cover, &Cube::alwaysHolds);
+    if (always != cover.end()) {
+        const bool smaller = cover.size() > 1;
+        cover.assign(1, Cube());
+        return smaller;
+    }
+    const Occurrences occurrences(cover);
+    std::vector<bool> absorbed(cover.size(), false);
+    bool any = false;
+    for (std::size_t i = 0; i < cover.size(); ++i) {
+        if (absorbed[i])
+            continue;
+        for (const std::size_t j : occurrences.candidatesBelow(cover[i])) {
+            if (j != i && !absorbed[j] && cover[j].isSubsetOf(cover[i]))
+                any = absorbed[j] = true;
+        }
+    }
+    if (any)
+        eraseMarked(cover, absorbed);
+    return any;
+}
+
+namespace {
+
+/// The sum of a cube's hashes, from which the hash of the cube without one constraint is a subtraction.
+std::uint64_t hashOf(const Cube& cube) {
+    std::uint64_t sum = 0;
+    for (const Constraint& constraint : cube.constraints())
+        sum += hash_value(constraint);
+    return sum;
+}
+
+/// Joins the cubes of a group, which are equal but for one atom.  Tells whether they became fewer or shorter.
+bool joinGroup(Cover& cover, const std::vector<std::size_t>& group, Atom atom, std::vector<bool>& gone,
+               std::vector<std::uint64_t>& hashes) {
+    std::vector<IntegerSet> sets;
+    std::size_t comparisonsBefore = 0;
+    for (const std::size_t i : group) {
+        sets.push_back(*cover[i].find(atom));
+        comparisonsBefore += cover[i].comparisons();
+    }
+    const std::vector<IntegerSet> joined = joinSets(sets);
+    if (joined.size() > sets.size())
+        return false;
+    std::vector<Cube> cubes;
+    std::size_t comparisonsAfter = 0;
+    for (const IntegerSet& set : joined) {
+        cubes.push_back(cover[group.front()]);
+        cubes.back().assign(atom, set);
+        comparisonsAfter += cubes.back().comparisons();
+    }
+    if (joined.size() == sets.size() && comparisonsAfter >= comparisonsBefore)
+        return false;
+    for (std::size_t i = 0; i < group.size(); ++i) {
+        if (i < cubes.size()) {
+            cover[group[i]] = std::move(cubes[i]);
+            hashes[group[i]] = hashOf(cover[group[i]]);
+        } else {
+            gone[group[i]] = true;
+        }
+    }
+    return true;
+}
+
+bool equalButFor(const Cube& a, const Cube& b, Atom atom) {
+    return std::ranges::equal(a.constraints(), b.constraints(), [atom](const Constraint& x, const Constraint& y) {
+        return x.atom == y.atom && (x.atom == atom || x.set == y.set);
+    });
+}
+
+/// Of the cubes that restrict an atom, those that say the same but for it, in groups of two and more.
+std::vector<std::vector<std::size_t>> groupsButFor(const Cover& cover, Atom atom,
+                                                   const std::vector<std::size_t>& members,
+                                                   const std::vector<bool>& gone,
+                                                   const std::vector<std::uint64_t>& hashes) {
+    std::vector<std::vector<std::size_t>> groups;
+    boost::unordered_map<std::uint64_t, std::size_t> byHash;
+    for (const std::size_t i : members) {
+        const IntegerSet* set = gone[i] ? nullptr : cover[i].find(atom);
+        if (set == nullptr)
+            continue;
+        const auto [at, added] = byHash.try_emplace(hashes[i] - hash_value(Constraint{atom, *set}), groups.size());
+        if (added)
+            groups.emplace_back();
+        std::vector<std::size_t>& group = groups[at->second];
+        if (group.empty() || equalButFor(cover[group.front()], cover[i], atom))
+            group.push_back(i);
+    }
+    std::erase_if(groups, [](const auto& group) { return group.size() < 2; });
+    return groups;
+}
+
+} // namespace
+
+bool joinCubes(Cover& cover) {
+    if (cover.size() < 2)
+        return false;
+    const Occurrences occurrences(cover);
+    std::vector<bool> gone(cover.size(), false);
+    std::vector<std::uint64_t> hashes;
+    for (const Cube& cube : cover)
+        hashes.push_back(hashOf(cube));
+    bool any = false;
+    for (Atom atom = 0; atom < occurrences.atoms(); ++atom) {
+        if (occurrences.of(atom).size() < 2)
+            continue;
+        for (const std::vector<std::size_t>& group : groupsButFor(cover, atom, occurrences.of(atom), gone, hashes))
+            any = joinGroup(cover, group, atom, gone, hashes) || any;
+    }
+    if (any)
+        eraseMarked(cover, gone);
+    return any;
+}
+
+} // namespace VT

@@ -1,0 +1,164 @@
+// How conditions stand to each other.
+#include "base/service/ServiceParts.hpp"
+#include "base/service/VCService.hpp"
+#include "base/variants/VariantKeywords.hpp"
+
+#include <algorithm>
+
+namespace VT {
+
+namespace {
+
+Decision noCondition() {
+    return {Answer::Undecided, DecisionBound::NoCondition, std::nullopt};
+}
+
+/// What is asked about a set, with operators in the place of the calls that Quill writes for them.
+SetDecision askAbout(ServiceParts& parts, SetDecision (Decider::*question)(std::span<const SymbolicExprId>),
+                     const std::vector<VCSymbolicExprId>& conditions) {
+    std::vector<SymbolicExprId> converted;
+    converted.reserve(conditions.size());
+    for (const VCSymbolicExprId& condition : conditions) {
+        if (!parts.table.has(condition.id()))
+            return {noCondition(), std::nullopt};
+        converted.push_back(parts.toC(condition.id()));
+    }
+    return (parts.decider().*question)(converted);
+}
+
+} // namespace
+
+bool ServiceParts::keywordsInForce() const {
+    return keywordFlag && isVariantKeywordsSimCodegenFeatureOn();
+}
+
+unsigned ServiceParts::decisionMode() const {
+    return (keywordsInForce() ? 1U : 0U) + (bits32 ? 2U : 0U);
+}
+
+Decider& ServiceParts::decider() {
+    std::unique_ptr<Decider>& decider = deciders.at(decisionMode());
+    if (decider == nullptr)
+        decider =
+            std::make_unique<Decider>(table, DecisionOptions{.keywordsInForce = keywordsInForce(), .bits32 = bits32});
+    return *decider;
+}
+
+/// The decision about a pair, from the cache where it is there.
+Decision VCService::ask(PairQuestion question, const VCSymbolicExprId& a, const VCSymbolicExprId& b,
+                        std::uint64_t steps) {
+    if (!has(a) || !has(b))
+        return noCondition();
+    const bool ordered = question == PairQuestion::FirstAlone;
+    const DecisionCache::Key key{ordered ? a.id() : std::min(a.id(), b.id()),
+                                 ordered ? b.id() : std::max(a.id(), b.id()), question, parts_->decisionMode()};
+    if (const Decision* known = parts_->caching ? parts_->decisions.find(key) : nullptr)
+        return *known;
+    // Operators that Quill writes as calls are decided as operators.
+    const SymbolicExprId first = parts_->toC(key.a);
+    const SymbolicExprId second = parts_->toC(key.b);
+    Decider& decider = parts_->decider();
+    decider.limitSteps(steps);
+    Decision decision = question == PairQuestion::Both         ? decider.overlaps(first, second)
+                        : question == PairQuestion::FirstAlone ? decider.implies(first, second).opposite()
+                                                               : decider.equivalent(first, second).opposite();
+    decider.limitSteps(limits::decisionSteps);
+    // What stays undecided with fewer steps may be decided with all.
+    if (parts_->caching && (steps == limits::decisionSteps || !decision.isUndecided()))
+        parts_->decisions.insert(key, decision);
+    return decision;
+}
+
+void VCService::setDecisions32Bit(bool are32Bit) {
+    parts_->bits32 = are32Bit;
+}
+
+Decision VCService::canHold(const VCSymbolicExprId& condition) {
+    return ask(PairQuestion::Both, condition, condition);
+}
+
+Decision VCService::mustHold(const VCSymbolicExprId& condition) {
+    return implies(parts_->table.getIdTRUE(), condition);
+}
+
+Decision VCService::implies(const VCSymbolicExprId& a, const VCSymbolicExprId& b) {
+    return ask(PairQuestion::FirstAlone, a, b).opposite();
+}
+
+Decision VCService::isEquivalent(const VCSymbolicExprId& a, const VCSymbolicExprId& b) {
+    return ask(PairQuestion::Differ, a, b).opposite();
+}
+
+Decision VCService::isDisjoint(const VCSymbolicExprId& a, const VCSymbolicExprId& b) {
+    return ask(PairQuestion::Both, a, b).opposite();
+}
+
+Decision VCService::contains(const VCSymbolicExprId& outer, const VCSymbolicExprId& inner) {
+    return implies(inner, outer);
+}
+
+Decision VCService::isTighterThan(const VCSymbolicExprId& a, const VCSymbolicExprId& b) {
+    Decision aImpliesB = implies(a, b);
+    if (aImpliesB.isNo())
+        return aImpliesB;
+    Decision onlyB = ask(PairQuestion::FirstAlone, b, a);
+    return aImpliesB.isUndecided() && !onlyB.isNo() ? aImpliesB : onlyB;
+}
+
+Relation VCService::compare(const VCSymbolicExprId& a, const VCSymbolicExprId& b) {
+    std::uint64_t steps = limits::decisionSteps;
+    const auto next = [&](PairQuestion question, const VCSymbolicExprId& x, const VCSymbolicExprId& y) {
+        Decision decision = ask(question, x, y, steps);
+        if (decision.bound == DecisionBound::Steps)
+            steps = limits::furtherSteps;
+        return decision;
+    };
+    Decision onlyA = next(PairQuestion::FirstAlone, a, b);
+    Decision onlyB = next(PairQuestion::FirstAlone, b, a);
+    return Relation::of(std::move(onlyA), std::move(onlyB), next(PairQuestion::Both, a, b));
+}
+
+SetDecision VCService::covers(const std::vector<VCSymbolicExprId>& conditions) {
+    return askAbout(*parts_, &Decider::covers, conditions);
+}
+
+SetDecision VCService::isDisjoint(const std::vector<VCSymbolicExprId>& conditions) {
+    return askAbout(*parts_, &Decider::disjoint, conditions);
+}
+
+// Sums of products.
+
+std::vector<VCSymbolicExprId> VCService::uniqueOperands(const VCSymbolicExprId& condition, bool ofAnd) {
+    if (!has(condition))
+        return {};
+    const SymbolicExprTable& table = parts_->table;
+    const SymbolicExprId simple = simplify(condition, true).id();
+    if (simple == (ofAnd ? table.getIdTRUE() : table.getIdFALSE()))
+        return {};
+    boost::container::flat_set<SymbolicExprId> operands;
+    if (ofAnd)
+        parts_->simplifier.computeUniqueAndOperandsId(*table.get(simple), operands);
+    else
+        parts_->simplifier.computeUniqueOrOperandsId(*table.get(simple), operands);
+    std::vector<SymbolicExprId> sorted(operands.begin(), operands.end());
+    std::ranges::sort(
+        sorted, [&](SymbolicExprId a, SymbolicExprId b) { return parts_->quillPrinter.compareUsingCache(a, b) < 0; });
+    return {sorted.begin(), sorted.end()};
+}
+
+std::vector<VCSymbolicExprId> VCService::computeUniqueAndOperandsId(const VCSymbolicExprId& condition) {
+    return uniqueOperands(condition, true);
+}
+
+std::vector<VCSymbolicExprId> VCService::computeUniqueOrOperandsId(const VCSymbolicExprId& condition) {
+    return uniqueOperands(condition, false);
+}
+
+std::string VCService::printWitness(const Witness& witness) {
+    std::string text;
+    for (const UnknownValue& each : witness)
+        text += (text.empty() ? "" : ", ") + parts_->cPrinter(each.unknown) + "=" + std::to_string(each.value);
+    return text;
+}
+
+} // namespace VT

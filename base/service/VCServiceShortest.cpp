@@ -1,0 +1,63 @@
+// Conditions made shorter: everywhere, or where another one is known to hold.
+#include "base/decide/shorten/ConditionProofs.hpp"
+#include "base/decide/shorten/ShortestForm.hpp"
+#include "base/service/ServiceParts.hpp"
+#include "base/service/VCService.hpp"
+#include "base/simplify/ConditionRoot.hpp"
+
+namespace VT {
+
+namespace {
+
+/// The shortened form as a condition of its own, or the given one where that would be longer.
+SymbolicExprId noLonger(SymbolicExprTable& table, const SymbolicExprPrinter& printer, SymbolicExprId shortened,
+                        SymbolicExprId given) {
+    if (shortened == given || !booleanOps.contains(table.get(given)->op()))
+        return shortened;
+    const SymbolicExprId condition = asConditionOfItsOwn(table, shortened);
+    return condition == shortened || printer.textLength(condition) <= printer.textLength(given) ? condition : given;
+}
+
+} // namespace
+
+VCSymbolicExprId VCService::shortestCondition(const VCSymbolicExprId& condition, bool isQuill,
+                                              std::vector<ShortForm>* forms) {
+    if (forms != nullptr)
+        forms->clear();
+    if (!has(condition))
+        return invalidId;
+    const SymbolicExprId given = isQuill ? condition.id() : parts_->toC(condition.id());
+    const SymbolicExprPrinter& printer = isQuill ? parts_->quillPrinter : parts_->cPrinter;
+    SymbolicExprTable& table = parts_->table;
+    const auto normalForm = [&] { return simplify(given, isQuill).id(); };
+    // A number is no condition: its value counts, not whether it is 0.
+    if (!booleanOps.contains(table.get(given)->op())) {
+        const SymbolicExprId simple = normalForm();
+        return printer.textLength(simple) <= printer.textLength(given) ? simple : given;
+    }
+    ConditionProofs proofs(parts_->decider(), parts_->toC, given, table.getIdTRUE(), false);
+    ShortestForm search(table, printer, parts_->keywordsInForce(), proofs);
+    // Bounds of the unknowns are something to know.
+    const SymbolicExprId result = search.find(given, parts_->bits32 ? table.getIdTRUE() : invalidId, normalForm);
+    if (forms != nullptr)
+        *forms = search.forms();
+    return noLonger(table, printer, result, given);
+}
+
+VCSymbolicExprId VCService::getImpliedCondition(const VCSymbolicExprId& condition, const VCSymbolicExprId& known,
+                                                bool isQuill) {
+    if (!has(condition) || !has(known))
+        return invalidId;
+    SymbolicExprTable& table = parts_->table;
+    const SymbolicExprId given = isQuill ? condition.id() : parts_->toC(condition.id());
+    const SymbolicExprId context = isQuill ? known.id() : parts_->toC(known.id());
+    ConditionProofs proofs(parts_->decider(), parts_->toC, given, context, true);
+    if (const auto decided = proofs.decided(given))
+        return *decided ? table.getIdTRUE() : table.getIdFALSE();
+    const SymbolicExprPrinter& printer = isQuill ? parts_->quillPrinter : parts_->cPrinter;
+    const auto normalForm = [&] { return simplify(given, isQuill).id(); };
+    ShortestForm search(table, printer, parts_->keywordsInForce(), proofs);
+    return noLonger(table, printer, search.find(given, context, normalForm), given);
+}
+
+} // namespace VT

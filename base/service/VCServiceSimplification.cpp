@@ -1,0 +1,64 @@
+// Conditions simplified: caches, customizer, simplifier.
+#include "base/service/ServiceParts.hpp"
+#include "base/service/VCService.hpp"
+#include "base/simplify/SimplifyVisitorBlockVariants.hpp"
+
+namespace VT {
+
+VCSymbolicExprId VCService::simplify(const VCSymbolicExprId& condition, bool isQuill) {
+    if (!has(condition))
+        return invalidId;
+    auto& cache = ServiceParts::of(parts_->simplified, isQuill);
+    if (const auto known = parts_->caching ? cache.find(condition.id()) : std::nullopt)
+        return *known;
+    SymbolicExprId result = invalidId;
+    if (const SymbolicExprId other = rewritten(condition.id()); other != condition.id())
+        result = simplifyNow(other, isQuill);
+    // A rewrite is a way to decide a condition; one that it leaves open keeps its own symbols.
+    if (result != parts_->table.getIdTRUE() && result != parts_->table.getIdFALSE())
+        result = simplifyNow(condition.id(), isQuill);
+    if (parts_->caching)
+        cache.insert(condition.id(), result);
+    return result;
+}
+
+/// What the customizer puts in the place of a condition; the condition itself where it has no say.
+SymbolicExprId VCService::rewritten(SymbolicExprId condition) {
+    const SymbolicExprTable& table = parts_->table;
+    const bool constant = condition == table.getIdTRUE() || condition == table.getIdFALSE();
+    if (parts_->customizer == nullptr || constant)
+        return condition;
+    const SymbolicExprId other = parts_->customizer->rewrite(condition, parts_->table);
+    return table.has(other) ? other : condition;
+}
+
+SymbolicExprId VCService::simplifyNow(SymbolicExprId condition, bool isQuill) {
+    VCCustomizer* const customizer = parts_->customizer.get();
+    // Asked without a customizer the visitor would answer self-comparisons the wrong way round.
+    const bool ask = isQuill && customizer != nullptr;
+    const SymbolicExprSimplify& simplifier = parts_->simplifier;
+    SymbolicExprSimplifyVisitorBlockVariants visitor(parts_->table, parts_->keywordFlag, simplifier.printer(), ask,
+                                                     customizer);
+    std::uint64_t passes = 0;
+    return simplifier.simplify(condition, passes, visitor);
+}
+
+VCSymbolicExprId VCService::simplifyFrom(const std::string& text, bool isQuill) {
+    auto& cache = ServiceParts::of(parts_->simplifiedFromText, isQuill);
+    if (const auto known = parts_->caching ? cache.find(text) : std::nullopt)
+        return *known;
+    const SymbolicExprId result = simplify(parse(text, isQuill), isQuill).id();
+    if (parts_->caching)
+        cache.insert(text, result);
+    return result;
+}
+
+VCSymbolicExprId VCService::simplifyFromCCondition(const std::string& text) {
+    return simplifyFrom(text, false);
+}
+
+VCSymbolicExprId VCService::simplifyFromQCondition(const std::string& text) {
+    return simplifyFrom(text, true);
+}
+
+} // namespace VT

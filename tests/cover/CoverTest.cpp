@@ -1,0 +1,140 @@
+// Sets of integers and sums of products against brute force over a window of values.
+#include "base/cover/Cover.hpp"
+
+#include <gtest/gtest.h>
+#include <rapidcheck/gtest.h>
+
+namespace VT::Testing {
+namespace {
+
+constexpr std::int64_t low = -6;
+constexpr std::int64_t high = 6;
+
+IntegerSet anySet() {
+    IntegerSet set = *rc::gen::inRange(0, 2) == 0 ? IntegerSet::all() : IntegerSet();
+    for (int i = *rc::gen::inRange(0, 4); i > 0; --i) {
+        const SymbolicOp op = static_cast<SymbolicOp>(*rc::gen::inRange(9, 15));
+        const IntegerSet next = IntegerSet::satisfying(op, *rc::gen::inRange<std::int64_t>(-4, 5));
+        set = *rc::gen::inRange(0, 2) == 0 ? set.intersect(next) : set.unite(next);
+    }
+    return set;
+}
+
+RC_GTEST_PROP(IntegerSets, FollowTheirMembers, ()) {
+    const IntegerSet a = anySet();
+    const IntegerSet b = anySet();
+    bool subset = true;
+    bool common = false;
+    for (std::int64_t x = low; x <= high; ++x) {
+        const bool inA = a.contains(x);
+        const bool inB = b.contains(x);
+        RC_ASSERT(a.complement().contains(x) == !inA);
+        RC_ASSERT(a.intersect(b).contains(x) == (inA && inB));
+        RC_ASSERT(a.unite(b).contains(x) == (inA || inB));
+        RC_ASSERT(a.minus(b).contains(x) == (inA && !inB));
+        subset = subset && (!inA || inB);
+        common = common || (inA && inB);
+    }
+    // The window reaches beyond every constant, so it decides for all integers.
+    RC_ASSERT(a.isSubsetOf(b) == subset);
+    RC_ASSERT(a.intersects(b) == common);
+    RC_ASSERT(a.complement().complement() == a);
+}
+
+RC_GTEST_PROP(IntegerSets, JoinedSetsAreTheirUnionAndNoLonger, ()) {
+    std::vector<IntegerSet> sets;
+    std::size_t before = 0;
+    for (int i = *rc::gen::inRange(1, 5); i > 0; --i) {
+        const std::int64_t from = *rc::gen::inRange<std::int64_t>(-4, 5);
+        const std::int64_t to = from + *rc::gen::inRange<std::int64_t>(0, 3);
+        const IntegerSet shapes[] = {
+            {from, to}, {IntegerSet::minusInfinity, to}, {from, IntegerSet::plusInfinity}, IntegerSet::allBut(from)};
+        sets.push_back(shapes[*rc::gen::inRange(0, 4)]);
+        before += sets.back().comparisons();
+    }
+    IntegerSet united;
+    for (const IntegerSet& set : sets)
+        united = united.unite(set);
+    IntegerSet joined;
+    std::size_t after = 0;
+    for (const IntegerSet& set : joinSets(sets)) {
+        joined = joined.unite(set);
+        after += set.comparisons();
+    }
+    RC_ASSERT(joined == united);
+    RC_ASSERT(after <= before);
+}
+
+constexpr Atom atoms = 3;
+
+Cover anyCover() {
+    Cover cover;
+    for (int i = *rc::gen::inRange(0, 7); i > 0; --i) {
+        Cube cube;
+        bool possible = true;
+        for (int j = *rc::gen::inRange(0, 4); j > 0; --j) {
+            const SymbolicOp op = static_cast<SymbolicOp>(*rc::gen::inRange(9, 15));
+            possible = cube.restrict(*rc::gen::inRange<Atom>(0, atoms),
+                                     IntegerSet::satisfying(op, *rc::gen::inRange<std::int64_t>(-2, 3))) &&
+                       possible;
+        }
+        if (possible)
+            cover.push_back(cube);
+    }
+    return cover;
+}
+
+/// The truth of a cover at every point of the window.
+std::vector<bool> truth(const Cover& cover) {
+    std::vector<bool> result;
+    std::int64_t values[atoms];
+    for (values[0] = -4; values[0] <= 4; ++values[0])
+        for (values[1] = -4; values[1] <= 4; ++values[1])
+            for (values[2] = -4; values[2] <= 4; ++values[2])
+                result.push_back(std::ranges::any_of(cover, [&](const Cube& cube) {
+                    return std::ranges::all_of(cube.constraints(),
+                                               [&](const Constraint& c) { return c.set.contains(values[c.atom]); });
+                }));
+    return result;
+}
+
+RC_GTEST_PROP(Covers, GetSmallerAndStayTheSame, ()) {
+    const Cover before = anyCover();
+    const std::vector<bool> expected = truth(before);
+    for (int step = 0; step < 5; ++step) {
+        Cover cover = before;
+        CoverBudget budget{step < 4 ? 1000U : 0U};
+        const bool changed = step == 0   ? absorb(cover)
+                             : step == 1 ? joinCubes(cover)
+                             : step == 2 ? dropComparisons(cover, budget)
+                             : step == 3 ? dropCubes(cover, budget)
+                                         : dropComparisons(cover, budget) || dropCubes(cover, budget);
+        RC_ASSERT(truth(cover) == expected);
+        RC_ASSERT(comparisons(cover) + cover.size() <= comparisons(before) + before.size());
+        RC_ASSERT(changed == !(cover == before));
+    }
+}
+
+RC_GTEST_PROP(Covers, CombineExactly, ()) {
+    const Cover a = anyCover();
+    const Cover b = anyCover();
+    const std::vector<bool> inA = truth(a);
+    const std::vector<bool> inB = truth(b);
+    const std::vector<bool> both = truth(product(a, b));
+    for (std::size_t i = 0; i < both.size(); ++i)
+        RC_ASSERT(both[i] == (inA[i] && inB[i]));
+    for (const Cube& cube : a) {
+        const std::vector<bool> inCube = truth({cube});
+        const std::vector<bool> outside = truth(complement(cube));
+        bool covered = true;
+        for (std::size_t i = 0; i < inCube.size(); ++i) {
+            RC_ASSERT(outside[i] == !inCube[i]);
+            covered = covered && (!inCube[i] || inB[i]);
+        }
+        CoverBudget budget{100000};
+        RC_ASSERT(covers(b, cube, budget) == covered);
+    }
+}
+
+} // namespace
+} // namespace VT::Testing

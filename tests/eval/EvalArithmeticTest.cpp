@@ -1,0 +1,431 @@
+// Every operator on every pair of corner values, and expressions in every way of evaluation, against arithmetic written
+// down again over wide integers.
+#include "base/eval/Eval.hpp"
+#include "base/eval/EvalVisitor.hpp"
+#include "tests/support/generators/AnyNode.hpp"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cmath>
+#include <functional>
+#include <limits>
+#include <map>
+#include <random>
+#include <set>
+
+namespace VT::Testing {
+namespace {
+
+constexpr double infinity = std::numeric_limits<double>::infinity();
+constexpr double threshold = 1.4901161193847656e-08;
+constexpr std::int64_t greatest = 2147483647;
+constexpr std::int64_t least = -2147483648;
+
+/// Values at which something changes: bounds of int, of shifts and of the tolerance, signs, halves, what is no number.
+const std::vector<SymbolicScalar>& corners() {
+    static const std::vector<SymbolicScalar> all = [] {
+        std::vector<SymbolicScalar> values{false, true, std::numeric_limits<double>::quiet_NaN()};
+        for (const int value :
+             {-2147483647 - 1, -2147483647, -33, -32, -31, -7, -1, 0, 1, 2, 31, 32, 33, 46341, 2147483646, 2147483647})
+            values.emplace_back(value);
+        for (const double value : {threshold, std::nextafter(threshold, 0.0), std::nextafter(threshold, 1.0), 0.0, 0.5,
+                                   0.3, 0.1 + 0.2, 1.0, 1.0 + threshold, 31.9, 32.0, 2147483647.5, 2147483648.0,
+                                   2147483648.5, 2147483649.0, 1e300, 5e-324, infinity})
+            values.insert(values.end(), {value, -value});
+        return values;
+    }();
+    return all;
+}
+
+SymbolicExprId literal(SymbolicExprTable& table, const SymbolicScalar& value) {
+    if (value.type() == ScalarType::Bool)
+        return SymbolicString(table, value.getBool() ? "true" : "false").getId(table);
+    if (value.type() == ScalarType::Int)
+        return SymbolicIntValue(table, value.getInt()).getId(table);
+    if (value == SymbolicScalar(-0.0)) // as a literal it is that of 0
+        return SymbolicUnaryMinusExpr(table, literal(table, 0.0)).getId(table);
+    const SymbolicExprId found = SymbolicDoubleValue(table, value.getDouble()).getId(table);
+    return found != invalidId ? found : table.size() - 1; // NaN is not found
+}
+
+/// A scalar in the oracle's hands: an integer without bounds, or a real.
+struct Wide {
+    bool isReal;
+    bool isBool;
+    std::int64_t integer;
+    double real;
+
+    explicit Wide(const SymbolicScalar& scalar)
+        : isReal(scalar.index() == 2),
+          isBool(scalar.index() == 0),
+          integer(isReal   ? 0
+                  : isBool ? (scalar.getBool() ? 1 : 0)
+                           : scalar.getInt()),
+          real(isReal ? scalar.getDouble() : static_cast<double>(integer)) {}
+
+    /// What bit operators see.
+    [[nodiscard]] std::int64_t bits() const {
+        if (!isReal)
+            return integer;
+        if (std::isnan(real))
+            return 0;
+        return static_cast<std::int64_t>(std::clamp(std::trunc(real), -2147483648.0, 2147483647.0));
+    }
+
+    [[nodiscard]] bool isTrue() const { return isReal ? !(real == 0.0) : integer != 0; }
+};
+
+/// The integer of 32 bits that is congruent.
+SymbolicScalar wrap(std::int64_t value) {
+    return static_cast<std::int32_t>(value);
+}
+
+SymbolicScalar saturate(std::int64_t value) {
+    return static_cast<std::int32_t>(std::clamp(value, least, greatest));
+}
+
+/// By a power of two, rounded down.
+SymbolicScalar shift(std::int64_t value, std::int64_t amount) {
+    if (amount < 0)
+        return wrap(value >> std::min<std::int64_t>(-amount, 63));
+    return amount > 31 ? SymbolicScalar(0) : wrap(value << amount);
+}
+
+SymbolicScalar divide(const Wide& a, const Wide& b) {
+    if (a.isReal || b.isReal) {
+        if (b.real >= threshold || b.real <= -threshold)
+            return a.real / b.real;
+        return std::isnan(a.real) ? a.real : std::signbit(a.real) && a.real != 0 ? -infinity : infinity;
+    }
+    if (b.integer != 0)
+        return saturate(a.integer / b.integer);
+    if (a.integer == 0)
+        return !a.isBool && !b.isBool ? 0 : static_cast<std::int32_t>(greatest);
+    return static_cast<std::int32_t>(a.integer > 0 ? greatest : least);
+}
+
+SymbolicScalar remainder(const Wide& a, const Wide& b) {
+    if (a.isReal || b.isReal)
+        return b.real > -threshold && b.real < threshold ? a.real : std::fmod(a.real, b.real);
+    return saturate(b.integer == 0 ? a.integer : a.integer % b.integer);
+}
+
+bool equal(const Wide& a, const Wide& b) {
+    if (!a.isReal && !b.isReal)
+        return a.integer == b.integer;
+    if (std::isnan(a.real) || std::isnan(b.real))
+        return std::isnan(a.real) && std::isnan(b.real);
+    return a.real == b.real || std::abs(a.real - b.real) < threshold;
+}
+
+bool less(const Wide& a, const Wide& b) {
+    return a.isReal || b.isReal ? a.real < b.real : a.integer < b.integer;
+}
+
+SymbolicScalar expected(SymbolicOp op, const Wide& a, const Wide& b) {
+    const bool real = a.isReal || b.isReal;
+    const auto number = [&](double inReals, std::int64_t inIntegers) {
+        return real ? SymbolicScalar(inReals) : wrap(inIntegers);
+    };
+    using Op = SymbolicOp;
+    const std::map<Op, std::function<SymbolicScalar()>> answers{
+        {Op::Plus, [&] { return number(a.real + b.real, a.integer + b.integer); }},
+        {Op::Minus, [&] { return number(a.real - b.real, a.integer - b.integer); }},
+        {Op::Multiply, [&] { return number(a.real * b.real, a.integer * b.integer); }},
+        {Op::UnaryMinus, [&] { return a.isReal ? SymbolicScalar(-a.real) : wrap(-a.integer); }},
+        {Op::Divide, [&] { return divide(a, b); }},
+        {Op::Modulo, [&] { return remainder(a, b); }},
+        {Op::Equal, [&] { return equal(a, b); }},
+        {Op::NotEqual, [&] { return !equal(a, b); }},
+        {Op::LessThan, [&] { return less(a, b); }},
+        {Op::GreaterThan, [&] { return less(b, a); }},
+        {Op::LessThanEqual, [&] { return less(a, b) || equal(a, b); }},
+        {Op::GreaterThanEqual, [&] { return less(b, a) || equal(a, b); }},
+        {Op::And, [&] { return a.isTrue() && b.isTrue(); }},
+        {Op::Or, [&] { return a.isTrue() || b.isTrue(); }},
+        {Op::Not, [&] { return !a.isTrue(); }},
+        {Op::BitAnd, [&] { return wrap(a.bits() & b.bits()); }},
+        {Op::BitOr, [&] { return wrap(a.bits() | b.bits()); }},
+        {Op::BitXOr, [&] { return wrap(a.bits() ^ b.bits()); }},
+        {Op::BitCompl, [&] { return wrap(-1 - a.bits()); }},
+        {Op::ShiftLeft, [&] { return shift(a.bits(), b.bits()); }},
+        {Op::ShiftRight, [&] { return shift(a.bits(), -b.bits()); }},
+    };
+    return answers.at(op)();
+}
+
+std::string shown(const SymbolicScalar& value) {
+    return std::string(1, "bid"[value.index()]) + ":" + std::to_string(value.toDouble());
+}
+
+TEST(Arithmetic, AgreesWithWideIntegersOnEveryPairOfCornerValues) {
+    SymbolicExprTable table;
+    const SymbolicExprId a = SymbolicString(table, "a").getId(table);
+    const SymbolicExprId b = SymbolicString(table, "b").getId(table);
+    std::vector<SymbolicExprId> literals;
+    for (const SymbolicScalar& value : corners())
+        literals.push_back(literal(table, value));
+    std::size_t operators = 0;
+    for (const OperatorInfo& row : operatorTable()) {
+        if (row.op <= SymbolicOp::DoubleValue || row.op == SymbolicOp::MemberValue || dimensionOps.contains(row.op))
+            continue;
+        const SymbolicExprId id = makeNode(table, row.op, {a, b, b});
+        const SymbolicExprEval evaluator(table);
+        if (scalarRuleIndex(row.op) == ScalarRuleIndex::None) {
+            EXPECT_THROW(static_cast<void>(evaluator.eval(id)), HostDiagnostic) << row.name;
+            EXPECT_THROW(static_cast<void>(evaluator.prepare(id)), HostDiagnostic) << row.name;
+            continue;
+        }
+        const std::size_t operands = operandCount(row.op).value();
+        ++operators;
+        PreparedExpr prepared = evaluator.prepare(id);
+        for (std::size_t i = 0; i < corners().size(); ++i)
+            for (std::size_t j = 0; j < (operands == 1 ? 1 : corners().size()); ++j) {
+                const SymbolicScalar& left = corners()[i];
+                const SymbolicScalar& right = corners()[j];
+                const SymbolicScalar wanted = visibleScalar(expected(row.op, Wide(left), Wide(right)));
+                table.registerValueId(a, literals[i]);
+                table.registerValueId(b, literals[j]);
+                prepared.set(0, left);
+                if (operands == 2)
+                    prepared.set(1, right);
+                const SymbolicScalar answer = evaluator.eval(id).scalar();
+                ASSERT_EQ(answer, wanted) << shown(left) << " " << row.name << " " << shown(right) << " is "
+                                          << shown(answer) << ", not " << shown(wanted);
+                ASSERT_EQ(prepared.run().scalar(), wanted) << shown(left) << " " << row.name << " " << shown(right);
+            }
+    }
+    EXPECT_EQ(operators, scalarRules.size());
+}
+
+/// What an expression is worth, or the key of what is reported about it.
+struct Outcome {
+    std::string error;
+    bool isVector = false;
+    std::vector<SymbolicScalar> values = {};
+
+    bool operator==(const Outcome&) const = default;
+
+    friend std::ostream& operator<<(std::ostream& stream, const Outcome& outcome) {
+        for (const SymbolicScalar& value : outcome.values)
+            stream << shown(value) << " ";
+        return stream << outcome.error;
+    }
+};
+
+/// The value of an expression by recursion over the tree; expressions are small.
+class Model {
+public:
+    explicit Model(const SymbolicExprTable& table) : table_(table) {}
+
+    Outcome of(SymbolicExprId id) { // NOLINT(misc-no-recursion)
+        const SymbolicExpr& node = *table_.get(id);
+        const SymbolicOp op = node.op();
+        if (op == SymbolicOp::IntValue)
+            return scalar(static_cast<const SymbolicIntValue&>(node).getValue());
+        if (op == SymbolicOp::DoubleValue)
+            return scalar(static_cast<const SymbolicDoubleValue&>(node).getValue());
+        if (op == SymbolicOp::String || op == SymbolicOp::MemberValue)
+            return ofSymbol(id, node);
+        const bool isList = dimensionOps.contains(op);
+        if (!isList && scalarRuleIndex(op) == ScalarRuleIndex::None)
+            return {"NotEvaluable"};
+        std::vector<Outcome> operands;
+        for (std::size_t i = 0; i < node.getNumInputs(); ++i) {
+            if (node.getInput(i) >= id)
+                return {"NotEvaluable"};
+            operands.push_back(of(node.getInput(i)));
+            if (!operands.back().error.empty())
+                return operands.back();
+        }
+        return isList ? listed(operands) : combined(op, operands.front(), operands.back());
+    }
+
+private:
+    static Outcome scalar(SymbolicScalar value) { return {"", false, {value}}; }
+
+    Outcome ofSymbol(SymbolicExprId id, const SymbolicExpr& node) { // NOLINT(misc-no-recursion)
+        const bool isMember = node.op() == SymbolicOp::MemberValue;
+        const std::string name = isMember ? "" : static_cast<const SymbolicString&>(node).getName();
+        if (name == "true" || name == "false")
+            return scalar(name == "true");
+        const SymbolicExprId value = table_.getValueId(id);
+        if (value == invalidId)
+            return {isMember ? "NotEvaluable" : "UnboundSymbol"};
+        if (!open_.insert(id).second)
+            return {"CyclicValue"};
+        const Outcome outcome = of(value);
+        open_.erase(id);
+        return outcome;
+    }
+
+    static Outcome listed(const std::vector<Outcome>& elements) {
+        Outcome list{"", true, {}};
+        for (const Outcome& element : elements) {
+            if (element.isVector)
+                return {"NotEvaluable"};
+            list.values.push_back(element.values.front());
+        }
+        return list;
+    }
+
+    static Outcome combined(SymbolicOp op, const Outcome& a, const Outcome& b) {
+        if (a.isVector && b.isVector && a.values.size() != b.values.size())
+            return {"SizeMismatch"};
+        Outcome result{"", a.isVector || b.isVector, {}};
+        const std::size_t count = a.isVector ? a.values.size() : b.values.size();
+        for (std::size_t i = 0; i < count; ++i)
+            result.values.push_back(
+                expected(op, Wide(a.values[a.isVector ? i : 0]), Wide(b.values[b.isVector ? i : 0])));
+        return result;
+    }
+
+    const SymbolicExprTable& table_;
+    std::set<SymbolicExprId> open_;
+};
+
+template <class Evaluate>
+Outcome outcomeOf(Evaluate evaluate) {
+    try {
+        const SymbolicValue value = evaluate();
+        return value.isVector() ? Outcome{"", true, value.elements()} : Outcome{"", false, {value.scalar()}};
+    } catch (const HostDiagnostic& diagnostic) {
+        return {diagnostic.messageId().substr(diagnostic.messageId().rfind(':') + 1)};
+    }
+}
+
+/// The model's outcome with what of it is visible.
+Outcome modelled(const SymbolicExprTable& table, SymbolicExprId id) {
+    Outcome outcome = Model(table).of(id);
+    std::ranges::transform(outcome.values, outcome.values.begin(), visibleScalar);
+    return outcome;
+}
+
+/// Operators over corner values, symbols and members.  In a wild graph some operators have no value and some operands
+/// are missing.
+class Graph {
+public:
+    Graph(unsigned seed, bool isWild) : random_(seed) {
+        for (const char* name : {"a", "b", "s", "true"})
+            symbols.push_back(SymbolicString(table, name).getId(table));
+        for (const std::size_t owner : {0U, 2U, 4U})
+            symbols.push_back(SymbolicMemberValue(table, symbols[owner], "x").getId(table));
+        nodes = symbols;
+        for (int i = 0; i < 8; ++i)
+            nodes.push_back(literal(table, anyScalar()));
+        while (nodes.size() < 50) {
+            const SymbolicOp op = isWild && below(30) == 0 ? operatorTable()[below(operatorTable().size())].op
+                                  : below(15) == 0         ? SymbolicOp::DimsND
+                                                           : scalarRules[below(scalarRules.size())].op;
+            std::vector<SymbolicExprId> inputs(operandCount(op).value_or(below(4)));
+            for (SymbolicExprId& input : inputs)
+                input = isWild && below(200) == 0 ? table.size() + below(3)
+                        : isWild && below(300) == 0
+                            ? invalidId
+                            : nodes[nodes.size() - 1 - below(std::min<std::size_t>(20, nodes.size()))];
+            if (op > SymbolicOp::DoubleValue)
+                nodes.push_back(makeNode(table, op, inputs));
+        }
+    }
+
+    std::size_t below(std::size_t bound) { return random_() % bound; }
+
+    SymbolicScalar anyScalar() { return corners()[below(corners().size())]; }
+
+    /// Gives a symbol a number or a list of numbers, and answers it.
+    SymbolicValue rebind(SymbolicExprId symbol) {
+        SymbolicValue::Elements elements;
+        std::vector<SymbolicExprId> literals;
+        for (std::size_t i = below(2) == 0 ? 2 : below(4); i > 0; --i) {
+            elements.push_back(anyScalar());
+            literals.push_back(literal(table, elements.back()));
+        }
+        const bool isList = elements.empty() || below(6) == 0;
+        table.registerValueId(symbol, isList ? SymbolicNDExpr(table, literals).getId(table) : literals.front());
+        return isList ? SymbolicValue(elements) : SymbolicValue(elements.front());
+    }
+
+    SymbolicExprTable table;
+    std::vector<SymbolicExprId> symbols, nodes;
+
+private:
+    std::mt19937_64 random_;
+};
+
+// Every way of asking answers what the model does.
+TEST(Ways, AgreeOnRandomGraphsOfBoundAndMissingParts) {
+    std::size_t values = 0, faults = 0;
+    for (unsigned seed = 0; seed < 800; ++seed) {
+        Graph graph(seed, true);
+        for (const SymbolicExprId symbol : graph.symbols)
+            if (graph.below(4) != 0)
+                graph.table.registerValueId(
+                    symbol, graph.nodes[graph.below(3) == 0 ? graph.below(graph.nodes.size()) : graph.symbols.size()]);
+        for (const SymbolicExprId id : graph.nodes) {
+            const SymbolicExprTable& table = graph.table;
+            const Outcome wanted = modelled(table, id);
+            SymbolicExprEvalImpl executed(table);
+            SymbolicExprEvalImpl accepted(table);
+            const SymbolicExprEval evaluator(table);
+            ASSERT_EQ(outcomeOf([&] { return evaluator.eval(id); }), wanted) << seed;
+            ASSERT_EQ(outcomeOf([&] { return executed.execute(table, id), executed.get(); }), wanted) << seed;
+            ASSERT_EQ(outcomeOf([&] { return table.get(id)->accept(table, accepted), accepted.get(); }), wanted)
+                << seed;
+            const Outcome prepared = outcomeOf([&] { return evaluator.prepare(id).run(); });
+            if (wanted.error.empty())
+                ASSERT_EQ(prepared, wanted) << seed;
+            else // it may come upon another fault first
+                ASSERT_NE(prepared.error, "") << seed;
+            ++(wanted.error.empty() ? values : faults);
+        }
+    }
+    EXPECT_GT(values, 8000U);
+    EXPECT_GT(faults, 8000U);
+}
+
+TEST(Prepared, AnswersWhateverItsSlotsAndTheTableHold) {
+    std::size_t values = 0, faults = 0, again = 0;
+    for (unsigned seed = 0; seed < 2000; ++seed) {
+        Graph graph(seed, false);
+        const SymbolicExprEval evaluator(graph.table);
+        const SymbolicExprId root = graph.nodes.back();
+        PreparedExpr prepared = evaluator.prepare(root);
+        PreparedExpr early = prepared;
+        for (const SymbolicExprId symbol : graph.symbols)
+            if (graph.below(4) != 0)
+                graph.rebind(symbol);
+        const bool failedEarly = !outcomeOf([&] { return early.run(); }).error.empty();
+        for (int round = 0; round < 10; ++round) {
+            for (const SymbolicExprId symbol : graph.symbols) {
+                if (round > 0 && graph.below(2) == 0)
+                    continue;
+                const SymbolicValue value = graph.rebind(symbol);
+                // In the first round some are left to be taken from the table.
+                if (const auto slot = prepared.slotOf(symbol); slot && (round > 0 || graph.below(2) == 0))
+                    prepared.set(*slot, value);
+            }
+            const Outcome wanted = modelled(graph.table, root);
+            if (round == 0 && failedEarly) {
+                ASSERT_EQ(outcomeOf([&] { return early.run(); }), wanted) << "kept from a failed run, seed " << seed;
+                ++again;
+            }
+            for (int time = 0; time < 2; ++time)
+                ASSERT_EQ(outcomeOf([&] { return prepared.run(); }), wanted) << "seed " << seed << ", round " << round;
+            ++(wanted.error.empty() ? values : faults);
+            if (graph.below(3) == 0) { // a copy goes on alone
+                PreparedExpr copy = prepared;
+                prepared = copy;
+                if (copy.slotCount() > 0)
+                    copy.set(0, SymbolicValue::Elements{1, 2, 3});
+                static_cast<void>(outcomeOf([&] { return copy.run(); }));
+            }
+        }
+    }
+    EXPECT_GT(values, 8000U);
+    EXPECT_GT(faults, 1000U);
+    EXPECT_GT(again, 300U);
+}
+
+} // namespace
+} // namespace VT::Testing

@@ -1,0 +1,267 @@
+// Memory runs out at every allocation in turn: the error passes, nothing leaks or breaks, the next call is right.
+#include "base/core/Nodes.hpp"
+#include "base/print/ExpressionPrinter.hpp"
+#include "base/service/SymbolRegistry.hpp"
+#include "base/simplify/Simplify.hpp"
+#include "base/transform/QuillConversion.hpp"
+#include "host/QuillParser.hpp"
+#include "parser/SymbolicExprParser.hpp"
+#include "tests/service/Customizers.hpp"
+#include "tests/support/Times.hpp"
+#include "tests/support/TreeText.hpp"
+#include "tests/support/generators/AnyNode.hpp"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cstdlib>
+#include <functional>
+#include <new>
+#include <optional>
+#include <random>
+#include <string>
+#include <vector>
+
+namespace VT::Testing {
+namespace {
+
+constexpr std::size_t never = ~std::size_t{0};
+
+std::size_t untilFailure = never; ///< allocations
+bool failed = false;
+std::size_t living = 0; ///< allocations that were not freed
+
+void* allocate(std::size_t bytes, std::size_t alignment = alignof(std::max_align_t)) noexcept {
+    if (untilFailure == 0) {
+        failed = true;
+        return nullptr;
+    }
+    if (untilFailure != never)
+        --untilFailure;
+    const std::size_t rounded = (bytes + alignment - 1) / alignment * alignment;
+    void* place = alignment <= alignof(std::max_align_t) ? std::malloc(std::max<std::size_t>(bytes, 1))
+                                                         : std::aligned_alloc(alignment, rounded);
+    living += place != nullptr ? 1 : 0;
+    return place;
+}
+
+void* orThrow(void* place) {
+    return place != nullptr ? place : throw std::bad_alloc();
+}
+
+void release(void* place) noexcept {
+    living -= place != nullptr ? 1 : 0;
+    std::free(place);
+}
+
+/// Calls with the number of the allocation that fails, from the first on until none fails.  A call that leaves
+/// allocations behind is an error.
+void forEachFailure(const std::function<void(std::size_t number)>& run) {
+    constexpr std::size_t enough = 100000;
+    for (std::size_t number = 0; number < enough; ++number) {
+        const std::size_t before = living;
+        run(number);
+        ASSERT_EQ(living, before) << "allocation " << number;
+        if (testing::Test::HasFatalFailure() || !failed)
+            return;
+    }
+    FAIL() << "fails without end";
+}
+
+/// Makes a call in which the allocation of that number, counted from 0, and all later ones fail; whether it returned.
+template <class Call>
+bool attempt(std::size_t number, Call call) {
+    const struct Limit {
+        ~Limit() { untilFailure = never; }
+    } limit;
+
+    failed = false;
+    untilFailure = number;
+    try {
+        call();
+        return true;
+    } catch (const std::bad_alloc&) {
+        return false;
+    }
+}
+
+/// Nodes of every shape, long texts and enough of them for several enlargements of everything.
+std::vector<std::pair<SymbolicOp, NodeParts>> script() {
+    std::vector<std::pair<SymbolicOp, NodeParts>> steps;
+    std::mt19937 random(9);
+    for (std::size_t i = 0; i < 4 * operatorCount; ++i) {
+        const auto op = static_cast<SymbolicOp>(i % operatorCount);
+        NodeParts parts{std::string(i, 'x'), static_cast<int>(i), 0.5 * static_cast<double>(i), {}};
+        const std::size_t count = operandCount(op).value_or(i % 7);
+        for (std::size_t k = 0; k < count; ++k)
+            parts.inputs.push_back(random() % (i / 2 + 1));
+        steps.emplace_back(op, parts);
+    }
+    return steps;
+}
+
+TEST(MemoryRunsOut, WhileNodesAreInterned) {
+    const auto steps = script();
+    std::vector<std::string> expected;
+    SymbolicExprTable whole;
+    for (const auto& [op, parts] : steps)
+        expected.push_back(treeText(whole, makeAny(whole, op, parts)));
+
+    forEachFailure([&](std::size_t number) {
+        std::size_t done = 0;
+        std::size_t size = 0;
+        std::optional<SymbolicExprTable> table;
+        attempt(number, [&] {
+            table.emplace();
+            for (; done < steps.size(); ++done) {
+                makeAny(*table, steps[done].first, steps[done].second);
+                size = table->size();
+            }
+        });
+        if (!table)
+            return;
+        ASSERT_EQ(failed, done < steps.size());
+        ASSERT_EQ(table->size(), size);
+        ASSERT_FALSE(table->has(size));
+        // The step that failed is done now, and everything is as if it had never failed.
+        for (std::size_t i = done; i < steps.size(); ++i)
+            makeAny(*table, steps[i].first, steps[i].second);
+        for (std::size_t i = done / 2; i < steps.size(); i += 7)
+            ASSERT_EQ(treeText(*table, makeAny(*table, steps[i].first, steps[i].second)), expected[i]);
+        ASSERT_EQ(table->size(), whole.size());
+    });
+}
+
+TEST(MemoryRunsOut, WhileANodeIsAdded) {
+    SymbolicExprTable source;
+    for (int i = 0; i < 128; ++i)
+        SymbolicIntValue(source, i);
+    SymbolicIntValue(source, 4711);
+    for (const std::size_t before : {0U, 11U, 12U, 16U, 128U}) {
+        forEachFailure([&](std::size_t number) {
+            SymbolicExprTable table;
+            for (std::size_t i = 0; i < before; ++i)
+                table.add(new SymbolicIntValue(source, static_cast<int>(i)));
+            const auto* node = new SymbolicIntValue(source, 4711);
+            const bool added = attempt(number, [&] { table.add(node); }); // freed where it fails
+            ASSERT_EQ(added, !failed);
+            ASSERT_EQ(table.size(), before + (added ? 1 : 0));
+            ASSERT_EQ(SymbolicIntValue(table, 4711).getId(table), before);
+        });
+    }
+}
+
+TEST(MemoryRunsOut, WhileTheTruthConstantsAreInterned) {
+    forEachFailure([](std::size_t number) {
+        SymbolicExprTable table;
+        attempt(number, [&] { table.addBoolSymbols(); });
+        ASSERT_EQ(table.getIdTRUE() == invalidId, table.getIdFALSE() == invalidId) << "both or none";
+        table.addBoolSymbols();
+        ASSERT_EQ(table.getIdFALSE(), 0U);
+        ASSERT_EQ(table.getIdTRUE(), 1U);
+    });
+}
+
+TEST(MemoryRunsOut, WhileTextIsReadConvertedSimplifiedAndPrinted) {
+    const auto road = [](SymbolicExprTable& table, const std::string& text) {
+        const SymbolicExprId read = SymbolicExprParser(table, true, true)(text);
+        const SymbolicExprId converted = SymbolicExprQ2C(table)(SymbolicExprC2Q(table)(read));
+        std::uint64_t passes = 0;
+        const SymbolicExprId result = SymbolicExprSimplify(table).simplify(converted, passes);
+        return SymbolicExprPrinter(table, false)(result);
+    };
+    for (const std::string text :
+         {"(Mode == 1 || f(Mode, 2.5) > 3) && !(Gear < 3 && a.member != 4) && (Mode == 1 || Mode == 2)",
+          "A != 1 && (B > 2 || !(A == 3 && C) || A <= 7) || B == A && (B != A || C < 4 && C > 2)",
+          "x/2 - 3*y % [4, 5] + -x*2 + 1 + 2.0 + (1 << 4) + ~z - x >= 12"}) {
+        SymbolicExprTable whole;
+        const std::string expected = road(whole, text);
+        forEachFailure([&](std::size_t number) {
+            SymbolicExprTable table;
+            std::string printed = expected;
+            attempt(number, [&] { printed = road(table, text); });
+            ASSERT_EQ(printed, expected);
+            ASSERT_EQ(road(table, text), expected);
+        });
+    }
+}
+
+TEST(MemoryRunsOut, WhileQuillIsParsed) {
+    for (const std::string& text :
+         std::vector<std::string>{"a + b", times(600, "f(1,[2 3;4],@(x)-x){'t'} + ") + "a.b'",
+                                  "[" + times(3000, "1 ") + "]", times(3000, "a^") + "$", times(200, "((")}) {
+        forEachFailure([&](std::size_t number) {
+            const auto parser = PARSER_T<char>::create(256);
+            attempt(number, [&] { parser->delete_parse_tree(parser->generate_parse_tree(text.data(), text.size())); });
+            const auto* const next = parser->generate_parse_tree("1 + x");
+            ASSERT_NE(next, nullptr);
+            ASSERT_EQ(next->children->code, 49);
+            ASSERT_EQ(next->children->childCount, 3);
+            parser->delete_parse_tree(next);
+        });
+    }
+}
+
+/// Every kind of work at once.
+std::string work() {
+    VCService& service = VCService::getInstance();
+    const VCSymbolicExprId condition =
+        service.simplifyFromCCondition("(A == 1 || A == 2) && B == 3 && !(C < 4) && f(A, B) / 2 + 3 * x.y != 1");
+    const VCSymbolicExprId both = service.AND(condition, service.NOT(service.parseC("B == 4"), true), true);
+    const VCSymbolicExprId quill = service.parseQ(service.printQExprWithConversion(condition));
+    const SymbolicExprId dimension = service.parseQ("[N*2.5, max(M', 3)]");
+    SymbolRegistry registry(service.table());
+    const std::string name = registry.registerExpression(nullptr, dimension);
+    if (service.printQExprWithConversion(both).empty() || registry.registeredBy(nullptr).front() != name)
+        return "";
+    return service.printCExpr(quill);
+}
+
+TEST(MemoryRunsOut, WhileTheServiceWorks) {
+    for (const bool caching : {true, false}) {
+        const std::string expected =
+            "A==1 && B==3 && C>=4 && f(A,B)/2+3*x.y!=1 || A==2 && B==3 && C>=4 && f(A,B)/2+3*x.y!=1";
+        ASSERT_EQ((FreshService(caching), work()), expected); // and what is made once for all has been made
+        forEachFailure([&](std::size_t number) {
+            const FreshService service(caching);
+            std::string answer = expected; // what fails unseen, because it was not needed, leaves the answer right
+            attempt(number, [&] { answer = work(); });
+            ASSERT_EQ(answer, expected);
+            ASSERT_EQ(work(), expected);
+        });
+    }
+}
+
+} // namespace
+} // namespace VT::Testing
+
+using namespace VT::Testing;
+
+// The forms for arrays call these.
+void* operator new(std::size_t bytes) {
+    return orThrow(allocate(bytes));
+}
+
+void* operator new(std::size_t bytes, std::align_val_t alignment) {
+    return orThrow(allocate(bytes, static_cast<std::size_t>(alignment)));
+}
+
+void* operator new(std::size_t bytes, const std::nothrow_t&) noexcept {
+    return allocate(bytes);
+}
+
+void operator delete(void* place) noexcept {
+    release(place);
+}
+
+void operator delete(void* place, std::size_t) noexcept {
+    release(place);
+}
+
+void operator delete(void* place, std::align_val_t) noexcept {
+    release(place);
+}
+
+void operator delete(void* place, std::size_t, std::align_val_t) noexcept {
+    release(place);
+}

@@ -1,0 +1,95 @@
+// vtsym compare
+#include "tools/vtsym/commands/Commands.hpp"
+#include "tools/vtsym/commands/Pairs.hpp"
+#include "tools/vtsym/io/Json.hpp"
+
+#include <array>
+
+namespace vtsym {
+
+namespace {
+
+constexpr const char* examples =
+    R"(Conditions are over integers without bounds, and the relation is exact: equivalent, disjoint, implies, implied by
+or overlaps.  Each assignment shows what keeps the two apart, or together.  A question that takes too many steps stays
+undecided.
+
+Examples:
+  vtsym compare 'A<B && B<C' 'A<C'
+  vtsym compare --from quill 'A == 1 | A == 2' 'A > 0 & A < 3'
+  vtsym compare --bits 32 'A < 2147483647' 'A != 2147483647'
+  vtsym compare --json < pairs.txt)";
+
+/// In the order of VT::RelationKind.
+constexpr std::array<const char*, 6> relations{"equivalent", "disjoint", "implies",
+                                               "implied by", "overlaps", "undecided"};
+
+const char* reasonOf(VT::DecisionBound bound) {
+    return bound == VT::DecisionBound::Steps ? ", it takes too many steps"
+                                             : ", it hangs on arithmetic beyond linear terms";
+}
+
+class Comparer {
+public:
+    explicit Comparer(const PairOptions& options) : options_(options), conditions_(options.bits32) {}
+
+    void answer(const std::string& text, std::string& out) {
+        conditions_.makeRoomFor(text);
+        const ConditionPair pair = readPair(conditions_, options_, text);
+        const VT::Relation relation = conditions_.service().compare(pair.first, pair.second);
+        if (options_.json)
+            appendJson(pair, relation, out);
+        else
+            appendText(relation, out);
+    }
+
+private:
+    void appendText(const VT::Relation& relation, std::string& out) const {
+        out.append(relations.at(static_cast<std::size_t>(relation.kind)));
+        if (relation.kind == VT::RelationKind::Undecided)
+            out.append(reasonOf(relation.bound));
+        const auto tell = [&](const char* who, const VT::Decision& decision) {
+            if (decision.witness)
+                out.append("; ").append(who).append(witnessText(conditions_, options_, *decision.witness));
+        };
+        tell("first alone: ", relation.onlyA);
+        tell("second alone: ", relation.onlyB);
+        if (relation.kind == VT::RelationKind::Overlaps || relation.kind == VT::RelationKind::Undecided)
+            tell("both: ", relation.both);
+    }
+
+    void appendJson(const ConditionPair& pair, const VT::Relation& relation, std::string& out) const {
+        appendMember(out, "a", jsonString(pair.firstText));
+        appendMember(out, "b", jsonString(pair.secondText));
+        appendMember(out, "relation", jsonString(relations.at(static_cast<std::size_t>(relation.kind))));
+        std::string witnesses;
+        const auto tell = [&](const char* who, const VT::Decision& decision) {
+            if (decision.witness)
+                appendMember(witnesses, who, witnessJson(conditions_, options_, *decision.witness));
+        };
+        tell("only_a", relation.onlyA);
+        tell("only_b", relation.onlyB);
+        tell("both", relation.both);
+        if (!witnesses.empty())
+            appendMember(out, "witness", "{" + witnesses.substr(1) + "}");
+    }
+
+    const PairOptions& options_;
+    Conditions conditions_;
+};
+
+} // namespace
+
+Command addCompare(CLI::App& program) {
+    CLI::App* const command = program.add_subcommand("compare", "Tell how two conditions stand to each other");
+    const auto options = std::make_shared<PairOptions>();
+    addPairOptions(*command, *options, "A", "B");
+    command->footer(examples);
+    return {command, [options](Console& console) {
+                Comparer comparer(*options);
+                const auto answer = [&](const std::string& text, std::string& out) { comparer.answer(text, out); };
+                return answerTexts(*options, console, {answer, false, nullptr, true});
+            }};
+}
+
+} // namespace vtsym

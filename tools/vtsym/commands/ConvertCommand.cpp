@@ -1,0 +1,44 @@
+// vtsym convert
+#include "tools/vtsym/answers/Conditions.hpp"
+#include "tools/vtsym/commands/Commands.hpp"
+#include "tools/vtsym/io/Json.hpp"
+#include "tools/vtsym/io/Texts.hpp"
+
+namespace vtsym {
+
+namespace {
+
+constexpr const char* examples = R"(Operators that a language does not have become calls: a % b is rem(a,b) in Quill.
+
+Examples:
+  vtsym convert --to quill '(F & 4) != 0 && a % b == 1'
+  vtsym convert 'Mode==1&&!(Gear>2)'
+  vtsym convert --to pp 'Mode==1 || s.gear>2 && true'
+  vtsym convert --to quill < conditions.txt)";
+
+} // namespace
+
+Command addConvert(CLI::App& program) {
+    CLI::App* const command = program.add_subcommand("convert", "Write conditions in another language, or tidily");
+    const auto options = std::make_shared<TextOptions>();
+    addTextOptions(*command, *options);
+    addLanguageOption(*command, *options);
+    command->footer(examples);
+    return {command, [options](Console& console) {
+                Conditions conditions;
+                std::vector<std::string> warnings;
+                const auto answer = [&](const std::string& text, std::string& out) {
+                    conditions.makeRoomFor(text);
+                    const VT::SymbolicExprId condition = conditions.parse(*options, text);
+                    const std::string result = conditions.print(*options, condition);
+                    warnings = conditions.warnings(*options, condition);
+                    if (options->json)
+                        appendMember(out, "result", jsonString(result));
+                    else
+                        out.append(result);
+                };
+                return answerTexts(*options, console, {answer, false, &warnings});
+            }};
+}
+
+} // namespace vtsym

@@ -1,0 +1,154 @@
+// vtsym dims
+#include "base/eval/Eval.hpp"
+#include "base/service/VCSymbols.hpp"
+#include "base/simplify/Simplify.hpp"
+#include "base/transform/Cast2Int.hpp"
+#include "base/transform/FactorDivision.hpp"
+#include "host/Diagnostics.hpp"
+#include "parser/QuillConverter.hpp"
+#include "tools/vtsym/answers/ValueText.hpp"
+#include "tools/vtsym/commands/Commands.hpp"
+#include "tools/vtsym/commands/Definitions.hpp"
+#include "tools/vtsym/io/Json.hpp"
+#include "tools/vtsym/io/Texts.hpp"
+
+#include <optional>
+#include <string_view>
+
+namespace vtsym {
+
+namespace {
+
+constexpr const char* examples =
+    R"(Each answer has a line for every form: the text with integers for its numbers, that simplified, and that with its
+divisions pulled outwards; then the symbols and, where all of them are defined, the value.  Simplifying and pulling
+outwards take divisions as exact.
+
+Examples:
+  vtsym dims 'N*2 + N/3'
+  vtsym dims -D N=6 -D 'M=N - 1' '[N/2 + M/3, 4]'
+  vtsym dims --json < dimensions.txt)";
+
+struct DimsOptions : TextOptions {
+    Definitions definitions;
+};
+
+/// A dimension expression, with integers for its numbers.  Throws what the reader reports.
+VT::SymbolicExprId readDimension(VT::SymbolicExprTable& table, const std::string& text) {
+    VT::VTSymbolicExprErrorChecker checker;
+    const VT::SymbolicExprId id = VT::SymbolicExprFromQParseTree(table, checker)(text);
+    if (!checker.diagnostics().empty())
+        throw VT::HostDiagnostic(checker.diagnostics().front());
+    return VT::SymbolicExprCast2Int(table).cast2Int(id);
+}
+
+void define(VT::SymbolicExprTable& table, const DimsOptions& options) {
+    table.addBoolSymbols();
+    bindDefinitions(table, options.definitions,
+                    [&table](const std::string& text) { return readDimension(table, text); });
+}
+
+std::vector<std::string> symbolsOf(const VT::SymbolicExprTable& table, VT::SymbolicExprId id) {
+    using enum VT::VCSymbolType;
+    std::vector<std::string> symbols;
+    VT::VCSymbolsOfSymbolicExpr(table, {Identifier, BoundMember, UnboundMember}).getSymbols(id, symbols);
+    std::erase_if(symbols, [](const std::string& name) { return name == "true" || name == "false"; });
+    return symbols;
+}
+
+/// The value; nothing where a symbol has none.
+std::optional<VT::SymbolicValue> valueOf(const VT::SymbolicExprTable& table, VT::SymbolicExprId id) {
+    std::vector<VT::SymbolicExprId> unbound;
+    VT::VCSymbolsOfSymbolicExpr(table, {VT::VCSymbolType::UnboundMember}).getSymbolIds(id, unbound);
+    if (!unbound.empty())
+        return std::nullopt;
+    try {
+        return VT::SymbolicExprEval(table).eval(id);
+    } catch (const VT::HostDiagnostic& diagnostic) {
+        if (diagnostic.messageId() != "Vantor:SymbolicDims:UnboundSymbol")
+            throw;
+        return std::nullopt;
+    }
+}
+
+/// Writes the lines, or the members, of one answer.
+class Report {
+public:
+    Report(std::string& out, bool json, const Style& style) : out_(out), json_(json), style_(style) {}
+
+    void text(std::string_view name, const std::string& text) {
+        json_ ? member(name, jsonString(text)) : line(name, text);
+    }
+
+    void list(std::string_view name, const std::vector<std::string>& texts) {
+        std::string list;
+        for (const std::string& text : texts)
+            list.append(list.empty() ? "" : json_ ? "," : ", ").append(json_ ? jsonString(text) : text);
+        if (json_)
+            member(name, "[" + list + "]");
+        else if (!texts.empty())
+            line(name, list);
+    }
+
+    void value(const VT::SymbolicValue& value) {
+        if (json_)
+            member("type", jsonString(typeText(value)));
+        json_ ? member("value", valueText(value, true)) : line("value", style_.good(valueText(value, false)));
+    }
+
+private:
+    static constexpr std::size_t nameColumns = 12;
+
+    void member(std::string_view name, std::string_view value) { appendMember(out_, name, value); }
+
+    void line(std::string_view name, std::string_view text) {
+        out_.append(begun_ ? "\n" : "").append(style_.name(name));
+        out_.append(nameColumns - name.size(), ' ').append(text);
+        begun_ = true;
+    }
+
+    std::string& out_;
+    bool json_;
+    const Style& style_;
+    bool begun_ = false;
+};
+
+void answer(const DimsOptions& options, const Style& style, const std::string& text, std::string& out) {
+    VT::SymbolicExprTable table;
+    define(table, options);
+    const VT::SymbolicExprId cast = readDimension(table, text);
+    const std::optional<VT::SymbolicValue> value = valueOf(table, cast);
+    std::uint64_t passes = 0;
+    const VT::SymbolicExprId simplified = VT::SymbolicExprSimplify(table).simplify(cast, passes);
+    const VT::SymbolicExprPrinter printer(table, true);
+    Report report(out, options.json, style);
+    report.text("cast", printer(cast));
+    report.text("simplified", printer(simplified));
+    report.text("factored", printer(VT::SymbolicExprFactorDivision(table).factorDivision(simplified)));
+    report.list("symbols", symbolsOf(table, cast));
+    if (value)
+        report.value(*value);
+}
+
+} // namespace
+
+Command addDims(CLI::App& program) {
+    CLI::App* const command = program.add_subcommand("dims", "Rearrange and evaluate dimension expressions in Quill");
+    const auto options = std::make_shared<DimsOptions>();
+    addTextOptions(*command, *options);
+    command->remove_option(command->get_option("--from"));
+    addDefinitions(*command, options->definitions);
+    command->footer(examples);
+    command->final_callback([options] {
+        VT::SymbolicExprTable table; // wrong definitions are told before any text
+        define(table, *options);
+    });
+    return {command, [options](Console& console) {
+                const auto answerText = [&](const std::string& text, std::string& out) {
+                    answer(*options, console.dataStyle(), text, out);
+                };
+                return answerTexts(*options, console, {answerText, !options->json});
+            }};
+}
+
+} // namespace vtsym

@@ -1,0 +1,84 @@
+// vtsym eval
+#include "base/eval/Eval.hpp"
+#include "base/transform/DimensionLists.hpp"
+#include "tools/vtsym/answers/Conditions.hpp"
+#include "tools/vtsym/answers/ValueText.hpp"
+#include "tools/vtsym/commands/Commands.hpp"
+#include "tools/vtsym/commands/Definitions.hpp"
+#include "tools/vtsym/io/Json.hpp"
+#include "tools/vtsym/io/Texts.hpp"
+
+#include <optional>
+
+namespace vtsym {
+
+namespace {
+
+constexpr const char* examples =
+    R"(Integers have 32 bits: + - * wrap, / cuts and saturates.  A name that is defined twice has its last value, and a
+value may name other definitions.
+
+Examples:
+  vtsym eval -D N=3 'N*2 + 1'
+  vtsym eval -D 'N=M + 1' -D M=4 '[N, N*M]'
+  vtsym eval -D s.gear=2 's.gear > 1 && !false'
+  vtsym eval --json -D Rate=0.5 < expressions.txt)";
+
+struct EvalOptions : TextOptions {
+    Definitions definitions;
+};
+
+class Evaluator {
+public:
+    explicit Evaluator(const EvalOptions& options) : options_(options) {}
+
+    void define();
+    void answer(const std::string& text, std::string& out);
+
+private:
+    [[nodiscard]] VT::SymbolicExprTable& table() const { return conditions_.service().table(); }
+
+    /// Quill writes a list as a matrix.
+    [[nodiscard]] VT::SymbolicExprId read(const std::string& text) const {
+        return VT::SymbolicExprDimensionLists(table())(conditions_.parse(options_, text));
+    }
+
+    const EvalOptions& options_;
+    Conditions conditions_;
+};
+
+void Evaluator::define() {
+    bindDefinitions(table(), options_.definitions, [this](const std::string& text) { return read(text); });
+}
+
+void Evaluator::answer(const std::string& text, std::string& out) {
+    if (conditions_.makeRoomFor(text))
+        define();
+    const VT::SymbolicValue value = VT::SymbolicExprEval(table()).eval(read(text));
+    if (options_.json) {
+        appendMember(out, "type", jsonString(typeText(value)));
+        appendMember(out, "value", valueText(value, true));
+    } else {
+        out.append(valueText(value, false));
+    }
+}
+
+} // namespace
+
+Command addEval(CLI::App& program) {
+    CLI::App* const command = program.add_subcommand("eval", "Evaluate expressions");
+    const auto options = std::make_shared<EvalOptions>();
+    const auto evaluator = std::make_shared<std::optional<Evaluator>>();
+    addTextOptions(*command, *options);
+    addDefinitions(*command, options->definitions);
+    command->footer(examples);
+    // Behind all options, because the language of the definitions is one.
+    command->final_callback([options, evaluator] { evaluator->emplace(*options).define(); });
+    return {command, [options, evaluator](Console& console) {
+                const Answering answering{
+                    [&](const std::string& text, std::string& out) { (*evaluator)->answer(text, out); }};
+                return answerTexts(*options, console, answering);
+            }};
+}
+
+} // namespace vtsym

@@ -1,0 +1,105 @@
+// vtsym simplify
+#include "tools/vtsym/answers/Conditions.hpp"
+#include "tools/vtsym/answers/Explanation.hpp"
+#include "tools/vtsym/commands/Commands.hpp"
+#include "tools/vtsym/io/Json.hpp"
+#include "tools/vtsym/io/Texts.hpp"
+
+namespace vtsym {
+
+namespace {
+
+constexpr const char* examples =
+    R"(Conditions are over integers: every name stands for an integer, and what is not zero is true.
+Quotients of a condition are truncated, as in C; dimensions, such as N/2*2, divide exactly.
+
+The answer is the shortest form found that is proven equal: fewest comparisons, then fewest bytes, and never longer than
+the condition as printed.  With --normal-form it is the library's sum of products.  What is no condition, such as 2+3,
+is a number and stays one.
+
+Examples:
+  vtsym simplify 'Mode == 1 && Mode == 2'
+  vtsym simplify 'A<B && B<C && A<C'
+  vtsym simplify --explain '!(A < 3) || A == 2'
+  vtsym simplify --normal-form '(A || B) && C'
+  vtsym simplify --to quill 'a / b == 1 && x != 2'
+  vtsym simplify --json < conditions.txt)";
+
+struct SimplifyOptions : TextOptions {
+    bool explain = false;
+    bool normalForm = false;
+    bool bits32 = false;
+};
+
+class Simplifier {
+public:
+    Simplifier(const SimplifyOptions& options, const Style& style)
+        : options_(options),
+          style_(style),
+          conditions_(options.bits32) {}
+
+    void answer(const std::string& text, std::string& out);
+
+    [[nodiscard]] const std::vector<std::string>& warnings() const noexcept { return warnings_; }
+
+private:
+    VT::SymbolicExprId answerInDetail(const std::string& text, std::string& out) const;
+
+    const SimplifyOptions& options_;
+    const Style& style_;
+    Conditions conditions_;
+    std::vector<std::string> warnings_;
+};
+
+void Simplifier::answer(const std::string& text, std::string& out) {
+    conditions_.makeRoomFor(text);
+    VT::SymbolicExprId result = 0;
+    if (options_.json || options_.explain) {
+        result = answerInDetail(text, out);
+    } else {
+        const VT::SymbolicExprId condition =
+            options_.normalForm ? conditions_.simplify(options_, text) : conditions_.parse(options_, text);
+        result = options_.normalForm ? condition : conditions_.shortest(options_, condition);
+        out.append(options_.normalForm ? conditions_.print(options_, result)
+                                       : conditions_.printShortest(options_, result, condition));
+    }
+    warnings_ = conditions_.warnings(options_, result);
+}
+
+/// Past the service's caches, which know results only.
+VT::SymbolicExprId Simplifier::answerInDetail(const std::string& text, std::string& out) const {
+    Explanation explanation(conditions_, options_, conditions_.parse(options_, text), options_.explain);
+    if (!options_.normalForm)
+        explanation.shorten();
+    if (!options_.json) {
+        explanation.appendText(style_, out);
+        return explanation.result();
+    }
+    appendMember(out, "result", jsonString(explanation.resultText()));
+    appendMember(out, "passes", std::to_string(explanation.passes()));
+    if (options_.explain)
+        appendMember(out, "steps", explanation.json());
+    return explanation.result();
+}
+
+} // namespace
+
+Command addSimplify(CLI::App& program) {
+    CLI::App* const command = program.add_subcommand("simplify", "Simplify conditions");
+    const auto options = std::make_shared<SimplifyOptions>();
+    addTextOptions(*command, *options);
+    addLanguageOption(*command, *options);
+    command->add_flag("--explain", options->explain,
+                      "Show the rules that fired, pass by pass, and how the shortest form was reached");
+    command->add_flag("--normal-form", options->normalForm, "Answer with the sum of products that the rules lead to");
+    addBitsOption(*command, options->bits32);
+    command->footer(examples);
+    return {
+        command, [options](Console& console) {
+            Simplifier simplifier(*options, console.dataStyle());
+            const auto answer = [&](const std::string& text, std::string& out) { simplifier.answer(text, out); };
+            return answerTexts(*options, console, {answer, options->explain && !options->json, &simplifier.warnings()});
+        }};
+}
+
+} // namespace vtsym

@@ -1,0 +1,245 @@
+#include "tools/vtsym/findings/Findings.hpp"
+
+#include "host/Text.hpp"
+#include "tools/vtsym/io/Json.hpp"
+
+#include <algorithm>
+
+namespace vtsym {
+
+namespace {
+
+std::string placeText(const Place& place) {
+    std::string text = VT::shownText(place.file);
+    if (place.line != 0)
+        text.append(":").append(std::to_string(place.line));
+    return text;
+}
+
+class CompilerWriter : public FindingWriter {
+public:
+    explicit CompilerWriter(Console& console) : FindingWriter(console) {}
+
+private:
+    void add(const Finding& finding) override {
+        console().data(console().dataStyle().strong(placeText(finding.place) + ":") + " " +
+                       VT::shownText(finding.message) + "\n");
+    }
+};
+
+class JsonWriter : public FindingWriter {
+public:
+    explicit JsonWriter(Console& console) : FindingWriter(console) {}
+
+private:
+    void add(const Finding& finding) override;
+};
+
+void JsonWriter::add(const Finding& finding) {
+    std::string out = "{\"file\":" + jsonString(finding.place.file);
+    appendMember(out, "line", std::to_string(finding.place.line));
+    appendMember(out, "kind", jsonString(finding.kind));
+    if (!finding.place.name.empty())
+        appendMember(out, "name", jsonString(finding.place.name));
+    appendMember(out, "condition", jsonString(finding.condition));
+    if (finding.proposed)
+        appendMember(out, "proposed", jsonString(*finding.proposed));
+    if (!finding.witness.empty())
+        appendMember(out, "witness", jsonString(finding.witness));
+    std::string follows;
+    for (const RelatedPlace& related : finding.follows) {
+        follows.append(follows.empty() ? "{" : ",{").append("\"line\":").append(std::to_string(related.place.line));
+        if (!related.place.name.empty())
+            appendMember(follows, "name", jsonString(related.place.name));
+        appendMember(follows, "text", jsonString(related.text));
+        follows.push_back('}');
+    }
+    appendMember(out, "follows", "[" + follows + "]");
+    console().data(out + "}\n");
+}
+
+/// The path of a file as a URI reference: a relative path stays relative.
+std::string uriOf(std::string_view path) {
+    static constexpr char digits[] = "0123456789ABCDEF";
+    static constexpr std::string_view plain = "-._~/!$&'()*+,;=@";
+    std::string uri = path.starts_with('/') ? "file://" : "";
+    for (const char c : path) {
+        const auto byte = static_cast<unsigned char>(c);
+        const bool isPlain = (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9') ||
+                             plain.find(c) != std::string_view::npos;
+        if (isPlain)
+            uri.push_back(c);
+        else
+            uri.append("%").append({digits[byte >> 4U], digits[byte & 15U]});
+    }
+    return uri;
+}
+
+std::string jsonMessage(std::string_view text) {
+    return "{\"text\":" + jsonString(text) + "}";
+}
+
+class SarifWriter : public FindingWriter {
+public:
+    SarifWriter(Console& console, std::span<const FindingRule> rules);
+
+private:
+    void add(const Finding& finding) override;
+    void addProblem(const Place& place, const std::string& sentence) override;
+    void addNote(const std::string& sentence) override;
+    void end() override;
+    void addNotification(std::string_view level, const std::string& sentence, const std::string& further);
+
+    std::span<const FindingRule> rules_;
+    std::string notifications_;
+    bool successful_ = true;
+    bool first_ = true;
+};
+
+std::string jsonRegion(const Place& place) {
+    std::string json = "{\"startLine\":" + std::to_string(place.line);
+    if (place.column != 0)
+        appendMember(json, "startColumn", std::to_string(place.column));
+    if (place.endLine != 0)
+        appendMember(json, "endLine", std::to_string(place.endLine));
+    if (place.endColumn != 0)
+        appendMember(json, "endColumn", std::to_string(place.endColumn));
+    return json + "}";
+}
+
+std::string jsonArtifact(const Place& place) {
+    return R"("artifactLocation":{"uri":)" + jsonString(uriOf(place.file)) + "}";
+}
+
+/// A location; `further` are members that it has beside its place.
+std::string jsonLocation(const Place& place, const std::string& further = {}) {
+    std::string json = "{\"physicalLocation\":{" + jsonArtifact(place);
+    if (place.line != 0)
+        appendMember(json, "region", jsonRegion(place));
+    json.push_back('}');
+    if (!place.name.empty())
+        appendMember(json, "logicalLocations", "[{\"fullyQualifiedName\":" + jsonString(place.name) + "}]");
+    return json + further + "}";
+}
+
+std::string jsonFix(const Fix& fix) {
+    std::string json = "{\"description\":" + jsonMessage(fix.description);
+    json.append(",\"artifactChanges\":[{").append(jsonArtifact(fix.region)).append(",\"replacements\":[{");
+    json.append("\"deletedRegion\":").append(jsonRegion(fix.region));
+    appendMember(json, "insertedContent", jsonMessage(fix.text));
+    return json + "}]}]}";
+}
+
+SarifWriter::SarifWriter(Console& console, std::span<const FindingRule> rules) : FindingWriter(console), rules_(rules) {
+    std::string out = R"({"$schema":"https://json.schemastore.org/sarif-2.1.0.json","version":"2.1.0","runs":[{)"
+                      R"("tool":{"driver":{"name":"vtsym","version":)" +
+                      jsonString(VTSYM_VERSION) + R"(,"rules":[)";
+    for (const FindingRule& rule : rules) {
+        out.append(&rule == rules.data() ? "{" : ",{").append("\"id\":").append(jsonString(rule.kind));
+        appendMember(out, "shortDescription", jsonMessage(rule.summary));
+        appendMember(out, "fullDescription", jsonMessage(rule.help));
+        appendMember(out, "defaultConfiguration", R"({"level":"warning"})");
+        out.push_back('}');
+    }
+    console.data(out + R"(]}},"columnKind":"unicodeCodePoints","results":[)");
+}
+
+void SarifWriter::add(const Finding& finding) {
+    const auto rule = std::ranges::find(rules_, finding.kind, &FindingRule::kind);
+    std::string out = first_ ? "\n{" : ",\n{";
+    first_ = false;
+    out.append("\"ruleId\":").append(jsonString(finding.kind));
+    appendMember(out, "ruleIndex", std::to_string(rule - rules_.begin()));
+    appendMember(out, "level", "\"warning\"");
+    appendMember(out, "message", jsonMessage(finding.message + "."));
+    appendMember(out, "locations", "[" + jsonLocation(finding.place) + "]");
+    if (!finding.follows.empty()) {
+        std::string related;
+        for (const RelatedPlace& each : finding.follows)
+            related.append(related.empty() ? "" : ",")
+                .append(jsonLocation(each.place, ",\"message\":" + jsonMessage(each.text)));
+        appendMember(out, "relatedLocations", "[" + related + "]");
+    }
+    if (finding.fix)
+        appendMember(out, "fixes", "[" + jsonFix(*finding.fix) + "]");
+    std::string properties = "{\"condition\":" + jsonString(finding.condition);
+    if (finding.proposed)
+        appendMember(properties, "proposed", jsonString(*finding.proposed));
+    if (!finding.witness.empty())
+        appendMember(properties, "witness", jsonString(finding.witness));
+    appendMember(out, "properties", properties + "}");
+    console().data(out + "}");
+}
+
+void SarifWriter::addProblem(const Place& place, const std::string& sentence) {
+    successful_ = false;
+    addNotification("error", sentence, ",\"locations\":[" + jsonLocation(place) + "]");
+}
+
+void SarifWriter::addNote(const std::string& sentence) {
+    addNotification("note", sentence, {});
+}
+
+/// `further` are members beside the level and the message.
+void SarifWriter::addNotification(std::string_view level, const std::string& sentence, const std::string& further) {
+    notifications_.append(notifications_.empty() ? "\n{" : ",\n{").append("\"level\":").append(jsonString(level));
+    appendMember(notifications_, "message", jsonMessage(sentence));
+    notifications_.append(further).append("}");
+}
+
+void SarifWriter::end() {
+    std::string out = "\n],\"invocations\":[{\"executionSuccessful\":";
+    out.append(successful_ ? "true" : "false");
+    if (!notifications_.empty())
+        appendMember(out, "toolExecutionNotifications", "[" + notifications_ + "]");
+    console().data(out + "}]}]}\n");
+}
+
+} // namespace
+
+void FindingWriter::write(const Finding& finding) {
+    add(finding);
+    ++found_;
+}
+
+void FindingWriter::problem(const Place& place, const std::string& sentence) {
+    console_.words("vtsym: " + placeText(place) + ": " + VT::shownText(sentence) + "\n");
+    addProblem(place, sentence);
+    failed_ = true;
+}
+
+void FindingWriter::note(const std::string& sentence) {
+    console_.words("vtsym: " + VT::shownText(sentence) + "\n");
+    addNote(sentence);
+}
+
+SearchResult FindingWriter::finish() {
+    end();
+    console_.flush();
+    if (failed_)
+        return SearchResult::Failed;
+    return found_ != 0 ? SearchResult::Found : SearchResult::NothingFound;
+}
+
+std::unique_ptr<FindingWriter> makeFindingWriter(FindingForm form, Console& console,
+                                                 std::span<const FindingRule> rules) {
+    switch (form) {
+    case FindingForm::Json:
+        return std::make_unique<JsonWriter>(console);
+    case FindingForm::Sarif:
+        return std::make_unique<SarifWriter>(console, rules);
+    default:
+        return std::make_unique<CompilerWriter>(console);
+    }
+}
+
+void addFormOptions(CLI::App& command, FindingForm& form) {
+    CLI::Option* const json = command.add_flag_callback(
+        "--json", [&form] { form = FindingForm::Json; }, "Write one JSON object a finding");
+    command
+        .add_flag_callback(
+            "--sarif", [&form] { form = FindingForm::Sarif; }, "Write a SARIF 2.1.0 log with fixes")
+        ->excludes(json);
+}
+
+} // namespace vtsym

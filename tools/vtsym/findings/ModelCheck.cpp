@@ -1,0 +1,316 @@
+#include "tools/vtsym/findings/ModelCheck.hpp"
+
+#include "base/VCService.hpp"
+#include "base/core/Table.hpp"
+#include "base/variants/VariantKeywords.hpp"
+#include "host/Diagnostics.hpp"
+#include "host/Text.hpp"
+#include "tools/vtsym/io/Json.hpp"
+
+#include <algorithm>
+#include <array>
+#include <unordered_set>
+
+namespace vtsym {
+
+namespace {
+
+constexpr std::size_t shownBytes = 200;   ///< of a condition in a sentence
+constexpr std::size_t climbed = 256;      ///< ancestors looked at
+constexpr std::size_t shownAncestors = 8; ///< whose conditions a finding follows from
+
+/// In the order of VT::ChoiceFault.
+constexpr std::array<std::string_view, 5> kinds{"dead", "always-active", "redundant", "overlapping", "missing"};
+
+std::string_view kindOf(VT::ChoiceFault fault) {
+    return kinds.at(static_cast<std::size_t>(fault));
+}
+
+bool isUnconditional(const VTBlock& block) {
+    return block.variantCondition().empty() ||
+           VT::VariantKeywords::isInheritVariantKeyword(block.variantCondition(), true);
+}
+
+std::string shown(const std::string& text) {
+    return VT::shownText(text, shownBytes);
+}
+
+Place regionOf(const std::string& file, const VT::Embedded::TextPlace& place) {
+    return {file, place.line, place.column, place.line, place.endColumn, {}};
+}
+
+Finding findingAt(Place place, VT::ChoiceFault fault, std::string message, std::string condition) {
+    Finding finding;
+    finding.place = std::move(place);
+    finding.kind = kindOf(fault);
+    finding.message = std::move(message);
+    finding.condition = std::move(condition);
+    return finding;
+}
+
+} // namespace
+
+ModelCheck::ModelCheck(const VTRootBD& model, std::string file, bool bits32)
+    : model_(model),
+      file_(std::move(file)),
+      conditions_(*handle_),
+      checker_(*handle_, {.bits32 = bits32}) {}
+
+std::string ModelCheck::print(VT::SymbolicExprId condition) const {
+    const std::string text = model_.isQuill() ? handle_->printQExpr(condition) : handle_->printCExpr(condition);
+    return text.empty() ? "true" : text;
+}
+
+std::string ModelCheck::witnessText(const VT::Witness& witness) const {
+    return witness.empty() ? "any values" : handle_->printWitness(witness);
+}
+
+Place ModelCheck::placeOf(const VTBlock& block) const {
+    const bool hasCondition = block.conditionPlace().line != 0;
+    Place place = regionOf(file_, hasCondition ? block.conditionPlace() : block.namePlace());
+    place.name = block.path();
+    return place;
+}
+
+void ModelCheck::write(std::vector<Finding>& kept, Finding finding) {
+    writer_->write(finding);
+    kept.push_back(std::move(finding));
+}
+
+void ModelCheck::problem(const Place& place, const std::string& sentence) {
+    writer_->problem(place, sentence);
+    problems_.push_back(sentence);
+}
+
+/// The conditions of a block and of its ancestors, the nearest first.
+std::vector<RelatedPlace> ModelCheck::conditionsAround(const VTBlock* block) const {
+    std::vector<RelatedPlace> around;
+    for (std::size_t i = 0; block != nullptr && i < climbed && around.size() < shownAncestors;
+         ++i, block = block->parent())
+        if (!isUnconditional(*block))
+            around.push_back({placeOf(*block), block->variantCondition()});
+    return around;
+}
+
+VT::SymbolicExprId ModelCheck::contextOf(const VTBlock* block) const {
+    return block != nullptr ? contexts_.at(block) : handle_->table().getIdTRUE();
+}
+
+VT::SymbolicExprId ModelCheck::conditionOf(const vtPort& port) const {
+    VT::VCSymbolicExprId to = handle_->table().getIdFALSE();
+    for (const VTBlock* const destination : port.destinations())
+        if (contexts_.contains(destination))
+            to = handle_->OR(to, contextOf(destination), false);
+    return handle_->AND(contextOf(&port.source()), to, false).id();
+}
+
+/// Whether all conditions are some.
+bool ModelCheck::readConditions() {
+    bool allRead = true;
+    std::unordered_set<const VTBlock*> withDefault;
+    const auto refuse = [&](const VTBlock& block, const std::string& sentence) {
+        problem(placeOf(block), block.path() + ": " + sentence);
+        allRead = false;
+    };
+    for (const VTBlock& block : model_.blocks()) {
+        if (VT::BlockConditions::isDefault(block) && !block.isChoice())
+            refuse(block, "\"(default)\" is for choices alone: write a condition.");
+        else if (VT::BlockConditions::isDefault(block) && !withDefault.insert(block.parent()).second)
+            refuse(block, "There is another \"(default)\" choice: write a condition.");
+        try {
+            conditions_.own(block);
+        } catch (const VT::HostDiagnostic& diagnostic) {
+            if (!VT::BlockConditions::isDefault(block)) // which reads the others, that are told themselves
+                refuse(block, diagnostic.what());
+        }
+    }
+    return allRead;
+}
+
+void ModelCheck::run(FindingWriter& writer) {
+    writer_ = &writer;
+    if (!readConditions())
+        return;
+    std::unordered_set<const VTBlock*> dead;      // with all that is in them
+    std::unordered_set<const VTBlock*> followers; // of what is around them
+    const auto note = [&](const VT::ChoiceSetReport& report, std::span<const VTBlock* const> blocks) {
+        for (const VT::ChoiceFinding& finding : report.findings) {
+            if (finding.fault == VT::ChoiceFault::Dead)
+                dead.insert(blocks[finding.choice]);
+            if (finding.fault == VT::ChoiceFault::AlwaysActive)
+                followers.insert(blocks[finding.choice]);
+        }
+    };
+    for (const VTBlock& block : model_.blocks()) {
+        const std::array self{&block};
+        if (dead.contains(block.parent()))
+            dead.insert(&block);
+        else if (!block.isChoice() && !isUnconditional(block))
+            note(checkBlock(block), self);
+        if (dead.contains(&block))
+            continue;
+        const VT::SymbolicExprId around = contextOf(block.parent());
+        contexts_.emplace(
+            &block, followers.contains(&block) ? around : handle_->AND(around, conditions_.own(block), false).id());
+        if (!block.choices().empty())
+            note(checkChoices(block), block.choices());
+        if (checker_.stepsUsedUp()) {
+            problem(placeOf(block), "The steps of the check are used up: what follows is not decided.");
+            return;
+        }
+    }
+    for (const vtPort& port : model_.ports())
+        if (contexts_.contains(&port.source()))
+            checkPort(port);
+}
+
+VT::ChoiceSetReport ModelCheck::checkBlock(const VTBlock& block) {
+    VT::ChoiceSetReport report = checker_.checkCondition(contextOf(block.parent()), conditions_.own(block).id());
+    const std::array blocks{&block};
+    for (const VT::ChoiceFinding& finding : report.findings)
+        write(otherFindings_, findingOf(block, blocks, finding));
+    for (const VT::ChoiceFinding& finding : report.undecided)
+        tellUndecided(block, blocks, finding);
+    return report;
+}
+
+VT::ChoiceSetReport ModelCheck::checkChoices(const VTBlock& block) {
+    std::vector<VT::SymbolicExprId> choices;
+    choices.reserve(block.choices().size());
+    for (const VTBlock* const choice : block.choices())
+        choices.push_back(conditions_.own(*choice).id());
+    const auto defaultChoice = std::ranges::find_if(
+        block.choices(), [](const VTBlock* each) { return VT::BlockConditions::isDefault(*each); });
+    VT::ChoiceSetReport report =
+        checker_.check(contextOf(&block), choices,
+                       defaultChoice == block.choices().end()
+                           ? std::nullopt
+                           : std::optional(static_cast<std::size_t>(defaultChoice - block.choices().begin())));
+    std::erase_if(report.findings, [&](const VT::ChoiceFinding& finding) {
+        const VTBlock& choice = *block.choices()[finding.choice];
+        return finding.fault == VT::ChoiceFault::AlwaysActive && choices.size() == 1 &&
+               (isUnconditional(choice) || VT::BlockConditions::isDefault(choice));
+    });
+    choiceSets_.push_back({&block, report, {}});
+    std::vector<Finding>& findings = choiceSets_.back().findings;
+    for (const VT::ChoiceFinding& finding : report.findings)
+        write(findings, findingOf(block, block.choices(), finding));
+    for (const VT::ChoiceFinding& finding : report.undecided)
+        tellUndecided(block, block.choices(), finding);
+    if (!report.allOverlaps && !checker_.stepsUsedUp()) {
+        write(findings,
+              findingAt(placeOf(block), VT::ChoiceFault::Overlap,
+                        "more choices of " + block.path() + " overlap than the pairs told", block.variantCondition()));
+    }
+    return report;
+}
+
+Finding ModelCheck::findingOf(const VTBlock& set, std::span<const VTBlock* const> blocks,
+                              const VT::ChoiceFinding& finding) {
+    const bool isOfSet = finding.fault == VT::ChoiceFault::Missing;
+    const bool isPair = finding.fault == VT::ChoiceFault::Overlap;
+    const VTBlock& block = isOfSet ? set : *blocks[isPair ? finding.other : finding.choice];
+    const VTBlock* const around = isOfSet ? &set : block.parent();
+    Finding result = findingAt(placeOf(block), finding.fault, {}, block.variantCondition());
+    result.follows = conditionsAround(around);
+    const std::string path = block.path();
+    const std::string where = result.follows.empty() ? "" : " where " + around->path() + " is";
+    const std::string condition = shown(block.variantCondition());
+    switch (finding.fault) {
+    case VT::ChoiceFault::Dead:
+        result.message = path + " is never active: ";
+        if (VT::BlockConditions::isDefault(block))
+            result.message += "the other choices leave nothing to it";
+        else if (checker_.canHold(conditions_.own(block).id()).isYes())
+            result.message += condition + " cannot hold" + where + " active";
+        else
+            result.message += condition + " never holds";
+        break;
+    case VT::ChoiceFault::AlwaysActive:
+        result.message = path + " is always active" + where;
+        break;
+    case VT::ChoiceFault::Redundant:
+        tellShortened(result, block, finding.proposed);
+        result.message += where.empty() ? "" : where + " active";
+        break;
+    case VT::ChoiceFault::Overlap: {
+        const VTBlock& first = *blocks[finding.choice];
+        result.message = first.path() + " and " + path + " are both active for " + witnessText(finding.witness);
+        if (finding.firstCovered && finding.secondCovered)
+            result.message += "; neither is ever active without the other";
+        else if (finding.firstCovered || finding.secondCovered)
+            result.message += "; " + (finding.firstCovered ? first.path() : path) + " is never active without " +
+                              (finding.firstCovered ? path : first.path());
+        result.follows.insert(result.follows.begin(), {placeOf(first), first.variantCondition()});
+        break;
+    }
+    case VT::ChoiceFault::Missing:
+        result.message = "no choice of " + path + " is active for " + witnessText(finding.witness);
+        break;
+    }
+    if (finding.fault != VT::ChoiceFault::Dead)
+        result.witness = handle_->printWitness(finding.witness);
+    return result;
+}
+
+void ModelCheck::tellShortened(Finding& finding, const VTBlock& block, VT::SymbolicExprId proposed) const {
+    const std::string text = print(proposed);
+    finding.message = finding.place.name + ": " + shown(block.variantCondition()) + " can be written " + shown(text);
+    finding.proposed = text;
+    if (block.conditionPlace().line != 0)
+        finding.fix =
+            Fix{"Take the redundant operand away.", regionOf(file_, block.conditionPlace()), jsonString(text)};
+}
+
+void ModelCheck::tellUndecided(const VTBlock& set, std::span<const VTBlock* const> blocks,
+                               const VT::ChoiceFinding& finding) {
+    if (checker_.stepsUsedUp())
+        return; // told once
+    const bool isOfSet = finding.fault == VT::ChoiceFault::Missing;
+    const VTBlock& block = isOfSet ? set : *blocks[finding.choice];
+    const std::string path = block.path();
+    std::string question;
+    switch (finding.fault) {
+    case VT::ChoiceFault::Overlap:
+        question = path + " and " + blocks[finding.other]->path() + " can be active at once";
+        break;
+    case VT::ChoiceFault::Missing:
+        question = "a choice of " + path + " is active for all values";
+        break;
+    default:
+        question = path + (finding.fault == VT::ChoiceFault::Dead ? " can be active" : " is always active");
+    }
+    problem(placeOf(block),
+            "Whether " + question + " stays undecided: it " +
+                (finding.bound == VT::DecisionBound::Steps ? "takes too many steps."
+                                                           : "hangs on arithmetic beyond linear terms."));
+}
+
+void ModelCheck::checkPort(const vtPort& port) {
+    const bool isJoined = std::ranges::any_of(port.destinations(), [&](const VTBlock* block) {
+        return checker_.canHold(conditions_.net(*block).id()).isYes();
+    });
+    if (!isJoined)
+        return; // without destinations, or they are told themselves
+    const VT::Decision flows = checker_.canHold(conditionOf(port));
+    Place place = regionOf(file_, port.place());
+    place.name = port.name();
+    if (flows.isUndecided())
+        problem(place, "Whether the port " + port.name() + " can be active stays undecided.");
+    if (!flows.isNo())
+        return;
+    std::vector<RelatedPlace> follows = conditionsAround(&port.source());
+    for (const VTBlock* const destination : port.destinations()) {
+        for (RelatedPlace& each : conditionsAround(destination))
+            if (follows.size() < 2 * shownAncestors)
+                follows.push_back(std::move(each));
+    }
+    Finding result = findingAt(std::move(place), VT::ChoiceFault::Dead,
+                               "the port " + shown(port.name()) + " is never active: " + port.source().path() +
+                                   " is never active together with a block that it goes to",
+                               {});
+    result.follows = std::move(follows);
+    write(otherFindings_, std::move(result));
+}
+
+} // namespace vtsym

@@ -1,0 +1,183 @@
+#include "tools/vtsym/io/Files.hpp"
+
+#include "tools/vtsym/io/Arguments.hpp"
+
+#include <algorithm>
+#include <array>
+#include <cerrno>
+#include <charconv>
+#include <fcntl.h>
+#include <limits>
+#include <new>
+#include <sys/stat.h>
+#include <system_error>
+#include <unistd.h>
+#include <utility>
+
+namespace vtsym {
+
+namespace {
+
+/// Bytes at the beginning of a file in which a text has no NUL.
+constexpr std::size_t firstBytes = 8192;
+
+struct Unit {
+    unsigned shift;
+    char letter;
+    const char* name;
+};
+
+constexpr std::array<Unit, 4> units{{{30, 'G', " GiB"}, {20, 'M', " MiB"}, {10, 'K', " KiB"}, {0, '\0', " bytes"}}};
+
+class Descriptor {
+public:
+    Descriptor(const std::string& path, int flags) : value_(open(path.c_str(), flags | O_CLOEXEC | O_NOCTTY, 0666)) {}
+
+    Descriptor(const Descriptor&) = delete;
+    Descriptor& operator=(const Descriptor&) = delete;
+
+    ~Descriptor() {
+        if (value_ >= 0)
+            ::close(value_);
+    }
+
+    [[nodiscard]] int get() const noexcept { return value_; }
+
+    /// Whether all that was written has arrived, as far as the system tells.
+    bool close() { return ::close(std::exchange(value_, -1)) == 0; }
+
+private:
+    int value_;
+};
+
+[[noreturn]] void fail(const char* what) {
+    throw FileError(what + std::generic_category().message(errno));
+}
+
+[[noreturn]] void failToRead() {
+    fail("cannot be read: ");
+}
+
+[[noreturn]] void failToWrite() {
+    fail("cannot be written: ");
+}
+
+/// Appends bytes until there are `size` of them; false at the end of the file.
+bool readUpTo(const Descriptor& file, std::size_t size, std::string& text) {
+    std::size_t at = text.size();
+    text.resize(size);
+    while (at < size) {
+        const ssize_t got = read(file.get(), text.data() + at, size - at);
+        if (got < 0 && errno != EINTR)
+            failToRead();
+        if (got == 0) {
+            text.resize(at);
+            return false;
+        }
+        at += static_cast<std::size_t>(std::max<ssize_t>(got, 0));
+    }
+    return true;
+}
+
+std::string readText(const Descriptor& file, std::size_t bound) {
+    struct stat state {};
+
+    if (file.get() < 0 || fstat(file.get(), &state) != 0)
+        failToRead();
+    if (S_ISDIR(state.st_mode))
+        throw FileError("is a folder: name a file in it");
+    const bool isRegular = S_ISREG(state.st_mode);
+    const auto refuseSize = [bound] {
+        throw FileError("is larger than " + sizeText(bound) + ": --max-size allows more");
+    };
+    std::string text;
+    bool goesOn = readUpTo(file, std::min(firstBytes, bound + 1), text);
+    if (text.find('\0') != std::string::npos)
+        throw FileError("is not a text: there is a NUL in it");
+    const std::size_t size = isRegular ? static_cast<std::size_t>(state.st_size) : 0;
+    if (size > bound || text.size() > bound)
+        refuseSize();
+    while (goesOn) { // one more byte than there is shows the end
+        goesOn = readUpTo(file, std::min(size >= text.size() ? size + 1 : 2 * text.size(), bound + 1), text);
+        if (text.size() > bound)
+            refuseSize();
+    }
+    return text;
+}
+
+/// A number of bytes with a unit or without; 0 where it is none.
+std::size_t bytesOf(std::string_view text) {
+    std::size_t number = 0;
+    const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+    const std::string_view rest(end, static_cast<std::size_t>(text.data() + text.size() - end));
+    if (error != std::errc() || rest.size() > 1)
+        return 0;
+    const char letter = rest.empty() ? '\0' : rest.front();
+    const auto* const unit = std::ranges::find(units, letter, &Unit::letter);
+    const bool fits = unit != units.end() && number <= (std::numeric_limits<std::size_t>::max() >> 1U >> unit->shift);
+    return fits ? number << unit->shift : 0;
+}
+
+} // namespace
+
+std::string readFile(const std::string& path, std::size_t bound) {
+    try {
+        return readText(Descriptor(path, O_RDONLY), bound);
+    } catch (const std::bad_alloc&) {
+        throw FileError("cannot be read: there is not enough memory for it");
+    } catch (const std::length_error&) {
+        throw FileError("cannot be read: there is not enough memory for it");
+    }
+}
+
+void writeFile(const std::string& path, std::string_view text) {
+    Descriptor file(path, O_WRONLY | O_CREAT | O_TRUNC);
+    if (file.get() < 0)
+        failToWrite();
+    while (!text.empty()) {
+        const ssize_t written = write(file.get(), text.data(), text.size());
+        if (written < 0 && errno != EINTR)
+            failToWrite();
+        text.remove_prefix(static_cast<std::size_t>(std::max<ssize_t>(written, 0)));
+    }
+    if (!file.close())
+        failToWrite();
+}
+
+bool isSameFile(const std::string& a, const std::string& b) {
+    struct stat first {};
+
+    struct stat second {};
+
+    return stat(a.c_str(), &first) == 0 && stat(b.c_str(), &second) == 0 && S_ISREG(first.st_mode) &&
+           first.st_dev == second.st_dev && first.st_ino == second.st_ino;
+}
+
+std::string sizeText(std::size_t bytes) {
+    const auto* const unit = std::ranges::find_if(units, [bytes](const Unit& each) {
+        return bytes >> each.shift != 0 && bytes >> each.shift << each.shift == bytes;
+    });
+    return unit == units.end() ? "0 bytes" : std::to_string(bytes >> unit->shift) + unit->name;
+}
+
+void addSizeOption(CLI::App& command, std::size_t& bound) {
+    const auto take = [&bound](const std::string& size) {
+        bound = bytesOf(size);
+        if (bound == 0) {
+            throw CLI::ValidationError("--max-size",
+                                       quotedArgument(size) +
+                                           " is not a size: write a number of bytes, or such as 64K, 64M or 1G");
+        }
+    };
+    addArgument(command, "--max-size", take, "Reject files that are larger (" + sizeText(mostBytes) + " unless given)")
+        ->type_name("SIZE");
+}
+
+void holdStandardStreams() {
+    // The lowest number that is free is the one that is taken; a stream in the wrong direction fails.
+    for (int stream = STDIN_FILENO; stream <= STDERR_FILENO; ++stream)
+        if (fcntl(stream, F_GETFD) == -1)
+            static_cast<void>(open("/dev/null", stream == STDIN_FILENO ? O_WRONLY : O_RDONLY));
+}
+
+} // namespace vtsym
