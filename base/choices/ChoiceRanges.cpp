@@ -1,5 +1,7 @@
 #include "base/choices/ChoiceRanges.hpp"
 
+#include "base/core/Chains.hpp"
+#include "base/core/Limits.hpp"
 #include "base/core/Nodes.hpp"
 #include "base/core/Operators.hpp"
 #include "base/variants/VariantKeywords.hpp"
@@ -14,8 +16,6 @@
 namespace VT {
 
 namespace {
-
-constexpr std::size_t mostOperands = 64; ///< that one condition is taken apart into
 
 constexpr std::int64_t lowest = std::numeric_limits<std::int64_t>::min();
 constexpr std::int64_t highest = std::numeric_limits<std::int64_t>::max();
@@ -66,22 +66,13 @@ std::optional<NameRange> rangeOf(const SymbolicExprTable& table, SymbolicExprId 
 /// The operands of a chain of one operator, as many as are looked at; nothing where there are more.
 std::vector<SymbolicExprId> operandsOf(const SymbolicExprTable& table, SymbolicExprId chain, SymbolicOp op) {
     std::vector<SymbolicExprId> operands;
-    std::vector<SymbolicExprId> open{chain};
-    for (std::size_t seen = 0; !open.empty(); ++seen) {
-        const SymbolicExprId id = open.back();
-        open.pop_back();
-        const SymbolicExpr& node = *table.get(id);
-        if (node.op() != op) {
+    const bool complete = walkChain(
+        table, chain, limits::rangeOperands, [op](SymbolicExprId, const SymbolicExpr& node) { return node.op() == op; },
+        [&](SymbolicExprId id, const SymbolicExpr* node) {
             operands.push_back(id);
-            continue;
-        }
-        for (const std::size_t i : {1U, 0U}) {
-            if (!table.hasOperand(id, node.getInput(i)) || seen > 2 * mostOperands)
-                return {};
-            open.push_back(node.getInput(i));
-        }
-    }
-    return operands;
+            return node != nullptr;
+        });
+    return complete ? operands : std::vector<SymbolicExprId>();
 }
 
 /// The ranges of an And.

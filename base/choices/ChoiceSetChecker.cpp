@@ -3,6 +3,7 @@
 #include "base/choices/ChoiceSetChecker.hpp"
 
 #include "base/choices/ChoiceRanges.hpp"
+#include "base/core/Chains.hpp"
 #include "base/core/Table.hpp"
 #include "base/decide/Decider.hpp"
 #include "base/decide/shorten/ConditionProofs.hpp"
@@ -100,21 +101,16 @@ Decision ChoiceSetChecker::canHold(SymbolicExprId condition) {
 
 /// Operands that && || ! leave, counted up to one beyond the bound.
 std::size_t ChoiceSetChecker::State::operandsOf(SymbolicExprId condition) const {
+    static constexpr OperatorSet logicalOps{SymbolicOp::And, SymbolicOp::Or, SymbolicOp::Not};
     std::size_t count = 0;
-    std::vector<SymbolicExprId> open{condition};
-    while (!open.empty() && count + open.size() <= limits::choiceOperands) {
-        const SymbolicExpr* const node = table.get(open.back());
-        open.pop_back();
-        const SymbolicOp op = node != nullptr ? node->op() : SymbolicOp::None; // of an operand that is missing
-        const bool isChain = op == SymbolicOp::And || op == SymbolicOp::Or;
-        if (isChain || op == SymbolicOp::Not)
-            open.push_back(node->getInput(0));
-        if (isChain)
-            open.push_back(node->getInput(1));
-        if (!isChain && op != SymbolicOp::Not)
+    const bool complete = walkChain(
+        table, condition, limits::choiceOperands,
+        [](SymbolicExprId, const SymbolicExpr& node) { return logicalOps.contains(node.op()); },
+        [&](SymbolicExprId, const SymbolicExpr*) {
             ++count;
-    }
-    return count + open.size();
+            return true;
+        });
+    return complete ? count : limits::choiceOperands + 1;
 }
 
 /// The condition without operands that its parent's makes redundant; itself where there are none.

@@ -104,12 +104,21 @@ inline constexpr std::size_t shortenByProofs = 64;
 inline constexpr std::size_t impliedTries = 1000;
 inline constexpr std::size_t impliedNodes = std::size_t{1} << 16U;
 
+/// Terms of a condition that one comparison is tried for in the place of a group, and literals that each of them is
+/// compared with.  Further ones are not tried.
+inline constexpr std::size_t impliedTerms = 8;
+inline constexpr std::size_t impliedLiterals = 12;
+
 /// Steps that the checks of all choice sets of a model may cost together: about half a minute.  Beyond the bound what
 /// is left is undecided.
 inline constexpr std::uint64_t choiceSteps = std::uint64_t{1} << 28U;
 
 /// Overlapping pairs that are told of one choice set; n choices have up to n^2/2.  Beyond the bound there are more.
 inline constexpr std::size_t choiceOverlaps = 1000;
+
+/// Products of a choice's condition, and comparisons of each, that the ranges of its names are read from.  A larger
+/// condition has no ranges, so that it is compared with every other choice.
+inline constexpr std::size_t rangeOperands = 64;
 
 /// Operands of a choice's condition up to which a redundant one is looked for.
 inline constexpr std::size_t choiceOperands = 64;

@@ -5,6 +5,7 @@
 // diagrams. One step for each operand, plus those of the diagrams.
 #include "base/decide/ConditionReader.hpp"
 
+#include "base/core/Chains.hpp"
 #include "base/core/Walk.hpp"
 #include "base/integer/ExactArithmetic.hpp"
 
@@ -119,27 +120,18 @@ bool ConditionReader::isWhole(SymbolicExprId id) {
 
 /// Appends the operands of a chain, each once, in the order of the tree.
 void ConditionReader::collectChain(SymbolicOp op, SymbolicExprId root) {
-    IdMap<bool> seen;
-    std::vector<SymbolicExprId> pending{root};
-    while (!pending.empty()) {
-        const SymbolicExprId id = pending.back();
-        pending.pop_back();
-        if (seen.find(id) != nullptr)
-            continue;
-        steps_.take();
-        seen.insert(id, true);
-        const SymbolicExpr* node = table_.get(id);
-        if (node == nullptr || node->op() != op || (id != root && read_.find(id) != nullptr)) {
+    walkDistinctChain(
+        table_, root, anyNumber,
+        [&](SymbolicExprId id, const SymbolicExpr& node) {
+            steps_.take();
+            return node.op() == op && (id == root || read_.find(id) == nullptr);
+        },
+        [&](SymbolicExprId id, const SymbolicExpr* node) {
+            missing_ = node == nullptr;
             operands_.push_back(id);
-            continue;
-        }
-        for (std::size_t i : {1U, 0U}) {
-            pending.push_back(node->getInput(i));
-            missing_ = missing_ || !table_.hasOperand(id, pending.back());
-        }
-        if (missing_)
-            return;
-    }
+            return !missing_;
+        },
+        [](SymbolicExprId) {});
 }
 
 void ConditionReader::store(SymbolicExprId id, Value value) {

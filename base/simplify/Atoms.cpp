@@ -1,6 +1,6 @@
 #include "base/simplify/Atoms.hpp"
 
-#include "base/util/IdMap.hpp"
+#include "base/core/Chains.hpp"
 
 #include <algorithm>
 
@@ -166,25 +166,13 @@ SymbolicExprId Atoms::write(const Cover& cover) {
 std::vector<SymbolicExprId> chainOperands(const RuleContext& context, SymbolicOp op, SymbolicExprId root,
                                           bool& repeated) {
     std::vector<SymbolicExprId> operands;
-    std::vector<SymbolicExprId> pending{root};
-    IdMap<bool> seen;
-    while (!pending.empty()) {
-        const SymbolicExprId id = pending.back();
-        pending.pop_back();
-        if (seen.find(id) != nullptr) {
-            repeated = true;
-            continue;
-        }
-        seen.insert(id, true);
-        const SymbolicExpr& node = context.node(id);
-        if (node.op() != op) {
+    walkDistinctChain(
+        context.table(), root, anyNumber, [op](SymbolicExprId, const SymbolicExpr& link) { return link.op() == op; },
+        [&](SymbolicExprId id, const SymbolicExpr*) {
             operands.push_back(id);
-            continue;
-        }
-        const auto& chain = static_cast<const SymbolicBinaryExpr&>(node);
-        pending.push_back(chain.right());
-        pending.push_back(chain.left());
-    }
+            return true;
+        },
+        [&](SymbolicExprId) { repeated = true; });
     return operands;
 }
 

@@ -1,5 +1,6 @@
 #include "base/simplify/Simplify.hpp"
 
+#include "base/core/Chains.hpp"
 #include "base/simplify/RuleTables.hpp"
 #include "base/util/IdMap.hpp"
 #include "base/variants/VariantKeywords.hpp"
@@ -21,40 +22,23 @@ std::span<const RuleInfo* const> simplificationRules() {
 
 namespace {
 
-/// Adds the operands of a chain of `op` to a set; false where there are more than the limit allows.  Walks one left
-/// spine after the other.
-bool collectOperands(const SymbolicExprTable& table, SymbolicOp op, SymbolicExprId root,
-                     boost::container::flat_set<SymbolicExprId>& out) {
-    std::vector<SymbolicExprId> pending{root};
-    IdMap<bool> walked;
-    while (!pending.empty()) {
-        if (out.size() >= limits::chainOperands)
-            return false;
-        SymbolicExprId id = pending.back();
-        pending.pop_back();
-        while (table.has(id) && table.get(id)->op() == op && walked.find(id) == nullptr) {
-            walked.insert(id, true);
-            pending.push_back(table.get(id)->getInput(1));
-            id = table.get(id)->getInput(0);
-        }
-        if (!table.has(id) || table.get(id)->op() != op)
-            out.insert(id);
-        if (pending.size() >= limits::chainOperands)
-            return false;
-    }
-    return true;
-}
-
+/// Adds the operands of a chain to a set, or the chain itself where there are more than the limit allows.
 void addOperands(const SymbolicExprTable& table, SymbolicOp op, const SymbolicExpr& node,
                  boost::container::flat_set<SymbolicExprId>& out) {
     const SymbolicExprId root = node.getId(table);
     if (!table.has(root))
         return;
-    boost::container::flat_set<SymbolicExprId> operands;
-    if (collectOperands(table, op, root, operands))
-        out.insert(operands.begin(), operands.end());
-    else
-        out.insert(root);
+    std::vector<SymbolicExprId> operands;
+    const bool complete = walkDistinctChain(
+        table, root, limits::chainOperands, [op](SymbolicExprId, const SymbolicExpr& link) { return link.op() == op; },
+        [&](SymbolicExprId id, const SymbolicExpr*) {
+            operands.push_back(id);
+            return true;
+        },
+        [](SymbolicExprId) {});
+    if (!complete)
+        operands.assign(1, root);
+    out.insert(operands.begin(), operands.end());
 }
 
 } // namespace

@@ -1,5 +1,6 @@
 #include "base/decide/shorten/FormulaReader.hpp"
 
+#include "base/core/Chains.hpp"
 #include "base/core/Limits.hpp"
 #include "base/core/Nodes.hpp"
 #include "base/integer/ExactArithmetic.hpp"
@@ -96,25 +97,19 @@ bool FormulaReader::enter(SymbolicExprId id) {
 
 /// Appends the operands of a chain, as often as they occur; false where one is missing or there are too many.
 bool FormulaReader::collectChain(SymbolicExprId root, SymbolicOp op) {
-    std::vector<SymbolicExprId> pending{root};
-    while (!pending.empty()) {
-        const SymbolicExprId id = pending.back();
-        pending.pop_back();
-        const SymbolicExpr* node = table_.get(id);
-        if (node == nullptr || pending.size() + operands_.size() > limits::shortenComparisons)
-            return false;
-        if (chainOf(node->op()) != op) {
-            operands_.push_back(id);
-            continue;
-        }
-        seen_.add(node->op());
-        for (const std::size_t at : {1U, 0U}) {
-            pending.push_back(node->getInput(at));
-            if (pending.back() >= id)
+    const std::size_t left = limits::shortenComparisons - std::min(operands_.size(), limits::shortenComparisons);
+    return walkChain(
+        table_, root, left,
+        [&](SymbolicExprId, const SymbolicExpr& node) {
+            if (chainOf(node.op()) != op)
                 return false;
-        }
-    }
-    return true;
+            seen_.add(node.op());
+            return true;
+        },
+        [&](SymbolicExprId id, const SymbolicExpr* node) {
+            operands_.push_back(id);
+            return node != nullptr;
+        });
 }
 
 ReadFormula FormulaReader::leave(const Frame& frame) {

@@ -1,5 +1,6 @@
 #include "base/decide/shorten/ImpliedCondition.hpp"
 
+#include "base/core/Chains.hpp"
 #include "base/core/Limits.hpp"
 #include "base/core/Make.hpp"
 #include "base/core/Nodes.hpp"
@@ -10,13 +11,6 @@
 #include <set>
 
 namespace VT {
-
-namespace {
-
-constexpr std::size_t mostOperands = 8;  ///< that comparisons are made of
-constexpr std::size_t mostLiterals = 12; ///< that each of them is compared with
-
-} // namespace
 
 SymbolicExprId compareWith(SymbolicExprTable& table, SymbolicOp op, SymbolicExprId operand, int literal) {
     return makeBinary(table, op, operand, SymbolicIntValue(table, literal).getId(table));
@@ -49,21 +43,16 @@ bool ImpliedCondition::split(SymbolicExprId condition) {
         if (node.op() != SymbolicOp::And && node.op() != SymbolicOp::Or)
             continue;
         items_[i].op = node.op();
-        std::vector<SymbolicExprId> pending{items_[i].id};
-        while (!pending.empty()) {
-            const SymbolicExprId id = pending.back();
-            pending.pop_back();
-            const SymbolicExpr* operand = table_.get(id);
-            if (operand == nullptr || items_.size() + pending.size() > limits::chainOperands)
-                return false;
-            if (operand->op() == node.op()) {
-                pending.push_back(operand->getInput(1));
-                pending.push_back(operand->getInput(0));
-                continue;
-            }
-            items_[i].operands.push_back(items_.size());
-            items_.push_back({SymbolicOp::None, id, i, {}});
-        }
+        const bool complete = walkChain(
+            table_, items_[i].id, limits::chainOperands - std::min(items_.size(), limits::chainOperands),
+            [&](SymbolicExprId, const SymbolicExpr& link) { return link.op() == node.op(); },
+            [&](SymbolicExprId id, const SymbolicExpr* operand) {
+                items_[i].operands.push_back(items_.size());
+                items_.push_back({SymbolicOp::None, id, i, {}});
+                return operand != nullptr;
+            });
+        if (!complete)
+            return false;
     }
     return true;
 }
@@ -174,14 +163,14 @@ void ImpliedCondition::collectComparisons(SymbolicExprId condition) {
                     if (literal == nullptr || literal->op() != SymbolicOp::IntValue)
                         continue;
                     auto at = std::ranges::find(operands, operand);
-                    if (at == operands.end() && (root == context_ || operands.size() == mostOperands))
+                    if (at == operands.end() && (root == context_ || operands.size() == limits::impliedTerms))
                         continue;
                     if (at == operands.end()) {
                         at = operands.insert(at, operand);
                         literals.emplace_back();
                     }
                     auto& known = literals[static_cast<std::size_t>(at - operands.begin())];
-                    if (known.size() < mostLiterals)
+                    if (known.size() < limits::impliedLiterals)
                         known.insert(static_cast<const SymbolicIntValue*>(literal)->getValue());
                 }
             },
