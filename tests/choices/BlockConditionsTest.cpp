@@ -1,8 +1,8 @@
 // Conditions of blocks and ports: texts, keywords, errors, depth.
-#include "base/choices/BlockConditions.hpp"
-#include "base/choices/ChoiceSetChecker.hpp"
+#include "base/service/BlockConditions.hpp"
 #include "base/core/Table.hpp"
-#include "base/service/SymbolRegistry.hpp"
+#include "base/service/ChoiceSet.hpp"
+#include "base/simplify/Simplify.hpp"
 #include "host/Diagnostics.hpp"
 #include "host/embedded/ModelFile.hpp"
 #include "tests/service/Customizers.hpp"
@@ -87,13 +87,6 @@ TEST(ChoiceSets, KeywordsAreInForceWhereTheyWereWhenTheServiceWasMade) {
             EXPECT_EQ(service->covers({choices[0], choices[1]}).isYes(), inForce);
         }
     }
-}
-
-TEST(ServiceRegistry, IsOverTheTableOfTheService) {
-    const FreshService service;
-    const SymbolicExprId expression = service->parseC("N*2 + 1");
-    EXPECT_EQ(service->symbolRegistry().registerExpression(nullptr, expression), "dim_N_2a2_2b1");
-    EXPECT_EQ(service->table().getAliasForSymbolicIdentifier("dim_N_2a2_2b1"), "(N*2+1)");
 }
 
 TEST(BlockConditions, NeedNoStack) {

@@ -2,8 +2,6 @@
 #include "tests/support/Cases.hpp"
 
 #include <gmock/gmock.h>
-#include <rapidcheck.h>
-#include <rapidcheck/gtest.h>
 
 #include <cstdlib>
 #include <memory>

@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <fstream>
+#include <map>
 #include <random>
 #include <set>
 #include <sstream>
@@ -17,14 +18,19 @@ namespace {
 
 using Json = nlohmann::json;
 
+const Json modelSchema = Json::parse(std::ifstream(VTSYM_TEST_DATA "/../../docs/model.schema.json"));
+
 /// Makes values that a schema allows.
 class Generator {
 public:
-    Generator(const Json& root, std::mt19937_64& random) : root_(root), random_(random) {}
+    explicit Generator(std::mt19937_64& random) : random_(random) {}
 
     Json make(const Json& schema, const std::string& parent, int depth) { // NOLINT(misc-no-recursion): as deep as asked
-        if (schema.contains("$ref"))
-            return makeReferenced(schema["$ref"].get<std::string>(), parent, depth);
+        const std::string reference = schema.value("$ref", "");
+        if (reference == "#/$defs/path") // blocks come before ports, by name
+            return paths_.empty() ? Json("nowhere") : Json(paths_[random_() % paths_.size()]);
+        if (!reference.empty())
+            return make(modelSchema.at(Json::json_pointer(reference.substr(1))), parent, depth);
         if (schema.contains("anyOf"))
             return make(schema["anyOf"][random_() % schema["anyOf"].size()], parent, depth);
         if (schema.contains("enum"))
@@ -53,14 +59,6 @@ public:
     }
 
 private:
-    Json makeReferenced(const std::string& reference, const std::string& parent, // NOLINT(misc-no-recursion)
-                        int depth) {
-        if (reference == "#/$defs/path") // blocks come before ports, by name
-            return paths_.empty() ? Json("nowhere") : Json(paths_[random_() % paths_.size()]);
-        return make(root_.at(Json::json_pointer(reference.substr(1))), parent, depth);
-    }
-
-    const Json& root_;
     std::mt19937_64& random_;
     std::size_t names_ = 0;
     std::vector<std::string> paths_;
@@ -97,14 +95,13 @@ std::string refusal(const Json& model) {
 }
 
 TEST(ModelSchema, DescribesWhatTheReaderAccepts) {
-    const Json schema = Json::parse(std::ifstream(VTSYM_TEST_DATA "/../../docs/model.schema.json"));
     std::size_t refused = 0;
     for (std::uint64_t seed = 0; seed < 3000; ++seed) {
         std::mt19937_64 random(seed);
-        Json model = Generator(schema, random).make(schema, "", 3);
+        Json model = Generator(random).make(modelSchema, "", 3);
         if (seed % 2 == 1)
             damage(model, random);
-        const std::string errors = schemaErrors(schema, schema, model);
+        const std::string errors = schemaErrors(modelSchema, modelSchema, model);
         const std::string said = refusal(model);
         // Only the reader knows the blocks that a path may lead to.
         if (said.find("path") != std::string::npos || said.find("no block") != std::string::npos)
@@ -117,18 +114,16 @@ TEST(ModelSchema, DescribesWhatTheReaderAccepts) {
 
 /// A member that only the reader knows is never generated, but the reader lists its members when it refuses one.
 TEST(ModelSchema, NamesEveryMemberThatTheReaderKnows) {
-    const Json schema = Json::parse(std::ifstream(VTSYM_TEST_DATA "/../../docs/model.schema.json"));
-    for (const auto& [pointer, model] :
-         std::vector<std::pair<std::string, std::string>>{{"", R"({"?":1})"},
-                                                          {"/$defs/block", R"({"blocks":[{"?":1}]})"},
-                                                          {"/$defs/port", R"({"ports":[{"?":1}]})"}}) {
+    const std::map<std::string, std::string> models{
+        {"", R"({"?":1})"}, {"/$defs/block", R"({"blocks":[{"?":1}]})"}, {"/$defs/port", R"({"ports":[{"?":1}]})"}};
+    for (const auto& [pointer, model] : models) {
         const std::string said = refusal(Json::parse(model));
         std::istringstream listed(said.substr(said.rfind(" has ") + 5));
         std::set<std::string> known{"$schema"};
         for (std::string name; listed >> name;)
             known.insert(name.substr(0, name.find_first_of(",.")));
         std::set<std::string> described{"$schema"};
-        for (const auto& [name, member] : schema[Json::json_pointer(pointer)]["properties"].items())
+        for (const auto& [name, member] : modelSchema[Json::json_pointer(pointer)]["properties"].items())
             described.insert(name);
         EXPECT_EQ(known, described) << said;
     }

@@ -1,9 +1,12 @@
-// The service without a customizer: lifetime, texts in both languages, combinations, queries.
+// The service without a customizer: lifetime, texts in both languages, decisions, combinations, queries.
+#include "base/service/SymbolRegistry.hpp"
 #include "host/Diagnostics.hpp"
 #include "tests/service/Customizers.hpp"
 #include "tests/support/Cases.hpp"
 
+#include <boost/algorithm/string.hpp>
 #include <gtest/gtest.h>
+#include <map>
 #include <optional>
 
 namespace VT::Testing {
@@ -46,6 +49,8 @@ TEST(ServiceLifetime, BeginsWithConstantsAndKeywords) {
     EXPECT_EQ(table.size(), 4U);
     EXPECT_EQ(service->parseC("(sim)"), 2U);
     EXPECT_EQ(service->parseC("(codegen)"), 3U);
+    for (const std::string text : {"true", "false", "", "TRUE", "!A"})
+        EXPECT_EQ(VCService::isTRUEOrFALSEString(text), text == "true" || text == "false") << text;
 }
 
 TEST(ServiceLifetime, ReadsTheCacheFeatureOnce) {
@@ -58,39 +63,88 @@ TEST(ServiceLifetime, ReadsTheCacheFeatureOnce) {
     EXPECT_EQ(customizer.rewrites, 2);
 }
 
-TEST(ServiceTexts, AreReadAndPrinted) {
-    const FreshService service;
-    for (const CaseRow& row : casesOf("service.txt", "texts", 5)) {
-        const std::string& text = row[0];
-        SCOPED_TRACE(text);
-        EXPECT_EQ(service->convertExprBetweenQandC(text, false, false), row[1]);
-        EXPECT_EQ(service->convertExprBetweenQandC(text, false, true), row[2]);
-        for (int again = 0; again < 2; ++again) {
-            EXPECT_EQ(service->simplifyCExprFromCCondition(text), row[3]);
-            EXPECT_EQ(service->simplifyQExprFromCCondition(text), row[4]);
+using Texts = std::vector<std::string>;
+
+std::string told(const std::string& text) {
+    return text;
+}
+
+std::string told(const Texts& texts) {
+    return texts.empty() ? "none" : boost::algorithm::join(texts, "; ");
+}
+
+std::string told(const Decision& decision) {
+    static const char* const answers[] = {"no", "yes", "undecided"};
+    const std::string answer = answers[static_cast<std::size_t>(decision.answer)];
+    if (!decision.witness)
+        return answer;
+    const std::string witness = VCService::getInstance().printWitness(*decision.witness);
+    return answer + (witness.empty() ? ":" : ": ") + witness;
+}
+
+/// What a function of the service answers to texts.
+template <auto function>
+std::string answer(VCService& service, const Texts& texts) {
+    if constexpr (std::is_invocable_v<decltype(function), VCService&, Texts>)
+        return told(std::invoke(function, service, texts));
+    else if constexpr (std::is_invocable_v<decltype(function), VCService&, std::string, std::string>)
+        return told(std::invoke(function, service, texts.at(0), texts.at(1)));
+    else if constexpr (std::is_invocable_v<decltype(function), VCService&, std::string, bool, bool>)
+        return told(std::invoke(function, service, texts.at(0), texts.at(1) == "Quill", texts.at(2) == "Quill"));
+    else if constexpr (std::is_invocable_v<decltype(function), VCService&, std::string>)
+        return told(std::invoke(function, service, texts.at(0)));
+    else
+        return told(std::invoke(function, service, service.parseC(texts.at(0))));
+}
+
+#define CALL(name) std::pair(#name, &answer<&VCService::name>)
+
+/// Every call twice, with and without caches.
+TEST(ServiceCalls, AnswerTexts) {
+    const auto mapOf = [](auto... calls) {
+        return std::map<std::string, std::string (*)(VCService&, const Texts&)>{calls...};
+    };
+    const auto functions =
+        mapOf(CALL(computeUniqueAndOperandsFromCCondition), CALL(computeUniqueAndOperandsFromQCondition),
+              CALL(computeUniqueOrOperandsFromCCondition), CALL(computeUniqueOrOperandsFromQCondition),
+              CALL(containsFromCConditions), CALL(containsFromQConditions), CALL(convertExprBetweenQandC),
+              CALL(coversFromCConditions), CALL(coversFromQConditions), CALL(getImpliedCExprFromCConditions),
+              CALL(getImpliedQExprFromQConditions), CALL(impliesFromCConditions), CALL(impliesFromQConditions),
+              CALL(isDisjointFromCConditions), CALL(isDisjointFromQConditions), CALL(isEquivalentFromCConditions),
+              CALL(isEquivalentFromQConditions), CALL(isTighterThanFromCConditions), CALL(isTighterThanFromQConditions),
+              CALL(printCExpr), CALL(printCExprNoConversion), CALL(printQExpr), CALL(printQExprWithConversion),
+              CALL(shortestCExprFromCCondition), CALL(shortestCExprFromQCondition), CALL(shortestQExprFromCCondition),
+              CALL(shortestQExprFromQCondition), CALL(simplifyCExprFromCCondition), CALL(simplifyCExprFromQCondition),
+              CALL(simplifyExpressionWithoutEvalChecks), CALL(simplifyQExprFromCCondition),
+              CALL(simplifyQExprFromQCondition));
+    for (const bool caching : {false, true}) {
+        const FreshService service(caching);
+        for (const CaseRow& row : casesOf("service.txt", "calls", 3)) {
+            SCOPED_TRACE(row[0] + " of " + row[1]);
+            Texts texts;
+            boost::algorithm::iter_split(texts, row[1], boost::algorithm::first_finder("; "));
+            for (int again = 0; again < 2; ++again)
+                try {
+                    EXPECT_EQ(functions.at(row[0])(*service, texts), row[2]);
+                } catch (const HostDiagnostic&) {
+                    EXPECT_EQ("refused", row[2]);
+                }
         }
-        EXPECT_EQ(service->simplifyExpressionWithoutEvalChecks(text, false, true), row[4]);
-        EXPECT_EQ(service->getBoolean(service->simplifyFromCCondition(text).id()), row[3].empty());
-        EXPECT_EQ(VCService::isTRUEOrFALSEString(text), text == "true" || text == "false");
     }
 }
 
-TEST(ServiceTexts, ThatAreNoConditionAreRefused) {
+TEST(ServiceDecisions, OfSetsAndOfWhatIsNoCondition) {
     const FreshService service;
-    const std::size_t nodes = service->table().size();
-    for (const CaseRow& row : casesOf("service.txt", "refused", 2)) {
-        const std::string& text = row[1];
-        SCOPED_TRACE(text);
-        if (row[0] == "Quill") {
-            EXPECT_THROW(service->parseQ(text), HostDiagnostic);
-            continue;
-        }
-        EXPECT_THROW(service->parseC(text), HostDiagnostic);
-        EXPECT_THROW(service->simplifyFromCCondition(text), HostDiagnostic);
-        EXPECT_THROW(service->simplifyCExprFromCCondition(text), HostDiagnostic);
-        EXPECT_THROW(service->convertExprBetweenQandC(text, false, true), HostDiagnostic);
+    const VCSymbolicExprId a = service->parseC("A>1");
+    const VCSymbolicExprId b = service->parseC("A<5");
+    EXPECT_EQ(service->isDisjoint({a, b}).members, std::pair(std::size_t{0}, std::size_t{1}));
+    for (const SymbolicExprId bad : {invalidId, SymbolicExprId{service->table().size() + 100}}) {
+        EXPECT_EQ(service->implies(a, bad).bound, DecisionBound::NoCondition);
+        EXPECT_EQ(service->compare(bad, a).bound, DecisionBound::NoCondition);
+        EXPECT_EQ(service->covers({a, bad}).bound, DecisionBound::NoCondition);
+        EXPECT_EQ(service->getImpliedCondition(bad, a), invalidId);
+        EXPECT_TRUE(service->computeUniqueAndOperandsId(bad).empty());
     }
-    EXPECT_EQ(service->table().size(), nodes);
 }
 
 TEST(ServiceCombinations, OfConstantsAndConditions) {
@@ -126,10 +180,9 @@ TEST(ServiceIds, ThatAreNotOfTheTableAreAnswered) {
         EXPECT_TRUE(service->isEqual(bad, bad));
         EXPECT_FALSE(service->isEqual(bad, x.id()));
         EXPECT_FALSE(service->getBoolean(bad));
-        EXPECT_THROW(service->printQExpr(bad), std::out_of_range);
-        EXPECT_THROW(service->printQExprWithConversion(bad), std::out_of_range);
-        EXPECT_THROW(service->printCExpr(bad), std::out_of_range);
-        EXPECT_THROW(service->printCExprNoConversion(bad), std::out_of_range);
+        for (const auto print : {&VCService::printQExpr, &VCService::printQExprWithConversion, &VCService::printCExpr,
+                                 &VCService::printCExprNoConversion})
+            EXPECT_THROW(((*service).*print)(bad), std::out_of_range);
     }
     EXPECT_EQ(VCSymbolicExprId(), invalidId);
     EXPECT_TRUE(x == x.id() && x.id() == x); // as numbers
@@ -138,21 +191,12 @@ TEST(ServiceIds, ThatAreNotOfTheTableAreAnswered) {
 
 TEST(ServiceAliases, FirstOneStays) {
     const FreshService service;
-    EXPECT_EQ(service->getParameterAlias("N"), "");
     service->addParameterAlias("N", "N_1");
     service->addParameterAlias("N", "N_2");
     EXPECT_EQ(service->getParameterAlias("N"), "N_1");
-    EXPECT_EQ(service->getParameterAlias("n"), "");
-    service->addParameterAlias("M", "-5");
-    EXPECT_EQ(service->getParameterAlias("M"), "(-5)");
-    EXPECT_EQ(service->printCExpr(service->parseC("N")), "N");
-}
-
-TEST(QuillService, ReadsConstants) {
-    const VCServiceHandle service;
-    for (const char* const constant : {"", "true"})
-        EXPECT_EQ(service->parseQ(constant), service->table().getIdTRUE());
-    EXPECT_EQ(service->parseQ("false"), service->table().getIdFALSE());
+    const SymbolicExprId expression = service->parseC("N*2 + 1");
+    EXPECT_EQ(service->symbolRegistry().registerExpression(nullptr, expression), "dim_N_2a2_2b1");
+    EXPECT_EQ(service->table().getAliasForSymbolicIdentifier("dim_N_2a2_2b1"), "(N*2+1)");
 }
 
 TEST(QuillService, ListsAndReplacesSymbols) {

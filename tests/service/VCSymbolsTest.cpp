@@ -8,7 +8,6 @@
 
 #include <gmock/gmock.h>
 
-#include <algorithm>
 #include <boost/algorithm/string/join.hpp>
 #include <set>
 #include <stdexcept>

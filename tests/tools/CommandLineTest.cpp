@@ -1,10 +1,17 @@
 // The program: what it answers, what it says, and its exit status.
-#include "base/core/Operators.hpp"
-#include "tests/support/generators/Corpus.hpp"
+#include "tests/support/Corpus.hpp"
+#include "tests/support/Parsing.hpp"
+#include "tests/support/RandomCondition.hpp"
+#include "tests/support/Times.hpp"
+#include "tests/support/Truth.hpp"
 #include "tests/tools/Program.hpp"
 
+#include <bitset>
+#include <boost/algorithm/string/trim.hpp>
 #include <gmock/gmock.h>
 #include <nlohmann/json.hpp>
+#include <random>
+#include <set>
 
 namespace VT::Testing {
 namespace {
@@ -15,8 +22,10 @@ using ::testing::Not;
 using Json = nlohmann::json;
 
 TEST(Program, KeepsToItsTranscripts) {
-    expectTranscript("program-commands.txt");
-    expectTranscript("program-usage.txt");
+    for (const char* const file : {"program-commands.txt", "program-usage.txt", "program-models.txt"})
+        expectTranscript(file);
+    expectTranscript("program-files.txt", {{"c.c", "#if A\n#if A\n#endif\n#endif\n"}, // 27 bytes
+                                           {"m", R"({"blocks": [{"name": "b", "condition": "A && !A"}]})"}});
 }
 
 TEST(Program, CompletesWhatIsTyped) {
@@ -27,47 +36,6 @@ TEST(Program, CompletesWhatIsTyped) {
                                     HasSubstr("Mode==7\r\n")));
 }
 
-TEST(Program, KeepsDefinitionsWhenItStartsAnew) {
-    std::string input;
-    for (int i = 0; i < 60'000; ++i) {
-        const std::string number = std::to_string(i);
-        input += "N + x" + number + " * 0 * (" + number + " - y" + number + ")\n";
-    }
-    EXPECT_EQ(runProgram({"eval", "-D", "N=3"}, input + "N\n").output, std::string(60'000, '\n') + "3\n");
-}
-
-TEST(Program, DrawsDeepTreesInBoundedColumns) {
-    std::string sum = "x0";
-    for (int i = 1; i < 3000; ++i)
-        sum += "+x" + std::to_string(i);
-    const std::vector<std::string> lines = linesOf(runProgram({"tree"}, sum).output);
-    EXPECT_EQ(std::ranges::count_if(lines, [](const auto& line) { return line.ends_with("Plus +"); }), 2999);
-    EXPECT_EQ(std::ranges::count_if(lines, [](const auto& line) { return line.find(" x") != line.npos; }), 3000);
-    EXPECT_THAT(lines, ::testing::Each(::testing::SizeIs(::testing::Lt(200))));
-}
-
-TEST(Program, ListsOperators) {
-    const std::vector<std::string> lines = linesOf(runProgram({"operators"}).output);
-    const std::vector<std::string> objects = linesOf(runProgram({"operators", "--json"}).output);
-    ASSERT_EQ(lines.size(), operatorTable().size() + 1);
-    ASSERT_EQ(objects.size(), operatorTable().size());
-    EXPECT_THAT(lines[9], AllOf(HasSubstr("Modulo"), HasSubstr("%"), HasSubstr("rem")));
-    EXPECT_THAT(objects[8], AllOf(HasSubstr(R"("op":8,)"), HasSubstr(R"("SymbolicModuloExpr")"), HasSubstr(R"("%")")));
-}
-
-TEST(Program, HelpsOnRequest) {
-    for (const std::string command : {"", "simplify", "convert", "pp", "tree", "eval", "dims", "symbols", "replace",
-                                      "repl", "operators", "compare", "given", "check", "scan"}) {
-        SCOPED_TRACE(command);
-        const ProgramResult help = runScript(Workplace(), "vtsym " + command + " --help");
-        EXPECT_EQ(help.status, 0);
-        EXPECT_EQ(help.words, "");
-        EXPECT_THAT(help.output, AllOf(HasSubstr("Examples:\n  vtsym "), HasSubstr(command)));
-        EXPECT_EQ(runScript(Workplace(), "vtsym help " + command).output, help.output);
-    }
-    EXPECT_THAT(runProgram({"--version"}).output, ::testing::MatchesRegex("vtsym [0-9]+\\.[0-9]+\\.[0-9]+\n"));
-}
-
 TEST(Program, AnswersTheSameHoweverItIsAsked) {
     std::string input;
     for (const CorpusFile& file : corpusFiles) {
@@ -75,6 +43,7 @@ TEST(Program, AnswersTheSameHoweverItIsAsked) {
         for (std::size_t i = 0; i < lines.size(); i += 7)
             input += lines[i] + "\n";
     }
+    input += input; // the caches know the second half
     const std::vector<std::string> inputs = linesOf(input);
     ASSERT_GT(inputs.size(), 1000U);
     const ProgramResult plain = runProgram({"simplify"}, input);
@@ -98,12 +67,8 @@ TEST(Program, OutlivesHostileTexts) {
     std::string everyByte;
     for (int byte = 0; byte < 256; ++byte)
         everyByte += byte == '\n' ? ' ' : static_cast<char>(byte);
-    std::string longText;
-    for (int i = 0; i < 100'000; ++i)
-        longText += "a == 1 && ";
-    const Strings texts{
-        std::string(200'000, '('), std::string(3'000'000, 'x'), everyByte, "1.e999999999", std::string(500'000, '9'),
-        longText + "b c"};
+    const Strings texts{std::string(200'000, '('), std::string(3'000'000, 'x'),         everyByte, "1.e999999999",
+                        std::string(500'000, '9'), times(100'000, "a == 1 && ") + "b c"};
     std::string input;
     for (const std::string& text : texts)
         input += text + "\n";
@@ -133,6 +98,97 @@ TEST(Program, ColoursOnlyATerminalThatWantsThem) {
         EXPECT_THAT(shown, HasSubstr("false"));
     }
     EXPECT_THAT(runProgram(arguments).words, Not(HasSubstr("\033")));
+}
+
+TEST(Program, AnswersWhatTheReadmeShows) {
+    const std::string root = VTSYM_TEST_DATA "/../..";
+    std::vector<std::pair<std::string, std::string>> examples; // commands and what they write
+    std::ifstream stream(root + "/README.md");
+    bool inside = false;
+    for (std::string line; std::getline(stream, line);) {
+        if (line.starts_with("```"))
+            inside = line == "```console";
+        else if (inside && line.starts_with("$ "))
+            examples.emplace_back(line.substr(2), "");
+        else if (inside)
+            examples.back().second += line + "\n";
+    }
+    EXPECT_GT(examples.size(), 10U);
+    for (auto [command, output] : examples) {
+        const std::size_t run = command.find("./run ");
+        ASSERT_NE(run, std::string::npos) << command;
+        command.replace(run, 5, "vtsym");
+        const std::string written = runScript(Workplace(), "exec 2>&1; cd '" + root + "'; " + command).output;
+        EXPECT_EQ(boost::trim_right_copy(written), boost::trim_right_copy(output)) << command;
+    }
+}
+
+TEST(Check, AgreesWithBruteForce) {
+    std::mt19937_64 random(7);
+    const ConditionShape shape{.lowest = 0};
+    using Truths = std::bitset<216>; // at the values from -1 to 4, which stand for all integers
+    const auto truthsOf = [](const std::string& condition) {
+        SymbolicExprTable table;
+        const Truth truth(table, read(table, condition));
+        Truths truths;
+        std::size_t at = 0;
+        forEachAssignment(ConditionShape().symbols, -1, 4,
+                          [&](const Assignment& values) { truths[at++] = truth.under(values) != 0; });
+        return truths;
+    };
+    Json blocks = Json::array();
+    std::set<std::string> expected;
+    const auto expectUsed = [&](const std::string& name, const Truths& truths, const Truths& around) {
+        if (truths.none() || truths == around)
+            expected.insert((truths.none() ? "dead " : "always-active ") + name);
+    };
+    for (int n = 0; n < 400; ++n) {
+        const std::string name = "S" + std::to_string(n);
+        const std::string condition = randomCondition(random, 1 + random() % 6, shape);
+        const Truths parent = truthsOf(condition);
+        expectUsed(name, parent, Truths().set());
+        Json choices = Json::array();
+        std::vector<Truths> active;
+        Truths missing = parent;
+        for (std::size_t left = 2 + random() % 4; left > 0; --left) {
+            const std::string choice = std::to_string(active.size());
+            const std::string text = randomCondition(random, 1 + random() % 4, shape);
+            choices.push_back({{"name", choice}, {"condition", text}});
+            active.push_back(parent & truthsOf(text));
+            missing &= ~active.back();
+            if (parent.none())
+                continue;
+            expectUsed(name + "/" + choice, active.back(), parent);
+            for (std::size_t i = 0; i + 1 < active.size(); ++i)
+                if ((active[i] & active.back()).any())
+                    expected.insert("overlapping " + name + "/" + std::to_string(i) + " " + name + "/" + choice);
+        }
+        if (missing.any())
+            expected.insert("missing " + name);
+        blocks.push_back({{"name", name}, {"condition", condition}, {"choices", choices}});
+    }
+    std::set<std::string> found;
+    std::string shortened;
+    std::string equivalent;
+    const Workplace place;
+    place.write("m", Json({{"blocks", blocks}}).dump());
+    for (const std::string& line : linesOf(runScript(place, "vtsym check --json m").output)) {
+        const Json finding = Json::parse(line);
+        const std::string kind = finding["kind"];
+        if (kind == "redundant") {
+            const Json& around = finding["follows"];
+            const std::string context = around.empty() ? "(" : "(" + around[0]["text"].get<std::string>() + ") && (";
+            shortened += context + finding["condition"].get<std::string>() + ")\t" + context +
+                         finding["proposed"].get<std::string>() + ")\n";
+            equivalent += "equivalent\n";
+        } else
+            found.insert(kind + (kind == "overlapping" ? " " + finding["follows"][0]["name"].get<std::string>() : "") +
+                         " " + finding["name"].get<std::string>());
+    }
+    EXPECT_EQ(found, expected);
+    EXPECT_GT(found.size(), 1000U);
+    EXPECT_GT(equivalent.size(), 1000U);
+    EXPECT_EQ(runProgram({"compare"}, shortened).output, equivalent);
 }
 
 } // namespace

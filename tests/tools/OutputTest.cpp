@@ -19,6 +19,8 @@ using Json = nlohmann::json;
 const std::array<std::string, 5> hostileTexts{"\x1b[1m\x07\x7f", "\xc2\x9b\xe2\x80\xae\xe2\x80\xa8",
                                               "\xe2\x80\x8f\xff\xc3", "\xd8\x9c\xe2\x81\xa6", "\xf3\xa0\x81\x81"};
 
+const std::string file = "program-hostile.txt";
+
 /// The first line that does not stand as it would be shown to a terminal.
 std::string spoiled(const std::string& text) {
     const std::vector<std::string> lines = linesOf(text);
@@ -42,7 +44,7 @@ TEST(Output, IsSafeForTerminalsWhateverTheArguments) {
     const Workplace place;
     place.write("m", "{}");
     for (const std::string& text : hostileTexts) {
-        for (const CaseRow& row : casesOf("program-hostile.txt", "arguments", 1))
+        for (const CaseRow& row : casesOf(file, "arguments", 1))
             expectSafe(place, row[0], text);
         expectSafe(place, "simplify A", {}, {}, text + "=1," + text + ",CacheSymExprSimplifyResults=" + text);
     }
@@ -73,39 +75,17 @@ TEST(Output, IsSafeForTerminalsWhateverTheFiles) {
     for (const std::string& text : hostileTexts) {
         const Workplace place;
         place.run("mkdir sources");
-        const std::string name = "X" + text;
-        place.write("sources/" + text + ".c", "#ifdef " + name + "\n#ifdef " + name + "\n#elif A && defined " + name +
-                                                  "\n#endif\n#if A /*" + text + "*/ && A == '" + text + "'\n#elif A\n" +
-                                                  "#endif\n#endif\n#if B\n#if B && " + text +
-                                                  "\n#elif B\n#endif\n#endif");
+        place.write("sources/" + text + ".c", boost::replace_all_copy(casesOf(file, "source", 1)[0][0], "@", text));
         for (const std::string option : {"--summary", "--json", "--sarif"})
             expectSafe(place, "scan " + option + " sources sources/@.c@", text);
-        const auto named = [&](const std::string& suffix) { return name + suffix; };
-        const Json choices = {{{"name", named("1")}, {"condition", "A<3"}},
-                              {{"name", named("2")}, {"condition", "A>1"}},
-                              {{"name", named("3")}, {"condition", name}},
-                              {{"name", named("4")}, {"condition", "A<0 && A>2"}}};
-        const Json good = {{{"name", name}, {"condition", "B && !B"}}, {{"name", named("s")}, {"choices", choices}}};
-        const Json port = {{"name", name}, {"from", named("s")}, {"to", named("s") + "/" + named("4")}};
-        std::vector<std::string> models{text, "{\"" + text + "\":1}", "{\"name\": \"" + text};
-        Json sound = good;
-        sound[1]["choices"].erase(2); // which cannot be read
-        for (const Json& model : std::initializer_list<Json>{
-                 {{"name", name}, {"blocks", good}},
-                 {{"name", name}, {"blocks", sound}, {"ports", {port}}},
-                 {{"language", name}},
-                 {{name, name}},
-                 {{"blocks", {{{"name", name + "/"}}}}},
-                 {{"blocks", {{{"name", name}}, {{"name", name}}}}},
-                 {{"ports", {port}}},
-             })
-            models.push_back(model.dump(-1, ' ', true, Json::error_handler_t::replace));
-        for (const std::string& model : models) {
-            place.write("m", model);
-            for (const std::string option : {"--json", "--sarif", "--bits=32"})
-                expectSafe(place, "check --html page m " + option, text);
-            EXPECT_EQ(spoiled(place.read("page")), "");
-        }
+        const std::string quoted = Json(text).dump(-1, ' ', true, Json::error_handler_t::replace);
+        for (const CaseRow& row : casesOf(file, "models", 1))
+            for (const std::string& part : {text, quoted.substr(1, quoted.size() - 2)}) {
+                place.write("m", boost::replace_all_copy(row[0], "@", part));
+                for (const std::string option : {"--json", "--sarif", "--bits=32"})
+                    expectSafe(place, "check --html page m " + option, text);
+                EXPECT_EQ(spoiled(place.read("page")), "");
+            }
         EXPECT_NE(place.read("page"), "");
     }
 }

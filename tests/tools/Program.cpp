@@ -1,6 +1,7 @@
 #include "tests/tools/Program.hpp"
 
 #include <array>
+#include <boost/algorithm/string.hpp>
 #include <gtest/gtest.h>
 #include <pty.h>
 #include <unistd.h>
@@ -32,17 +33,16 @@ std::string inEnvironment(Strings settings, const std::string& command) {
 
 /// Whether a text is that of the pattern, where … stands for anything.
 bool isLike(const std::string& text, const std::string& pattern) {
-    const std::string any = "\u2026";
-    std::size_t at = 0;
-    std::size_t from = 0;
-    for (std::size_t end = 0; (end = pattern.find(any, from)) != std::string::npos; from = end + any.size()) {
-        const std::string part = pattern.substr(from, end - from);
-        const std::size_t found = text.find(part, at);
-        if (found == std::string::npos || (from == 0 && found != 0))
+    std::vector<std::string> parts;
+    boost::algorithm::iter_split(parts, pattern, boost::algorithm::first_finder("\u2026"));
+    std::size_t end = 0;
+    for (const std::string& part : parts) {
+        const std::size_t found = text.find(part, end);
+        if (found == std::string::npos)
             return false;
-        at = found + part.size();
+        end = found + part.size();
     }
-    return from == 0 ? text == pattern : text.substr(at).ends_with(pattern.substr(from));
+    return text.starts_with(parts.front()) && text.ends_with(parts.back()) && (parts.size() > 1 || text == pattern);
 }
 
 } // namespace
