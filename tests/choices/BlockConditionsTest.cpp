@@ -1,7 +1,7 @@
 // Conditions of blocks and ports: texts, keywords, errors, depth.
-#include "base/service/BlockConditions.hpp"
+#include "base/choices/BlockConditions.hpp"
+#include "base/choices/ChoiceSetChecker.hpp"
 #include "base/core/Table.hpp"
-#include "base/service/ChoiceSet.hpp"
 #include "base/simplify/Simplify.hpp"
 #include "host/Diagnostics.hpp"
 #include "host/embedded/ModelFile.hpp"

@@ -1,19 +1,20 @@
 // Hashes as fixed numbers, which nodes are one, and interning against a map of structures.
 #include "base/core/Nodes.hpp"
+#include "tests/support/Cases.hpp"
 #include "tests/support/StructureNumbers.hpp"
+#include "tests/support/TreeReader.hpp"
+#include "tests/support/TreeText.hpp"
 #include "tests/support/generators/AnyNode.hpp"
 #include "tests/support/generators/RandomExpression.hpp"
 
 #include <cmath>
 #include <gtest/gtest.h>
 #include <limits>
-#include <map>
 #include <rapidcheck/gtest.h>
 
 namespace VT::Testing {
 namespace {
 
-constexpr double infinity = std::numeric_limits<double>::infinity();
 constexpr double nan = std::numeric_limits<double>::quiet_NaN();
 
 /// The mixing step, written once more.
@@ -31,38 +32,25 @@ std::uint64_t steps(std::uint64_t hash, const std::vector<std::int64_t>& keys) {
 }
 
 TEST(Hash, Seeds) {
-    int op = 24;
-    for (const std::uint64_t seed :
-         {0x0fdae6de77aaba93U, 0x787a4f407d7cdda1U, 0x88aa289d8bcc8534U, 0xe5c6bd2ac9565810U, 0x330d65c2aad4576cU,
-          0x3c2c6926fc977bb0U, 0x016a16511cb5a6fdU, 0x7cb93a5f4dd58737U}) {
-        EXPECT_EQ(step(0, op), seed);
-        EXPECT_EQ(hashSeed(static_cast<SymbolicOp>(op++)), seed);
+    for (const CaseRow& row : casesOf("hashes.txt", "seeds", 2)) {
+        const int op = std::stoi(row[0]);
+        const std::uint64_t seed = std::stoull(row[1], nullptr, 16);
+        EXPECT_EQ(step(0, op), seed) << op;
+        EXPECT_EQ(hashSeed(static_cast<SymbolicOp>(op)), seed) << op;
     }
 }
 
 TEST(Hash, Leaves) {
     SymbolicExprTable table;
-    for (const auto& [text, hash] :
-         std::map<std::string, std::uint64_t>{{"true", 0xfffffffffffffffe},
-                                              {"false", 0xfffffffffffffffd},
-                                              {"", 0},
-                                              {"True", steps(0, {84, 114, 117, 101})},
-                                              {"\xc3\xa4", steps(0, {-61, -92})}, // bytes are signed
-                                              {std::string("a\0", 2), steps(0, {97, 0})}})
-        EXPECT_EQ(SymbolicString(table, text).getHash(), hash) << text;
-
-    EXPECT_EQ(SymbolicIntValue(table, 7).getHash(), 7U);
-    EXPECT_EQ(SymbolicIntValue(table, -2).getHash(), 0xfffffffffffffffe);
-    EXPECT_EQ(SymbolicIntValue(table, std::numeric_limits<int>::min()).getHash(), 0xffffffff80000000);
-    for (const auto& [value, hash] : std::vector<std::pair<double, std::uint64_t>>{{0.0, 0},
-                                                                                   {-0.0, 0},
-                                                                                   {1.0, 0x3ff0000000000000},
-                                                                                   {-2.5, 0xc004000000000000},
-                                                                                   {nan, 0xfffffffffffffffd},
-                                                                                   {-nan, 0xfffffffffffffffd},
-                                                                                   {infinity, 0xffffffffffffffff},
-                                                                                   {-infinity, 0xfffffffffffffffe}})
-        EXPECT_EQ(SymbolicDoubleValue(table, value).getHash(), hash) << value;
+    const auto wanted = [](const CaseRow& row) { return std::stoull(row[1], nullptr, 16); };
+    for (const CaseRow& row : casesOf("hashes.txt", "names", 2))
+        EXPECT_EQ(SymbolicString(table, row[0]).getHash(), wanted(row)) << row[0];
+    for (const std::string& text : {std::string("True"), std::string("\xc3\xa4"), std::string("a\0", 2)})
+        EXPECT_EQ(SymbolicString(table, text).getHash(), steps(0, {text.begin(), text.end()})) << "bytes are signed";
+    for (const CaseRow& row : casesOf("hashes.txt", "integers", 2))
+        EXPECT_EQ(SymbolicIntValue(table, std::stoi(row[0])).getHash(), wanted(row)) << row[0];
+    for (const CaseRow& row : casesOf("hashes.txt", "reals", 2))
+        EXPECT_EQ(SymbolicDoubleValue(table, std::stod(row[0])).getHash(), wanted(row)) << row[0];
 }
 
 TEST(Hash, OperatorsMixTheirCodeAndThenTheirOperands) {
@@ -91,52 +79,26 @@ TEST(Hash, OperatorsMixTheirCodeAndThenTheirOperands) {
 }
 
 TEST(Equality, GenericClassesAndTheirTwinsAreOne) {
-    using Op = SymbolicOp;
-    for (const auto& [fixed, generic] : std::vector<std::pair<Op, Op>>{{Op::Dims2D, Op::DimsND},
-                                                                       {Op::Dims3D, Op::DimsND},
-                                                                       {Op::FcnCall0U, Op::FcnCall},
-                                                                       {Op::FcnCall1U, Op::FcnCall},
-                                                                       {Op::FcnCall2U, Op::FcnCall}}) {
-        const NodeParts parts{"", 0, 0, std::vector<SymbolicExprId>(*operandCount(fixed), 0)};
-        for (const auto& [first, second] : {std::pair{fixed, generic}, std::pair{generic, fixed}}) {
+    for (const CaseRow& row : casesOf("hashes.txt", "twins", 2))
+        for (const std::size_t first : {0U, 1U}) {
+            SCOPED_TRACE(row[first]);
             SymbolicExprTable table, other;
-            ASSERT_EQ(SymbolicString(table, "f").getId(table), SymbolicString(other, "f").getId(other));
-            const SymbolicExprId id = makeAny(table, first, parts);
-            EXPECT_EQ(makeAny(table, second, parts), id);
-            EXPECT_EQ(table.get(id)->op(), first) << "the first one stands for both";
+            const SymbolicExprId id = readTree(table, row[first]);
+            EXPECT_EQ(readTree(table, row[1 - first]), id);
+            EXPECT_EQ(treeText(table, id), row[first]) << "the first one stands for both";
             EXPECT_EQ(table.size(), 2U);
-            EXPECT_TRUE(*other.get(makeAny(other, second, parts)) == *table.get(id));
+            EXPECT_TRUE(*other.get(readTree(other, row[1 - first])) == *table.get(id));
         }
-    }
 }
 
 TEST(Equality, RealsWithinTheTolerance) {
-    const double epsilon = std::numeric_limits<double>::epsilon();
-    const double largest = std::numeric_limits<double>::max();
-
-    const struct {
-        double a, b;
-        bool equal;
-        bool merged; // equal, and of one hash
-    } cases[] = {
-        {1.5, 1.5, true, true},
-        {0.0, -0.0, true, true},
-        {1.0, 1.0 + epsilon, true, false},
-        {1.0, 1.0 + 2 * epsilon, false, false},
-        {largest, -largest, false, false},
-        {largest, infinity, false, false},
-        {infinity, infinity, true, true},
-        {infinity, -infinity, false, false},
-        {nan, nan, false, false},
-        {nan, 0.0, false, false},
-    };
-
-    for (const auto& [a, b, equal, merged] : cases) {
+    for (const CaseRow& row : casesOf("hashes.txt", "pairs of reals", 4)) {
+        SCOPED_TRACE(row[0] + " " + row[1]);
         SymbolicExprTable table;
-        const SymbolicDoubleValue first(table, a), second(table, b);
-        EXPECT_EQ(first == second, equal) << a << ' ' << b;
-        EXPECT_EQ(second == first, equal) << a << ' ' << b;
-        EXPECT_EQ(table.size(), merged ? 1U : 2U) << a << ' ' << b;
+        const SymbolicDoubleValue first(table, std::stod(row[0])), second(table, std::stod(row[1]));
+        EXPECT_EQ(first == second, row[2] == "equal");
+        EXPECT_EQ(second == first, row[2] == "equal");
+        EXPECT_EQ(table.size(), row[3] == "one" ? 1U : 2U);
     }
 }
 

@@ -1,33 +1,20 @@
-// Codes, classes, operands and slots of virtual functions: what hosts rely on in binary form.  The data stand here
-// again on purpose.
+// Codes, classes, operands and slots of virtual functions: what hosts rely on in binary form.  The data stand in
+// a file of cases again on purpose.
 #include "base/core/Nodes.hpp"
 #include "host/Diagnostics.hpp"
+#include "tests/support/Cases.hpp"
 #include "tests/support/Slots.hpp"
 #include "tests/support/generators/AnyNode.hpp"
 
+#include <algorithm>
 #include <gmock/gmock.h>
-#include <sstream>
 
 namespace VT::Testing {
 namespace {
 
 using Visitor = SymbolicExprVisitor;
 
-/// The classes in the order of their codes and of the visitors' slots, with their operands; * is any number.
-constexpr const char* classes =
-    "String0 IntValue0 DoubleValue0 PlusExpr2 MinusExpr2 UnaryMinusExpr1 MultiplyExpr2 DivideExpr2 ModuloExpr2 "
-    "EqualExpr2 NotEqualExpr2 LessThanExpr2 LessThanEqualExpr2 GreaterThanExpr2 GreaterThanEqualExpr2 AndExpr2 OrExpr2 "
-    "NotExpr1 BitAndExpr2 BitOrExpr2 BitXOrExpr2 BitComplExpr1 ShiftLeftExpr2 ShiftRightExpr2 2DExpr2 3DExpr3 NDExpr* "
-    "FcnCall0UExpr1 FcnCall1UExpr2 FcnCall2UExpr3 FcnCallExpr* MemberValue1 QColonExpr2 QColon3Expr3 RowExpr* "
-    "CellArrayExpr* MatrixExpr* PowerExpr2 DotPowerExpr2 DotMulExpr2 DotDivExpr2 LDivExpr2 DotLDivExpr2 TransposeExpr1 "
-    "DotTransposeExpr1 SingleAndExpr2 SingleOrExpr2 AnonymousFuncExpr2";
-
-struct Row {
-    std::string className;
-    std::ptrdiff_t visitSlot;
-};
-
-const Row rows[] = {
+const std::pair<std::string, std::ptrdiff_t> visitSlots[] = {
 #define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                         \
     {#Class, slotOf(static_cast<void (Visitor::*)(const Class&)>(&Visitor::visit))},
 #include "base/core/operators.def"
@@ -35,17 +22,16 @@ const Row rows[] = {
 };
 
 TEST(Operators, EachClassHasItsCodeItsOperandsAndItsSlot) {
-    std::istringstream words(classes);
-    int code = 0;
-    for (std::string word; words >> word; ++code) {
-        SCOPED_TRACE(word);
-        const bool any = word.back() == '*';
-        const std::size_t count = any ? 4 : static_cast<std::size_t>(word.back() - '0');
-        word.pop_back();
+    const std::vector<CaseRow> rows = casesOf("operators.txt", "classes", 2);
+    ASSERT_EQ(operatorTable().size(), rows.size());
+    for (int code = 0; code < operatorCount; ++code) {
+        const CaseRow& row = rows[static_cast<std::size_t>(code)];
+        SCOPED_TRACE(row[0]);
+        const bool any = row[1] == "any";
+        const std::size_t count = any ? 4 : std::stoul(row[1]);
         const auto op = static_cast<SymbolicOp>(code);
-        EXPECT_EQ(operatorInfo(op).className, "Symbolic" + word);
-        EXPECT_EQ(rows[code].className, "Symbolic" + word);
-        EXPECT_EQ(rows[code].visitSlot, code + 3);
+        EXPECT_EQ(operatorInfo(op).className, row[0]);
+        EXPECT_EQ(visitSlots[code], std::pair(row[0], std::ptrdiff_t{code + 3}));
         EXPECT_EQ(operandCount(op), any ? std::nullopt : std::optional(count)) << "its base class";
 
         SymbolicExprTable table;
@@ -69,7 +55,6 @@ TEST(Operators, EachClassHasItsCodeItsOperandsAndItsSlot) {
         EXPECT_EQ(node.getNumArgs(), (code >= 27 && code <= 30) || code == 35 ? count - 1 : 0);
         EXPECT_EQ(node.getNumValue(), number ? 0.0 : 18446744073709551616.0);
     }
-    EXPECT_EQ(operatorTable().size(), static_cast<std::size_t>(code));
 }
 
 TEST(Operators, SlotsOfNodesTablesAndVisitors) {
@@ -90,29 +75,12 @@ TEST(Operators, SlotsOfNodesTablesAndVisitors) {
 }
 
 TEST(OperandAccessDeathTest, OutOfRange) {
-    using Op = SymbolicOp;
-
-    const struct {
-        Op op;
-        std::size_t operands;
-        std::string message;
-        std::string function;
-        bool checkedOnly; ///< answered while assertions are off
-        SymbolicExprId answer;
-    } cases[] = {
-        {Op::String, 0, "VT::SymbolicExpr::getInput() should not be called", "VT::SymbolicExpr::getInput(", false, 0},
-        {Op::Not, 1, "VT::SymbolicUnaryExpr::getInput(aIdx) aIdx is greater than 0", "VT::SymbolicUnaryExpr::getInput(",
-         true, 0},
-        {Op::Plus, 2, "VT::SymbolicBinaryExpr::getInput(aIdx) aIdx is out of bounds",
-         "virtual VT::SymbolicExprId VT::SymbolicBinaryExpr::getInput(std::size_t) const", false, 0},
-        {Op::QColon3, 3, "VT::SymbolicTernaryExpr::getInput(aIdx) aIdx is out of bounds",
-         "VT::SymbolicTernaryExpr::getInput(", false, 0},
-        {Op::Row, 2, "VT::SymbolicUnaryExpr::getInput(aIdx) aIdx is out of bounds", "VT::SymbolicMultiExpr::getInput(",
-         true, invalidId},
-    };
-
-    for (const auto& [op, operands, message, function, checkedOnly, answer] : cases) {
-        SCOPED_TRACE(operatorInfo(op).className);
+    for (const CaseRow& row : casesOf("operators.txt", "operands out of range", 4)) {
+        SCOPED_TRACE(row[0]);
+        const auto op = std::ranges::find(operatorTable(), row[0], &OperatorInfo::name)->op;
+        const std::string &message = row[1], &function = row[2];
+        const bool checkedOnly = !row[3].empty(); // answered while assertions are off
+        const std::size_t operands = operandCount(op).value_or(2);
         SymbolicExprTable table;
         SymbolicString(table, "x");
         const NodeParts parts{"y", 0, 0, std::vector<SymbolicExprId>(operands, 0)};
@@ -124,7 +92,7 @@ TEST(OperandAccessDeathTest, OutOfRange) {
                     EXPECT_DEATH(static_cast<void>(node.getInput(index)),
                                  testing::AllOf(testing::HasSubstr(message), testing::HasSubstr(function)));
                 } else {
-                    EXPECT_EQ(node.getInput(index), answer);
+                    EXPECT_EQ(node.getInput(index), std::stoull(row[3]));
                 }
             }
         }

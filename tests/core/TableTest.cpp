@@ -1,11 +1,11 @@
 // The table: identifiers, lookups and what it keeps beside its nodes.
 #include "base/core/Nodes.hpp"
+#include "tests/support/Cases.hpp"
 #include "tests/support/HostTables.hpp"
 #include "tests/support/TreeText.hpp"
 
 #include <gmock/gmock.h>
 
-#include <limits>
 #include <memory>
 
 namespace VT::Testing {
@@ -34,27 +34,25 @@ TEST(Table, OperandsAreIdentifiersOrNodesInEveryCombination) {
     SymbolicExprTable table;
     const SymbolicString a(table, "a");
     const SymbolicIntValue b(table, 1);
-    const SymbolicExprId idA = a.getId(table);
-    const SymbolicExprId idB = b.getId(table);
-    const SymbolicExprId sum = SymbolicPlusExpr(table, idA, idB).getId(table);
-    EXPECT_EQ(SymbolicPlusExpr(table, a, idB).getId(table), sum);
-    EXPECT_EQ(SymbolicPlusExpr(table, idA, b).getId(table), sum);
-    EXPECT_EQ(SymbolicPlusExpr(table, a, b).getId(table), sum);
-    EXPECT_EQ(SymbolicPlusExpr(table, SymbolicString(table, "a"), SymbolicIntValue(table, 1)).getId(table), sum);
-    EXPECT_NE(SymbolicPlusExpr(table, b, a).getId(table), sum);
-    EXPECT_EQ(treeText(table, SymbolicQColon3Expr(table, a, idB, a).getId(table)), "QColon3(a,1,a)");
-    EXPECT_EQ(treeText(table, SymbolicMemberValue(table, a, "m").getId(table)), "MemberValue(a,m)");
+    const SymbolicExprId idA = a.getId(table), idB = b.getId(table);
+    const auto text = [&](const SymbolicExpr& node) { return treeText(table, node.getId(table)); };
+    for (const SymbolicExpr& sum :
+         {SymbolicPlusExpr(table, idA, idB), SymbolicPlusExpr(table, a, idB), SymbolicPlusExpr(table, idA, b),
+          SymbolicPlusExpr(table, a, b), SymbolicPlusExpr(table, SymbolicString(table, "a"), idB)})
+        EXPECT_EQ(text(sum), "Plus(a,1)");
+    EXPECT_EQ(text(SymbolicPlusExpr(table, b, a)), "Plus(1,a)");
+    EXPECT_EQ(text(SymbolicQColon3Expr(table, a, idB, a)), "QColon3(a,1,a)");
+    EXPECT_EQ(text(SymbolicMemberValue(table, a, "m")), "MemberValue(a,m)");
 
     // A name that is given as text is interned.
-    const SymbolicExprId call = SymbolicFcnCallExpr(table, std::string("f"), {idA, idB, idA}).getId(table);
-    EXPECT_EQ(treeText(table, call), "FcnCall(f,a,1,a)");
-    EXPECT_EQ(SymbolicFcnCallExpr(table, SymbolicString(table, "f"), {idA, idB, idA}).getId(table), call);
-    EXPECT_EQ(SymbolicFcnCallExpr(table, "f", {idA, idB, idA}).getId(table), call);
-    EXPECT_EQ(treeText(table, SymbolicFcnCall0UExpr(table, "g").getId(table)), "FcnCall0U(g)");
-    EXPECT_EQ(treeText(table, SymbolicFcnCall1UExpr(table, "g", a).getId(table)), "FcnCall1U(g,a)");
-    EXPECT_EQ(treeText(table, SymbolicFcnCall2UExpr(table, std::string("g"), a, b).getId(table)), "FcnCall2U(g,a,1)");
-    EXPECT_EQ(treeText(table, SymbolicFcnCall2UExpr(table, 0, a, 1).getId(table)), "FcnCall2U(a,a,1)");
-    EXPECT_EQ(treeText(table, SymbolicCellArrayExpr(table, idB, {idA, idA}).getId(table)), "CellArray(1,a,a)");
+    EXPECT_EQ(text(SymbolicFcnCallExpr(table, std::string("f"), {idA, idB, idA})), "FcnCall(f,a,1,a)");
+    EXPECT_EQ(text(SymbolicFcnCallExpr(table, SymbolicString(table, "f"), {idA, idA, idA})), "FcnCall(f,a,a,a)");
+    EXPECT_EQ(text(SymbolicFcnCallExpr(table, "f", {idB, idB, idA})), "FcnCall(f,1,1,a)");
+    EXPECT_EQ(text(SymbolicFcnCall0UExpr(table, "g")), "FcnCall0U(g)");
+    EXPECT_EQ(text(SymbolicFcnCall1UExpr(table, "g", a)), "FcnCall1U(g,a)");
+    EXPECT_EQ(text(SymbolicFcnCall2UExpr(table, std::string("g"), a, b)), "FcnCall2U(g,a,1)");
+    EXPECT_EQ(text(SymbolicFcnCall2UExpr(table, 0, a, 1)), "FcnCall2U(a,a,1)");
+    EXPECT_EQ(text(SymbolicCellArrayExpr(table, idB, {idA, idA})), "CellArray(1,a,a)");
 }
 
 TEST(Table, LookupsOfWhatIsNotThere) {
@@ -138,19 +136,11 @@ TEST(Table, NodesAreKeptWhereADerivedTableKeepsThem) {
 
 TEST(Table, ValuesOfNames) {
     SymbolicExprTable table;
-    for (const auto& [real, expected] :
-         std::vector<std::pair<double, int>>{{2.7, 2},
-                                             {-2.7, -2},
-                                             {2147483646.5, 2147483646},
-                                             {2147483648.0, noValue},
-                                             {-2147483648.9, std::numeric_limits<int>::min()}}) {
-        table.registerValueId("R", SymbolicDoubleValue(table, real).getId(table));
-        EXPECT_EQ(table.getValue("R"), expected) << real;
+    for (const CaseRow& row : casesOf("operators.txt", "values of reals", 2)) {
+        SymbolicDoubleValue(table, std::stod(row[0]));
+        table.registerValueId("R", table.size() - 1);
+        EXPECT_EQ(table.getValue("R"), std::stoi(row[1])) << row[0];
     }
-    SymbolicDoubleValue(table, std::numeric_limits<double>::quiet_NaN());
-    table.registerValueId("R", table.size() - 1);
-    EXPECT_EQ(table.getValue("R"), noValue);
-
     table.registerValue("N", 3);
     EXPECT_EQ(table.getValue("N"), 3);
     table.registerValue("N", -4);

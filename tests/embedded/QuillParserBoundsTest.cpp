@@ -1,11 +1,11 @@
 // Long texts, nesting at the bound and one beyond, and texts that nobody would write.
 #include "parser/QuillConverterBlockVariants.hpp"
 #include "tests/embedded/QuillTreeText.hpp"
+#include "tests/support/Cases.hpp"
 #include "tests/support/Times.hpp"
 
 #include <gtest/gtest.h>
 #include <random>
-#include <tuple>
 
 namespace VT::Testing {
 namespace {
@@ -24,17 +24,14 @@ bool expectSoundAnswer(QuillReading& reading, const std::string& text) {
 }
 
 TEST(QuillBounds, NestingAtTheBoundAndOneBeyond) {
-    // What opens, what closes, and the place of the bracket that is one too many.
-    const std::vector<std::tuple<std::string, std::string, std::size_t>> nests = {
-        {"(", ")", 0},      {"[", "]", 0},     {"{", "}", 0},    {"f(", ")", 1},           {"c{", "}", 1},
-        {"a || (", ")", 5}, {"a^(b+", ")", 2}, {"@(x) ", "", 0}, {"2^-@(x, y) x*", "", 3}, {"1:(", ")", 2}};
     for (const std::size_t nesting : {std::size_t{1}, std::size_t{7}, bound}) {
         QuillReading reading(nesting);
-        for (const auto& [open, close, place] : nests) {
-            const std::string good = times(nesting, open) + "x" + times(nesting, close);
-            EXPECT_NE(reading.read(good), nullptr) << good;
-            const std::string deep = times(nesting + 1, open) + "x" + times(nesting + 1, close);
-            EXPECT_EQ(reading.read(deep), nullptr) << open;
+        for (const CaseRow& row : casesOf("quill-bounds.txt", "nests", 3)) {
+            const std::string &open = row[0], &close = row[1];
+            const std::size_t place = std::stoul(row[2]);
+            const auto nest = [&](std::size_t depth) { return times(depth, open) + "x" + times(depth, close); };
+            EXPECT_NE(reading.read(nest(nesting)), nullptr) << open;
+            EXPECT_EQ(reading.read(nest(nesting + 1)), nullptr) << open;
             EXPECT_EQ(reading.failure().position, nesting * open.size() + place) << open;
             EXPECT_EQ(reading.failure().reason, "brackets and functions are nested too deeply");
         }
@@ -49,29 +46,17 @@ TEST(QuillBounds, NestingAtTheBoundAndOneBeyond) {
     }
     // Siblings do not add up, nor do the prefix operators of different operands.
     QuillReading reading(1);
-    for (const std::string piece : {"(x) + ", "-x + ", "f(-1) * ", "[-x] - ", "-(x) : ", "[@f] == ", "f(@f) < "}) {
-        const std::string text = times(500, piece) + "x";
-        EXPECT_NE(reading.read(text), nullptr) << piece;
-    }
+    for (const char* const piece : {"(x) + ", "-x + ", "f(-1) * ", "[-x] - ", "-(x) : ", "[@f] == ", "f(@f) < "})
+        EXPECT_NE(reading.read(times(500, piece) + "x"), nullptr) << piece;
 }
 
 TEST(QuillBounds, LongTexts) {
-    // The beginning, what is repeated, the end, and whether it is read.
-    const std::vector<std::tuple<std::string, std::string, std::string, bool>> shapes = {
-        {"a", "+a", "", true},     {"a", "^-a", "", true},    {"a", "'", "", true},        {"a", ".b", "", true},
-        {"f", "()", "", true},     {"c", "{1}", "", true},    {"1", ":1", "", true},       {"[", "1 ", "]", true},
-        {"[", ";", "]", true},     {"f(", "1,", "1)", true},  {"", "n", "", true},         {"1.", "7", "", true},
-        {"'", "''", "'", true},    {"", " ", "a", true},      {"%", "%", "\na", true},     {"", "...\n", "a", true},
-        {"[", "1 -2 ", "]", true}, {"[", "(1)' ", "]", true}, {"a", "||b&&c|d", "", true}, {"@(", "p,", "p) p", true},
-        {"", "(a)+", "a", true},   {"", "(", "", false},      {"", "-", "", false},        {"", "@(x)", "", false},
-        {"", "a ", "", false},     {"'", "a", "", false},     {"", "f(", "", false},       {"", "''", "' '", true},
-        {"", "...", "", false},    {"[", "a '", "", false},   {"", "[1 -", "", false},     {"a", "= ", "", false},
-        {"", "1e", "", false},     {"a", "+%\n", "", false},  {"", "\xFF", "", false},     {"a...", "a", "+", true}};
     QuillReading reading;
-    for (const auto& [front, piece, back, isRead] : shapes) {
-        const std::size_t count = (mebibyte - front.size() - back.size()) / piece.size();
-        EXPECT_EQ(expectSoundAnswer(reading, front + times(count, piece) + back), isRead) << piece;
-    }
+    for (const bool isRead : {true, false})
+        for (const CaseRow& row : casesOf("quill-bounds.txt", isRead ? "long texts" : "long errors", 3)) {
+            const std::size_t count = (mebibyte - row[1].size() - row[2].size()) / row[0].size();
+            EXPECT_EQ(expectSoundAnswer(reading, row[1] + times(count, row[0]) + row[2]), isRead) << row[0];
+        }
 }
 
 /// A parser that has read one long text does not hold on to its memory, and trees live apart from each other.
@@ -94,15 +79,8 @@ TEST(QuillBounds, TreesOfOneParser) {
         parser->delete_parse_tree(tree);
 }
 
-const std::vector<std::string> pieces = {
-    "||",  "&&", "|",  "&",  "==",    "~=",        "!=",     "<=",          ">=",    "<",  ">",  ":", "+",
-    "-",   "*",  "/",  "\\", ".*",    "./",        ".\\",    "^",           ".^",    "'",  ".'", "~", "!",
-    "@",   ".",  ",",  ";",  "(",     ")",         "[",      "]",           "{",     "}",  " ",  "a", "b9",
-    "12",  "1.", ".5", "2i", "end",   "'t'",       "\"u\"",  "% c\n",       "...\n", "\n", "=",  "$", "\xC3",
-    "0x1", "1e", "f(", "@(", "(sim)", "(codegen)", "[1 -2]", "a.b(2).c{1}", "@(x) x"};
-
 /// An expression that has lost or got some pieces.
-std::string wounded(std::mt19937_64& random) {
+std::string wounded(std::mt19937_64& random, const std::vector<CaseRow>& pieces) {
     std::string text =
         "@(p, q) ~(a.b(2).c{1}' == [1 -2; x(end) 'it''s']) || f(2:3:n, {}) .^ -2^0x1F & q ... rest\n + 1.5e-3i % c";
     for (std::size_t wounds = random() % 4; wounds-- > 0;) {
@@ -110,7 +88,7 @@ std::string wounded(std::mt19937_64& random) {
         if (random() % 2 == 0)
             text.erase(place, random() % 4);
         else
-            text.insert(place, pieces[random() % pieces.size()]);
+            text.insert(place, pieces[random() % pieces.size()][0]);
     }
     return text;
 }
@@ -136,8 +114,8 @@ void expectExpressionOrReport(const std::string& text) {
 TEST(QuillSoup, IsReadOrRefused) {
     std::mt19937_64 random(2);
     QuillReading reading(8, {"(sim)", "(codegen)"});
-    int fromTokens = 0;
-    int fromWounded = 0;
+    const std::vector<CaseRow> pieces = casesOf("quill-bounds.txt", "pieces", 1);
+    int fromTokens = 0, fromWounded = 0;
     for (int round = 0; round < 40000; ++round) {
         std::string bytes(random() % 24, ' ');
         for (char& c : bytes)
@@ -145,9 +123,9 @@ TEST(QuillSoup, IsReadOrRefused) {
         expectSoundAnswer(reading, bytes);
         std::string tokens;
         for (std::size_t count = random() % 12; count-- > 0;)
-            tokens += pieces[random() % pieces.size()];
+            tokens += pieces[random() % pieces.size()][0];
         fromTokens += expectSoundAnswer(reading, tokens) ? 1 : 0;
-        const std::string ill = wounded(random);
+        const std::string ill = wounded(random, pieces);
         fromWounded += expectSoundAnswer(reading, ill) ? 1 : 0;
         for (const std::string& text : {bytes, tokens, ill})
             if (round % 8 == 0)

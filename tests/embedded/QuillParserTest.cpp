@@ -38,13 +38,10 @@ TEST(QuillConstructs, EveryPairOfOperators) {
         int level = 0;
     };
 
-    constexpr int power = 9;
     constexpr int range = 304;
-    const std::vector<Operator> infixes = {
-        {"||", 130, 0}, {"&&", 136, 1}, {"|", 132, 2},    {"&", 134, 3},    {"==", 103, 4}, {"~=", 104, 4},
-        {"!=", 104, 4}, {"<", 99, 5},   {"<=", 100, 5},   {">", 101, 5},    {">=", 102, 5}, {":", range, 6},
-        {"+", 49, 7},   {"-", 50, 7},   {"*", 90, 8},     {"/", 92, 8},     {"\\", 94, 8},  {".*", 91, 8},
-        {"./", 93, 8},  {".\\", 95, 8}, {"^", 76, power}, {".^", 77, power}};
+    std::vector<Operator> infixes;
+    for (const CaseRow& row : casesOf("quill-trees.txt", "infix operators", 3))
+        infixes.push_back({row[0], std::stoi(row[1]), std::stoi(row[2])});
     const auto rule = [](const Operator& op, const std::string& inputs) {
         return op.code == 0 ? inputs : "(" + std::to_string(op.code) + " " + inputs + ")";
     };
@@ -53,20 +50,20 @@ TEST(QuillConstructs, EveryPairOfOperators) {
     for (const std::string blank : {"", " ", "\t", "\n", "% c\n", "... c\n", "  "})
         for (const Operator& first : infixes) {
             const std::string open = "a" + blank + first.text + blank;
+            const bool isPower = first.level == 9;
             for (const Operator& second : infixes)
                 expect(open + "b" + blank + second.text + blank + "c",
                        (first.code == range && second.code == range ? "(305 a b c)"
                         : second.level > first.level                ? rule(first, "a " + rule(second, "b c"))
                                                                     : rule(second, rule(first, "a b") + " c")));
             for (const Operator& prefix : {Operator{"-", 44}, {"~", 46}, {"!", 46}, {"+", 0}}) {
+                const std::string left = rule(first, rule(prefix, "a") + " b");
                 expect(open + prefix.text + blank + "b", rule(first, "a " + rule(prefix, "b")));
-                expect(
-                    prefix.text + blank + open + "b",
-                    (first.level == power ? rule(prefix, rule(first, "a b")) : rule(first, rule(prefix, "a") + " b")));
+                expect(prefix.text + blank + open + "b", isPower ? rule(prefix, rule(first, "a b")) : left);
             }
             for (const Operator& postfix : {Operator{"'", 78}, {".'", 79}}) {
-                expect(open + "b" + postfix.text, (first.level == power ? rule(postfix, rule(first, "a b"))
-                                                                        : rule(first, "a " + rule(postfix, "b"))));
+                const std::string right = rule(first, "a " + rule(postfix, "b"));
+                expect(open + "b" + postfix.text, isPower ? rule(postfix, rule(first, "a b")) : right);
                 expect("a" + postfix.text + blank + first.text + blank + "b", rule(first, rule(postfix, "a") + " b"));
             }
         }

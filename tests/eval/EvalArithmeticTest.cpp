@@ -2,7 +2,9 @@
 // down again over wide integers.
 #include "base/eval/Eval.hpp"
 #include "base/eval/EvalVisitor.hpp"
+#include "tests/support/TreeReader.hpp"
 #include "tests/support/generators/AnyNode.hpp"
+#include "tests/support/oracles/Truth.hpp"
 
 #include <gtest/gtest.h>
 
@@ -45,7 +47,7 @@ SymbolicExprId literal(SymbolicExprTable& table, const SymbolicScalar& value) {
         return SymbolicIntValue(table, value.getInt()).getId(table);
     if (value == SymbolicScalar(-0.0)) // as a literal it is that of 0
         return SymbolicUnaryMinusExpr(table, literal(table, 0.0)).getId(table);
-    const SymbolicExprId found = SymbolicDoubleValue(table, value.getDouble()).getId(table);
+    const SymbolicExprId found = Trees{table}.real(value.getDouble());
     return found != invalidId ? found : table.size() - 1; // NaN is not found
 }
 
@@ -142,17 +144,13 @@ SymbolicScalar expected(SymbolicOp op, const Wide& a, const Wide& b) {
         {Op::GreaterThan, [&] { return less(b, a); }},
         {Op::LessThanEqual, [&] { return less(a, b) || equal(a, b); }},
         {Op::GreaterThanEqual, [&] { return less(b, a) || equal(a, b); }},
-        {Op::And, [&] { return a.isTrue() && b.isTrue(); }},
-        {Op::Or, [&] { return a.isTrue() || b.isTrue(); }},
-        {Op::Not, [&] { return !a.isTrue(); }},
-        {Op::BitAnd, [&] { return wrap(a.bits() & b.bits()); }},
-        {Op::BitOr, [&] { return wrap(a.bits() | b.bits()); }},
-        {Op::BitXOr, [&] { return wrap(a.bits() ^ b.bits()); }},
-        {Op::BitCompl, [&] { return wrap(-1 - a.bits()); }},
         {Op::ShiftLeft, [&] { return shift(a.bits(), b.bits()); }},
         {Op::ShiftRight, [&] { return shift(a.bits(), -b.bits()); }},
     };
-    return answers.at(op)();
+    if (const auto answer = answers.find(op); answer != answers.end())
+        return answer->second();
+    return booleanOps.contains(op) ? SymbolicScalar(computed(op, a.isTrue(), b.isTrue()).value() != 0)
+                                   : wrap(computed(op, a.bits(), b.bits()).value());
 }
 
 std::string shown(const SymbolicScalar& value) {
@@ -161,8 +159,7 @@ std::string shown(const SymbolicScalar& value) {
 
 TEST(Arithmetic, AgreesWithWideIntegersOnEveryPairOfCornerValues) {
     SymbolicExprTable table;
-    const SymbolicExprId a = SymbolicString(table, "a").getId(table);
-    const SymbolicExprId b = SymbolicString(table, "b").getId(table);
+    const SymbolicExprId a = Trees{table}.name("a"), b = Trees{table}.name("b");
     std::vector<SymbolicExprId> literals;
     for (const SymbolicScalar& value : corners())
         literals.push_back(literal(table, value));
@@ -182,8 +179,7 @@ TEST(Arithmetic, AgreesWithWideIntegersOnEveryPairOfCornerValues) {
         PreparedExpr prepared = evaluator.prepare(id);
         for (std::size_t i = 0; i < corners().size(); ++i)
             for (std::size_t j = 0; j < (operands == 1 ? 1 : corners().size()); ++j) {
-                const SymbolicScalar& left = corners()[i];
-                const SymbolicScalar& right = corners()[j];
+                const SymbolicScalar &left = corners()[i], &right = corners()[j];
                 const SymbolicScalar wanted = visibleScalar(expected(row.op, Wide(left), Wide(right)));
                 table.registerValueId(a, literals[i]);
                 table.registerValueId(b, literals[j]);
@@ -307,10 +303,9 @@ Outcome modelled(const SymbolicExprTable& table, SymbolicExprId id) {
 class Graph {
 public:
     Graph(unsigned seed, bool isWild) : random_(seed) {
-        for (const char* name : {"a", "b", "s", "true"})
-            symbols.push_back(SymbolicString(table, name).getId(table));
-        for (const std::size_t owner : {0U, 2U, 4U})
-            symbols.push_back(SymbolicMemberValue(table, symbols[owner], "x").getId(table));
+        for (const char* const symbol :
+             {"a", "b", "s", "true", "MemberValue(a,x)", "MemberValue(s,x)", "MemberValue(MemberValue(a,x),x)"})
+            symbols.push_back(readTree(table, symbol));
         nodes = symbols;
         for (int i = 0; i < 8; ++i)
             nodes.push_back(literal(table, anyScalar()));
@@ -365,8 +360,7 @@ TEST(Ways, AgreeOnRandomGraphsOfBoundAndMissingParts) {
         for (const SymbolicExprId id : graph.nodes) {
             const SymbolicExprTable& table = graph.table;
             const Outcome wanted = modelled(table, id);
-            SymbolicExprEvalImpl executed(table);
-            SymbolicExprEvalImpl accepted(table);
+            SymbolicExprEvalImpl executed(table), accepted(table);
             const SymbolicExprEval evaluator(table);
             ASSERT_EQ(outcomeOf([&] { return evaluator.eval(id); }), wanted) << seed;
             ASSERT_EQ(outcomeOf([&] { return executed.execute(table, id), executed.get(); }), wanted) << seed;

@@ -6,6 +6,7 @@
 #include "parser/QuillConverterBlockVariants.hpp"
 #include "parser/SymbolicExprParser.hpp"
 #include "tests/support/Cases.hpp"
+#include "tests/support/TreeReader.hpp"
 #include "tests/support/generators/AnyNode.hpp"
 
 #include <gmock/gmock.h>
@@ -21,11 +22,20 @@ class Evaluation : public ::testing::Test {
 protected:
     SymbolicExprId read(const std::string& text) { return SymbolicExprParser(table, true, true)(text); }
 
-    SymbolicExprId name(const std::string& text) { return SymbolicString(table, text).getId(table); }
-
     void bind(const std::string& symbol, const std::string& value) { table.registerValueId(read(symbol), read(value)); }
 
+    void expectValue(SymbolicExprId id, const SymbolicValue& wanted) {
+        EXPECT_EQ(SymbolicExprEval(table).eval(id), wanted);
+        EXPECT_EQ(SymbolicExprEval(table).prepare(id).run(), wanted);
+    }
+
+    void expectNone(SymbolicExprId id) {
+        EXPECT_THROW(static_cast<void>(SymbolicExprEval(table).eval(id)), HostDiagnostic);
+        EXPECT_THROW(static_cast<void>(SymbolicExprEval(table).prepare(id).run()), HostDiagnostic);
+    }
+
     SymbolicExprTable table;
+    Trees tree{table};
 };
 
 using Vector = SymbolicValue::Elements;
@@ -55,14 +65,12 @@ TEST_F(Evaluation, NamesWhatHasNoValue) {
 }
 
 TEST_F(Evaluation, AnswersIdentifiersThatAreNoNodes) {
-    const SymbolicExprId one = SymbolicIntValue(table, 1).getId(table);
+    const SymbolicExprId one = tree.integer(1);
     const SymbolicExprId onNothing = SymbolicPlusExpr(table, one, 1000).getId(table);
     const SymbolicExprId onItself = SymbolicPlusExpr(table, one, table.size()).getId(table);
     table.registerValueId("N", 1000);
-    for (const SymbolicExprId id : {SymbolicExprId{999}, invalidId, onNothing, onItself, name("N")}) {
-        EXPECT_THROW(static_cast<void>(SymbolicExprEval(table).eval(id)), HostDiagnostic);
-        EXPECT_THROW(static_cast<void>(SymbolicExprEval(table).prepare(id).run()), HostDiagnostic);
-    }
+    for (const SymbolicExprId id : {SymbolicExprId{999}, invalidId, onNothing, onItself, tree.name("N")})
+        expectNone(id);
     SymbolicExprEvalImpl visitor(table);
     EXPECT_THROW(static_cast<void>(visitor.get()), HostDiagnostic);
     table.get(onNothing)->invoke(visitor);
@@ -94,56 +102,42 @@ TEST_F(Evaluation, QuillWritesListsAsMatrices) {
     EXPECT_EQ(lists(quill("[1 2]*3")), read("[1, 2]*3"));
     for (const CaseRow& row : casesOf("eval.txt", "no lists of Quill", 1)) {
         const SymbolicExprId id = quill(row[0]);
-        EXPECT_EQ(lists(id), id) << row[0];
-        EXPECT_THROW(static_cast<void>(SymbolicExprEval(table).eval(id)), HostDiagnostic) << row[0];
+        SCOPED_TRACE(row[0]);
+        EXPECT_EQ(lists(id), id);
+        expectNone(id);
     }
-    EXPECT_THROW(static_cast<void>(SymbolicExprEval(table).eval(lists(quill("[[1 2] 3]")))), HostDiagnostic);
     EXPECT_EQ(lists(invalidId), invalidId);
-    const SymbolicExprId hollow = SymbolicMatrixExpr(table, std::vector<SymbolicExprId>{1000}).getId(table);
-    EXPECT_THROW(static_cast<void>(SymbolicExprEval(table).eval(lists(hollow))), HostDiagnostic);
+    for (const SymbolicExprId id : {quill("[[1 2] 3]"), tree(SymbolicOp::Matrix, SymbolicExprId{1000})})
+        expectNone(lists(id));
 }
 
-TEST_F(Evaluation, EvaluatesSharedNodesOnce) {
-    table.registerValue("x", 1);
-    const Trees tree{table};
-    const SymbolicExprId id = tree.doubled(SymbolicOp::Plus, name("x"));
-    const SymbolicExprId truth = tree.doubled(SymbolicOp::And, name("x"));
-    EXPECT_EQ(SymbolicExprEval(table).eval(id), SymbolicValue(0)); // 2^64 wraps
-    EXPECT_EQ(SymbolicExprEval(table).prepare(id).run(), SymbolicValue(0));
-    EXPECT_EQ(SymbolicExprEval(table).eval(truth), SymbolicValue(true));
-}
-
-TEST_F(Evaluation, TakesDepthFromMemory) {
+TEST_F(Evaluation, SharedAndDeepExpressions) {
     constexpr int depth = 1'000'000;
-    const SymbolicExprId one = SymbolicIntValue(table, 1).getId(table);
-    table.registerValueId("x", one);
-    const SymbolicExprId x = name("x");
-    const SymbolicExprId sum = Trees{table}.zigzag(SymbolicOp::Plus, SymbolicOp::Plus, x, one, depth);
-    SymbolicExprId prefix = x;
-    SymbolicExprId bound = one;
+    const SymbolicExprId one = tree.integer(1), x = tree.name("x");
+    table.registerValueId(x, one);
+    expectValue(tree.doubled(SymbolicOp::Plus, x), 0); // 2^64 wraps
+    expectValue(tree.doubled(SymbolicOp::And, x), true);
+
+    const SymbolicExprId sum = tree.zigzag(SymbolicOp::Plus, SymbolicOp::Plus, x, one, depth);
+    SymbolicExprId prefix = x, bound = one;
     for (int i = 0; i < depth; ++i) {
-        prefix = SymbolicBitComplExpr(table, prefix).getId(table);
-        const SymbolicExprId symbol = name("s" + std::to_string(i));
+        prefix = tree(SymbolicOp::BitCompl, prefix);
+        const SymbolicExprId symbol = tree.name("s" + std::to_string(i));
         table.registerValueId(symbol, bound);
         bound = symbol;
     }
-    for (const auto& [id, wanted] :
-         std::vector<std::pair<SymbolicExprId, int>>{{sum, depth + 1}, {prefix, 1}, {bound, 1}}) {
-        EXPECT_EQ(SymbolicExprEval(table).eval(id), SymbolicValue(wanted));
-        EXPECT_EQ(SymbolicExprEval(table).prepare(id).run(), SymbolicValue(wanted));
-    }
+    expectValue(sum, depth + 1);
+    expectValue(prefix, 1);
+    expectValue(bound, 1);
     table.registerValueId("s0", bound); // a million symbols in a circle
-    EXPECT_THROW(static_cast<void>(SymbolicExprEval(table).eval(bound)), HostDiagnostic);
-    EXPECT_THROW(static_cast<void>(SymbolicExprEval(table).eval(SymbolicPowerExpr(table, sum, sum).getId(table))),
-                 HostDiagnostic);
+    expectNone(bound);
+    expectNone(tree(SymbolicOp::Power, sum, sum));
 }
 
 TEST(Prepared, HasASlotForEachSymbol) {
     SymbolicExprTable table;
-    const SymbolicExprId a = SymbolicString(table, "a").getId(table);
-    const SymbolicExprId member = SymbolicMemberValue(table, a, "x").getId(table);
-    const SymbolicExprId sum = SymbolicPlusExpr(table, member, SymbolicPlusExpr(table, a, member)).getId(table);
-    const SymbolicExprId id = SymbolicPlusExpr(table, sum, SymbolicString(table, "true")).getId(table);
+    const SymbolicExprId id = readTree(table, "Plus(Plus(MemberValue(a,x),Plus(a,MemberValue(a,x))),true)");
+    const SymbolicExprId member = readTree(table, "MemberValue(a,x)"), sum = table.get(id)->getInput(0);
     PreparedExpr prepared = SymbolicExprEval(table).prepare(id);
     ASSERT_EQ(prepared.slotCount(), 2U);
     EXPECT_EQ(prepared.symbol(0), member);

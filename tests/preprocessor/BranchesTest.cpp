@@ -220,11 +220,7 @@ std::vector<std::set<int>> entered(std::string text, const Values& values) {
     }
     for (const std::string& name : macros)
         for (const char* const value : {" 1\n", " 0\n"})
-            begin.append("#define ")
-                .append(name)
-                .append(value)
-                .append(pragma("push", name))
-                .append("#undef " + name + "\n");
+            begin += "#define " + name + value + pragma("push", name) + "#undef " + name + "\n";
     begin += "#unassert m\n";
     for (const std::string import : {"export import", "import"}) // of a header: its macros are those of an #include
         for (std::size_t at = 0; (at = text.find("\n" + import, at)) != std::string::npos;)
@@ -233,10 +229,9 @@ std::vector<std::set<int>> entered(std::string text, const Values& values) {
     std::vector<std::size_t> digits(macros.size());
     for (bool more = true; more;) {
         all += begin;
-        for (std::size_t i = 0; i < macros.size(); ++i) {
+        for (std::size_t i = 0; i < macros.size(); ++i)
             if (!values[digits[i]].empty())
                 all += "#define " + macros[i] + " " + values[digits[i]] + "\n";
-        }
         all += "@@\n#line 1\n" + text;
         more = false;
         for (std::size_t i = 0; i < digits.size() && !more; ++i) {
@@ -263,10 +258,9 @@ std::size_t offsetOf(const std::string& text, std::uint64_t line, std::uint64_t 
     std::size_t at = 0;
     for (; line > 1; --line)
         at = text.find('\n', at) + 1;
-    for (; column > 1; --column)
-        do
+    for (; column > 1; --column) // of a character of one or more bytes
+        for (++at; (static_cast<unsigned char>(text[at]) & 0xC0U) == 0x80U;)
             ++at;
-        while ((static_cast<unsigned char>(text[at]) & 0xC0U) == 0x80U);
     return at;
 }
 
@@ -283,11 +277,11 @@ void check(const RandomSource& source, bool plain, std::map<BranchFindingKind, i
         const int number = static_cast<int>(branch - source.branches.begin());
         found[number] = finding.kind;
         for (const std::set<int>& world : worlds) {
-            const bool isRight = finding.kind == BranchFindingKind::Dead ? !world.contains(number)
-                                 : finding.kind == BranchFindingKind::AlwaysTrue
-                                     ? !isReached(*branch, world) || world.contains(number)
-                                     : true;
-            ASSERT_TRUE(isRight) << finding.directive << "\n" << source.text;
+            const bool isIn = world.contains(number);
+            ASSERT_FALSE(finding.kind == BranchFindingKind::Dead && isIn) << finding.directive << "\n" << source.text;
+            ASSERT_FALSE(finding.kind == BranchFindingKind::AlwaysTrue && isReached(*branch, world) && !isIn)
+                << finding.directive << "\n"
+                << source.text;
         }
         if (finding.replaced)
             fixes.push_back(finding);
@@ -304,13 +298,14 @@ void check(const RandomSource& source, bool plain, std::map<BranchFindingKind, i
     for (std::size_t i = 0; plain && i < source.branches.size(); ++i) {
         const Branch& branch = source.branches[i];
         const int number = static_cast<int>(i);
-        const auto in = [number](const std::set<int>& world) { return world.contains(number); };
-        const auto lives = [&](const auto& world) { return branch.parent < 0 || world.contains(branch.parent); };
-        const auto reached = [&](const auto& world) { return isReached(branch, world); };
-        const auto decidesNothing = [&](const auto& world) { return !reached(world) || in(world); };
-        const bool isDead = std::ranges::any_of(worlds, lives) && std::ranges::none_of(worlds, in);
-        const bool always =
-            !branch.isElse && std::ranges::any_of(worlds, reached) && std::ranges::all_of(worlds, decidesNothing);
+        std::size_t lives = 0, reached = 0, in = 0; // worlds
+        for (const std::set<int>& world : worlds) {
+            lives += branch.parent < 0 || world.contains(branch.parent) ? 1U : 0U;
+            reached += isReached(branch, world) ? 1U : 0U;
+            in += world.contains(number) ? 1U : 0U;
+        }
+        const bool isDead = lives > 0 && in == 0;
+        const bool always = !branch.isElse && reached > 0 && reached == in; // none is in that is not reached
         const auto is = [&](BranchFindingKind kind) { return found.contains(number) && found[number] == kind; };
         EXPECT_EQ(is(BranchFindingKind::Dead), isDead) << branch.line << "\n" << source.text;
         EXPECT_EQ(is(BranchFindingKind::AlwaysTrue), always) << branch.line << "\n" << source.text;

@@ -2,9 +2,9 @@
 #include "base/decide/shorten/StringifyImpliedCondition.hpp"
 #include "base/print/CTextObstacles.hpp"
 #include "base/print/Predicates.hpp"
-#include "tests/print/TreeReader.hpp"
 #include "tests/support/Cases.hpp"
 #include "tests/support/Parsing.hpp"
+#include "tests/support/TreeReader.hpp"
 #include "tests/support/generators/RandomCondition.hpp"
 #include "tests/support/oracles/Truth.hpp"
 
@@ -46,8 +46,7 @@ TEST_F(GeneratedCode, ConditionsUnderAKnownOne) {
     for (const CaseRow& row : casesOf("print.txt", "implied", 3)) {
         const std::string &given = row[0], &text = row[1], &left = row[2];
         SCOPED_TRACE(given + "; " + text);
-        const SymbolicExprId known = read(given);
-        const SymbolicExprId condition = read(text);
+        const SymbolicExprId known = read(given), condition = read(text);
         StringifyImpliedCondition printer(table, false, true, known);
         EXPECT_EQ(printer.print(condition), left);
         printer.forget();
@@ -109,7 +108,6 @@ TEST_F(GeneratedCode, ObstaclesOfCText) {
             EXPECT_EQ(obstacles(id, CTextUse::Program), row[1]);
             EXPECT_EQ(obstacles(id, CTextUse::Directive), row[2]);
         }
-    const SymbolicExprId a = tree.name("a");
     table.insertAliasInfo("int", "rows");
     table.insertAliasInfo("a b", "(p+q)");
     table.insertAliasInfo("Name", "true");
@@ -119,23 +117,19 @@ TEST_F(GeneratedCode, ObstaclesOfCText) {
     for (const SymbolicExprId id : {readTree(table, "MemberValue(a b,field)"), read("Name.B")})
         EXPECT_EQ(findCTextObstacles(table, id, CTextUse::Directive, aliases).front().obstacle,
                   CTextObstacle::MemberOfNoName);
-    for (const OperatorInfo& op : operatorTable()) {
-        const bool onlyInQuill = op.op != Op::UnaryMinus && op.c.find_first_of(".\\':") != std::string_view::npos;
-        if (onlyInQuill && op.op != Op::MemberValue) {
-            const std::vector<SymbolicExprId> inputs(*operandCount(op.op), a);
-            EXPECT_EQ(obstacles(makeNode(table, op.op, inputs), CTextUse::Program), "NoSuchOperator") << op.name;
+    for (const OperatorInfo& row : operatorTable())
+        if (row.c.find_first_of(".\\':") != std::string_view::npos && row.op != Op::MemberValue) { // Quill alone has it
+            const std::vector<SymbolicExprId> inputs(*operandCount(row.op), tree.name("a"));
+            EXPECT_EQ(obstacles(tree(row.op, inputs), CTextUse::Program), "NoSuchOperator") << row.name;
         }
-    }
 }
 
 TEST_F(GeneratedCode, SharedAndDeepConditions) {
     const SymbolicExprId known = read("A == 1");
     SymbolicExprId doubled = tree(Op::Or, known, read("B"));
-    SymbolicExprId open = read("C");
-    for (int i = 0; i < 64; ++i) {
+    for (int i = 0; i < 64; ++i)
         doubled = tree(i % 2 == 0 ? Op::And : Op::Or, doubled, doubled);
-        open = tree(Op::And, open, open);
-    }
+    const SymbolicExprId open = tree.doubled(Op::And, read("C"));
     EXPECT_EQ(StringifyImpliedCondition(table, false, true, known).print(doubled), "1");
     EXPECT_EQ(StringifyImpliedCondition(table, false, true, open).print(open), "1");
     StringifyImpliedCondition printer(table, false, true, known);
@@ -144,8 +138,7 @@ TEST_F(GeneratedCode, SharedAndDeepConditions) {
     EXPECT_THROW(static_cast<void>(printer.get()), std::out_of_range);
     EXPECT_TRUE(findCTextObstacles(table, open, CTextUse::Directive).empty());
 
-    SymbolicExprId spine = read("C");
-    SymbolicExprId member = read("S");
+    SymbolicExprId spine = read("C"), member = read("S");
     for (int i = 0; i < 200'000; ++i) {
         spine = tree(i % 3 == 0 ? Op::Or : Op::And, spine, i % 3 == 1 ? known : tree.name("x" + std::to_string(i)));
         member = tree(Op::MemberValue, member);

@@ -3,6 +3,7 @@
 #include "base/core/Limits.hpp"
 #include "base/print/ExpressionPrinter.hpp"
 #include "base/print/StringifySymbolicExpr.hpp"
+#include "tests/support/TreeReader.hpp"
 #include "tests/support/generators/AnyNode.hpp"
 #include "tests/support/generators/RandomExpression.hpp"
 
@@ -38,12 +39,10 @@ TEST_F(PrintBounds, AgreesWithTheTextsAndIsAnOrder) {
         ids.push_back(tree(Op::And, tree.name("a_name_of_more_than_a_head"),
                            ids[random() % ids.size()])); // long texts that begin alike
     }
-    ids.push_back(tree.name("a+b")); // texts of several expressions
-    ids.push_back(tree(Op::Plus, tree.name("a"), tree.name("b")));
-    ids.push_back(tree(Op::UnaryMinus, tree.integer(3)));
-    ids.push_back(tree.integer(-3));
+    for (const char* const text :
+         {"\"a+b\"", "Plus(a,b)", "UnaryMinus(3)", "-3", "\xc3\xa4"}) // some texts are the same
+        ids.push_back(readTree(table, text));
     ids.push_back(tree.name(std::string("a\0", 2)));
-    ids.push_back(tree.name("\xc3\xa4"));
     std::ranges::sort(ids);
     ids.erase(std::unique(ids.begin(), ids.end()), ids.end());
 
@@ -66,22 +65,16 @@ TEST_F(PrintBounds, AgreesWithTheTextsAndIsAnOrder) {
 TEST(PrintHistory, DoesNotDependOnWhatWasInternedWhen) {
     const auto sorted = [](unsigned history) {
         SymbolicExprTable table;
-        const Trees tree{table};
         std::mt19937_64 past(history);
         for (unsigned i = 0; i < 50 * history; ++i)
             randomTree(table, past, operators, 4);
-        const SymbolicExprId f = tree.name("f"), x = tree.name("x");
-        if (history % 2 == 0) { // either class may stand for both
-            tree(Op::FcnCall1U, f, x);
-            tree(Op::Dims2D, f, x);
-        }
+        if (history % 2 == 0) // either class may stand for both
+            readTree(table, "Row(FcnCall1U(f,x),Dims2D(f,x))");
         std::mt19937_64 random(11);
-        std::vector<SymbolicExprId> ids{tree(Op::FcnCall, f, x),
-                                        tree.name("f(x)"),
-                                        tree(Op::DimsND, f, x),
-                                        tree.name("[f,x]"),
-                                        tree(Op::FcnCall, tree.name("f"), tree.name("x"), x),
-                                        tree.name("f(x,x)")};
+        std::vector<SymbolicExprId> ids;
+        for (const char* const text :
+             {"FcnCall(f,x)", "\"f(x)\"", "DimsND(f,x)", "\"[f,x]\"", "FcnCall(f,x,x)", "\"f(x,x)\""})
+            ids.push_back(readTree(table, text));
         for (int i = 0; i < 300; ++i)
             ids.push_back(randomTree(table, random, operators, 5));
         std::ranges::shuffle(ids, past);
@@ -100,16 +93,14 @@ TEST(PrintHistory, DoesNotDependOnWhatWasInternedWhen) {
 TEST_F(PrintBounds, StructureDecidesBeyondTheBound) {
     for (const std::size_t length : {limits::orderedTextBytes - 1, limits::orderedTextBytes}) {
         const SymbolicExprId name = tree.name(std::string(length, 'n'));
-        const SymbolicExprId product =
-            tree(Op::Multiply, name, name); // '*' is before '+', addition before multiplication
-        const SymbolicExprId sum = tree(Op::Plus, name, name);
-        EXPECT_EQ(SymbolicExprPrinter(table, true).compareUsingCache(product, sum) < 0,
+        // '*' is before '+', addition before multiplication
+        EXPECT_EQ(printer.compareUsingCache(tree(Op::Multiply, name, name), tree(Op::Plus, name, name)) < 0,
                   length < limits::orderedTextBytes);
     }
 }
 
 TEST_F(PrintBounds, GiantTexts) {
-    const auto doubled = [&](SymbolicExprId id) { return tree.doubled(Op::Plus, id); };
+    const auto doubled = [&](const char* text) { return tree.doubled(Op::Plus, readTree(table, text)); };
     const auto sum = [&](int changed) {
         SymbolicExprId id = tree.name("x");
         for (int i = 1; i < 100'000; ++i)
@@ -125,17 +116,15 @@ TEST_F(PrintBounds, GiantTexts) {
         EXPECT_LT(printer.compareUsingCache(a, b), 0);
         EXPECT_GT(printer.compareUsingCache(b, a), 0);
     };
-    expectLess(doubled(tree.name("x")), doubled(tree.name("y")));
-    expectLess(doubled(tree(Op::Minus, tree.name("x"), tree.name("y"))),
-               doubled(tree(Op::Minus, tree.name("x"), tree.name("z"))));
-    expectLess(sum(0), sum(100));
+    expectLess(doubled("x"), doubled("y"));
+    expectLess(doubled("Minus(x,y)"), doubled("Minus(x,z)"));
     expectLess(sum(0), sum(60'000));
     expectLess(sum(60'000), sum(100));
     expectLess(bottom(tree.name("x")), bottom(tree.name("y")));
 
     const auto fresh = [&] { // every NaN is a node of its own
         static_cast<void>(SymbolicDoubleValue(table, std::nan("")));
-        return doubled(table.size() - 1);
+        return tree.doubled(Op::Plus, table.size() - 1);
     };
     const SymbolicExprId one = fresh();
     EXPECT_EQ(printer.compareUsingCache(one, fresh()), 0);
@@ -158,7 +147,7 @@ TEST_F(PrintBounds, TextAtTheBoundAndOneByteBeyond) {
 }
 
 TEST_F(PrintBounds, DoublingGraphsAreMeasuredByTheirNodes) {
-    const SymbolicExprId quotient = tree(Op::Divide, tree.name("x"), tree.name("y"));
+    const SymbolicExprId quotient = readTree(table, "Divide(x,y)");
     // x/y&&x/y is 8 bytes; each further level doubles and adds && and two parentheses.
     EXPECT_EQ(printer.textLength(tree.doubled(Op::And, quotient, 55)), (std::uint64_t{6} << 55U) - 4);
     for (const Op op : {Op::And, Op::BitAnd, Op::ShiftRight}) {
@@ -180,7 +169,7 @@ TEST(PrintDepth, DeepSpines) {
             for (int i = 0; i < deep; ++i)
                 id = right ? tree(op, x, id) : tree(op, id, x);
             const bool call = op == Op::Modulo;
-            const std::size_t perLevel = call ? std::size(std::string("rem(,x)")) : right ? 4 : 2;
+            const std::size_t perLevel = call ? 7 : right ? 4 : 2; // rem(,x), +(x), +x
             const std::string text = SymbolicExprPrinter(table, true)(id);
             EXPECT_EQ(text.size(), 2 + perLevel * deep - (right && !call ? 2 : 0));
             if (call)
@@ -201,13 +190,13 @@ TEST(PrintDepth, DeepSpines) {
 TEST_F(PrintBounds, WideNodesAndLongNames) {
     const std::string name(3'000'000, 'n');
     const std::vector<SymbolicExprId> inputs(200'000, tree.name("x"));
-    EXPECT_EQ(SymbolicExprPrinter(table, false)(tree.name(name)), name);
-    EXPECT_EQ(SymbolicExprPrinter(table, false)(tree(Op::CellArray, inputs)).size(), 2 * inputs.size() + 1);
+    EXPECT_EQ(printer(tree.name(name)), name);
+    EXPECT_EQ(printer(tree(Op::CellArray, inputs)).size(), 2 * inputs.size() + 1);
     SymbolicExprId nested = tree.name("x");
     for (int i = 0; i < 1000; ++i)
         nested = tree(Op::Row, nested);
-    EXPECT_EQ(SymbolicExprPrinter(table, true)(nested), "x");
-    EXPECT_EQ(SymbolicExprPrinter(table, true)(tree(Op::FcnCall, std::vector<SymbolicExprId>{})), "()");
+    EXPECT_EQ(printer(nested), "x");
+    EXPECT_EQ(printer(readTree(table, "FcnCall()")), "()");
 }
 
 TEST_F(PrintBounds, IdentifiersThatAreNotOfTheTable) {

@@ -1,10 +1,10 @@
 // What expressions look like in both languages.
 #include "base/print/Predicates.hpp"
 #include "base/print/StringifySymbolicExpr.hpp"
-#include "tests/print/TreeReader.hpp"
 #include "tests/support/Cases.hpp"
 #include "tests/support/Locales.hpp"
 #include "tests/support/Parsing.hpp"
+#include "tests/support/TreeReader.hpp"
 
 #include <gtest/gtest.h>
 
@@ -45,6 +45,22 @@ TEST_F(Texts, OfBothLanguages) {
             EXPECT_EQ(inC.textLength(id), row[2].size());
         }
     EXPECT_EQ(SymbolicExprPrinter(table, true)(SymbolicDoubleValue(table, std::nan(""))), "NaN");
+}
+
+TEST_F(Texts, OperatorsOfBoth) {
+    for (const OperatorInfo& row : operatorTable())
+        for (const bool quill : {false, true}) {
+            const bool isInfix = row.form == OperatorForm::Infix, isPrefix = row.form == OperatorForm::Prefix;
+            if (!isInfix && !isPrefix && row.form != OperatorForm::Postfix)
+                continue;
+            const std::string spelling(quill ? row.quill : row.c);
+            const std::string other = quill && row.op == Op::ShiftRight ? "-b" : "b"; // Quill shifts to the left
+            std::string wanted = isPrefix ? spelling + "a" : "a" + spelling + (isInfix ? other : "");
+            if (spelling.empty())
+                wanted = std::string(row.quillCall) + "(a" + (isInfix ? "," + other : "") + ")";
+            const SymbolicExprId id = isInfix ? tree(row.op, a, b) : tree(row.op, a);
+            EXPECT_EQ(SymbolicExprPrinter(table, quill)(id), wanted) << row.name;
+        }
 }
 
 TEST_F(Texts, NumbersReadBackInEveryLocale) {

@@ -2,10 +2,11 @@
 #include "base/print/ExpressionPrinter.hpp"
 #include "base/transform/QuillConversion.hpp"
 #include "parser/QuillConverterBlockVariants.hpp"
+#include "tests/support/Cases.hpp"
 #include "tests/support/Parsing.hpp"
+#include "tests/support/TreeReader.hpp"
 #include "tests/support/TreeText.hpp"
 #include "tests/support/generators/AnyNode.hpp"
-#include "tests/support/generators/Corpus.hpp"
 #include "tests/support/generators/RandomExpression.hpp"
 
 #include <gtest/gtest.h>
@@ -112,8 +113,6 @@ struct Press {
     SymbolicExprFromQParseTreeBlockVariants fromQuill{table, checker};
 };
 
-constexpr int smallest = std::numeric_limits<int>::min();
-
 TEST(ReadBack, EveryOperatorUnderEveryOther) {
     for (const bool quill : {false, true}) {
         Press press(quill);
@@ -127,12 +126,11 @@ TEST(ReadBack, EveryOperatorUnderEveryOther) {
                 inputs[0] = name;
             return tree(op, inputs);
         };
-        const std::vector<SymbolicExprId> leaves{tree.name("a"),   tree.integer(0),        tree.integer(5),
-                                                 tree.integer(-5), tree.integer(smallest), tree.real(-0.0),
-                                                 tree.real(-2.5),  tree.real(1e22),        tree.real(2147483648.0)};
         for (const Op outer : written(quill))
             for (const std::size_t place : {0U, 1U})
-                for (const SymbolicExprId leaf : leaves) {
+                for (const char* const text :
+                     {"a", "0", "5", "-5", "-2147483648", "-0.0r", "-2.5r", "1e22r", "2147483648r"}) {
+                    const SymbolicExprId leaf = readTree(press.table, text);
                     press.expectReadsBack(around(outer, leaf, place));
                     for (const Op inner : written(quill))
                         press.expectReadsBack(around(outer, around(inner, leaf, 0), place));
@@ -159,46 +157,29 @@ struct QuillTrees {
     std::size_t below(std::size_t bound) { return static_cast<std::size_t>(random() % bound); }
 
     SymbolicExprId leaf() {
-        static const std::vector<std::string> names{"a", "b", "i", "e1", "rem", "Inf", "(sim)", "(codegen)"};
-        constexpr double infinity = std::numeric_limits<double>::infinity();
-        static const std::vector<double> reals{-0.0, 0.1,          -2.5,         5e-324,        1e300,
-                                               1e22, 2147483647.0, 2147483648.0, -2147483648.0, -2147483649.0,
-                                               0.0,  infinity,     -infinity};
-        static const std::vector<int> integers{0, 1, -1, 2, smallest, std::numeric_limits<int>::max()};
-        switch (below(4)) {
-        case 0:
-            return make.integer(integers[below(integers.size())]);
-        case 1:
-            return make.real(reals[below(reals.size())]);
-        default:
-            return make.name(names[below(names.size())]);
-        }
+        static const std::vector<CaseRow> leaves = casesOf("print.txt", "leaves of Quill", 1);
+        return readTree(table, leaves[below(leaves.size())][0]);
     }
 
     // NOLINTBEGIN(misc-no-recursion): as deep as asked for
 
-    std::vector<SymbolicExprId> several(int depth, std::size_t most, bool apart = true) {
-        std::vector<SymbolicExprId> trees(below(most + 1));
-        std::ranges::generate(trees, [&] { return apart ? alone(depth) : tree(depth); });
+    std::vector<SymbolicExprId> several(int depth) {
+        std::vector<SymbolicExprId> trees(below(4));
+        std::ranges::generate(trees, [&] { return alone(depth); });
         return trees;
     }
 
     /// What has brackets or commas around it, or is the whole.
     SymbolicExprId alone(int depth) {
-        switch (below(6)) {
-        case 0:
-            return make(Op::QColon, leaf(), leaf());
-        case 1:
-            return make(Op::QColon3, leaf(), leaf(), leaf());
-        case 2:
-            return make(Op::AnonymousFunc, make.name("@(p,q)"), tree(depth));
-        default:
-            return tree(depth);
-        }
+        const std::size_t kind = below(6);
+        return kind == 0   ? make(Op::QColon, leaf(), leaf())
+               : kind == 1 ? make(Op::QColon3, leaf(), leaf(), leaf())
+               : kind == 2 ? make(Op::AnonymousFunc, make.name("@(p,q)"), tree(depth))
+                           : tree(depth);
     }
 
     SymbolicExprId withParts(Op op, SymbolicExprId first, int depth) {
-        std::vector<SymbolicExprId> inputs = several(depth - 1, 3);
+        std::vector<SymbolicExprId> inputs = several(depth - 1);
         inputs.resize(operandCount(op).value_or(inputs.size() + 1) - 1, first);
         inputs.insert(inputs.begin(), first);
         return make(op, inputs);
@@ -210,27 +191,19 @@ struct QuillTrees {
     }
 
     SymbolicExprId compound(int depth) {
-        static const std::vector<Op> calls{Op::FcnCall0U, Op::FcnCall1U, Op::FcnCall2U, Op::FcnCall};
-        switch (below(8)) {
-        case 0:
-            return withParts(calls[below(calls.size())], tree(depth - 1), depth);
-        case 1:
+        static const std::vector<Op> lists{Op::FcnCall0U, Op::FcnCall1U, Op::FcnCall2U, Op::FcnCall,
+                                           Op::Dims2D,    Op::Dims3D,    Op::DimsND};
+        const std::size_t kind = below(8);
+        if (kind < 2)
+            return withParts(lists[below(lists.size())], tree(depth - 1), depth);
+        if (kind == 2)
             return make(Op::MemberValue, tree(depth - 1));
-        case 2:
-        case 3: {
+        if (kind < 5) {
             std::vector<SymbolicExprId> rows(1 + below(3));
-            std::ranges::generate(rows, [&] { return make(Op::Row, several(depth - 1, 3)); });
+            std::ranges::generate(rows, [&] { return make(Op::Row, several(depth - 1)); });
             return make(below(2) == 0 ? Op::Matrix : Op::CellArray, rows);
         }
-        case 4: {
-            static const std::vector<Op> lists{Op::Dims2D, Op::Dims3D, Op::DimsND};
-            return withParts(lists[below(lists.size())], tree(depth - 1), depth);
-        }
-        case 5:
-            return ranges ? make(Op::QColon, tree(depth - 1), tree(depth - 1)) : leaf();
-        default:
-            return leaf();
-        }
+        return kind == 5 && ranges ? make(Op::QColon, tree(depth - 1), tree(depth - 1)) : leaf();
     }
 
     // NOLINTEND(misc-no-recursion)
@@ -245,18 +218,6 @@ TEST(ReadBack, EveryShapeOfQuill) {
         QuillTrees anything{press.table, random, true};
         press.expectSettles(SymbolicExprPrinter(press.table, true)(anything.alone(depth)), false);
     }
-}
-
-TEST(ReadBack, RealConditions) {
-    Press press(false);
-    std::size_t conditions = 0;
-    for (const CorpusFile& file : corpusFiles)
-        for (const std::string& line : corpusLines(file.name))
-            if (const ParseAnswer read = parse(press.table, line); !read.error) {
-                ++conditions;
-                press.expectReadsBack(read.id);
-            }
-    EXPECT_GT(conditions, 10000U);
 }
 
 } // namespace

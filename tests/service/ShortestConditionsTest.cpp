@@ -4,11 +4,11 @@
 #include "base/decide/Decider.hpp"
 #include "tests/service/Customizers.hpp"
 #include "tests/support/Cases.hpp"
-#include "tests/support/Corpus.hpp"
 #include "tests/support/Parsing.hpp"
-#include "tests/support/RandomCondition.hpp"
 #include "tests/support/Times.hpp"
-#include "tests/support/Truth.hpp"
+#include "tests/support/generators/Corpus.hpp"
+#include "tests/support/generators/RandomCondition.hpp"
+#include "tests/support/oracles/Truth.hpp"
 
 #include <boost/algorithm/string/replace.hpp>
 #include <gtest/gtest.h>

@@ -14,21 +14,12 @@ std::string unescaped(const std::string& text) {
             result += text[at];
             continue;
         }
-        switch (text[++at]) {
-        case 'n':
-            result += '\n';
-            break;
-        case 't':
-            result += '\t';
-            break;
-        case 'x':
+        const char what = text[++at];
+        if (what == 'x') {
             result += static_cast<char>(std::stoi(text.substr(at + 1, 2), nullptr, 16));
             at += 2;
-            break;
-        case 'e':
-            break;
-        default:
-            result += text[at];
+        } else if (what != 'e') {
+            result += what == 'n' ? '\n' : what == 't' ? '\t' : what;
         }
     }
     return result;

@@ -17,23 +17,8 @@
 
 namespace VT::Testing {
 
-/// A table of any kind that numbers its nodes in a known way.
-class NumberedTable {
-public:
-    virtual ~NumberedTable() = default;
-    virtual SymbolicExprTable& table() = 0;
-
-    /// The identifier of the node that was or will be added at a position.
-    [[nodiscard]] virtual SymbolicExprId idAt(std::size_t position) const { return position; }
-
-    [[nodiscard]] virtual std::size_t count() const = 0;
-
-    /// Whether the library keeps the nodes.
-    [[nodiscard]] virtual bool isOrdered() const { return true; }
-};
-
 /// A table that keeps its nodes itself, under identifiers of its own making; the base's storage stays empty.
-class HostTable final : public SymbolicExprTable, public NumberedTable {
+class HostTable final : public SymbolicExprTable {
 public:
     enum class Numbering { Dense, Descending, Far };
 
@@ -66,18 +51,14 @@ public:
 
     SymbolicExprTable* CreateSymbolicExprTable() const override { return new HostTable(numbering_); }
 
-    SymbolicExprTable& table() override { return *this; }
-
-    [[nodiscard]] SymbolicExprId idAt(std::size_t position) const override {
+    [[nodiscard]] SymbolicExprId idAt(std::size_t position) const {
         constexpr SymbolicExprId million = 1'000'000;
         if (numbering_ == Numbering::Descending)
             return million - position;
         return numbering_ == Numbering::Far ? invalidId - 1 - position * million * million : position;
     }
 
-    [[nodiscard]] std::size_t count() const override { return kept_.size(); }
-
-    [[nodiscard]] bool isOrdered() const override { return false; }
+    [[nodiscard]] std::size_t count() const { return kept_.size(); }
 
 private:
     Numbering numbering_;
@@ -92,28 +73,34 @@ public:
     const SymbolicExpr* get(SymbolicExprId id) const override { return SymbolicExprTable::get(id); }
 };
 
-/// A table whose nodes the library keeps.
-template <class Table>
-class LibraryTable final : public NumberedTable {
+/// A table of any kind, with what is known of how it numbers its nodes.
+class NumberedTable {
 public:
-    SymbolicExprTable& table() override { return table_; }
+    explicit NumberedTable(SymbolicExprTable* table) : table_(table), host_(dynamic_cast<HostTable*>(table)) {}
 
-    [[nodiscard]] std::size_t count() const override { return table_.size(); }
+    SymbolicExprTable& table() { return *table_; }
+
+    /// The identifier of the node that was or will be added at a position.
+    [[nodiscard]] SymbolicExprId idAt(std::size_t position) const { return host_ ? host_->idAt(position) : position; }
+
+    [[nodiscard]] std::size_t count() const { return host_ ? host_->count() : table_->size(); }
+
+    /// Whether the library keeps the nodes.
+    [[nodiscard]] bool isOrdered() const { return host_ == nullptr; }
 
 private:
-    Table table_;
+    std::unique_ptr<SymbolicExprTable> table_;
+    const HostTable* host_;
 };
-
-using PlainTable = LibraryTable<SymbolicExprTable>;
 
 /// One empty table of each kind.
 inline std::vector<std::unique_ptr<NumberedTable>> tablesOfEachKind() {
+    using Numbering = HostTable::Numbering;
     std::vector<std::unique_ptr<NumberedTable>> tables;
-    tables.push_back(std::make_unique<PlainTable>());
-    tables.push_back(std::make_unique<LibraryTable<DerivedTable>>());
-    for (const auto numbering :
-         {HostTable::Numbering::Dense, HostTable::Numbering::Descending, HostTable::Numbering::Far})
-        tables.push_back(std::make_unique<HostTable>(numbering));
+    tables.push_back(std::make_unique<NumberedTable>(new SymbolicExprTable));
+    tables.push_back(std::make_unique<NumberedTable>(new DerivedTable));
+    for (const auto numbering : {Numbering::Dense, Numbering::Descending, Numbering::Far})
+        tables.push_back(std::make_unique<NumberedTable>(new HostTable(numbering)));
     return tables;
 }
 

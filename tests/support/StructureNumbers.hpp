@@ -24,8 +24,7 @@ public:
             family = SymbolicOp::FcnCall;
         if (dimensionOps.contains(family))
             family = SymbolicOp::DimsND;
-        const auto found = numbers_.try_emplace({family, payload(node), operands}, numbers_.size());
-        return found.first->second;
+        return numbers_.try_emplace({family, payload(node), operands}, numbers_.size()).first->second;
     }
 
     /// The numbers of all nodes of a table, by identifier.
@@ -44,16 +43,6 @@ public:
     static constexpr std::size_t none = ~std::size_t{0};
 
 private:
-    struct Structure {
-        SymbolicOp op;
-        std::string payload;
-        std::vector<std::size_t> operands;
-
-        bool operator<(const Structure& other) const {
-            return std::tie(op, payload, operands) < std::tie(other.op, other.payload, other.operands);
-        }
-    };
-
     static std::string payload(const SymbolicExpr& node) {
         if (node.op() == SymbolicOp::String)
             return static_cast<const SymbolicString&>(node).getName();
@@ -64,7 +53,7 @@ private:
         return {};
     }
 
-    std::map<Structure, std::size_t> numbers_;
+    std::map<std::tuple<SymbolicOp, std::string, std::vector<std::size_t>>, std::size_t> numbers_;
 };
 
 } // namespace VT::Testing

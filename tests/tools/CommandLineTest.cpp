@@ -1,9 +1,9 @@
 // The program: what it answers, what it says, and its exit status.
-#include "tests/support/Corpus.hpp"
 #include "tests/support/Parsing.hpp"
-#include "tests/support/RandomCondition.hpp"
 #include "tests/support/Times.hpp"
-#include "tests/support/Truth.hpp"
+#include "tests/support/generators/Corpus.hpp"
+#include "tests/support/generators/RandomCondition.hpp"
+#include "tests/support/oracles/Truth.hpp"
 #include "tests/tools/Program.hpp"
 
 #include <bitset>

@@ -124,10 +124,9 @@ TEST(Copy, LongChainsOfValues) {
 }
 
 TEST(Replacement, AgreesWithAModelOverEveryClass) {
-    const std::set<SymbolicOp> untouched{SymbolicOp::Dims2D,      SymbolicOp::Dims3D,       SymbolicOp::DimsND,
-                                         SymbolicOp::FcnCall0U,   SymbolicOp::CellArray,    SymbolicOp::Matrix,
-                                         SymbolicOp::MemberValue, SymbolicOp::AnonymousFunc};
-    const std::set<SymbolicOp> calls{SymbolicOp::FcnCall1U, SymbolicOp::FcnCall2U, SymbolicOp::FcnCall};
+    using Op = SymbolicOp;
+    const std::set<Op> untouched{Op::Dims2D,    Op::Dims3D, Op::DimsND,      Op::FcnCall0U,
+                                 Op::CellArray, Op::Matrix, Op::MemberValue, Op::AnonymousFunc};
     std::mt19937_64 random(9);
     int replacedRounds = 0;
     for (int round = 0; round < 500; ++round) {
@@ -157,7 +156,7 @@ TEST(Replacement, AgreesWithAModelOverEveryClass) {
                 operands.push_back(expected[node.getInput(i)]);
                 replaced = replaced || expectReplaced[node.getInput(i)];
                 const auto found = byNumber.find(operands.back());
-                if (found == byNumber.end() || untouched.contains(node.op()) || (i == 0 && calls.contains(node.op())))
+                if (found == byNumber.end() || untouched.contains(node.op()) || (i == 0 && callOps.contains(node.op())))
                     continue;
                 operands.back() = found->second;
                 replaced = true;

@@ -1,4 +1,5 @@
-// Real literals made integers, divisions pulled outwards, and every driver over shared and deep expressions.
+// Real literals made integers, divisions pulled outwards, C operators and calls of Quill functions, and every driver
+// over shared and deep expressions.
 #include "base/print/ExpressionPrinter.hpp"
 #include "base/transform/Cast2Int.hpp"
 #include "base/transform/Copy.hpp"
@@ -8,6 +9,7 @@
 #include "base/transform/XForm.hpp"
 #include "tests/support/Cases.hpp"
 #include "tests/support/Parsing.hpp"
+#include "tests/support/TreeReader.hpp"
 #include "tests/support/TreeText.hpp"
 #include "tests/support/generators/AnyNode.hpp"
 #include "tests/support/generators/RandomExpression.hpp"
@@ -19,6 +21,8 @@
 
 namespace VT::Testing {
 namespace {
+
+using Op = SymbolicOp;
 
 TEST(Cast2Int, RoundsEveryRealLiteral) {
     for (const CaseRow& row : casesOf("transform.txt", "rounded", 2)) {
@@ -40,7 +44,7 @@ TEST(Cast2Int, LeavesEverythingElse) {
     for (const SymbolicExprId id : randomGraph(random, table, 2000)) {
         const SymbolicExprId whole = cast.cast2Int(id);
         EXPECT_EQ(cast.cast2Int(whole), whole);
-        EXPECT_EQ(table.get(whole)->op() == SymbolicOp::DoubleValue, false);
+        EXPECT_NE(table.get(whole)->op(), Op::DoubleValue);
     }
 }
 
@@ -59,22 +63,19 @@ std::int64_t valueOf(const SymbolicExprTable& table, SymbolicExprId id, std::map
     if (const auto found = known.find(id); found != known.end())
         return found->second;
     const SymbolicExpr& node = *table.get(id);
-    const SymbolicOp op = node.op();
+    const Op op = node.op();
     const auto in = [&](std::size_t i) { return valueOf(table, node.getInput(i), known); };
-    const std::int64_t value = op == SymbolicOp::IntValue     ? static_cast<std::int64_t>(node.getNumValue())
-                               : op == SymbolicOp::Plus       ? in(0) + in(1)
-                               : op == SymbolicOp::Minus      ? in(0) - in(1)
-                               : op == SymbolicOp::UnaryMinus ? -in(0)
-                               : op == SymbolicOp::Multiply   ? in(0) * in(1)
-                               : op == SymbolicOp::Divide     ? in(0) * power(in(1), prime - 2)
-                                                              : static_cast<std::int64_t>(node.getHash() % prime);
+    const std::int64_t value = op == Op::IntValue   ? static_cast<std::int64_t>(node.getNumValue())
+                               : op == Op::Plus     ? in(0) + in(1)
+                               : op == Op::Minus    ? in(0) - in(1)
+                               : op == Op::Multiply ? in(0) * in(1)
+                               : op == Op::Divide   ? in(0) * power(in(1), prime - 2)
+                                                    : static_cast<std::int64_t>(node.getHash() % prime);
     return known[id] = (value % prime + prime) % prime;
 }
 
 class FactorDivision : public testing::Test {
 protected:
-    SymbolicExprId read(const std::string& text) { return Testing::read(table, text); }
-
     SymbolicExprId factored(SymbolicExprId id) { return SymbolicExprFactorDivision(table).factorDivision(id); }
 
     SymbolicExprTable table;
@@ -83,27 +84,26 @@ protected:
 TEST_F(FactorDivision, EveryOperatorOfQuotients) {
     const SymbolicExprPrinter print(table, false);
     for (const CaseRow& row : casesOf("transform.txt", "factored", 2)) {
-        const SymbolicExprId before = read(row[0]), after = factored(before);
+        const SymbolicExprId before = read(table, row[0]), after = factored(before);
         EXPECT_TRUE(row[1].empty() ? after == before : print(after) == row[1]) << row[0] << " becomes " << print(after);
     }
     for (const SymbolicExprId id : {invalidId, SymbolicExprId{table.size()}})
         EXPECT_EQ(factored(id), invalidId);
-    const SymbolicExprId x = read("x");
-    const SymbolicExprId elementWise = SymbolicDotDivExpr(table, SymbolicLDivExpr(table, x, x), x).getId(table);
+    const SymbolicExprId elementWise = readTree(table, "DotDiv(LDiv(x,x),x)");
     EXPECT_EQ(factored(elementWise), elementWise);
 }
 
 TEST_F(FactorDivision, KeepsTheValueAndLeavesOneQuotient) {
+    static constexpr Op operators[] = {Op::Plus, Op::Minus, Op::Multiply, Op::Divide};
+    const Trees tree{table};
     std::mt19937_64 random(6);
     for (int round = 0; round < 300; ++round) {
-        std::vector<SymbolicExprId> nodes{read("N"), read("M"), read("K"), read("3"), read("7")};
+        std::vector<SymbolicExprId> nodes{tree.name("N"), tree.name("M"), tree.name("K"), tree.integer(3),
+                                          tree.integer(7)};
         for (int i = 0; i < 12; ++i) {
             const SymbolicExprId a = nodes[random() % nodes.size()], b = nodes[random() % nodes.size()];
-            const SymbolicExprId made[] = {
-                SymbolicPlusExpr(table, a, b).getId(table), SymbolicMinusExpr(table, a, b).getId(table),
-                SymbolicMultiplyExpr(table, a, b).getId(table), SymbolicDivideExpr(table, a, b).getId(table)};
             std::map<SymbolicExprId, std::int64_t> values;
-            const SymbolicExprId chosen = made[random() % 4];
+            const SymbolicExprId chosen = tree(operators[random() % 4], a, b);
             if (valueOf(table, chosen, values) != 0) // so that no divisor is zero
                 nodes.push_back(chosen);
         }
@@ -117,13 +117,62 @@ TEST_F(FactorDivision, KeepsTheValueAndLeavesOneQuotient) {
         EXPECT_EQ(factored(after), after);
     }
 
-    const SymbolicExprId doubled = Trees{table}.doubled(SymbolicOp::Plus, read("N/2"));
+    const SymbolicExprId doubled = tree.doubled(Op::Plus, read(table, "N/2"));
     std::map<SymbolicExprId, std::int64_t> values;
     EXPECT_EQ(table.get(factored(doubled))->op(), SymbolicOp::Divide);
     EXPECT_EQ(valueOf(table, doubled, values), valueOf(table, factored(doubled), values));
 }
 
-using Op = SymbolicOp;
+class QuillConversion : public testing::Test {
+protected:
+    template <class Driver>
+    void expectConverted(const std::string& section) {
+        for (const CaseRow& row : casesOf("transform.txt", section, 2)) {
+            const SymbolicExprId before = read(table, row[0]), after = Driver(table)(before);
+            EXPECT_TRUE(row[1].empty() ? after == before : treeText(table, after) == row[1])
+                << row[0] << " becomes " << treeText(table, after);
+        }
+    }
+
+    SymbolicExprTable table;
+};
+
+TEST_F(QuillConversion, NamesAreInternedInOrder) {
+    SymbolicExprQ2CVisitor visitor(table);
+    std::string names;
+    for (SymbolicExprId id = 0; id < table.size(); ++id)
+        names += treeText(table, id) + " ";
+    EXPECT_EQ(names, "idivide rem bitand bitor bitxor bitcmp bitshift ");
+    EXPECT_EQ(visitor.get(), invalidId);
+}
+
+TEST_F(QuillConversion, CallsBecomeOperators) {
+    expectConverted<SymbolicExprQ2C>("calls to operators");
+}
+
+TEST_F(QuillConversion, OperatorsBecomeCalls) {
+    expectConverted<SymbolicExprC2Q>("operators to calls");
+}
+
+TEST_F(QuillConversion, TheCallClassDoesNotMatter) {
+    for (const char* const call : {"FcnCall2U(rem,x,x)", "FcnCall(rem,x,x)"}) {
+        SymbolicExprTable fresh;
+        EXPECT_EQ(treeText(fresh, SymbolicExprQ2C(fresh)(readTree(fresh, call))), "Modulo(x,x)");
+    }
+    for (const char* const call : {"FcnCall()", "FcnCall2U(Plus(rem,1),a,b)"}) {
+        const SymbolicExprId id = readTree(table, call);
+        EXPECT_EQ(SymbolicExprQ2C(table)(id), id);
+    }
+}
+
+TEST_F(QuillConversion, IdentifiersThatAreNotOfTheTable) {
+    for (const SymbolicExprId id : {invalidId, SymbolicExprId{1}, SymbolicExprId{3}}) { // of names interned later
+        SymbolicExprTable small, other;
+        const SymbolicString a(small, "a"), alike(other, "a");
+        EXPECT_EQ(SymbolicExprQ2C(small)(id), invalidId);
+        EXPECT_EQ(SymbolicExprC2Q(other)(id), invalidId);
+    }
+}
 
 TEST(Drivers, SharedAndDeepExpressions) {
     SymbolicExprTable table;

@@ -38,20 +38,11 @@ const std::vector<SymbolicOp>& valueOperators() {
 }
 
 SymbolicExprId anyLeaf(SymbolicExprTable& table, std::mt19937_64& random, const ConditionWorld& world) {
-    constexpr int least = std::numeric_limits<int>::min();
-    constexpr int greatest = std::numeric_limits<int>::max();
-    static constexpr std::array integers{0, 1, -1, 2, 3, 7, 31, greatest, least};
-    static constexpr std::array reals{0.0,
-                                      -0.0,
-                                      0.5,
-                                      1.0,
-                                      2.0,
-                                      -1.5,
-                                      0.1,
-                                      1e300,
-                                      2147483648.0,
-                                      std::numeric_limits<double>::infinity(),
-                                      std::numeric_limits<double>::quiet_NaN()};
+    using Int = std::numeric_limits<int>;
+    constexpr double infinity = std::numeric_limits<double>::infinity();
+    constexpr double nan = std::numeric_limits<double>::quiet_NaN();
+    static constexpr std::array integers{0, 1, -1, 2, 3, 7, 31, Int::max(), Int::min()};
+    static constexpr std::array reals{0.0, -0.0, 0.5, 1.0, 2.0, -1.5, 0.1, 1e300, 2147483648.0, infinity, nan};
     const Trees tree{table};
     const std::size_t kind = below(random, 16);
     if (kind < 2)

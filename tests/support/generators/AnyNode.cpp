@@ -44,29 +44,21 @@ SymbolicExprId make(SymbolicExprTable& table, const NodeParts& parts) {
 } // namespace
 
 std::optional<std::size_t> operandCount(SymbolicOp op) {
-    switch (op) {
-#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                         \
-    case SymbolicOp::Name:                                                                                             \
-        return countOf<Class>();
+    static constexpr std::optional<std::size_t> counts[] = {
+#define VTSYM_OPERATOR(Code, Name, Class, ...) countOf<Class>(),
 #include "base/core/operators.def"
 #undef VTSYM_OPERATOR
-    case SymbolicOp::None:
-        break;
-    }
-    return 0;
+    };
+    return counts[static_cast<std::size_t>(op)];
 }
 
 SymbolicExprId makeAny(SymbolicExprTable& table, SymbolicOp op, const NodeParts& parts) {
-    switch (op) {
-#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                         \
-    case SymbolicOp::Name:                                                                                             \
-        return make<Class>(table, parts);
+    static constexpr SymbolicExprId (*makers[])(SymbolicExprTable&, const NodeParts&) = {
+#define VTSYM_OPERATOR(Code, Name, Class, ...) make<Class>,
 #include "base/core/operators.def"
 #undef VTSYM_OPERATOR
-    case SymbolicOp::None:
-        break;
-    }
-    return invalidId;
+    };
+    return makers[static_cast<std::size_t>(op)](table, parts);
 }
 
 SymbolicExprId Trees::doubled(SymbolicOp op, SymbolicExprId id, int times) const {

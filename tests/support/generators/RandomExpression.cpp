@@ -13,14 +13,12 @@ const T& anyOf(std::mt19937_64& random, const std::vector<T>& all) {
     return all[random() % all.size()];
 }
 
+using Int = std::numeric_limits<int>;
+using Real = std::numeric_limits<double>;
 const std::vector<std::string> names{"", "a", "b", "N", "f", "true", "(sim)", "\xff"};
-const std::vector<int> integers{-2, -1, 0, 1, 2, 3, std::numeric_limits<int>::min(), std::numeric_limits<int>::max()};
-const std::vector<double> reals{0.0,   -0.0,
-                                0.5,   1.0,
-                                -2.75, 1.0 + std::numeric_limits<double>::epsilon(),
-                                1e300, std::numeric_limits<double>::infinity()};
-const std::vector<double> oddReals{0.5, -std::numeric_limits<double>::infinity(),
-                                   std::numeric_limits<double>::quiet_NaN()};
+const std::vector<int> integers{-2, -1, 0, 1, 2, 3, Int::min(), Int::max()};
+const std::vector<double> reals{0.0, -0.0, 0.5, 1.0, -2.75, 1.0 + Real::epsilon(), 1e300, Real::infinity()};
+const std::vector<double> oddReals{0.5, -Real::infinity(), Real::quiet_NaN()};
 
 /// A node whose operands are what `pick` answers for an operator and a position.
 template <class Pick>

@@ -54,7 +54,6 @@ ExactValue::ExactValue(const SymbolicExprTable& table, SymbolicExprId root, Quot
             step.literal = name == "true" ? 1 : 0;
         } else {
             step.name = name;
-            names_.push_back(name);
         }
     }
 }

@@ -37,14 +37,10 @@ public:
     /// Whether the latest value took a quotient with a remainder, which only a dimension takes for exact.
     [[nodiscard]] bool tookRemainder() const noexcept { return tookRemainder_; }
 
-    /// Names of symbols other than the truth constants.
-    [[nodiscard]] const std::vector<std::string>& names() const noexcept { return names_; }
-
 private:
     [[nodiscard]] std::optional<ExactNumber> compute(const Step& step, const std::vector<ExactNumber>& values) const;
 
     std::vector<Step> steps_;
-    std::vector<std::string> names_;
     mutable bool tookRemainder_ = false;
 };
 

@@ -67,9 +67,7 @@ private:
 
     Z3_ast asTruth(SymbolicExprId id) {
         const Z3_ast ast = done_.at(id);
-        if (isTruth(id))
-            return ast;
-        return Z3_mk_not(context_, Z3_mk_eq(context_, ast, integer(0)));
+        return isTruth(id) ? ast : Z3_mk_not(context_, Z3_mk_eq(context_, ast, integer(0)));
     }
 
     Z3_ast asNumber(SymbolicExprId id) {
