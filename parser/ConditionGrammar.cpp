@@ -44,37 +44,27 @@ struct Infix {
 };
 
 struct InfixRow {
-    SymbolicOp op;
+    SymbolicOp op = SymbolicOp::None;
     Infix infix;
 };
 
-template <SymbolicOp Op, class Action = binary_expr<Op>>
+template <SymbolicOp Op>
 constexpr InfixRow infix{
     Op, {operatorInfo(Op).precedence, [](SyntaxArena& arena, const expression_ast& left, const expression_ast& right) {
-             return Action()(arena, left, right);
+             return binary_expr<Op>()(arena, left, right);
          }}};
 
-/// The infix operators of the grammar.  Their spellings and strengths are those of the operator table.
-constexpr auto infixOperators = std::to_array<InfixRow>({
-    infix<SymbolicOp::Or>,
-    infix<SymbolicOp::And>,
-    infix<SymbolicOp::BitOr>,
-    infix<SymbolicOp::BitXOr>,
-    infix<SymbolicOp::BitAnd>,
-    infix<SymbolicOp::Equal>,
-    infix<SymbolicOp::NotEqual>,
-    infix<SymbolicOp::LessThanEqual>,
-    infix<SymbolicOp::LessThan>,
-    infix<SymbolicOp::GreaterThanEqual>,
-    infix<SymbolicOp::GreaterThan>,
-    infix<SymbolicOp::ShiftRight>,
-    infix<SymbolicOp::ShiftLeft>,
-    infix<SymbolicOp::Plus>,
-    infix<SymbolicOp::Minus>,
-    infix<SymbolicOp::Multiply>,
-    infix<SymbolicOp::Divide>,
-    infix<SymbolicOp::Modulo, modulo_expr>,
-});
+/// The rows of the operators in grammarInfixOps, in the order of the operator table.
+constexpr auto infixOperators = [] {
+    std::array<InfixRow, static_cast<std::size_t>(grammarInfixOps.size())> rows{};
+    std::size_t next = 0;
+#define VTSYM_OPERATOR(Code, Name, ...)                                                                                \
+    if constexpr (grammarInfixOps.contains(SymbolicOp::Name))                                                          \
+        rows[next++] = infix<SymbolicOp::Name>;
+#include "base/core/operators.def"
+#undef VTSYM_OPERATOR
+    return rows;
+}();
 
 constexpr std::size_t countPrecedences() {
     std::uint64_t seen = 0;

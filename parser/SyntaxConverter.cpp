@@ -1,6 +1,8 @@
 #include "parser/SyntaxConverter.hpp"
 
+#include "base/core/Make.hpp"
 #include "base/core/Nodes.hpp"
+#include "parser/SyntaxActions.hpp"
 
 #include <boost/container/small_vector.hpp>
 
@@ -111,11 +113,10 @@ private:
         const SymbolicExprId operand = takeLast();
         switch (node.op) {
         case SymbolicOp::UnaryMinus:
-            return intern<SymbolicUnaryMinusExpr>(operand);
         case SymbolicOp::Not:
-            return intern<SymbolicNotExpr>(operand);
+            return makeUnary(table_, node.op, operand);
         case SymbolicOp::BitCompl:
-            return cOperators_ ? intern<SymbolicBitComplExpr>(operand) : intern<SymbolicNotExpr>(operand);
+            return makeUnary(table_, cOperators_ ? node.op : SymbolicOp::Not, operand);
         case SymbolicOp::FcnCall0U:
             return intern<SymbolicFcnCall0UExpr>(operand);
         default:
@@ -134,46 +135,7 @@ private:
     }
 
     SymbolicExprId buildInfix(SymbolicOp op, SymbolicExprId left, SymbolicExprId right) {
-        switch (op) {
-        case SymbolicOp::Plus:
-            return intern<SymbolicPlusExpr>(left, right);
-        case SymbolicOp::Minus:
-            return intern<SymbolicMinusExpr>(left, right);
-        case SymbolicOp::Multiply:
-            return intern<SymbolicMultiplyExpr>(left, right);
-        case SymbolicOp::Divide:
-            return intern<SymbolicDivideExpr>(left, right);
-        case SymbolicOp::Modulo:
-            return intern<SymbolicModuloExpr>(left, right);
-        case SymbolicOp::Equal:
-            return intern<SymbolicEqualExpr>(left, right);
-        case SymbolicOp::NotEqual:
-            return intern<SymbolicNotEqualExpr>(left, right);
-        case SymbolicOp::LessThan:
-            return intern<SymbolicLessThanExpr>(left, right);
-        case SymbolicOp::LessThanEqual:
-            return intern<SymbolicLessThanEqualExpr>(left, right);
-        case SymbolicOp::GreaterThan:
-            return intern<SymbolicGreaterThanExpr>(left, right);
-        case SymbolicOp::GreaterThanEqual:
-            return intern<SymbolicGreaterThanEqualExpr>(left, right);
-        case SymbolicOp::And:
-            return intern<SymbolicAndExpr>(left, right);
-        case SymbolicOp::Or:
-            return intern<SymbolicOrExpr>(left, right);
-        case SymbolicOp::BitAnd:
-            return intern<SymbolicBitAndExpr>(left, right);
-        case SymbolicOp::BitOr:
-            return intern<SymbolicBitOrExpr>(left, right);
-        case SymbolicOp::BitXOr:
-            return intern<SymbolicBitXOrExpr>(left, right);
-        case SymbolicOp::ShiftLeft:
-            return intern<SymbolicShiftLeftExpr>(left, right);
-        case SymbolicOp::ShiftRight:
-            return intern<SymbolicShiftRightExpr>(left, right);
-        default:
-            return invalidId;
-        }
+        return grammarInfixOps.contains(op) ? makeBinary(table_, op, left, right) : invalidId;
     }
 
     SymbolicExprId buildCall(const binary_op& node) {

@@ -115,6 +115,20 @@ public:
 
     [[nodiscard]] constexpr int size() const { return std::popcount(bits_); }
 
+    /// The operators of either set.
+    friend constexpr OperatorSet operator|(OperatorSet a, OperatorSet b) {
+        a.bits_ |= b.bits_;
+        return a;
+    }
+
+    /// The operators of both sets.
+    friend constexpr OperatorSet operator&(OperatorSet a, OperatorSet b) {
+        a.bits_ &= b.bits_;
+        return a;
+    }
+
+    constexpr bool operator==(const OperatorSet&) const = default;
+
     /// The operators whose row satisfies a condition.
     template <class Condition>
     static constexpr OperatorSet where(Condition condition) {
@@ -135,6 +149,9 @@ private:
 
 /// The comparisons == ~= < <= > >=.
 inline constexpr OperatorSet comparisonOps = OperatorSet::where([](const OperatorInfo& r) { return r.onEqual >= 0; });
+/// The operators written between their two operands.
+inline constexpr OperatorSet infixOps =
+    OperatorSet::where([](const OperatorInfo& r) { return r.form == OperatorForm::Infix; });
 /// Kinds whose every value is a truth value.
 inline constexpr OperatorSet booleanOps = OperatorSet::where([](const OperatorInfo& r) { return r.boolean; });
 /// The four call classes.

@@ -79,7 +79,7 @@ void SymbolicExprQ2CVisitor::convert(const Call& node) {
 
 /// The C operator on the arguments.
 SymbolicExprId SymbolicExprQ2CVisitor::build(SymbolicOp op, std::span<const SymbolicExprId> arguments) {
-    if (op == SymbolicOp::BitCompl)
+    if (arguments.size() == 1)
         return makeUnary(table(), op, arguments[0]);
     if (op != SymbolicOp::ShiftLeft)
         return makeBinary(table(), op, arguments[0], arguments[1]);
@@ -89,55 +89,15 @@ SymbolicExprId SymbolicExprQ2CVisitor::build(SymbolicOp op, std::span<const Symb
 
 // C to Quill.
 
-void SymbolicExprC2QVisitor::visit(const SymbolicDivideExpr& node) {
-    callOfTwo(node);
-}
-
-void SymbolicExprC2QVisitor::visit(const SymbolicModuloExpr& node) {
-    callOfTwo(node);
-}
-
-void SymbolicExprC2QVisitor::visit(const SymbolicBitAndExpr& node) {
-    callOfTwo(node);
-}
-
-void SymbolicExprC2QVisitor::visit(const SymbolicBitOrExpr& node) {
-    callOfTwo(node);
-}
-
-void SymbolicExprC2QVisitor::visit(const SymbolicBitXOrExpr& node) {
-    callOfTwo(node);
-}
-
-void SymbolicExprC2QVisitor::visit(const SymbolicShiftLeftExpr& node) {
-    callOfShift(node);
-}
-
-void SymbolicExprC2QVisitor::visit(const SymbolicShiftRightExpr& node) {
-    callOfShift(node);
-}
-
-void SymbolicExprC2QVisitor::visit(const SymbolicBitComplExpr& node) {
-    if (lacksOperand(node))
-        return SymbolicExprXFormVisitor::visit(node);
-    const SymbolicExprId operand = pop();
-    push(factory_.make<SymbolicFcnCall1UExpr>(nameOf(node.code), operand));
-}
-
-template <class Node>
-void SymbolicExprC2QVisitor::callOfTwo(const Node& node) {
-    if (lacksOperand(node))
-        return SymbolicExprXFormVisitor::visit(node);
-    const SymbolicExprId right = pop();
-    const SymbolicExprId left = pop();
-    push(factory_.make<SymbolicFcnCall2UExpr>(nameOf(node.code), left, right));
-}
-
-template <class Node>
-void SymbolicExprC2QVisitor::callOfShift(const Node& node) {
-    if (!lacksOperand(node))
-        push(make(quillShiftAmount(table(), node.code, pop())));
-    callOfTwo(node);
+/// Replaces the results of the operands by the call that stands for the operator.
+void SymbolicExprC2QVisitor::callFor(SymbolicOp op) {
+    SymbolicExprId last = pop();
+    if (quillCallArguments(op) == 1)
+        return push(factory_.make<SymbolicFcnCall1UExpr>(nameOf(op), last));
+    if (op == SymbolicOp::ShiftLeft || op == SymbolicOp::ShiftRight)
+        last = make(quillShiftAmount(table(), op, last));
+    const SymbolicExprId first = pop();
+    push(factory_.make<SymbolicFcnCall2UExpr>(nameOf(op), first, last));
 }
 
 // Drivers.

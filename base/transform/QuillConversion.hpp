@@ -54,20 +54,23 @@ public:
     explicit SymbolicExprC2QVisitor(SymbolicExprTable& target) : QuillCallVisitor(target) {}
 
     using QuillCallVisitor::visit;
-    void visit(const SymbolicDivideExpr& node) override;
-    void visit(const SymbolicModuloExpr& node) override;
-    void visit(const SymbolicBitAndExpr& node) override;
-    void visit(const SymbolicBitOrExpr& node) override;
-    void visit(const SymbolicBitXOrExpr& node) override;
-    void visit(const SymbolicBitComplExpr& node) override;
-    void visit(const SymbolicShiftLeftExpr& node) override;
-    void visit(const SymbolicShiftRightExpr& node) override;
+#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                         \
+    void visit(const Class& node) override {                                                                           \
+        convert(node);                                                                                                 \
+    }
+#include "base/core/operators.def"
+#undef VTSYM_OPERATOR
 
 private:
     template <class Node>
-    void callOfTwo(const Node& node);
-    template <class Node>
-    void callOfShift(const Node& node);
+    void convert(const Node& node) {
+        if constexpr (quillCallOps.contains(Node::code))
+            if (!lacksOperand(node))
+                return callFor(Node::code);
+        SymbolicExprXFormVisitor::visit(node);
+    }
+
+    void callFor(SymbolicOp op);
 };
 
 /// Converts expressions of one table to C shape, in that table.
