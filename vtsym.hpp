@@ -18,6 +18,7 @@
 #include "base/print/Predicates.hpp"
 #include "base/print/PreprocessorVCExpr.hpp"
 #include "base/print/StringifySymbolicExpr.hpp"
+#include "base/print/StructuralOrder.hpp"
 #include "base/scan/SourceScan.hpp"
 #include "base/service/SymbolRegistry.hpp"
 #include "base/service/VCSymbols.hpp"

@@ -1,3 +1,5 @@
+// The exception class of diagnostics.  Its contents are shared by all copies, so that copying, and so throwing and
+// catching, cannot fail.
 #include "host/Diagnostics.hpp"
 
 #include <utility>

@@ -20,7 +20,7 @@ using DiagnosticArgument = std::variant<std::string, std::int64_t, double>;
 /// their contents and do not throw.
 class VTSYM_API HostDiagnostic : public std::runtime_error {
 public:
-    /// @param sentence  what to tell the user
+    /// @param sentence  what the user reads
     /// @param offset    byte offset in the text that the message is about, where there is one
     HostDiagnostic(std::string messageId, std::vector<DiagnosticArgument> arguments, std::string additionalText,
                    std::optional<std::size_t> offset, const std::string& sentence);
@@ -44,7 +44,7 @@ private:
 
 /// Makes a diagnostic of a message id; throws nothing but std::bad_alloc, whatever the id and the arguments are.
 ///
-/// @param additionalText  appended to the sentence of the catalogue in a sentence of its own
+/// @param additionalText  appended to the sentence of the catalogue as a sentence of its own
 /// @param offset          byte offset in the text that the message is about, where there is one
 VTSYM_API VT::HostDiagnostic vtsvCreateDiagnostic(std::string messageId, std::vector<VT::DiagnosticArgument> arguments,
                                                   std::string additionalText,
@@ -53,10 +53,10 @@ VTSYM_API VT::HostDiagnostic vtsvCreateDiagnostic(std::string messageId, std::ve
 /// Throws the diagnostic.
 [[noreturn]] VTSYM_API void vtsvThrowIExceptionFromDiagnostic(const VT::HostDiagnostic& diagnostic);
 
-/// Ends the process: a promise that the library or its caller made does not hold.  The embedded host writes one line to
-/// standard error and aborts.  A host may throw instead; the library stays usable then.
+/// Ends the process: an invariant of the library, or a precondition of a call, does not hold.  The embedded host writes
+/// one line to standard error and aborts.  A host may throw instead; the library stays usable then.
 [[noreturn]] VTSYM_API void vtsvFatalDiagnostic(const char* message, const char* file, int line, const char* function);
 
-/// Whether breaches that the library can answer without harm are fatal nevertheless.  On from the start.
+/// Whether violated preconditions that the library could ignore without harm are fatal.  True by default.
 VTSYM_API bool vtsvAssertionsEnabled() noexcept;
 VTSYM_API void vtsvSetAssertionsEnabled(bool enabled) noexcept;

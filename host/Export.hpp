@@ -1,5 +1,5 @@
 // The one export macro of the library.
 #pragma once
 
-/// Marks what leaves the shared library; everything else is compiled with hidden visibility.
+/// Exports a symbol from the shared library; everything else is compiled with hidden visibility.
 #define VTSYM_API __attribute__((visibility("default")))

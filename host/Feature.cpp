@@ -1,3 +1,5 @@
+// Assignments to feature flags: NAME=VALUE is read and checked here; the host keeps the flags.  Linear in the text and
+// in the number of flags.
 #include "host/Feature.hpp"
 
 #include "host/Text.hpp"

@@ -9,17 +9,17 @@
 #include <vector>
 
 /// A named integer switch that its host can set.  A flag lives as long as the component that declares it, usually from
-/// load to unload, and is found by name while it lives.  Flags are used by one thread at a time.
+/// load to unload, and can be found by name during that time.  Flags are used by one thread at a time.
 class VTSYM_API VtFeature {
 public:
-    /// Told after a new value was set.
+    /// Called after a new value was set.
     using ChangeCallback = void (*)(const VtFeature& feature);
 
     /// Registers the flag.  The host may start it with another value than the default: the embedded host looks for it
     /// in the environment variable VTSYM_FEATURES (NAME=VALUE,NAME=VALUE,...).
     ///
     /// @param sourceUnit  the unit that declares the flag
-    /// @param identifier  number of the flag in the host's books
+    /// @param identifier  number of the flag in the host's records
     VtFeature(std::string_view name, std::string_view description, std::string_view sourceUnit,
               std::string_view category, int identifier, std::int32_t defaultValue, ChangeCallback callback);
     ~VtFeature();
@@ -41,18 +41,18 @@ public:
     std::int32_t value() const;
     void setValue(std::int32_t value);
 
-    /// A flag counts as on when its value is above 0.
+    /// A flag is on when its value is above 0.
     bool isOn() const { return value() > 0; }
 
-    /// The living flag of that name (the oldest of several), or nullptr.
+    /// The flag of that name (the oldest of several), or nullptr.
     static VtFeature* find(std::string_view name);
 
-    /// The living flags in the order of their creation.
+    /// All flags in the order of their creation.
     static std::vector<VtFeature*> all();
 
     /// Carries out an assignment NAME=VALUE, VALUE being a decimal integer of 32 bits.
     ///
-    /// @return what is wrong with the assignment, in words for its author; empty when it was done.
+    /// @return what is wrong with the assignment, in words for its author; empty on success.
     static std::string assign(std::string_view assignment);
 
 private:
@@ -72,10 +72,10 @@ namespace VT {
 struct FeatureAssignment {
     std::string name;
     std::int32_t value = 0;
-    std::string error; ///< what is wrong with the text; empty for a good one
+    std::string error; ///< what is wrong with the text; empty for a valid one
 };
 
-/// Reads NAME=VALUE; blanks around both are ignored.  Never throws for a bad text.
+/// Reads NAME=VALUE; blanks around both are ignored.  Reports an invalid text in `error`.
 VTSYM_API FeatureAssignment parseFeatureAssignment(std::string_view text);
 
 } // namespace VT

@@ -13,9 +13,9 @@ namespace foundation::core::log {
 enum class Level : std::uint8_t { Debug, Info, Warning, Error, Off };
 
 template <typename Char>
-class basic_diagnostic_logger; // only over char
+class basic_diagnostic_logger; // char is the only instance
 
-/// A logger with a name.  Lines below its level cost one comparison.  Where lines go is the host's business; the
+/// A logger with a name.  Lines below its level cost one comparison.  The host decides where lines go; the
 /// embedded host writes them to standard error and takes the first level from the environment variable VTSYM_LOG
 /// (debug, info, warning, error or off; warning without it).
 template <>
@@ -32,7 +32,7 @@ public:
 
     void setLevel(Level level) noexcept { level_ = level; }
 
-    /// Whether a line of that level is written: ask before a line is put together at some cost.
+    /// Whether a line of that level is written: check it before composing a costly line.
     bool enabled(Level level) const noexcept { return level >= level_ && level != Level::Off; }
 
     void debug(std::string_view line) { log(Level::Debug, line); }

@@ -1,3 +1,7 @@
+// Makes readable sentences of message ids and arguments.
+//
+// Method: the rows of host/Messages.def become a constant table, which is searched from the front; an error is rare.
+// Every argument is shown quoted, escaped and cut, so the length of a sentence is bounded.
 #include "host/Messages.hpp"
 
 #include "host/Numbers.hpp"
@@ -40,7 +44,7 @@ std::string shown(const DiagnosticArgument& argument) {
     return vtsv_dtoa(std::get<double>(argument), true);
 }
 
-/// The place in words; texts are bytes, so bytes are counted, and from 1 as people do.
+/// The place in words: texts are bytes, so bytes are counted, from 1 as people do.
 std::string place(std::span<const DiagnosticArgument> arguments, std::optional<std::size_t> offset) {
     if (!offset)
         return "an unknown place";

@@ -27,8 +27,8 @@ VTSYM_API const MessageInfo* findMessage(std::string_view id);
 /// Whether the arguments have the number and the types that the row asks for.
 VTSYM_API bool fits(const MessageInfo& message, std::span<const DiagnosticArgument> arguments);
 
-/// The readable sentence for a message.  An unknown id, or arguments that do not fit, give the id and the arguments as
-/// they are, so that an error is never hidden by an error of its report.  Length is bounded whatever the arguments
+/// The readable sentence for a message.  For an unknown id, or arguments that do not fit, it lists the id and the
+/// arguments, so that an error is never hidden by an error in its report.  Length is bounded whatever the arguments
 /// hold.
 VTSYM_API std::string messageSentence(std::string_view id, std::span<const DiagnosticArgument> arguments,
                                       std::optional<std::size_t> offset);

@@ -1,4 +1,4 @@
-// The model whose blocks carry conditions: what the library asks of its host about it.  The types are the host's own.
+// Services that the library asks of its host: the model whose blocks carry conditions.  The types are the host's own.
 #pragma once
 
 #include "host/Export.hpp"
@@ -15,17 +15,17 @@ namespace VT {
 
 /// A variant condition as its author wrote it.
 struct VariantCondition {
-    std::string_view text; ///< empty where there is none
+    std::string_view text; ///< empty without a condition
     bool isQuill = false;  ///< in Quill syntax; otherwise in C syntax
 };
 
 } // namespace VT
 
-/// The block that holds a block, or nullptr; following parents comes to an end.
+/// The block that holds a block, or nullptr.  Following parents must come to an end.
 VTSYM_API const VTBlock* vtsvGetBlockParent(const VTBlock& block);
 /// The condition of a block itself.  The text may be one of the variant keywords.
 VTSYM_API VT::VariantCondition vtsvGetBlockVariantCondition(const VTBlock& block);
-/// The alternatives of a block, each of which has this block as its parent; none for most blocks.
+/// The choices of a block, each of which has this block as its parent; empty for most blocks.
 VTSYM_API std::span<const VTBlock* const> vtsvGetBlockChoices(const VTBlock& block);
 
 /// The block that a port belongs to, and those that its signal goes to.

@@ -7,9 +7,8 @@
 #include <string>
 #include <string_view>
 
-/// Writes a number: fixed notation where the exponent of its first digit is -5 to 20 (`2`, `0.25`, `-0`), scientific
-/// beyond
-/// (`1e+22`, `1.5e-07`), `Inf`, `-Inf` and `NaN`.
+/// Writes a number: in fixed notation where the exponent of its first digit is -5 to 20 (`2`, `0.25`, `-0`), otherwise
+/// in scientific notation (`1e+22`, `1.5e-07`); as `Inf`, `-Inf` or `NaN`.
 ///
 /// @param shortest  the fewest digits that read back to the same value; otherwise 17 significant digits without
 /// trailing zeros
@@ -30,6 +29,6 @@ struct ParsedNumber {
 
 } // namespace VT
 
-/// Reads a decimal number (`2`, `2.`, `.5`, `-1.5e-7`) in whole, rounded to the nearest value, ties to even; what is
-/// too small becomes zero.  Linear in the length of the text.
+/// Reads a text that is one decimal number (`2`, `2.`, `.5`, `-1.5e-7`), rounded to the nearest value, ties to even.  A
+/// number that is too small becomes zero.  Linear in the length of the text.
 VTSYM_API VT::ParsedNumber vtsv_strtod(std::string_view text);

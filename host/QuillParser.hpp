@@ -17,7 +17,7 @@
 template <class Char>
 struct _Q_parse_tree_T {
     static constexpr std::int32_t terminal = 0;    ///< a token
-    static constexpr std::int32_t nonTerminal = 1; ///< a rule and what it was made of
+    static constexpr std::int32_t nonTerminal = 1; ///< a rule and its parts
 
     std::int32_t kind;
     std::int32_t code;   ///< of the token or the rule: VT::QuillToken, VT::QuillRule
@@ -30,7 +30,7 @@ struct _Q_parse_tree_T {
 
     union {
         const Char* text;                ///< of a terminal: the token, inside the text that was parsed
-        const _Q_parse_tree_T* children; ///< of a non-terminal: the first of its children, the others behind it
+        const _Q_parse_tree_T* children; ///< of a non-terminal: the first of its children, followed by the others
     };
 };
 
@@ -51,7 +51,7 @@ enum class QuillRule : std::int32_t {
 /// Why a text has no parse tree.
 struct QuillFailure {
     std::size_t position = 0; ///< characters before the place where parsing stopped; at most those of the text
-    std::string_view reason;  ///< a sentence for the author of the text; empty where there was no failure; lives on
+    std::string_view reason;  ///< a sentence for the author of the text; empty without a failure; has static lifetime
 };
 
 } // namespace VT
@@ -81,13 +81,13 @@ public:
         return generate_parse_tree(text, std::char_traits<Char>::length(text));
     }
 
-    /// The tree of a text: a node VT::QuillRule::Root with one child.  nullptr where the text is no expression;
-    /// failure() tells why then.  The tree points into the text, which must outlive it.
+    /// The tree of a text: a node VT::QuillRule::Root with one child.  nullptr where the text is not an
+    /// expression; failure() returns the reason then.  The tree points into the text, which must outlive it.
     ///
     /// Linear in the length of the text.  When memory runs out, std::bad_alloc passes and the parser stays usable.
     virtual const Tree* generate_parse_tree(const Char* text, std::size_t length) = 0;
 
-    /// Frees a tree that this parser has made; nullptr is welcome.
+    /// Frees a tree that this parser has made; does nothing for nullptr.
     virtual void delete_parse_tree(const Tree* tree) noexcept = 0;
 
     /// Why the last text has no tree.

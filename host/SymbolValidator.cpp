@@ -1,3 +1,6 @@
+// The default validator: every name is a symbol.
+//
+// Here so that the class has one home for its table of virtual functions.
 #include "host/SymbolValidator.hpp"
 
 namespace VT {

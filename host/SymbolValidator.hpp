@@ -1,4 +1,4 @@
-// What the names in an expression stand for: a service that the library asks of its host.
+// The meaning of the names in an expression: a service that the library asks of its host.
 #pragma once
 
 #include "host/Export.hpp"
@@ -17,7 +17,7 @@ struct QxArray {
         Logical,
         Integer,
         Real,
-        Other, ///< text, structure, object: nothing that has numbers
+        Other, ///< text, structure, object: no numbers
     };
 
     Type type = Type::Other;
@@ -34,7 +34,7 @@ struct UnknownSymbol {};
 
 using SymbolMeaning = std::variant<SymbolName, UnknownSymbol, QxArray>;
 
-/// Tells what names stand for.  The default takes every name as a symbol.
+/// Resolves names to their meaning.  The default takes every name as a symbol.
 class VTSYM_API SymbolValidator {
 public:
     SymbolValidator() = default;
@@ -42,9 +42,9 @@ public:
     SymbolValidator& operator=(const SymbolValidator&) = delete;
     virtual ~SymbolValidator();
 
-    /// The meaning of a name.  An exception ends the conversion of the text and passes to whoever asked for it.
+    /// The meaning of a name.  An exception ends the conversion of the text and passes to its caller.
     ///
-    /// @param text      where the name stands, ended by NUL
+    /// @param text      the text that holds the name, ended by NUL
     /// @param position  characters of the text before the name
     virtual SymbolMeaning resolveSymbol(const std::string& name, const char* text, std::size_t position);
 };

@@ -1,3 +1,5 @@
+// Shows texts in which anything may be: characters that a terminal would interpret, hide or reorder are escaped byte by
+// byte.  Linear in the text.
 #include "host/Text.hpp"
 
 #include <algorithm>

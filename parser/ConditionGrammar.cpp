@@ -1,3 +1,11 @@
+// The condition grammar: C-like text to syntax values.
+//
+// Method: recursive descent for operands, operator precedence for what joins them (Floyd, "Syntactic analysis and
+// operator precedence", 1963): operands and operators of one expression are folded as they are read, and operators that
+// wait bind tighter and tighter, so the number of strengths bounds their stack.  Alternatives differ in their first
+// token, so no text is read twice.
+// Cost: linear in the text; the depth of the stack is bounded by limits::nesting.
+// Relies on: the operator table for spellings and strengths.
 #include "parser/ConditionGrammar.hpp"
 
 #include "base/core/Check.hpp"
@@ -13,6 +21,8 @@
 
 #include <array>
 #include <bit>
+#include <type_traits>
+#include <utility>
 
 namespace VT::Parser {
 
@@ -26,7 +36,7 @@ using Place = const char*;
 using Range = boost::iterator_range<Place>;
 using Blanks = ascii::space_type;
 
-/// What one reading carries.  The grammar itself carries nothing from text to text and may be shared.
+/// The state of one reading.  The grammar itself keeps nothing from text to text and may be shared.
 struct Reading {
     SyntaxArena& arena;
     Place refused = nullptr; ///< the literal, bracket or prefix operator that ended the reading
@@ -37,7 +47,7 @@ struct Reading {
     }
 };
 
-/// An infix operator: its binding strength, of which a smaller number binds tighter, and what its operands become.
+/// An infix operator: its binding strength (a smaller number binds tighter) and the action that joins its operands.
 struct Infix {
     std::uint8_t precedence = 0;
     expression_ast (*combine)(SyntaxArena& arena, const expression_ast& left, const expression_ast& right) = nullptr;
@@ -54,12 +64,12 @@ constexpr InfixRow infix{
              return binary_expr<Op>()(arena, left, right);
          }}};
 
-/// The rows of the operators in grammarInfixOps, in the order of the operator table.
+/// The rows of the operators in conditionInfixOps, in the order of the operator table.
 constexpr auto infixOperators = [] {
-    std::array<InfixRow, static_cast<std::size_t>(grammarInfixOps.size())> rows{};
+    std::array<InfixRow, static_cast<std::size_t>(conditionInfixOps.size())> rows{};
     std::size_t next = 0;
 #define VTSYM_OPERATOR(Code, Name, ...)                                                                                \
-    if constexpr (grammarInfixOps.contains(SymbolicOp::Name))                                                          \
+    if constexpr (conditionInfixOps.contains(SymbolicOp::Name))                                                        \
         rows[next++] = infix<SymbolicOp::Name>;
 #include "base/core/operators.def"
 #undef VTSYM_OPERATOR
@@ -178,7 +188,7 @@ struct apply_prefixes {
     }
 };
 
-/// Notes the place of an error.  No other alternative could read what stands there, so the whole text fails too.
+/// Notes the place of an error.  No other alternative could read the text there, so the whole text fails too.
 struct refuse {
     template <class Context>
     void operator()(const Range& here, Context& context, bool& pass) const {
@@ -209,7 +219,7 @@ struct store_value {
     }
 };
 
-/// A number beyond the finite values is no real literal.
+/// A number beyond the finite values is not a real literal.
 struct store_real {
     template <class Context>
     void operator()(const Range& digits, Context& context, bool& pass) const {
@@ -223,7 +233,7 @@ struct store_real {
     }
 };
 
-/// Makes more of the value that was read before: of a name a call or a member.
+/// Extends the value that was read before: a name becomes a call or a member.
 template <class Action>
 struct extend_value {
     template <class Context>
@@ -252,7 +262,7 @@ struct append_element {
 /// One grammar for each combination of options.
 ///
 /// Operands are led by their first token, so that none is read twice: f(x), f(), a.b and a share the reading of the
-/// name. An infix operator without an operand behind it is given back; reading then stops before it.
+/// name.  An infix operator without an operand after it is given back; reading then stops before it.
 class ConditionGrammar {
 public:
     explicit ConditionGrammar(const GrammarOptions& options);

@@ -1,4 +1,5 @@
-// The condition grammar, hidden from everyone but the parser: its implementation is expensive to compile.
+// The condition grammar.  Only the parser includes this; the implementation, expensive to compile, is in one source
+// file.
 #pragma once
 
 #include "parser/SyntaxValue.hpp"
@@ -9,14 +10,15 @@
 
 namespace VT::Parser {
 
-/// Which texts are conditions.
+/// The variants of the language.
 struct GrammarOptions {
-    bool cOperators = true;       ///< ~ is the complement and ~= no operator
+    bool cOperators = true;       ///< ~ is the complement, and ~= is not an operator
     bool variantKeywords = false; ///< (sim) and (codegen) are operands
 };
 
+/// The result of reading a text.
 struct SyntaxResult {
-    std::optional<expression_ast> value; ///< nothing where the text is no complete expression
+    std::optional<expression_ast> value; ///< nothing where the text is not one complete expression
     std::size_t stop = 0;                ///< where reading stopped, in bytes from the start of the text
 };
 

@@ -1,3 +1,6 @@
+// Collects the reports of converters of Quill text as host diagnostics.
+//
+// Each report costs a copy of the text; a converter makes one for each text that it refuses.
 #include "parser/ErrorChecker.hpp"
 
 #include <utility>
@@ -6,7 +9,7 @@ namespace VT {
 
 namespace {
 
-/// What a node is called in a report.
+/// The name of a node in a report.
 std::string nameOf(const _Q_parse_tree_T<char>& node) {
     if (node.kind == _Q_parse_tree_T<char>::terminal)
         return {node.text, node.length};

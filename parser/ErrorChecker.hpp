@@ -1,4 +1,4 @@
-// Where the converters of Quill text leave what they refuse.
+// Receives the reports of the converters of Quill text.
 #pragma once
 
 #include "base/core/Node.hpp"
@@ -33,17 +33,16 @@ public:
 
     void disableDiagnostics() noexcept { skip_ = true; }
 
-    /// What was reported since the last clear().
+    /// The reports since the last clear().
     [[nodiscard]] const std::vector<HostDiagnostic>& diagnostics() const noexcept { return diagnostics_; }
 
     void clear() noexcept { diagnostics_.clear(); }
 
     /// The position of a token, or of the first token of a rule.
     [[nodiscard]] virtual std::size_t getNodeStartIdx(const ParseTree& node) const;
-    /// A converter begins with another text.
+    /// Called by a converter when it begins another text.
     virtual void startText();
-    /// The whole of the text that a report is about, where it is the one that a converter is at: a NUL in it ends
-    /// nothing.
+    /// Returns the whole text that a report is about.  A NUL does not end it while a converter works on that text.
     [[nodiscard]] std::string wholeText(const char* text) const;
 
     virtual void reportInvalidLiteralValue(const std::string& literal, const char* text, std::size_t position);
@@ -56,7 +55,7 @@ public:
     virtual void reportUnsupportedValue(const std::string& name, const char* text, std::size_t position);
     /// A diagnostic that a converter made itself: see symbolicDimsDiagnostic().
     virtual void reportDiagnostic(const HostDiagnostic& diagnostic);
-    /// Names the token, or what the host's parser calls the rule.
+    /// Names the token, or the rule as the host's parser calls it.
     virtual void reportUnhandledExpr(const ParseTree& node, const char* text);
     virtual void reportDivisionExpr(const ParseTree& node, const char* text);
     /// Names the callee of the node, which is a call.
@@ -75,7 +74,7 @@ private:
     void collectNamed(std::string_view key, std::string name, const char* text, std::size_t position);
 
     std::vector<HostDiagnostic> diagnostics_;
-    std::string_view text_; ///< that a converter is at
+    std::string_view text_; ///< of the conversion under way
     bool skip_ = false;
 };
 
@@ -90,7 +89,7 @@ public:
 VTSYM_API HostDiagnostic symbolicDimsDiagnostic(std::string_view key, std::vector<DiagnosticArgument> arguments,
                                                 std::size_t position, std::string additionalText = {});
 
-/// A reason of the host's parser as a sentence to follow another one; empty for none.
+/// The reason of a failure as a sentence to follow another one; empty without a reason.
 VTSYM_API std::string sentenceOf(const QuillFailure& failure);
 
 } // namespace VT

@@ -49,7 +49,7 @@ private:
         return static_cast<const SymbolicString*>(table_.get(id))->getName();
     }
 
-    /// The place of a name, or the free one where it would stand.
+    /// Returns the slot of a name, or the free one where it would go.
     [[nodiscard]] std::size_t probe(std::string_view name, std::uint32_t tag) const {
         std::size_t at = tag & (slots_.size() - 1);
         while (slots_[at].id != invalidId && (slots_[at].tag != tag || nameOf(slots_[at].id) != name))

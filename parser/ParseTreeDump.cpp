@@ -1,4 +1,9 @@
+// Writes a parse tree for people: one line for each node, depth first on an explicit stack.
+//
+// Linear in the tree: blanks that show the depth are bounded.
 #include "parser/ParseTreeDump.hpp"
+
+#include "base/core/Limits.hpp"
 
 #include <algorithm>
 #include <ostream>
@@ -12,9 +17,8 @@ namespace {
 using ParseTree = _Q_parse_tree_T<char>;
 
 void writeNode(std::ostream& out, const ParseTree& node, std::size_t depth) {
-    constexpr std::size_t deepestIndent = 40; // the text stays linear in the number of nodes
     const bool isTerminal = node.kind == ParseTree::terminal;
-    out << std::string(2 * std::min(depth, deepestIndent), ' ') << '(' << depth << ": "
+    out << std::string(2 * std::min(depth, limits::dumpIndent), ' ') << '(' << depth << ": "
         << (isTerminal ? vtuQParserTerminalName(node.code) : vtuQParserNonTerminalName(node.code))
         << ") Code = " << node.code;
     if (isTerminal)

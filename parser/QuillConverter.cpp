@@ -1,3 +1,10 @@
+// Converts parse trees of dimension expressions to nodes.
+//
+// Method: one walk over the tree with two stacks: nodes that wait for operands, and the operands.  A table maps the
+// code of a rule to its operands among the children and to a function that builds the node.  Every step goes through a
+// virtual visit, so that a host may override it; a visit returns `deferred` where the walk has to convert operands
+// first.  Calls that C has operators for are converted at the end (QuillConversion).
+// Cost: linear in the text.
 #include "parser/QuillConverter.hpp"
 
 #include "base/core/Check.hpp"
@@ -30,22 +37,22 @@ std::size_t countOf(const ParseTree& node) {
     return node.kind == ParseTree::nonTerminal ? static_cast<std::size_t>(std::max(node.childCount, 0)) : 0;
 }
 
-constexpr double leastInteger = std::numeric_limits<std::int32_t>::min();
+constexpr double int32Minimum = std::numeric_limits<std::int32_t>::min();
 
-/// Whether a node is a minus directly before the literal 2147483648.  They are one literal, for the number alone is no
+/// Whether a node is a minus directly before the literal 2147483648.  They are one literal: the number alone is not an
 /// integer of 32 bits.
 bool isMinusLeast(const ParseTree& node) {
     if (!isRule(node, QuillRule::UnaryMinus) && !isRule(node, QuillRule::UnaryMinus2))
         return false;
     if (countOf(node) < 2)
         return false;
-    constexpr std::size_t fewestDigits = 10; // in decimal and, with 0x, in hexadecimal
+    constexpr std::size_t digitsOfMinimum = 10; // in decimal and, with 0x, in hexadecimal
     const ParseTree& operand = SymbolicExprFromQParseTree::skipExprGoal(node.children[1]);
-    return isTerminal(operand, QuillToken::Number) && operand.length >= fewestDigits &&
-           quillNumber({operand.text, operand.length}).value == -leastInteger;
+    return isTerminal(operand, QuillToken::Number) && operand.length >= digitsOfMinimum &&
+           quillNumber({operand.text, operand.length}).value == -int32Minimum;
 }
 
-/// Whether a callee is more than a plain name, which may stand in parentheses.
+/// Whether a callee is more than a plain name, in parentheses or not.
 bool isFurtherCallee(const ParseTree& callee) {
     const ParseTree* inner = &SymbolicExprFromQParseTree::skipExprGoal(callee);
     while ((isRule(*inner, QuillRule::Parentheses) || isRule(*inner, QuillRule::Parentheses2)) && countOf(*inner) > 1)
@@ -62,7 +69,7 @@ bool isQuillCall(const SymbolicExpr* name) {
 
 } // namespace
 
-/// While a text is converted the checker knows all of it.
+/// Shows the checker the whole text while it is converted.
 class SymbolicExprFromQParseTree::TextInWork {
 public:
     TextInWork(SymbolicExprFromQParseTree& self, std::string_view text)
@@ -85,7 +92,7 @@ private:
     std::string_view outer_;
 };
 
-/// Leaves the stacks as they were, however the conversion ends, and gives the memory of a huge one back.
+/// Restores the stacks, however the conversion ends, and frees the memory of a huge one.
 class SymbolicExprFromQParseTree::Unwind {
 public:
     explicit Unwind(SymbolicExprFromQParseTree& self)
@@ -191,7 +198,7 @@ SymbolicExprId SymbolicExprFromQParseTree::convert(std::string_view text, const 
     } else {
         id = visitNode(*tree, text.data());
     }
-    // Nothing but a call of one of those functions is said differently in C.  One that an override made is not counted.
+    // Only calls of those functions differ in C.  Those that an override made are not counted.
     const bool mayHoldCalls = convertible_ != before || typeid(*this) != *request.ownClass;
     return id != invalidId && mayHoldCalls ? SymbolicExprQ2C(table_)(id) : id;
 }
@@ -207,7 +214,7 @@ SymbolicExprFromQParseTree::Parser& SymbolicExprFromQParseTree::parserFor(bool v
     return *parser;
 }
 
-// The walk: nodes that wait for operands stand on one stack, the operands on another.
+// The walk.
 
 SymbolicExprId SymbolicExprFromQParseTree::visitNode(const ParseTree& node, const char* text) {
     const Unwind unwind(*this);
@@ -228,7 +235,7 @@ SymbolicExprId SymbolicExprFromQParseTree::enter(const ParseTree& node, const ch
     return supportOperator(goal, text) ? visitNonTerminal(goal, text) : invalidId;
 }
 
-/// Completes the nodes above the first `frames` ones; `id` is what the visit of the topmost answered.
+/// Completes the nodes above the first `frames` ones; `id` is the result of the topmost visit.
 SymbolicExprId SymbolicExprFromQParseTree::finish(SymbolicExprId id, std::size_t frames, const char* text) {
     while (id != invalidId) {
         if (id != deferred) {
@@ -265,7 +272,7 @@ SymbolicExprId SymbolicExprFromQParseTree::afterOperands(const ParseTree& node, 
 
 SymbolicExprId SymbolicExprFromQParseTree::afterOperands(const ParseTree& node, const Rule& rule, const char* text) {
     if (isMinusLeast(node))
-        return getNumberFromValue(leastInteger, '-' + textOf(skipExprGoal(node.children[1])), text,
+        return getNumberFromValue(int32Minimum, '-' + textOf(skipExprGoal(node.children[1])), text,
                                   checker_.getNodeStartIdx(node), true);
     const std::size_t children = countOf(node);
     if (rule.count == allChildren)

@@ -23,11 +23,11 @@ namespace VT {
 /// Turns Quill text such as `N*2+1`, `[N, 3]` or `rem(N, 4)` into one interned expression in C shape, by way of the
 /// parse tree of the host's parser.
 ///
-/// Welcome are names, numbers, the operators + - * / && || ~ and the comparisons, fields, lists of one row, and calls
-/// of idivide, rem, bitand, bitor, bitxor, bitcmp and bitshift with their number of arguments.  Every literal is a real
+/// Accepts names, numbers, the operators + - * / && || ~ and the comparisons, fields, lists of one row, and calls of
+/// idivide, rem, bitand, bitor, bitxor, bitcmp and bitshift with their number of arguments.  Every literal is a real
 /// number, and a minus directly before 2147483648 belongs to it.  Names are given to the symbol validator.
 ///
-/// Anything else makes the invalid identifier and one report, which goes through a report operation to the error
+/// Anything else yields the invalid identifier and one report, which goes through a report operation to the error
 /// checker.  Nothing is thrown for bad text.  Exceptions of the host's parser, the validator, the checker and
 /// std::bad_alloc pass; the converter stays usable, and nodes of the text may stay interned.
 ///
@@ -35,12 +35,12 @@ namespace VT {
 /// used by one thread at a time.
 ///
 /// The order of the virtual functions is fixed: hosts call them by slot.  Every one of them may be overridden.  The
-/// visits answer an identifier, the invalid one after a report, or `deferred`.
+/// visits return an identifier, the invalid one after a report, or `deferred`.
 class VTSYM_API SymbolicExprFromQParseTree {
 public:
     using ParseTree = _Q_parse_tree_T<char>;
 
-    /// What a visit answers for a node whose children are converted next; the node follows them.  No table has it.
+    /// Returned by a visit of a node whose children are to be converted first.  Not the identifier of any node.
     static constexpr SymbolicExprId deferred = invalidId - 1;
 
     /// All of them outlive the converter.  Without a validator every name is a symbol.
@@ -66,14 +66,14 @@ public:
 
     // Slots 1 to 6.
 
-    /// Whether a number that is no 32-bit integer is refused.  It never is.
+    /// Whether a number that is not a 32-bit integer is refused.  False.
     [[nodiscard]] virtual bool supportIntegerOnly() const;
-    /// Whether an integral number of 32 bits is an integer literal.  It never is: every number is a real literal.
+    /// Whether an integral number of 32 bits becomes an integer literal.  False: every number is a real literal.
     [[nodiscard]] virtual bool shouldCreateIntValueNodeForIntegerValue() const;
-    /// Whether a truth value may stand for a number.  It may.
+    /// Whether a truth value may be used as a number.  True.
     [[nodiscard]] virtual bool supportLogicalValues() const;
-    /// Asked before any rule is converted; always agrees.  Who refuses, reports: with reportDivisionExpr(), for
-    /// instance.
+    /// Whether a rule may be converted; asked before each.  True.  An override that refuses a rule must report it, for
+    /// instance with reportDivisionExpr().
     virtual bool supportOperator(const ParseTree& node, const char* text);
     virtual ~SymbolicExprFromQParseTree();
     /// Lets the checker collect reports.
@@ -94,18 +94,18 @@ public:
 
     /// An identifier or a number; any other token is reported.
     virtual SymbolicExprId visitTerminal(const ParseTree& node, const char* text);
-    /// The identifier of the name of a called function; the invalid one, and no report, where the callee is no
+    /// The identifier of the name of a called function; the invalid one, and no report, where the callee is not an
     /// identifier.
     virtual SymbolicExprId getFunctionNameSymId(const ParseTree& node, const char* text);
-    /// What a name stands for: itself, its value, or nothing that a dimension could hold, which is reported.
+    /// Resolves a name: to itself or to its value.  A meaning that no dimension can have is reported.
     virtual SymbolicExprId resolveIdentifier(const std::string& name, const char* text, std::size_t position);
-    /// Whether a function may be called with so many arguments; reports where it may not.
+    /// Whether a function may be called with `numArgs` arguments; reports where it may not.
     virtual bool supportFcn(SymbolicExprId functionNameId, std::size_t numArgs, const ParseTree& node,
                             const char* text);
     /// A scalar becomes a literal, a row a list of dimensions; any other value of a name is reported.
     virtual SymbolicExprId getNumberFromQxArray(const QxArray& array, const std::string& name, const char* text,
                                                 std::size_t position);
-    /// Converts a rule; one that this class does not know is reported.
+    /// Converts a rule; a rule that this class does not support is reported.
     virtual SymbolicExprId visitNonTerminal(const ParseTree& node, const char* text);
 
     // Slots 21 to 25: further reports.
@@ -145,7 +145,7 @@ protected:
         std::uint32_t step = 1;
     };
 
-    /// What a rule is made of and what becomes of it.
+    /// The operands of a rule among its children, and the function that builds its node.
     struct Rule {
         QuillRule code;
         std::uint8_t first; ///< the first operand's place among the children
@@ -183,7 +183,7 @@ protected:
     SymbolicExprId afterOperands(const ParseTree& node, const Rule& rule, const char* text);
     /// Converts a call.
     ///
-    /// @param furtherCallees  whether other callees than names are welcome.  A name in parentheses is no callee.
+    /// @param furtherCallees  whether other callees than names are accepted.  A name in parentheses is never one.
     SymbolicExprId visitCallNode(const ParseTree& node, const char* text, bool furtherCallees);
 
     /// Calls `build` with its operands as arguments, for the table of rules.
@@ -205,7 +205,7 @@ protected:
         return self.factory_.make<Node>(std::vector<SymbolicExprId>(operands.begin(), operands.end()));
     }
 
-    /// Reports a node and answers the invalid identifier.
+    /// Reports a node and returns the invalid identifier.
     SymbolicExprId refuse(const ParseTree& node, const char* text);
 
     /// How a text is converted.
@@ -213,7 +213,7 @@ protected:
         bool variantKeywords = false; ///< (sim) and (codegen) are names
         bool listAtTop = false;       ///< a list that is the whole text is one of dimensions
         std::ostream* dump = nullptr; ///< receives the parse tree
-        /// The class that the library itself converts with.  One derived from it may answer nodes of its own.
+        /// The library's own class.  One derived from it may return nodes of its own.
         const std::type_info* ownClass = &typeid(SymbolicExprFromQParseTree);
     };
 
@@ -264,7 +264,7 @@ private:
     Parser& parserFor(bool variantKeywords);
     SymbolicExprId enter(const ParseTree& node, const char* text);
     SymbolicExprId finish(SymbolicExprId id, std::size_t frames, const char* text);
-    /// A call, whose callee stands before its arguments among the operands.
+    /// Converts a call, whose callee comes before its arguments among the operands.
     SymbolicExprId afterArguments(const ParseTree& node, SymbolicExprId name);
     SymbolicExprId dimensions(std::span<const SymbolicExprId> ids);
 
@@ -280,7 +280,7 @@ private:
     std::vector<std::pair<SymbolicExprId, std::size_t>> functions_; ///< the supported ones with their arguments
     std::vector<Frame> frames_;
     std::vector<SymbolicExprId> operands_;
-    std::uint64_t convertible_ = 0; ///< calls that C has operators for, counted when they are met
+    std::uint64_t convertible_ = 0; ///< calls met so far that C has operators for
     std::size_t earlierReports_ = 0;
     std::size_t reportedPosition_ = 0;
     QuillFailure failure_;

@@ -1,3 +1,5 @@
+// Converts parse trees of variant conditions: the base's walk with the rules of the whole language, and a cache of the
+// names that were resolved.  Linear in the text.
 #include "parser/QuillConverterBlockVariants.hpp"
 
 #include "base/core/Nodes.hpp"
@@ -52,7 +54,7 @@ SymbolicExprId SymbolicExprFromQParseTreeBlockVariants::operator()(const std::u1
     return answer(id, converted);
 }
 
-/// The identifier, or the exception that a refused text is.
+/// Returns the identifier, or throws for a text that was refused.
 SymbolicExprId SymbolicExprFromQParseTreeBlockVariants::answer(SymbolicExprId id, std::string_view text) {
     if (id != invalidId || skipDiagnostics())
         return id;
@@ -162,7 +164,7 @@ SymbolicExprId SymbolicExprFromQParseTreeBlockVariants::visitCellIndexNode(const
     return refuse(node.childCount > 1 ? node.children[1] : node, text);
 }
 
-/// The parameters become one name, `@(p,q)`, which the printer writes before the body.
+/// Converts a function: its parameters become one name, `@(p,q)`, which the printer writes before the body.
 SymbolicExprId SymbolicExprFromQParseTreeBlockVariants::visitAnonymousFunction(const ParseTree& node,
                                                                                const char* text) {
     if (node.childCount < 2 || !isRule(node.children[0], QuillRule::ParameterList))

@@ -11,18 +11,18 @@ namespace VT {
 
 /// Turns the Quill text of a condition into one interned expression in C shape.
 ///
-/// What is welcome beyond SymbolicExprFromQParseTree: every operator of the language, ranges, matrices, cell arrays,
-/// anonymous functions, and any function with any number of arguments, be it a name or any expression but a name in
-/// parentheses.  Indexing with braces, texts, imaginary numbers and function handles have no node.  An integral literal
-/// of 32 bits is an integer, with its minus -2147483648 too.  While the feature flag VariantKeywordsSimCodegen is above
-/// 0, (sim) and (codegen) are names.
+/// Accepts, beyond SymbolicExprFromQParseTree: every operator of the language, ranges, matrices, cell arrays, anonymous
+/// functions, and calls with any number of arguments of any callee but a name in parentheses.  Indexing with braces,
+/// texts, imaginary numbers and function handles have no node and are refused.  An integral literal
+/// of 32 bits is an integer, -2147483648 with its minus included.  While the feature flag VariantKeywordsSimCodegen is
+/// above 0, (sim) and (codegen) are names.
 ///
-/// Names stand for themselves, whatever the validator says of them; resolveIdentifier() asks it once for each name in a
+/// Names stand for themselves whatever their meaning; resolveIdentifier() asks the validator once for each name in a
 /// converter's life, so that the host sees them.
 ///
 /// A text that is refused leaves one report in the checker, and is thrown as the host diagnostic
 /// "Vantor:Variants:ExpressionParseError" with two arguments, the text and a line of blanks that points below it with
-/// ^, with the byte offset of the place and with the reason.  While the checker drops reports, such a text answers the
+/// ^, with the byte offset of the place and with the reason.  While the checker drops reports, such a text yields the
 /// invalid identifier instead.
 class VTSYM_API SymbolicExprFromQParseTreeBlockVariants : public SymbolicExprFromQParseTree {
 public:
@@ -43,7 +43,7 @@ public:
     /// A matrix of rows.
     SymbolicExprId visitMatrixNode(const ParseTree& node, const char* text) override;
 
-    /// Reports the brace: no node stands for indexing with braces.
+    /// Reports the brace: indexing with braces has no node.
     virtual SymbolicExprId visitCellIndexNode(const ParseTree& node, const char* text);
     /// A cell array of rows; one without elements has an empty row.
     virtual SymbolicExprId visitCellArrayNode(const ParseTree& node, const char* text);

@@ -1,3 +1,5 @@
+// Values of number tokens.  Short decimal integers, which are most of them, are computed directly and exactly; all
+// others go through <charconv>.  Linear in the token.
 #include "parser/QuillNumber.hpp"
 
 #include <algorithm>

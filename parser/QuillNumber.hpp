@@ -7,8 +7,8 @@
 
 namespace VT {
 
-/// The value of a number token: decimal as vtsv_strtod() reads it, or hexadecimal behind 0x, rounded to the nearest.
-/// Linear in its length.
+/// Returns the value of a number token: decimal as vtsv_strtod() reads it, or hexadecimal after 0x, rounded to the
+/// nearest.  Linear in its length.
 ParsedNumber quillNumber(std::string_view token);
 
 } // namespace VT

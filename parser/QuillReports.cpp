@@ -1,5 +1,6 @@
-// What the parse-tree converter of dimensions supports, and its reports: each goes to the checker's operation of the
-// same name.
+// Reports of the parse-tree converter of dimensions, and what it supports.
+//
+// Each report notes its position and goes to the checker's operation of the same name.
 #include "parser/QuillConverter.hpp"
 
 namespace VT {

@@ -1,4 +1,6 @@
-// The tokens of the parse-tree converter: names, what they stand for, and numbers.
+// The tokens of the parse-tree converter: names, the values that a validator knows for them, and numbers.
+//
+// Every refusal goes through one report operation.  Linear in the token, or in the elements of a name's value.
 #include "parser/QuillConverter.hpp"
 #include "parser/QuillNumber.hpp"
 

@@ -5,10 +5,11 @@
 
 namespace VT::Parser {
 
-/// Where a real literal ends: an optional sign, digits with a decimal point, digits on one side of it at least, and an
-/// exponent where digits follow the e.  Without a point there is none, nor are there names for infinity and NaN.
+/// The extent of a real literal: an optional sign, digits with a decimal point and digits on at least one side of it,
+/// and an exponent where digits follow the e.  A number without a point is not a real literal; infinity and NaN have no
+/// names.
 ///
-/// Digits are passed over, for sums of digits are not rounded right: the value is that of the characters.
+/// Digits are only passed over: adding them up would round wrongly, so the value is converted from the characters.
 template <class Value>
 struct strict_real_policies : boost::spirit::qi::strict_real_policies<Value> {
     template <class Place, class Digits>
@@ -43,7 +44,7 @@ struct strict_real_policies : boost::spirit::qi::strict_real_policies<Value> {
     }
 
 private:
-    /// Whether there were any.
+    /// Returns whether there were any.
     template <class Place>
     static bool skipDigits(Place& first, const Place& last) {
         const Place start = first;

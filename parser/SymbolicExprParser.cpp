@@ -1,3 +1,5 @@
+// Parses conditions: the grammar reads the whole text to a syntax value, which is then interned.  A text that is
+// refused interns nothing.  Linear in the text.
 #include "parser/SymbolicExprParser.hpp"
 
 #include "base/variants/VariantKeywords.hpp"

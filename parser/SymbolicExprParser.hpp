@@ -18,7 +18,7 @@ namespace VT {
 /// of an operand belongs to the literal: `-5` is a literal, `- 5` a negation.  Letters, digits and blanks are those of
 /// ASCII.
 ///
-/// A parser keeps nothing from text to text but the nodes in its table.
+/// A parser keeps nothing from text to text except the nodes in its table.
 class VTSYM_API SymbolicExprParser {
 public:
     /// Parses into `table`, which must outlive the parser.
@@ -31,12 +31,12 @@ public:
           cOperatorMode_(cOperatorMode),
           allowVariantKeywords_(allowVariantKeywords) {}
 
-    /// The identifier of the whole text's expression.
+    /// Parses a whole text and returns the identifier of its expression.
     ///
     /// Text that is not one complete expression is thrown as the host diagnostic "Vantor:Variants:ExpressionParseError"
     /// with two arguments, the text and a line of blanks that points below it with ^, and with the byte offset of the
-    /// place: where the rules stop, counted behind blanks, or the first digit of an integer literal beyond 32 bits, or
-    /// the bracket or prefix operator that is one more than limits::nesting.  Nothing is interned for such a text.
+    /// place: where the rules stop, after blanks, or the first digit of an integer literal beyond 32 bits, or
+    /// the bracket or prefix operator beyond limits::nesting.  Nothing is interned for such a text.
     ///
     /// Linear in the length of the text.  When memory runs out, std::bad_alloc passes and nodes of the text may stay
     /// interned.

@@ -1,28 +1,9 @@
-// What the condition grammar makes of an operator and its operands.
+// The semantic actions of the condition grammar: an operator and its operands become a syntax value.
 #pragma once
 
 #include "parser/SyntaxValue.hpp"
 
 namespace VT::Parser {
-
-/// The infix operators of the condition grammar.  Their spellings and strengths are those of the operator table.
-inline constexpr OperatorSet grammarInfixOps{SymbolicOp::Or,          SymbolicOp::And,
-                                             SymbolicOp::BitOr,       SymbolicOp::BitXOr,
-                                             SymbolicOp::BitAnd,      SymbolicOp::Equal,
-                                             SymbolicOp::NotEqual,    SymbolicOp::LessThanEqual,
-                                             SymbolicOp::LessThan,    SymbolicOp::GreaterThanEqual,
-                                             SymbolicOp::GreaterThan, SymbolicOp::ShiftRight,
-                                             SymbolicOp::ShiftLeft,   SymbolicOp::Plus,
-                                             SymbolicOp::Minus,       SymbolicOp::Multiply,
-                                             SymbolicOp::Divide,      SymbolicOp::Modulo};
-
-/// The infix operators that only Quill text has, whatever C spelling is printed for them.
-inline constexpr OperatorSet quillInfixOps{SymbolicOp::Power,     SymbolicOp::DotPower, SymbolicOp::DotMul,
-                                           SymbolicOp::DotDiv,    SymbolicOp::LDiv,     SymbolicOp::DotLDiv,
-                                           SymbolicOp::SingleAnd, SymbolicOp::SingleOr};
-
-static_assert((grammarInfixOps | quillInfixOps) == infixOps && (grammarInfixOps & quillInfixOps) == OperatorSet(),
-              "say of every infix operator whether the condition grammar reads it");
 
 /// Makes the syntax value of an operator with one operand.
 template <SymbolicOp Op>

@@ -1,5 +1,11 @@
+// Interns syntax values.
+//
+// Method: post-order with two stacks: tasks, and the identifiers of operands whose operator waits.  Right operands come
+// before left ones, because identifiers are handed out in the order of interning.
+// Cost: linear in the size of the value.
 #include "parser/SyntaxConverter.hpp"
 
+#include "base/core/Check.hpp"
 #include "base/core/Make.hpp"
 #include "base/core/Nodes.hpp"
 #include "parser/SyntaxActions.hpp"
@@ -17,7 +23,9 @@ namespace {
 /// Alternatives of a syntax value by index.
 enum Alternative : std::size_t { Empty, Integer, Real, Text, Nested, List, Binary, Unary };
 
-/// Converts bottom-up with two stacks: what is still to do, and the identifiers of operands whose operator waits.
+constexpr OperatorSet prefixOps{SymbolicOp::UnaryMinus, SymbolicOp::Not, SymbolicOp::BitCompl, SymbolicOp::FcnCall0U};
+
+/// Converts bottom-up with two stacks: tasks, and the identifiers of operands whose operator waits.
 class Converter {
 public:
     Converter(SymbolicExprTable& table, bool cOperators) : table_(table), cOperators_(cOperators) {}
@@ -32,6 +40,7 @@ public:
             else
                 visit(*task.value);
         }
+        VTSYM_CHECK(ids_.size() == 1);
         return ids_.back();
     }
 
@@ -41,7 +50,7 @@ private:
         bool operandsDone;
     };
 
-    /// Plans a conversion; what is planned last is done first.
+    /// Plans a conversion; the last one planned is done first.
     void plan(const expression_ast& value) { tasks_.push_back({&value, false}); }
 
     void planElements(const expression_list& list) {
@@ -51,7 +60,7 @@ private:
         std::reverse(tasks_.begin() + static_cast<std::ptrdiff_t>(first), tasks_.end());
     }
 
-    /// Converts a leaf; plans a compound value behind its operands.
+    /// Converts a leaf; plans a compound value after its operands.
     void visit(const expression_ast& value) {
         switch (value.index()) {
         case Integer:
@@ -111,17 +120,10 @@ private:
 
     SymbolicExprId build(const unary_op& node) {
         const SymbolicExprId operand = takeLast();
-        switch (node.op) {
-        case SymbolicOp::UnaryMinus:
-        case SymbolicOp::Not:
-            return makeUnary(table_, node.op, operand);
-        case SymbolicOp::BitCompl:
-            return makeUnary(table_, cOperators_ ? node.op : SymbolicOp::Not, operand);
-        case SymbolicOp::FcnCall0U:
-            return intern<SymbolicFcnCall0UExpr>(operand);
-        default:
+        if (!prefixOps.contains(node.op))
             return invalidId;
-        }
+        const bool isNot = node.op == SymbolicOp::BitCompl && !cOperators_;
+        return makeUnary(table_, isNot ? SymbolicOp::Not : node.op, operand);
     }
 
     SymbolicExprId build(const binary_op& node) {
@@ -131,11 +133,9 @@ private:
         const SymbolicExprId first = takeLast();
         if (node.op == SymbolicOp::MemberValue)
             return buildMember(first, last);
-        return buildInfix(node.op, last, first); // the right operand was converted first
-    }
-
-    SymbolicExprId buildInfix(SymbolicOp op, SymbolicExprId left, SymbolicExprId right) {
-        return grammarInfixOps.contains(op) ? makeBinary(table_, op, left, right) : invalidId;
+        if (!conditionInfixOps.contains(node.op))
+            return invalidId;
+        return makeBinary(table_, node.op, last, first); // the right operand was converted first
     }
 
     SymbolicExprId buildCall(const binary_op& node) {

@@ -1,4 +1,4 @@
-// From syntax values to nodes.
+// Interns syntax values as nodes.
 #pragma once
 
 #include "base/core/Table.hpp"
@@ -6,8 +6,8 @@
 
 namespace VT::Parser {
 
-/// Interns a syntax value and answers its identifier.  Operands are interned before their operator: the right one
-/// before the left one, elements of a list and arguments of a call in order behind the callee.  An empty value, and an
+/// Interns a syntax value and returns its identifier.  Operands are interned before their operator: the right one
+/// before the left one, elements of a list and arguments of a call in order after the callee.  An empty value, and an
 /// operator that no condition has, yield the invalid identifier.  ~ becomes the complement with C operators and the
 /// logical not without.
 ///

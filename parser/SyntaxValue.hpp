@@ -1,4 +1,4 @@
-// What the condition grammar reads a text as, before it becomes nodes.
+// Syntax values: the result of reading a condition, before it becomes nodes.
 #pragma once
 
 #include "base/core/Operators.hpp"
@@ -18,7 +18,7 @@ struct binary_op;
 struct unary_op;
 
 /// A syntax value.  Compound values refer to parts that their SyntaxArena owns and a text is a range of the parsed
-/// text, so a value is copied in constant time and destroyed without a look at what is below it, however deep that is.
+/// text, so a value is copied and destroyed in constant time, however deep it is.
 struct expression_ast : std::variant<std::monostate,         // nothing
                                      std::int32_t,           // integer literal
                                      double,                 // real literal
@@ -57,6 +57,25 @@ struct unary_op {
     expression_ast operand;
 };
 
+/// The infix operators of the condition grammar.  Their spellings and strengths are those of the operator table.
+inline constexpr OperatorSet conditionInfixOps{SymbolicOp::Or,          SymbolicOp::And,
+                                               SymbolicOp::BitOr,       SymbolicOp::BitXOr,
+                                               SymbolicOp::BitAnd,      SymbolicOp::Equal,
+                                               SymbolicOp::NotEqual,    SymbolicOp::LessThanEqual,
+                                               SymbolicOp::LessThan,    SymbolicOp::GreaterThanEqual,
+                                               SymbolicOp::GreaterThan, SymbolicOp::ShiftRight,
+                                               SymbolicOp::ShiftLeft,   SymbolicOp::Plus,
+                                               SymbolicOp::Minus,       SymbolicOp::Multiply,
+                                               SymbolicOp::Divide,      SymbolicOp::Modulo};
+
+/// The infix operators that only Quill text has, whatever C spelling is printed for them.
+inline constexpr OperatorSet quillInfixOps{SymbolicOp::Power,     SymbolicOp::DotPower, SymbolicOp::DotMul,
+                                           SymbolicOp::DotDiv,    SymbolicOp::LDiv,     SymbolicOp::DotLDiv,
+                                           SymbolicOp::SingleAnd, SymbolicOp::SingleOr};
+
+static_assert((conditionInfixOps | quillInfixOps) == infixOps && (conditionInfixOps & quillInfixOps) == OperatorSet(),
+              "say of every infix operator whether the condition grammar reads it");
+
 /// Owns the parts of syntax values and frees them together.
 class SyntaxArena {
 public:
@@ -68,7 +87,7 @@ public:
         return make<binary_op>(op, left, right);
     }
 
-    /// Appends an element to a list; nullptr stands for the list that has none yet.
+    /// Appends an element to a list; nullptr is the empty list.
     expression_list* append(expression_list* list, const expression_ast& element) {
         if (list == nullptr)
             list = make<expression_list>();

@@ -1,3 +1,8 @@
+// Reads and combines the variant conditions of blocks.
+//
+// Method: memos by block for own and net conditions; net conditions are built from the topmost ancestor that is not
+// known down to the block.
+// Cost: each condition is read once, each block combined once.
 #include "base/choices/BlockConditions.hpp"
 
 #include "base/core/Table.hpp"
@@ -77,7 +82,7 @@ VCSymbolicExprId BlockConditions::of(const vtPort& port) {
     return service_.AND(from, to, false);
 }
 
-// The same, asked once.
+// The service's operations, each with memos of its own.
 
 VCSymbolicExprId VCService::getQExprNetAAVCEIdx(const VTBlock* block, bool simplify, const VCCustomizer* customizer) {
     return block == nullptr ? VCSymbolicExprId()

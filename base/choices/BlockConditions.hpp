@@ -1,4 +1,4 @@
-// The conditions of the host's blocks and ports.
+// The combined conditions of the host's blocks and ports.
 #pragma once
 
 #include "base/service/VCSymbolicExprId.hpp"
@@ -11,22 +11,21 @@ namespace VT {
 class VCCustomizer;
 class VCService;
 
-/// Reads and combines the variant conditions of blocks, each once: a model with n blocks costs n conditions.  To be
-/// thrown away when the model changes.  The service outlives it.
+/// Reads and combines the variant conditions of blocks, each once: a model with n blocks costs n conditions.  Make a
+/// new object when the model changes.  The service outlives it.
 ///
-/// Reading a condition may be refused by the host diagnostics of its language.  What was read stays.
+/// A condition that cannot be read throws the host diagnostics of its language.  Conditions read before stay.
 class VTSYM_API BlockConditions {
 public:
-    /// `customizer` says what the parameters of a block's condition stand for; nullptr for themselves.  It outlives the
-    /// object.
+    /// `customizer` replaces the parameters of a block's condition; with nullptr they stay.  It outlives the object.
     explicit BlockConditions(VCService& service, const VCCustomizer* customizer = nullptr)
         : service_(service),
           customizer_(customizer) {}
 
-    /// Whether a block is the choice for where no other one is active.
+    /// Whether a block is the default choice, active where no other one is.
     static bool isDefault(const VTBlock& block);
-    /// The condition of a block itself.  "(inherit)" and no text at all are TRUE; "(default)" is that none of the
-    /// other choices' conditions holds, but for those that are "(default)" as well.
+    /// The condition of a block itself.  "(inherit)" and the empty text are TRUE; "(default)" holds where none of
+    /// the other choices' conditions does, those that are "(default)" as well left out.
     VCSymbolicExprId own(const VTBlock& block);
     /// Whether a block is active: its own condition and those of all its ancestors, And from the top down.
     VCSymbolicExprId net(const VTBlock& block);

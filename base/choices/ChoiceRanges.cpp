@@ -1,3 +1,10 @@
+// Ranges that conditions confine names to.
+//
+// Method: an Or of Ands of comparisons of a name with an integer.  Ranges of an And are intersected; those of an Or are
+// joined to the smallest range that holds both, for names that both confine.  Other operands are left out, which only
+// makes ranges wider.
+// Cost: linear in the operands, of which at most limits::rangeOperands are looked at; comparing two conditions is
+// linear in their names.
 #include "base/choices/ChoiceRanges.hpp"
 
 #include "base/core/Chains.hpp"
@@ -20,7 +27,7 @@ namespace {
 constexpr std::int64_t lowest = std::numeric_limits<std::int64_t>::min();
 constexpr std::int64_t highest = std::numeric_limits<std::int64_t>::max();
 
-/// A name that stands for an integer and nothing else.
+/// Whether an expression is a name of an integer: not a truth constant, not a variant keyword.
 bool isName(const SymbolicExprTable& table, SymbolicExprId id) {
     const SymbolicExpr* const node = table.get(id);
     if (node == nullptr || node->op() != SymbolicOp::String || id == table.getIdTRUE() || id == table.getIdFALSE())
@@ -63,7 +70,7 @@ std::optional<NameRange> rangeOf(const SymbolicExprTable& table, SymbolicExprId 
     }
 }
 
-/// The operands of a chain of one operator, as many as are looked at; nothing where there are more.
+/// Returns the operands of a chain of one operator; nothing where there are more than are looked at.
 std::vector<SymbolicExprId> operandsOf(const SymbolicExprTable& table, SymbolicExprId chain, SymbolicOp op) {
     std::vector<SymbolicExprId> operands;
     const bool complete = walkChain(

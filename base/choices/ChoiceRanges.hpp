@@ -1,5 +1,5 @@
-// Ranges that conditions confine names to: a look at a condition that often tells without a decision that it holds
-// nowhere where another one does.
+// Ranges that conditions confine names to.  They often show, without a decision, that two conditions never hold
+// together.
 #pragma once
 
 #include "base/core/Table.hpp"
@@ -19,8 +19,8 @@ struct NameRange {
 /// Names and the ranges outside of which a condition does not hold; in the order of identifiers.
 using NameRanges = std::vector<NameRange>;
 
-/// The ranges that the comparisons of names with integers give in a condition that is an And, or an Or of Ands.  Looks
-/// at a few dozen operands; what it leaves out makes the ranges wider.
+/// Returns the ranges from the comparisons of names with integers in a condition that is an And, or an Or of Ands.
+/// Looks at limits::rangeOperands operands; those left out make the ranges wider.
 NameRanges rangesOf(const SymbolicExprTable& table, SymbolicExprId condition);
 
 /// Ranges that hold wherever one of two conditions does.

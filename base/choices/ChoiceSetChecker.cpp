@@ -1,5 +1,11 @@
-// Sets are asked about by halves.  The diagrams of both halves stay with the decider, so the next larger half costs
-// what it adds.  The price is one node interned for each choice and for each half.
+// Checks choice sets against exact decisions.
+//
+// Method: the choices, sorted by their ranges, are joined in halves of halves.  Where no choice of one half overlaps
+// one of the other, one decision settles all pairs; otherwise the larger half is split.  The diagrams of both halves
+// stay with the decider, so the next larger half costs only the difference.
+// Cost: one node interned for each choice and each half; some n log n steps without overlaps, and a few decisions more
+// for each level and each overlap.  limits::choiceSteps bounds all sets together.
+// Relies on: Decider for proofs, ChoiceRanges to skip decisions.
 #include "base/choices/ChoiceSetChecker.hpp"
 
 #include "base/choices/ChoiceRanges.hpp"
@@ -50,8 +56,8 @@ struct ChoiceSetChecker::State {
     SymbolicExprId shorten(SymbolicExprId parent, SymbolicExprId condition);
     std::vector<Run> halve(std::span<const SymbolicExprId> holds);
     void findOverlaps(const std::vector<Run>& runs, std::span<const SymbolicExprId> holds, ChoiceSetReport& report);
-    void tellOverlap(std::size_t first, std::size_t second, Decision decision, std::span<const SymbolicExprId> holds,
-                     ChoiceSetReport& report);
+    void reportOverlap(std::size_t first, std::size_t second, Decision decision, std::span<const SymbolicExprId> holds,
+                       ChoiceSetReport& report);
 
     VCService& service;
     SymbolicExprTable& table;
@@ -99,7 +105,7 @@ Decision ChoiceSetChecker::canHold(SymbolicExprId condition) {
     return state_->ask(&Decider::canHold, state_->toC(condition));
 }
 
-/// Operands that && || ! leave, counted up to one beyond the bound.
+/// Counts the operands below && || !, up to one beyond the bound.
 std::size_t ChoiceSetChecker::State::operandsOf(SymbolicExprId condition) const {
     static constexpr OperatorSet logicalOps{SymbolicOp::And, SymbolicOp::Or, SymbolicOp::Not};
     std::size_t count = 0;
@@ -113,7 +119,7 @@ std::size_t ChoiceSetChecker::State::operandsOf(SymbolicExprId condition) const 
     return complete ? count : limits::choiceOperands + 1;
 }
 
-/// The condition without operands that its parent's makes redundant; itself where there are none.
+/// Drops operands that the parent's condition makes redundant; returns the condition itself without such.
 SymbolicExprId ChoiceSetChecker::State::shorten(SymbolicExprId parent, SymbolicExprId condition) {
     const std::size_t operands = operandsOf(condition);
     if (operands < 2 || operands > limits::choiceOperands)
@@ -207,8 +213,8 @@ std::vector<ChoiceSetChecker::State::Run> ChoiceSetChecker::State::halve(std::sp
     return runs;
 }
 
-void ChoiceSetChecker::State::tellOverlap(std::size_t first, std::size_t second, Decision decision,
-                                          std::span<const SymbolicExprId> holds, ChoiceSetReport& report) {
+void ChoiceSetChecker::State::reportOverlap(std::size_t first, std::size_t second, Decision decision,
+                                            std::span<const SymbolicExprId> holds, ChoiceSetReport& report) {
     ChoiceFinding finding{
         .fault = ChoiceFault::Overlap, .choice = std::min(first, second), .other = std::max(first, second)};
     if (decision.isUndecided()) {
@@ -223,7 +229,7 @@ void ChoiceSetChecker::State::tellOverlap(std::size_t first, std::size_t second,
 
 void ChoiceSetChecker::State::findOverlaps(const std::vector<Run>& runs, std::span<const SymbolicExprId> holds,
                                            ChoiceSetReport& report) {
-    std::size_t told = 0;
+    std::size_t reported = 0;
     std::vector<std::pair<std::size_t, std::size_t>> open;
     // Small runs come first, so that larger ones are decided from theirs.
     for (const Run& run : runs) {
@@ -237,13 +243,13 @@ void ChoiceSetChecker::State::findOverlaps(const std::vector<Run>& runs, std::sp
             Decision both = ask(&Decider::overlaps, runs[a].holds, runs[b].holds);
             if (both.isNo())
                 continue;
-            if (told == options.overlaps || stepsLeft == 0) {
+            if (reported == options.overlaps || stepsLeft == 0) {
                 report.allOverlaps = false;
                 return;
             }
             if (runs[a].isSingle() && runs[b].isSingle()) {
-                tellOverlap(runs[a].left, runs[b].left, std::move(both), holds, report);
-                ++told;
+                reportOverlap(runs[a].left, runs[b].left, std::move(both), holds, report);
+                ++reported;
                 continue;
             }
             const bool splitsFirst = runs[a].count >= runs[b].count;
@@ -254,8 +260,8 @@ void ChoiceSetChecker::State::findOverlaps(const std::vector<Run>& runs, std::sp
     }
 }
 
-/// Where the parent is active and no choice is.  The price of an exact answer grows with the names in the conditions;
-/// when it is too high, values beyond all ranges may still show that there is a gap.
+/// Decides whether the parent can be active and no choice.  The cost of an exact answer grows with the names in the
+/// conditions; when it is too high, values beyond all ranges may still prove a gap.
 Decision ChoiceSetChecker::State::findGap(SymbolicExprId parent, const std::vector<Run>& runs) {
     const Run& all = runs.back();
     Decision gap = ask(&Decider::implies, parent, all.holds).opposite();

@@ -1,4 +1,4 @@
-// Whether the choices of a block fit together.
+// Checks whether the choices of a block fit together: none dead, none doubled, none missing.
 #pragma once
 
 #include "base/core/Limits.hpp"
@@ -13,21 +13,23 @@ namespace VT {
 
 class VCService;
 
+/// Options of a checker, for all of its sets.
 struct ChoiceSetOptions {
     bool bits32 = false;                           ///< unknowns are signed 32-bit integers
     std::uint64_t steps = limits::choiceSteps;     ///< that all sets may cost together
-    std::size_t overlaps = limits::choiceOverlaps; ///< that are told of one set
+    std::size_t overlaps = limits::choiceOverlaps; ///< that are reported of one set
 };
 
+/// What can be wrong with a choice set.
 enum class ChoiceFault : std::uint8_t {
     Dead,         ///< a choice is never active where its parent is
     AlwaysActive, ///< it is active wherever its parent is
     Redundant,    ///< its condition has an operand that can go, given the parent's
     Overlap,      ///< two choices are active at once
-    Missing,      ///< none is
+    Missing,      ///< no choice is active somewhere
 };
 
-/// What is wrong with a set, or could not be decided about it.
+/// A fault of a set, or one that could not be decided.
 struct ChoiceFinding {
     ChoiceFault fault;
     std::size_t choice = 0;                    ///< position
@@ -36,19 +38,20 @@ struct ChoiceFinding {
     bool firstCovered = false;                 ///< of an overlap: the first is active only where the second is
     bool secondCovered = false;                ///< and the other way round
     SymbolicExprId proposed = invalidId;       ///< of a redundant operand: the condition without it
-    DecisionBound bound = DecisionBound::None; ///< that left it undecided
+    DecisionBound bound = DecisionBound::None; ///< the bound that left it undecided
 };
 
+/// The findings about one set.
 struct ChoiceSetReport {
-    bool parentNeverHolds = false;       ///< nothing else was asked then
-    std::vector<ChoiceFinding> findings; ///< by choice, then fault; overlaps and what is missing behind all
+    bool parentNeverHolds = false;       ///< nothing else was checked then
+    std::vector<ChoiceFinding> findings; ///< by choice, then fault; overlaps and a gap come last
     std::vector<ChoiceFinding> undecided;
-    bool allOverlaps = true; ///< whether the overlaps found are all; false beyond the bound
+    bool allOverlaps = true; ///< false where there may be more overlaps, beyond the bound
 };
 
-/// Checks choice sets against exact decisions: not one finding is a guess.
+/// Checks choice sets against exact decisions: every finding is proven.
 ///
-/// Ranges of names tell most choices apart without a decision.  Other overlaps are looked for by halves: where no
+/// Ranges of names separate most choices without a decision.  Other overlaps are looked for by halves: where no
 /// choice of one half overlaps one of the other, one decision settles all pairs.  So a set of n choices without
 /// overlaps takes some n log n steps, and each overlap found a few decisions more for each level of halves.  Steps are
 /// counted over all sets; when they are used up everything further is undecided.

@@ -13,9 +13,9 @@
 
 namespace VT {
 
-/// What stands before a node: all that a probe wants to know lies in one cache line.
+/// The header of a node: all that a probe wants to know lies in one cache line.
 struct NodeCell {
-    /// The code of a node that was added from outside and may be of any class: a pointer to it stands in its place.
+    /// The code of a node that was added from outside and may be of any class: the cell holds a pointer to it.
     static constexpr std::uint32_t foreign = ~std::uint32_t{0};
 
     std::uint32_t id;   ///< cells run out before these numbers do
@@ -24,19 +24,19 @@ struct NodeCell {
     [[nodiscard]] bool isOf(SymbolicOp op) const noexcept { return code == static_cast<std::uint32_t>(op); }
 
     [[nodiscard]] const SymbolicExpr* node() const noexcept {
-        const void* behind = this + 1;
-        return code == foreign ? *static_cast<const SymbolicExpr* const*>(behind)
-                               : static_cast<const SymbolicExpr*>(behind);
+        const void* content = this + 1;
+        return code == foreign ? *static_cast<const SymbolicExpr* const*>(content)
+                               : static_cast<const SymbolicExpr*>(content);
     }
 };
 
-/// Hands out cells from chunks that it frees together; what stands in them is its user's to destroy.  Never moves them.
+/// Hands out cells from chunks that it frees together; the user destroys what is in them.  Never moves them.
 class CellStore {
 public:
-    /// Names a cell; 0 names none.
+    /// Names a cell; 0 is not a cell.
     using Number = std::uint32_t;
 
-    /// Room for a cell and so many bytes behind it, for an object no more aligned than a pointer.  Throws
+    /// Returns room for a cell followed by `bytes` bytes, for an object no more aligned than a pointer.  Throws
     /// std::bad_alloc, or std::length_error when the numbers run out at 128 GiB.
     Number allocate(std::size_t bytes) {
         const std::size_t units = (sizeof(NodeCell) + bytes + unit - 1) / unit;
@@ -59,7 +59,7 @@ private:
     static constexpr std::align_val_t lineSize{64}; // so that the cell of a binary node lies in one cache line
     static constexpr unsigned chunkBits = 20;
     static constexpr std::uint32_t chunkMask = (std::uint32_t{1} << chunkBits) - 1;
-    static constexpr std::size_t mostChunks = std::size_t{1} << (32 - chunkBits);
+    static constexpr std::size_t chunkCount = std::size_t{1} << (32 - chunkBits);
     static constexpr std::size_t firstUnits = 128;
     static constexpr std::size_t doublings = 13; // until a chunk is as large as its numbers allow
     static constexpr std::size_t reserved = 1;   // keeps number 0 free
@@ -69,7 +69,7 @@ private:
     };
 
     void grow() {
-        if (chunks_.size() == mostChunks)
+        if (chunks_.size() == chunkCount)
             throw std::length_error("expression table: no room for another node");
         const std::size_t units = firstUnits << std::min(chunks_.size(), doublings);
         const std::size_t first = chunks_.size() << chunkBits;
@@ -81,7 +81,7 @@ private:
     }
 
     std::vector<std::unique_ptr<std::byte, Free>> chunks_;
-    std::size_t next_ = 0; // wider than a number, because the end of the last chunk is none
+    std::size_t next_ = 0; // wider than a number: the end of the last chunk has none
     std::size_t end_ = 0;
 };
 

@@ -1,4 +1,4 @@
-// Every bound of the library: its unit, why it is there and what happens at it.
+// Every bound of the library: its unit, its reason and its consequence.
 #pragma once
 
 #include <cstddef>
@@ -18,7 +18,7 @@ inline constexpr std::uint64_t chainOperands = 1000;
 /// second; real conditions take up to a hundred.  Beyond the bound the call gives up and returns what it was given.
 inline constexpr std::size_t multipliedLiterals = 50'000;
 
-/// Literals that the search for redundant parts of one sum of products looks at: so many, and so many more for each
+/// Literals that the search for redundant parts of one sum of products looks at: a fixed number, and a number for each
 /// literal of the sum.  Beyond the bound the sum stays as it is.
 inline constexpr std::size_t coverSteps = 50'000;
 inline constexpr std::size_t coverStepsPerLiteral = 64;
@@ -30,7 +30,7 @@ inline constexpr std::size_t coverDepth = 200;
 /// a parse error at that place.
 inline constexpr std::size_t nesting = 256;
 
-/// Visits of one rebuilding run whose results serve one occurrence of their node only: where a host's table leads in
+/// Visits of one rebuilding run whose results serve only one occurrence of their node: where a host's table leads in
 /// circles, or a host's visitor does not leave one result for a node.  Beyond the bound the first result of a node
 /// serves for all of its occurrences.
 inline constexpr std::size_t repeatedVisits = std::size_t{1} << 20U;
@@ -39,9 +39,17 @@ inline constexpr std::size_t repeatedVisits = std::size_t{1} << 20U;
 /// bound printing throws std::length_error.
 inline constexpr std::size_t textBytes = std::size_t{1} << 30U;
 
-/// Bytes of two operands' texts that the simplifier compares when it sorts them; operands that agree in so many are
-/// ordered by their structure.
+/// Bytes of two operands' texts that the simplifier compares when it sorts them; operands that agree in all of them
+/// are ordered by their structure.
 inline constexpr std::size_t orderedTextBytes = std::size_t{1} << 16U;
+
+/// Texts that a printer keeps from one print, in records of 48 bytes.  A print that made more frees them, which costs
+/// less than printing did.
+inline constexpr std::size_t keptTexts = std::size_t{1} << 16U;
+
+/// Bytes of an expression's text in an error of evaluation: more than a message shows.  A longer text is replaced by
+/// the name of its operator.
+inline constexpr std::size_t namedBytes = 4096;
 
 /// In evaluation a real divisor below it counts as zero, and real values that differ by less are equal: the square root
 /// of the machine epsilon.
@@ -72,7 +80,7 @@ inline constexpr std::size_t termCases = 64;
 inline constexpr std::size_t confirmations = 8192;
 
 /// Steps that all proofs for one shorter condition may cost together: about an eighth of a second.  Beyond the bound
-/// the shortest form found so far stands.
+/// the shortest form found so far is the result.
 inline constexpr std::uint64_t shortenSteps = std::uint64_t{1} << 20U;
 
 /// Comparisons of a condition, each occurrence counted, up to which a shorter form is looked for.  A longer one keeps
@@ -89,7 +97,7 @@ inline constexpr std::size_t shortenProducts = 128;
 inline constexpr std::size_t shortenCoverSteps = 4000;
 
 /// Rounds of taking out common operands, and of that together with judging constraints by those around them.  Real
-/// conditions take two or three; the latest form stands.
+/// conditions take two or three; the latest form is the result.
 inline constexpr std::size_t factorRounds = 32;
 inline constexpr std::size_t shortenRounds = 4;
 
@@ -100,7 +108,7 @@ inline constexpr std::size_t writtenIntervals = 64;
 inline constexpr std::size_t shortenByProofs = 64;
 
 /// Changes tried, each with a proof, and nodes interned on the way, to take operands from one condition.  Beyond either
-/// bound the shortest form found so far stands.
+/// bound the shortest form found so far is the result.
 inline constexpr std::size_t impliedTries = 1000;
 inline constexpr std::size_t impliedNodes = std::size_t{1} << 16U;
 
@@ -113,7 +121,7 @@ inline constexpr std::size_t impliedLiterals = 12;
 /// is left is undecided.
 inline constexpr std::uint64_t choiceSteps = std::uint64_t{1} << 28U;
 
-/// Overlapping pairs that are told of one choice set; n choices have up to n^2/2.  Beyond the bound there are more.
+/// Overlapping pairs that are reported of one choice set; n choices have up to n^2/2.  Beyond the bound there are more.
 inline constexpr std::size_t choiceOverlaps = 1000;
 
 /// Products of a choice's condition, and comparisons of each, that the ranges of its names are read from.  A larger
@@ -123,7 +131,7 @@ inline constexpr std::size_t rangeOperands = 64;
 /// Operands of a choice's condition up to which a redundant one is looked for.
 inline constexpr std::size_t choiceOperands = 64;
 
-/// Steps that decisions about the conditions of one source file may cost: so many for a file, and so many more for each
+/// Steps that decisions about the conditions of one source file may cost: a number for each file, and one for each
 /// condition as it is read.  Real conditions take some hundred, those of long chains over one macro some thousand.
 /// While they are used up, a condition is not decided, which is counted.
 inline constexpr std::uint64_t scanSteps = std::uint64_t{1} << 22U;
@@ -138,12 +146,12 @@ inline constexpr std::uint64_t branchDecisionSteps = std::uint64_t{1} << 16U;
 inline constexpr std::size_t scanNodes = std::size_t{1} << 20U;
 
 /// Facts of branches around a condition that it is compared with: between one and two windows of those about one macro,
-/// and of all together what weighs so much, a fact about several macros as much as several.  Further ones are left out.
+/// and of all together a total weight, a fact about several macros as much as several.  Further ones are left out.
 inline constexpr std::size_t factWindow = 128;
 inline constexpr std::size_t factWeight = 256;
 inline constexpr std::size_t compoundFactWeight = 8;
 
-/// Tokens of a directive's condition that is looked into, and how often each of them may be written into the texts of
+/// Tokens of a directive's condition that is read, and how often each of them may be written into the texts of
 /// unknowns (comparisons within comparisons repeat their operands).  Beyond either bound the condition is an unknown.
 inline constexpr std::size_t conditionTokens = 4096;
 inline constexpr std::size_t conditionTexts = 16;
@@ -155,6 +163,13 @@ inline constexpr std::size_t macroNamesFollowed = 1024;
 
 /// Raw strings without an end in one file that are searched to the end of the file.  Further ones are ordinary strings.
 inline constexpr unsigned endlessRawStrings = 8;
+
+/// Characters of an identifier that the symbol registry makes for generated code: what C99 compilers tell apart.  Longer
+/// ones are cut and numbered.
+inline constexpr std::size_t identifierLength = 63;
+
+/// Levels of indentation in a dumped parse tree.  Deeper lines begin there, so that the text stays linear in the nodes.
+inline constexpr std::size_t dumpIndent = 40;
 
 /// Bytes of a directive that a finding quotes as a reason; what is longer is cut.
 inline constexpr std::size_t quotedBytes = 4096;

@@ -1,3 +1,8 @@
+// Makes nodes of operators that are known at run time only.
+//
+// Method: for each number of operands, an array of constructors by operator code, filled at compile time from
+// operators.def.  A class of another shape has no entry, which yields the invalid identifier.
+// Cost: one indirect call more than the constructor itself.
 #include "base/core/Make.hpp"
 
 #include "base/core/Nodes.hpp"

@@ -1,4 +1,4 @@
-// The immutable expression node: what every node class answers.
+// The immutable expression node: the interface of every node class.
 #pragma once
 
 #include "base/core/Operators.hpp"
@@ -47,17 +47,17 @@ public:
     [[nodiscard]] virtual bool isBinaryExpr() const;
     [[nodiscard]] virtual bool isTernaryExpr() const;
     [[nodiscard]] virtual bool isMultiExpr() const;
-    /// Whether the node is a call of a class with a fixed number of arguments; the generic call class answers false.
+    /// Whether the node is a call of a class with a fixed number of arguments; false for the generic call class.
     [[nodiscard]] virtual bool isFcnCallExpr() const;
     /// The value of a literal number; 2^64 for every other node.
     [[nodiscard]] virtual double getNumValue() const;
     /// The operand at a position below getNumInputs().  A position out of range is a fatal diagnostic; the unary and
-    /// the many-operand classes check it only while the host's assertion switch is on and otherwise answer the only
+    /// the many-operand classes check it only while the host's assertion switch is on and otherwise return the only
     /// operand, or the invalid identifier.
     [[nodiscard]] virtual SymbolicExprId getInput(std::size_t aIdx) const;
     /// Number of entries of a dimension list, 0 for other nodes.
     [[nodiscard]] virtual std::size_t getNumDimensions() const;
-    /// Number of arguments of a call, of operands behind the head of a cell array; 0 for other nodes.
+    /// Number of arguments of a call, of operands after the head of a cell array; 0 for other nodes.
     [[nodiscard]] virtual std::size_t getNumArgs() const;
     /// Visits every occurrence of a node below and including this one: operands first, or the node first where the
     /// visitor's isBottomUpVistor() says so.  A shared operand is visited once for every path to it, one that is

@@ -1,4 +1,7 @@
-// Hash, equality and operand access of the shapes; dispatch of the node classes.
+// The node classes: hash, equality and operand access by shape, dispatch by class.
+//
+// The bodies of accept() and invoke() are expanded from operators.def here, so that every table of virtual functions
+// has one home.  Hash and equality are linear in the operands and O(1) but for the classes with any number of them.
 #include "base/core/Nodes.hpp"
 
 #include "base/core/Walk.hpp"
@@ -14,7 +17,7 @@
 
 namespace VT {
 
-// What a node answers unless its shape knows better.
+// Defaults, which shapes override.
 
 std::size_t SymbolicExpr::getNumInputs() const {
     return 0;

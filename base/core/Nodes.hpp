@@ -2,9 +2,9 @@
 //
 //     const SymbolicExprId sum = SymbolicPlusExpr(table, a, SymbolicIntValue(table, 1)).getId(table);
 //
-// A constructor interns a copy unless the table holds an equal node; getId() then tells the identifier.  The object
-// itself is a temporary.  Every operand is given as an identifier or as a node that the table holds.  When memory runs
-// out, the table is as before and std::bad_alloc passes.
+// A constructor interns a copy unless the table holds an equal node; getId() then returns the identifier.  The object
+// itself is a temporary.  Every operand is an identifier or a node that the table holds.  When memory runs out, the
+// table is as before and std::bad_alloc passes.
 #pragma once
 
 #include "base/core/Shapes.hpp"
@@ -76,7 +76,7 @@ public:
 
     [[nodiscard]] std::uint64_t getHash() const final { return Payload::hashOf(Op); }
 
-    /// The same answer as the base's, without a probe right behind the construction.
+    /// Returns what the base's getId() returns, without a probe right after the construction.
     [[nodiscard]] SymbolicExprId getId(const SymbolicExprTable& table) const {
         return table.template idOf<Node>(static_cast<const Payload&>(*this));
     }
@@ -93,7 +93,7 @@ protected:
     explicit InternedNode(const Payload& payload) : Payload(payload) {}
 };
 
-/// Input 0 behind which the others follow.
+/// Returns input 0 followed by the others.
 VTSYM_API std::vector<SymbolicExprId> headed(SymbolicExprId head, const std::vector<SymbolicExprId>& rest);
 
 // One constructor for each shape of the operator table.

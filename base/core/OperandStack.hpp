@@ -1,4 +1,5 @@
-// The stack of a visitor that rebuilds, which the walkers know: a visit operation is told its node and nothing else.
+// The stack of a visitor that rebuilds.  A visit operation receives its node and nothing else, so operands that were
+// rebuilt, and the identifier under which the node is visited, reach it through this base, which the walkers know.
 #pragma once
 
 #include "base/core/Table.hpp"
@@ -41,12 +42,12 @@ protected:
         return id;
     }
 
-    /// The last result; the invalid identifier where there is none.
+    /// The last result; the invalid identifier for an empty stack.
     [[nodiscard]] SymbolicExprId top() const noexcept { return stack_.empty() ? invalidId : stack_.back(); }
 
     [[nodiscard]] std::size_t depth() const noexcept { return stack_.size(); }
 
-    /// Whether `visit`, a visit of a node with so many operands, takes these, nothing below them, and leaves one
+    /// Whether `visit`, a visit of a node with `operands` operands, takes these, nothing below them, and leaves one
     /// result.
     template <class Visit>
     bool keepsDiscipline(std::size_t operands, Visit visit) {

@@ -49,7 +49,7 @@ struct OperatorInfo {
     OperatorForm form;
     SymbolicOp negated;  ///< comparison that holds exactly where this one does not, or None
     SymbolicOp mirrored; ///< comparison that holds for swapped operands, or None
-    int onEqual;         ///< value of a comparison of equal operands (0 or 1), -1 for no comparison
+    int onEqual;         ///< value of a comparison of equal operands (0 or 1), -1 for other operators
     bool boolean;        ///< every value of the node is a truth value
     std::string_view meaning;
 };

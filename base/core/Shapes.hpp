@@ -1,7 +1,7 @@
 // The shapes of nodes: payload, operands, hash and equality.  The node classes themselves are in Nodes.hpp.
 //
-// Beside the virtual operations each shape tells whether another node of its class has the same parts, and the hash of
-// its parts as operands of an operator: interning knows the class and needs no virtual call.
+// Beside the virtual operations each shape compares its parts with those of another node of its class (hasParts) and
+// hashes them as operands of an operator (hashOf): interning knows the class and needs no virtual call.
 #pragma once
 
 #include "base/core/Node.hpp"
@@ -214,7 +214,7 @@ class VTSYM_API MemberShape : public SymbolicUnaryExpr {
 public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override;
 
-    /// The field behind the dot.
+    /// The field after the dot.
     [[nodiscard]] const std::string& getMemberName() const noexcept { return name_; }
 
     [[nodiscard]] bool hasParts(const MemberShape& other) const noexcept {

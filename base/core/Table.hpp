@@ -1,4 +1,6 @@
-// The interning store of expression nodes.
+// The interning store of expression nodes: owns them and yields one identifier for one structure.
+//
+// Look-ups and additions are O(1) on average and hash each node once; Table.cpp describes the index.
 #pragma once
 
 #include "base/core/Cells.hpp"
@@ -21,7 +23,7 @@ class InternedNode;
 }
 
 /// Owns expression nodes and gives one identifier to one structure.  Nodes enter through their constructors and live as
-/// long as the table.  Beside them stand value bindings of expressions, aliases of identifiers and the two truth
+/// long as the table.  The table also holds value bindings of expressions, aliases of identifiers and the two truth
 /// constants.
 ///
 /// A table holds up to 128 GiB of nodes, three thousand million at most, and throws std::length_error for one more.
@@ -52,7 +54,7 @@ public:
     virtual SymbolicExprTable* CreateSymbolicExprTable() const;
 
     /// Fills `out` with the identifiers of all nodes of an operator, in increasing order.  Scans the whole table; a
-    /// derived class is asked for the nodes 0, 1, ... up to the first one that it does not have.
+    /// derived class provides the nodes 0, 1, ... up to the first one that it does not have.
     void lookup(const SymbolicOp& op, std::vector<SymbolicExprId>& out) const;
 
     /// Number of nodes in the table's own storage; where no derived class keeps nodes elsewhere, identifiers are the
@@ -65,7 +67,7 @@ public:
     /// Whether an identifier is one of this table.
     [[nodiscard]] bool has(SymbolicExprId id) const { return isPlain() ? id < nodes_.size() : get(id) != nullptr; }
 
-    /// Whether there is a node for `operand`, an operand of the node that stands under `id`.  In the table's own
+    /// Whether there is a node for `operand`, an operand of the node `id`.  In the table's own
     /// storage operands are older than their nodes, so that nothing leads in a circle: an operand whose identifier is
     /// not below its node's counts as missing.  Elsewhere, and for a node that is not interned and has the invalid
     /// identifier, every node of the table will do.
@@ -94,8 +96,8 @@ public:
     /// Whether an identifier is the invalid one.
     [[nodiscard]] bool isUnsetValue(SymbolicExprId id) const noexcept { return id == invalidId_; }
 
-    /// The integer bound to a name: a real value is truncated toward zero, at most to the bounds of int; a name without
-    /// a binding, or bound to anything but a number, answers 2147483647.  Interns the name.
+    /// The integer bound to a name: a real value is truncated toward zero, at most to the bounds of int; for a name
+    /// without a binding, or bound to anything but a number, 2147483647.  Interns the name.
     int getValue(const std::string& name);
 
     /// Fills `symbols` with the text of every identifier below `id`, each once, in the order of first occurrence.
@@ -120,7 +122,7 @@ private:
         CellStore::Number cell = 0; ///< 0 marks a free slot
     };
 
-    /// What a constructor found or added, so that the lookup right behind it need not hash and probe again.  Kept for
+    /// What a constructor found or added, so that the lookup right after it need not hash and probe again.  Kept for
     /// classes in which equal nodes have equal hashes.
     struct LastAnswer {
         const SymbolicExpr* candidate = nullptr;
@@ -175,7 +177,7 @@ private:
     LastAnswer lastAnswer_;
 };
 
-/// The position of the slot of an equal node, or of the free slot where it would stand.
+/// Returns the position of the slot of an equal node, or of the free slot where it would go.
 template <class Equal>
 std::size_t SymbolicExprTable::probe(std::uint32_t tag, Equal equal) const {
     const std::size_t mask = index_.size() - 1;
@@ -245,7 +247,7 @@ const NodeCell* SymbolicExprTable::place(const Payload& candidate, std::uint32_t
 /// The identifier of a node of class Node that was made by one of its constructors.
 template <class Node, class Payload>
 SymbolicExprId SymbolicExprTable::idOf(const Payload& node) const {
-    // Another node may stand where the remembered one stood, so it is compared, which is cheaper than hashing.
+    // Another node may be where the remembered one was, so it is compared, which is cheaper than hashing.
     if constexpr (!Node::equalWithinTolerance) {
         if (lastAnswer_.candidate == &node && lastAnswer_.cell->isOf(Node::code) &&
             static_cast<const Payload*>(lastAnswer_.cell->node())->hasParts(node))

@@ -1,3 +1,9 @@
+// The walk of accept() and execute(): every occurrence of every node, in the order that the visitor asks for.
+//
+// Method: depth first on an explicit stack.  Over a table of a host the nodes of the path are kept too, so that a node
+// that leads back to itself is passed over as a missing operand.
+// Cost: linear in the number of paths from the root, which may be exponential in the number of nodes; walkUnknown() and
+// walkDistinct() are linear in the nodes.
 #include "base/core/Walk.hpp"
 
 #include "base/core/OperandStack.hpp"
@@ -16,7 +22,7 @@ public:
           operands_(dynamic_cast<OperandStack*>(&visitor)),
           path_(table) {}
 
-    /// `bottomUp` is asked at each node that has operands.
+    /// `bottomUp()` is called at each node that has operands: whether they come first.
     template <class BottomUp>
     void run(SymbolicExprId id, const SymbolicExpr& root, BottomUp bottomUp) {
         enter(id, root, bottomUp);

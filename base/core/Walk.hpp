@@ -19,7 +19,7 @@ namespace VT {
 VTSYM_API void visitEveryOccurrence(const SymbolicExprTable& table, const SymbolicExpr& root,
                                     SymbolicExprVisitor& visitor);
 
-/// The nodes that a walk over a plain table is inside of: none that matters, because its nodes lead in no circle.
+/// The path of a walk over a plain table.  Its nodes lead in no circle, so nothing is kept.
 class PlainPath {
 public:
     explicit PlainPath(const SymbolicExprTable& table) : size_(table.size()) {}
@@ -39,7 +39,7 @@ private:
     std::size_t size_;
 };
 
-/// The nodes that a walk over any table is inside of.
+/// The path of a walk over any table: the nodes between the root and the current one.
 class WalkPath {
 public:
     explicit WalkPath(const SymbolicExprTable& table) : table_(table) {}
@@ -144,10 +144,10 @@ void walkUnknownBelow(const SymbolicExprTable& table, SymbolicExprId root, std::
 
 /// Post-order walk for a caller that remembers the nodes itself, operands from left to right.
 ///
-/// `known(id, parent)` tells whether the node was visited before, in this walk or an earlier one, and takes note of a
+/// `known(id, parent)` returns whether the node was visited before, in this walk or an earlier one, and takes note of a
 /// further occurrence if so; `visit(id, node, parent)` is called for every other node, and `missing(id, parent)` for an
-/// operand that no node stands for.  `parent` is the node on whose behalf, nullptr for the root.  A `visit` with a
-/// fourth parameter is told whether the node is part of a circle, so that what is below it depends on the path to it.
+/// operand without a node.  `parent` is the node whose operand it is, nullptr for the root.  The fourth parameter of a
+/// `visit` that has one is whether the node is part of a circle, so that what is below it depends on the path to it.
 /// `stack` is room that a caller of many small walks may keep.  Linear in the number of edges.
 template <class Known, class Visit, class Missing>
 void walkUnknown(const SymbolicExprTable& table, SymbolicExprId root, std::vector<WalkFrame>& stack, Known&& known,
@@ -161,8 +161,8 @@ void walkUnknown(const SymbolicExprTable& table, SymbolicExprId root, std::vecto
 /// Post-order walk over the distinct nodes below and including `root`, operands from left to right.
 ///
 /// `visit(id, node, parent)` is called once for each distinct node, `again(id, parent)` for each of its further
-/// occurrences as an operand, and with the invalid identifier for an operand that no node stands for.  `parent` is the
-/// node on whose behalf, nullptr for the root.  Linear in the number of edges.
+/// occurrences as an operand, and with the invalid identifier for an operand without a node.  `parent` is the node
+/// whose operand it is, nullptr for the root.  Linear in the number of edges.
 template <class Visit, class Again>
 void walkDistinctWithParents(const SymbolicExprTable& table, SymbolicExprId root, Visit&& visit, Again&& again) {
     IdMap<bool> seen;

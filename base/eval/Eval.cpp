@@ -1,3 +1,5 @@
+// The doors of evaluation: eval() computes one value at once (SymbolicExprEvalImpl), prepare() flattens an expression
+// for many evaluations with changing values (PreparedExpr).
 #include "base/eval/Eval.hpp"
 
 #include "base/eval/EvalVisitor.hpp"

@@ -19,7 +19,7 @@ public:
     /// Linear in the distinct nodes of the expression and of the values it needs, times the length of the vectors.
     [[nodiscard]] SymbolicValue eval(SymbolicExprId id) const;
 
-    /// The expression made ready for many evaluations with changing values.  Linear in its distinct nodes.  Throws
+    /// Prepares the expression for many evaluations with changing values.  Linear in its distinct nodes.  Throws
     /// "Vantor:SymbolicDims:NotEvaluable" for a node that has no value whatever its symbols are.
     [[nodiscard]] PreparedExpr prepare(SymbolicExprId id) const;
 

@@ -1,5 +1,9 @@
+// The errors of evaluation, thrown as host diagnostics.
+//
+// An expression is named by its C text; one whose text is longer than limits::namedBytes by the name of its operator.
 #include "base/eval/EvalReports.hpp"
 
+#include "base/core/Limits.hpp"
 #include "base/print/ExpressionPrinter.hpp"
 #include "host/Diagnostics.hpp"
 
@@ -13,14 +17,11 @@ namespace VT::detail {
 
 namespace {
 
-/// More of a text than a message shows.
-constexpr std::size_t namedBytes = 4096;
-
 /// The text of an expression; what kind of expression it is, where the text would be long.
 std::string nameOf(const SymbolicExprTable& table, const SymbolicExpr& node) {
     try {
         SymbolicExprPrinter printer(table, false);
-        printer.setTextBound(namedBytes);
+        printer.setTextBound(limits::namedBytes);
         return printer(node);
     } catch (const std::logic_error&) { // too long, or an operand is missing
         return std::string(operatorInfo(node.op()).meaning);

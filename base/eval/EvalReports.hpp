@@ -13,7 +13,7 @@ namespace VT::detail {
 [[noreturn]] void throwCyclicValue(const SymbolicExprTable& table, const SymbolicExpr& symbol);
 /// "Vantor:SymbolicDims:NotEvaluable": a node of this kind, or on these operands, has no value.
 [[noreturn]] void throwNotEvaluable(const SymbolicExprTable& table, const SymbolicExpr& node);
-/// The same for an identifier that no node stands for, as an operand of `parent` where that is not nullptr.
+/// The same for an identifier without a node, an operand of `parent` unless that is nullptr.
 [[noreturn]] void throwMissingNode(const SymbolicExprTable& table, SymbolicExprId id, const SymbolicExpr* parent);
 /// "Vantor:SymbolicDims:SizeMismatch": the operands of a node are vectors of different lengths.
 [[noreturn]] void throwSizeMismatch(const SymbolicExprTable& table, const SymbolicExpr& node, std::size_t left,

@@ -1,5 +1,13 @@
+// Computes values bottom-up.
+//
+// Method: depth first over operands, bound values and list elements with explicit stacks of frames and values.  The
+// value of each distinct node is kept.  A node whose value is being evaluated is marked open; meeting it again is a
+// cycle.
+// Cost: linear in the distinct nodes, times the length of the vectors; limits::evaluatedElements bounds those.
+// Relies on: ScalarRules for the operators on scalars.
 #include "base/eval/EvalVisitor.hpp"
 
+#include "base/core/Check.hpp"
 #include "base/core/Limits.hpp"
 #include "base/eval/EvalReports.hpp"
 #include "base/eval/Evaluation.hpp"
@@ -37,7 +45,7 @@ void SymbolicExprEvalImpl::on(const SymbolicExpr& node) {
         visitedValue_ = evaluateFrom([&] { enterNode(invalidId, node, node.op(), detail::evaluationOf(node.op())); });
 }
 
-/// The value of the expression that is put on the stack or the frames.
+/// Computes the value of the expression that `enterRoot` puts on the stack or the frames.
 template <class Enter>
 SymbolicValue SymbolicExprEvalImpl::evaluateFrom(Enter enterRoot) {
     try {
@@ -64,10 +72,11 @@ SymbolicValue SymbolicExprEvalImpl::evaluateFrom(Enter enterRoot) {
     }
 }
 
-/// The value on the stack as it is handed out.
+/// Takes the value from the stack and returns it as callers see it.
 SymbolicValue SymbolicExprEvalImpl::takeValue() {
     const Entry& entry = values_[stack_.back()];
     stack_.pop_back();
+    VTSYM_CHECK(stack_.empty() && frames_.empty());
     if (entry.elements == nullptr)
         return visibleScalar(entry.scalar);
     Elements elements(*entry.elements);
@@ -108,7 +117,7 @@ void SymbolicExprEvalImpl::enterNode(SymbolicExprId id, const SymbolicExpr& node
     if (way == Evaluation::Literal) {
         push(detail::literalValue(node, op));
     } else if (way == Evaluation::Operands) {
-        if (!table_.isPlain() && id != invalidId) // in a plain one operands lead in no circle
+        if (!table_.isPlain() && id != invalidId) // operands in a plain table lead in no circle
             markOpen(id);
         enterOperands(id, node, op);
     } else {
@@ -155,7 +164,7 @@ void SymbolicExprEvalImpl::enterSymbol(SymbolicExprId id, const SymbolicExpr& no
     frames_.push_back({&node, id, value, invalidId, 0, 1, ScalarRuleIndex::None, true});
 }
 
-/// Makes the value of the topmost frame's node from those of its operands, and remembers it.
+/// Computes the value of the topmost frame's node from those of its operands, and remembers it.
 void SymbolicExprEvalImpl::leave() {
     const Frame& done = frames_.back();
     if (done.rule != ScalarRuleIndex::None)

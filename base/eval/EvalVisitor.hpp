@@ -2,6 +2,7 @@
 #pragma once
 
 #include "base/core/Nodes.hpp"
+#include "base/eval/ScalarRules.hpp"
 #include "base/eval/Values.hpp"
 #include "base/util/IdMap.hpp"
 
@@ -27,17 +28,17 @@ enum class Evaluation : std::uint8_t;
 ///
 ///     Vantor:SymbolicDims:UnboundSymbol   a symbol without a value
 ///     Vantor:SymbolicDims:CyclicValue     a symbol whose value needs itself
-///     Vantor:SymbolicDims:NotEvaluable    a node of another class, a list in a list, an identifier that is no node's
+///     Vantor:SymbolicDims:NotEvaluable    a node of another class, a list in a list, an identifier without a node
 ///     Vantor:SymbolicDims:SizeMismatch    two vectors of different lengths
 ///
-/// Of several faults the one that is met first counts, where a node is met before its operands and these from left to
-/// right.  A node without a value is not looked into, and neither is the owner of a member.
+/// Of several faults the first one met is thrown; a node is met before its operands, and these from left to right.  The
+/// operands of a node without a value are not evaluated, nor is the owner of a member.
 ///
-/// Either evaluate(), or a run by node.accept(table, visitor) or visitor.execute(table, id) and then get().  Both
-/// answer the same and report the same.  Such a run visits what evaluate() passes over, such as the owner of a member,
-/// so its visits compute nothing: get() evaluates the node that was visited last, which is the root.
+/// Use either evaluate(), or a run by node.accept(table, visitor) or visitor.execute(table, id) and then get().  Both
+/// return the same value and throw the same errors.  Such a run visits what evaluate() passes over, such as the owner
+/// of a member, so its visits compute nothing: get() evaluates the node that was visited last, which is the root.
 ///
-/// Each distinct node is evaluated once in the visitor's life and its value is remembered: bindings are not to change
+/// Each distinct node is evaluated once in the visitor's life and its value is remembered: bindings must not change
 /// meanwhile.
 class VTSYM_API SymbolicExprEvalImpl : public RoutedVisitor<SymbolicExprEvalImpl> {
 public:
@@ -48,8 +49,8 @@ public:
     SymbolicExprEvalImpl& operator=(const SymbolicExprEvalImpl&) = delete;
 
     /// The value of an expression.  Linear in the distinct nodes that the visitor has not met, times the length of the
-    /// vectors.  Throws std::length_error beyond limits::evaluatedElements.  After an exception the visitor can be used
-    /// on.
+    /// vectors.  Throws std::length_error beyond limits::evaluatedElements.  After an exception the visitor is still
+    /// usable.
     SymbolicValue evaluate(SymbolicExprId id);
 
     /// The value of the run that was completed last; it can be asked for once.  Throws like evaluate(), and
@@ -72,7 +73,7 @@ private:
     struct Frame {
         const SymbolicExpr* node;
         SymbolicExprId id;
-        SymbolicExprId first;  ///< operand of an operator, or the value of a symbol; a list is asked for its elements
+        SymbolicExprId first; ///< operand of an operator, or the value of a symbol; a list has its elements in its node
         SymbolicExprId second; ///< operand of an operator
         std::size_t next;
         std::size_t count;
@@ -112,7 +113,7 @@ private:
     std::forward_list<Elements> vectors_; ///< of the entries
     std::size_t elementCount_ = 0;        ///< in them
 
-    // What get() answers: the value of a node of the table, or one that is known already.
+    // The result of get(): the value of a node of the table, or one that is known already.
     SymbolicExprId visited_ = invalidId;
     std::optional<SymbolicValue> visitedValue_;
 };

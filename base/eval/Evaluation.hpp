@@ -1,20 +1,21 @@
-// How the value of a node is found, by its operator.
+// How the value of a node is found, by its operator; the literals and constants that need no search.
 #pragma once
 
 #include "base/core/Nodes.hpp"
-#include "base/eval/Values.hpp"
+#include "base/eval/ScalarRules.hpp"
 
 #include <array>
 #include <optional>
 
 namespace VT::detail {
 
+/// Where the value of a node comes from.
 enum class Evaluation : std::uint8_t {
-    None,     ///< there is none
-    Literal,  ///< in the node
+    None,     ///< the node has no value
+    Literal,  ///< in the node itself
     Symbol,   ///< bound to it, or a truth value
     Member,   ///< bound to it
-    Operands, ///< made of the operands' values
+    Operands, ///< computed from the operands' values
 };
 
 inline constexpr auto evaluations = [] {
@@ -40,7 +41,7 @@ inline SymbolicScalar literalValue(const SymbolicExpr& literal, SymbolicOp op) {
     return static_cast<const SymbolicDoubleValue&>(literal).getValue();
 }
 
-/// The truth value that an identifier is.
+/// The value of the identifiers "true" and "false"; nothing for others.
 inline std::optional<bool> truthConstant(const SymbolicExpr& identifier) {
     const std::string& name = static_cast<const SymbolicString&>(identifier).getName();
     if (name == "true")

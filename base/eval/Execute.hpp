@@ -1,13 +1,13 @@
 // The operations of prepared expressions, and running them.
 #pragma once
 
-#include "base/eval/Values.hpp"
+#include "base/eval/ScalarRules.hpp"
 
 #include <cstdint>
 
 namespace VT::detail {
 
-/// One operation: what to do with which cells.  Its result stands behind that of the operation before it.
+/// One operation: its code and the cells of its operands.  Its result follows that of the operation before it.
 struct Operation {
     std::uint32_t code;
     std::uint32_t left;
@@ -26,11 +26,11 @@ constexpr ScalarRuleIndex ruleOfCode(std::uint32_t code) {
     return static_cast<ScalarRuleIndex>(code / typePairs);
 }
 
-/// The code behind the last operation.
+/// The code that ends the operations.
 inline constexpr std::uint32_t endCode =
     operationCode(static_cast<ScalarRuleIndex>(scalarRules.size()), ScalarType::Bool, ScalarType::Bool);
 
-/// Runs operations up to the one with endCode, over cells of the types that the codes say; results are written from
+/// Runs operations up to the one with endCode, over cells of the types that the codes are for; results are written from
 /// `result` on.
 void execute(const Operation* operation, ScalarCell* cells, ScalarCell* result) noexcept;
 

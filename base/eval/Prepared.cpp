@@ -1,3 +1,9 @@
+// An expression made ready for many evaluations.
+//
+// Method: the constructor flattens the expression into steps in the order of evaluation.  A run lays them out over
+// cells (PreparedLayout) when the shapes of the slots have changed, chooses the code of each operation when their types
+// have changed, and executes.
+// Cost: a run with shapes and types as before is linear in its operations; laying out and choosing codes are, too.
 #include "base/eval/Prepared.hpp"
 
 #include "base/core/Limits.hpp"
@@ -134,7 +140,7 @@ SymbolicValue PreparedExpr::run() {
     return compute();
 }
 
-/// A run in which slots that were not set take their values from the table, and keep them where it succeeds.
+/// Runs with values from the table for slots that were not set; they keep these where the run succeeds.
 SymbolicValue PreparedExpr::runFirst() {
     const std::vector<std::size_t> taken = emptySlots();
     try {

@@ -23,8 +23,8 @@ namespace VT {
 ///     const SymbolicValue value = area.run();
 ///
 /// Every symbol of the expression but "true" and "false", and every member, has a slot.  A slot that is not set takes
-/// the value that its symbol has in the table when run() first needs it.  run() answers what SymbolicExprEval::eval()
-/// would answer with those values bound, bit for bit.
+/// the value that its symbol has in the table when run() first needs it.  run() returns what SymbolicExprEval::eval()
+/// would return with those values bound, bit for bit.
 ///
 /// Types are settled when run() first sees them and then cost nothing.  A value of another type than the slot's last
 /// one lets the next run choose all operations by their types anew; a scalar in the place of a vector, or a vector of
@@ -44,7 +44,7 @@ public:
     /// The slot of a symbol by its name.
     [[nodiscard]] std::optional<std::size_t> slotOf(const std::string& name) const;
 
-    /// Gives a slot a value.  Throw std::out_of_range for a slot that is none.
+    /// Sets the value of a slot.  Throws std::out_of_range for a number that is not a slot's.
     void setBool(std::size_t slot, bool value) { setScalar(slot, value); }
 
     void setInt(std::size_t slot, std::int32_t value) { setScalar(slot, value); }
@@ -55,8 +55,9 @@ public:
 
     /// The value of the expression.  Throws "Vantor:SymbolicDims:UnboundSymbol" or ":CyclicValue" for a slot that was
     /// not set and cannot take a value from the table, ":SizeMismatch" and ":NotEvaluable" where vectors do not fit,
-    /// and std::length_error beyond limits::evaluatedElements.  The slots stay as they were then: those that were not
-    /// set ask the table again.  Of several faults it may name another one than SymbolicExprEval::eval().
+    /// and std::length_error beyond limits::evaluatedElements.  After an exception the slots are as
+    /// before: those that were not set ask the table again.  Of several faults it may name another one than
+    /// SymbolicExprEval::eval().
     [[nodiscard]] SymbolicValue run();
 
 private:
@@ -65,7 +66,7 @@ private:
 
     PreparedExpr(const SymbolicExprTable& table, SymbolicExprId id);
 
-    /// What a slot holds: a scalar of a type, whose numbers these are too, a vector, or nothing.
+    /// What a slot holds: a scalar (numbered like ScalarType), a vector, or nothing.
     enum class Holding : std::uint8_t { Bool, Int, Double, Vector, Nothing };
 
     /// Where a value comes from: a slot, a constant or a step, by number.
@@ -132,7 +133,7 @@ private:
     std::vector<detail::Operation> operations_;
     std::size_t firstResult_ = 0;
     std::vector<Place> slotPlaces_;
-    std::vector<std::uint32_t> vectorCells_; ///< of vectors, one behind the other
+    std::vector<std::uint32_t> vectorCells_; ///< of vectors, one after the other
     Place rootPlace_;
 };
 

@@ -1,3 +1,9 @@
+// Lays out the cells of a prepared expression and the operations over them.
+//
+// Method: one pass over the steps.  The cells of scalar slots come first, then elements of vectors and constants, then
+// one result for each operation, in order.  An operator on vectors becomes one operation for each element; one on
+// constants is computed at once and becomes a constant.
+// Cost: linear in the steps and in the elements of their vectors; limits::evaluatedElements bounds both.
 #include "base/eval/PreparedLayout.hpp"
 
 #include "base/core/Limits.hpp"
@@ -10,8 +16,7 @@ namespace VT {
 
 namespace {
 
-/// Marks the number of an operation that stands for the cell of its result, until the number of cells before the
-/// results is known.
+/// Marks the number of an operation as that of its result, until the number of cells before the results is known.
 constexpr std::uint32_t ofResult = std::uint32_t{1} << 31U;
 
 } // namespace
@@ -37,7 +42,7 @@ void PreparedExprLayout::install(PreparedExpr& expression) noexcept {
     expression.firstResult_ = firstResult_;
 }
 
-/// The cells of the slots come first, so that they stay where they are; elements of vectors stand behind them.
+/// Places the slots.  Their cells come first, so that they stay where they are; elements of vectors follow.
 void PreparedExprLayout::placeSlots() {
     const std::size_t count = expression_.slotCount();
     cells_.assign(expression_.cells_.begin(), expression_.cells_.begin() + static_cast<std::ptrdiff_t>(count));
@@ -73,7 +78,7 @@ PreparedExprLayout::Place PreparedExprLayout::placeOf(const PreparedExpr::Source
     }
 }
 
-/// A list is made of cells that are there; nothing is done when it runs.
+/// A list names cells that other steps make; it has no operation.
 PreparedExprLayout::Place PreparedExprLayout::placeList(const Step& step) {
     const auto begin = static_cast<std::uint32_t>(vectorCells_.size());
     for (std::uint32_t i = 0; i < step.count; ++i) {
@@ -99,7 +104,7 @@ PreparedExprLayout::Place PreparedExprLayout::placeOperator(const Step& step) {
     return {begin, length, true};
 }
 
-/// The cell of an element of a vector; that of a scalar, which takes part in every element.
+/// Returns the cell of an element of a vector; that of a scalar for every index.
 std::uint32_t PreparedExprLayout::element(const Place& place, std::uint32_t index) const {
     return place.isVector ? vectorCells_[place.at + index] : place.at;
 }

@@ -1,7 +1,13 @@
+// Finds what C text or a preprocessor cannot decide as the library does.
+//
+// Method: one walk over the distinct nodes with a check for each operator, name, member and call.  For a directive, the
+// names that become macros are printed, sorted by their texts, and neighbours compared.
+// Cost: linear in the nodes, but for the sorting of names.
 #include "base/print/CTextObstacles.hpp"
 
 #include "base/core/Walk.hpp"
 #include "base/print/PreprocessorVCExpr.hpp"
+#include "base/print/StructuralOrder.hpp"
 #include "base/util/IdMap.hpp"
 #include "base/variants/VariantKeywords.hpp"
 
@@ -14,7 +20,7 @@ namespace VT {
 
 namespace {
 
-/// Operators that C text writes, but C has not.
+/// Operators that C text writes though C has no such operator.
 constexpr OperatorSet notInC = [] {
     OperatorSet set{SymbolicOp::Power, SymbolicOp::DotPower,  SymbolicOp::DotMul,    SymbolicOp::DotDiv,
                     SymbolicOp::LDiv,  SymbolicOp::DotLDiv,   SymbolicOp::Transpose, SymbolicOp::DotTranspose,
@@ -46,7 +52,7 @@ bool isWord(std::string_view text) {
     });
 }
 
-/// Letters beyond ASCII are left to the compiler.
+/// Leaves letters beyond ASCII to the compiler.
 bool isIdentifier(std::string_view text) {
     return !text.empty() && isWord(text) && (text.front() < '0' || text.front() > '9');
 }
@@ -84,7 +90,7 @@ private:
     struct Words {
         bool isTruth = false; ///< `true` or `false`
         bool isIdentifier = false;
-        bool isReserved = false; ///< a word that C, or the preprocessor, keeps to itself
+        bool isReserved = false; ///< a reserved word of C, or of the preprocessor
     };
 
     Words wordsOf(SymbolicExprId id);
@@ -148,8 +154,8 @@ Finder::Words Finder::wordsOf(SymbolicExprId id) {
     return looked_.insert(id, {text == "true" || text == "false", isIdentifier(text), isReserved(text)});
 }
 
-/// Whether what stands before a point or an argument list is written so that C can read it.  Members are looked at
-/// themselves.
+/// Whether the operand before a point or an argument list is written so that C can read it.  Members are checked on
+/// their own.
 bool Finder::isNamed(SymbolicExprId id) {
     const SymbolicOp kind = op(id);
     if (kind == SymbolicOp::String)
@@ -157,12 +163,12 @@ bool Finder::isNamed(SymbolicExprId id) {
     return kind == SymbolicOp::MemberValue || (!inDirective() && callOps.contains(kind));
 }
 
-/// Whether C, or the preprocessor, keeps a word to itself.
+/// Whether a word is reserved by C, or by the preprocessor.
 bool Finder::isReserved(std::string_view word) const {
     return inDirective() ? word == definedOperator : std::ranges::binary_search(keywordsOfC, word);
 }
 
-/// A text that a predicate has chosen is the host's.
+/// A text that a predicate has chosen is the host's responsibility.
 void Finder::lookAtName(SymbolicExprId id, const SymbolicString& name) {
     const std::string text = predicate_.printIdentifier(name);
     if (VariantKeywords::isVariantKeyword(text, false))
@@ -190,7 +196,7 @@ void Finder::lookAtCall(SymbolicExprId id, const SymbolicExpr& call) {
         note(CTextObstacle::DefinedNoName, id);
 }
 
-/// Takes note of a name that stands for itself rather than for the owner of a member.
+/// Takes note of a name that is used by itself rather than as the owner of a member.
 void Finder::occurs(SymbolicExprId id, const SymbolicExpr* parent) {
     const SymbolicOp kind = op(id);
     if ((kind != SymbolicOp::String && kind != SymbolicOp::MemberValue) ||

@@ -8,22 +8,22 @@
 
 namespace VT {
 
-/// Where the C text of a condition stands.
+/// Where the C text of a condition is used.
 enum class CTextUse : std::uint8_t {
     Program,   ///< in a compiled expression; members are fields
-    Directive, ///< behind `#if`, as PreprocessorVCExpr prints it; members are flat macro names
+    Directive, ///< after `#if`, as PreprocessorVCExpr prints it; members are flat macro names
 };
 
 /// Why the text of a condition is not decided as the condition is.
 enum class CTextObstacle : std::uint8_t {
-    NoSuchOperator,  ///< power, transpose, element-wise or left division, range, list, function: C has none
+    NoSuchOperator,  ///< C has no such operator: power, transpose, element-wise or left division, range ...
     BitwiseLogic,    ///< element-wise & or | of what may be other than 0 and 1, which C combines bit by bit
     RealConstant,    ///< a directive knows integers only; C has no infinities
-    MemberOfNoName,  ///< a member of anything but a name is no macro, and in C a number has none
-    CalledNoName,    ///< only a name can be that of a macro with arguments, and in C a number is no function
+    MemberOfNoName,  ///< a member of anything but a name is not a macro, and in C a number has no members
+    CalledNoName,    ///< only a name can be called: in a directive a macro with arguments, in C a function
     SharedMacroName, ///< two parameters become one macro
     VariantKeyword,  ///< "(sim)" and its like would be names in parentheses
-    NoSuchName,      ///< what a name is written as is no name in C, or a word that the language keeps to itself
+    NoSuchName,      ///< a name is written as something that C does not take for one, or as a reserved word
     DefinedNoName,   ///< `defined` of anything but one name
 };
 
@@ -35,8 +35,8 @@ struct CTextFinding {
 };
 
 /// The obstacles in a condition, at most one of each kind and operator; none for an identifier that is not of the
-/// table.  Calls such as defined(X) are no obstacle.  `predicate` is that of the printer; what it writes for a name
-/// that stands alone is taken to be C.  Linear in the number of distinct nodes, but for the sorting of names.
+/// table.  Calls such as defined(X) are not obstacles.  `predicate` is that of the printer; what it writes for a name
+/// is taken to be C.  Linear in the number of distinct nodes, but for the sorting of names.
 [[nodiscard]] VTSYM_API std::vector<CTextFinding>
 findCTextObstacles(const SymbolicExprTable& table, SymbolicExprId id, CTextUse use,
                    const SymbolicExprPrinter::PredicateHandle& predicate = {});

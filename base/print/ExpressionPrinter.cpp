@@ -1,17 +1,19 @@
+// Prints expressions by identifier, with two stores: printed nodes, which share their texts in a pool, and finished
+// texts.
+//
+// Cost: each distinct node is looked at once in the printer's life; a text costs its length.  textLength() and
+// compareUsingCache() write no text.
+// Relies on: StringifySymbolicExpr for the texts, the predicate's version() for names that change.
 #include "base/print/ExpressionPrinter.hpp"
 
+#include "base/core/Check.hpp"
+#include "base/core/Limits.hpp"
 #include "base/print/StringifySymbolicExpr.hpp"
+#include "base/print/StructuralOrder.hpp"
 
 #include <boost/unordered_map.hpp>
 
 namespace VT {
-
-namespace {
-
-/// Texts that one print may leave behind; a print that made more gives its memory back, which costs less than it did.
-constexpr std::size_t keptTexts = std::size_t{1} << 16U;
-
-} // namespace
 
 struct SymbolicExprPrinter::State {
     State(const SymbolicExprTable& expressions, bool quillSyntax, bool spacedLogicalOperators,
@@ -19,6 +21,8 @@ struct SymbolicExprPrinter::State {
         : table(expressions),
           names(predicate),
           plainNames(predicate.isPlain()),
+          quill(quillSyntax),
+          spaced(spacedLogicalOperators),
           stringify(expressions, quillSyntax, spacedLogicalOperators, predicate) {}
 
     template <class Expression>
@@ -27,9 +31,18 @@ struct SymbolicExprPrinter::State {
             stringify.forget(); // names may have changed since
         const std::size_t before = stringify.texts().size();
         std::string text = stringify.print(expression);
-        if (stringify.texts().size() - before > keptTexts)
+        VTSYM_CHECK_SAMPLED(isAsPrintedAnew(expression, text));
+        if (stringify.texts().size() - before > limits::keptTexts)
             stringify.forget();
         return text;
+    }
+
+    /// Whether a visitor that has met nothing prints the same.  Names may have changed without a new version.
+    template <class Expression>
+    [[nodiscard]] bool isAsPrintedAnew(const Expression& expression, const std::string& text) const {
+        StringifySymbolicExpr fresh(table, quill, spaced, names);
+        fresh.setTextBound(text.size());
+        return !plainNames || fresh.print(expression) == text;
     }
 
     /// Drops what was printed under names that are others now.
@@ -44,6 +57,8 @@ struct SymbolicExprPrinter::State {
     const SymbolicExprTable& table;
     PredicateHandle names;
     bool plainNames;
+    bool quill;
+    bool spaced;
     StringifySymbolicExpr stringify;
     boost::unordered_map<SymbolicExprId, std::string> finished;
     std::uint64_t version = 0; ///< of the names
@@ -68,8 +83,10 @@ std::string SymbolicExprPrinter::operator()(const SymbolicExpr& node) const {
 std::string SymbolicExprPrinter::printIdUsingCache(SymbolicExprId id) const {
     state_->followNames();
     const auto found = state_->finished.find(id);
-    if (found != state_->finished.end())
+    if (found != state_->finished.end()) {
+        VTSYM_CHECK_SAMPLED(state_->isAsPrintedAnew(id, found->second));
         return found->second;
+    }
     return state_->finished.emplace(id, state_->print(id)).first->second;
 }
 

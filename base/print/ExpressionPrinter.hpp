@@ -16,23 +16,23 @@ class StringifySymbolicExpr;
 
 /// Prints expressions of one table as one line of text each, in Quill or in C syntax.
 ///
-/// A printer keeps what it knows of the nodes that it met, so that each of them is looked at once in the printer's
+/// A printer keeps the printed forms of the nodes that it met, so that each of them is looked at once in the printer's
 /// life; a graph with shared operands costs its nodes, and the text its length.  Nothing is interned.  A printer is
 /// used by one thread at a time; its table outlives it.
 class VTSYM_API SymbolicExprPrinter {
 public:
-    /// Gives the text of an identifier.  The base gives its name.
+    /// Chooses the text of an identifier.  The base chooses its name.
     class VTSYM_API Predicate {
     public:
         [[nodiscard]] virtual std::string printIdentifier(const SymbolicString& node) const;
         virtual ~Predicate();
-        /// A number that is another one once texts have changed, so that printers drop those that they keep.  The base
-        /// answers 0: texts never change.
+        /// A number that differs once texts have changed, so that printers drop those that they keep.  The base returns
+        /// 0: texts never change.
         [[nodiscard]] virtual std::uint64_t version() const;
     };
 
-    /// The predicate of a printer: one of the caller's, which outlives the printer, or a temporary, which is kept.
-    /// Names as they are, when none is given.
+    /// The predicate of a printer: one of the caller's, which outlives the printer, or a temporary, which is kept.  An
+    /// empty handle prints names as they are.
     class VTSYM_API PredicateHandle {
     public:
         PredicateHandle() = default;
@@ -65,10 +65,10 @@ public:
     SymbolicExprPrinter& operator=(SymbolicExprPrinter&&) noexcept;
     ~SymbolicExprPrinter();
 
-    /// The text of an expression.  Throws std::out_of_range for an identifier that is not of the table and
-    /// std::length_error for a text beyond the bound; nothing of it was written then.
+    /// Returns the text of an expression.  Throws std::out_of_range for an identifier that is not of the table, and
+    /// std::length_error for a text beyond the bound, before anything of it is written.
     [[nodiscard]] std::string operator()(SymbolicExprId id) const;
-    /// The text of a node whose operands are of the table; it need not be there itself.
+    /// Returns the text of a node whose operands are in the table; the node itself need not be.
     [[nodiscard]] std::string operator()(const SymbolicExpr& node) const;
     /// The same as printing the identifier, from a store of finished texts that lives as long as the printer.  The
     /// store is emptied when the predicate has another version, so that it follows new aliases.  Under a predicate that
@@ -81,11 +81,11 @@ public:
     [[nodiscard]] std::uint64_t textLength(SymbolicExprId id) const;
     /// Orders two expressions: by the first limits::orderedTextBytes bytes of their texts, as unsigned numbers, a
     /// beginning before the longer text, and those that agree in them by compareStructure().  Negative, zero or
-    /// positive; zero for expressions that cannot be told apart.  The order does not depend on what was interned when,
-    /// nor on what the printer has met.
+    /// positive; zero for expressions that do not differ.  The order does not depend on the order of interning, nor
+    /// on the nodes that the printer has met.
     ///
-    /// Writes no text.  Mostly O(1) behind the nodes that the printer has not met; at worst linear in the bound and the
-    /// depth. Throws std::out_of_range for an identifier that is not of the table.
+    /// Writes no text.  Mostly O(1) once the printer has met the nodes; at worst linear in the bound and the depth.
+    /// Throws std::out_of_range for an identifier that is not of the table.
     [[nodiscard]] int compareUsingCache(SymbolicExprId left, SymbolicExprId right) const;
 
     /// Bytes beyond which printing throws std::length_error; limits::textBytes unless set.
@@ -95,11 +95,5 @@ private:
     struct State;
     std::unique_ptr<State> state_;
 };
-
-/// Orders two expressions of a table by structure: operator, literal or name, number of operands, then the operands
-/// from left to right.  Zero for equal structure.  Identifiers have no say, so the order does not depend on the table's
-/// history.  Linear in the depth of the first difference; linear in the size where copies of NaN make equal structures
-/// of several nodes.
-[[nodiscard]] VTSYM_API int compareStructure(const SymbolicExprTable& table, SymbolicExprId left, SymbolicExprId right);
 
 } // namespace VT

@@ -1,3 +1,6 @@
+// Names of identifiers on output: plain, or the aliases of a table.
+//
+// Aliases are only ever added, so their number serves as the version.  Each look-up is O(length of the name).
 #include "base/print/Predicates.hpp"
 
 #include <typeinfo>

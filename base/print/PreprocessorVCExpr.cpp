@@ -1,3 +1,5 @@
+// Prints conditions for generated code: what differs from the general printer, which are the truth constants, members,
+// blanks and parentheses.  Costs what the general printer costs.
 #include "base/print/PreprocessorVCExpr.hpp"
 
 namespace VT {

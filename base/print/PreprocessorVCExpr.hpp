@@ -5,13 +5,13 @@
 
 namespace VT {
 
-/// Prints a condition as the text behind `#if`, or as its Quill counterpart, for readers who need not know how mixed
+/// Prints a condition as the text after `#if`, or as its Quill counterpart, for readers who need not know how mixed
 /// operators bind.
 ///
 /// Every binary operator has a blank on each side.  A comparison wraps operands of its own precedence on both sides.
 /// In C, members become flat macro names (A.B is A_B) and the constants `true` and `false` are written 1 and 0, so
 /// that TRUE is `1` and not the empty text.  What a preprocessor cannot decide is printed all the same;
-/// findCTextObstacles() tells of it.
+/// findCTextObstacles() reports it.
 class VTSYM_API PreprocessorVCExpr : public StringifySymbolicExpr {
 public:
     /// @param quillSyntax        Quill's spellings; those of C otherwise

@@ -1,5 +1,14 @@
+// Turns an expression into text bottom-up.
+//
+// Method: a visit takes the printed operands of its node from a stack and leaves the printed node, whose text is a join
+// of theirs in a TextPool.  Parentheses follow the precedences of the operator table, and two signs never touch.  A C
+// operator without a Quill spelling becomes a call, in whose arguments divisions become calls too; a node that is
+// written differently there keeps both forms, so no node is printed more than twice.
+// Cost: O(operands) for each distinct node, then the length of the text.
+// Relies on: the walkers for order and depth, QuillCalls for the names of functions and the amounts of shifts.
 #include "base/print/StringifySymbolicExpr.hpp"
 
+#include "base/core/Check.hpp"
 #include "base/transform/QuillCalls.hpp"
 #include "host/Numbers.hpp"
 
@@ -21,7 +30,7 @@ constexpr unsigned char leafPrecedence = 0;
 /// Room that spares most prints the growth of their stacks.
 constexpr std::size_t firstDepth = 16;
 
-/// Nodes for which a fresh visitor makes room at once, if the table has so many: growing from nothing would cost more
+/// Nodes for which a fresh visitor makes room at once, if the table has as many: growing from nothing would cost more
 /// than printing most expressions.
 constexpr std::size_t firstNodes = 2048;
 
@@ -109,6 +118,7 @@ StringifySymbolicExpr::Printed StringifySymbolicExpr::printedOnce(SymbolicExprId
         texts_.reserve(nodes);
         known_.reserve(nodes);
     }
+    [[maybe_unused]] const std::size_t before = stack_.size();
     walkUnknown(
         table_, id, frames_, [&](SymbolicExprId operand, const SymbolicExpr*) { return pushKnown(operand); },
         [&](SymbolicExprId visited, const SymbolicExpr& node, const SymbolicExpr*) {
@@ -118,6 +128,7 @@ StringifySymbolicExpr::Printed StringifySymbolicExpr::printedOnce(SymbolicExprId
                                   whole.precedence};
         },
         [](SymbolicExprId, const SymbolicExpr*) { throwNoSuchExpression(); });
+    VTSYM_CHECK(frames_.empty() && stack_.size() == before + 1);
     return stack_.back();
 }
 
@@ -199,8 +210,8 @@ void StringifySymbolicExpr::appendDouble(double value) {
 
 // Operators.
 
-/// Whether a literal needs parentheses before what follows it: that binds tighter than its sign, or is a field or
-/// arguments, which no number has.
+/// Whether a literal needs parentheses: what follows it binds tighter than its sign, or is a field or an argument list,
+/// which a number cannot have.
 bool StringifySymbolicExpr::needsParentheses(const Printed& operand, unsigned char precedence) const {
     if (!isLiteral(operand) || precedence >= signPrecedence)
         return false;
@@ -224,9 +235,9 @@ StringifySymbolicExpr::Printed StringifySymbolicExpr::createBinaryExpr(const Sym
     const Delimiters delimiters = isDelimitWithSpacesAndWrapParenthesis(op, precedence, assoc, lhs, rhs);
     const std::string_view bare = spelling;
     // Two signs would join.
-    const bool signBehindSign = !delimiters.spaced && bare.ends_with('-') && texts_.beginsWith(rhs.text, '-');
+    const bool signAfterSign = !delimiters.spaced && bare.ends_with('-') && texts_.beginsWith(rhs.text, '-');
     const Text left = delimiters.wrapLeft || needsParentheses(lhs, precedence) ? wrapped(lhs.text) : lhs.text;
-    const Text right = delimiters.wrapRight || signBehindSign ? wrapped(rhs.text) : rhs.text;
+    const Text right = delimiters.wrapRight || signAfterSign ? wrapped(rhs.text) : rhs.text;
     if (!delimiters.spaced)
         return {op, texts_.infix(left, bare, right), precedence};
     boost::container::small_vector<char, 8> spaced{' '};
@@ -327,7 +338,7 @@ StringifySymbolicExpr::Printed StringifySymbolicExpr::quillCall(SymbolicOp op, s
     return call(kept.size() == 1 ? SymbolicOp::FcnCall1U : SymbolicOp::FcnCall2U, name, {kept.data(), kept.size()});
 }
 
-/// The printed second argument of the call that stands for a shift.
+/// Prints the second argument of the call that stands for a shift.
 StringifySymbolicExpr::Printed StringifySymbolicExpr::shiftAmount(const SymbolicExpr& shift, const Printed& amount) {
     const ShiftAmount converted = quillShiftAmount(table_, shift.op(), shift.getInput(1));
     constexpr const OperatorInfo& minus = operatorInfo(SymbolicOp::UnaryMinus);
@@ -355,7 +366,7 @@ void StringifySymbolicExpr::PrintQExprFromCExpr(const SymbolicExpr& node) {
 
 // Visits.
 
-/// What a node's row in the operator table says.
+/// Prints a node by its row in the operator table.
 template <SymbolicOp Op, class Node>
 void StringifySymbolicExpr::append(const Node& node) {
     static constexpr const OperatorInfo& row = operatorInfo(Op);

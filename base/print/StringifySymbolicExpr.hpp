@@ -18,24 +18,24 @@
 namespace VT {
 
 /// Prints an expression bottom-up: each visit takes the printed operands of its node from a stack and leaves the
-/// printed node. Spellings, precedences and forms are those of the operator table.  Parentheses are put where
+/// printed node. Spellings, precedences and forms are those of the operator table.  Parentheses are written where
 /// precedence demands them and where the text would otherwise read differently.
 ///
 /// A visitor serves one print: node.accept(table, visitor) or visitor.execute(table, id), then get().  Those visit a
 /// shared operand once for every path to it; print() visits each distinct node once.
 ///
-/// A derived printer overrides visits, the joining of operands and what is answered; all of it works through a
-/// reference to this class.
+/// A derived printer overrides visits, the joining of operands and the results; all of it works through a reference to
+/// this class.
 class VTSYM_API StringifySymbolicExpr : public SymbolicExprVisitor {
 public:
-    /// A printed expression: what the node is, its text, and how strongly the outermost operator binds (0 for what
-    /// needs no parentheses anywhere; a smaller number binds tighter).
+    /// A printed expression: the operator of its node, its text, and how strongly the outermost operator binds (0 for a
+    /// text that needs no parentheses anywhere; a smaller number binds tighter).
     struct Printed {
         SymbolicOp op;
         Text text;
         unsigned char precedence;
-        /// Where the node is written differently inside a Quill call that stands for a C operator, the number of that
-        /// form; 0 where it is not.
+        /// Number of the form that the node has inside a Quill call that stands for a C operator; 0 where it is written
+        /// the same there.
         std::uint32_t inCall = 0;
     };
 
@@ -101,7 +101,7 @@ protected:
     [[nodiscard]] Printed createBinaryExpr(const SymbolicOp& op, const char* spelling, unsigned char precedence,
                                            OpAssociativity assoc, const Printed& lhs, const Printed& rhs);
     /// Decides on parentheses by precedence and on blanks.  Parentheses without which a sign would read differently are
-    /// put whatever this answers.
+    /// written in any case.
     [[nodiscard]] virtual Delimiters isDelimitWithSpacesAndWrapParenthesis(const SymbolicOp& op,
                                                                            unsigned char precedence,
                                                                            OpAssociativity assoc, const Printed& lhs,
@@ -115,7 +115,7 @@ protected:
         push({op, texts_.bytes(text), precedence});
     }
 
-    /// The operand that was printed last.  Throws std::out_of_range where there is none.
+    /// The operand that was printed last.  Throws std::out_of_range for an empty stack.
     [[nodiscard]] const Printed& top() const;
 
     /// Takes it from the stack.
@@ -130,7 +130,7 @@ protected:
         return texts_.str(printed.text, textBound_);
     }
 
-    /// The text of an identifier, as the predicate gives it.
+    /// The text of an identifier, as the predicate chooses it.
     [[nodiscard]] std::string identifier(const SymbolicString& node) const {
         return predicate_.printIdentifier(node);
     }
@@ -146,7 +146,7 @@ protected:
 private:
     class StackDepth;
 
-    /// A printed expression, packed; all zero where there is none, so that fresh pages are zeroed memory.
+    /// A printed expression, packed; all zero for a node that was not met, so that fresh pages are zeroed memory.
     struct Known {
         Text text;
         std::uint32_t inCall;

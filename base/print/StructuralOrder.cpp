@@ -1,4 +1,14 @@
-#include "base/print/ExpressionPrinter.hpp"
+// Orders expressions by structure.
+//
+// Method: both expressions are walked in parallel from the root, in pre-order on an explicit stack.  Nodes are
+// interned, so operands of one identifier are equal and skipped, and the walk goes straight down to the first
+// difference.
+// Cost: linear in the depth of that difference.  Only copies of NaN are equal under several identifiers; pairs of nodes
+// built on them are remembered, so that shared operands are compared once.
+// Relies on: interning (equal structure has one identifier, but for NaN).
+#include "base/print/StructuralOrder.hpp"
+
+#include "base/core/Nodes.hpp"
 
 #include <array>
 #include <bit>
@@ -30,7 +40,7 @@ SymbolicOp canonicalOp(const SymbolicExpr& node) {
     return op;
 }
 
-/// Numbers by value; where values do not tell, by their bits (-0, NaN).
+/// Numbers by value; where values do not differ, by their bits (-0, NaN).
 int orderDoubles(double a, double b) {
     if (a < b || b < a)
         return a < b ? -1 : 1;
@@ -67,9 +77,6 @@ int orderNodes(const SymbolicExpr& a, const SymbolicExpr& b) {
 } // namespace
 
 int compareStructure(const SymbolicExprTable& table, SymbolicExprId left, SymbolicExprId right) {
-    // Nodes of unlike identifiers differ, so the walk goes straight down to the first difference.  Only copies of NaN
-    // are equal under several identifiers; what is built on them is remembered, so that shared operands are compared
-    // once.
     std::vector<std::pair<SymbolicExprId, SymbolicExprId>> stack{{left, right}};
     boost::unordered_set<std::pair<SymbolicExprId, SymbolicExprId>> compared;
     while (!stack.empty()) {

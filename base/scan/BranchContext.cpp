@@ -1,3 +1,9 @@
+// Facts around a branch, and laws about their macros.
+//
+// Method: an index from groups of unknowns (those about one macro in one version) to facts.  related() collects facts
+// in waves from the groups of the condition.  laws() sorts the unknowns by macro, version and epoch and relates
+// neighbours.
+// Cost: push and pop O(unknowns of the fact); related() bounded by limits::factWeight and limits::factWindow.
 #include "base/scan/BranchContext.hpp"
 
 #include "base/core/Limits.hpp"
@@ -33,8 +39,7 @@ void BranchContext::pop(std::size_t size) {
 }
 
 std::vector<std::size_t> BranchContext::related(const DirectiveCondition& condition) {
-    // Between one and two windows, so that neighbours in a long chain look at the same facts and share what was
-    // decided.
+    // Between one and two windows, so that neighbours in a long chain look at the same facts and share decisions.
     constexpr std::size_t window = limits::factWindow;
     std::vector<std::size_t> result;
     std::size_t weight = 0;
@@ -112,15 +117,15 @@ BranchContext::Laws BranchContext::laws(const DirectiveCondition& condition, con
             if (value && (defined || !isLast)) {
                 const SymbolicExprId zero =
                     equal(at(Kind::Value, epochs[e]), SymbolicIntValue(table_, 0).getId(table_));
-                (isLast ? laws.undefined : laws.states).push_back(either(at(Kind::Defined, epochs[e]), zero));
+                (isLast ? laws.undefinedLaws : laws.includeLaws).push_back(either(at(Kind::Defined, epochs[e]), zero));
             }
             if (isLast || first.state.derived)
                 continue;
             const SymbolicExprId undefined = SymbolicNotExpr(table_, at(Kind::Defined, epochs[e])).getId(table_);
             if (value)
-                laws.states.push_back(
+                laws.includeLaws.push_back(
                     either(undefined, equal(at(Kind::Value, epochs[e]), at(Kind::Value, epochs[e + 1]))));
-            laws.states.push_back(either(undefined, at(Kind::Defined, epochs[e + 1])));
+            laws.includeLaws.push_back(either(undefined, at(Kind::Defined, epochs[e + 1])));
         }
     }
     return laws;

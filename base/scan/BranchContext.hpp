@@ -1,4 +1,4 @@
-// What holds where a branch begins: conditions of the branches around it, and opposites of those before it in its
+// The facts at the beginning of a branch: conditions of the branches around it, and opposites of those before it in its
 // chain.
 #pragma once
 
@@ -11,7 +11,7 @@ namespace VT {
 
 /// A condition that holds, or does not, where a branch begins.
 struct BranchFact {
-    SymbolicExprId node; ///< holds
+    SymbolicExprId node; ///< the condition that holds
     bool negated;        ///< the directive's condition does not hold
     std::uint64_t line;
     std::size_t begin; ///< the directive, in bytes
@@ -19,7 +19,7 @@ struct BranchFact {
     std::vector<MacroUnknownId> unknowns;
 };
 
-/// The facts of the open chains of one file, found by what they are about.
+/// The facts of the open chains of one file, found by the macros that they are about.
 class BranchContext {
 public:
     BranchContext(SymbolicExprTable& table, MacroUnknowns& unknowns) : table_(table), unknowns_(unknowns) {}
@@ -33,26 +33,27 @@ public:
     void negateLast();
     void pop(std::size_t size);
 
-    /// The facts that have to do with a condition, in their order: those about the same macros, then those about the
-    /// macros of these, and so on up to a bound.  Of very many about one macro the latest.
+    /// Returns the positions of the facts that are related to a condition, in order: those about the same macros, those
+    /// about the macros of these, and so on up to limits::factWeight.  Of more than limits::factWindow about one macro,
+    /// the latest.
     std::vector<std::size_t> related(const DirectiveCondition& condition);
 
-    /// What is known of how unknowns depend on each other.
+    /// How unknowns depend on each other.
     struct Laws {
-        std::vector<SymbolicExprId> states;    ///< a macro that is defined is left as it is by an #include
-        std::vector<SymbolicExprId> undefined; ///< a macro that is not defined is 0
+        std::vector<SymbolicExprId> includeLaws;   ///< an #include leaves a macro that is defined as it is
+        std::vector<SymbolicExprId> undefinedLaws; ///< a macro that is not defined is 0
     };
 
-    /// The laws about the unknowns of a condition and of facts.
+    /// Returns the laws about the unknowns of a condition and of facts.  n log n in these unknowns.
     Laws laws(const DirectiveCondition& condition, const std::vector<std::size_t>& facts);
 
 private:
     SymbolicExprTable& table_;
     MacroUnknowns& unknowns_;
     std::vector<BranchFact> facts_;
-    std::vector<std::vector<std::uint32_t>> byGroup_; ///< facts by what they are about
+    std::vector<std::vector<std::uint32_t>> byGroup_; ///< facts by group of unknowns
     std::vector<std::uint64_t> marks_;                ///< by fact: the latest question that it was related to
-    std::vector<std::uint64_t> groupMarks_;           ///< the same by what it is about
+    std::vector<std::uint64_t> groupMarks_;           ///< the same by group of unknowns
     std::uint64_t question_ = 0;
 };
 

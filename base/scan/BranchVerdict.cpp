@@ -1,3 +1,11 @@
+// Judges a condition under known facts.
+//
+// Method: a verdict is a question to the decider: disjoint from the facts, implied by them, or equivalent to a shorter
+// condition (ImpliedCondition) under them.  Reasons are minimised as in delta debugging (Zeller, Hildebrandt,
+// "Simplifying and isolating failure-inducing input", 2002): runs of facts are dropped, in halves of halves, while the
+// rest suffices.
+// Cost: at most limits::branchSteps a question; what was judged before is answered from memory.
+// Relies on: Decider, whose answers are proven or "undecided".
 #include "base/scan/BranchVerdict.hpp"
 
 #include "base/core/Limits.hpp"
@@ -25,7 +33,7 @@ BranchJudge::BranchJudge(SymbolicExprTable& table)
     table.addBoolSymbols();
 }
 
-/// The conjunction; TRUE of nothing.
+/// Joins conditions by And; no conditions yield TRUE.
 SymbolicExprId BranchJudge::all(std::span<const SymbolicExprId> facts, std::span<const SymbolicExprId> laws,
                                 std::span<const SymbolicExprId> further) {
     SymbolicExprId joined = invalidId;
@@ -40,16 +48,16 @@ void BranchJudge::charge(std::uint64_t steps) {
     stepsLeft_ -= std::min(stepsLeft_, steps);
 }
 
-/// Whether a decision is yes; it is not asked once the steps are used up.
+/// Whether a decision is "yes".  Does not ask once the steps are used up.
 template <class Ask>
 bool BranchJudge::proven(Ask ask) {
     if (stepsLeft_ == 0) {
-        gaveUp_ = true;
+        isUndecided_ = true;
         return false;
     }
     const Decision decision = ask();
     charge(decider_.stepsTaken() + 1);
-    gaveUp_ = gaveUp_ || decision.isUndecided();
+    isUndecided_ = isUndecided_ || decision.isUndecided();
     return decision.isYes();
 }
 
@@ -83,17 +91,17 @@ SymbolicExprId BranchJudge::shortened(SymbolicExprId condition, SymbolicExprId k
     const SymbolicOp op = table_.get(condition)->op();
     if (op != SymbolicOp::And && op != SymbolicOp::Or)
         return condition;
-    bool gaveUp = false; // the neighbours of what is too hard are as hard
+    bool isTooHard = false; // its neighbours are as hard
     const auto isEqual = [&](SymbolicExprId candidate) {
-        if (gaveUp)
+        if (isTooHard)
             return false;
         return proven([&] {
             Decision equal = decider_.equivalentGiven(candidate, condition, known);
-            gaveUp = equal.bound == DecisionBound::Steps;
+            isTooHard = equal.bound == DecisionBound::Steps;
             return equal;
         });
     };
-    std::uint64_t nodes = 0; // what is tried is made of them, at most each time with one of them left out
+    std::uint64_t nodes = 0; // each candidate leaves out one of them
     walkDistinct(
         table_, condition, [&](SymbolicExprId, const SymbolicExpr&) { ++nodes; }, [](SymbolicExprId) {});
     charge(std::min<std::uint64_t>(nodes * nodes, limits::impliedNodes));
@@ -109,22 +117,23 @@ bool BranchJudge::beginBranch() noexcept {
 
 BranchVerdict BranchJudge::judge(SymbolicExprId condition, const KnownConditions& known) {
     beginQuestion();
-    const Question question{condition, all(known.facts, known.laws, known.deathLaws), all(known.facts, known.laws, {})};
+    const Question question{condition, all(known.facts, known.includeLaws, known.undefinedLaws),
+                            all(known.facts, known.includeLaws, {})};
     auto judged = judged_.find(question);
     if (judged == judged_.end()) {
         const BranchVerdict verdict = decide(question);
-        judged = judged_.emplace(question, Judged{verdict, limits::branchSteps - stepsLeft_, gaveUp_}).first;
+        judged = judged_.emplace(question, Judged{verdict, limits::branchSteps - stepsLeft_, isUndecided_}).first;
     }
-    // What was judged before costs what it cost then, so that a file's findings do not depend on those before it.
-    const auto& [verdict, steps, gaveUp] = judged->second;
+    // An earlier verdict costs again what it cost then, so that a file's findings do not depend on the files before it.
+    const auto& [verdict, steps, isUndecided] = judged->second;
     spend(steps);
-    givenUp_ += gaveUp ? 1U : 0U;
+    givenUp_ += isUndecided ? 1U : 0U;
     return verdict;
 }
 
 void BranchJudge::beginQuestion() {
     stepsLeft_ = limits::branchSteps;
-    gaveUp_ = false;
+    isUndecided_ = false;
 }
 
 void BranchJudge::spend(std::uint64_t steps) {
@@ -139,8 +148,9 @@ std::vector<std::size_t> BranchJudge::reasons(SymbolicExprId condition, const Br
     const auto suffices = [&](const std::vector<std::size_t>& positions) {
         std::vector<SymbolicExprId> facts(positions.size());
         std::ranges::transform(positions, facts.begin(), [&](std::size_t at) { return known.facts[at]; });
-        return holds(verdict, condition,
-                     all(facts, known.laws, toShorten ? std::span<const SymbolicExprId>() : known.deathLaws));
+        return holds(
+            verdict, condition,
+            all(facts, known.includeLaws, toShorten ? std::span<const SymbolicExprId>() : known.undefinedLaws));
     };
     // The last facts that are enough, then without whole runs of them, then without shorter ones.
     std::vector<std::size_t> kept;

@@ -1,4 +1,4 @@
-// What a condition comes to where something is known.
+// Judges a condition under known facts: dead, always true, or equivalent to a shorter one.
 #pragma once
 
 #include "base/core/Limits.hpp"
@@ -13,44 +13,46 @@
 
 namespace VT {
 
+/// What is proven about a condition where known ones hold.
 enum class BranchVerdictKind : std::uint8_t {
-    None,
+    None,       ///< nothing
     Dead,       ///< the condition never holds
     AlwaysTrue, ///< it always holds
     Removable,  ///< a shorter one holds in the same cases
 };
 
+/// A verdict and, for Removable, the condition to write instead.
 struct BranchVerdict {
     BranchVerdictKind kind = BranchVerdictKind::None;
     SymbolicExprId shorter = invalidId;
 };
 
-/// What is known where a condition stands, as nodes that all hold.
+/// The conditions that hold where another one is judged.
 struct KnownConditions {
     std::vector<SymbolicExprId> facts;
-    std::vector<SymbolicExprId> laws;      ///< that count for every verdict
-    std::vector<SymbolicExprId> deathLaws; ///< that count for Dead and AlwaysTrue alone
+    std::vector<SymbolicExprId> includeLaws;   ///< used for every verdict
+    std::vector<SymbolicExprId> undefinedLaws; ///< used for Dead and AlwaysTrue alone
 };
 
-/// Judges conditions of one table and remembers what it judged.  Every verdict is proven; where the steps for a
-/// question or for its file are used up, the verdict is the one proven by then, or none.
+/// Judges conditions of one table and remembers its verdicts.  Every verdict is proven; where the steps for a question
+/// or for its file are used up, the verdict is the one proven by then, or None.
 class BranchJudge {
 public:
     explicit BranchJudge(SymbolicExprTable& table);
 
-    /// The questions that follow are about another file.
+    /// Starts the budget of another file.
     void beginFile() noexcept { fileStepsLeft_ = limits::scanSteps; }
 
-    /// The question that follows is about the next condition; false where no steps are left for one.
+    /// Adds the budget of the next condition; false where no steps are left for it.
     bool beginBranch() noexcept;
 
-    /// What holds never or always where nothing that is known can be so is not judged.
+    /// Judges a condition under known ones.  Yields None where the known ones contradict each other.
     BranchVerdict judge(SymbolicExprId condition, const KnownConditions& known);
-    /// Positions of the facts that a verdict follows from, the fewest found within the steps.
+    /// Returns the positions of the facts that a verdict follows from, the fewest found within the steps.
     std::vector<std::size_t> reasons(SymbolicExprId condition, const BranchVerdict& verdict,
                                      const KnownConditions& known);
 
-    /// Conditions about which something was not decided, and steps of all questions.
+    /// Number of conditions with an undecided question, and steps of all questions.
     [[nodiscard]] std::uint64_t givenUp() const noexcept { return givenUp_; }
 
     [[nodiscard]] std::uint64_t steps() const noexcept { return steps_; }
@@ -70,7 +72,7 @@ private:
     struct Judged {
         BranchVerdict verdict;
         std::uint64_t steps;
-        bool gaveUp; ///< a decision on the way
+        bool isUndecided; ///< a decision on the way was
     };
 
     void beginQuestion();
@@ -88,9 +90,9 @@ private:
     Decider decider_;
     SymbolicExprPrinter printer_;
     std::unordered_map<Question, Judged, QuestionHash> judged_;
-    std::int64_t fileStepsLeft_ = 0; ///< a question may leave a debt, which the conditions behind it pay off
+    std::int64_t fileStepsLeft_ = 0; ///< a question may leave a debt, which later conditions pay off
     std::uint64_t stepsLeft_ = 0;    ///< of the question
-    bool gaveUp_ = false;            ///< a decision of the question
+    bool isUndecided_ = false;       ///< a decision of the question was
     std::uint64_t givenUp_ = 0;
     std::uint64_t steps_ = 0;
 };

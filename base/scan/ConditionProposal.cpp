@@ -1,3 +1,6 @@
+// Writes shortened conditions in the words of their author: parts are looked up by node among the spellings of the
+// condition, and && and || between them are written with an explicit stack.  Linear in the shorter condition, times the
+// spellings.
 #include "base/scan/ConditionProposal.hpp"
 
 #include <algorithm>
@@ -6,7 +9,7 @@ namespace VT {
 
 namespace {
 
-/// The text of a part that is no chain of && or ||.
+/// Returns the text of a part that is not a chain of && or ||.
 std::optional<std::string> partText(const SymbolicExprTable& table, const MacroUnknowns& unknowns,
                                     const DirectiveCondition& condition, std::span<const DirectiveToken> tokens,
                                     SymbolicExprId part) {

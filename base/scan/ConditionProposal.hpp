@@ -9,8 +9,8 @@
 
 namespace VT {
 
-/// The text of a condition that was made from parts of another one, which is given with its tokens: the parts as they
-/// are written there, and further comparisons in ordinary spelling.  Nothing where there is no such text.
+/// Returns the text of `proposal`, which was made from parts of `condition`: the parts as they are written in its
+/// tokens, and further comparisons in ordinary spelling.  Nothing where a part has no such text.
 std::optional<std::string> proposalText(const SymbolicExprTable& table, const MacroUnknowns& unknowns,
                                         const DirectiveCondition& condition, std::span<const DirectiveToken> tokens,
                                         SymbolicExprId proposal);

@@ -1,3 +1,5 @@
+// Arithmetic of directives: exact where the standard defines the result, refused where it does not or where compilers
+// differ (overflow, division by zero, shifts by too much).  O(1), reading linear in the token.
 #include "base/scan/ConstantArithmetic.hpp"
 
 #include "base/integer/ExactArithmetic.hpp"
@@ -13,7 +15,7 @@ constexpr DirectiveConstant truth(bool holds) {
     return {holds ? 1U : 0U, false};
 }
 
-/// Whether letters behind a number are the suffix of an integer.
+/// Whether the letters after a number are the suffix of an integer.
 bool isSuffix(std::string_view suffix, bool& isUnsigned) {
     std::string letters;
     for (const char c : suffix)

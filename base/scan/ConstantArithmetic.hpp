@@ -1,4 +1,4 @@
-// Integers as the preprocessor computes them: of 64 bits, signed or unsigned.
+// Integers of directives: 64 bits, signed or unsigned, as the preprocessor computes.
 #pragma once
 
 #include "base/core/Operators.hpp"
@@ -9,6 +9,7 @@
 
 namespace VT {
 
+/// An integer constant of a directive.
 struct DirectiveConstant {
     std::uint64_t bits = 0;
     bool isUnsigned = false;
@@ -18,11 +19,11 @@ struct DirectiveConstant {
     [[nodiscard]] bool isNegative() const noexcept { return !isUnsigned && asSigned() < 0; }
 };
 
-/// The value of an integer or character constant as it is written; nothing where it is none, or where compilers differ.
+/// Returns the value of an integer or character constant; nothing for other texts, and where compilers differ.
 std::optional<DirectiveConstant> readConstant(std::string_view number);
 std::optional<DirectiveConstant> readCharacter(std::string_view quoted);
 
-/// The value of an operation; nothing where it has none: an overflow, a division by zero, a shift beyond the bits.
+/// Computes an operation; nothing for an overflow, a division by zero, a shift by too many bits.
 std::optional<DirectiveConstant> computeConstant(SymbolicOp op, DirectiveConstant a);
 std::optional<DirectiveConstant> computeConstant(SymbolicOp op, DirectiveConstant a, DirectiveConstant b);
 

@@ -1,3 +1,10 @@
+// Reads conditions of directives as nodes.
+//
+// Method: operator precedence on two stacks.  An operand is a constant, a truth value, a value of a macro or another
+// term; operators (DirectiveOperators.cpp) compute constants, compare, join, or make a term.  Terms become nodes only
+// where they are compared or used as a truth value.  A condition that cannot be read is one unknown.
+// Cost: linear in the tokens but for the texts of nested terms, which limits::conditionTexts bounds.
+// Relies on: MacroUnknowns for the unknowns, MacroStates for the states in which macros are read.
 #include "base/scan/DirectiveCondition.hpp"
 
 #include "base/core/Limits.hpp"
@@ -46,7 +53,7 @@ SymbolicOp infixOf(const DirectiveToken& token) {
     return mayBe && known != infixOperators.end() ? known->second : SymbolicOp::None;
 }
 
-/// The operator of a prefix; Plus for a plus, None for none.
+/// Returns the operator of a prefix; Plus for a plus, None for other tokens.
 SymbolicOp prefixOf(const DirectiveToken& token) {
     const std::string_view text = token.text;
     return text == "!" || text == "not"     ? SymbolicOp::Not
@@ -56,7 +63,7 @@ SymbolicOp prefixOf(const DirectiveToken& token) {
                                             : SymbolicOp::None;
 }
 
-/// Whether a condition with the token means what nothing in the file tells: #machine(x), a name spelled in another way.
+/// Whether the file does not determine the meaning of a token: #machine(x), a name that may be spelled in another way.
 bool isUncertain(const DirectiveToken& token) {
     return token.text == "#" || isOddName(token);
 }
@@ -101,7 +108,7 @@ DirectiveCondition DirectiveConditionReader::read(const Directive& directive) {
     return std::move(condition_);
 }
 
-/// An unknown as a whole: equal conditions are still equal.
+/// Reads the condition as one unknown: equal texts are still equal.
 void DirectiveConditionReader::readAsWhole() {
     condition_ = {};
     condition_.understood = false;
@@ -287,7 +294,7 @@ SymbolicExprId DirectiveConditionReader::truth(const Operand& operand) {
     return node;
 }
 
-/// The symbol of a value or a term.
+/// Returns the symbol of a value or a term.
 SymbolicExprId DirectiveConditionReader::symbol(const Operand& operand) {
     if (operand.kind == Operand::Kind::Value)
         return use(unknowns_.value(states_.nameOf(tokens_[operand.innerFirst].text)));
@@ -309,7 +316,7 @@ std::string DirectiveConditionReader::text(std::uint32_t first, std::uint32_t la
     return spelledTokens(tokens_.subspan(first, last - first + 1), compact);
 }
 
-/// The macros that a text names.
+/// Returns the macros that a text names.
 std::vector<MacroStates::Name> DirectiveConditionReader::macros(std::uint32_t first, std::uint32_t last) {
     std::vector<MacroStates::Name> names;
     for (std::uint32_t i = first; i <= last; ++i)

@@ -1,7 +1,7 @@
 // Conditions of #if and #elif become nodes.
 //
-// A macro stands for one integer, signed or unsigned, of 64 bits; one that is not defined is 0.  Understood are && ||
-// !, defined, and comparisons of a macro with a constant that is the same integer for both kinds of macros: not
+// A macro stands for one integer, signed or unsigned, of 64 bits; one that is not defined is 0.  The reader understands
+// && || !, defined, and comparisons of a macro with a constant that is the same integer for both kinds of macros: not
 // negative, not unsigned where it is ordered, and no more than an int.  Any other comparison of two terms is an unknown
 // of its own that is negative, zero or positive, so that A < B and A >= B are opposites but nothing follows for a third
 // macro: one of them may be unsigned.  Other arithmetic is an unknown of its own, equal where its text is equal; so are
@@ -21,23 +21,24 @@
 
 namespace VT {
 
-/// How a part of a condition is written: tokens from `first` to `last`.
+/// The spelling of a part of a condition: tokens from `first` to `last`.
 struct PartSpelling {
     SymbolicExprId part;
     std::uint32_t first;
     std::uint32_t last;
 };
 
+/// A condition that was read: its node, the unknowns in it, and how its parts are written.
 struct DirectiveCondition {
     SymbolicExprId node = invalidId;
-    std::optional<bool> constant;         ///< a switch as a whole
-    bool understood = true;               ///< false: an unknown as a whole
+    std::optional<bool> constant;         ///< of a condition that is a switch
+    bool understood = true;               ///< false for a condition that is one unknown
     bool bracketed = false;               ///< && is in parentheses between ||
     std::vector<MacroUnknownId> unknowns; ///< each once
-    std::vector<PartSpelling> spellings;  ///< of what && and || join
+    std::vector<PartSpelling> spellings;  ///< of the parts that && and || join
 };
 
-/// The text of tokens: with one blank where there was any, or with none that is not needed.
+/// Returns the text of tokens, with one blank where there was any; if `compact`, only where the tokens would join.
 std::string spelledTokens(std::span<const DirectiveToken> tokens, bool compact = false);
 
 /// Reads conditions of one file, in its order.

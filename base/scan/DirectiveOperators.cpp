@@ -1,4 +1,5 @@
-// What operators of directives' conditions make of their operands.
+// Applies the operators of directives' conditions to operands that were read.  O(1), or the length of a text where an
+// operand becomes an unknown.
 #include "base/decide/shorten/ImpliedCondition.hpp"
 #include "base/scan/DirectiveCondition.hpp"
 

@@ -1,3 +1,10 @@
+// Finds the directives of a C or C++ file.
+//
+// Method: the translation phases of the C standard that matter for directives, in one pass: splices, comments and
+// literals are skipped in place, by a table that classifies bytes.  Only directives become tokens; of code, only names
+// that hint at a pragma operator.
+// Cost: linear in the text.  A raw string without an end costs a search to the end of the file, so their number is
+// bounded (limits::endlessRawStrings).  Tokens are views of the text, but for those with a splice inside.
 #include "base/scan/DirectiveReader.hpp"
 
 #include "base/core/Limits.hpp"
@@ -41,7 +48,7 @@ bool isRawPrefix(std::string_view name) {
     return name == "R" || name == "LR" || name == "uR" || name == "UR" || name == "u8R";
 }
 
-constexpr std::size_t longestRawDelimiter = 16;
+constexpr std::size_t rawDelimiterLength = 16;
 
 constexpr auto keywords = std::to_array<std::pair<std::string_view, DirectiveKind>>({
     {"if", DirectiveKind::If},
@@ -64,8 +71,8 @@ constexpr auto longOperators =
     std::to_array<std::string_view>({"&&", "||", "==", "!=", "<=", ">=", "<<", ">>", "##", "->"});
 constexpr std::string_view shortOperators = "()!~+-*/%<>&^|?:,=#.;[]{}";
 
-/// Names in code that tell a pragma operator: a macro may make one from arguments with any of the others.
-bool tellsPragma(std::string_view name) {
+/// Names in code that hint at a pragma operator: a macro may make one from arguments with any of the others.
+bool hintsAtPragma(std::string_view name) {
     return name == "_Pragma" || name == "__pragma" || name == "pop_macro" || name == "GCC" || name == "clang";
 }
 
@@ -92,7 +99,7 @@ DirectiveReader::DirectiveReader(std::string_view text) : text_(text) {
         place_ = 3;
 }
 
-std::size_t DirectiveReader::behindSplices(std::size_t place) const {
+std::size_t DirectiveReader::afterSplices(std::size_t place) const {
     while (at(place) == '\\') {
         std::size_t end = place + 1;
         while (end < text_.size() && classOf(text_[end]) == Class::Blank)
@@ -107,15 +114,15 @@ std::size_t DirectiveReader::behindSplices(std::size_t place) const {
 bool DirectiveReader::beginsComment(std::size_t place) const {
     if (at(place) != '/')
         return false;
-    const char next = at(behindSplices(place + 1));
+    const char next = at(afterSplices(place + 1));
     return next == '/' || next == '*';
 }
 
-std::size_t DirectiveReader::behindComment(std::size_t place) const {
-    place = behindSplices(place + 1);
+std::size_t DirectiveReader::afterComment(std::size_t place) const {
+    place = afterSplices(place + 1);
     if (at(place++) == '*') {
         while ((place = text_.find('*', place)) != std::string_view::npos) {
-            const std::size_t next = behindSplices(++place);
+            const std::size_t next = afterSplices(++place);
             if (at(next) == '/')
                 return next + 1;
         }
@@ -132,33 +139,33 @@ std::size_t DirectiveReader::behindComment(std::size_t place) const {
     return text_.size();
 }
 
-/// The place behind a literal; that of the end of its line where it has no end.
-std::size_t DirectiveReader::behindQuoted(std::size_t place) const {
+/// Returns the place after a literal; the end of its line for a literal without an end.
+std::size_t DirectiveReader::afterQuoted(std::size_t place) const {
     const char quote = text_[place++];
     while (place < text_.size() && text_[place] != quote && text_[place] != '\n') {
         if (text_[place] != '\\') {
             ++place;
             continue;
         }
-        const std::size_t next = behindSplices(place);
-        place = next != place ? next : behindSplices(place + 1) + 1; // a splice, or an escaped character
+        const std::size_t next = afterSplices(place);
+        place = next != place ? next : afterSplices(place + 1) + 1; // a splice, or an escaped character
     }
     return at(place) == quote ? place + 1 : std::min(place, text_.size());
 }
 
-/// The place behind a header's name in angle brackets; that of its beginning where it does not end on its line.
-std::size_t DirectiveReader::behindHeaderName(std::size_t place) const {
-    for (std::size_t at = place; at < text_.size() && text_[at] != '\n'; at = std::max(at + 1, behindSplices(at)))
+/// Returns the place after a header's name in angle brackets; its beginning where it does not end on its line.
+std::size_t DirectiveReader::afterHeaderName(std::size_t place) const {
+    for (std::size_t at = place; at < text_.size() && text_[at] != '\n'; at = std::max(at + 1, afterSplices(at)))
         if (text_[at] == '>')
             return at + 1;
     return place;
 }
 
-/// The place behind a raw string whose quote is given; the place of the quote where it is none.
-std::size_t DirectiveReader::behindRawString(std::size_t quote) {
+/// Returns the place after the raw string with this quote; the quote itself where it is not a raw string.
+std::size_t DirectiveReader::afterRawString(std::size_t quote) {
     if (endlessRawStrings_ == limits::endlessRawStrings)
         return quote;
-    const std::size_t open = text_.substr(0, quote + 2 + longestRawDelimiter).find('(', quote + 1);
+    const std::size_t open = text_.substr(0, quote + 2 + rawDelimiterLength).find('(', quote + 1);
     if (open == std::string_view::npos)
         return quote;
     const std::string_view delimiter = text_.substr(quote + 1, open - quote - 1);
@@ -171,14 +178,14 @@ std::size_t DirectiveReader::behindRawString(std::size_t quote) {
     return close == std::string_view::npos ? quote : close + end.size();
 }
 
-/// Passes blanks, comments and splices; whether there were any.
+/// Skips blanks, comments and splices; returns whether there were any.
 bool DirectiveReader::skipBlanks() {
     const std::size_t before = place_;
     while (place_ < text_.size()) {
         const Class kind = classOf(text_[place_]);
         const std::size_t next = kind == Class::Blank                            ? place_ + 1
-                                 : kind == Class::Backslash                      ? behindSplices(place_)
-                                 : kind == Class::Slash && beginsComment(place_) ? behindComment(place_)
+                                 : kind == Class::Backslash                      ? afterSplices(place_)
+                                 : kind == Class::Slash && beginsComment(place_) ? afterComment(place_)
                                                                                  : place_;
         if (next == place_)
             break;
@@ -188,7 +195,8 @@ bool DirectiveReader::skipBlanks() {
     return place_ != before;
 }
 
-/// Passes the rest of a logical line; the place of the first name in it that tells a pragma operator, or npos.
+/// Skips the rest of a logical line; returns the place of the first name in it that hints at a pragma operator, or
+/// npos.
 std::size_t DirectiveReader::skipLine() {
     std::size_t pragma = std::string_view::npos;
     while (place_ < text_.size()) {
@@ -204,24 +212,24 @@ std::size_t DirectiveReader::skipLine() {
                    (isOfName(text_[place_]) || (number && text_[place_] == '\'' && isOfName(at(place_ + 1)))))
                 ++place_;
             std::string_view name = text_.substr(begin, place_ - begin);
-            if (behindSplices(place_) != place_) {
+            if (afterSplices(place_) != place_) {
                 place_ = begin;
                 name = readRun(number);
             }
             if (at(place_) == '"' && isRawPrefix(name))
-                place_ = behindRawString(place_);
-            if (pragma == std::string_view::npos && tellsPragma(name))
+                place_ = afterRawString(place_);
+            if (pragma == std::string_view::npos && hintsAtPragma(name))
                 pragma = begin;
             break;
         }
         case Class::Slash:
-            place_ = beginsComment(place_) ? behindComment(place_) : place_ + 1;
+            place_ = beginsComment(place_) ? afterComment(place_) : place_ + 1;
             break;
         case Class::Quote:
-            place_ = behindQuoted(place_);
+            place_ = afterQuoted(place_);
             break;
         case Class::Backslash:
-            place_ = std::max(place_ + 1, behindSplices(place_));
+            place_ = std::max(place_ + 1, afterSplices(place_));
             break;
         default:
             ++place_;
@@ -230,7 +238,7 @@ std::size_t DirectiveReader::skipLine() {
     return pragma;
 }
 
-/// A name, or what the preprocessor takes for a number; a text of its own where splices were inside.
+/// Reads a name or a preprocessing number; one with splices inside is copied without them.
 std::string_view DirectiveReader::readRun(bool number) {
     std::size_t begin = place_;
     std::string* joined = nullptr;
@@ -244,7 +252,7 @@ std::string_view DirectiveReader::readRun(bool number) {
                 break;
             ++place_;
         }
-        const std::size_t next = behindSplices(place_);
+        const std::size_t next = afterSplices(place_);
         if (next == place_ || !isOfName(at(next)))
             break;
         if (joined == nullptr)
@@ -263,8 +271,8 @@ bool DirectiveReader::readToken(bool afterBlank, bool mayBeHeader, DirectiveToke
     const std::size_t begin = place_;
     const char c = text_[begin];
     token = {DirectiveTokenKind::Other, afterBlank, {}, begin, begin};
-    const std::size_t next = behindSplices(begin + 1);
-    if (const std::size_t header = mayBeHeader && c == '<' ? behindHeaderName(begin) : begin; header != begin) {
+    const std::size_t next = afterSplices(begin + 1);
+    if (const std::size_t header = mayBeHeader && c == '<' ? afterHeaderName(begin) : begin; header != begin) {
         token.kind = DirectiveTokenKind::String;
         token.text = text_.substr(begin, header - begin);
         place_ = header;
@@ -275,19 +283,19 @@ bool DirectiveReader::readToken(bool afterBlank, bool mayBeHeader, DirectiveToke
         token.kind = DirectiveTokenKind::Name;
         token.text = readRun(false);
         const bool raw = at(place_) == '"' && isRawPrefix(token.text);
-        const std::size_t end = raw ? behindRawString(place_) : place_;
+        const std::size_t end = raw ? afterRawString(place_) : place_;
         const bool prefix = token.text == "L" || token.text == "u" || token.text == "U" || token.text == "u8";
         if (raw && end != place_)
             token.kind = DirectiveTokenKind::String;
         else if (prefix && classOf(at(place_)) == Class::Quote)
             token.kind = at(place_) == '"' ? DirectiveTokenKind::String : DirectiveTokenKind::Other;
         if (token.kind != DirectiveTokenKind::Name) {
-            place_ = raw ? end : behindQuoted(place_);
+            place_ = raw ? end : afterQuoted(place_);
             token.text = text_.substr(begin, place_ - begin);
         }
     } else if (classOf(c) == Class::Quote) {
         token.kind = c == '"' ? DirectiveTokenKind::String : DirectiveTokenKind::Character;
-        place_ = behindQuoted(begin);
+        place_ = afterQuoted(begin);
         token.text = text_.substr(begin, place_ - begin);
     } else {
         for (const std::string_view spelling : longOperators) {
@@ -316,7 +324,7 @@ std::uint64_t DirectiveReader::lineOf(std::size_t place) {
     return line_;
 }
 
-/// Reads a directive behind its mark; false for a kind that is of no interest.
+/// Reads a directive after its #; false for a kind that is ignored.
 bool DirectiveReader::readDirective(Directive& directive) {
     directive.line = lineOf(directive.begin);
     skipBlanks();
@@ -332,9 +340,9 @@ bool DirectiveReader::readDirective(Directive& directive) {
     directive.keywordEnd = directive.end = place_;
     commentPassed_ = false;
     bool blank = skipBlanks();
-    if (directive.kind == DirectiveKind::Include) { // a header's name is no token: <sys//types.h>
+    if (directive.kind == DirectiveKind::Include) { // a header's name is not a token: <sys//types.h>
         if (at(place_) == '<')
-            place_ = behindHeaderName(place_);
+            place_ = afterHeaderName(place_);
         skipLine();
         return true;
     }
@@ -357,7 +365,7 @@ void DirectiveReader::readTokens(Directive& directive, bool blank) {
     directive.tokens = tokens_;
 }
 
-/// Passes the beginning of an import declaration, import <a.h>;  Stays where there is none.
+/// Skips the beginning of an import declaration, `import <a.h>`, if there is one; returns whether there was.
 bool DirectiveReader::skipImport() {
     const std::size_t begin = place_;
     const auto nextWord = [&] {
@@ -373,14 +381,14 @@ bool DirectiveReader::skipImport() {
     const char next = at(place_);
     if (word == "import" && (next == '<' || next == '"' || classOf(next) == Class::Name)) {
         if (next == '<')
-            place_ = behindHeaderName(place_);
+            place_ = afterHeaderName(place_);
         return true;
     }
     place_ = begin;
     return false;
 }
 
-/// Reads a line of code; whether it is an import declaration or may hold a pragma operator.
+/// Reads a line of code; returns whether it is an import declaration or may hold a pragma operator.
 bool DirectiveReader::readCode(Directive& directive) {
     const bool isImport = skipImport();
     const std::size_t pragma = skipLine();
@@ -403,13 +411,13 @@ bool DirectiveReader::next(Directive& directive) {
         joined_.clear();
         directive = {};
         directive.begin = place_;
-        const bool digraph = at(place_) == '%' && at(behindSplices(place_ + 1)) == ':';
+        const bool digraph = at(place_) == '%' && at(afterSplices(place_ + 1)) == ':';
         if (at(place_) != '#' && !digraph) {
             if (readCode(directive))
                 return true;
             continue;
         }
-        place_ = digraph ? behindSplices(place_ + 1) + 1 : place_ + 1;
+        place_ = digraph ? afterSplices(place_ + 1) + 1 : place_ + 1;
         if (readDirective(directive))
             return true;
         skipLine();

@@ -17,16 +17,19 @@ namespace VT {
 /// carriage returns end lines.  Linear in the text.
 [[nodiscard]] bool hasManyReadings(std::string_view text);
 
+/// The kind of a preprocessing token; Other for everything that is not one of the kinds.
 enum class DirectiveTokenKind : std::uint8_t { Name, Number, Character, String, Operator, Other };
 
+/// A token of a directive.
 struct DirectiveToken {
     DirectiveTokenKind kind;
-    bool afterBlank;       ///< blanks or a comment stand before it
+    bool afterBlank;       ///< blanks or a comment precede it
     std::string_view text; ///< without line splices; operators in their ordinary spelling
     std::size_t begin;     ///< byte offsets in the file
     std::size_t end;
 };
 
+/// The directives that conditions depend on; all others are skipped.
 enum class DirectiveKind : std::uint8_t {
     If,
     Ifdef,
@@ -42,25 +45,25 @@ enum class DirectiveKind : std::uint8_t {
     Pragma,  ///< and lines of code with a pragma operator
 };
 
+/// A directive and its tokens.  Valid until the next one is read.
 struct Directive {
     DirectiveKind kind;
     bool hasComment;    ///< between the keyword and the last token
     std::uint64_t line; ///< from 1
-    std::size_t begin;  ///< byte offsets: of the #, of the keyword, behind the keyword, behind the last token
+    std::size_t begin;  ///< byte offsets: of the #, of the keyword, after the keyword, after the last token
     std::size_t keyword;
     std::size_t keywordEnd;
     std::size_t end;
-    std::span<const DirectiveToken> tokens; ///< behind the keyword; of code from the pragma operator on
+    std::span<const DirectiveToken> tokens; ///< after the keyword; of code from the pragma operator on
 };
 
-/// Reads the directives of a text one by one, as a C preprocessor finds them: behind line splices and comments, not in
+/// Reads the directives of a text one by one, as a C preprocessor finds them: after line splices and comments, not in
 /// comments, string literals, character constants and raw strings.  Blanks between a backslash and the end of its line
-/// are overlooked.  There are no trigraphs.  What follows `import` at the beginning of a line is an inclusion.  A
-/// literal that does not end on its line ends with it, as in prose that is left out; what looks like a raw string
-/// without an end is an ordinary string.
+/// are ignored.  Trigraphs are not replaced.  An `import` at the beginning of a line is an inclusion.  A literal that
+/// does not end on its line ends with it, as in prose that is left out; a raw string without an end is an ordinary
+/// string.
 ///
-/// Code is read for what may be a pragma operator: _Pragma, __pragma, and names that arguments of a macro made of one
-/// hold.
+/// Code is searched for possible pragma operators: _Pragma, __pragma, and names in arguments of macros that make one.
 ///
 /// Linear in the text, which may be any bytes and outlives the reader.
 class VTSYM_API DirectiveReader {
@@ -73,12 +76,12 @@ public:
 private:
     [[nodiscard]] char at(std::size_t place) const { return place < text_.size() ? text_[place] : '\0'; }
 
-    [[nodiscard]] std::size_t behindSplices(std::size_t place) const;
+    [[nodiscard]] std::size_t afterSplices(std::size_t place) const;
     [[nodiscard]] bool beginsComment(std::size_t place) const;
-    [[nodiscard]] std::size_t behindComment(std::size_t place) const;
-    [[nodiscard]] std::size_t behindQuoted(std::size_t place) const;
-    [[nodiscard]] std::size_t behindRawString(std::size_t quote);
-    [[nodiscard]] std::size_t behindHeaderName(std::size_t place) const;
+    [[nodiscard]] std::size_t afterComment(std::size_t place) const;
+    [[nodiscard]] std::size_t afterQuoted(std::size_t place) const;
+    [[nodiscard]] std::size_t afterRawString(std::size_t quote);
+    [[nodiscard]] std::size_t afterHeaderName(std::size_t place) const;
     bool skipBlanks();
     std::size_t skipLine();
     bool skipImport();

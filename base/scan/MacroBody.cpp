@@ -1,3 +1,5 @@
+// Classifies the definition of a macro by its tokens: one operand, another macro, or operators that may come apart.
+// Linear in the tokens.
 #include "base/scan/MacroBody.hpp"
 
 #include <algorithm>
@@ -13,8 +15,8 @@ bool is(Tokens tokens, std::size_t at, std::string_view text) {
     return at < tokens.size() && tokens[at].text == text;
 }
 
-/// The position after the parenthesis that closes the one at the front; that of the end where there is none.
-std::size_t behindParentheses(Tokens tokens) {
+/// Returns the position after the parenthesis that closes the first one; beyond the end where none does.
+std::size_t afterParentheses(Tokens tokens) {
     std::size_t open = 0;
     for (std::size_t i = 0; i < tokens.size(); ++i) {
         open += tokens[i].text == "(" ? 1U : 0U;
@@ -46,8 +48,8 @@ MacroBody formOf(Tokens body, Tokens parameters) {
     if (is(body, 0, "defined") && body.size() == 2)
         return {};
     if (is(body, 0, "("))
-        return {.form = behindParentheses(body) == body.size() ? Form::Operand : Form::Open};
-    if (body.size() > 1 && !(is(body, 1, "(") && behindParentheses(body.subspan(1)) == body.size() - 1))
+        return {.form = afterParentheses(body) == body.size() ? Form::Operand : Form::Open};
+    if (body.size() > 1 && !(is(body, 1, "(") && afterParentheses(body.subspan(1)) == body.size() - 1))
         return {.form = Form::Open};
     if (body.empty() || body.front().kind != DirectiveTokenKind::Name)
         return {.form = body.size() > 1 ? Form::Open : Form::Operand};
@@ -95,7 +97,7 @@ bool isOddName(const DirectiveToken& token) {
 MacroBody readMacroBody(Tokens definition) {
     const bool isFunction = is(definition, 0, "(") && !definition.front().afterBlank;
     const std::size_t begin =
-        isFunction ? std::min<std::size_t>(behindParentheses(definition), definition.size()) : std::size_t{0};
+        isFunction ? std::min<std::size_t>(afterParentheses(definition), definition.size()) : std::size_t{0};
     const Tokens body = definition.subspan(begin);
     MacroBody result = formOf(body, definition.first(begin));
     result.varies = hasPaste(body) || std::ranges::any_of(body, isOddName);
@@ -107,7 +109,7 @@ bool pragmaChangesMacros(Tokens tokens) {
     const auto anyHolds = [&](std::string_view word) {
         return std::ranges::any_of(tokens, [&](const DirectiveToken& token) { return holds(token, word); });
     };
-    // Options of the compiler set predefined macros; what is poisoned cannot be read.
+    // Options of the compiler set predefined macros; a poisoned macro cannot be read.
     static constexpr auto ofCompiler =
         std::to_array<std::string_view>({"target", "optimize", "pop_options", "reset_options", "poison"});
     static constexpr auto others = std::to_array<std::string_view>({"pop_macro", "include_alias"});

@@ -1,4 +1,4 @@
-// What the definition of a macro means for the conditions that use it.
+// Classifies the definition of a macro by its effect on the conditions that use it.
 #pragma once
 
 #include "base/scan/DirectiveReader.hpp"
@@ -8,18 +8,18 @@
 
 namespace VT {
 
-/// The tokens of a definition after the macro's name, and what they are.
+/// The class of a definition: the tokens after the macro's name.
 struct MacroBody {
     enum class Form : std::uint8_t {
         Operand, ///< nothing, a constant, a prefix and an operand, or anything in parentheses
-        Alias,   ///< another macro's name, or a call of it: what that macro is
-        Open,    ///< operators that those around the macro may take apart, or a parameter that may be such
+        Alias,   ///< another macro's name, or a call of it: of the class of that macro
+        Open,    ///< operators that others around the macro may take apart, or a parameter that may hold such
     };
 
     Form form = Form::Operand;
     bool varies = false;      ///< its value may change though no macro does
     bool hasPragma = false;   ///< its expansion may change macros
-    std::string_view alias{}; ///< of which macro
+    std::string_view alias{}; ///< the macro of an Alias
 };
 
 /// Reads a definition.  Linear in its tokens.

@@ -1,3 +1,9 @@
+// Numbers the states of macros in the course of a file.
+//
+// Method: a counter of changes.  Each macro has the number of its last change, and everything together has a floor,
+// raised where any macro may have changed; the state of a macro is the larger of the two, and of those that its
+// definition names.  Chains of branches keep the numbers at their beginning on a stack.
+// Cost: O(1) for each change; stateOf() is linear in the macros followed, bounded by limits::macrosFollowed.
 #include "base/scan/MacroStates.hpp"
 
 #include "base/core/Limits.hpp"

@@ -1,13 +1,13 @@
-// What a file does to macros on its way.
+// The states of macros in the course of a file.
 //
 // A macro's state is a number that is new whenever its value may be.  Two readings of a macro in one state are equal;
 // nothing is known of readings in different states.
 //
-// A macro that the file defines or undefines is another one in all that follows, in the other branches of a chain too.
-// A macro that the file defines by other macros changes with them.  One that is made by joining tokens, or that hangs
-// on the line where it is read, changes between any two readings, and so does what is defined by it.  An included file
-// may define what is not defined, which is told apart by the epoch: one more for each #include, but in other branches
-// of its chain, where it was not included.
+// A macro that the file defines or undefines has a new state in all that follows, in the other branches of a chain too.
+// A macro that the file defines by other macros changes with them.  One that is made by joining tokens, or that depends
+// on the line where it is read, changes between any two readings, and so do macros that it defines.  An included file
+// may define a macro that is not defined.  The epoch records that: it grows with each #include, but not in other
+// branches of its chain, where the file was not included.
 #pragma once
 
 #include "base/scan/MacroBody.hpp"
@@ -23,6 +23,7 @@
 
 namespace VT {
 
+/// The states of all macros of one file.
 class MacroStates {
 public:
     using Name = std::uint32_t;
@@ -31,24 +32,24 @@ public:
         std::uint64_t version; ///< new with every definition that concerns the macro
         std::uint64_t epoch;   ///< new with every #include
         bool derived;          ///< the file defines the macro by others
-        bool varies = false;   ///< the value may be another one with each reading
+        bool varies = false;   ///< the value may differ with each reading
         bool operator==(const State&) const = default;
     };
 
-    /// The number of a name.  With `lasting`, the text outlives this and need not be copied.
+    /// Returns the number of a name.  With `lasting`, the text outlives this object and is not copied.
     Name nameOf(std::string_view text, bool lasting = false);
 
     [[nodiscard]] std::string_view textOf(Name name) const { return texts_[name]; }
 
-    /// The macro is defined or undefined here.
+    /// Records that the file defines or undefines the macro here.
     void change(Name name);
-    /// The macro's definition is this and holds these names.
+    /// Adds a definition of the macro, which holds these names.
     void addBody(Name name, const MacroBody& body, std::span<const Name> names);
 
-    /// Any macro may be defined or undefined.
+    /// Records that any macro may have changed.
     void changeAll() { floor_ = latestFloor_ = ++latest_; }
 
-    /// Macros that are not defined may be.
+    /// Records an #include: macros that are not defined may be from here on.
     void include() { epoch_ = ++latestEpoch_; }
 
     /// A chain of branches begins; goes on with its next branch; ends.
@@ -56,15 +57,16 @@ public:
     void nextBranch();
     void close();
 
-    /// Linear in what the macro is defined by, up to a bound; beyond it the macro varies.
+    /// Returns the state of a macro.  Linear in the macros that define it, up to limits::macrosFollowed; beyond the
+    /// bound it varies.
     State stateOf(Name name);
 
-    /// Whether the macro may stand for operators that those around it take apart: B || C in A == 1.  Costs the same;
-    /// beyond the bound it may.
+    /// Whether the macro may stand for operators that others around it take apart: `B || C` in `A == 1`.  Costs the
+    /// same; true beyond the bound.
     bool isOpen(Name name);
 
 private:
-    struct Chain { ///< what was in force where it began
+    struct Chain { ///< the numbers where it began
         std::uint64_t floor;
         std::uint64_t epoch;
         std::uint64_t latestFloor;

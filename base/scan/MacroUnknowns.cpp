@@ -1,3 +1,9 @@
+// The unknowns of conditions: one symbol for each question about a macro in one state.
+//
+// Method: hash maps from question and state to the unknown, and from node to unknown.  A symbol's name is the macro's,
+// with its state after a line break where that is not the first one, so that no macro of the file can have the same
+// name.
+// Cost: O(1) on average for each question, plus the length of the name.
 #include "base/scan/MacroUnknowns.hpp"
 
 #include <boost/container_hash/hash.hpp>
@@ -81,7 +87,7 @@ MacroStates::State MacroUnknowns::stateOf(const std::vector<MacroStates::Name>& 
     return all;
 }
 
-/// A subject that nothing else is about.
+/// Returns a subject of its own.
 MacroStates::Name MacroUnknowns::freshSubject(std::string_view text) {
     return states_.nameOf(std::string(text).append("\n").append(std::to_string(++unique_)));
 }

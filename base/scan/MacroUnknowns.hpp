@@ -1,4 +1,4 @@
-// What conditions of directives ask of macros, as unknowns of a table.
+// The unknowns of directives' conditions: questions about macros, each a symbol of a table.
 #pragma once
 
 #include "base/core/Nodes.hpp"
@@ -15,20 +15,20 @@ namespace VT {
 
 using MacroUnknownId = std::uint32_t;
 
-/// An unknown: something asked of macros in one state of theirs.
+/// An unknown: a question about macros in one state.
 struct MacroUnknown {
     enum class Kind : std::uint8_t {
         Value,      ///< of a macro; 0 where it is not defined
         Defined,    ///< whether a macro is defined
         Comparison, ///< of two terms: negative, zero or positive
-        Term,       ///< any other arithmetic, a call, a condition that was not understood
+        Term,       ///< other arithmetic, a call, a condition that was not understood
     };
 
     Kind kind;
-    MacroStates::Name subject; ///< the macro's name, or the text of what is asked
+    MacroStates::Name subject; ///< the macro's name, or the text of the question
     MacroStates::State state;
-    std::uint32_t group; ///< of what is asked about one subject in one version
-    SymbolicExprId node; ///< a symbol whose value it is
+    std::uint32_t group; ///< shared by all questions about one subject in one version
+    SymbolicExprId node; ///< its symbol
     std::string left;    ///< how the terms are written; `right` for a comparison alone
     std::string right;
 };
@@ -40,14 +40,14 @@ public:
 
     MacroUnknownId value(MacroStates::Name macro);
     MacroUnknownId defined(MacroStates::Name macro);
-    /// The same as value() or defined(), as it was asked in another state.
+    /// The same as value() or defined(), in a given state.
     MacroUnknownId asked(MacroUnknown::Kind kind, MacroStates::Name macro, const MacroStates::State& state);
-    /// What equals what has the same `key` and hangs on the same macros; the texts are how it is written.  Where one of
-    /// the macros varies, like nothing else.
+    /// Comparisons, and terms, with one `key` and one state of their macros are equal.  `left`, `right` and `text` are
+    /// how they are written.  Where one of the macros varies, a fresh unknown, equal to no other.
     MacroUnknownId comparison(const std::string& key, std::string left, std::string right,
                               const std::vector<MacroStates::Name>& macros);
     MacroUnknownId term(const std::string& key, std::string text, const std::vector<MacroStates::Name>& macros);
-    /// Like nothing else.
+    /// A fresh unknown, equal to no other.
     MacroUnknownId unique(std::string text);
 
     /// Groups are numbered from 0.
@@ -55,7 +55,7 @@ public:
 
     [[nodiscard]] const MacroUnknown& operator[](MacroUnknownId id) const { return unknowns_[id]; }
 
-    /// The unknown whose symbol is given, if it is one.
+    /// Returns the unknown of a symbol, or nullptr.
     [[nodiscard]] const MacroUnknown* find(SymbolicExprId node) const;
 
 private:

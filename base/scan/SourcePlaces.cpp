@@ -1,3 +1,5 @@
+// Lines and columns of a file.  Columns are counted from the beginning of the line, in code points; a byte that is not
+// UTF-8 counts as one.  Nothing is kept: findings are few.
 #include "base/scan/SourcePlaces.hpp"
 
 #include <algorithm>
@@ -6,7 +8,7 @@ namespace VT {
 
 namespace {
 
-/// Bytes of the character at a place: 1 for what is no UTF-8.
+/// Returns the length of the character at a place in bytes; 1 for a byte that is not UTF-8.
 std::size_t characterLength(std::string_view text, std::size_t at) {
     const auto lead = static_cast<unsigned char>(text[at]);
     const std::size_t length = lead < 0xC2 ? 1 : lead < 0xE0 ? 2 : lead < 0xF0 ? 3 : lead < 0xF5 ? 4 : 1;

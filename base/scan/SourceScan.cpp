@@ -1,4 +1,10 @@
-// One pass over the directives of a file.  What is open is on stacks: chains, and what holds inside them.
+// Scans a file for branches that are dead, always entered, or enterable by a shorter condition.
+//
+// Method: one pass over the directives with a stack of open chains.  For each condition, the facts around it that are
+// about the same macros are collected, the condition is judged under them, and the reasons are reduced to those that
+// suffice.
+// Cost: about linear in the text; limits::scanSteps and limits::scanStepsPerBranch bound the decisions.
+// Relies on: DirectiveReader, DirectiveConditionReader, BranchContext, BranchJudge.
 #include "base/scan/SourceScan.hpp"
 
 #include "base/core/Limits.hpp"
@@ -13,7 +19,7 @@ namespace VT {
 
 namespace {
 
-using Found = std::function<void(const BranchFinding&)>;
+using ReportFinding = std::function<void(const BranchFinding&)>;
 
 std::string_view keywordText(DirectiveKind kind) {
     switch (kind) {
@@ -50,7 +56,7 @@ std::string directiveText(const Directive& directive) {
     return text;
 }
 
-/// A directive as a reason quotes it.
+/// Returns a directive as a reason quotes it.
 std::string quoted(std::string text) {
     if (text.size() > limits::quotedBytes)
         text.replace(limits::quotedBytes, std::string::npos, "...");
@@ -69,13 +75,13 @@ std::string conditionText(const Directive& directive) {
 class FileScan {
 public:
     FileScan(SymbolicExprTable& table, BranchJudge& judge, const SourceScanOptions& options, SourceScanCounts& counts,
-             std::string_view text, bool isCpp, const Found& found)
+             std::string_view text, bool isCpp, const ReportFinding& reportFinding)
         : table_(table),
           judge_(judge),
           options_(options),
           counts_(counts),
           text_(text),
-          found_(found),
+          report_(reportFinding),
           unknowns_(table, states_),
           conditions_(table, states_, unknowns_, isCpp),
           context_(table, unknowns_) {}
@@ -85,12 +91,12 @@ public:
 private:
     struct Chain {
         std::size_t firstFact;
-        bool silentAround;    ///< nothing is told of the whole chain
-        bool silent = false;  ///< nothing is told inside the branch
+        bool silentAround;    ///< nothing is reported about the whole chain
+        bool silent = false;  ///< nothing is reported inside the branch
         bool hasFact = false; ///< the branch's condition is the last fact
         bool hadElse = false;
         bool switchedOn = false;              ///< a branch before is entered by a switch
-        std::optional<BranchReason> always{}; ///< the branch that is entered before those behind it
+        std::optional<BranchReason> always{}; ///< the branch that is always entered, so that later ones never are
     };
 
     [[nodiscard]] bool isSilent() const {
@@ -104,7 +110,7 @@ private:
     void judgeBranch(const Directive& directive, const DirectiveCondition& condition);
     [[nodiscard]] bool isSingle(SymbolicExprId condition) const;
     [[nodiscard]] BranchFinding finding(BranchFindingKind kind, const Directive& directive) const;
-    void tell(BranchFinding finding, const Directive& directive, std::string proposed);
+    void report(BranchFinding finding, const Directive& directive, std::string proposed);
     [[nodiscard]] BranchReason reasonOf(const BranchFact& fact) const;
 
     SymbolicExprTable& table_;
@@ -112,7 +118,7 @@ private:
     const SourceScanOptions& options_;
     SourceScanCounts& counts_;
     std::string_view text_;
-    const Found& found_;
+    const ReportFinding& report_;
     MacroStates states_;
     MacroUnknowns unknowns_;
     DirectiveConditionReader conditions_;
@@ -164,7 +170,7 @@ void FileScan::changeMacros(const Directive& directive) {
     if (tokens.empty())
         return;
     const bool isCut = tokens.size() > 1 && isOddName(tokens[1]) && tokens[1].begin == tokens[0].end;
-    if (tokens[0].kind != DirectiveTokenKind::Name || isOddName(tokens[0]) || isCut) { // who knows which macro
+    if (tokens[0].kind != DirectiveTokenKind::Name || isOddName(tokens[0]) || isCut) { // the macro is unknown
         states_.changeAll();
         return;
     }
@@ -195,7 +201,7 @@ void FileScan::beginBranch(const Directive& directive) {
         return;
     } else {
         leaveBranch();
-        if (chains_.back().hadElse) { // no chain that means anything
+        if (chains_.back().hadElse) { // not a chain with a meaning
             chains_.back().silent = true;
             return;
         }
@@ -206,7 +212,7 @@ void FileScan::beginBranch(const Directive& directive) {
     if (chain.always && !chain.switchedOn && !chain.silentAround) {
         BranchFinding dead = finding(BranchFindingKind::Dead, directive);
         dead.reasons.push_back(*chain.always);
-        tell(std::move(dead), directive, "0");
+        report(std::move(dead), directive, "0");
     }
     chain.hadElse = directive.kind == DirectiveKind::Else;
     if (!isSilent() && !chain.hadElse)
@@ -249,7 +255,7 @@ void FileScan::judgeBranch(const Directive& directive, const DirectiveCondition&
     if ((related.empty() && isSingle(condition.node)) || !judge_.beginBranch())
         return;
     BranchContext::Laws laws = context_.laws(condition, related);
-    KnownConditions known{{}, std::move(laws.states), std::move(laws.undefined)};
+    KnownConditions known{{}, std::move(laws.includeLaws), std::move(laws.undefinedLaws)};
     for (const std::size_t fact : related)
         known.facts.push_back(context_[fact].node);
     const BranchVerdict verdict = judge_.judge(condition.node, known);
@@ -272,7 +278,7 @@ void FileScan::judgeBranch(const Directive& directive, const DirectiveCondition&
     chain.silent = verdict.kind == BranchVerdictKind::Dead;
     if (verdict.kind == BranchVerdictKind::AlwaysTrue)
         chain.always = BranchReason{result.region, quoted(result.directive), true};
-    tell(std::move(result), directive, std::move(proposed));
+    report(std::move(result), directive, std::move(proposed));
 }
 
 BranchReason FileScan::reasonOf(const BranchFact& fact) const {
@@ -292,12 +298,12 @@ BranchFinding FileScan::finding(BranchFindingKind kind, const Directive& directi
     return result;
 }
 
-/// Tells a finding with what to write instead of its condition; #else has none.
-void FileScan::tell(BranchFinding finding, const Directive& directive, std::string proposed) {
+/// Reports a finding with the condition to write instead; #else has none.
+void FileScan::report(BranchFinding finding, const Directive& directive, std::string proposed) {
     if (directive.kind != DirectiveKind::Else && !directive.tokens.empty()) {
         finding.condition = conditionText(directive);
         const bool whole = !isExpression(directive.kind);
-        if (!directive.hasComment) { // a comment inside is not for us to take away
+        if (!directive.hasComment) { // replacing would drop a comment inside
             const std::size_t begin = whole ? directive.keyword : directive.tokens.front().begin;
             finding.replaced = regionOf(text_, directive.begin, directive.line, begin, directive.end);
             finding.replacement = whole ? opensChain(directive.kind) ? "if " : "elif " : "";
@@ -305,7 +311,7 @@ void FileScan::tell(BranchFinding finding, const Directive& directive, std::stri
         }
         finding.proposed = std::move(proposed);
     }
-    found_(finding);
+    report_(finding);
 }
 
 } // namespace
@@ -331,7 +337,7 @@ SourceScanner::SourceScanner(SourceScanner&&) noexcept = default;
 SourceScanner& SourceScanner::operator=(SourceScanner&&) noexcept = default;
 SourceScanner::~SourceScanner() = default;
 
-void SourceScanner::scan(std::string_view text, bool isCpp, const std::function<void(const BranchFinding&)>& found) {
+void SourceScanner::scan(std::string_view text, bool isCpp, const std::function<void(const BranchFinding&)>& report) {
     State& state = *state_;
     if (state.table->size() > limits::scanNodes)
         state.renew();
@@ -339,7 +345,7 @@ void SourceScanner::scan(std::string_view text, bool isCpp, const std::function<
     const std::uint64_t stepsBefore = judge.steps();
     const std::uint64_t givenUpBefore = judge.givenUp();
     judge.beginFile();
-    FileScan(*state.table, *state.judge, state.options, state.counts, text, isCpp, found).run();
+    FileScan(*state.table, *state.judge, state.options, state.counts, text, isCpp, report).run();
     state.counts.undecided += judge.givenUp() - givenUpBefore;
     state.counts.steps += judge.steps() - stepsBefore;
 }

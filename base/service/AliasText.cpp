@@ -1,3 +1,5 @@
+// Puts negative literals in parentheses, so that an alias means the same in every operand's place: `-1` after a minus,
+// or before a power, would read differently.  Linear in the text.
 #include "base/service/AliasText.hpp"
 
 #include <algorithm>
@@ -16,7 +18,7 @@ std::string_view trimmed(std::string_view text) {
     return text.substr(0, text.find_last_not_of(blanks) + 1);
 }
 
-/// Whether a text is a number as the preprocessor of C splits texts, in whatever base and with whatever suffix.
+/// Whether a text is a preprocessing number of C, in any base and with any suffix.
 bool isNumber(std::string_view text) {
     const std::string_view begin = text.substr(text.starts_with('.') ? 1 : 0);
     if (begin.empty() || digits.find(begin.front()) == std::string_view::npos)

@@ -1,4 +1,4 @@
-// What the service remembers of decided pairs.
+// The service's cache of decisions about pairs.
 #pragma once
 
 #include "base/decide/Decision.hpp"
@@ -10,21 +10,21 @@
 
 namespace VT {
 
-/// What may be true of two conditions; every question about a pair is one of these or its opposite.
+/// A question about two conditions; every question about a pair is one of these or its opposite.
 enum class PairQuestion : std::uint8_t {
     FirstAlone, ///< the first can hold without the second
     Both,       ///< they can hold together
     Differ,     ///< one can hold without the other
 };
 
-/// Decisions by what was asked.  Only grows, as what is in here stays right.
+/// Decisions by question.  Only grows: decisions stay right.  O(1) on average.
 class DecisionCache {
 public:
     struct Key {
         SymbolicExprId a;
         SymbolicExprId b;
         PairQuestion question;
-        unsigned mode; ///< what the decider was told: ServiceParts::decisionMode()
+        unsigned mode; ///< of the decider: ServiceParts::decisionMode()
         bool operator==(const Key&) const = default;
 
         friend std::size_t hash_value(const Key& key) noexcept {

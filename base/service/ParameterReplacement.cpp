@@ -1,3 +1,5 @@
+// Replaces parameters of conditions: collects the identifiers, asks what replaces each, and rebuilds the condition
+// once.  Linear in the distinct nodes.
 #include "base/service/ParameterReplacement.hpp"
 
 #include "base/service/VCSymbols.hpp"
@@ -30,7 +32,7 @@ SymbolicExprId replaceIdentifiers(SymbolicExprTable& table, SymbolicExprId condi
         if (const SymbolicExprId replacement = other(name); replacement != invalidId)
             replacements[symbol] = replacement;
     }
-    // A condition that is one symbol is nobody's operand.
+    // A condition that is one symbol is not an operand.
     const auto whole = replacements.find(condition);
     return whole != replacements.end() ? whole->second : SymbolicExprReplacement(table, replacements)(condition);
 }

@@ -1,4 +1,4 @@
-// Parameters of conditions and what a customizer puts in their place.
+// Replaces parameters of conditions as a customizer asks for.
 #pragma once
 
 #include "base/core/Table.hpp"
@@ -10,15 +10,15 @@
 
 namespace VT {
 
-/// What to put in the place of a parameter; nothing for one that stays.
+/// Chooses the replacement of a parameter; nothing for one that stays.
 using ParameterChoice = std::function<std::optional<ParameterReplacement>(const std::string& parameter)>;
 
-/// The condition with its identifiers replaced by what `other` answers for them; the invalid identifier for those that
-/// stay.  A name that does not occur is never asked for, so that nothing is interned in vain.
+/// Returns the condition with each identifier replaced by `other(name)`; one for which that is the invalid identifier
+/// stays.  `other` is called only for names that occur, so that no unused node is interned.
 SymbolicExprId replaceIdentifiers(SymbolicExprTable& table, SymbolicExprId condition,
                                   const std::function<SymbolicExprId(const std::string& name)>& other);
 
-/// The condition with its parameters replaced.  Truth constants and variant keywords are no parameters.
+/// Returns the condition with its parameters replaced.  Truth constants and variant keywords are not parameters.
 SymbolicExprId replaceParameters(SymbolicExprTable& table, SymbolicExprId condition, const ParameterChoice& choose);
 
 /// The parameters of a condition, each once: the identifiers in it but truth constants, variant keywords, names of

@@ -1,4 +1,4 @@
-// What a VCService is made of.
+// The parts of a VCService: table, parsers, printers, simplifier, deciders and caches.
 #pragma once
 
 #include "base/decide/Decider.hpp"
@@ -24,7 +24,7 @@ struct CustomizerRelease {
     void operator()(VCCustomizer* customizer) const noexcept { customizer->release(); }
 };
 
-/// Members are destroyed in reverse, so that the customizer goes last.
+/// Members are destroyed in reverse order, so the customizer goes last.
 struct ServiceParts {
     ServiceParts();
 
@@ -39,12 +39,16 @@ struct ServiceParts {
 
     /// Whether the variant keywords are in force at this moment: they were when the service was made, and are.
     [[nodiscard]] bool keywordsInForce() const;
-    /// What decisions depend on beside their conditions: 1 for keywords in force, 2 for 32-bit unknowns.
+    /// The mode that decisions depend on beside their conditions: 1 for keywords in force, 2 for 32-bit unknowns.
     [[nodiscard]] unsigned decisionMode() const;
+    /// Whether a kept answer about a condition may differ from a fresh one: a customizer took part at some time, a
+    /// value is bound to one of its members, or it names a variant keyword.  For checks.
+    [[nodiscard]] bool mayHaveChanged(SymbolicExprId condition) const;
     /// The decider for the present mode.
     Decider& decider();
 
     std::unique_ptr<VCCustomizer, CustomizerRelease> customizer;
+    bool customized = false; ///< there was a customizer at some time
     std::int32_t useCount = 0;
     SymbolicExprTable table;
     SymbolicExprParser cParser;

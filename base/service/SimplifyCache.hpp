@@ -1,4 +1,4 @@
-// What the service remembers of finished simplifications.
+// The service's cache of finished simplifications.
 #pragma once
 
 #include "base/core/Node.hpp"
@@ -9,8 +9,8 @@
 
 namespace VT {
 
-/// Simplified conditions by what was asked for.  Only grows: identifiers are never reused and nodes never change, so
-/// that what is in here stays right.
+/// Simplified conditions by condition or by text.  Only grows: identifiers are never reused and nodes never change, so
+/// results stay right, except where a customizer, a flag or a value bound to a member changes.  O(1) on average.
 template <class Key>
 class SimplifyCache {
 public:

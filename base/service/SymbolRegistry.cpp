@@ -1,5 +1,12 @@
+// The dimension expressions of blocks under identifiers of their own.
+//
+// Method: the identifier is an injective encoding of the simplified expression's C text; where that is too long for a C
+// compiler, a hash of the text replaces its end, and a text that meets another one under its hash takes the next
+// number.
+// Cost: linear in the size of the expression; look-ups O(1) on average.
 #include "base/service/SymbolRegistry.hpp"
 
+#include "base/core/Limits.hpp"
 #include "base/service/AliasText.hpp"
 #include "base/util/Hash.hpp"
 
@@ -10,7 +17,6 @@ namespace VT {
 
 namespace {
 
-constexpr std::size_t longestIdentifier = 63;
 constexpr std::string_view hexDigits = "0123456789abcdef";
 
 bool isLetter(char c) {
@@ -21,14 +27,14 @@ bool isLetterOrDigit(char c) {
     return isLetter(c) || (c >= '0' && c <= '9');
 }
 
-/// Whether a text is an identifier that no other text is given.
+/// Whether a text is an identifier that no other text is encoded as.
 bool isOwnIdentifier(const std::string& text) {
-    return text.size() <= longestIdentifier && !text.empty() && isLetter(text.front()) &&
+    return text.size() <= limits::identifierLength && !text.empty() && isLetter(text.front()) &&
            std::ranges::all_of(text, [](char c) { return isLetterOrDigit(c) || c == '_'; }) &&
            !text.starts_with("dim_") && !text.starts_with("dimx_");
 }
 
-/// A text as letters, digits and _, from which it could be read back.
+/// Encodes a text as letters, digits and _, from which it could be decoded.
 std::string encoded(const std::string& text) {
     std::string code;
     for (const char c : text) {
@@ -59,13 +65,13 @@ std::string SymbolRegistry::identifierOf(const std::string& text) const {
         return text;
     const std::string code = encoded(text);
     std::string identifier = "dim_" + code;
-    if (identifier.size() <= longestIdentifier)
+    if (identifier.size() <= limits::identifierLength)
         return identifier;
     // Two long texts with one number are as good as impossible, but the second would get another expression's
     // identifier.
     for (std::uint64_t number = hashBytes(0, text);; ++number) {
         const std::string digits = sixteenDigits(number);
-        identifier = "dimx_" + code.substr(0, longestIdentifier - 6 - digits.size()) + '_' + digits;
+        identifier = "dimx_" + code.substr(0, limits::identifierLength - 6 - digits.size()) + '_' + digits;
         const auto taken = entries_.find(identifier);
         if (taken == entries_.end() || taken->second.text == text)
             return identifier;

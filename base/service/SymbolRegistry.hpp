@@ -1,4 +1,4 @@
-// The dimension expressions of blocks under names of their own.
+// Names for the dimension expressions of blocks.
 #pragma once
 
 #include "base/print/ExpressionPrinter.hpp"
@@ -13,13 +13,13 @@
 
 namespace VT {
 
-/// Gives the dimension expressions of blocks identifiers.  Of a block its address is used alone.
+/// Gives the dimension expressions of blocks identifiers.  Only the address of a block is used.
 ///
-/// An expression is simplified and printed as C text.  A text that is an identifier is its own; any other one becomes
-/// `dim_` and the text, in which _ is written __ and everything but letters and digits _xx, in hexadecimal: `N*2+1` is
-/// `dim_N_2a2_2b1`.  Where that is longer than 63 characters, which is what C compilers tell apart, it is `dimx_`, the
-/// beginning and a number made of the whole text.  So an identifier is the same in every run, and two texts never share
-/// one.
+/// An expression is simplified and printed as C text.  A text that is an identifier is used as it is; any other one
+/// becomes `dim_` followed by the text with _ written as __ and all but letters and digits as _xx, in hexadecimal:
+/// `N*2+1` is `dim_N_2a2_2b1`.  Where that is longer than 63 characters, which C compilers need not distinguish, it is
+/// `dimx_`, the beginning and a hash of the whole text.  So an identifier is the same in every run, and two texts never
+/// share one.
 ///
 /// Used by one thread at a time.
 class VTSYM_API SymbolRegistry {
@@ -29,9 +29,10 @@ public:
     SymbolRegistry(const SymbolRegistry&) = delete;
     SymbolRegistry& operator=(const SymbolRegistry&) = delete;
 
-    /// Registers an expression for a block and answers its identifier, which has the expression's text, in parentheses
+    /// Registers an expression for a block and returns its identifier, which has the expression's text, in parentheses
     /// where it needs them, as its alias in the table.  The same expression again, or another one with the same
-    /// simplified text, answers the same identifier.  The empty text for an identifier that is not of the table.
+    /// simplified text, returns the same identifier.  Returns the empty text for an identifier that is not of the
+    /// table.
     ///
     /// Linear in the size of the expression.  When memory runs out or the text is beyond the printer's bound, the
     /// exception passes and the block has registered what it had.

@@ -1,4 +1,4 @@
-// The texts that are conditions in every language, without a parser.
+// The texts of the truth constants, which are the same in every language and need no parser.
 #pragma once
 
 #include "base/core/Table.hpp"

@@ -31,8 +31,8 @@ struct ServiceParts;
 /// "false" is FALSE, exactly so and without a parser; every other text is read by the grammar of its language, whose
 /// diagnostics pass to the caller.
 ///
-/// An identifier that is not of the service's table is answered, never followed: combining and simplifying it give the
-/// invalid identifier, it is equal to itself alone, and printing it throws std::out_of_range.
+/// An identifier that is not of the service's table is never followed: combining and simplifying it yield the invalid
+/// identifier, it is equal to itself alone, and printing it throws std::out_of_range.
 ///
 /// The service belongs to one thread at a time.  An operation that throws leaves it as it was, but for nodes that were
 /// interned on the way.  A customizer that is being asked must neither clean() the service nor install another
@@ -41,11 +41,11 @@ class VTSYM_API VCService {
 public:
     /// The service of the process, made by the first call.
     static VCService& getInstance();
-    /// Takes one user away; without a user left, the service is destroyed with all that it knows.  Does nothing where
-    /// there is no service.  The next getInstance() makes a new one.
+    /// Removes one user; the last one to go destroys the service with everything in it.  Does nothing without a
+    /// service.  The next getInstance() makes a new one.
     static void clean();
     /// Installs a customizer, which the service owns from now on, and releases the previous one; nullptr for none.  The
-    /// one that is installed already stays.  What was simplified under the previous one stays in the caches.
+    /// one that is installed already stays.  Results that were simplified under the previous one stay in the caches.
     void setVCCustomizer(VCCustomizer* customizer);
 
     VCService(const VCService&) = delete;
@@ -54,7 +54,7 @@ public:
     // Reading.
 
     /// The condition of a text in C or in Quill; one condition is the same nodes in both, but for literals with a sign.
-    /// Throws the host diagnostic "Vantor:Variants:ExpressionParseError" for any text that is none.
+    /// Throws the host diagnostic "Vantor:Variants:ExpressionParseError" for text that is not a condition.
     SymbolicExprId parseC(const std::string& text);
     SymbolicExprId parseQ(const std::string& text);
     /// Whether a text is exactly "true" or "false".
@@ -68,8 +68,8 @@ public:
 
     // Simplifying.
 
-    /// The simplified condition.  In Quill mode an installed customizer confirms rewrites.  A customizer may also put
-    /// another condition in the place of this one, which counts only where it turns out TRUE or FALSE.
+    /// The simplified condition.  In Quill mode an installed customizer confirms rewrites.  A customizer may also
+    /// replace the condition by another one, which is used only where it simplifies to TRUE or FALSE.
     ///
     /// While the feature "CacheSymExprSimplifyResults" was above 0 when the service was made, results are kept by
     /// language.
@@ -78,7 +78,7 @@ public:
     VCSymbolicExprId simplifyFromCCondition(const std::string& text);
     VCSymbolicExprId simplifyFromQCondition(const std::string& text);
     /// The same, printed.  Quill text of a C condition is that of the condition in Quill shape: the C text `a/b==1`
-    /// gives `idivide(a,b)==1`.
+    /// becomes `idivide(a,b)==1`.
     std::string simplifyCExprFromCCondition(const std::string& text);
     std::string simplifyQExprFromCCondition(const std::string& text);
     std::string simplifyCExprFromQCondition(const std::string& text);
@@ -88,14 +88,14 @@ public:
 
     // Printing.
 
-    /// Quill text of the condition as it stands.
+    /// Quill text of the condition in its own shape.
     std::string printQExpr(const VCSymbolicExprId& condition);
     /// Quill text of the condition in Quill shape: C operators without a Quill spelling, and every division, as calls.
     std::string printQExprWithConversion(const VCSymbolicExprId& condition);
     /// C text of the condition in C shape: Quill calls that stand for C operators as operators.  Powers, transposes,
-    /// element-wise operators and ranges, which C has not, keep their Quill spelling.
+    /// element-wise operators and ranges, which C does not have, keep their Quill spelling.
     std::string printCExpr(const VCSymbolicExprId& condition);
-    /// C text of the condition as it stands.
+    /// C text of the condition in its own shape.
     std::string printCExprNoConversion(const VCSymbolicExprId& condition);
     /// A text in the other language, or in the same one as the printer writes it; not simplified.
     std::string convertExprBetweenQandC(const std::string& text, bool inputIsQuill, bool outputIsQuill);
@@ -111,13 +111,13 @@ public:
     [[nodiscard]] std::string getParameterAlias(const std::string& parameter) const;
     /// Records an alias of a parameter, that of a negative literal in parentheses; the first alias stays.
     void addParameterAlias(const std::string& parameter, const std::string& alias);
-    /// Records for each parameter of a block's condition what a customizer puts in its place there
+    /// Records for each parameter of a block's condition what a customizer replaces it by there
     /// (VCCustomizer::parameterOfBlock), as above.  Records nothing for nullptr, for a parameter that stays, and for an
     /// identifier that is not of the table.
     void addParameterAlias(const VTBlock* block, SymbolicExprId condition, const VCCustomizer* customizer);
 
-    /// Appends the symbols of the kinds asked for, as Quill text or as identifiers.  Throws std::out_of_range for a
-    /// kind that is none.
+    /// Appends the symbols of the kinds asked for, as Quill text or as identifiers.  Throws std::out_of_range for
+    /// an invalid kind.
     void getSymbolsFromExpression(const VCSymbolicExprId& condition, std::vector<std::string>& symbols,
                                   const VCSymbolTypes& kinds) const;
     void getSymbolsFromExpression(const VCSymbolicExprId& condition, std::vector<std::string>& symbols,
@@ -136,8 +136,8 @@ public:
     /// flows: where its source is active, and one of its destinations.  With `simplify` as when combining; the invalid
     /// identifier for nullptr.  Each call reads the conditions anew; BlockConditions reads many blocks' once.
     ///
-    /// A customizer says what the parameters of each block's own condition stand for (VCCustomizer::parameterOfBlock).
-    /// It need not be the one that is installed, which alone has a say in simplification.
+    /// A customizer replaces the parameters of each block's own condition (VCCustomizer::parameterOfBlock).
+    /// It need not be the installed one, which alone takes part in simplification.
     VCSymbolicExprId getQExprNetAAVCEIdx(const VTBlock* block, bool simplify, const VCCustomizer* customizer = nullptr);
     VCSymbolicExprId getQExprNetAAVCEIdx(const vtPort* port, bool simplify, const VCCustomizer* customizer = nullptr);
     /// The same as Quill text and as C text.
@@ -149,8 +149,8 @@ public:
     // Deciding.  Answers are exact over the integers, without bounds unless asked for, or "undecided" with the bound
     // that was hit, and come with a witness where one assignment proves them; see Decision.hpp.  Operators that Quill
     // writes as calls are decided as operators, the variant keywords as opposites while they are in force.  A
-    // customizer has no say.  Decisions about pairs are kept like simplified conditions; an identifier that is not of
-    // the table stays undecided.
+    // customizer takes no part.  Decisions about pairs are kept like simplified conditions; an identifier that is not
+    // of the table stays undecided.
 
     /// Whether decisions are over the signed 32-bit integers from now on; over all integers at first.
     void setDecisions32Bit(bool are32Bit);
@@ -166,9 +166,9 @@ public:
     /// Whether the outer condition holds wherever the inner one does.
     Decision contains(const VCSymbolicExprId& outer, const VCSymbolicExprId& inner);
     /// Whether a implies b and is not equivalent to it.  The witness of "yes" makes b hold alone, that of "no" makes a
-    /// hold alone; there is none where the two are equivalent.
+    /// hold alone; equivalent conditions have no witness.
     Decision isTighterThan(const VCSymbolicExprId& a, const VCSymbolicExprId& b);
-    /// How two conditions stand to each other, in one word and with all witnesses.
+    /// How two conditions relate, in one word and with all witnesses.
     Relation compare(const VCSymbolicExprId& a, const VCSymbolicExprId& b);
     /// Whether some condition of a set holds for every assignment.
     SetDecision covers(const std::vector<VCSymbolicExprId>& conditions);
@@ -176,7 +176,7 @@ public:
     SetDecision isDisjoint(const std::vector<VCSymbolicExprId>& conditions);
 
     /// The simplified condition as a sum of products: the operands of its Or, each once, in the order of their texts.
-    /// FALSE is the empty sum.  What simplification leaves unexpanded stands as one operand.
+    /// FALSE is the empty sum.  A part that simplification leaves unexpanded is one operand.
     std::vector<VCSymbolicExprId> computeUniqueOrOperandsId(const VCSymbolicExprId& condition);
     /// A product of such a sum as a set of factors: the operands of its And.  TRUE is the empty product.
     std::vector<VCSymbolicExprId> computeUniqueAndOperandsId(const VCSymbolicExprId& condition);
@@ -186,11 +186,11 @@ public:
     // bounds the shortest form proven so far is returned.
 
     /// The shortest form found that is proven equal to a condition for all assignments: the fewest comparisons and
-    /// other truth values, and of those forms the fewest bytes.  Never longer than the condition, which comes back
-    /// where nothing better is proven; TRUE and FALSE are the shortest of all.  A root that is no truth value, as in
+    /// other truth values, and of those forms the fewest bytes.  Never longer than the condition, which is returned
+    /// where nothing better is proven; TRUE and FALSE are the shortest of all.  A root that is not a truth value, as in
     /// `2+3` or `N`, is a number: it is simplified where that makes it no longer, and keeps its value.
     ///
-    /// `forms` receives the forms that were looked at on the way, the shortest first; none for numbers.
+    /// `forms` receives the forms that were considered, the shortest first; it is empty for numbers.
     VCSymbolicExprId shortestCondition(const VCSymbolicExprId& condition, bool isQuill,
                                        std::vector<ShortForm>* forms = nullptr);
     /// The shortest form found that is proven equal to a condition wherever the known one holds.  TRUE where the known
@@ -201,7 +201,7 @@ public:
     /// A witness as text: "A=3, B=0".
     std::string printWitness(const Witness& witness);
 
-    // The same about texts, which may be refused as when they are parsed.
+    // The same for texts, which may be refused as when they are parsed.
 
     Decision impliesFromCConditions(const std::string& a, const std::string& b);
     Decision impliesFromQConditions(const std::string& a, const std::string& b);
@@ -226,7 +226,7 @@ public:
     std::vector<std::string> computeUniqueOrOperandsFromCCondition(const std::string& condition);
     std::vector<std::string> computeUniqueOrOperandsFromQCondition(const std::string& condition);
 
-    // What further operations on conditions are made of.
+    // The parts that further operations on conditions are built on.
 
     [[nodiscard]] SymbolicExprTable& table() noexcept;
     [[nodiscard]] SymbolicExprSimplify& simplifier() noexcept;
@@ -245,6 +245,7 @@ private:
     [[nodiscard]] bool has(const VCSymbolicExprId& condition) const noexcept;
     SymbolicExprId parse(const std::string& text, bool isQuill);
     VCSymbolicExprId simplifyFrom(const std::string& text, bool isQuill);
+    bool isAsSimplifiedAnew(const std::string& text, bool isQuill, SymbolicExprId kept);
     std::string printIn(bool quill, SymbolicExprId condition, bool wasQuill);
     VCSymbolicExprId combined(SymbolicExprId condition, bool simplify);
     SymbolicExprId rewritten(SymbolicExprId condition);

@@ -1,4 +1,5 @@
-// Conditions put together, compared and asked.
+// Combines and compares conditions, and records aliases of parameters.  A combination interns one node at most; its
+// simplification costs what simplify() costs.
 #include "base/service/AliasText.hpp"
 #include "base/service/ParameterReplacement.hpp"
 #include "base/service/ServiceParts.hpp"

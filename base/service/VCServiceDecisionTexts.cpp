@@ -1,4 +1,6 @@
 // Decisions about conditions given as texts.
+//
+// Texts are read in order, so of several bad ones the first is reported.  Costs parsing and the decision.
 #include "base/service/ServiceParts.hpp"
 #include "base/service/VCService.hpp"
 

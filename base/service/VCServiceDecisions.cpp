@@ -1,4 +1,9 @@
-// How conditions stand to each other.
+// Decisions about pairs and sets of conditions.
+//
+// Method: every question about a pair is one of three (PairQuestion) or its opposite, which share a cache.  There is
+// one decider for each mode (keywords in force, 32-bit unknowns), made when it is first needed.
+// Cost: at most limits::decisionSteps a question; a kept decision is O(1).
+#include "base/core/Check.hpp"
 #include "base/service/ServiceParts.hpp"
 #include "base/service/VCService.hpp"
 #include "base/variants/VariantKeywords.hpp"
@@ -13,7 +18,7 @@ Decision noCondition() {
     return {Answer::Undecided, DecisionBound::NoCondition, std::nullopt};
 }
 
-/// What is asked about a set, with operators in the place of the calls that Quill writes for them.
+/// Asks a question about a set.  Calls that Quill writes for operators are decided as operators.
 SetDecision askAbout(ServiceParts& parts, SetDecision (Decider::*question)(std::span<const SymbolicExprId>),
                      const std::vector<VCSymbolicExprId>& conditions) {
     std::vector<SymbolicExprId> converted;
@@ -24,6 +29,27 @@ SetDecision askAbout(ServiceParts& parts, SetDecision (Decider::*question)(std::
         converted.push_back(parts.toC(condition.id()));
     }
     return (parts.decider().*question)(converted);
+}
+
+/// Decides a pair anew.  Operators that Quill writes as calls are decided as operators.
+Decision decide(ServiceParts& parts, Decider& decider, const DecisionCache::Key& key, std::uint64_t steps) {
+    const SymbolicExprId first = parts.toC(key.a);
+    const SymbolicExprId second = parts.toC(key.b);
+    decider.limitSteps(steps);
+    Decision decision = key.question == PairQuestion::Both         ? decider.overlaps(first, second)
+                        : key.question == PairQuestion::FirstAlone ? decider.implies(first, second).opposite()
+                                                                   : decider.equivalent(first, second).opposite();
+    decider.limitSteps(limits::decisionSteps);
+    return decision;
+}
+
+/// Whether a decider that has read nothing comes to the decision that was kept.
+[[maybe_unused]] bool isAsDecidedAnew(ServiceParts& parts, const DecisionCache::Key& key, const Decision& kept) {
+    if (parts.mayHaveChanged(key.a) || parts.mayHaveChanged(key.b))
+        return true;
+    Decider fresh(parts.table, parts.decider().options());
+    const Decision decision = decide(parts, fresh, key, limits::decisionSteps);
+    return kept.answer == decision.answer && kept.witness == decision.witness;
 }
 
 } // namespace
@@ -44,7 +70,7 @@ Decider& ServiceParts::decider() {
     return *decider;
 }
 
-/// The decision about a pair, from the cache where it is there.
+/// Decides a pair, from the cache where possible.
 Decision VCService::ask(PairQuestion question, const VCSymbolicExprId& a, const VCSymbolicExprId& b,
                         std::uint64_t steps) {
     if (!has(a) || !has(b))
@@ -52,17 +78,11 @@ Decision VCService::ask(PairQuestion question, const VCSymbolicExprId& a, const 
     const bool ordered = question == PairQuestion::FirstAlone;
     const DecisionCache::Key key{ordered ? a.id() : std::min(a.id(), b.id()),
                                  ordered ? b.id() : std::max(a.id(), b.id()), question, parts_->decisionMode()};
-    if (const Decision* known = parts_->caching ? parts_->decisions.find(key) : nullptr)
+    if (const Decision* known = parts_->caching ? parts_->decisions.find(key) : nullptr) {
+        VTSYM_CHECK_SAMPLED(isAsDecidedAnew(*parts_, key, *known));
         return *known;
-    // Operators that Quill writes as calls are decided as operators.
-    const SymbolicExprId first = parts_->toC(key.a);
-    const SymbolicExprId second = parts_->toC(key.b);
-    Decider& decider = parts_->decider();
-    decider.limitSteps(steps);
-    Decision decision = question == PairQuestion::Both         ? decider.overlaps(first, second)
-                        : question == PairQuestion::FirstAlone ? decider.implies(first, second).opposite()
-                                                               : decider.equivalent(first, second).opposite();
-    decider.limitSteps(limits::decisionSteps);
+    }
+    Decision decision = decide(*parts_, parts_->decider(), key, steps);
     // What stays undecided with fewer steps may be decided with all.
     if (parts_->caching && (steps == limits::decisionSteps || !decision.isUndecided()))
         parts_->decisions.insert(key, decision);

@@ -1,4 +1,6 @@
-// The service of the process: how it comes and goes.
+// The service of the process: made by its first user, destroyed with its last one.
+//
+// A handle keeps the number of the service that it counted on, so that it never counts down a later one.
 #include "base/service/ServiceParts.hpp"
 #include "base/service/VCService.hpp"
 #include "base/variants/Features.hpp"
@@ -61,6 +63,7 @@ void VCService::setVCCustomizer(VCCustomizer* customizer) {
         return;
     decltype(parts_->customizer) previous(customizer);
     previous.swap(parts_->customizer);
+    parts_->customized = true;
 }
 
 VCServiceHandle::VCServiceHandle() {

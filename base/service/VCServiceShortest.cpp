@@ -1,4 +1,5 @@
-// Conditions made shorter: everywhere, or where another one is known to hold.
+// Shortens conditions, everywhere or under a known condition: sets up proofs and search (base/decide/shorten), and
+// falls back to the given form where the result would be longer.
 #include "base/decide/shorten/ConditionProofs.hpp"
 #include "base/decide/shorten/ShortestForm.hpp"
 #include "base/service/ServiceParts.hpp"
@@ -9,7 +10,7 @@ namespace VT {
 
 namespace {
 
-/// The shortened form as a condition of its own, or the given one where that would be longer.
+/// Returns the shortened form as a condition of its own, or the given one where that would be longer.
 SymbolicExprId noLonger(SymbolicExprTable& table, const SymbolicExprPrinter& printer, SymbolicExprId shortened,
                         SymbolicExprId given) {
     if (shortened == given || !booleanOps.contains(table.get(given)->op()))
@@ -30,14 +31,14 @@ VCSymbolicExprId VCService::shortestCondition(const VCSymbolicExprId& condition,
     const SymbolicExprPrinter& printer = isQuill ? parts_->quillPrinter : parts_->cPrinter;
     SymbolicExprTable& table = parts_->table;
     const auto normalForm = [&] { return simplify(given, isQuill).id(); };
-    // A number is no condition: its value counts, not whether it is 0.
+    // A number is not a condition: its value matters, not whether it is 0.
     if (!booleanOps.contains(table.get(given)->op())) {
         const SymbolicExprId simple = normalForm();
         return printer.textLength(simple) <= printer.textLength(given) ? simple : given;
     }
     ConditionProofs proofs(parts_->decider(), parts_->toC, given, table.getIdTRUE(), false);
     ShortestForm search(table, printer, parts_->keywordsInForce(), proofs);
-    // Bounds of the unknowns are something to know.
+    // Bounds of the unknowns are known facts.
     const SymbolicExprId result = search.find(given, parts_->bits32 ? table.getIdTRUE() : invalidId, normalForm);
     if (forms != nullptr)
         *forms = search.forms();

@@ -1,16 +1,36 @@
-// Conditions simplified: caches, customizer, simplifier.
+// Simplifies conditions: cache, then the customizer's rewrite, then the simplifier.
+//
+// The caches keep identifiers by condition and by text, one pair for each language.  A hit is O(1).
+#include "base/core/Check.hpp"
 #include "base/service/ServiceParts.hpp"
 #include "base/service/VCService.hpp"
 #include "base/simplify/SimplifyVisitorBlockVariants.hpp"
+#include "base/variants/VariantKeywords.hpp"
+
+#include <algorithm>
+#include <vector>
 
 namespace VT {
+
+bool ServiceParts::mayHaveChanged(SymbolicExprId condition) const {
+    std::vector<SymbolicExprId> symbols;
+    VCSymbolsOfSymbolicExpr(table, VCSymbolTypes{VCSymbolType::Identifier, VCSymbolType::BoundMember})
+        .getSymbolIds(condition, symbols);
+    return customized || std::ranges::any_of(symbols, [&](SymbolicExprId id) {
+               const SymbolicExpr& symbol = *table.get(id);
+               return symbol.op() != SymbolicOp::String ||
+                      VariantKeywords::isVariantKeyword(static_cast<const SymbolicString&>(symbol).getName(), false);
+           });
+}
 
 VCSymbolicExprId VCService::simplify(const VCSymbolicExprId& condition, bool isQuill) {
     if (!has(condition))
         return invalidId;
     auto& cache = ServiceParts::of(parts_->simplified, isQuill);
-    if (const auto known = parts_->caching ? cache.find(condition.id()) : std::nullopt)
+    if (const auto known = parts_->caching ? cache.find(condition.id()) : std::nullopt) {
+        VTSYM_CHECK_SAMPLED(parts_->mayHaveChanged(condition.id()) || *known == simplifyNow(condition.id(), isQuill));
         return *known;
+    }
     SymbolicExprId result = invalidId;
     if (const SymbolicExprId other = rewritten(condition.id()); other != condition.id())
         result = simplifyNow(other, isQuill);
@@ -22,7 +42,7 @@ VCSymbolicExprId VCService::simplify(const VCSymbolicExprId& condition, bool isQ
     return result;
 }
 
-/// What the customizer puts in the place of a condition; the condition itself where it has no say.
+/// Returns the customizer's rewrite of a condition; the condition itself without a customizer, and for constants.
 SymbolicExprId VCService::rewritten(SymbolicExprId condition) {
     const SymbolicExprTable& table = parts_->table;
     const bool constant = condition == table.getIdTRUE() || condition == table.getIdFALSE();
@@ -34,7 +54,7 @@ SymbolicExprId VCService::rewritten(SymbolicExprId condition) {
 
 SymbolicExprId VCService::simplifyNow(SymbolicExprId condition, bool isQuill) {
     VCCustomizer* const customizer = parts_->customizer.get();
-    // Asked without a customizer the visitor would answer self-comparisons the wrong way round.
+    // Asking without a customizer, the visitor would decide self-comparisons the wrong way round.
     const bool ask = isQuill && customizer != nullptr;
     const SymbolicExprSimplify& simplifier = parts_->simplifier;
     SymbolicExprSimplifyVisitorBlockVariants visitor(parts_->table, parts_->keywordFlag, simplifier.printer(), ask,
@@ -43,10 +63,18 @@ SymbolicExprId VCService::simplifyNow(SymbolicExprId condition, bool isQuill) {
     return simplifier.simplify(condition, passes, visitor);
 }
 
+/// Whether a text is read and simplified to what was kept.
+bool VCService::isAsSimplifiedAnew(const std::string& text, bool isQuill, SymbolicExprId kept) {
+    const SymbolicExprId condition = parse(text, isQuill);
+    return parts_->mayHaveChanged(condition) || simplifyNow(condition, isQuill) == kept;
+}
+
 VCSymbolicExprId VCService::simplifyFrom(const std::string& text, bool isQuill) {
     auto& cache = ServiceParts::of(parts_->simplifiedFromText, isQuill);
-    if (const auto known = parts_->caching ? cache.find(text) : std::nullopt)
+    if (const auto known = parts_->caching ? cache.find(text) : std::nullopt) {
+        VTSYM_CHECK_SAMPLED(isAsSimplifiedAnew(text, isQuill, *known));
         return *known;
+    }
     const SymbolicExprId result = simplify(parse(text, isQuill), isQuill).id();
     if (parts_->caching)
         cache.insert(text, result);

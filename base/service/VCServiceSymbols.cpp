@@ -1,4 +1,6 @@
-// The symbols of conditions.
+// The symbols of conditions, and their replacement by name.
+//
+// Thin wrappers over VCSymbols and ParameterReplacement; linear in the distinct nodes.
 #include "base/service/ParameterReplacement.hpp"
 #include "base/service/ServiceParts.hpp"
 #include "base/service/VCService.hpp"

@@ -1,4 +1,6 @@
-// Conditions from text and to text.
+// Reads conditions from text, prints them, and converts between the languages.
+//
+// The constants have texts of their own, which no parser or printer sees: TRUE is the empty text.
 #include "base/service/ServiceParts.hpp"
 #include "base/service/TruthTexts.hpp"
 #include "base/service/VCService.hpp"
@@ -47,8 +49,8 @@ std::string VCService::printCExpr(const VCSymbolicExprId& condition) {
     return printCExprNoConversion(parts_->toC(condition.id()));
 }
 
-/// Text of a condition that was read in one language and is written in one: what was written in Quill has Quill's shape
-/// where it is to be Quill, and what was written in C has that of C.
+/// Prints a condition that was read in one language in the same or the other one.  Where the languages differ, the
+/// condition is converted to the shape of the one it is printed in.
 std::string VCService::printIn(bool quill, SymbolicExprId condition, bool wasQuill) {
     if (quill)
         return wasQuill ? printQExpr(condition) : printQExprWithConversion(condition);

@@ -1,3 +1,8 @@
+// Collects the symbols of a condition by kind.
+//
+// Method: depth first on an explicit stack.  The general walkers follow every operand; here the node decides: a
+// member's owner is not entered, and a call's name is reported for each distinct call, before its arguments.
+// Cost: linear in the edges.
 #include "base/service/VCSymbols.hpp"
 
 #include "base/print/ExpressionPrinter.hpp"

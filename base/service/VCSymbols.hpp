@@ -30,7 +30,7 @@ public:
 
     FlagSetForEnum() = default;
 
-    /// Throws std::out_of_range ("bitset::set") for a flag that is no value of the enumeration.
+    /// Throws std::out_of_range ("bitset::set") for a flag that is not a value of the enumeration.
     FlagSetForEnum(std::initializer_list<Flag> flags) {
         for (const Flag flag : flags)
             set(flag);
@@ -52,7 +52,7 @@ private:
 using VCSymbolTypes = FlagSetForEnum<VCSymbolType, VCSymbolType>;
 
 /// Collects the symbols of some kinds, in the order of their first occurrence.  Unlike an identifier, the name of a
-/// function is given for each distinct call, and an operand of a member is not looked into.
+/// function is collected for each distinct call, and the owner of a member is not searched.
 class VTSYM_API VCSymbolsOfSymbolicExpr : public SymbolsOfSymbolicExpr {
 public:
     using Kinds = VCSymbolTypes::Bits;

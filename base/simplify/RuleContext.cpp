@@ -6,10 +6,7 @@ namespace VT {
 
 RuleListener::~RuleListener() = default;
 
-RuleContext::RuleContext(SymbolicExprTable& table, const SymbolicExprPrinter& printer, bool keywordsOn)
-    : table_(table),
-      printer_(printer),
-      keywordsOn_(keywordsOn) {}
+RuleContext::RuleContext(SymbolicExprTable& table, bool keywordsOn) : table_(table), keywordsOn_(keywordsOn) {}
 
 SymbolicExprId RuleContext::resolve(SymbolicExprId id) const {
     if (op(id) != SymbolicOp::MemberValue)

@@ -3,7 +3,6 @@
 
 #include "base/core/Make.hpp"
 #include "base/core/Nodes.hpp"
-#include "base/print/ExpressionPrinter.hpp"
 #include "base/simplify/Rule.hpp"
 #include "base/util/IdMap.hpp"
 
@@ -13,10 +12,11 @@
 
 namespace VT {
 
-/// The table, the order of operands and the state of one pass.
+/// The table, the order of operands and the state of one pass.  How operands are ordered is the driver's choice: rules
+/// know the order through sortsBefore() alone, never the printer.
 class RuleContext {
 public:
-    RuleContext(SymbolicExprTable& table, const SymbolicExprPrinter& printer, bool keywordsOn);
+    RuleContext(SymbolicExprTable& table, bool keywordsOn);
     RuleContext(const RuleContext&) = delete;
     RuleContext& operator=(const RuleContext&) = delete;
     virtual ~RuleContext() = default;
@@ -31,8 +31,11 @@ public:
     /// Whether the node at hand is below a comparison or a logical operator, where quotients are truncated; elsewhere
     /// they are exact.
     [[nodiscard]] virtual bool inCondition() const = 0;
-    /// Tells that a chain or a distribution is beyond the limit: the pass will not be used.
+    /// Reports that a chain or a distribution is beyond the limit: the pass will not be used.
     virtual void giveUp() = 0;
+    /// Whether a comes before b among the operands of a chain: a strict weak order that never depends on how nodes are
+    /// numbered.
+    [[nodiscard]] virtual bool sortsBefore(SymbolicExprId a, SymbolicExprId b) const = 0;
 
     [[nodiscard]] const SymbolicExpr& node(SymbolicExprId id) const { return *table_.get(id); }
 
@@ -71,12 +74,7 @@ public:
     [[nodiscard]] bool isSimKeyword(SymbolicExprId id) const;
     [[nodiscard]] bool isCodegenKeyword(SymbolicExprId id) const;
 
-    /// Whether the Quill text of a sorts before that of b; never depends on how nodes are numbered.
-    [[nodiscard]] bool sortsBefore(SymbolicExprId a, SymbolicExprId b) const {
-        return printer_.compareUsingCache(a, b) < 0;
-    }
-
-    /// Applications of rules, told to the listener; free of cost where nobody listens.
+    /// Reports applications of rules to the listener; free of cost where nobody listens.
     [[nodiscard]] bool explaining() const noexcept { return listener_ != nullptr; }
 
     void fired(const RuleInfo& rule, SymbolicExprId before, SymbolicExprId after);
@@ -90,7 +88,6 @@ public:
 
 private:
     SymbolicExprTable& table_;
-    const SymbolicExprPrinter& printer_;
     bool keywordsOn_;
     RuleListener* listener_ = nullptr;
     std::uint64_t pass_ = 0;

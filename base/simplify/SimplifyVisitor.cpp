@@ -25,8 +25,9 @@ bool continues(SymbolicOp above, SymbolicOp op) {
 class SymbolicExprSimplifyVisitor::Rules final : public RuleContext {
 public:
     Rules(SymbolicExprSimplifyVisitor& visitor, const SymbolicExprPrinter& printer)
-        : RuleContext(visitor.table(), printer, visitor.keywordsOn),
-          visitor_(visitor) {}
+        : RuleContext(visitor.table(), visitor.keywordsOn),
+          visitor_(visitor),
+          printer_(printer) {}
 
     bool confirmRewrite(SymbolicExprId expression, SymbolicExprId replacement) override {
         return visitor_.confirmRewrite(expression, replacement);
@@ -48,8 +49,14 @@ public:
         return true;
     }
 
+    /// By the Quill text.
+    [[nodiscard]] bool sortsBefore(SymbolicExprId a, SymbolicExprId b) const override {
+        return printer_.compareUsingCache(a, b) < 0;
+    }
+
 private:
     SymbolicExprSimplifyVisitor& visitor_;
+    const SymbolicExprPrinter& printer_;
 };
 
 /// The walk of one pass: visits each distinct node once in each of the two contexts, operands first.

@@ -1,4 +1,4 @@
-// Texts that are made of texts: appending costs nothing, and a shared part is there once.
+// A pool of texts that are made of texts: appending is O(1), and a shared part is stored once.
 #pragma once
 
 #include "base/util/PlainVector.hpp"
@@ -21,15 +21,16 @@ enum class Text : std::uint32_t {};
 /// recurses.
 class TextPool {
 public:
-    /// A text of these bytes, which are copied.  O(bytes).
+    /// Returns a text of these bytes, which are copied.  O(bytes).  Like all that add texts it throws std::length_error
+    /// for more than 2^32 records, and std::bad_alloc.
     Text bytes(std::string_view bytes);
-    /// open, the parts with the separator between them, close.  O(parts).
+    /// Returns open, the parts with the separator between them, close.  O(parts).
     Text join(std::string_view open, std::span<const Text> parts, std::string_view separator, std::string_view close);
 
-    /// left, separator, right.  O(1).
+    /// Returns left, separator, right.  O(1).
     Text infix(Text left, std::string_view separator, Text right);
 
-    /// open, text, close.  O(1).
+    /// Returns open, text, close.  O(1).
     Text enclose(std::string_view open, Text text, std::string_view close) {
         return join(open, std::span<const Text>(&text, 1), "", close);
     }
@@ -37,7 +38,7 @@ public:
     /// The number of bytes, at most `unbounded`.  O(1).
     [[nodiscard]] std::uint64_t length(Text text) const { return record(text).length; }
 
-    /// The length of every text that is at least so long.
+    /// The length that length() returns for every text of that many bytes or more.
     static constexpr std::uint64_t unbounded = std::uint64_t{1} << 62U;
 
     /// Whether a text begins with a byte.  O(1).
@@ -45,7 +46,7 @@ public:
         return record(text).length > 0 && record(text).head[0] == first;
     }
 
-    /// The bytes of a text.  Throws std::length_error where there are more than `bound`, before it allocates any.
+    /// Returns the bytes of a text.  Throws std::length_error where there are more than `bound`, before it allocates.
     /// O(bytes).
     [[nodiscard]] std::string str(Text text, std::size_t bound) const;
 
@@ -57,16 +58,16 @@ public:
     /// Number of records, each of 48 bytes.
     [[nodiscard]] std::size_t size() const noexcept { return records_.size(); }
 
-    /// Room for so many records.
+    /// Makes room for `records` records.
     void reserve(std::size_t records) { records_.reserve(records); }
 
-    /// Forgets all texts and gives their memory back.
+    /// Forgets all texts and frees their memory.
     void clear() noexcept;
 
 private:
     static constexpr std::size_t headBytes = 16;
 
-    /// A few bytes between or around parts; zeros behind them.
+    /// A few bytes between or around parts, followed by zeros.
     template <std::size_t Capacity>
     struct Glue {
         std::array<char, Capacity> bytes;
@@ -84,7 +85,7 @@ private:
 
     struct Record {
         std::uint64_t length;
-        std::array<char, headBytes> head; ///< the first bytes of the text, zeros behind its end
+        std::array<char, headBytes> head; ///< the first bytes of the text, followed by zeros
         std::uint32_t first;
         std::uint32_t second;
         std::uint32_t leading; ///< the smallest known text with the same first bytes, as many as are ever ordered

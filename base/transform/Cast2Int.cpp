@@ -1,3 +1,7 @@
+// Real literals become integers: one rebuilding pass with a hook for real literals.
+//
+// Values beyond 32 bits become the least integer, as the conversion instruction of common processors yields.  Linear in
+// the distinct nodes.
 #include "base/transform/Cast2Int.hpp"
 
 #include <cmath>

@@ -5,8 +5,8 @@
 
 namespace VT {
 
-/// Rebuilds an expression with an integer literal in the place of every real one: the nearest integer, halves away from
-/// zero.  Values that do not fit 32 bits, infinities and NaN become -2147483648.
+/// Rebuilds an expression with every real literal replaced by an integer: the nearest one, halves away from zero.
+/// Values that do not fit 32 bits, infinities and NaN become -2147483648.
 class VTSYM_API SymbolicExprCast2IntVisitor : public SymbolicExprXFormVisitor2 {
 public:
     explicit SymbolicExprCast2IntVisitor(SymbolicExprTable& target) : SymbolicExprXFormVisitor2(target) {}
@@ -23,7 +23,7 @@ public:
     explicit SymbolicExprCast2Int(SymbolicExprTable& table) : table_(table) {}
 
     /// The expression with integer literals alone: `N*2.0+0.5` becomes `N*2+1`, and an expression without real literals
-    /// stays itself.  An identifier that is not of the table gives the invalid one.  Linear in the number of distinct
+    /// stays itself.  An identifier that is not of the table yields the invalid one.  Linear in the number of distinct
     /// nodes.
     [[nodiscard]] SymbolicExprId cast2Int(SymbolicExprId id) const;
 

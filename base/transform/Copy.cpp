@@ -1,3 +1,9 @@
+// Copies expressions from one table into another, together with the values bound to their symbols.
+//
+// Method: one rebuilding run for the expression.  The values of the symbols that it meets wait in a queue and are
+// copied one after the other, never from within a visit, so that chains of values may be of any length and lead in
+// circles.
+// Cost: linear in the distinct nodes of the expression and of the values.
 #include "base/transform/Copy.hpp"
 
 namespace VT {

@@ -9,9 +9,9 @@
 namespace VT {
 
 /// Rebuilds every node as it is and brings the value of each symbol along: the value is copied too, with the values of
-/// the symbols that it mentions, and bound to the symbol's copy, in the place of a value that was bound there.  A
+/// the symbols that it mentions, and bound to the symbol's copy, where it replaces an earlier value.  A
 /// symbol without a value in the source keeps the one that it has in the target.  Only symbols bring values; those
-/// bound to other expressions stay behind.
+/// bound to other expressions are not copied.
 ///
 /// For one run; both tables outlive it.
 class VTSYM_API SymbolicExprCopyVisitor : public SymbolicExprXFormVisitor {
@@ -47,7 +47,7 @@ public:
     SymbolicExprCopy(const SymbolicExprTable& source, SymbolicExprTable& target) : source_(source), target_(target) {}
 
     /// The copy's identifier in the target: the expression itself where both tables are one.  An identifier that is not
-    /// of the source gives the invalid one.  Chains of bound values may be of any length and lead in circles.  Linear
+    /// of the source yields the invalid one.  Chains of bound values may be of any length and lead in circles.  Linear
     /// in the number of distinct nodes of the expression and of the values that come with it.
     SymbolicExprId operator()(SymbolicExprId id) const;
 

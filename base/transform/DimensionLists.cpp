@@ -1,10 +1,12 @@
+// Matrices with one row become lists of dimensions, which have a value.  Linear in the distinct nodes and their
+// operands.
 #include "base/transform/DimensionLists.hpp"
 
 namespace VT {
 
 namespace {
 
-/// The only row of a matrix; nullptr where there is none.
+/// Returns the only row of a matrix; nullptr for other nodes and matrices.
 const SymbolicExpr* onlyRow(const SymbolicExprTable& table, SymbolicExprId id) {
     const SymbolicExpr* const matrix = table.get(id);
     if (matrix == nullptr || matrix->op() != SymbolicOp::Matrix || matrix->getNumInputs() != 1)

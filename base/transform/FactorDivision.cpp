@@ -1,8 +1,13 @@
+// Pulls divisions outwards: a/b + c/d becomes (a*d + c*b)/(b*d).
+//
+// Method: one rebuilding pass.  At each sum, difference, remainder, product and quotient the operands, rebuilt already,
+// are taken as fractions, and the node becomes one fraction.
+// Cost: linear in the distinct nodes; nothing is folded, so a result has at most a few nodes more for each of them.
 #include "base/transform/FactorDivision.hpp"
 
 namespace VT {
 
-/// An operand as numerator and divisor; the divisor of what is no quotient is the invalid identifier and stands for 1.
+/// An operand as numerator and divisor; the divisor of anything but a quotient is the invalid identifier and means 1.
 struct SymbolicExprFactorDivisionVisitor::Fraction {
     SymbolicExprId numerator;
     SymbolicExprId divisor = invalidId;

@@ -6,11 +6,11 @@
 namespace VT {
 
 /// Rebuilds an expression so that a sum, difference, remainder, product or quotient of quotients becomes one quotient:
-/// N/2 + M/3 becomes (N*3 + M*2)/(2*3).  Nothing is folded and nothing cancelled, and no divisor is looked at.
-/// Element-wise and left division are no quotients, nor is a division that lacks an operand.
+/// N/2 + M/3 becomes (N*3 + M*2)/(2*3).  Nothing is folded or cancelled, and no divisor is checked.
+/// Element-wise and left division are not quotients, nor is a division that lacks an operand.
 ///
-/// The result has the value of the original where quotients are exact: dimensions are meant, not the truncating
-/// division of integers.
+/// The result has the value of the original where quotients are exact, as those of dimensions are; under the truncating
+/// division of integers it may differ.
 class VTSYM_API SymbolicExprFactorDivisionVisitor : public SymbolicExprXFormVisitor {
 public:
     /// A visitor that builds in `target`.
@@ -42,7 +42,7 @@ public:
     explicit SymbolicExprFactorDivision(SymbolicExprTable& table) : table_(table) {}
 
     /// The expression with its divisions pulled outwards, in one pass that is not repeated: the expression itself where
-    /// it has none.  An identifier that is not of the table gives the invalid one.  Linear in the number of distinct
+    /// it has none.  An identifier that is not of the table yields the invalid one.  Linear in the number of distinct
     /// nodes.
     [[nodiscard]] SymbolicExprId factorDivision(SymbolicExprId id) const;
 

@@ -1,3 +1,8 @@
+// Which Quill function stands for which C operator, and how the amount of a shift reads in the other language.  All
+// O(1).
+//
+// Quill's bitshift() shifts to the left by a positive amount and to the right by a negative one, so a C shift to the
+// right negates its amount.  -2147483648 has no negative of 32 bits; shifting by one place less yields the same.
 #include "base/transform/QuillCalls.hpp"
 
 #include <limits>
@@ -13,7 +18,7 @@ std::optional<int> negated(int value) {
     return -value;
 }
 
-/// The negative of a number of places.  No integer has 2147483648 bits, so a shift by one place less says the same.
+/// The negative of a number of places.  No integer has 2147483648 bits, so a shift by one place less yields the same.
 int opposite(int places) {
     return negated(places).value_or(std::numeric_limits<int>::max());
 }
@@ -43,7 +48,7 @@ ShiftAmount minus(SymbolicExprId id) {
     return {ShiftAmount::Form::Negated, 0, id};
 }
 
-/// The names live in a table because a node's class has no other way into the world.
+/// The names live in a table because nodes are made by interning only.
 class CallNames {
 public:
     CallNames() {

@@ -1,5 +1,5 @@
-// Quill has no operators for integer division, remainder, bits and shifts: it calls functions.  Which function stands
-// for which C operator, and what becomes of the amount of a shift.
+// Quill has no operators for integer division, remainder, bits and shifts: it calls functions.  This header relates the
+// function to the C operator, and the amount of a shift in one language to that in the other.
 #pragma once
 
 #include "base/core/Nodes.hpp"
@@ -48,10 +48,10 @@ inline constexpr auto quillCalls = detail::listQuillCalls();
 /// The name of the Quill function that stands for a C operator, as a node of a table of its own.
 VTSYM_API const SymbolicString& quillCallName(SymbolicOp op);
 
-/// The amount of a shift in the other language, said in terms of the amount it had.
+/// The amount of a shift in the other language, in terms of the amount it had.
 struct ShiftAmount {
     enum class Form : unsigned char {
-        Expression, ///< `expression` as it stands
+        Expression, ///< `expression` unchanged
         Literal,    ///< the integer literal `literal`
         Negated,    ///< minus `expression`
     };
@@ -66,12 +66,12 @@ struct CShift {
     ShiftAmount amount;
 };
 
-/// The C shift that says bitshift(a, amount): to the left by a positive amount, to the right by a negative one.  Of
+/// The C shift that equals bitshift(a, amount): to the left by a positive amount, to the right by a negative one.  Of
 /// 2147483648 places, which no literal has, one is left out.
 VTSYM_API CShift shiftOfQuillCall(const SymbolicExprTable& table, SymbolicExprId amount);
 
-/// The second argument of the bitshift() that says a C shift by `amount`.  A literal stays a literal where its negative
-/// fits 32 bits, and a minus is taken away rather than doubled.
+/// The second argument of the bitshift() that equals a C shift by `amount`.  A literal stays a literal where its
+/// negative fits 32 bits, and a minus is taken away rather than doubled.
 VTSYM_API ShiftAmount quillShiftAmount(const SymbolicExprTable& table, SymbolicOp shift, SymbolicExprId amount);
 
 } // namespace VT

@@ -1,3 +1,8 @@
+// Converts between the two shapes of one operation: the C operator and the call of a Quill function.
+//
+// Method: one rebuilding pass in each direction.  Names of functions are compared as identifiers.
+// Cost: linear in the distinct nodes.
+// Relies on: QuillCalls for names and for the amounts of shifts.
 #include "base/transform/QuillConversion.hpp"
 
 #include "base/core/Make.hpp"

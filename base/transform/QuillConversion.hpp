@@ -78,8 +78,8 @@ class VTSYM_API SymbolicExprQ2C {
 public:
     explicit SymbolicExprQ2C(SymbolicExprTable& table) : table_(table) {}
 
-    /// The C shape of an expression: the expression itself where nothing is to convert.  An identifier that is not of
-    /// the table gives the invalid one.  Linear in the number of distinct nodes.
+    /// The C shape of an expression: the expression itself where nothing is converted.  An identifier that is not of
+    /// the table yields the invalid one.  Linear in the number of distinct nodes.
     SymbolicExprId operator()(SymbolicExprId id) const;
 
 private:
@@ -91,8 +91,8 @@ class VTSYM_API SymbolicExprC2Q {
 public:
     explicit SymbolicExprC2Q(SymbolicExprTable& table) : table_(table) {}
 
-    /// The Quill shape of an expression: the expression itself where nothing is to convert.  An identifier that is not
-    /// of the table gives the invalid one.  Linear in the number of distinct nodes.
+    /// The Quill shape of an expression: the expression itself where nothing is converted.  An identifier that is not
+    /// of the table yields the invalid one.  Linear in the number of distinct nodes.
     SymbolicExprId operator()(SymbolicExprId id) const;
 
 private:

@@ -1,3 +1,8 @@
+// Replaces operands inside an expression.
+//
+// Method: one rebuilding pass.  Before a node is rebuilt, its operands on the stack are looked up, once each; the form
+// of the operator decides which of them may be replaced.
+// Cost: linear in the distinct nodes and their operands.
 #include "base/transform/Replacement.hpp"
 
 #include <boost/container/small_vector.hpp>

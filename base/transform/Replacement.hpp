@@ -1,4 +1,4 @@
-// Puts expressions in the place of others inside an expression.
+// Replaces operands of an expression by other expressions.
 #pragma once
 
 #include "base/transform/XForm.hpp"
@@ -7,16 +7,16 @@
 
 namespace VT {
 
-/// What is replaced, and what comes in its place; identifiers of the table that is built in.
+/// Operands and their replacements; identifiers of the table that is built in.
 using SymbolicExprReplacements = std::unordered_map<SymbolicExprId, SymbolicExprId>;
 
 /// Rebuilds an expression and replaces operands on the way: those of operators, ranges and rows, and the arguments of
 /// calls.  Names of functions, owners of members, dimensions, matrices, cell arrays and anonymous functions keep their
 /// operands, though not those further down: [f(x), 2] becomes [f(y), 2], but [x, 2] stays.
 ///
-/// An operand is looked up as it was rebuilt, once: what came in its place is not looked up again, so x and y can be
-/// exchanged.  The root is no operand and is never replaced, nor is an operand that is missing.  A replacement that is
-/// not of the target when it is needed is ignored.
+/// An operand is looked up as it was rebuilt, once: a replacement is not looked up again, so x and y can be
+/// exchanged.  The root is not an operand and is never replaced, nor is an operand that is missing.  A replacement that
+/// is not of the target when it is needed is ignored.
 class VTSYM_API SymbolicExprReplacementVisitor : public SymbolicExprXFormVisitor {
 public:
     /// A visitor that builds in `target`; `replacements` outlives it.
@@ -48,8 +48,8 @@ public:
         : table_(table),
           replacements_(replacements) {}
 
-    /// The expression with its operands replaced: itself where nothing is to replace.  An identifier that is not of the
-    /// table gives the invalid one.  Linear in the number of distinct nodes.
+    /// The expression with its operands replaced: itself where nothing is replaced.  An identifier that is not of the
+    /// table yields the invalid one.  Linear in the number of distinct nodes.
     SymbolicExprId operator()(SymbolicExprId id);
 
     /// Whether the last call replaced an operand.

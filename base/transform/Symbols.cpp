@@ -1,3 +1,5 @@
+// Collects the symbols that an expression mentions: one walk over the distinct nodes, with the nodes that were visited
+// kept from call to call.  Linear in the edges.
 #include "base/transform/Symbols.hpp"
 
 #include "base/core/Walk.hpp"

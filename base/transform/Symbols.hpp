@@ -10,7 +10,7 @@
 namespace VT {
 
 /// Collects symbols of one table in the order of their first occurrence, operands from left to right.  Every identifier
-/// is a symbol, the names of functions and the constants "true" and "false" too; the names of members are none.
+/// is a symbol, the names of functions and the constants "true" and "false" too; the names of members are not.
 ///
 /// A collector remembers what it visited: a further call adds only what the calls before did not meet.  When a call
 /// throws, the list is as it was and the collector is of no further use.  The table outlives it.

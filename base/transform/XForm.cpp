@@ -1,5 +1,13 @@
+// The bases of visitors that rebuild an expression bottom-up into a table.
+//
+// Method: rebuild() visits each distinct node once, operands first, and hands its result to further occurrences.  It
+// does so only while visits keep the discipline of the stack: after one that does not, and inside circles of a host's
+// table, nodes are visited for each occurrence, as execute() does.  Where nothing changed, the node's own identifier is
+// returned without a probe of the table.
+// Cost: linear in the distinct nodes and their operands; limits::repeatedVisits bounds the rest.
 #include "base/transform/XForm.hpp"
 
+#include "base/core/Check.hpp"
 #include "base/core/Limits.hpp"
 #include "base/core/Walk.hpp"
 #include "base/variants/VariantKeywords.hpp"
@@ -10,7 +18,7 @@ namespace VT {
 
 SymbolicExprFactory::~SymbolicExprFactory() = default;
 
-/// The NaN that was added last, if it stands where the table's own storage ends.
+/// Returns the NaN that was added last, if it is the last node of the table's own storage.
 SymbolicExprId SymbolicExprFactory::newestNaN() const {
     const SymbolicExprId last = table_.size() - 1;
     const SymbolicExpr* const node = table_.get(last);
@@ -84,7 +92,9 @@ SymbolicExprId SymbolicExprXFormVisitor::rebuild(const SymbolicExprTable& source
                 --repeatable;
         },
         [&](SymbolicExprId, const SymbolicExpr*) { push(invalidId); });
-    return get();
+    const SymbolicExprId result = get();
+    VTSYM_CHECK(!disciplined || depth() == 0);
+    return result;
 }
 
 /// The node rebuilt from the operands on the stack; its own identifier, without a probe, where nothing changed.

@@ -77,7 +77,7 @@ protected:
     /// The same for a subclass that keeps the results of several runs, by the source's identifiers.
     SymbolicExprId rebuild(const SymbolicExprTable& source, SymbolicExprId id, IdMap<SymbolicExprId>& results);
 
-    /// Visits one node that stands in the source under an identifier, for drivers of a subclass's own.  `id` is the
+    /// Visits one node of the source, for drivers of a subclass's own.  `id` is the
     /// invalid one unless source and target are one table.
     void visitAs(SymbolicExprId id, const SymbolicExpr& node);
 
@@ -89,9 +89,12 @@ protected:
     /// The identifier of a real literal; a NaN that is visited in place is the literal itself.
     SymbolicExprId makeReal(double value);
 
-    bool keywordsOn;            ///< the keyword feature when the visitor was made
+    /// Whether the keyword feature was on when the visitor was made.  A subclass may switch it off for itself.
+    bool keywordsOn;
     std::uint64_t operandLimit; ///< operands that a subclass flattens from one chain
-    bool gaveUp = false;        ///< set where a chain was longer
+    /// Whether a subclass has met a chain of more than operandLimit operands, or has given up for another reason: the
+    /// result of the run is not to be used.
+    bool gaveUp = false;
     SymbolicExprFactory factory_;
 
 private:
@@ -101,7 +104,7 @@ private:
     SymbolicExprTable& table_;
 };
 
-/// Tells the construction hooks of SymbolicExprXFormVisitor2 apart.
+/// Selects one of the construction hooks of SymbolicExprXFormVisitor2.
 template <SymbolicOp Op>
 struct OpTag {};
 

@@ -30,14 +30,14 @@ public:
 private:
     static constexpr std::size_t alignment = alignof(void*);
     static constexpr std::size_t firstChunk = std::size_t{1} << 12U;
-    static constexpr std::size_t largestChunk = std::size_t{1} << 20U;
+    static constexpr std::size_t lastChunkSize = std::size_t{1} << 20U;
 
     void grow(std::size_t bytes) {
         const std::size_t size = bytes > chunk_ ? bytes : chunk_;
         chunks_.push_back(std::make_unique_for_overwrite<std::byte[]>(size));
         next_ = chunks_.back().get();
         end_ = next_ + size;
-        if (chunk_ < largestChunk)
+        if (chunk_ < lastChunkSize)
             chunk_ *= 2;
     }
 

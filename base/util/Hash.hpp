@@ -1,4 +1,6 @@
 // The hash step that every hash of the library is made of.
+//
+// One round of MurmurHash64A (Appleby, 2008) without its final mix: tables spread the bits themselves.
 #pragma once
 
 #include <cstdint>

@@ -1,4 +1,7 @@
 // A small, fast map from identifiers to values, for memos that live during one walk.
+//
+// Method: open addressing with linear probing, filled to three quarters at most; multiplication spreads the keys.
+// Cost: O(1) on average; no memory until the first insertion.
 #pragma once
 
 #include "base/util/Hash.hpp"
@@ -10,8 +13,7 @@
 
 namespace VT {
 
-/// Open addressing with linear probing; keys are never removed one by one.  The identifier with all bits set is not a
-/// key.
+/// Keys are never removed one by one.  The identifier with all bits set is not a key.
 template <class Value>
 class IdMap {
 public:

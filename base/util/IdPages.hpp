@@ -1,4 +1,8 @@
 // A sparse array over identifiers, for memos that live long.
+//
+// Method: two levels of page tables as of virtual memory, with pages of 16 values; identifiers beyond any dense table
+// are kept in a map instead.
+// Cost: O(1) for each access, no table look-up where it is the page that was written last; memory in the pages written.
 #pragma once
 
 #include "base/util/IdMap.hpp"
@@ -19,8 +23,8 @@ class IdPages {
 public:
     using Id = std::uint64_t;
 
-    /// The place of a value, or nullptr where its page was never written; a page starts with zeros.  Valid until the
-    /// next at().
+    /// Returns the place of a value, or nullptr where its page was never written; a page starts with zeros.  Valid
+    /// until the next at().
     [[nodiscard]] const Value* find(Id id) const noexcept {
         if (id / pageSize == lastNumber_)
             return &pages_[lastPage_][id % pageSize];
@@ -32,14 +36,14 @@ public:
         return page == 0 ? nullptr : &pages_[page - 1][id % pageSize];
     }
 
-    /// The place of a value, made if it was not there.  Valid until the next at().
+    /// Returns the place of a value and makes it if it was not there.  Valid until the next at().
     Value& at(Id id) {
         if (id / pageSize != lastNumber_)
             turnTo(id);
         return pages_[lastPage_][id % pageSize];
     }
 
-    /// Room for the values of so many neighbours.
+    /// Makes room for the values of `count` neighbouring identifiers.
     void reserve(std::size_t count) {
         chapters_.reserve(count / (pageSize * chapterSize) + 1);
         pages_.reserve(count / pageSize + 1);
@@ -83,7 +87,7 @@ private:
         return root_[outer];
     }
 
-    /// The number of elements behind the addition: the number of a page or chapter, from 1 on.
+    /// Returns the number of elements after the addition: the number of the new page or chapter, from 1 on.
     template <class Element>
     static std::uint32_t addZeros(PlainVector<Element>& vector, std::size_t count) {
         std::memset(static_cast<void*>(vector.extend(count)), 0, count * sizeof(Element));
@@ -95,7 +99,7 @@ private:
     PlainVector<std::array<std::uint32_t, chapterSize>> chapters_; ///< numbers of pages; 0 for none
     PlainVector<std::array<Value, pageSize>> pages_;
     Id lastNumber_ = none;       ///< id / pageSize of the page that at() wrote last
-    std::uint32_t lastPage_ = 0; ///< where it stands in pages_
+    std::uint32_t lastPage_ = 0; ///< its index in pages_
 };
 
 } // namespace VT

@@ -1,4 +1,4 @@
-// Large pages for what is read all over.
+// Large memory pages for storage that is read in random order.
 #pragma once
 
 #include <cstddef>

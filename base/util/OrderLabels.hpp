@@ -33,7 +33,7 @@ std::size_t labelInserted(Iterator begin, Iterator end, Iterator at, LabelOf lab
         return 1;
     }
     Iterator first = at;
-    Iterator behind = std::next(at);
+    Iterator last = std::next(at);
     std::size_t count = 1;
     double most = 1;
     for (unsigned bits = 1;; ++bits) {
@@ -41,14 +41,14 @@ std::size_t labelInserted(Iterator begin, Iterator end, Iterator at, LabelOf lab
         const std::uint64_t low = below & ~span;
         for (; first != begin && labelOf(*std::prev(first)) >= low; ++count)
             --first;
-        for (; behind != end && labelOf(*behind) - low <= span; ++count)
-            ++behind;
+        for (; last != end && labelOf(*last) - low <= span; ++count)
+            ++last;
         most *= growth;
         if (static_cast<double>(count) > most && bits < 64)
             continue;
         const std::uint64_t step = span / (count + 1);
         std::uint64_t label = low;
-        for (; first != behind; ++first)
+        for (; first != last; ++first)
             labelOf(*first) = label += step;
         return count;
     }

@@ -1,4 +1,6 @@
 // A vector of plain data for large, long-lived stores.
+//
+// Method: std::realloc, which moves large blocks by their page tables where the system can.  Capacity doubles.
 #pragma once
 
 #include <algorithm>
@@ -28,13 +30,13 @@ public:
 
     [[nodiscard]] std::size_t size() const noexcept { return size_; }
 
-    /// Room for so many values in all.
+    /// Makes room for `count` values in all.
     void reserve(std::size_t count) {
         if (capacity_ < count)
             grow(count - size_);
     }
 
-    /// Appends values that are to be written before they are read, and gives the first.  Moves the others.
+    /// Appends `count` values, to be written before they are read, and returns the first.  Moves the others.
     Value* extend(std::size_t count) {
         if (capacity_ - size_ < count)
             grow(count);
@@ -50,7 +52,10 @@ public:
 
     void pop_back() noexcept { --size_; }
 
-    /// Forgets all values and gives their memory back.
+    /// Forgets the values from a position on and keeps their memory.
+    void truncate(std::size_t size) noexcept { size_ = std::min(size_, size); }
+
+    /// Forgets all values and frees their memory.
     void clear() noexcept {
         std::free(data_);
         data_ = nullptr;
@@ -60,7 +65,7 @@ public:
 
 private:
     void grow(std::size_t count) {
-        constexpr std::size_t firstBytes = 960; // what allocators still keep at hand
+        constexpr std::size_t firstBytes = 960; // of a size that allocators keep ready
         const std::size_t capacity =
             std::max({firstBytes / sizeof(Value), std::size_t{1}, 2 * capacity_, size_ + count});
         void* const grown = std::realloc(static_cast<void*>(data_), capacity * sizeof(Value));

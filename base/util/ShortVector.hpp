@@ -8,8 +8,8 @@
 
 namespace VT {
 
-/// A small_vector whose move assignment needs no memory.  That of the base does where the target was moved from before,
-/// and ends the program when there is none.
+/// A small_vector whose move assignment needs no memory.  That of the base allocates where the target was moved from
+/// before, and ends the program when memory runs out.
 template <class Value, std::size_t Count>
 class ShortVector final : public boost::container::small_vector<Value, Count> {
     using Base = boost::container::small_vector<Value, Count>;

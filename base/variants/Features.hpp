@@ -8,7 +8,7 @@ namespace VT {
 /// "CacheSymExprSimplifyResults": whether the condition service keeps the results of simplification.
 VTSYM_API VtFeature& cacheSymExprSimplifyResultsFeature();
 
-/// "GuardIncludesOfVariantData": for the host's code generation; the library decides nothing by it.
+/// "GuardIncludesOfVariantData": for the host's code generation; the library does not read it.
 VTSYM_API VtFeature& guardIncludesOfVariantDataFeature();
 
 } // namespace VT

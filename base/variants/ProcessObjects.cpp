@@ -1,5 +1,6 @@
-// Everything that the library creates when it is loaded.  One translation unit, because only within one does C++
-// promise an order.
+// Everything that the library creates when it is loaded: feature flags, loggers and keywords.
+//
+// One translation unit, because only within one does C++ guarantee an order of construction.
 #include "base/variants/Features.hpp"
 #include "base/variants/Loggers.hpp"
 #include "base/variants/VariantKeywords.hpp"

@@ -1,4 +1,4 @@
-// The reserved words that may stand in the place of a variant condition.
+// The reserved words that may be written instead of a variant condition.
 #pragma once
 
 #include "host/Export.hpp"
@@ -7,6 +7,7 @@
 
 namespace VT {
 
+/// The spellings of the keywords.  All of them are O(length of the text).
 class VTSYM_API VariantKeywords {
 public:
     static std::string getInheritVariantKeyword();   ///< "(inherit)": the variant follows its parent
@@ -18,8 +19,8 @@ public:
     /// Whether the text is exactly one of the four keywords or, withCGVarName, the name "@default".
     static bool isVariantKeyword(const std::string& text, bool withCGVarName);
 
-    // Whether the text, apart from white space around it, is the keyword.  White space is what the current locale says.
-    // Always false unless enabled: the caller says whether that kind of keyword is in force.
+    // Whether the text, apart from white space around it, is the keyword.  The current locale defines white space.
+    // Always false unless `enabled`: the caller knows whether that kind of keyword is in force.
     static bool isInheritVariantKeyword(const std::string& text, bool enabled);
     static bool isDefaultVariantKeyword(const std::string& text, bool enabled);
     static bool isSimVariantKeyword(const std::string& text, bool enabled);

@@ -1,4 +1,6 @@
-// Diagnostics as exceptions with sentences from the catalogue.
+// Diagnostics of the embedded host: exceptions with sentences from the catalogue, and the end of the process.
+//
+// A fatal diagnostic writes one line to standard error and aborts, so that a debugger or a core dump shows the place.
 #include "host/Diagnostics.hpp"
 
 #include "host/Messages.hpp"

@@ -1,4 +1,6 @@
-// Flags in a registry of the process, started from the environment variable VTSYM_FEATURES.
+// Feature flags in a registry of the process, started from the environment variable VTSYM_FEATURES.
+//
+// Look-ups search the registry from the front: there are a handful of flags.
 #include "host/Feature.hpp"
 #include "host/Log.hpp"
 #include "host/Text.hpp"
@@ -10,7 +12,7 @@
 
 namespace {
 
-/// What VTSYM_FEATURES asks for.
+/// The assignments in VTSYM_FEATURES.
 struct Settings {
     std::vector<VT::FeatureAssignment> assignments; ///< in the order written, bad ones too
 
@@ -74,8 +76,8 @@ VtFeature::~VtFeature() {
 }
 
 std::int32_t VtFeature::value() const {
-    // Told on the first reading: by then every flag of the library has been made, and what still has no flag is a
-    // mistake.
+    // Reported on the first reading: by then every flag of the library has been made, and an assignment that still has
+    // no flag is a mistake.
     static const bool reported = reportSettings();
     static_cast<void>(reported);
     return value_;

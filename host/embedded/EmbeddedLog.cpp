@@ -1,4 +1,6 @@
 // Loggers on spdlog, writing to standard error.
+//
+// A logger opens its sink with the first line that it writes: most never write.  Lines are escaped and cut.
 #include "host/Log.hpp"
 
 #include "host/Text.hpp"
@@ -35,7 +37,7 @@ spdlog::level::level_enum spdlogLevel(Level level) {
 
 struct basic_diagnostic_logger<char>::Sink {
     explicit Sink(const std::string& name) : logger(name, std::make_shared<spdlog::sinks::stderr_sink_st>()) {
-        logger.set_level(spdlog::level::trace); // the logger above has looked at the level already
+        logger.set_level(spdlog::level::trace); // the logger above has checked the level already
         logger.set_pattern("%n: %l: %v");
     }
 

@@ -1,3 +1,7 @@
+// The embedded host's model, and the host services that the library asks about it.
+//
+// Blocks are owned in the order of addition, so that a parent comes before its blocks.  A hash map from parent and name
+// to block serves paths: find() is linear in the path.
 #include "host/embedded/EmbeddedModel.hpp"
 
 #include "host/Text.hpp"
@@ -72,7 +76,7 @@ const VTBlock* VTRootBD::find(std::string_view path) const {
     }
 }
 
-// What the library asks.
+// The services of host/Model.hpp.
 
 const VTBlock* vtsvGetBlockParent(const VTBlock& block) {
     return block.parent();

@@ -16,12 +16,12 @@ class VTRootBD;
 
 namespace VT::Embedded {
 
-/// Where a text stands in the file of the model.  Lines and columns begin at 1 and columns count code points; 0 is
+/// The place of a text in the file of the model.  Lines and columns begin at 1 and columns count code points; 0 is
 /// unknown.  Quotes belong to the text.
 struct TextPlace {
     std::uint64_t line = 0;
     std::uint64_t column = 0;
-    std::uint64_t endColumn = 0; ///< behind the last one
+    std::uint64_t endColumn = 0; ///< after the last one
 };
 
 } // namespace VT::Embedded
@@ -39,21 +39,21 @@ public:
     /// Whether this block is a choice of its parent.
     [[nodiscard]] bool isChoice() const noexcept { return isChoice_; }
 
-    /// The condition of this block alone, in the language of the model; empty where there is none.
+    /// The condition of this block alone, in the language of the model; empty without one.
     [[nodiscard]] const std::string& variantCondition() const noexcept { return condition_; }
 
-    /// The alternatives of this block, in the order of the model.
+    /// The choices of this block, in the order of the model.
     [[nodiscard]] std::span<const VTBlock* const> choices() const noexcept { return choices_; }
 
-    /// The names from the top of the model, separated by "/"; of more than eight the last eight, behind ".../".
-    /// Names are fit for a terminal, of a long one the beginning.
+    /// The names from the top of the model, separated by "/"; of more than eight the last eight, after ".../".
+    /// Names are shown fit for a terminal, long ones cut.
     [[nodiscard]] std::string path() const;
 
     [[nodiscard]] const VT::Embedded::TextPlace& namePlace() const noexcept { return namePlace_; }
 
     [[nodiscard]] const VT::Embedded::TextPlace& conditionPlace() const noexcept { return conditionPlace_; }
 
-    /// `place` is where the text stands, quotes included.
+    /// `place` is the place of the text, quotes included.
     void setVariantCondition(std::string condition, const VT::Embedded::TextPlace& place = {});
 
 private:
@@ -115,12 +115,12 @@ public:
     /// Adds a block without a name and a condition to a block of this model, or to the top for nullptr.  A choice has a
     /// parent.
     VTBlock& addBlock(VTBlock* parent, bool isChoice);
-    /// Names a block.  What is wrong with the name, in words for its author; empty when it was given.  A name is not
-    /// empty, holds no "/", and is the only one of its kind beside its siblings.
+    /// Names a block.  Returns what is wrong with the name, in words for its author; empty on success.  A name is not
+    /// empty, holds no "/", and differs from those of its siblings.
     std::string nameBlock(VTBlock& block, std::string name, const VT::Embedded::TextPlace& place = {});
     void addPort(vtPort port);
 
-    /// All blocks, each behind its parent; siblings in the order in which they were added.
+    /// All blocks, each after its parent; siblings in the order in which they were added.
     [[nodiscard]] const std::deque<VTBlock>& blocks() const noexcept { return blocks_; }
 
     [[nodiscard]] const std::deque<vtPort>& ports() const noexcept { return ports_; }

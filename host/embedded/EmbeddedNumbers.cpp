@@ -1,4 +1,6 @@
-// Numbers through <charconv>, which knows no locale.
+// Numbers as text and back through <charconv>, which is exact and knows no locale.
+//
+// Digits come from the shortest or the 17-digit scientific form and are laid out anew.  Linear in the text.
 #include "host/Numbers.hpp"
 
 #include <algorithm>

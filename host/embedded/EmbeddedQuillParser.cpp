@@ -1,3 +1,9 @@
+// The embedded host's parser of Quill text.
+//
+// Method: operator precedence (Floyd, "Syntactic analysis and operator precedence", 1963) with two states: an operand
+// must follow, or one is complete.  Brackets and anonymous functions are kept on explicit stacks; nothing recurses.
+// Cost: linear in the text; memory in the open brackets and the tree.
+// Relies on: QuillLexer for tokens, QuillBuilder for the stack of operands and the tree.
 #include "host/embedded/EmbeddedQuillParser.hpp"
 
 #include <array>
@@ -49,7 +55,7 @@ std::string_view QuillParser::keywordHere() const {
     return {};
 }
 
-// Where an operand must follow.
+// An operand must follow.
 
 QuillParser::State QuillParser::readOperand() {
     lexer_.skipBlanks();
@@ -96,7 +102,7 @@ QuillParser::State QuillParser::readName() {
     if (name.code == static_cast<std::int32_t>(QuillToken::Identifier))
         return push(name, Tail::Chain);
     if (indexes_ == 0)
-        return fail("end stands only among the arguments of an index", name.start);
+        return fail("end is only allowed among the arguments of an index", name.start);
     return push(name, Tail::Value);
 }
 
@@ -124,10 +130,10 @@ QuillParser::State QuillParser::readFunction() {
     if (lexer_.peek() == '(')
         return readParameters(start);
     if (!QuillLexer::startsName(lexer_.peek()))
-        return fail("a function name or parameters in parentheses are missing behind @");
+        return fail("a function name or parameters in parentheses are missing after @");
     const QuillNode name = lexer_.name();
     if (name.code != static_cast<std::int32_t>(QuillToken::Identifier))
-        return fail("end is no function name", name.start);
+        return fail("end is not a function name", name.start);
     builder_.push(name);
     builder_.gather(builder_.operandCount() - 1, QuillRule::FunctionHandle, start);
     prefixes_ = 0;
@@ -147,12 +153,12 @@ QuillParser::State QuillParser::readParameters(std::size_t start) {
             return fail("a parameter name is missing");
         const QuillNode name = lexer_.name();
         if (name.code != static_cast<std::int32_t>(QuillToken::Identifier))
-            return fail("end is no parameter name", name.start);
+            return fail("end is not a parameter name", name.start);
         builder_.push(name);
         lexer_.skipBlanks();
         more = lexer_.peek() == ',';
         if (!more && lexer_.peek() != ')')
-            return fail("a , or ) is missing behind the parameter");
+            return fail("a , or ) is missing after the parameter");
         if (more)
             lexer_.skip(1);
     }
@@ -186,11 +192,11 @@ QuillParser::State QuillParser::missingOperand() {
     if (byte == ';' && !open_.back().bracket->semicolons)
         return extraSemicolon();
     if (byte >= 0x80)
-        return fail("characters outside ASCII stand only in quotes and comments");
+        return fail("characters outside ASCII are only allowed in quotes and comments");
     return fail(lexer_.atEnd() ? "the text ends where a value must follow" : "a value is missing");
 }
 
-// Behind an operand.
+// An operand is complete.
 
 QuillParser::State QuillParser::readOperator() {
     const bool blank = lexer_.skipBlanks();
@@ -232,8 +238,8 @@ QuillParser::State QuillParser::readOperator() {
                                                                                          : readInfix(*found);
 }
 
-/// Whether what stands here, behind white space, is an element of its own: not an operator, unless one that is a prefix
-/// operator by standing directly before its operand.
+/// Whether the token here, after white space, begins an element of its own.  An operator does so only as a prefix
+/// operator: directly before its operand.
 bool QuillParser::startsElement() const {
     const char c = lexer_.peek();
     switch (c) {
@@ -293,14 +299,14 @@ QuillParser::State QuillParser::readField() {
         return fail("a field name is missing");
     const QuillNode field = lexer_.name();
     if (field.code != static_cast<std::int32_t>(QuillToken::Identifier))
-        return fail("end is no field name", field.start);
+        return fail("end is not a field name", field.start);
     wrap(QuillRule::Field, std::array{builder_.lastOperand(), field});
     return State::Operator;
 }
 
 QuillParser::State QuillParser::nextElement() {
     if (!open_.back().bracket->commas)
-        return fail("a comma stands only between arguments and between elements");
+        return fail("a comma is only allowed between arguments and between elements");
     reduceTo(QuillLevel::Expression);
     lexer_.skip(1);
     return State::Operand;
@@ -317,7 +323,7 @@ QuillParser::State QuillParser::nextRow() {
 }
 
 QuillParser::State QuillParser::extraSemicolon() {
-    return fail("this ; is extra: it stands only between the rows of a matrix or of a cell array");
+    return fail("this ; is extra: it is only allowed between the rows of a matrix or of a cell array");
 }
 
 QuillParser::State QuillParser::close() {
@@ -360,9 +366,9 @@ QuillParser::State QuillParser::finish() {
 QuillParser::State QuillParser::missingOperator() {
     const char c = lexer_.peek();
     if (c == '=')
-        return fail("a single = is no operator; == compares");
+        return fail("a single = is not an operator: write == to compare");
     if (static_cast<unsigned char>(c) >= 0x80)
-        return fail("characters outside ASCII stand only in quotes and comments");
+        return fail("characters outside ASCII are only allowed in quotes and comments");
     return fail("an operator is missing");
 }
 

@@ -1,6 +1,4 @@
-// The embedded host's parser of Quill text.
-//
-// Operator precedence with explicit stacks; nothing recurses.
+// The embedded host's parser of Quill text: operator precedence with explicit stacks.
 #pragma once
 
 #include "host/embedded/QuillBrackets.hpp"
@@ -8,6 +6,7 @@
 
 namespace VT::Embedded {
 
+/// The parser of host/QuillParser.hpp over char.  Linear in the text; keeps the memory of small texts for the next one.
 class QuillParser final : public PARSER_T<char> {
 public:
     QuillParser(std::size_t nesting, std::span<const std::string> keywords);
@@ -18,7 +17,7 @@ public:
     QuillFailure failure() const noexcept override { return failure_; }
 
 private:
-    /// What reading one token leads to.
+    /// The state after one token.
     enum class State : std::uint8_t {
         Operand,  ///< an operand must follow
         Operator, ///< an operand is complete
@@ -26,7 +25,7 @@ private:
         Failed,
     };
 
-    /// What may stand directly behind an operand.
+    /// What may directly follow an operand.
     enum class Tail : std::uint8_t {
         Chain, ///< arguments, a field, a transpose
         Value, ///< a transpose
@@ -46,7 +45,7 @@ private:
 
     State fail(std::string_view reason) { return fail(reason, lexer_.position()); }
 
-    // Where an operand must follow.
+    // An operand must follow.
     State readOperand();
     State readName();
     State readQuotedText();
@@ -56,7 +55,7 @@ private:
     State open(const QuillBracket& bracket);
     State missingOperand();
 
-    // Behind an operand.
+    // An operand is complete.
     State readOperator();
     State readInfix(const QuillOperator& infix);
     State readColon();
@@ -82,7 +81,7 @@ private:
 
     std::size_t depth() const { return open_.size() - 1 + functions_; }
 
-    /// The keyword that stands here, empty where none does.
+    /// The keyword at this place, empty without one.
     std::string_view keywordHere() const;
 
     const std::size_t nesting_;

@@ -1,3 +1,6 @@
+// UTF-16 to UTF-8, one code point at a time; a surrogate without its partner becomes U+FFFD.
+//
+// Linear in the text.
 #include "host/Text.hpp"
 
 namespace {

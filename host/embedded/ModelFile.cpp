@@ -1,4 +1,9 @@
-// Reads a model while its JSON text goes by, with a stack of what is open.
+// Reads a model from JSON.
+//
+// Method: an event-driven (SAX) reader with a stack of open objects and lists, checked against a table of members.
+// Ports are joined to their blocks at the end, when all blocks have their names.  A counting iterator recovers the
+// place of each token, which the JSON parser does not report.
+// Cost: linear in the text.
 #include "host/embedded/ModelFile.hpp"
 
 #include "host/Text.hpp"
@@ -20,7 +25,7 @@ constexpr std::size_t shownBytes = 80;
 
 // Where the reader is in a text.
 
-/// Tells how far the parser has read, which it keeps to itself.
+/// Records how far the parser has read, which it does not report.
 class CountingIterator {
 public:
     using iterator_category = std::input_iterator_tag;
@@ -79,7 +84,7 @@ private:
     std::uint64_t column_ = 1;
 };
 
-// What a model is made of.
+// The members of a model.
 
 enum class Part : std::uint8_t { Model, Blocks, Choices, Block, Ports, Port, Destinations };
 
@@ -89,7 +94,7 @@ struct Member {
     Part in;
     std::string_view name;
     Shape shape;
-    Part list; ///< what its list is
+    Part list; ///< the part that its list is
 };
 
 constexpr std::array<Member, 14> members{{
@@ -203,7 +208,7 @@ private:
     const char*& furthest_;
     Places places_;
     TextPlace place_;     ///< of the token that was read last
-    std::size_t end_ = 0; ///< behind it
+    std::size_t end_ = 0; ///< after it
     std::vector<Open> open_;
     std::vector<PendingPort> ports_;
 };
@@ -383,7 +388,7 @@ bool Reader::parse_error(std::size_t position, const std::string&, const Json::e
     if (const std::size_t colon = sentence.find(": "); colon != std::string::npos)
         sentence.erase(0, colon + 2);
     const std::size_t at = std::min(position == 0 ? 0 : position - 1, text_.size());
-    throw ModelError("This is no JSON: " + shownText(sentence, 4 * shownBytes) + ".", Places(text_).of(at, at));
+    throw ModelError("This is not JSON: " + shownText(sentence, 4 * shownBytes) + ".", Places(text_).of(at, at));
 }
 
 const VTBlock& Reader::resolve(const PendingName& name) const {

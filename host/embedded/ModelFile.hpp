@@ -8,7 +8,8 @@
 
 namespace VT::Embedded {
 
-/// A text is no model.  what() is a sentence that says what to change, with the JSON pointer of the place.
+/// Thrown for a text that is not a model.  what() is a sentence that says what to change, with the JSON pointer of the
+/// place.
 class VTSYM_API ModelError : public std::runtime_error {
 public:
     ModelError(const std::string& sentence, const TextPlace& place) : std::runtime_error(sentence), place_(place) {}
@@ -20,7 +21,7 @@ private:
 };
 
 /// Reads a model from JSON text, as docs/model.schema.json describes it, into an empty root diagram.  Throws ModelError
-/// for the first thing that is wrong; the diagram is in an unspecified state then.  Linear in the text; nesting needs
+/// for the first error; the diagram is in an unspecified state then.  Linear in the text; nesting needs
 /// no stack.
 VTSYM_API void readModel(const std::string& json, VTRootBD& model);
 

@@ -5,13 +5,13 @@
 
 namespace VT::Embedded {
 
-/// A kind of bracket, and what may stand in it.
+/// A kind of bracket, and what it may hold.
 struct QuillBracket {
     char closing;
     QuillToken open;
     QuillToken close;
-    QuillRule rule;              ///< of what the bracket makes
-    std::string_view missing;    ///< the reason to fail where another bracket closes, or none
+    QuillRule rule;              ///< that the bracket makes
+    std::string_view missing;    ///< the reason for a failure where another bracket closes, or nothing does
     bool commas = false;         ///< between arguments or elements
     bool semicolons = false;     ///< between rows
     bool blanksSeparate = false; ///< white space separates like a comma

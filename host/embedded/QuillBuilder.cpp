@@ -1,3 +1,5 @@
+// Builds parse trees: an operator takes its operands from their stack as soon as one that binds no tighter follows.
+// Each step is O(children); the stacks and a small tree are kept from text to text.
 #include "host/embedded/QuillBuilder.hpp"
 
 #include <array>

@@ -1,4 +1,4 @@
-// Operands and the operators that wait for more of them become a tree.
+// Builds a parse tree from operands and operators.
 #pragma once
 
 #include "host/embedded/QuillTree.hpp"
@@ -26,10 +26,10 @@ public:
     /// The tree of the only operand.
     QuillTree* finish();
 
-    /// Gives back what a long text has made the stacks and the unfinished tree hold.
+    /// Frees the memory of stacks and of an unfinished tree that a long text made large.
     void release();
 
-    /// Takes a tree back.
+    /// Takes a tree back for another text.
     void recycle(std::unique_ptr<QuillTree> tree) noexcept;
 
     std::size_t operandCount() const { return operands_.size(); }
@@ -47,7 +47,7 @@ public:
 
     /// Begins a group.
     ///
-    /// @return what ends it
+    /// @return the argument for endGroup()
     std::size_t beginGroup() { return std::exchange(group_, waiting_.size()); }
 
     void endGroup(std::size_t outer) { group_ = outer; }
@@ -60,7 +60,7 @@ public:
     /// Makes one operand of the operands from `first` on: they become its children.
     void gather(std::size_t first, QuillRule rule, std::size_t start);
 
-    /// Puts one operand in the place of the last ones.
+    /// Replaces the last operands by one, whose children are given.
     void replace(std::size_t operands, std::size_t start, QuillRule rule, std::span<const QuillNode> children);
 
 private:

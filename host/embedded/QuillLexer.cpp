@@ -1,3 +1,6 @@
+// Reads the tokens of Quill text.
+//
+// The first character selects the kind of token, at most two more settle it.  Linear in the text.
 #include "host/embedded/QuillLexer.hpp"
 
 #include <algorithm>
@@ -90,7 +93,7 @@ QuillNode QuillLexer::number() {
             ++length;
     } else {
         length = skipDigits(0);
-        // The dot of an operator or of a continuation is none of the number's: 5.^2 is 5 .^ 2.
+        // The dot of an operator or of a continuation does not belong to the number: 5.^2 is 5 .^ 2.
         if (peek(length) == '.' && dottedOperator(peek(length + 1)) == nullptr && !isBlank(length))
             length = skipDigits(length + 1);
         if ((peek(length) | 0x20) == 'e') {
@@ -100,8 +103,8 @@ QuillNode QuillLexer::number() {
                 length = skipDigits(exponent);
         }
     }
-    const Class behindSuffix = classOf(peek(length + 1));
-    if ((peek(length) == 'i' || peek(length) == 'j') && behindSuffix != Class::Letter && behindSuffix != Class::Digit)
+    const Class afterSuffix = classOf(peek(length + 1));
+    if ((peek(length) == 'i' || peek(length) == 'j') && afterSuffix != Class::Letter && afterSuffix != Class::Digit)
         return token(QuillToken::ImaginaryNumber, length + 1);
     return token(QuillToken::Number, length);
 }

@@ -1,7 +1,7 @@
 // The tokens of Quill text.
 //
-// What a character means depends on where it stands: a quote opens a text where an operand may start and transposes
-// behind one.  The parser knows the place and asks for the token that may stand there.
+// The meaning of a character depends on its place: a quote opens a text where an operand may start and transposes after
+// one.  The parser knows the place and asks for the token that may be there.
 #pragma once
 
 #include "host/QuillParser.hpp"
@@ -28,7 +28,7 @@ enum class QuillLevel : std::uint8_t {
     Power,
 };
 
-/// An operator that stands behind an operand.
+/// An operator that follows an operand.
 struct QuillOperator {
     std::string_view spelling;
     QuillToken token;
@@ -36,7 +36,7 @@ struct QuillOperator {
     QuillLevel level;
 };
 
-/// Reads a text from left to right.  Behind the end of the text it sees NUL.
+/// Reads a text from left to right.  After the end of the text it sees NUL.
 class QuillLexer {
 public:
     explicit QuillLexer(std::string_view text) : text_(text) {}
@@ -56,7 +56,7 @@ public:
     /// @return whether there were any
     bool skipBlanks() { return mayBeBlank(peek()) && skipMoreBlanks(); }
 
-    /// Whether white space, a comment or a continuation stands `ahead` of here.
+    /// Whether white space, a comment or a continuation begins `ahead` characters from here.
     bool isBlank(std::size_t ahead) const;
 
     static bool startsName(char c) { return classOf(c) == Class::Letter; }
@@ -67,7 +67,7 @@ public:
 
     void skip(std::size_t length) { position_ += length; }
 
-    /// The token of so many characters from here.
+    /// Reads the token of `length` characters from here.
     QuillNode token(QuillToken code, std::size_t length) {
         const QuillNode node = here(code, length);
         position_ += length;
@@ -83,7 +83,7 @@ public:
     /// A text in the quotes that start here; of length 0, and nothing is read, where they are not closed.
     QuillNode quotedText();
 
-    /// The operator behind an operand that starts here, or nullptr.  A quote counts as the transpose.
+    /// The operator at this place, after an operand, or nullptr.  A quote counts as the transpose.
     const QuillOperator* operatorHere() const;
 
 private:

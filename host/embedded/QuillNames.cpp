@@ -1,4 +1,6 @@
-// The names of the codes in parse trees.
+// The names of the codes in parse trees, for people.
+//
+// Expanded from host/QuillCodes.def into switches, so a code is looked up in constant time.
 #include "host/QuillParser.hpp"
 
 const char* vtuQParserTerminalName(std::int32_t code) noexcept {

@@ -16,7 +16,7 @@ class QuillTree : public QuillNode {
 public:
     QuillTree() : QuillNode{} {}
 
-    /// Stores nodes behind one another.
+    /// Stores nodes in a row.
     ///
     /// @return the first of them, nullptr for none
     const QuillNode* store(std::span<const QuillNode> nodes) {

@@ -1,6 +1,9 @@
 // Memory runs out at every allocation in turn: the error passes, nothing leaks or breaks, the next call is right.
 #include "base/core/Nodes.hpp"
 #include "base/service/SymbolRegistry.hpp"
+#include "base/simplify/Simplify.hpp"
+#include "base/text/TextPool.hpp"
+#include "base/transform/QuillConversion.hpp"
 #include "host/QuillParser.hpp"
 #include "tests/service/Customizers.hpp"
 #include "tests/support/Times.hpp"
@@ -11,6 +14,7 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <dlfcn.h>
 #include <functional>
 #include <new>
 #include <optional>
@@ -94,6 +98,21 @@ std::vector<std::pair<SymbolicOp, NodeParts>> script() {
         steps.emplace_back(op, parts);
     }
     return steps;
+}
+
+TEST(MemoryRunsOut, WhileADeepTextIsWritten) {
+    forEachFailure([&](std::size_t number) {
+        constexpr std::size_t depth = 300; // more than a writer has room for from the start
+        TextPool pool;
+        Text deep = pool.bytes("x");
+        for (std::size_t i = 0; i < depth; ++i)
+            deep = pool.enclose("(", deep, ")");
+        std::string whole(depth, '(');
+        whole.append("x").append(depth, ')');
+        attempt(number, [&] { static_cast<void>(pool.str(deep, whole.size())); });
+        ASSERT_EQ(pool.str(pool.bytes("y"), 1), "y");
+        ASSERT_EQ(pool.str(deep, whole.size()), whole);
+    });
 }
 
 TEST(MemoryRunsOut, WhileNodesAreInterned) {
@@ -237,3 +256,17 @@ void operator delete(void* place, std::align_val_t) noexcept {
 void operator delete(void* place, std::size_t, std::align_val_t) noexcept {
     release(place);
 }
+
+#if !defined(__SANITIZE_ADDRESS__)
+// Stores that grow in place; the sanitizer has an allocator of its own.
+extern "C" void* realloc(void* place, std::size_t bytes) noexcept {
+    static const auto next = reinterpret_cast<void* (*)(void*, std::size_t)>(::dlsym(RTLD_NEXT, "realloc"));
+    if (untilFailure == 0) {
+        failed = true;
+        return nullptr;
+    }
+    if (untilFailure != never)
+        --untilFailure;
+    return next(place, bytes);
+}
+#endif

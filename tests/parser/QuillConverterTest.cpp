@@ -233,10 +233,10 @@ TEST_F(QuillReports, ThoseOfAnEarlierTextExplainNothing) {
     const std::u16string lone = std::u16string(u"b + ") + char16_t{0xd800};
     for (int i = 0; i < 2; ++i) {
         EXPECT_EQ(reason("A +"), "The text ends where a value must follow.@3");
-        EXPECT_EQ(reason(lone), "\"b + \xef\xbf\xbd\" holds no valid character at byte 5, before \"\xef\xbf\xbd\": "
+        EXPECT_EQ(reason(lone), "\"b + \xef\xbf\xbd\" holds an invalid character at byte 5, before \"\xef\xbf\xbd\": "
                                 "replace it.@4");
         EXPECT_EQ(reason("1 + f(x)"), "@0");
-        EXPECT_EQ(reason("2i"), "\"2i\" has no meaning where it stands in \"2i\": write the expression without it.@0");
+        EXPECT_EQ(reason("2i"), "\"2i\" cannot be used in \"2i\": write the expression without it.@0");
     }
     EXPECT_EQ(checker.diagnostics().size(), 6U);
 }

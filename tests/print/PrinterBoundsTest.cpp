@@ -3,6 +3,7 @@
 #include "base/core/Limits.hpp"
 #include "base/print/ExpressionPrinter.hpp"
 #include "base/print/StringifySymbolicExpr.hpp"
+#include "base/print/StructuralOrder.hpp"
 #include "tests/support/TreeReader.hpp"
 #include "tests/support/generators/AnyNode.hpp"
 #include "tests/support/generators/RandomExpression.hpp"

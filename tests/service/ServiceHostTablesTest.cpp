@@ -9,6 +9,7 @@
 #include "base/eval/EvalVisitor.hpp"
 #include "base/print/CTextObstacles.hpp"
 #include "base/print/PreprocessorVCExpr.hpp"
+#include "base/print/StructuralOrder.hpp"
 #include "base/service/VCSymbols.hpp"
 #include "base/simplify/Simplify.hpp"
 #include "base/transform/QuillConversion.hpp"
