@@ -61,10 +61,6 @@ set(VTSYM_GUARDED_HEADERS fmt/ spdlog/ boost/spirit boost/phoenix boost/fusion C
 set(VTSYM_HEADERS_embedded fmt/ spdlog/ nlohmann/)
 set(VTSYM_HEADERS_parser boost/spirit boost/phoenix boost/fusion)
 set(VTSYM_HEADERS_io CLI/ nlohmann/ histedit editline)
-set(VTSYM_HEADERS_answers CLI/ nlohmann/)
-set(VTSYM_HEADERS_findings CLI/ nlohmann/)
-set(VTSYM_HEADERS_commands CLI/ nlohmann/)
-set(VTSYM_HEADERS_program CLI/ nlohmann/)
 
 # All layers that `layer` may use, itself included.
 function(vtsym_reach layer result)

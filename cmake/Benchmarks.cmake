@@ -9,7 +9,7 @@ endif()
 list(REMOVE_ITEM bench_support ${bench_sources})
 
 find_package(benchmark REQUIRED)
-find_path(VTSYM_MUPARSER_INCLUDE muParser.h) # a peer to measure beside; left out where it is not installed
+find_path(VTSYM_MUPARSER_INCLUDE muParser.h) # a peer to compare with; left out where it is not installed
 find_library(VTSYM_MUPARSER_LIBRARY muparser)
 include(${CMAKE_CURRENT_LIST_DIR}/Z3.cmake)
 add_custom_target(benchmarks)

@@ -1,16 +1,26 @@
-// The part of the standard library that most sources include; precompiled once for all layers.
+// The headers of the standard library and of Boost that most sources include; precompiled once for the library and the
+// program.
 #include <algorithm>
 #include <array>
+#include <bit>
+#include <boost/unordered_map.hpp>
+#include <cmath>
+#include <compare>
 #include <cstddef>
 #include <cstdint>
 #include <functional>
+#include <iterator>
+#include <limits>
+#include <map>
 #include <memory>
 #include <optional>
+#include <set>
 #include <span>
 #include <stdexcept>
 #include <string>
 #include <string_view>
 #include <unordered_map>
+#include <unordered_set>
 #include <utility>
 #include <variant>
 #include <vector>

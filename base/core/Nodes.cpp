@@ -254,7 +254,8 @@ SymbolicExprId CallName::in(SymbolicExprTable& table) const {
     }                                                                                                                  \
     void Class::accept(const SymbolicExprTable& table, SymbolicExprVisitor& visitor) const {                           \
         visitEveryOccurrence(table, *this, visitor);                                                                   \
-    }
+    }                                                                                                                  \
+    template void SymbolicExprTable::intern<Class>(const Class::NodeBase::Shape&);
 #include "base/core/operators.def"
 #undef VTSYM_OPERATOR
 

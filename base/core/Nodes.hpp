@@ -243,4 +243,10 @@ struct CellNode : InternedNode<Node, Op, CellShape> {
 #include "base/core/operators.def"
 #undef VTSYM_OPERATOR
 
+// Instantiated in Nodes.cpp alone: every source that builds nodes would compile the table's probing again.
+#define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                         \
+    extern template void SymbolicExprTable::intern<Class>(const Class::NodeBase::Shape&);
+#include "base/core/operators.def"
+#undef VTSYM_OPERATOR
+
 } // namespace VT

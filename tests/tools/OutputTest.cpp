@@ -35,9 +35,9 @@ void expectSafe(const Workplace& place, const std::string& command, const std::s
     const ProgramResult result = runScript(place, script, input, {"VTSYM_LOG=debug", "VTSYM_FEATURES=" + flags});
     SCOPED_TRACE(Json(script).dump(-1, ' ', true, Json::error_handler_t::replace));
     EXPECT_LE(result.status, 2); // a signal is above
-    EXPECT_EQ(spoiled(result.output), "");
-    EXPECT_EQ(spoiled(result.words), "");
-    EXPECT_NE(result.output + result.words, "");
+    EXPECT_EQ(spoiled(result.out), "");
+    EXPECT_EQ(spoiled(result.err), "");
+    EXPECT_NE(result.out + result.err, "");
 }
 
 TEST(Output, IsSafeForTerminalsWhateverTheArguments) {
@@ -68,7 +68,7 @@ TEST(Output, IsSafeForTerminalsWhateverTheTexts) {
     }
     // Texts in JSON are the texts that were given.
     for (const std::string& text : {hostileTexts[0], hostileTexts[1], hostileTexts[3], hostileTexts[4]})
-        EXPECT_EQ(Json::parse(runProgram({"simplify", "--json", text}).output)["input"], text);
+        EXPECT_EQ(Json::parse(runProgram({"simplify", "--json", text}).out)["input"], text);
 }
 
 TEST(Output, IsSafeForTerminalsWhateverTheFiles) {

@@ -31,7 +31,7 @@ std::string inEnvironment(Strings settings, const std::string& command) {
     return commandOf("env -i", settings) + " " + command;
 }
 
-/// Whether a text is that of the pattern, where … stands for anything.
+/// Whether a text matches the pattern, in which … matches anything.
 bool isLike(const std::string& text, const std::string& pattern) {
     std::vector<std::string> parts;
     boost::algorithm::iter_split(parts, pattern, boost::algorithm::first_finder("\u2026"));
@@ -72,7 +72,7 @@ ProgramResult runOnTerminal(const Strings& arguments, const std::string& input, 
     ProgramResult result;
     std::array<char, 4096> part{};
     for (ssize_t got = 0; (got = read(terminal, part.data(), part.size())) > 0;) // until the program closes it
-        result.output.append(part.data(), static_cast<std::size_t>(got));
+        result.out.append(part.data(), static_cast<std::size_t>(got));
     int status = 0;
     waitpid(child, &status, 0);
     result.status = WIFEXITED(status) ? WEXITSTATUS(status) : -1;
@@ -101,11 +101,11 @@ void expectTranscript(const std::string& file, const std::map<std::string, std::
         if (line.starts_with('<'))
             command.input += text + "\n";
         else if (line.starts_with('!'))
-            command.expected.words += text + "\n";
+            command.expected.err += text + "\n";
         else if (line.starts_with('='))
             command.expected.status = std::stoi(text);
         else
-            command.expected.output += line.substr(line.starts_with('\\') ? 1 : 0) + "\n";
+            command.expected.out += line.substr(line.starts_with('\\') ? 1 : 0) + "\n";
     }
     EXPECT_FALSE(commands.empty()) << file;
     for (const auto& [script, input, expected] : commands) {
@@ -114,9 +114,9 @@ void expectTranscript(const std::string& file, const std::map<std::string, std::
         for (const auto& [name, content] : files)
             place.write(name, content);
         const ProgramResult result = runScript(place, script, input);
-        EXPECT_EQ(result.output, expected.output);
+        EXPECT_EQ(result.out, expected.out);
         EXPECT_EQ(result.status, expected.status);
-        EXPECT_TRUE(isLike(result.words, expected.words)) << result.words << "is not\n" << expected.words;
+        EXPECT_TRUE(isLike(result.err, expected.err)) << result.err << "is not\n" << expected.err;
     }
 }
 

@@ -10,9 +10,9 @@
 namespace VT::Testing {
 
 struct ProgramResult {
-    std::string output;
-    std::string words; ///< standard error
-    int status = -1;   ///< exit status; above 128 where a signal ended the program
+    std::string out;
+    std::string err;
+    int status = -1; ///< exit status; above 128 where a signal ended the program
 };
 
 using Strings = std::vector<std::string>;
@@ -26,10 +26,10 @@ ProgramResult runProgram(const Strings& arguments, const std::string& input = {}
 /// What a terminal shows when the program runs on it and the input is typed.
 ProgramResult runOnTerminal(const Strings& arguments, const std::string& input, const Strings& environment);
 
-/// Runs the commands of a file of tests/data/cases, each where the given files are, and tells what is not as written.
-/// Lines say by their first character what they are; the others, and what is behind a \, are lines of the output:
+/// Runs the commands of a file of tests/data/cases, each in a folder with the given files, and expects what is written.
+/// The first character of a line says what it is; any other line, or the rest of one after a \, is a line of output:
 ///     $ a script of a shell in which vtsym is the program      < a line of its standard input
-///     ! a line of standard error; … stands for anything        = its status unless it is 0        # a comment
+///     ! a line of standard error; … matches anything           = its status unless it is 0        # a comment
 void expectTranscript(const std::string& file, const std::map<std::string, std::string>& files = {});
 
 std::vector<std::string> linesOf(const std::string& text);

@@ -21,7 +21,7 @@ TEST(Scan, WritesSarif) {
     place.run("mkdir 'sub dir'");
     place.write("a.c", source);
     place.write("sub dir/%b.hh", "#if true\n#if X\n#elif X == 1\n#endif\n#endif");
-    const Json sarif = Json::parse(runScript(place, "vtsym scan --sarif .").output);
+    const Json sarif = Json::parse(runScript(place, "vtsym scan --sarif .").out);
     EXPECT_EQ(schemaErrors(schema, schema, sarif), "");
     const Json& results = sarif["runs"][0]["results"];
     ASSERT_EQ(results.size(), 5U);
@@ -42,16 +42,16 @@ TEST(Scan, KeepsToItsTranscript) {
     expectTranscript("program-scan.txt", {{"a", source}});
 }
 
-TEST(Scan, TellsWhatWasNotDone) {
+TEST(Scan, ReportsWhatWasNotDone) {
     const Workplace place;
     const auto scan = [&](const std::string& arguments) { return runScript(place, "vtsym scan " + arguments); };
     place.run("printf '\\0\\1' >binary.c; ln -s nowhere gone.c");
     const ProgramResult unread = scan("--sarif gone.c .");
     EXPECT_EQ(unread.status, 2);
-    EXPECT_THAT(unread.words, HasSubstr("gone.c: cannot be read: No such file"));
-    EXPECT_THAT(unread.words, HasSubstr("binary.c: is not a text"));
-    EXPECT_EQ(schemaErrors(schema, schema, Json::parse(unread.output)), "");
-    EXPECT_THAT(unread.output, HasSubstr("\"executionSuccessful\":false"));
+    EXPECT_THAT(unread.err, HasSubstr("gone.c: cannot be read: No such file"));
+    EXPECT_THAT(unread.err, HasSubstr("binary.c: is not a text"));
+    EXPECT_EQ(schemaErrors(schema, schema, Json::parse(unread.out)), "");
+    EXPECT_THAT(unread.out, HasSubstr("\"executionSuccessful\":false"));
 
     std::string hard; // what an included file may define is asked at each branch
     for (int i = 0; i < 48; ++i)
@@ -59,9 +59,9 @@ TEST(Scan, TellsWhatWasNotDone) {
     place.write("hard.c", hard);
     const ProgramResult givenUp = scan("--sarif hard.c");
     EXPECT_EQ(givenUp.status, 0);
-    EXPECT_THAT(givenUp.words, ::testing::MatchesRegex("vtsym: [1-9][0-9]* decisions were given up: .*\n"));
-    EXPECT_EQ(schemaErrors(schema, schema, Json::parse(givenUp.output)), "");
-    EXPECT_THAT(givenUp.output, HasSubstr("\"level\":\"note\""));
+    EXPECT_THAT(givenUp.err, ::testing::MatchesRegex("vtsym: [1-9][0-9]* decisions were given up: .*\n"));
+    EXPECT_EQ(schemaErrors(schema, schema, Json::parse(givenUp.out)), "");
+    EXPECT_THAT(givenUp.out, HasSubstr("\"level\":\"note\""));
 }
 
 } // namespace

@@ -1,3 +1,5 @@
+// Chooses the printers and conversions that the options ask for, and renews the service when its table or the texts in
+// its caches pass a bound.
 #include "tools/vtsym/answers/Conditions.hpp"
 
 #include "base/core/Table.hpp"
@@ -11,7 +13,7 @@ namespace vtsym {
 
 namespace {
 
-// When the service has collected much.
+// The service is renewed when its table or its texts have grown to this.
 constexpr std::size_t fullTable = 100'000;               ///< nodes
 constexpr std::size_t fullTexts = std::size_t{1} << 26U; ///< bytes
 constexpr std::size_t cacheEntryBytes = 64;
@@ -67,7 +69,7 @@ VT::SymbolicExprId Conditions::shortestGiven(const TextOptions& options, VT::Sym
     return notLonger(options, service().getImpliedCondition(given, context, options.toQuill()).id(), given);
 }
 
-/// A shorter form, unless the brackets that directives have of their own make it longer.
+/// Returns the result, or the condition itself where the extra brackets of a directive make the result longer.
 VT::SymbolicExprId Conditions::notLonger(const TextOptions& options, VT::SymbolicExprId result,
                                          VT::SymbolicExprId condition) const {
     const VT::SymbolicExprTable& table = service().table();
@@ -118,7 +120,7 @@ std::vector<std::string> Conditions::warnings(const TextOptions& options, VT::Sy
                       options.toDirective() ? VT::CTextUse::Directive : VT::CTextUse::Program);
 }
 
-std::string Conditions::printAsItStands(VT::SymbolicExprId condition, bool quill) const {
+std::string Conditions::printUnconverted(VT::SymbolicExprId condition, bool quill) const {
     return visible(quill ? service().printQExpr(condition) : service().printCExprNoConversion(condition));
 }
 

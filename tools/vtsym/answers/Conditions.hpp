@@ -1,4 +1,5 @@
-// The service as the program uses it.
+// The condition service as the commands use it: reading, simplifying and printing in the languages of the options.
+// Relies on the library only through VCService and the printers.
 #pragma once
 
 #include "base/VCService.hpp"
@@ -11,43 +12,43 @@
 
 namespace vtsym {
 
-/// The condition service, renewed when it has collected much, so that input without end takes memory with an end.
-/// Identifiers hold until the next makeRoomFor().
+/// A condition service that is renewed when its caches have grown large, so that endless input takes bounded memory.
+/// Identifiers are valid until the next makeRoomFor().
 class Conditions {
 public:
-    /// `bits32`: decisions are over signed 32-bit integers.
+    /// `bits32` makes decisions over signed integers of 32 bits.
     explicit Conditions(bool bits32 = false) : bits32_(bits32) { renew(); }
 
     [[nodiscard]] VT::VCService& service() const { return **handle_; }
 
-    /// To be called before the service is given a text.  True where the service was renewed.
+    /// To be called before the service reads a text.  Returns whether the service was renewed.
     bool makeRoomFor(const std::string& text);
 
-    /// The condition of a text in the language of the options, as it stands or as the service simplifies it.
+    /// The condition of a text in the language of the options: as written, or as the service simplifies it.
     [[nodiscard]] VT::SymbolicExprId parse(const TextOptions& options, const std::string& text) const;
     [[nodiscard]] VT::SymbolicExprId simplify(const TextOptions& options, const std::string& text) const;
     /// A condition with the operators of the language that the options answer in.
     [[nodiscard]] VT::SymbolicExprId inAnswerShape(const TextOptions& options, VT::SymbolicExprId condition) const;
-    /// The shortest form found of a condition, which is never longer as print() writes it.  `forms` receives what was
-    /// looked at on the way.
+    /// The shortest form found of a condition; as print() writes it, it is never longer.  `forms` receives the forms
+    /// that were considered.
     [[nodiscard]] VT::SymbolicExprId shortest(const TextOptions& options, VT::SymbolicExprId condition,
                                               std::vector<VT::ShortForm>* forms = nullptr) const;
-    /// The same where a known condition holds.
+    /// The shortest form found that is equal wherever a known condition holds.
     [[nodiscard]] VT::SymbolicExprId shortestGiven(const TextOptions& options, VT::SymbolicExprId condition,
                                                    VT::SymbolicExprId known) const;
-    /// The text of a shortest form: print(), but for 1 and 0 where `true` or `false` would be longer than the condition
-    /// that it is of.
+    /// The text of a shortest form: as print() writes it, or 1 or 0 where `true` or `false` would be longer than the
+    /// condition itself.
     [[nodiscard]] std::string printShortest(const TextOptions& options, VT::SymbolicExprId shortest,
                                             VT::SymbolicExprId condition) const;
-    /// The symbols of a condition as Quill writes them, each once; the truth constants are none.
+    /// The symbols of a condition as Quill writes them, each once, without the truth constants.
     [[nodiscard]] std::vector<std::string> symbols(VT::SymbolicExprId condition, const VT::VCSymbolTypes& kinds) const;
-    /// The text of a condition in the shape of the language that the options ask for.  Unlike the service it writes
-    /// `true` for TRUE, 1 in a directive, so that no answer is invisible.
+    /// The text of a condition in the language that the options ask for.  The service prints nothing for TRUE; this
+    /// writes `true`, or 1 in a directive, so that every answer is visible.
     [[nodiscard]] std::string print(const TextOptions& options, VT::SymbolicExprId condition) const;
-    /// What C or a preprocessor would decide differently, where the options ask for the one or the other.
+    /// Warnings about what C or a preprocessor would decide differently, where the options ask for its language.
     [[nodiscard]] std::vector<std::string> warnings(const TextOptions& options, VT::SymbolicExprId condition) const;
-    /// The same as print() without a change of shape.
-    [[nodiscard]] std::string printAsItStands(VT::SymbolicExprId condition, bool quill) const;
+    /// The text of a condition with its own operators, whichever language they are from.
+    [[nodiscard]] std::string printUnconverted(VT::SymbolicExprId condition, bool quill) const;
 
 private:
     void renew();
@@ -56,7 +57,7 @@ private:
 
     bool bits32_;
     std::optional<VT::VCServiceHandle> handle_;
-    std::size_t textBytes_ = 0; ///< of what the service may have kept
+    std::size_t textBytes_ = 0; ///< that the service may have kept
 };
 
 } // namespace vtsym

@@ -1,7 +1,10 @@
+// Listens to the simplifier while it runs and prints each firing.  Conditions on the way are cut to a line: a shared
+// graph of a few nodes can have a text of gigabytes.
 #include "tools/vtsym/answers/Explanation.hpp"
 
 #include "base/core/Table.hpp"
 #include "host/Text.hpp"
+#include "tools/vtsym/answers/NodeText.hpp"
 #include "tools/vtsym/io/Json.hpp"
 
 #include <algorithm>
@@ -10,11 +13,9 @@ namespace vtsym {
 
 namespace {
 
-// Of conditions on the way: the beginning of a long one is shown, and of a very long one its length alone.
-constexpr std::size_t shownBytes = 200;
-constexpr std::size_t printedBytes = 20'000;
+constexpr std::size_t shownBytes = 200; ///< of a condition on the way
 
-/// Keeps the rules that fire while it lives.
+/// Records the rules that fire during its life.
 class Listener : public VT::RuleListener {
 public:
     Listener(VT::SymbolicExprSimplify& simplifier, std::vector<VT::RuleFiring>& firings)
@@ -62,12 +63,12 @@ std::string Explanation::resultText() const {
                      : conditions_.print(options_, result_);
 }
 
-/// A condition on the way; the beginning of a long one.
+/// The text of a condition on the way, cut where it is long.
 std::string Explanation::step(VT::SymbolicExprId condition) const {
     const VT::SymbolicExprPrinter& printer = conditions_.service().simplifier().printer();
     if (const std::uint64_t bytes = printer.textLength(condition); bytes > printedBytes)
-        return "(" + std::to_string(bytes) + " bytes of text)";
-    return VT::shownText(conditions_.printAsItStands(condition, options_.toQuill()), shownBytes);
+        return lengthOfText(bytes);
+    return VT::shownText(conditions_.printUnconverted(condition, options_.toQuill()), shownBytes);
 }
 
 void Explanation::appendText(const Style& style, std::string& out) const {
@@ -76,13 +77,13 @@ void Explanation::appendText(const Style& style, std::string& out) const {
     if (firings_.empty())
         out.append("  no rule applies\n");
     else if (result_ == condition_)
-        out.append("  what this leads to is longer or beyond a limit, so the condition stays\n");
+        out.append("  the result is longer or a limit was reached, so the condition stays\n");
     if (shortest_)
         appendForms(style, out);
     out.append("= ").append(style.good(resultText()));
 }
 
-/// What the rules lead to, and the forms that were looked at instead, the shortest first.
+/// Appends the result of the rules and the forms that were considered instead, the shortest first.
 void Explanation::appendForms(const Style& style, std::string& out) const {
     if (result_ != condition_)
         out.append(style.faint("normal form")).append("\n  ").append(step(result_)) += '\n';
@@ -99,7 +100,7 @@ void Explanation::appendForms(const Style& style, std::string& out) const {
     }
     const bool isChosen = std::ranges::any_of(forms_, &VT::ShortForm::chosen);
     if (!isChosen && *shortest_ != result_)
-        out.append("  nothing shorter is proven, so the condition stays\n");
+        out.append("  no shorter form is proven equal, so the condition stays\n");
 }
 
 void Explanation::appendSteps(const Style& style, std::string& out) const {

@@ -1,4 +1,5 @@
-// What a simplification did.
+// The steps of one simplification: rules that fired, forms that were considered, and the result.
+// Bypasses the caches of the service, which keep only results.
 #pragma once
 
 #include "base/simplify/Simplify.hpp"
@@ -10,7 +11,7 @@
 
 namespace vtsym {
 
-/// A condition simplified, with the rules that fired on the way, and how its shortest form was reached.
+/// Simplifies one condition and records how.
 class Explanation {
 public:
     /// Simplifies a condition of the service; `conditions` and `options` outlive the explanation.
@@ -21,12 +22,12 @@ public:
 
     [[nodiscard]] std::uint64_t passes() const noexcept { return passes_; }
 
-    /// Looks for the shortest form, which becomes the result.
+    /// Searches the shortest form, which becomes the result.
     void shorten();
 
     /// The text of the result.
     [[nodiscard]] std::string resultText() const;
-    /// Appends the condition, each rule with before and after by passes, the forms that were looked at, and the result.
+    /// Appends the condition, the rules of each pass with the text before and after, the forms considered, the result.
     void appendText(const Style& style, std::string& out) const;
     /// The steps as a JSON array.
     [[nodiscard]] std::string json() const;
@@ -41,7 +42,7 @@ private:
     VT::SymbolicExprId condition_;
     VT::SymbolicExprId result_ = 0; ///< of the rules
     std::optional<VT::SymbolicExprId> shortest_;
-    std::vector<VT::ShortForm> forms_; ///< that were looked at for the shortest one
+    std::vector<VT::ShortForm> forms_; ///< considered for the shortest one
     std::uint64_t passes_ = 0;
     std::vector<VT::RuleFiring> firings_;
 };

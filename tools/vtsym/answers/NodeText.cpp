@@ -1,3 +1,5 @@
+// Labels come from the operator table, so that a new operator needs no edit here.
+// Names are cut to nameBytes and escaped.
 #include "tools/vtsym/answers/NodeText.hpp"
 
 #include "base/core/Nodes.hpp"
@@ -26,6 +28,11 @@ std::string labelOf(const VT::SymbolicExpr& node) {
     if (const std::string_view spelling = row.c.empty() ? row.quill : row.c; !spelling.empty())
         label.append(" ").append(spelling);
     return label;
+}
+
+std::string lengthOfText(std::uint64_t bytes) {
+    std::string text = "(";
+    return text.append(std::to_string(bytes)).append(" bytes of text)");
 }
 
 } // namespace vtsym

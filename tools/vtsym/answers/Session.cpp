@@ -1,3 +1,7 @@
+// Looks up a line that begins with a colon in one table of commands; every other line is a condition.
+//
+// A value is put in the place of its name before a condition is simplified, so `:let` costs a walk over each condition.
+// Errors are placed in the whole line, not in the part that a command takes.
 #include "tools/vtsym/answers/Session.hpp"
 
 #include "base/core/Nodes.hpp"
@@ -14,7 +18,7 @@ namespace vtsym {
 namespace {
 
 constexpr const char* lastResult = "ans";
-constexpr std::size_t shownBytes = 80; ///< of a word
+constexpr std::size_t shownBytes = 80; ///< of an unknown command
 
 std::string_view trimmed(std::string_view text) {
     constexpr const char* blanks = " \t\r";
@@ -32,11 +36,11 @@ struct Session::CommandRow {
     void (*run)(Session&, std::string_view argument, std::string& out);
 };
 
-// Without TEXT a command is about the last result.
+// Without TEXT, a command applies to the last result.
 const Session::CommandRow Session::commands[] = {
-    {":quill", "[TEXT]", "show as Quill; without TEXT read and write Quill from now on",
+    {":quill", "[TEXT]", "show as Quill; without TEXT, switch to Quill",
      [](Session& session, std::string_view text, std::string& out) { session.showIn("quill", text, out); }},
-    {":c", "[TEXT]", "show as C; without TEXT read and write C from now on",
+    {":c", "[TEXT]", "show as C; without TEXT, switch to C",
      [](Session& session, std::string_view text, std::string& out) { session.showIn("c", text, out); }},
     {":pp", "[TEXT]", "show as the condition of a preprocessor directive",
      [](Session& session, std::string_view text, std::string& out) { session.showDirective(text, out); }},
@@ -46,10 +50,10 @@ const Session::CommandRow Session::commands[] = {
      [](Session& session, std::string_view text, std::string& out) { session.explain(text, out); }},
     {":symbols", "[TEXT]", "list its symbols",
      [](Session& session, std::string_view text, std::string& out) { session.listSymbols(text, out); }},
-    {":let", "NAME=VALUE", "put VALUE in the place of NAME from now on",
+    {":let", "NAME=VALUE", "replace NAME by VALUE from now on",
      [](Session& session, std::string_view text, std::string& out) { session.let(text, out); }},
     {":help", "", "show this list", [](Session& session, std::string_view, std::string& out) { session.help(out); }},
-    {":quit", "", "leave, as the end of the input does",
+    {":quit", "", "leave; so does the end of the input",
      [](Session& session, std::string_view, std::string&) { session.ended_ = true; }},
 };
 
@@ -79,7 +83,7 @@ const Session::CommandRow& Session::commandOf(std::string_view word) {
     throw CommandError("There is no command " + VT::shownText(word, shownBytes) + "; :help lists them.");
 }
 
-/// The condition of a part of the line.
+/// Reads a part of the line.
 VT::SymbolicExprId Session::parse(std::string_view text) const {
     try {
         return conditions_.parse(options_, std::string(text));
@@ -88,7 +92,7 @@ VT::SymbolicExprId Session::parse(std::string_view text) const {
     }
 }
 
-/// The same, with values in the places of names.
+/// Reads a part of the line and replaces names by their values.
 VT::SymbolicExprId Session::read(std::string_view text) {
     const VT::SymbolicExprId condition = parse(text);
     for (std::string& symbol :
@@ -99,12 +103,12 @@ VT::SymbolicExprId Session::read(std::string_view text) {
                                   : VT::SymbolicExprReplacement(conditions_.service().table(), values_)(condition);
 }
 
-/// What a command is about: its text or, without one, the last result.
+/// The condition that a command applies to: its text or, without one, the last result.
 VT::SymbolicExprId Session::subject(std::string_view text) {
     if (!text.empty())
         return read(text);
     if (!result_)
-        throw CommandError("There is no result yet.");
+        throw CommandError("There is no result yet: enter a condition first.");
     return *result_;
 }
 
@@ -169,7 +173,7 @@ void Session::let(std::string_view assignment, std::string& out) {
     const std::size_t equals = assignment.find('=');
     const std::string name(trimmed(assignment.substr(0, equals)));
     if (equals == std::string::npos || !isName(name))
-        throw CommandError("A value is given as in :let NAME=VALUE.");
+        throw CommandError("A definition is written :let NAME=VALUE.");
     const VT::SymbolicExprId value = read(trimmed(assignment.substr(equals + 1)));
     out.append(name).append(" = ").append(conditions_.print(options_, value));
     bind(name, value);
@@ -177,7 +181,7 @@ void Session::let(std::string_view assignment, std::string& out) {
 }
 
 void Session::help(std::string& out) const {
-    out.append("A condition is answered by its shortest form, which is `ans` from then on.");
+    out.append("A condition is answered by its shortest form, which `ans` refers to afterwards.");
     for (const CommandRow& command : commands) {
         std::string usage = std::string(command.word) + " " + command.argument;
         usage.resize(std::max<std::size_t>(usage.size(), 18), ' ');

@@ -1,4 +1,5 @@
-// The read-evaluate-print loop without its terminal.
+// The prompt without its terminal: answers conditions and commands, and remembers names, values and the last result.
+// Tests and pipes use it line by line; ReplCommand adds the line editor.
 #pragma once
 
 #include "base/transform/Replacement.hpp"
@@ -12,14 +13,13 @@
 
 namespace vtsym {
 
-/// Answers conditions and commands one after another and remembers the last result, the names seen and the values that
-/// names were given.
+/// Answers lines one after another.
 class Session {
 public:
     Session(const TextOptions& options, const Style& style);
 
-    /// Appends the answer to a line: the simplified condition, or what a command shows.  Nothing for an empty line.
-    /// Throws what reading and printing throw, and CommandError for a command that is none.  A line that fails changes
+    /// Appends the answer to a line: the simplified condition or the output of a command; nothing for an empty line.
+    /// Throws what reading and printing throw, and CommandError for an unknown command.  A line that fails changes
     /// nothing.
     void answer(const std::string& line, std::string& out);
 
@@ -49,11 +49,11 @@ private:
     void let(std::string_view assignment, std::string& out);
     void help(std::string& out) const;
 
-    std::string_view line_; ///< that is being answered
+    std::string_view line_; ///< being answered
     TextOptions options_;
     const Style& style_;
     Conditions conditions_;
-    VT::SymbolicExprReplacements values_; ///< what names stand for, `ans` too
+    VT::SymbolicExprReplacements values_; ///< of names, `ans` included
     std::optional<VT::SymbolicExprId> result_;
     std::set<std::string> words_;
     bool ended_ = false;

@@ -1,3 +1,5 @@
+// Writes a Graphviz digraph: one vertex for each distinct node, so that the size is linear in the nodes of the graph,
+// not in the paths through it.
 #include "base/core/Walk.hpp"
 #include "tools/vtsym/answers/NodeText.hpp"
 #include "tools/vtsym/answers/TreeWriters.hpp"

@@ -1,3 +1,5 @@
+// Draws a tree with an explicit stack.  A shared operator is drawn once and referred to by number, so the work is
+// linear in the nodes; operators below drawnDepth levels are drawn as further trees, so that lines fit a screen.
 #include "base/core/Walk.hpp"
 #include "base/util/IdMap.hpp"
 #include "tools/vtsym/answers/NodeText.hpp"
@@ -40,7 +42,7 @@ private:
     struct Level {
         const VT::SymbolicExpr* node;
         std::size_t next;
-        std::size_t indentBytes; ///< of its own line
+        std::size_t indentBytes; ///< of the operator's own line
     };
 
     void drawPart(VT::SymbolicExprId root);
@@ -68,7 +70,7 @@ void Drawing::draw(VT::SymbolicExprId root) {
         out_.append("\n");
         drawPart(deferred_[i]);
     }
-    out_.pop_back(); // the end of the last line is the caller's
+    out_.pop_back(); // the caller ends the last line
 }
 
 void Drawing::drawPart(VT::SymbolicExprId root) {

@@ -1,3 +1,5 @@
+// Writes nested JSON objects with an explicit stack; a node that was written before is its identifier alone, so the
+// size is linear in the nodes.
 #include "base/core/Nodes.hpp"
 #include "base/util/IdMap.hpp"
 #include "tools/vtsym/answers/NodeText.hpp"
@@ -10,7 +12,7 @@ namespace vtsym {
 
 namespace {
 
-/// The members of a node but its operands, without the closing brace.
+/// A node without its operands and without the closing brace.
 std::string opened(const VT::SymbolicExpr& node, VT::SymbolicExprId id) {
     std::string json = "{\"kind\":" + jsonString(VT::operatorInfo(node.op()).className);
     appendMember(json, "op", std::to_string(static_cast<int>(node.op())));

@@ -1,4 +1,5 @@
-// An expression as the tree that it is.  The writers' stacks do not grow with its depth, and a shared node costs once.
+// Three pictures of an expression: a drawing, JSON and Graphviz.
+// Each writes a shared node once and uses a stack that does not grow with the nesting of the expression.
 #pragma once
 
 #include "base/core/Table.hpp"
@@ -8,14 +9,14 @@
 
 namespace vtsym {
 
-/// A drawing in lines.  Operators that occur again, and those too deep for the width of a screen, are drawn once and
-/// referred to by their identifiers; the deep ones below the rest.
+/// Appends a drawing in lines.  An operator that occurs again is referred to by its identifier; so is one that is too
+/// deep for the width of a screen, which is drawn below the rest.
 void appendDrawing(const VT::SymbolicExprTable& table, VT::SymbolicExprId root, const Style& style, std::string& out);
 
-/// A JSON object in one line; an operator that was written before is its identifier alone.
+/// Appends a JSON object in one line; an operator that was written before is its identifier alone.
 void appendJsonTree(const VT::SymbolicExprTable& table, VT::SymbolicExprId root, std::string& out);
 
-/// A digraph in the language of Graphviz, one vertex for each distinct node.
+/// Appends a digraph in the language of Graphviz, one vertex for each distinct node.
 void appendDotGraph(const VT::SymbolicExprTable& table, VT::SymbolicExprId root, std::string& out);
 
 } // namespace vtsym

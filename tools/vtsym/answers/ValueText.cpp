@@ -1,3 +1,5 @@
+// Prints doubles with the digits that read back as the same value, in text as in JSON.
+// Numbers that JSON lacks are quoted there.
 #include "tools/vtsym/answers/ValueText.hpp"
 
 #include "tools/vtsym/io/Json.hpp"
@@ -6,7 +8,7 @@ namespace vtsym {
 
 namespace {
 
-/// A scalar as text; what JSON has no number for is named alike in both.
+/// A scalar as text or as JSON.
 std::string scalarText(const VT::SymbolicScalar& scalar, bool json) {
     switch (scalar.type()) {
     case VT::ScalarType::Bool:

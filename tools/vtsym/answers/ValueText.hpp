@@ -1,4 +1,5 @@
-// Values of expressions as the program writes them.
+// Values of expressions as `eval` and `dims` print them.
+// Infinities and NaN have the same names in text and in JSON.
 #pragma once
 
 #include "base/eval/Values.hpp"
@@ -8,10 +9,10 @@
 
 namespace vtsym {
 
-/// A value as text or as JSON; what JSON has no number for is named alike in both.
+/// A value as text or as JSON.
 std::string valueText(const VT::SymbolicValue& value, bool json);
 
-/// bool, int, double or vector.
+/// The type of a value: bool, int, double or vector.
 std::string_view typeText(const VT::SymbolicValue& value);
 
 } // namespace vtsym

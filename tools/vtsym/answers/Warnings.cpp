@@ -1,15 +1,17 @@
+// One sentence for each kind of obstacle, with the expression that it is about.
+// Expressions are cut to shownBytes; a very long one is not printed at all.
 #include "tools/vtsym/answers/Warnings.hpp"
 
 #include "base/core/Table.hpp"
 #include "base/print/PreprocessorVCExpr.hpp"
 #include "host/Text.hpp"
+#include "tools/vtsym/answers/NodeText.hpp"
 
 namespace vtsym {
 
 namespace {
 
 constexpr std::size_t shownBytes = 60;
-constexpr std::size_t printedBytes = 20'000;
 
 class Wording {
 public:
@@ -30,12 +32,12 @@ private:
     VT::SymbolicExprPrinter printer_;
 };
 
-/// The beginning of an expression; the number of its bytes where it is very long.
+/// The beginning of an expression, or the length of a very long one.
 std::string Wording::text(VT::SymbolicExprId id) const {
     if (table_.get(id) == nullptr)
         return "(nothing)";
     if (const std::uint64_t bytes = printer_.textLength(id); bytes > printedBytes)
-        return "(" + std::to_string(bytes) + " bytes of text)";
+        return lengthOfText(bytes);
     return VT::shownText(printer_(id), shownBytes);
 }
 

@@ -1,9 +1,10 @@
-// vtsym check
+// vtsym check: reads a model, runs ModelCheck on it, and writes the findings and, if wanted, a page.
+// A model that cannot be read, a page that cannot be written and an undecided question end with status 2.
 #include "tools/vtsym/commands/Commands.hpp"
 #include "tools/vtsym/findings/Findings.hpp"
 #include "tools/vtsym/findings/ModelCheck.hpp"
 #include "tools/vtsym/findings/ModelPage.hpp"
-#include "tools/vtsym/io/Arguments.hpp"
+#include "tools/vtsym/io/CommandLine.hpp"
 #include "tools/vtsym/io/Files.hpp"
 #include "tools/vtsym/io/Texts.hpp"
 
@@ -13,12 +14,12 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* examples =
-    R"(A model is a JSON file of blocks in blocks; the choices of a block are alternatives, each with a condition of its own.
-docs/model.schema.json describes it.  Every finding is proven; conditions are over integers without bounds.
+constexpr const char* notes =
+    R"(A model is a JSON file of nested blocks; wherever a block is active, exactly one of its choices should be.
+docs/model.schema.json describes the file.  Every finding is proven, over integers without bounds unless --bits is given.
 
-The exit status is 0 where nothing was found, 1 where something was, and 2 where the model could not be read, something
-could not be decided, or the page could not be written.
+Exit status: 0 no findings, 1 findings, 2 the model could not be read, a question could not be decided, or the page could
+not be written.
 
 Examples:
   vtsym check model.json
@@ -27,17 +28,16 @@ Examples:
 
 constexpr std::array<FindingRule, 5> rules{{
     {"dead", "A block is never active.",
-     "The condition cannot hold where those of the blocks around it hold. Correct the condition, or take the block "
-     "away."},
+     "The condition contradicts those of the blocks around it. Correct the condition, or remove the block."},
     {"always-active", "A block is always active.",
-     "The condition holds wherever those of the blocks around it hold. Take the condition away, or correct it."},
-    {"redundant", "A condition has an operand that can go.",
-     "Wherever the blocks around it are active, the condition means the same without the operand. Write the shorter "
-     "one."},
+     "The conditions of the blocks around it imply the condition. Remove the condition, or correct it."},
+    {"redundant", "A condition has a redundant operand.",
+     "Wherever the blocks around it are active, the condition has the same value without the operand. Write the "
+     "shorter condition."},
     {"overlapping", "Two choices are active at once.",
-     "An assignment makes the conditions of two choices hold together. Make one condition exclude the other."},
+     "An assignment makes the conditions of two choices hold together. Let one condition exclude the other."},
     {"missing", "No choice is active.",
-     "An assignment makes the block active and none of its choices. Add a choice for it, or a \"(default)\" one."},
+     "An assignment makes the block active, but no choice of it. Add a choice, or one with \"(default)\"."},
 }};
 
 struct CheckOptions {
@@ -80,17 +80,18 @@ SearchResult check(const CheckOptions& options, Console& console) {
 
 } // namespace
 
-Command addCheck(CLI::App& program) {
-    CLI::App* const command = program.add_subcommand("check", "Check the choices of a model against each other");
+void addCheck(CommandLine& program) {
+    Command& command = program.add("check", "Find dead, overlapping and missing choices in a model", notes);
     const auto options = std::make_shared<CheckOptions>();
-    addArgument(*command, "MODEL", options->file, "File of the model")->required();
-    addArgument(*command, "--html", options->page, "Write a page that shows how the choices stand to each other")
-        ->type_name("FILE");
-    addSizeOption(*command, options->mostBytes);
-    addFormOptions(*command, options->form);
-    addBitsOption(*command, options->bits32);
-    command->footer(examples);
-    return {command, [options](Console& console) { return check(*options, console); }, SearchResult::Failed};
+    command.addArgument({"MODEL", "File of the model"}, options->file);
+    command.require("MODEL");
+    command.addArgument({"--html", "Write an HTML page with a matrix of the choices of each block", "FILE"},
+                        options->page);
+    addSizeOption(command, options->mostBytes);
+    addFormOptions(command, options->form);
+    addBitsOption(command, options->bits32);
+    command.run = [options](Console& console) { return check(*options, console); };
+    command.onError = SearchResult::Failed;
 }
 
 } // namespace vtsym

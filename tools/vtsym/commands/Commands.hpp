@@ -1,39 +1,27 @@
-// The commands of the program.
+// The commands of the program.  Each is one source of its name, which adds it to the command line.
+// A new command is declared here and added in main.cpp.
 #pragma once
 
+#include "tools/vtsym/io/CommandLine.hpp"
 #include "tools/vtsym/io/Console.hpp"
-#include "tools/vtsym/io/ExitStatus.hpp"
 
-#include <CLI/CLI.hpp>
-
-#include <functional>
 #include <memory>
 
 namespace vtsym {
 
-/// What a command does once the command line has been read.
-using Run = std::function<ExitStatus(Console&)>;
-
-/// A command of the program's command line.
-struct Command {
-    CLI::App* app;
-    Run run;
-    ExitStatus onError = false; ///< what it ends with when run() throws
-};
-
-Command addSimplify(CLI::App& program);
-Command addCompare(CLI::App& program);
-Command addGiven(CLI::App& program);
-Command addCheck(CLI::App& program);
-Command addConvert(CLI::App& program);
-Command addTree(CLI::App& program);
-Command addSymbols(CLI::App& program);
-Command addReplace(CLI::App& program);
-Command addRepl(CLI::App& program);
-Command addPreprocess(CLI::App& program);
-Command addEval(CLI::App& program);
-Command addDims(CLI::App& program);
-Command addOperators(CLI::App& program);
-Command addScan(CLI::App& program);
+void addSimplify(CommandLine& program);
+void addCompare(CommandLine& program);
+void addGiven(CommandLine& program);
+void addCheck(CommandLine& program);
+void addConvert(CommandLine& program);
+void addTree(CommandLine& program);
+void addSymbols(CommandLine& program);
+void addReplace(CommandLine& program);
+void addRepl(CommandLine& program);
+void addPreprocess(CommandLine& program);
+void addEval(CommandLine& program);
+void addDims(CommandLine& program);
+void addOperators(CommandLine& program);
+void addScan(CommandLine& program);
 
 } // namespace vtsym

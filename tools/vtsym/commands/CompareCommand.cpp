@@ -1,4 +1,5 @@
-// vtsym compare
+// vtsym compare: the relation of two conditions, with the assignments that prove it.
+// The decider answers; this prints its decision as text or JSON.
 #include "tools/vtsym/commands/Commands.hpp"
 #include "tools/vtsym/commands/Pairs.hpp"
 #include "tools/vtsym/io/Json.hpp"
@@ -9,10 +10,10 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* examples =
-    R"(Conditions are over integers without bounds, and the relation is exact: equivalent, disjoint, implies, implied by
-or overlaps.  Each assignment shows what keeps the two apart, or together.  A question that takes too many steps stays
-undecided.
+constexpr const char* notes =
+    R"(Conditions are over integers without bounds unless --bits is given.  The relation is exact: equivalent, disjoint,
+implies, implied by or overlaps.  Assignments prove it: for which values the first holds alone, the second alone, or
+both.  A question that takes too many steps stays undecided.
 
 Examples:
   vtsym compare 'A<B && B<C' 'A<C'
@@ -25,8 +26,8 @@ constexpr std::array<const char*, 6> relations{"equivalent", "disjoint", "implie
                                                "implied by", "overlaps", "undecided"};
 
 const char* reasonOf(VT::DecisionBound bound) {
-    return bound == VT::DecisionBound::Steps ? ", it takes too many steps"
-                                             : ", it hangs on arithmetic beyond linear terms";
+    return bound == VT::DecisionBound::Steps ? ": it takes too many steps"
+                                             : ": it depends on arithmetic beyond linear terms";
 }
 
 class Comparer {
@@ -48,14 +49,14 @@ private:
         out.append(relations.at(static_cast<std::size_t>(relation.kind)));
         if (relation.kind == VT::RelationKind::Undecided)
             out.append(reasonOf(relation.bound));
-        const auto tell = [&](const char* who, const VT::Decision& decision) {
+        const auto append = [&](const char* who, const VT::Decision& decision) {
             if (decision.witness)
                 out.append("; ").append(who).append(witnessText(conditions_, options_, *decision.witness));
         };
-        tell("first alone: ", relation.onlyA);
-        tell("second alone: ", relation.onlyB);
+        append("first alone: ", relation.onlyA);
+        append("second alone: ", relation.onlyB);
         if (relation.kind == VT::RelationKind::Overlaps || relation.kind == VT::RelationKind::Undecided)
-            tell("both: ", relation.both);
+            append("both: ", relation.both);
     }
 
     void appendJson(const ConditionPair& pair, const VT::Relation& relation, std::string& out) const {
@@ -63,13 +64,13 @@ private:
         appendMember(out, "b", jsonString(pair.secondText));
         appendMember(out, "relation", jsonString(relations.at(static_cast<std::size_t>(relation.kind))));
         std::string witnesses;
-        const auto tell = [&](const char* who, const VT::Decision& decision) {
+        const auto append = [&](const char* who, const VT::Decision& decision) {
             if (decision.witness)
                 appendMember(witnesses, who, witnessJson(conditions_, options_, *decision.witness));
         };
-        tell("only_a", relation.onlyA);
-        tell("only_b", relation.onlyB);
-        tell("both", relation.both);
+        append("only_a", relation.onlyA);
+        append("only_b", relation.onlyB);
+        append("both", relation.both);
         if (!witnesses.empty())
             appendMember(out, "witness", "{" + witnesses.substr(1) + "}");
     }
@@ -80,16 +81,16 @@ private:
 
 } // namespace
 
-Command addCompare(CLI::App& program) {
-    CLI::App* const command = program.add_subcommand("compare", "Tell how two conditions stand to each other");
+void addCompare(CommandLine& program) {
+    Command& command =
+        program.add("compare", "Compare two conditions: equivalent, disjoint, implied or overlapping", notes);
     const auto options = std::make_shared<PairOptions>();
-    addPairOptions(*command, *options, "A", "B");
-    command->footer(examples);
-    return {command, [options](Console& console) {
-                Comparer comparer(*options);
-                const auto answer = [&](const std::string& text, std::string& out) { comparer.answer(text, out); };
-                return answerTexts(*options, console, {answer, false, nullptr, true});
-            }};
+    addPairOptions(command, *options, "A", "B");
+    command.run = [options](Console& console) {
+        Comparer comparer(*options);
+        const auto answer = [&](const std::string& text, std::string& out) { comparer.answer(text, out); };
+        return answerTexts(*options, console, {answer, false, nullptr, true});
+    };
 }
 
 } // namespace vtsym

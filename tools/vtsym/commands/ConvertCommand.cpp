@@ -1,4 +1,5 @@
-// vtsym convert
+// vtsym convert: prints conditions in another language, without simplifying them.
+// Warns where C or a preprocessor would read the result differently.
 #include "tools/vtsym/answers/Conditions.hpp"
 #include "tools/vtsym/commands/Commands.hpp"
 #include "tools/vtsym/io/Json.hpp"
@@ -8,7 +9,7 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* examples = R"(Operators that a language does not have become calls: a % b is rem(a,b) in Quill.
+constexpr const char* notes = R"(An operator that a language lacks becomes a call: a % b is rem(a,b) in Quill.
 
 Examples:
   vtsym convert --to quill '(F & 4) != 0 && a % b == 1'
@@ -18,27 +19,27 @@ Examples:
 
 } // namespace
 
-Command addConvert(CLI::App& program) {
-    CLI::App* const command = program.add_subcommand("convert", "Write conditions in another language, or tidily");
+void addConvert(CommandLine& program) {
+    Command& command =
+        program.add("convert", "Translate conditions between C, Quill and preprocessor directives", notes);
     const auto options = std::make_shared<TextOptions>();
-    addTextOptions(*command, *options);
-    addLanguageOption(*command, *options);
-    command->footer(examples);
-    return {command, [options](Console& console) {
-                Conditions conditions;
-                std::vector<std::string> warnings;
-                const auto answer = [&](const std::string& text, std::string& out) {
-                    conditions.makeRoomFor(text);
-                    const VT::SymbolicExprId condition = conditions.parse(*options, text);
-                    const std::string result = conditions.print(*options, condition);
-                    warnings = conditions.warnings(*options, condition);
-                    if (options->json)
-                        appendMember(out, "result", jsonString(result));
-                    else
-                        out.append(result);
-                };
-                return answerTexts(*options, console, {answer, false, &warnings});
-            }};
+    addTextOptions(command, *options);
+    addLanguageOption(command, *options);
+    command.run = [options](Console& console) {
+        Conditions conditions;
+        std::vector<std::string> warnings;
+        const auto answer = [&](const std::string& text, std::string& out) {
+            conditions.makeRoomFor(text);
+            const VT::SymbolicExprId condition = conditions.parse(*options, text);
+            const std::string result = conditions.print(*options, condition);
+            warnings = conditions.warnings(*options, condition);
+            if (options->json)
+                appendMember(out, "result", jsonString(result));
+            else
+                out.append(result);
+        };
+        return answerTexts(*options, console, {answer, false, &warnings});
+    };
 }
 
 } // namespace vtsym

@@ -1,18 +1,20 @@
+// Splits a definition at its first =, reads both sides, and binds the name in the table.
+// A side that cannot be read is an error of the command line, with the message of the reader.
 #include "tools/vtsym/commands/Definitions.hpp"
 
 #include "base/core/Nodes.hpp"
-#include "tools/vtsym/io/Arguments.hpp"
+#include "tools/vtsym/io/CommandLine.hpp"
 #include "tools/vtsym/io/ErrorText.hpp"
 
 namespace vtsym {
 
 namespace {
 
-/// The two sides of NAME=VALUE, which stands with its first =.
+/// Splits NAME=VALUE at its first =.
 Definition definitionOf(const std::string& assignment) {
     const std::size_t equals = assignment.find('=');
     if (equals == std::string::npos || equals == 0)
-        throw CLI::ValidationError("-D", quotedArgument(assignment) + " is not NAME=VALUE");
+        throw UsageError("-D", quotedArgument(assignment) + " is not NAME=VALUE");
     return {assignment.substr(0, equals), assignment.substr(equals + 1)};
 }
 
@@ -20,20 +22,19 @@ VT::SymbolicExprId readSide(const ReadExpression& read, const std::string& text,
     try {
         return read(text);
     } catch (...) {
-        throw CLI::ValidationError("-D", what + " cannot be read: " + currentTextError().message);
+        throw UsageError("-D", what + " cannot be read: " + currentTextError().message);
     }
 }
 
 } // namespace
 
-void addDefinitions(CLI::App& command, Definitions& definitions) {
+void addDefinitions(Command& command, Definitions& definitions) {
     const auto take = [&definitions](const std::vector<std::string>& assignments) {
         for (const std::string& assignment : assignments)
             definitions.push_back(definitionOf(assignment));
     };
-    addArguments(command, "-D", take,
-                 "Give a symbol, or a member such as A.B, a value, which is an expression in the language of the texts")
-        ->type_name("NAME=VALUE");
+    command.addArguments(
+        {"-D", "Define a symbol, or a member A.B, as an expression in the language of the texts", "NAME=VALUE"}, take);
 }
 
 void bindDefinitions(VT::SymbolicExprTable& table, const Definitions& definitions, const ReadExpression& read) {
@@ -43,10 +44,11 @@ void bindDefinitions(VT::SymbolicExprTable& table, const Definitions& definition
         const bool isSymbol =
             node != nullptr && (node->op() == VT::SymbolicOp::String || node->op() == VT::SymbolicOp::MemberValue);
         if (!isSymbol || name == table.getIdTRUE() || name == table.getIdFALSE())
-            throw CLI::ValidationError("-D",
-                                       quotedArgument(definition.name) + " is not a name that can be given a value");
+            throw UsageError("-D", quotedArgument(definition.name) +
+                                       " cannot be defined; write a name, or a member such as A.B");
         if (definition.value.empty())
-            throw CLI::ValidationError("-D", quotedArgument(definition.name + "=") + " gives no value");
+            throw UsageError("-D",
+                             quotedArgument(definition.name + "=") + " has no value; write an expression after =");
         table.registerValueId(name,
                               readSide(read, definition.value, "the value of " + quotedArgument(definition.name)));
     }

@@ -1,15 +1,16 @@
-// The values that a command is told for symbols.
+// Definitions NAME=VALUE of `eval` and `dims`: option -D, and binding the names in a table.
+// A value is an expression and may use the names of other definitions.
 #pragma once
 
 #include "base/core/Table.hpp"
-
-#include <CLI/CLI.hpp>
 
 #include <functional>
 #include <string>
 #include <vector>
 
 namespace vtsym {
+
+class Command;
 
 struct Definition {
     std::string name;
@@ -18,13 +19,13 @@ struct Definition {
 
 using Definitions = std::vector<Definition>;
 
-/// Reads an expression into the table that definitions are for.
+/// Reads an expression into the table in which names are bound.
 using ReadExpression = std::function<VT::SymbolicExprId(const std::string&)>;
 
-/// Gives a command -D, which adds to `definitions`.
-void addDefinitions(CLI::App& command, Definitions& definitions);
+/// Adds -D to a command, which adds to `definitions`.
+void addDefinitions(Command& command, Definitions& definitions);
 
-/// Binds the definitions in a table, in order.  Throws CLI::ValidationError for what is none.
+/// Binds the definitions in a table, in order.  Throws UsageError for one that cannot be read.
 void bindDefinitions(VT::SymbolicExprTable& table, const Definitions& definitions, const ReadExpression& read);
 
 } // namespace vtsym

@@ -1,4 +1,5 @@
-// vtsym dims
+// vtsym dims: dimension expressions in the forms that the host works with: integers, simplified, divisions pulled out.
+// Each text has a table of its own, in which the definitions are bound again.
 #include "base/eval/Eval.hpp"
 #include "base/service/VCSymbols.hpp"
 #include "base/simplify/Simplify.hpp"
@@ -19,10 +20,10 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* examples =
-    R"(Each answer has a line for every form: the text with integers for its numbers, that simplified, and that with its
-divisions pulled outwards; then the symbols and, where all of them are defined, the value.  Simplifying and pulling
-outwards take divisions as exact.
+constexpr const char* notes =
+    R"(Each answer has a line for every form: the text with integers for its numbers, the simplified form, and that form with
+its divisions pulled outwards; then the symbols and, if all of them are defined, the value.  Divisions are taken to be
+exact.
 
 Examples:
   vtsym dims 'N*2 + N/3'
@@ -33,7 +34,7 @@ struct DimsOptions : TextOptions {
     Definitions definitions;
 };
 
-/// A dimension expression, with integers for its numbers.  Throws what the reader reports.
+/// Reads a dimension expression and turns its numbers into integers.  Throws the first diagnostic of the reader.
 VT::SymbolicExprId readDimension(VT::SymbolicExprTable& table, const std::string& text) {
     VT::VTSymbolicExprErrorChecker checker;
     const VT::SymbolicExprId id = VT::SymbolicExprFromQParseTree(table, checker)(text);
@@ -56,7 +57,7 @@ std::vector<std::string> symbolsOf(const VT::SymbolicExprTable& table, VT::Symbo
     return symbols;
 }
 
-/// The value; nothing where a symbol has none.
+/// The value, or nullopt where a symbol has no value.
 std::optional<VT::SymbolicValue> valueOf(const VT::SymbolicExprTable& table, VT::SymbolicExprId id) {
     std::vector<VT::SymbolicExprId> unbound;
     VT::VCSymbolsOfSymbolicExpr(table, {VT::VCSymbolType::UnboundMember}).getSymbolIds(id, unbound);
@@ -71,7 +72,7 @@ std::optional<VT::SymbolicValue> valueOf(const VT::SymbolicExprTable& table, VT:
     }
 }
 
-/// Writes the lines, or the members, of one answer.
+/// Appends the lines, or the JSON members, of one answer.
 class Report {
 public:
     Report(std::string& out, bool json, const Style& style) : out_(out), json_(json), style_(style) {}
@@ -132,23 +133,21 @@ void answer(const DimsOptions& options, const Style& style, const std::string& t
 
 } // namespace
 
-Command addDims(CLI::App& program) {
-    CLI::App* const command = program.add_subcommand("dims", "Rearrange and evaluate dimension expressions in Quill");
+void addDims(CommandLine& program) {
+    Command& command = program.add("dims", "Rearrange and evaluate dimension expressions in Quill", notes);
     const auto options = std::make_shared<DimsOptions>();
-    addTextOptions(*command, *options);
-    command->remove_option(command->get_option("--from"));
-    addDefinitions(*command, options->definitions);
-    command->footer(examples);
-    command->final_callback([options] {
-        VT::SymbolicExprTable table; // wrong definitions are told before any text
+    addTexts(command, *options);
+    addDefinitions(command, options->definitions);
+    command.afterOptions = [options] {
+        VT::SymbolicExprTable table; // reports wrong definitions before any text is answered
         define(table, *options);
-    });
-    return {command, [options](Console& console) {
-                const auto answerText = [&](const std::string& text, std::string& out) {
-                    answer(*options, console.dataStyle(), text, out);
-                };
-                return answerTexts(*options, console, {answerText, !options->json});
-            }};
+    };
+    command.run = [options](Console& console) {
+        const auto answerText = [&](const std::string& text, std::string& out) {
+            answer(*options, console.outStyle(), text, out);
+        };
+        return answerTexts(*options, console, {answerText, !options->json});
+    };
 }
 
 } // namespace vtsym

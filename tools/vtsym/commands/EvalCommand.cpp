@@ -1,4 +1,5 @@
-// vtsym eval
+// vtsym eval: values of expressions, with definitions for their names.
+// The definitions are bound again whenever the service is renewed.
 #include "base/eval/Eval.hpp"
 #include "base/transform/DimensionLists.hpp"
 #include "tools/vtsym/answers/Conditions.hpp"
@@ -14,9 +15,9 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* examples =
-    R"(Integers have 32 bits: + - * wrap, / cuts and saturates.  A name that is defined twice has its last value, and a
-value may name other definitions.
+constexpr const char* notes =
+    R"(Integers have 32 bits: + - * wrap, / truncates and saturates.  The last definition of a name counts, and a value may use
+other definitions.
 
 Examples:
   vtsym eval -D N=3 'N*2 + 1'
@@ -38,7 +39,7 @@ public:
 private:
     [[nodiscard]] VT::SymbolicExprTable& table() const { return conditions_.service().table(); }
 
-    /// Quill writes a list as a matrix.
+    /// A list in Quill is written as a matrix.
     [[nodiscard]] VT::SymbolicExprId read(const std::string& text) const {
         return VT::SymbolicExprDimensionLists(table())(conditions_.parse(options_, text));
     }
@@ -65,20 +66,18 @@ void Evaluator::answer(const std::string& text, std::string& out) {
 
 } // namespace
 
-Command addEval(CLI::App& program) {
-    CLI::App* const command = program.add_subcommand("eval", "Evaluate expressions");
+void addEval(CommandLine& program) {
+    Command& command = program.add("eval", "Evaluate expressions", notes);
     const auto options = std::make_shared<EvalOptions>();
     const auto evaluator = std::make_shared<std::optional<Evaluator>>();
-    addTextOptions(*command, *options);
-    addDefinitions(*command, options->definitions);
-    command->footer(examples);
-    // Behind all options, because the language of the definitions is one.
-    command->final_callback([options, evaluator] { evaluator->emplace(*options).define(); });
-    return {command, [options, evaluator](Console& console) {
-                const Answering answering{
-                    [&](const std::string& text, std::string& out) { (*evaluator)->answer(text, out); }};
-                return answerTexts(*options, console, answering);
-            }};
+    addTextOptions(command, *options);
+    addDefinitions(command, options->definitions);
+    // After all options: --from is the language of the definitions too.
+    command.afterOptions = [options, evaluator] { evaluator->emplace(*options).define(); };
+    command.run = [options, evaluator](Console& console) {
+        const Answering answering{[&](const std::string& text, std::string& out) { (*evaluator)->answer(text, out); }};
+        return answerTexts(*options, console, answering);
+    };
 }
 
 } // namespace vtsym

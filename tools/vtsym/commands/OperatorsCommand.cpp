@@ -1,4 +1,5 @@
-// vtsym operators
+// vtsym operators: prints the operator table, expanded from operators.def, as columns or as JSON.
+// A new row of the table appears here without an edit.
 #include "base/core/Operators.hpp"
 #include "tools/vtsym/commands/Commands.hpp"
 #include "tools/vtsym/io/Json.hpp"
@@ -12,13 +13,13 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* examples = R"(A smaller precedence binds tighter.
+constexpr const char* notes = R"(A smaller precedence binds tighter.
 
 Examples:
   vtsym operators
   vtsym operators --json | jq 'select(.c == "%")')";
 
-/// The names of how operators are written, by operator code.
+/// The names of the forms in which operators are written, by operator code.
 constexpr auto formNames = std::to_array<std::string_view>({
 #define VTSYM_OPERATOR(Code, Name, Class, Shape, Quill, C, QuillCall, Prec, Assoc, Form, ...) #Form,
 #include "base/core/operators.def"
@@ -95,21 +96,20 @@ std::string jsonOf(const VT::OperatorInfo& row) {
 
 } // namespace
 
-Command addOperators(CLI::App& program) {
-    CLI::App* const command = program.add_subcommand("operators", "List the operators that expressions are made of");
+void addOperators(CommandLine& program) {
+    Command& command = program.add("operators", "List the operators of expressions", notes);
     const auto json = std::make_shared<bool>(false);
-    command->add_flag("--json", *json, "Answer with one JSON object per operator");
-    command->footer(examples);
-    return {command, [json](Console& console) {
-                if (*json) {
-                    for (const VT::OperatorInfo& row : VT::operatorTable())
-                        console.data(jsonOf(row));
-                } else {
-                    console.data(table(console.dataStyle()));
-                }
-                console.flush();
-                return true;
-            }};
+    command.addFlag("--json", "Answer with one JSON object per operator", *json);
+    command.run = [json](Console& console) {
+        if (*json) {
+            for (const VT::OperatorInfo& row : VT::operatorTable())
+                console.out(jsonOf(row));
+        } else {
+            console.out(table(console.outStyle()));
+        }
+        console.flush();
+        return true;
+    };
 }
 
 } // namespace vtsym

@@ -1,7 +1,9 @@
+// Joins two arguments into one text with a tab, so that arguments and lines are answered alike, and reads both parts of
+// a text with offsets that count from its beginning.
 #include "tools/vtsym/commands/Pairs.hpp"
 
 #include "host/Diagnostics.hpp"
-#include "tools/vtsym/io/Arguments.hpp"
+#include "tools/vtsym/io/CommandLine.hpp"
 #include "tools/vtsym/io/ErrorText.hpp"
 #include "tools/vtsym/io/Json.hpp"
 
@@ -11,7 +13,7 @@ namespace vtsym {
 
 namespace {
 
-/// Reads the part of a text from begin to end; keeps the error where it cannot be read.
+/// Reads the part of a text that begins at a byte; appends to the errors where it cannot be read.
 VT::SymbolicExprId readPart(const Conditions& conditions, const TextOptions& options, const std::string& part,
                             std::size_t begin, std::vector<TextError>& errors) {
     try {
@@ -32,12 +34,12 @@ std::string nameOf(const Conditions& conditions, const TextOptions& options, VT:
     return options.fromQuill() ? service.printQExprWithConversion(unknown) : service.printCExprNoConversion(unknown);
 }
 
-/// Makes one text of two arguments, in which a tab is a blank like any other.
+/// Joins two arguments into one text; a tab inside of them becomes a blank.
 void joinArguments(PairOptions& options) {
     if (!options.first || (options.first == "-" && !options.second))
         return;
     if (!options.second)
-        throw CLI::ValidationError("two conditions are needed; the one that always holds is true");
+        throw UsageError("the second condition is missing; write true for one that always holds");
     std::ranges::replace(*options.first, '\t', ' ');
     std::ranges::replace(*options.second, '\t', ' ');
     options.texts = {*options.first + "\t" + *options.second};
@@ -45,22 +47,21 @@ void joinArguments(PairOptions& options) {
 
 } // namespace
 
-void addPairOptions(CLI::App& command, PairOptions& options, const std::string& first, const std::string& second) {
-    addArgument(
-        command, first, [&options](const std::string& text) { options.first = text; },
-        "Two conditions; without any, or with -, every line of standard input is two, separated by a tab");
-    addArgument(
-        command, second, [&options](const std::string& text) { options.second = text; }, "");
+void addPairOptions(Command& command, PairOptions& options, const std::string& first, const std::string& second) {
+    command.addArgument({first, "A condition; without any, or with -, lines of standard input with two, a tab between"},
+                        [&options](const std::string& text) { options.first = text; });
+    command.addArgument({second, "The other condition"},
+                        [&options](const std::string& text) { options.second = text; });
     addSourceOption(command, options);
-    command.add_flag("--json", options.json, "Answer with one JSON object per pair");
+    command.addFlag("--json", "Answer with one JSON object per pair", options.json);
     addBitsOption(command, options.bits32);
-    command.callback([&options] { joinArguments(options); });
+    command.afterOptions = [&options] { joinArguments(options); };
 }
 
 ConditionPair readPair(const Conditions& conditions, const TextOptions& options, const std::string& text) {
     const std::size_t tab = text.find('\t');
     if (tab == std::string::npos || text.find('\t', tab + 1) != std::string::npos)
-        throw CommandError("Two conditions are separated by one tab.");
+        throw CommandError("This is not a pair: write two conditions with one tab between them.");
     ConditionPair pair{text.substr(0, tab), text.substr(tab + 1), VT::invalidId, VT::invalidId};
     std::vector<TextError> errors;
     pair.first = readPart(conditions, options, pair.firstText, 0, errors);

@@ -1,4 +1,5 @@
-// Commands on two conditions at a time.
+// Two conditions a time, for `compare` and `given`: as two arguments, or as lines with a tab between them.
+// Both are read before an error is reported, so that one line reports the errors of both.
 #pragma once
 
 #include "tools/vtsym/answers/Conditions.hpp"
@@ -8,14 +9,16 @@
 
 namespace vtsym {
 
-/// What a command on pairs is told.  A pair is one text, its two conditions separated by a tab.
+class Command;
+
+/// Options of a command on pairs.  A pair is one text whose two conditions are separated by a tab.
 struct PairOptions : TextOptions {
     std::optional<std::string> first;
     std::optional<std::string> second;
     bool bits32 = false;
 };
 
-/// Two conditions as they were written, and what they are.
+/// Two conditions, as written and as read.
 struct ConditionPair {
     std::string firstText;
     std::string secondText;
@@ -23,10 +26,10 @@ struct ConditionPair {
     VT::SymbolicExprId second;
 };
 
-/// Gives a command two texts under the names that its help shows, --from, --json and --bits.
-void addPairOptions(CLI::App& command, PairOptions& options, const std::string& first, const std::string& second);
+/// Adds two positionals of these names, --from, --json and --bits.
+void addPairOptions(Command& command, PairOptions& options, const std::string& first, const std::string& second);
 
-/// The conditions of a pair.  Throws CommandError for those that cannot be read, with places in the whole text.
+/// Reads a pair.  Throws CommandError with one error for each condition that cannot be read, placed in the whole text.
 ConditionPair readPair(const Conditions& conditions, const TextOptions& options, const std::string& text);
 
 /// An assignment as text, "A=3, B=0", and as a JSON object.

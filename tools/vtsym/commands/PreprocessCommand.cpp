@@ -1,9 +1,10 @@
-// vtsym pp
+// vtsym pp: conditions as the host generates them for preprocessor directives, shortened under a known condition.
+// Unlike `given`, it takes parts away without searching for the shortest form.
 #include "base/decide/shorten/StringifyImpliedCondition.hpp"
 #include "base/transform/QuillConversion.hpp"
 #include "tools/vtsym/answers/Conditions.hpp"
 #include "tools/vtsym/commands/Commands.hpp"
-#include "tools/vtsym/io/Arguments.hpp"
+#include "tools/vtsym/io/CommandLine.hpp"
 #include "tools/vtsym/io/ErrorText.hpp"
 #include "tools/vtsym/io/Json.hpp"
 #include "tools/vtsym/io/Texts.hpp"
@@ -12,7 +13,7 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* examples =
+constexpr const char* notes =
     R"(Members become macro names: s.x is s_x.  The condition that always holds is written as 1.
 
 Examples:
@@ -28,7 +29,7 @@ class Preprocessor {
 public:
     explicit Preprocessor(const PreprocessOptions& options) : options_(options) {}
 
-    /// Whether the given condition can be read; says why not.
+    /// Returns whether the known condition can be read, and reports why it cannot.
     bool readsGiven(Console& console);
     void answer(const std::string& text, std::string& out);
 
@@ -45,10 +46,10 @@ bool Preprocessor::readsGiven(Console& console) {
         return true;
     } catch (...) {
         const TextError error = currentTextError();
-        std::string words = "vtsym: --given: " + error.message + "\n";
+        std::string message = "vtsym: --given: " + error.message + "\n";
         if (error.offset)
-            words += withCaret(options_.given, *error.offset, console.wordStyle());
-        console.words(words);
+            message += withCaret(options_.given, *error.offset, console.errStyle());
+        console.err(message);
         return false;
     }
 }
@@ -71,21 +72,21 @@ void Preprocessor::answer(const std::string& text, std::string& out) {
 
 } // namespace
 
-Command addPreprocess(CLI::App& program) {
-    CLI::App* const command = program.add_subcommand("pp", "Write conditions for preprocessor directives");
+void addPreprocess(CommandLine& program) {
+    Command& command = program.add("pp", "Write conditions for preprocessor directives", notes);
     const auto options = std::make_shared<PreprocessOptions>();
     options->to = "pp";
-    addTextOptions(*command, *options);
-    addArgument(*command, "--given", options->given, "A condition that is known to hold; what it decides is left out")
-        ->type_name("CONDITION");
-    command->footer(examples);
-    return {command, [options](Console& console) {
-                Preprocessor preprocessor(*options);
-                if (!preprocessor.readsGiven(console))
-                    return false;
-                const auto answer = [&](const std::string& text, std::string& out) { preprocessor.answer(text, out); };
-                return answerTexts(*options, console, {answer, false, &preprocessor.warnings});
-            }};
+    addTextOptions(command, *options);
+    command.addArgument(
+        {"--given", "A condition that is known to hold; the parts that it decides are left out", "CONDITION"},
+        options->given);
+    command.run = [options](Console& console) {
+        Preprocessor preprocessor(*options);
+        if (!preprocessor.readsGiven(console))
+            return false;
+        const auto answer = [&](const std::string& text, std::string& out) { preprocessor.answer(text, out); };
+        return answerTexts(*options, console, {answer, false, &preprocessor.warnings});
+    };
 }
 
 } // namespace vtsym

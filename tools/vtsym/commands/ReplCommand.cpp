@@ -1,4 +1,5 @@
-// vtsym repl
+// vtsym repl: a prompt on a terminal, one answer a line otherwise.
+// The session answers; this reads lines and reports errors.
 #include "tools/vtsym/answers/Session.hpp"
 #include "tools/vtsym/commands/Commands.hpp"
 #include "tools/vtsym/io/ErrorText.hpp"
@@ -10,15 +11,15 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* examples =
-    R"(On a terminal lines are edited, with a history and completion of names by Tab.  Otherwise every line of standard input is
-answered as by the other commands.
+constexpr const char* notes =
+    R"(On a terminal, lines are edited, with a history, and Tab completes names.  Otherwise every line of standard input is
+answered by one line, as by the other commands.  :help lists the commands of the prompt.
 
 Examples:
   vtsym repl
   printf 'A>2 && A<4\nans || A>3\n:tree\n' | vtsym repl)";
 
-/// Talks with the user; true, for nobody asks a dialogue how it went.
+/// Answers the lines typed on a terminal.  Returns true, since errors in a dialogue are no failure of the program.
 bool talk(Session& session, Console& console) {
     LineEditor editor("> ", [&session]() -> const std::set<std::string>& { return session.words(); });
     while (const std::optional<std::string> line = editor.read()) {
@@ -27,13 +28,13 @@ bool talk(Session& session, Console& console) {
             session.answer(*line, out);
         } catch (...) {
             const TextError error = currentTextError();
-            console.words(errorText(*line, error, console.wordStyle()));
+            console.err(errorText(*line, error, console.errStyle()));
             continue;
         }
         if (session.ended())
             break;
         if (!out.empty())
-            console.data(out + "\n");
+            console.out(out + "\n");
         console.flush();
     }
     return true;
@@ -41,21 +42,20 @@ bool talk(Session& session, Console& console) {
 
 } // namespace
 
-Command addRepl(CLI::App& program) {
-    CLI::App* const command = program.add_subcommand("repl", "Answer conditions and commands as they are typed");
+void addRepl(CommandLine& program) {
+    Command& command = program.add("repl", "Simplify conditions at a prompt", notes);
     const auto options = std::make_shared<TextOptions>();
-    addSourceOption(*command, *options);
-    command->footer(examples);
-    return {command, [options](Console& console) {
-                Session session(*options, console.dataStyle());
-                if (isatty(STDIN_FILENO) == 1 && isatty(STDOUT_FILENO) == 1)
-                    return talk(session, console);
-                const auto answer = [&](const std::string& line, std::string& out) {
-                    if (!session.ended())
-                        session.answer(line, out);
-                };
-                return answerTexts(*options, console, {answer});
-            }};
+    addSourceOption(command, *options);
+    command.run = [options](Console& console) {
+        Session session(*options, console.outStyle());
+        if (isatty(STDIN_FILENO) == 1 && isatty(STDOUT_FILENO) == 1)
+            return talk(session, console);
+        const auto answer = [&](const std::string& line, std::string& out) {
+            if (!session.ended())
+                session.answer(line, out);
+        };
+        return answerTexts(*options, console, {answer});
+    };
 }
 
 } // namespace vtsym

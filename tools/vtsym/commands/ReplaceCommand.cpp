@@ -1,7 +1,8 @@
-// vtsym replace
+// vtsym replace: names replaced by other names, all at once.
+// Leading arguments of the form NAME=NAME are replacements; no condition has that form.
 #include "tools/vtsym/answers/Conditions.hpp"
 #include "tools/vtsym/commands/Commands.hpp"
-#include "tools/vtsym/io/Arguments.hpp"
+#include "tools/vtsym/io/CommandLine.hpp"
 #include "tools/vtsym/io/Json.hpp"
 #include "tools/vtsym/io/Texts.hpp"
 
@@ -11,8 +12,8 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* examples =
-    R"(All names are replaced at once, so two can be exchanged.  The names of functions and members stay.
+constexpr const char* notes =
+    R"(All names are replaced at once, so that two can be exchanged.  The names of functions and members stay.
 
 Examples:
   vtsym replace Mode=Gear 'Mode == 1 && Speed > 2'
@@ -21,7 +22,7 @@ Examples:
 
 using Names = std::unordered_map<std::string, std::string>;
 
-/// Takes the replacements from the beginning of the arguments: no condition looks like NAME=NAME.
+/// Removes the replacements from the front of the arguments.
 Names takeNames(std::vector<std::string>& arguments) {
     Names names;
     auto next = arguments.begin();
@@ -32,40 +33,37 @@ Names takeNames(std::vector<std::string>& arguments) {
             break;
         const std::string name = next->substr(0, equals);
         if (!names.emplace(name, next->substr(equals + 1)).second)
-            throw CLI::ValidationError("replace", quotedArgument(name) + " is replaced twice");
+            throw UsageError("replace", quotedArgument(name) + " is replaced twice; leave one replacement out");
     }
     if (names.empty())
-        throw CLI::ValidationError("replace", "a replacement NAME=NAME is missing before the texts");
+        throw UsageError("replace", "there is no replacement; write NAME=NAME before the texts");
     arguments.erase(arguments.begin(), next);
     return names;
 }
 
 } // namespace
 
-Command addReplace(CLI::App& program) {
-    CLI::App* const command = program.add_subcommand("replace", "Replace names in conditions");
+void addReplace(CommandLine& program) {
+    Command& command = program.add("replace", "Replace names in conditions", notes);
     const auto options = std::make_shared<TextOptions>();
     const auto names = std::make_shared<Names>();
-    addTextOptions(*command, *options);
-    command->get_option("TEXT")->description(
-        "NAME=NAME... and then texts to work on; without any, or with -, every line of standard input");
-    addLanguageOption(*command, *options);
-    command->footer(examples);
-    command->final_callback([options, names] { *names = takeNames(options->texts); });
-    return {command, [options, names](Console& console) {
-                Conditions conditions;
-                const auto answer = [&](const std::string& text, std::string& out) {
-                    conditions.makeRoomFor(text);
-                    const VT::VCSymbolicExprId replaced =
-                        conditions.service().replaceSymbolsInExpression(conditions.parse(*options, text), *names);
-                    const std::string result = conditions.print(*options, replaced.id());
-                    if (options->json)
-                        appendMember(out, "result", jsonString(result));
-                    else
-                        out.append(result);
-                };
-                return answerTexts(*options, console, {answer});
-            }};
+    addTextOptions(command, *options, "NAME=NAME... and then texts to work on");
+    addLanguageOption(command, *options);
+    command.afterOptions = [options, names] { *names = takeNames(options->texts); };
+    command.run = [options, names](Console& console) {
+        Conditions conditions;
+        const auto answer = [&](const std::string& text, std::string& out) {
+            conditions.makeRoomFor(text);
+            const VT::VCSymbolicExprId replaced =
+                conditions.service().replaceSymbolsInExpression(conditions.parse(*options, text), *names);
+            const std::string result = conditions.print(*options, replaced.id());
+            if (options->json)
+                appendMember(out, "result", jsonString(result));
+            else
+                out.append(result);
+        };
+        return answerTexts(*options, console, {answer});
+    };
 }
 
 } // namespace vtsym

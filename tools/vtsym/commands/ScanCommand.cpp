@@ -1,10 +1,11 @@
-// vtsym scan
+// vtsym scan: reads C and C++ files and prints the findings of SourceScanner as messages, JSON or SARIF with fixes.
+// A file that cannot be read is reported and does not end the scan; the status is 2 then.
 #include "base/scan/SourceScan.hpp"
 #include "host/Text.hpp"
 #include "tools/vtsym/commands/Commands.hpp"
 #include "tools/vtsym/findings/Findings.hpp"
 #include "tools/vtsym/findings/SourceFiles.hpp"
-#include "tools/vtsym/io/Arguments.hpp"
+#include "tools/vtsym/io/CommandLine.hpp"
 #include "tools/vtsym/io/Files.hpp"
 
 #include <array>
@@ -14,13 +15,13 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* examples =
-    R"(Holds every #if, #ifdef, #ifndef, #elif, #elifdef and #elifndef against the directives around it and those before
-it in its chain, and tells which branches are never entered, which are always entered, and which conditions have a
-shorter text.  Directories are searched for C and C++ files.  A macro that a file defines or undefines on the way is
-another one behind; an included file may define what is not defined.  #if 0 and #if 1 are left alone.
+constexpr const char* notes =
+    R"(Compares every #if, #ifdef, #ifndef, #elif, #elifdef and #elifndef with the directives around it and those before it in
+its chain, and reports branches that no build enters, conditions that always hold, and conditions with a shorter text.
+Directories are searched for C and C++ files.  Nothing is concluded about a macro across a #define or #undef of it, and an
+included file may define what is not defined.  #if 0 and #if 1 are left alone.
 
-Exit status: 0 nothing was found, 1 something was, 2 a path could not be read, whatever was found in others.
+Exit status: 0 no findings, 1 findings, 2 a path could not be read, with or without findings in others.
 
 Examples:
   vtsym scan src include
@@ -30,9 +31,9 @@ constexpr auto rules = std::to_array<FindingRule>({
     {"dead", "A branch is never entered.",
      "The condition contradicts a directive around the branch or before it in its chain, so that no definition of the "
      "macros enters the branch. Correct the condition, or remove the branch."},
-    {"always-true", "A condition always holds where it stands.",
-     "The directives around the branch and before it in its chain imply the condition, so that it decides nothing and "
-     "branches behind it are dead. Correct the condition, or remove it."},
+    {"always-true", "A condition always holds.",
+     "The directives around the branch and before it in its chain imply the condition, so that later branches of the "
+     "chain are dead. Correct the condition, or remove it."},
     {"removable", "A condition has a shorter text that enters the branch in the same cases.",
      "The directives around the branch and before it in its chain make a part of the condition redundant. Correct the "
      "condition, or write the shorter one."},
@@ -90,8 +91,8 @@ Finding findingOf(const std::string& file, const VT::BranchFinding& found) {
         finding.proposed = found.proposed;
     for (const VT::BranchReason& reason : found.reasons)
         finding.follows.push_back({placeOf(file, reason.region), reason.directive});
-    if (found.replaced && VT::shownText(found.replacement) == found.replacement) // logs hold UTF-8 alone
-        finding.fix = Fix{"Write the condition that is left.", placeOf(file, *found.replaced), found.replacement};
+    if (found.replaced && VT::shownText(found.replacement) == found.replacement) // a log can hold only UTF-8
+        finding.fix = Fix{"Write the shorter condition.", placeOf(file, *found.replaced), found.replacement};
     return finding;
 }
 
@@ -115,34 +116,34 @@ SearchResult scan(const ScanOptions& options, Console& console) {
                      [&](const VT::BranchFinding& found) { writer->write(findingOf(path, found)); });
     }
     if (files == 0 && !writer->failed())
-        problem(options.paths.front(), "there is no C or C++ file");
+        problem(options.paths.front(), "there is no C or C++ file: name a folder of sources, or a file");
     if (const std::uint64_t undecided = scanner.counts().undecided; undecided > 0)
-        writer->note(std::to_string(undecided) + " decisions were given up: what depends on them is not reported");
+        writer->note(std::to_string(undecided) + " decisions were given up: findings that depend on them are missing");
     const SearchResult result = writer->finish();
     if (options.summary) {
         const VT::SourceScanCounts& counts = scanner.counts();
-        console.words("vtsym: " + std::to_string(files) + " files, " + std::to_string(counts.branches) + " branches, " +
-                      std::to_string(writer->found()) + " findings; " + std::to_string(counts.unread) +
-                      " conditions not understood, " + std::to_string(counts.undecided) + " decisions given up\n");
+        console.err("vtsym: " + std::to_string(files) + " files, " + std::to_string(counts.branches) + " branches, " +
+                    std::to_string(writer->found()) + " findings; " + std::to_string(counts.unread) +
+                    " conditions not understood, " + std::to_string(counts.undecided) + " decisions given up\n");
     }
     return result;
 }
 
 } // namespace
 
-Command addScan(CLI::App& program) {
-    CLI::App* const command =
-        program.add_subcommand("scan", "Find dead, redundant and shortenable preprocessor conditions in C and C++");
+void addScan(CommandLine& program) {
+    Command& command =
+        program.add("scan", "Find dead, redundant and shortenable preprocessor conditions in C and C++", notes);
     const auto options = std::make_shared<ScanOptions>();
     const auto take = [options](std::vector<std::string> paths) { options->paths = std::move(paths); };
-    addArguments(*command, "PATH", take, "Files and directories")->required();
-    addFormOptions(*command, options->form);
-    addSizeOption(*command, options->mostBytes);
-    command->add_flag("--strict-includes", options->strictIncludes, "Take it that an included file changes any macro");
-    command->add_flag("--summary", options->summary, "Tell on standard error how much was read");
-    command->footer(examples);
-    return {command, [options](Console& console) { return ExitStatus(scan(*options, console)); },
-            ExitStatus(SearchResult::Failed)};
+    command.addArguments({"PATH", "Files and directories"}, take);
+    command.require("PATH");
+    addFormOptions(command, options->form);
+    addSizeOption(command, options->mostBytes);
+    command.addFlag("--strict-includes", "Assume that an included file changes any macro", options->strictIncludes);
+    command.addFlag("--summary", "Report on standard error how much was read", options->summary);
+    command.run = [options](Console& console) { return scan(*options, console); };
+    command.onError = SearchResult::Failed;
 }
 
 } // namespace vtsym

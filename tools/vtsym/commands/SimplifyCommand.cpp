@@ -1,4 +1,5 @@
-// vtsym simplify
+// vtsym simplify: the shortest form of a condition that is proven equal, or its sum of products.
+// Explanations and JSON count passes, so they bypass the caches of the service.
 #include "tools/vtsym/answers/Conditions.hpp"
 #include "tools/vtsym/answers/Explanation.hpp"
 #include "tools/vtsym/commands/Commands.hpp"
@@ -9,13 +10,13 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* examples =
-    R"(Conditions are over integers: every name stands for an integer, and what is not zero is true.
-Quotients of a condition are truncated, as in C; dimensions, such as N/2*2, divide exactly.
+constexpr const char* notes =
+    R"(Every name stands for an integer of any size, and every value but zero is true.  Quotients in conditions are truncated, as
+in C; in dimensions, such as N/2*2, they are exact.
 
 The answer is the shortest form found that is proven equal: fewest comparisons, then fewest bytes, and never longer than
-the condition as printed.  With --normal-form it is the library's sum of products.  What is no condition, such as 2+3,
-is a number and stays one.
+the condition as printed.  With --normal-form it is the sum of products that the rules lead to.  A number, such as 2+3,
+stays a number.
 
 Examples:
   vtsym simplify 'Mode == 1 && Mode == 2'
@@ -66,7 +67,7 @@ void Simplifier::answer(const std::string& text, std::string& out) {
     warnings_ = conditions_.warnings(options_, result);
 }
 
-/// Past the service's caches, which know results only.
+/// Bypasses the caches of the service, which keep only results.
 VT::SymbolicExprId Simplifier::answerInDetail(const std::string& text, std::string& out) const {
     Explanation explanation(conditions_, options_, conditions_.parse(options_, text), options_.explain);
     if (!options_.normalForm)
@@ -84,22 +85,20 @@ VT::SymbolicExprId Simplifier::answerInDetail(const std::string& text, std::stri
 
 } // namespace
 
-Command addSimplify(CLI::App& program) {
-    CLI::App* const command = program.add_subcommand("simplify", "Simplify conditions");
+void addSimplify(CommandLine& program) {
+    Command& command = program.add("simplify", "Find the shortest equal form of conditions", notes);
     const auto options = std::make_shared<SimplifyOptions>();
-    addTextOptions(*command, *options);
-    addLanguageOption(*command, *options);
-    command->add_flag("--explain", options->explain,
-                      "Show the rules that fired, pass by pass, and how the shortest form was reached");
-    command->add_flag("--normal-form", options->normalForm, "Answer with the sum of products that the rules lead to");
-    addBitsOption(*command, options->bits32);
-    command->footer(examples);
-    return {
-        command, [options](Console& console) {
-            Simplifier simplifier(*options, console.dataStyle());
-            const auto answer = [&](const std::string& text, std::string& out) { simplifier.answer(text, out); };
-            return answerTexts(*options, console, {answer, options->explain && !options->json, &simplifier.warnings()});
-        }};
+    addTextOptions(command, *options);
+    addLanguageOption(command, *options);
+    command.addFlag("--explain", "Show the rules that fired, pass by pass, and how the shortest form was reached",
+                    options->explain);
+    command.addFlag("--normal-form", "Answer with the sum of products instead", options->normalForm);
+    addBitsOption(command, options->bits32);
+    command.run = [options](Console& console) {
+        Simplifier simplifier(*options, console.outStyle());
+        const auto answer = [&](const std::string& text, std::string& out) { simplifier.answer(text, out); };
+        return answerTexts(*options, console, {answer, options->explain && !options->json, &simplifier.warnings()});
+    };
 }
 
 } // namespace vtsym

@@ -1,7 +1,8 @@
-// vtsym symbols
+// vtsym symbols: the names in conditions, by kind.
+// Definitions do not apply here, so every member counts as unbound.
 #include "tools/vtsym/answers/Conditions.hpp"
 #include "tools/vtsym/commands/Commands.hpp"
-#include "tools/vtsym/io/Arguments.hpp"
+#include "tools/vtsym/io/CommandLine.hpp"
 #include "tools/vtsym/io/Json.hpp"
 #include "tools/vtsym/io/Texts.hpp"
 
@@ -14,8 +15,8 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* examples =
-    R"(Symbols are listed as Quill writes them, in the order in which they first occur, each once.
+constexpr const char* notes =
+    R"(Symbols are listed as Quill writes them, each once, in the order of their first occurrence.
 
 Examples:
   vtsym symbols 'Mode == 1 && P.gear > f(x)'
@@ -27,7 +28,7 @@ using VT::VCSymbolType;
 /// The words of --kinds.
 constexpr std::array<std::pair<const char*, VCSymbolType>, 3> kindWords{{
     {"identifiers", VCSymbolType::Identifier},
-    {"members", VCSymbolType::UnboundMember}, // texts bind no values
+    {"members", VCSymbolType::UnboundMember}, // nothing binds values here
     {"functions", VCSymbolType::FunctionName},
 }};
 
@@ -42,7 +43,7 @@ std::vector<std::string> kindNames() {
     return names;
 }
 
-/// The words of lists with commas.
+/// The kinds named in comma-separated lists.
 std::vector<std::string> kindsIn(const std::vector<std::string>& lists) {
     std::vector<std::string> kinds;
     for (const std::string& list : lists) {
@@ -65,36 +66,35 @@ VT::VCSymbolTypes kindsOf(const SymbolsOptions& options) {
 
 } // namespace
 
-Command addSymbols(CLI::App& program) {
-    CLI::App* const command = program.add_subcommand("symbols", "List the symbols of conditions");
+void addSymbols(CommandLine& program) {
+    Command& command = program.add("symbols", "List the symbols of conditions", notes);
     const auto options = std::make_shared<SymbolsOptions>();
-    addTextOptions(*command, *options);
+    addTextOptions(command, *options);
     const auto take = [options](const std::vector<std::string>& lists) { options->kinds = kindsIn(lists); };
-    addArguments(*command, "--kinds", take,
-                 "Kinds to list, with commas between: identifiers, members, functions (the first two unless given)")
-        ->type_name("KIND,...");
-    command->footer(examples);
-    return {command, [options](Console& console) {
-                if (options->kinds.empty())
-                    options->kinds = {"identifiers", "members"};
-                Conditions conditions;
-                const auto answer = [&](const std::string& text, std::string& out) {
-                    conditions.makeRoomFor(text);
-                    const auto symbols = conditions.symbols(conditions.parse(*options, text), kindsOf(*options));
-                    std::string list;
-                    for (const std::string& symbol : symbols) {
-                        list.append(list.empty()    ? ""
-                                    : options->json ? ","
-                                                    : " ")
-                            .append(options->json ? jsonString(symbol) : symbol);
-                    }
-                    if (options->json)
-                        appendMember(out, "symbols", "[" + list + "]");
-                    else
-                        out.append(list);
-                };
-                return answerTexts(*options, console, {answer});
-            }};
+    command.addArguments(
+        {"--kinds", "Kinds, with commas: identifiers, members, functions (the first two unless given)", "KIND,..."},
+        take);
+    command.run = [options](Console& console) {
+        if (options->kinds.empty())
+            options->kinds = {"identifiers", "members"};
+        Conditions conditions;
+        const auto answer = [&](const std::string& text, std::string& out) {
+            conditions.makeRoomFor(text);
+            const auto symbols = conditions.symbols(conditions.parse(*options, text), kindsOf(*options));
+            std::string list;
+            for (const std::string& symbol : symbols) {
+                list.append(list.empty()    ? ""
+                            : options->json ? ","
+                                            : " ")
+                    .append(options->json ? jsonString(symbol) : symbol);
+            }
+            if (options->json)
+                appendMember(out, "symbols", "[" + list + "]");
+            else
+                out.append(list);
+        };
+        return answerTexts(*options, console, {answer});
+    };
 }
 
 } // namespace vtsym

@@ -1,4 +1,5 @@
-// vtsym tree
+// vtsym tree: the nodes of an expression as a drawing, as JSON or for Graphviz.
+// Reads with the converters themselves, so that the tree shows what the reader made, before any rewriting.
 #include "base/service/TruthTexts.hpp"
 #include "parser/QuillConverterBlockVariants.hpp"
 #include "parser/SymbolicExprParser.hpp"
@@ -11,8 +12,8 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* examples =
-    R"(Identifiers count the nodes in the order in which they were made, anew for every text; false is 0 and true is 1.
+constexpr const char* notes =
+    R"(Identifiers count the nodes of a text in the order in which they were made; false is 0 and true is 1.
 
 Examples:
   vtsym tree 'Mode == 1 && Gear > 2'
@@ -48,18 +49,18 @@ void answer(const TreeOptions& options, const Style& style, const std::string& t
 
 } // namespace
 
-Command addTree(CLI::App& program) {
-    CLI::App* const command = program.add_subcommand("tree", "Show expressions as trees");
+void addTree(CommandLine& program) {
+    Command& command = program.add("tree", "Show expressions as trees", notes);
     const auto options = std::make_shared<TreeOptions>();
-    addTextOptions(*command, *options);
-    command->add_flag("--dot", options->dot, "Answer with graphs for Graphviz")->excludes("--json");
-    command->footer(examples);
-    return {command, [options](Console& console) {
-                const auto answerText = [&](const std::string& text, std::string& out) {
-                    answer(*options, console.dataStyle(), text, out);
-                };
-                return answerTexts(*options, console, {answerText, !options->json});
-            }};
+    addTextOptions(command, *options);
+    command.addFlag("--dot", "Answer with graphs for Graphviz", options->dot);
+    command.exclude("--dot", "--json");
+    command.run = [options](Console& console) {
+        const auto answerText = [&](const std::string& text, std::string& out) {
+            answer(*options, console.outStyle(), text, out);
+        };
+        return answerTexts(*options, console, {answerText, !options->json});
+    };
 }
 
 } // namespace vtsym

@@ -1,6 +1,9 @@
+// One writer for each form.  Findings are written as soon as they are found; a SARIF log keeps only its notifications
+// until the end, so that memory does not grow with the number of findings.
 #include "tools/vtsym/findings/Findings.hpp"
 
 #include "host/Text.hpp"
+#include "tools/vtsym/io/CommandLine.hpp"
 #include "tools/vtsym/io/Json.hpp"
 
 #include <algorithm>
@@ -22,8 +25,8 @@ public:
 
 private:
     void add(const Finding& finding) override {
-        console().data(console().dataStyle().strong(placeText(finding.place) + ":") + " " +
-                       VT::shownText(finding.message) + "\n");
+        console().out(console().outStyle().strong(placeText(finding.place) + ":") + " " +
+                      VT::shownText(finding.message) + "\n");
     }
 };
 
@@ -55,7 +58,7 @@ void JsonWriter::add(const Finding& finding) {
         follows.push_back('}');
     }
     appendMember(out, "follows", "[" + follows + "]");
-    console().data(out + "}\n");
+    console().out(out + "}\n");
 }
 
 /// The path of a file as a URI reference: a relative path stays relative.
@@ -111,7 +114,7 @@ std::string jsonArtifact(const Place& place) {
     return R"("artifactLocation":{"uri":)" + jsonString(uriOf(place.file)) + "}";
 }
 
-/// A location; `further` are members that it has beside its place.
+/// A location; `further` are members to add to its place.
 std::string jsonLocation(const Place& place, const std::string& further = {}) {
     std::string json = "{\"physicalLocation\":{" + jsonArtifact(place);
     if (place.line != 0)
@@ -141,7 +144,7 @@ SarifWriter::SarifWriter(Console& console, std::span<const FindingRule> rules) :
         appendMember(out, "defaultConfiguration", R"({"level":"warning"})");
         out.push_back('}');
     }
-    console.data(out + R"(]}},"columnKind":"unicodeCodePoints","results":[)");
+    console.out(out + R"(]}},"columnKind":"unicodeCodePoints","results":[)");
 }
 
 void SarifWriter::add(const Finding& finding) {
@@ -168,7 +171,7 @@ void SarifWriter::add(const Finding& finding) {
     if (!finding.witness.empty())
         appendMember(properties, "witness", jsonString(finding.witness));
     appendMember(out, "properties", properties + "}");
-    console().data(out + "}");
+    console().out(out + "}");
 }
 
 void SarifWriter::addProblem(const Place& place, const std::string& sentence) {
@@ -180,7 +183,7 @@ void SarifWriter::addNote(const std::string& sentence) {
     addNotification("note", sentence, {});
 }
 
-/// `further` are members beside the level and the message.
+/// `further` are members to add to the level and the message.
 void SarifWriter::addNotification(std::string_view level, const std::string& sentence, const std::string& further) {
     notifications_.append(notifications_.empty() ? "\n{" : ",\n{").append("\"level\":").append(jsonString(level));
     appendMember(notifications_, "message", jsonMessage(sentence));
@@ -192,7 +195,7 @@ void SarifWriter::end() {
     out.append(successful_ ? "true" : "false");
     if (!notifications_.empty())
         appendMember(out, "toolExecutionNotifications", "[" + notifications_ + "]");
-    console().data(out + "}]}]}\n");
+    console().out(out + "}]}]}\n");
 }
 
 } // namespace
@@ -203,13 +206,13 @@ void FindingWriter::write(const Finding& finding) {
 }
 
 void FindingWriter::problem(const Place& place, const std::string& sentence) {
-    console_.words("vtsym: " + placeText(place) + ": " + VT::shownText(sentence) + "\n");
+    console_.err("vtsym: " + placeText(place) + ": " + VT::shownText(sentence) + "\n");
     addProblem(place, sentence);
     failed_ = true;
 }
 
 void FindingWriter::note(const std::string& sentence) {
-    console_.words("vtsym: " + VT::shownText(sentence) + "\n");
+    console_.err("vtsym: " + VT::shownText(sentence) + "\n");
     addNote(sentence);
 }
 
@@ -233,13 +236,10 @@ std::unique_ptr<FindingWriter> makeFindingWriter(FindingForm form, Console& cons
     }
 }
 
-void addFormOptions(CLI::App& command, FindingForm& form) {
-    CLI::Option* const json = command.add_flag_callback(
-        "--json", [&form] { form = FindingForm::Json; }, "Write one JSON object a finding");
-    command
-        .add_flag_callback(
-            "--sarif", [&form] { form = FindingForm::Sarif; }, "Write a SARIF 2.1.0 log with fixes")
-        ->excludes(json);
+void addFormOptions(Command& command, FindingForm& form) {
+    command.addFlag("--json", "Write one JSON object per finding", [&form] { form = FindingForm::Json; });
+    command.addFlag("--sarif", "Write a SARIF 2.1.0 log with fixes", [&form] { form = FindingForm::Sarif; });
+    command.exclude("--sarif", "--json");
 }
 
 } // namespace vtsym

@@ -1,10 +1,9 @@
-// What a search through files found, and the forms in which it is told.
+// Findings in files, and the forms in which they are written: messages like a compiler's, JSON lines, SARIF.
+// `scan` and `check` share them; a new form is one class in Findings.cpp.
 #pragma once
 
 #include "tools/vtsym/io/Console.hpp"
 #include "tools/vtsym/io/ExitStatus.hpp"
-
-#include <CLI/CLI.hpp>
 
 #include <cstdint>
 #include <memory>
@@ -16,24 +15,26 @@
 
 namespace vtsym {
 
-/// A place in a file.  Lines and columns begin at 1, columns count code points, a byte that is no UTF-8 as one; 0 is
-/// unknown.  The end is behind the last column.
+class Command;
+
+/// A place in a file.  Lines and columns begin at 1; 0 is unknown.  Columns count code points, and a byte that is not
+/// UTF-8 as one.  The end column is the one after the last.
 struct Place {
     std::string file;
     std::uint64_t line = 0;
     std::uint64_t column = 0;
     std::uint64_t endLine = 0;
     std::uint64_t endColumn = 0;
-    std::string name; ///< of the thing there, where the file gives it one: "Engine/Gear"
+    std::string name; ///< of the block or port there: "Engine/Gear"
 };
 
 /// Another place that a finding follows from.
 struct RelatedPlace {
     Place place;
-    std::string text; ///< what stands there
+    std::string text; ///< of the condition or directive there
 };
 
-/// A change that settles a finding: the region of a place, which has a line and columns, replaced by a text.
+/// A change that resolves a finding: replaces a region, which has a line and columns, by a text.
 struct Fix {
     std::string description; ///< a sentence
     Place region;
@@ -44,7 +45,7 @@ struct Fix {
 struct FindingRule {
     std::string_view kind;    ///< "dead"
     std::string_view summary; ///< a sentence
-    std::string_view help;    ///< what it means and what to do, in sentences
+    std::string_view help;    ///< meaning and remedy, in sentences
 };
 
 struct Finding {
@@ -60,23 +61,22 @@ struct Finding {
 
 enum class FindingForm : std::uint8_t { Compiler, Json, Sarif };
 
-/// Writes findings in the order in which they come: `file:line: message` lines, one JSON object a line, or a SARIF
-/// 2.1.0 log.  Counts them.
+/// Writes findings as they are found, and counts them.  Throws OutputError.
 class FindingWriter {
 public:
     virtual ~FindingWriter() = default;
 
     void write(const Finding& finding);
-    /// Tells on standard error that something could not be searched, or not to its end: the search fails.
+    /// Reports on standard error that a place could not be searched completely; the search fails.
     void problem(const Place& place, const std::string& sentence);
-    /// Tells on standard error something about the whole search, which does not fail.
+    /// Reports a remark about the whole search on standard error; the search does not fail.
     void note(const std::string& sentence);
-    /// Ends the output: nothing may follow.  What the search ends with.
+    /// Ends the output, after which nothing may be written.  Returns the outcome.
     SearchResult finish();
 
     [[nodiscard]] std::uint64_t found() const noexcept { return found_; }
 
-    /// Whether a problem was told.
+    /// Whether a problem was reported.
     [[nodiscard]] bool failed() const noexcept { return failed_; }
 
 protected:
@@ -98,11 +98,12 @@ private:
     bool failed_ = false;
 };
 
-/// The rules are all kinds that will be written.  Throws OutputError, as does all that writes.
+/// Makes a writer: `file:line: message` lines, one JSON object a line, or a SARIF 2.1.0 log.  `rules` holds every kind
+/// of finding that will be written, and outlives the writer.  Throws OutputError.
 std::unique_ptr<FindingWriter> makeFindingWriter(FindingForm form, Console& console,
                                                  std::span<const FindingRule> rules);
 
-/// Gives a command --json and --sarif.
-void addFormOptions(CLI::App& command, FindingForm& form);
+/// Adds --json and --sarif to a command.
+void addFormOptions(Command& command, FindingForm& form);
 
 } // namespace vtsym

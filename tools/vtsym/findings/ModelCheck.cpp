@@ -1,3 +1,8 @@
+// Walks the blocks from the outside to the inside.  A block's context, the condition under which it is active, is made
+// from its parent's, and every question is asked under it; a dead block ends the walk below it.
+//
+// ChoiceSetChecker bounds the steps of the whole check; where they are used up, the rest is reported as undecided.  A
+// finding lists the conditions of a bounded number of ancestors, so that nesting does not multiply the work.
 #include "tools/vtsym/findings/ModelCheck.hpp"
 
 #include "base/VCService.hpp"
@@ -15,9 +20,9 @@ namespace vtsym {
 
 namespace {
 
-constexpr std::size_t shownBytes = 200;   ///< of a condition in a sentence
-constexpr std::size_t climbed = 256;      ///< ancestors looked at
-constexpr std::size_t shownAncestors = 8; ///< whose conditions a finding follows from
+constexpr std::size_t shownBytes = 200;       ///< of a condition in a sentence
+constexpr std::size_t visitedAncestors = 256; ///< in search of conditions that a finding follows from
+constexpr std::size_t shownAncestors = 8;     ///< whose conditions a finding lists
 
 /// In the order of VT::ChoiceFault.
 constexpr std::array<std::string_view, 5> kinds{"dead", "always-active", "redundant", "overlapping", "missing"};
@@ -85,7 +90,7 @@ void ModelCheck::problem(const Place& place, const std::string& sentence) {
 /// The conditions of a block and of its ancestors, the nearest first.
 std::vector<RelatedPlace> ModelCheck::conditionsAround(const VTBlock* block) const {
     std::vector<RelatedPlace> around;
-    for (std::size_t i = 0; block != nullptr && i < climbed && around.size() < shownAncestors;
+    for (std::size_t i = 0; block != nullptr && i < visitedAncestors && around.size() < shownAncestors;
          ++i, block = block->parent())
         if (!isUnconditional(*block))
             around.push_back({placeOf(*block), block->variantCondition()});
@@ -104,7 +109,7 @@ VT::SymbolicExprId ModelCheck::conditionOf(const vtPort& port) const {
     return handle_->AND(contextOf(&port.source()), to, false).id();
 }
 
-/// Whether all conditions are some.
+/// Reads the conditions of all blocks.  Returns whether every one could be read.
 bool ModelCheck::readConditions() {
     bool allRead = true;
     std::unordered_set<const VTBlock*> withDefault;
@@ -120,7 +125,7 @@ bool ModelCheck::readConditions() {
         try {
             conditions_.own(block);
         } catch (const VT::HostDiagnostic& diagnostic) {
-            if (!VT::BlockConditions::isDefault(block)) // which reads the others, that are told themselves
+            if (!VT::BlockConditions::isDefault(block)) // it reads the other choices, which report their own errors
                 refuse(block, diagnostic.what());
         }
     }
@@ -131,8 +136,8 @@ void ModelCheck::run(FindingWriter& writer) {
     writer_ = &writer;
     if (!readConditions())
         return;
-    std::unordered_set<const VTBlock*> dead;      // with all that is in them
-    std::unordered_set<const VTBlock*> followers; // of what is around them
+    std::unordered_set<const VTBlock*> dead;      // and everything inside of them
+    std::unordered_set<const VTBlock*> followers; // always active where their parents are
     const auto note = [&](const VT::ChoiceSetReport& report, std::span<const VTBlock* const> blocks) {
         for (const VT::ChoiceFinding& finding : report.findings) {
             if (finding.fault == VT::ChoiceFault::Dead)
@@ -155,7 +160,8 @@ void ModelCheck::run(FindingWriter& writer) {
         if (!block.choices().empty())
             note(checkChoices(block), block.choices());
         if (checker_.stepsUsedUp()) {
-            problem(placeOf(block), "The steps of the check are used up: what follows is not decided.");
+            problem(placeOf(block),
+                    "The steps of the check are used up: later blocks and ports are not checked; split the model.");
             return;
         }
     }
@@ -170,7 +176,7 @@ VT::ChoiceSetReport ModelCheck::checkBlock(const VTBlock& block) {
     for (const VT::ChoiceFinding& finding : report.findings)
         write(otherFindings_, findingOf(block, blocks, finding));
     for (const VT::ChoiceFinding& finding : report.undecided)
-        tellUndecided(block, blocks, finding);
+        reportUndecided(block, blocks, finding);
     return report;
 }
 
@@ -196,11 +202,11 @@ VT::ChoiceSetReport ModelCheck::checkChoices(const VTBlock& block) {
     for (const VT::ChoiceFinding& finding : report.findings)
         write(findings, findingOf(block, block.choices(), finding));
     for (const VT::ChoiceFinding& finding : report.undecided)
-        tellUndecided(block, block.choices(), finding);
+        reportUndecided(block, block.choices(), finding);
     if (!report.allOverlaps && !checker_.stepsUsedUp()) {
-        write(findings,
-              findingAt(placeOf(block), VT::ChoiceFault::Overlap,
-                        "more choices of " + block.path() + " overlap than the pairs told", block.variantCondition()));
+        write(findings, findingAt(placeOf(block), VT::ChoiceFault::Overlap,
+                                  "more choices of " + block.path() + " overlap than the pairs reported",
+                                  block.variantCondition()));
     }
     return report;
 }
@@ -230,7 +236,7 @@ Finding ModelCheck::findingOf(const VTBlock& set, std::span<const VTBlock* const
         result.message = path + " is always active" + where;
         break;
     case VT::ChoiceFault::Redundant:
-        tellShortened(result, block, finding.proposed);
+        describeShorter(result, block, finding.proposed);
         result.message += where.empty() ? "" : where + " active";
         break;
     case VT::ChoiceFault::Overlap: {
@@ -253,19 +259,18 @@ Finding ModelCheck::findingOf(const VTBlock& set, std::span<const VTBlock* const
     return result;
 }
 
-void ModelCheck::tellShortened(Finding& finding, const VTBlock& block, VT::SymbolicExprId proposed) const {
+void ModelCheck::describeShorter(Finding& finding, const VTBlock& block, VT::SymbolicExprId proposed) const {
     const std::string text = print(proposed);
     finding.message = finding.place.name + ": " + shown(block.variantCondition()) + " can be written " + shown(text);
     finding.proposed = text;
     if (block.conditionPlace().line != 0)
-        finding.fix =
-            Fix{"Take the redundant operand away.", regionOf(file_, block.conditionPlace()), jsonString(text)};
+        finding.fix = Fix{"Remove the redundant operand.", regionOf(file_, block.conditionPlace()), jsonString(text)};
 }
 
-void ModelCheck::tellUndecided(const VTBlock& set, std::span<const VTBlock* const> blocks,
-                               const VT::ChoiceFinding& finding) {
+void ModelCheck::reportUndecided(const VTBlock& set, std::span<const VTBlock* const> blocks,
+                                 const VT::ChoiceFinding& finding) {
     if (checker_.stepsUsedUp())
-        return; // told once
+        return; // reported once, for the whole check
     const bool isOfSet = finding.fault == VT::ChoiceFault::Missing;
     const VTBlock& block = isOfSet ? set : *blocks[finding.choice];
     const std::string path = block.path();
@@ -283,7 +288,7 @@ void ModelCheck::tellUndecided(const VTBlock& set, std::span<const VTBlock* cons
     problem(placeOf(block),
             "Whether " + question + " stays undecided: it " +
                 (finding.bound == VT::DecisionBound::Steps ? "takes too many steps."
-                                                           : "hangs on arithmetic beyond linear terms."));
+                                                           : "depends on arithmetic beyond linear terms."));
 }
 
 void ModelCheck::checkPort(const vtPort& port) {
@@ -291,7 +296,7 @@ void ModelCheck::checkPort(const vtPort& port) {
         return checker_.canHold(conditions_.net(*block).id()).isYes();
     });
     if (!isJoined)
-        return; // without destinations, or they are told themselves
+        return; // no destinations, or dead ones that have findings of their own
     const VT::Decision flows = checker_.canHold(conditionOf(port));
     Place place = regionOf(file_, port.place());
     place.name = port.name();

@@ -1,4 +1,5 @@
-// A model checked.
+// Checks a model: whether each block can be active, whether its choices exclude each other and leave no gap, and its
+// ports. Puts the findings of ChoiceSetChecker into words, with places in the file.
 #pragma once
 
 #include "base/choices/BlockConditions.hpp"
@@ -13,34 +14,34 @@
 
 namespace vtsym {
 
-/// Checks the conditions of blocks, the choices of each block against each other, and the ports.
+/// Checks one model, once.
 class ModelCheck {
 public:
-    /// What was found about the choices of a block.
+    /// The findings about the choices of a block.
     struct ChoiceSet {
         const VTBlock* block;
         VT::ChoiceSetReport report;
         std::vector<Finding> findings;
     };
 
-    /// `file` is what places are told in.  The model outlives the check.
+    /// `file` is the name of the file in places.  The model outlives the check.
     ModelCheck(const VTRootBD& model, std::string file, bool bits32);
 
-    /// Writes what is found, block by block; once.  Blocks in one that is never active are left out.
+    /// Writes the findings, block by block.  Leaves out the blocks inside of one that is never active.
     void run(FindingWriter& writer);
 
     /// The sets in the order of the model, as far as they were checked.
     [[nodiscard]] const std::vector<ChoiceSet>& choiceSets() const noexcept { return choiceSets_; }
 
-    /// What was found about other blocks and about ports.
+    /// The findings about other blocks and about ports.
     [[nodiscard]] const std::vector<Finding>& otherFindings() const noexcept { return otherFindings_; }
 
-    /// Sentences on what could not be read or decided.
+    /// Sentences about conditions that could not be read or decided.
     [[nodiscard]] const std::vector<std::string>& problems() const noexcept { return problems_; }
 
     [[nodiscard]] const std::string& file() const noexcept { return file_; }
 
-    /// The text of a witness; "any values" of one without unknowns.
+    /// The text of a witness; "any values" for one without unknowns.
     [[nodiscard]] std::string witnessText(const VT::Witness& witness) const;
 
 private:
@@ -52,8 +53,8 @@ private:
     VT::ChoiceSetReport checkChoices(const VTBlock& block);
     void checkPort(const vtPort& port);
     Finding findingOf(const VTBlock& set, std::span<const VTBlock* const> blocks, const VT::ChoiceFinding& finding);
-    void tellUndecided(const VTBlock& set, std::span<const VTBlock* const> blocks, const VT::ChoiceFinding& finding);
-    void tellShortened(Finding& finding, const VTBlock& block, VT::SymbolicExprId proposed) const;
+    void reportUndecided(const VTBlock& set, std::span<const VTBlock* const> blocks, const VT::ChoiceFinding& finding);
+    void describeShorter(Finding& finding, const VTBlock& block, VT::SymbolicExprId proposed) const;
     [[nodiscard]] VT::SymbolicExprId contextOf(const VTBlock* block) const;
     [[nodiscard]] VT::SymbolicExprId conditionOf(const vtPort& port) const;
     [[nodiscard]] Place placeOf(const VTBlock& block) const;
@@ -64,7 +65,7 @@ private:
     VT::VCServiceHandle handle_;
     VT::BlockConditions conditions_;
     VT::ChoiceSetChecker checker_;
-    /// Where a block is active, without the conditions that follow from those around them.
+    /// The condition under which a block is active, without the parts that are implied by the blocks around it.
     std::unordered_map<const VTBlock*, VT::SymbolicExprId> contexts_;
     FindingWriter* writer_ = nullptr;
     std::vector<ChoiceSet> choiceSets_;

@@ -1,3 +1,6 @@
+// Writes one section for each choice set: the matrix, in which a cell is a pair of choices, and the findings.
+// Names and conditions are escaped and cut; the numbers of sets, columns and findings are bounded, and the page says
+// what it leaves out.
 #include "tools/vtsym/findings/ModelPage.hpp"
 
 #include "host/Text.hpp"
@@ -10,14 +13,14 @@ namespace vtsym {
 
 namespace {
 
-// What a page shows at most; it says what it leaves out.
+// The most that a page shows.
 constexpr std::size_t mostSets = 200;
 constexpr std::size_t mostColumns = 60;
 constexpr std::size_t denseColumns = 20;
 constexpr std::size_t mostFindings = 200; ///< of one set
 constexpr std::size_t shownBytes = 2000;  ///< of one text
 
-/// A text fit to stand between tags and in attributes.
+/// A text that is safe between tags and in attributes.
 std::string escaped(const std::string& text) {
     std::string html;
     for (const char c : VT::shownText(text, shownBytes)) {
@@ -48,7 +51,7 @@ std::string counted(std::size_t count, const std::string& noun) {
     return std::to_string(count) + " " + noun + (count == 1 ? "" : "s");
 }
 
-/// A cell with a tip of one line or two.
+/// A cell whose tip has one line or two.
 std::string cell(const std::string& kind, const std::string& mark, const std::string& tip,
                  const std::string& second = {}) {
     const std::string title = escaped(tip) + (second.empty() ? "" : "&#10;" + escaped(second));

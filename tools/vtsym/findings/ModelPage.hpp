@@ -1,4 +1,5 @@
-// A page that shows how the choices of a model stand to each other.
+// An HTML page with a matrix for the choices of each block: which exclude each other, overlap, or are dead.
+// The page is self-contained: it loads nothing and works from a file.
 #pragma once
 
 #include "tools/vtsym/findings/ModelCheck.hpp"
@@ -7,7 +8,7 @@
 
 namespace vtsym {
 
-/// One HTML page without anything outside of it.
+/// The page of a model that was checked.
 std::string modelPage(const VTRootBD& model, const ModelCheck& check);
 
 } // namespace vtsym

@@ -1,4 +1,5 @@
-// What every page has: its style, and the script that shows what is under the pointer or the focus.
+// The constant parts of every page: its style, and the script that shows the tip under the pointer or the focus.
+// Colours follow the scheme of the reader's system; without the script the tips remain plain titles.
 #pragma once
 
 namespace vtsym {

@@ -1,3 +1,5 @@
+// Searches directories with a stack of its own, so that their nesting does not matter, and never follows links below a
+// given path, so that a circle of links ends.  A directory that cannot be read is reported, and the search continues.
 #include "tools/vtsym/findings/SourceFiles.hpp"
 
 #include <algorithm>
@@ -21,7 +23,7 @@ bool isSource(const fs::path& path) {
     return isCppPath(path.native()) || std::ranges::find(otherExtensions, extension) != otherExtensions.end();
 }
 
-/// A path without its roundabouts.  What is before `..` may be a link that leads elsewhere, so such a path stays.
+/// A path without redundant parts.  A path with `..` stays as it is, since the part before may be a link.
 std::string tidied(const fs::path& path) {
     return std::ranges::find(path, fs::path("..")) == path.end() ? path.lexically_normal().string() : path.string();
 }

@@ -1,4 +1,5 @@
-// The C and C++ files that a search is to read.
+// Finds the C and C++ files that a scan reads, in a stable order.
+// Recognises them by their extensions.
 #pragma once
 
 #include <functional>
@@ -8,15 +9,14 @@
 
 namespace vtsym {
 
-/// Whether a path has the extension of a C++ file; headers of either language have not.
+/// Whether a path has an extension that only C++ uses; .h and .c are read as C.
 bool isCppPath(std::string_view path);
 
-/// Tells that something could not be read, and why.
+/// Receives a path that could not be read, and the reason.
 using FileProblem = std::function<void(const std::string& path, const std::string& sentence)>;
 
-/// The files that paths stand for, each once, in the order of their names: a path to a file is that file, a path to a
-/// directory all C and C++ files below that are regular files.  Symbolic links are followed where they are given, not
-/// below a directory.
+/// The files to read, each once, ordered by name: every path to a file, and the regular C and C++ files below every
+/// path to a directory.  A symbolic link is followed where it is given, but not below a directory.
 std::vector<std::string> sourceFiles(const std::vector<std::string>& paths, const FileProblem& problem);
 
 } // namespace vtsym

@@ -1,3 +1,6 @@
+// Buffers standard output and writes standard error through it, so that on a terminal answers and messages appear in
+// the order in which they were made.  One thread, started only for a terminal, redraws the progress line five times a
+// second.
 #include "tools/vtsym/io/Console.hpp"
 
 #include <cerrno>
@@ -10,8 +13,8 @@ namespace vtsym {
 namespace {
 
 constexpr std::size_t bufferBytes = std::size_t{1} << 16U;
-constexpr std::chrono::seconds quietTime{1};
-constexpr std::chrono::milliseconds refreshTime{200};
+constexpr std::chrono::seconds quietTime{1};          ///< before the progress line appears
+constexpr std::chrono::milliseconds refreshTime{200}; ///< between two updates of it
 
 bool isColoured(int descriptor) {
     const char* const refused = std::getenv("NO_COLOR");
@@ -20,7 +23,7 @@ bool isColoured(int descriptor) {
            (terminal == nullptr || std::strcmp(terminal, "dumb") != 0);
 }
 
-/// Writes all of a text; 0, or the error that stopped it.
+/// Writes all of a text.  Returns 0, or the error that stopped it.
 int writeAll(int descriptor, std::string_view text) {
     while (!text.empty()) {
         const ssize_t written = write(descriptor, text.data(), text.size());
@@ -47,12 +50,12 @@ std::string Style::in(std::string_view code, std::string_view text) const {
 }
 
 Console::Console()
-    : dataStyle_(isColoured(STDOUT_FILENO)),
-      wordStyle_(isColoured(STDERR_FILENO)),
-      dataToTerminal_(isatty(STDOUT_FILENO) == 1),
-      wordsToTerminal_(isatty(STDERR_FILENO) == 1),
+    : outStyle_(isColoured(STDOUT_FILENO)),
+      errStyle_(isColoured(STDERR_FILENO)),
+      outIsTerminal_(isatty(STDOUT_FILENO) == 1),
+      errIsTerminal_(isatty(STDERR_FILENO) == 1),
       since_(std::chrono::steady_clock::now()) {
-    if (wordsToTerminal_)
+    if (errIsTerminal_)
         progress_ = std::thread([this] { showProgress(); });
 }
 
@@ -68,7 +71,7 @@ Console::~Console() {
     progress_.join();
 }
 
-void Console::data(std::string_view text) {
+void Console::out(std::string_view text) {
     buffer_.append(text);
     if (buffer_.size() >= bufferBytes)
         flush();
@@ -78,7 +81,7 @@ void Console::flush() {
     if (buffer_.empty())
         return;
     const std::lock_guard lock(mutex_);
-    if (dataToTerminal_)
+    if (outIsTerminal_)
         eraseProgress();
     const int error = writeAll(STDOUT_FILENO, buffer_);
     buffer_.clear();
@@ -86,16 +89,16 @@ void Console::flush() {
         throw OutputError(error);
 }
 
-void Console::words(std::string_view lines) {
+void Console::err(std::string_view lines) {
     flush();
     const std::lock_guard lock(mutex_);
     eraseProgress();
-    const int error = writeAll(STDERR_FILENO, lines); // nobody is left to be told, but for the exit status
-    wordsLost_ = wordsLost_ || (error != 0 && error != EBADF);
+    const int error = writeAll(STDERR_FILENO, lines); // only the exit status can still report this
+    errFailed_ = errFailed_ || (error != 0 && error != EBADF);
 }
 
 void Console::working(std::uint64_t line) {
-    if (!wordsToTerminal_)
+    if (!errIsTerminal_)
         return;
     const std::lock_guard lock(mutex_);
     if (line_ == 0)
@@ -104,7 +107,7 @@ void Console::working(std::uint64_t line) {
 }
 
 void Console::waiting() {
-    if (!wordsToTerminal_)
+    if (!errIsTerminal_)
         return;
     const std::lock_guard lock(mutex_);
     if (line_ != 0)

@@ -1,4 +1,5 @@
-// Where the program's data and words go.
+// Standard output and standard error of the program: answers, messages, colours and the progress line.
+// Everything that the program prints passes through here.
 #pragma once
 
 #include <chrono>
@@ -12,19 +13,19 @@
 
 namespace vtsym {
 
-/// Standard output took no more.
+/// Standard output refused to take more.
 class OutputError : public std::runtime_error {
 public:
     explicit OutputError(int error);
 
-    /// Whether nobody reads any more, which is no error to tell.
+    /// Whether the reader of a pipe has left, which is not worth a message.
     [[nodiscard]] bool readerIsGone() const noexcept { return readerIsGone_; }
 
 private:
     bool readerIsGone_;
 };
 
-/// Colours of one stream: escape sequences, or nothing where it is no terminal or colours are not wanted.
+/// Colours for one stream: escape sequences, or nothing where it is not a terminal or NO_COLOR is set.
 class Style {
 public:
     explicit Style(bool coloured) : coloured_(coloured) {}
@@ -45,8 +46,8 @@ private:
     bool coloured_;
 };
 
-/// Data on standard output, buffered; words on standard error, at once.  On a terminal a progress line shows after a
-/// second of work between two outputs.
+/// Writes answers to standard output, buffered, and messages to standard error, at once.  On a terminal a progress line
+/// appears after a second of work without output.
 class Console {
 public:
     Console();
@@ -54,42 +55,43 @@ public:
     Console& operator=(const Console&) = delete;
     ~Console();
 
-    /// Adds data to standard output.  Throws OutputError.
-    void data(std::string_view text);
-    /// Hands everything to standard output.  Throws OutputError.
+    /// Writes to standard output.  Throws OutputError.
+    void out(std::string_view text);
+    /// Hands over what standard output has not yet received.  Throws OutputError.
     void flush();
-    /// Writes whole lines to standard error, behind the data before them.
-    void words(std::string_view lines);
+    /// Writes whole lines to standard error, after flushing standard output.
+    void err(std::string_view lines);
 
-    /// Whether standard error did not take all of them; one that is closed is not meant to.
-    [[nodiscard]] bool wordsLost() const noexcept { return wordsLost_; }
+    /// Whether standard error refused a message; a closed one is not expected to take any.
+    [[nodiscard]] bool errFailed() const noexcept { return errFailed_; }
 
-    /// Tells the progress line that the work on a line of input begins, or that there is none while the program waits.
+    /// Starts the progress line for a line of input.
     void working(std::uint64_t line);
+    /// Stops it while the program waits for input.
     void waiting();
 
-    [[nodiscard]] const Style& dataStyle() const noexcept { return dataStyle_; }
+    [[nodiscard]] const Style& outStyle() const noexcept { return outStyle_; }
 
-    [[nodiscard]] const Style& wordStyle() const noexcept { return wordStyle_; }
+    [[nodiscard]] const Style& errStyle() const noexcept { return errStyle_; }
 
 private:
     void showProgress();
     void eraseProgress();
 
-    Style dataStyle_;
-    Style wordStyle_;
-    bool dataToTerminal_;
-    bool wordsToTerminal_;
-    bool wordsLost_ = false;
+    Style outStyle_;
+    Style errStyle_;
+    bool outIsTerminal_;
+    bool errIsTerminal_;
+    bool errFailed_ = false;
     std::string buffer_;
 
-    std::mutex mutex_; ///< of what follows, and of standard error
+    std::mutex mutex_; ///< guards standard error and all members below
     std::condition_variable stop_;
     bool stopping_ = false;
     bool shown_ = false;
-    std::uint64_t line_ = 0;                        ///< that is worked on; 0 for none
-    std::chrono::steady_clock::time_point since_;   ///< when work began after the last wait
-    std::chrono::steady_clock::duration worked_{0}; ///< before that
+    std::uint64_t line_ = 0;                        ///< being worked on; 0 while waiting
+    std::chrono::steady_clock::time_point since_;   ///< when the work on it began
+    std::chrono::steady_clock::duration worked_{0}; ///< time spent on the lines before
     std::thread progress_;
 };
 

@@ -1,3 +1,7 @@
+// Turns the exception of a text into its message, and places a caret under the byte that it is about.
+//
+// Lines are cut around that byte, at the beginnings of UTF-8 characters, so that text and caret fit a screen however
+// long the text is.  Bytes that are not UTF-8 count as one column each.
 #include "tools/vtsym/io/ErrorText.hpp"
 
 #include "host/Diagnostics.hpp"
@@ -11,15 +15,15 @@ namespace vtsym {
 
 namespace {
 
-// Bytes of the text that are shown before and behind the place of an error.
+// Bytes of the text that are shown before and after the place of an error.
 constexpr std::size_t shownBefore = 48;
-constexpr std::size_t shownBehind = 32;
+constexpr std::size_t shownAfter = 32;
 
 bool continuesCharacter(char byte) {
     return (static_cast<unsigned char>(byte) & 0xc0U) == 0x80U;
 }
 
-/// The nearest beginning of a character at or before a byte; the byte itself in what is no UTF-8.
+/// The nearest beginning of a character at or before a byte; the byte itself where the text is not UTF-8.
 std::size_t characterAt(std::string_view text, std::size_t offset) {
     std::size_t begin = offset;
     while (begin > 0 && begin < text.size() && offset - begin < 3 && continuesCharacter(text[begin]))
@@ -50,14 +54,14 @@ TextError currentTextError() {
 std::string withCaret(std::string_view text, std::size_t offset, const Style& style) {
     offset = std::min(offset, text.size());
     const std::size_t begin = characterAt(text, offset > shownBefore ? offset - shownBefore : 0);
-    const std::size_t end = characterAt(text, std::min(text.size() - offset, shownBehind) + offset);
+    const std::size_t end = characterAt(text, std::min(text.size() - offset, shownAfter) + offset);
     std::string before = begin > 0 ? "..." : "";
     before += VT::shownText(text.substr(begin, offset - begin));
-    std::string behind = VT::shownText(text.substr(offset, end - offset));
+    std::string after = VT::shownText(text.substr(offset, end - offset));
     if (end < text.size())
-        behind += "...";
+        after += "...";
     const auto columns = std::ranges::count_if(before, [](char byte) { return !continuesCharacter(byte); });
-    std::string result = "  " + before + behind + "\n  ";
+    std::string result = "  " + before + after + "\n  ";
     result.append(static_cast<std::size_t>(columns), ' ').append(style.bad("^")).append("\n");
     return result;
 }

@@ -1,4 +1,5 @@
-// How errors look.
+// Errors of single texts: what is known about them, and how they look on standard error and in JSON.
+// An error of one text does not end the program; the next text is answered.
 #pragma once
 
 #include "tools/vtsym/io/Console.hpp"
@@ -15,17 +16,17 @@
 
 namespace vtsym {
 
-/// What is told of a text that has no answer.
+/// The reason why a text has no answer.
 struct TextError {
     std::string id;                    ///< of the message
     std::string message;               ///< a sentence
-    std::optional<std::size_t> offset; ///< byte of the text that it is about
-    // The part of the text that is shown.
+    std::optional<std::size_t> offset; ///< of the byte that is wrong
+    // The part of the text to show.
     std::size_t begin = 0;
     std::size_t end = std::string::npos;
 };
 
-/// A line that mixes commands and texts cannot be followed.
+/// A line of several parts, such as a command and its text, cannot be answered.
 class CommandError : public std::runtime_error {
 public:
     explicit CommandError(const std::string& sentence) : CommandError(TextError{"vtsym:Command", sentence, {}}) {}
@@ -49,24 +50,25 @@ private:
     std::vector<TextError> errors_;
 };
 
-/// The errors that are being handled: to be called in a catch clause.  Rethrows what is no matter of the text.
+/// The errors of the exception being handled; to be called in a catch clause.  Rethrows an exception that is not about
+/// the text.
 std::vector<TextError> currentTextErrors();
 /// The first of them.
 TextError currentTextError();
 
-/// A line, or the part of a long line around a byte of it, and below it a caret under that byte.  What a terminal would
-/// not show as it is, is shown as \xNN.
+/// A line, or the part of a long line around a byte of it, and below it a caret under that byte.  A byte that a
+/// terminal would not show as a character is written as \xNN.
 std::string withCaret(std::string_view text, std::size_t offset, const Style& style);
 
-/// The lines for standard error, without the number of the text and with it.
+/// The lines for standard error, without the line number of the text or with it.
 std::string errorText(std::string_view text, const TextError& error, const Style& style);
 std::string errorLines(std::uint64_t line, std::string_view text, std::span<const TextError> errors,
                        const Style& style);
 
-/// The line for standard error that warns of a text.
+/// The line for standard error that warns about a text.
 std::string warningLine(std::uint64_t line, std::string_view warning, const Style& style);
 
-/// The member of a JSON answer: the first error, with a list of those further on.
+/// The member of a JSON answer: the first error, and a list of the others.
 std::string jsonOf(std::span<const TextError> errors);
 
 } // namespace vtsym

@@ -1,17 +1,18 @@
-// How a command ends.
+// Exit statuses: 0 or 1 for a command that answers texts, 0, 1 or 2 for one that searches files.
+// Status 2 also reports a wrong command line.
 #pragma once
 
 #include <cstdint>
 
 namespace vtsym {
 
-/// What a search through files comes to.
+/// The outcome of a search through files.
 enum class SearchResult : std::uint8_t { NothingFound, Found, Failed };
 
-/// The exit status of a command: 0 or 1 for one that answers texts, 0, 1 or 2 for a search.
+/// The exit status of a command, made from the outcome that the command returns.
 class ExitStatus {
 public:
-    // NOLINTBEGIN(google-explicit-constructor): what a command returns is its status
+    // NOLINTBEGIN(google-explicit-constructor): commands return their outcome
     ExitStatus(bool success) : value_(success ? 0 : 1) {}
 
     ExitStatus(SearchResult result) : value_(static_cast<int>(result)) {}

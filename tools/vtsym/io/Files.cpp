@@ -1,6 +1,9 @@
+// Reads the first bytes of a file before anything else: a NUL there shows that it is not a text, so that an endless or
+// huge binary file costs one read.  Then reads one byte more than the file claims to have, which shows that it ended,
+// and grows the text by doubling where the size is not known.  System calls that a signal interrupted are repeated.
 #include "tools/vtsym/io/Files.hpp"
 
-#include "tools/vtsym/io/Arguments.hpp"
+#include "tools/vtsym/io/CommandLine.hpp"
 
 #include <algorithm>
 #include <array>
@@ -18,7 +21,7 @@ namespace vtsym {
 
 namespace {
 
-/// Bytes at the beginning of a file in which a text has no NUL.
+/// Bytes at the beginning of a file that are searched for a NUL.
 constexpr std::size_t firstBytes = 8192;
 
 struct Unit {
@@ -43,7 +46,7 @@ public:
 
     [[nodiscard]] int get() const noexcept { return value_; }
 
-    /// Whether all that was written has arrived, as far as the system tells.
+    /// Whether everything written has arrived, as far as the system knows.
     bool close() { return ::close(std::exchange(value_, -1)) == 0; }
 
 private:
@@ -62,7 +65,7 @@ private:
     fail("cannot be written: ");
 }
 
-/// Appends bytes until there are `size` of them; false at the end of the file.
+/// Appends bytes until the text has `size` of them.  Returns false at the end of the file.
 bool readUpTo(const Descriptor& file, std::size_t size, std::string& text) {
     std::size_t at = text.size();
     text.resize(size);
@@ -97,7 +100,7 @@ std::string readText(const Descriptor& file, std::size_t bound) {
     const std::size_t size = isRegular ? static_cast<std::size_t>(state.st_size) : 0;
     if (size > bound || text.size() > bound)
         refuseSize();
-    while (goesOn) { // one more byte than there is shows the end
+    while (goesOn) { // asking for one more byte shows the end
         goesOn = readUpTo(file, std::min(size >= text.size() ? size + 1 : 2 * text.size(), bound + 1), text);
         if (text.size() > bound)
             refuseSize();
@@ -105,7 +108,7 @@ std::string readText(const Descriptor& file, std::size_t bound) {
     return text;
 }
 
-/// A number of bytes with a unit or without; 0 where it is none.
+/// Reads a number of bytes, with a unit or without.  Returns 0 for anything else.
 std::size_t bytesOf(std::string_view text) {
     std::size_t number = 0;
     const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
@@ -160,21 +163,21 @@ std::string sizeText(std::size_t bytes) {
     return unit == units.end() ? "0 bytes" : std::to_string(bytes >> unit->shift) + unit->name;
 }
 
-void addSizeOption(CLI::App& command, std::size_t& bound) {
+void addSizeOption(Command& command, std::size_t& bound) {
     const auto take = [&bound](const std::string& size) {
         bound = bytesOf(size);
         if (bound == 0) {
-            throw CLI::ValidationError("--max-size",
-                                       quotedArgument(size) +
-                                           " is not a size: write a number of bytes, or such as 64K, 64M or 1G");
+            throw UsageError("--max-size",
+                             quotedArgument(size) +
+                                 " is not a size; write a number of bytes, with K, M or G after it for larger units");
         }
     };
-    addArgument(command, "--max-size", take, "Reject files that are larger (" + sizeText(mostBytes) + " unless given)")
-        ->type_name("SIZE");
+    command.addArgument(
+        {"--max-size", "Reject files that are larger (" + sizeText(mostBytes) + " unless given)", "SIZE"}, take);
 }
 
 void holdStandardStreams() {
-    // The lowest number that is free is the one that is taken; a stream in the wrong direction fails.
+    // open() takes the lowest free number.  The direction is wrong on purpose: using the stream fails.
     for (int stream = STDIN_FILENO; stream <= STDERR_FILENO; ++stream)
         if (fcntl(stream, F_GETFD) == -1)
             static_cast<void>(open("/dev/null", stream == STDIN_FILENO ? O_WRONLY : O_RDONLY));

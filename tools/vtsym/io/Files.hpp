@@ -1,7 +1,6 @@
-// Files that the program reads and writes.
+// Reading and writing whole files, within a bound, and with errors that say what to do.
+// A path may name a device or a pipe; nothing is read beyond the bound.
 #pragma once
-
-#include <CLI/CLI.hpp>
 
 #include <cstddef>
 #include <stdexcept>
@@ -10,35 +9,36 @@
 
 namespace vtsym {
 
+class Command;
+
 /// Bytes of a file, unless --max-size says otherwise, and of a line of standard input.  Sources and models that people
-/// write stay far below; what is larger is data, of which nothing more is read.
+/// write stay far below it; a larger file is rejected, a longer line is an error of that line.
 inline constexpr std::size_t mostBytes = std::size_t{64} << 20U;
 
-/// A file cannot be read or written.  what() goes on after its name: "cannot be read: Permission denied".
+/// A file cannot be read or written.  what() continues after its name: "cannot be read: Permission denied".
 class FileError : public std::runtime_error {
 public:
     using std::runtime_error::runtime_error;
 };
 
-/// The text in a file, a device or a pipe.  Throws FileError where there is none: for a folder, for more bytes than
-/// `bound`, and for a NUL among the first bytes.  Reads no more than it takes to know, and waits for the other end of a
-/// pipe.
+/// Reads a file, a device or a pipe.  Throws FileError for a folder, for more bytes than `bound`, for a NUL among the
+/// first bytes, and where the system refuses.  Waits for the other end of a pipe.
 std::string readFile(const std::string& path, std::size_t bound);
 
-/// Makes a text what is in a file.  Throws FileError; the file may hold a part of the text then.
+/// Replaces the content of a file.  Throws FileError, after which the file may hold a part of the text.
 void writeFile(const std::string& path, std::string_view text);
 
-/// Whether two paths lead to one regular file, through links too.
+/// Whether two paths lead to the same regular file, directly or through links.
 bool isSameFile(const std::string& a, const std::string& b);
 
 /// Bytes in words: "64 MiB".
 std::string sizeText(std::size_t bytes);
 
-/// Gives a command --max-size.
-void addSizeOption(CLI::App& command, std::size_t& bound);
+/// Adds --max-size to a command.
+void addSizeOption(Command& command, std::size_t& bound);
 
-/// Opens standard streams that the caller of the program closed, so that no file gets the number of one.  They refuse
-/// reading and writing as before.
+/// Opens the standard streams that the caller of the program closed, so that no other file receives their numbers.
+/// Reading from them and writing to them fails as before.
 void holdStandardStreams();
 
 } // namespace vtsym

@@ -1,3 +1,6 @@
+// Quotes strings with nlohmann-json, which validates their UTF-8, and then escapes what a terminal would act upon or
+// hide: control characters, invisible ones and those that change the direction of writing.  Linear in the length of the
+// text.
 #include "tools/vtsym/io/Json.hpp"
 
 #include "host/Numbers.hpp"
@@ -10,7 +13,7 @@ namespace vtsym {
 
 namespace {
 
-/// Takes the character at the front of a text that is UTF-8.
+/// Removes the first character of a text, which is valid UTF-8, and returns its code point.
 char32_t takeCharacter(std::string_view& text) {
     const auto byte = [&text](std::size_t at) { return static_cast<unsigned char>(text[at]); };
     const std::size_t length = byte(0) < 0x80 ? 1 : byte(0) < 0xe0 ? 2 : byte(0) < 0xf0 ? 3 : 4;

@@ -1,3 +1,5 @@
+// Wraps libedit: its callbacks find the editor's state through EL_CLIENTDATA, and Tab completes from a sorted set, in
+// which the words that begin alike are neighbours.
 #include "tools/vtsym/io/LineEditor.hpp"
 
 #include <cstdio>
@@ -31,7 +33,7 @@ Completion complete(const std::string& text, const std::set<std::string>& words)
         result.candidates.insert(*word);
     if (result.candidates.empty())
         return result;
-    // In order, so what the first and the last agree in all agree in.
+    // The candidates are sorted: letters that the first and the last share are shared by all.
     const std::string& first = *result.candidates.begin();
     const std::string& last = *result.candidates.rbegin();
     std::size_t common = begun.size();
@@ -69,7 +71,7 @@ LineEditor::State::State(std::string text, std::function<const std::set<std::str
     if (history == nullptr) {
         if (editor != nullptr)
             el_end(editor);
-        throw std::runtime_error("the terminal cannot be used");
+        throw std::runtime_error("the terminal cannot be used: set TERM to its kind, or pipe the lines in");
     }
     ::history(history, &event, H_SETSIZE, rememberedLines);
     ::history(history, &event, H_SETUNIQUE, 1);

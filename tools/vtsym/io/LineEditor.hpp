@@ -1,4 +1,5 @@
-// Lines typed on a terminal.
+// Reads lines on a terminal, with a history and completion of names.
+// Relies on libedit; without a terminal the program reads standard input instead.
 #pragma once
 
 #include <functional>
@@ -9,16 +10,16 @@
 
 namespace vtsym {
 
-/// Reads lines with editing, a history for as long as it lives, and completion.
+/// A prompt.  Its history lasts as long as the object.
 class LineEditor {
 public:
-    /// `words` gives the words to complete from whenever Tab is pressed.
+    /// `words` is asked for the words to complete from whenever Tab is pressed.
     LineEditor(std::string prompt, std::function<const std::set<std::string>&()> words);
     LineEditor(const LineEditor&) = delete;
     LineEditor& operator=(const LineEditor&) = delete;
     ~LineEditor();
 
-    /// The next line without its end; nothing at the end of the input.
+    /// The next line, without its end; nullopt at the end of the input.
     std::optional<std::string> read();
 
 private:
@@ -26,10 +27,10 @@ private:
     std::unique_ptr<State> state_;
 };
 
-/// How completion goes on from the beginning of a word.
+/// The ways to continue the beginning of a word.
 struct Completion {
-    std::string addition;             ///< what all words that begin so agree in
-    std::set<std::string> candidates; ///< the words
+    std::string addition;             ///< letters that all candidates continue with
+    std::set<std::string> candidates; ///< words that begin so
 };
 
 /// Completes the name or command at the end of a text.

@@ -1,6 +1,11 @@
+// Answers texts one after another.  Every line of standard input is answered by one line, whatever happens, so that a
+// caller can pair them; an error leaves an empty line, or an object with `"error"`.
+//
+// Answers are flushed whenever the next read may wait, so that another program can hold a dialogue.  Memory is bounded
+// by the longest line, of which at most mostBytes are kept.
 #include "tools/vtsym/io/Texts.hpp"
 
-#include "tools/vtsym/io/Arguments.hpp"
+#include "tools/vtsym/io/CommandLine.hpp"
 #include "tools/vtsym/io/ErrorText.hpp"
 #include "tools/vtsym/io/Files.hpp"
 #include "tools/vtsym/io/Json.hpp"
@@ -18,7 +23,7 @@ namespace vtsym {
 
 namespace {
 
-/// Bytes of a line that is too long that are kept, to tell which one it is.
+/// Bytes that are kept of a line that is too long, to show which line it is.
 constexpr std::size_t shownOfLong = 80;
 
 /// Answers one text after another.
@@ -29,7 +34,7 @@ public:
           console_(console),
           answering_(answering) {}
 
-    /// @param isWhole  whether the text is not the beginning of one that is too long
+    /// `isWhole` is false for the beginning of a text that is too long.
     void answer(const std::string& text, bool isWhole = true);
 
     [[nodiscard]] bool allAnswered() const noexcept { return allAnswered_; }
@@ -52,15 +57,15 @@ void Answerer::answer(const std::string& text, bool isWhole) {
         out_ += '\n';
     if (json_)
         out_.append("{\"line\":").append(std::to_string(line_));
-    std::string words;
+    std::string messages;
     const std::size_t begin = out_.size();
-    if (json_ && !answering_.tellsInput)
+    if (json_ && !answering_.writesInput)
         appendMember(out_, "input", jsonString(text));
     try {
         if (!isWhole)
-            throw CommandError("The line is longer than " + sizeText(mostBytes) + ".");
+            throw CommandError("The line is longer than " + sizeText(mostBytes) + ": split it.");
         answering_.answer(text, out_);
-        words = warnings();
+        messages = warnings();
     } catch (...) {
         const std::vector<TextError> errors = currentTextErrors();
         allAnswered_ = false;
@@ -69,24 +74,24 @@ void Answerer::answer(const std::string& text, bool isWhole) {
             appendMember(out_, "input", jsonString(text));
             appendMember(out_, "error", jsonOf(errors));
         } else {
-            words = errorLines(line_, text, errors, console_.wordStyle());
+            messages = errorLines(line_, text, errors, console_.errStyle());
         }
     }
     out_ += json_ ? "}\n" : "\n";
-    console_.data(out_);
-    if (!words.empty())
-        console_.words(words);
+    console_.out(out_);
+    if (!messages.empty())
+        console_.err(messages);
 }
 
 std::string Answerer::warnings() const {
     std::string lines;
     if (answering_.warnings != nullptr)
         for (const std::string& warning : *answering_.warnings)
-            lines += warningLine(line_, warning, console_.wordStyle());
+            lines += warningLine(line_, warning, console_.errStyle());
     return lines;
 }
 
-/// The line of standard input that is being read.
+/// The line of standard input being read.
 struct InputLine {
     std::string text;
     bool begun = false;
@@ -108,8 +113,8 @@ struct InputLine {
     }
 };
 
-/// Calls `use` with every line of standard input; 0, or the error that ended reading.  Before it waits for more input,
-/// it lets the answers so far out.
+/// Calls `use` with every line of standard input.  Returns 0, or the error that ended reading.  Flushes the answers so
+/// far before it waits for more input.
 template <class Use>
 int forEachLine(Console& console, Use&& use) {
     std::array<char, 65536> buffer{};
@@ -151,33 +156,31 @@ bool isName(std::string_view text) {
            std::string_view::npos;
 }
 
-void addTextOptions(CLI::App& command, TextOptions& options) {
-    const auto take = [&options](std::vector<std::string> texts) { options.texts = std::move(texts); };
-    addArguments(command, "TEXT", take, "Texts to work on; without any, or with -, every line of standard input");
+void addTexts(Command& command, TextOptions& options, const std::string& texts) {
+    command.addArguments({"TEXT", texts + "; without any, or with -, every line of standard input"},
+                         [&options](std::vector<std::string> given) { options.texts = std::move(given); });
+    command.addFlag("--json", "Answer with one JSON object per text", options.json);
+}
+
+void addTextOptions(Command& command, TextOptions& options, const std::string& texts) {
+    addTexts(command, options, texts);
     addSourceOption(command, options);
-    command.add_flag("--json", options.json, "Answer with one JSON object per text");
 }
 
-void addSourceOption(CLI::App& command, TextOptions& options) {
-    addArgument(command, "--from", options.from, "Language of the texts: c or quill")
-        ->check(oneOf({"c", "quill"}))
-        ->type_name("LANGUAGE");
+void addSourceOption(Command& command, TextOptions& options) {
+    command.addChoice({"--from", "Language of the texts: c or quill (c unless given)", "LANGUAGE"}, {"c", "quill"},
+                      [&options](const std::string& language) { options.from = language; });
 }
 
-void addLanguageOption(CLI::App& command, TextOptions& options) {
-    addArgument(command, "--to", options.to,
-                "Language of the answers: c, quill or pp, the condition of a preprocessor directive (as --from unless "
-                "given)")
-        ->check(oneOf({"c", "quill", "pp"}))
-        ->type_name("LANGUAGE");
+void addLanguageOption(Command& command, TextOptions& options) {
+    command.addChoice(
+        {"--to", "Language of the answers: c, quill or pp for directives (as --from unless given)", "LANGUAGE"},
+        {"c", "quill", "pp"}, [&options](const std::string& language) { options.to = language; });
 }
 
-void addBitsOption(CLI::App& command, bool& bits32) {
-    const auto take = [&bits32](const std::string&) { bits32 = true; };
-    addArgument(command, "--bits", take,
-                "Take names for signed integers of 32 bits; for integers without bounds unless given")
-        ->check(oneOf({"32"}))
-        ->type_name("BITS");
+void addBitsOption(Command& command, bool& bits32) {
+    command.addChoice({"--bits", "Take names for signed integers of 32 bits (without bounds unless given)", "BITS"},
+                      {"32"}, [&bits32](const std::string&) { bits32 = true; });
 }
 
 bool answerTexts(const TextOptions& options, Console& console, const Answering& answering) {
@@ -186,7 +189,7 @@ bool answerTexts(const TextOptions& options, Console& console, const Answering& 
     const auto readInput = [&] {
         if (const int error =
                 forEachLine(console, [&](const InputLine& line) { answerer.answer(line.text, line.isWhole); })) {
-            console.words(std::string("vtsym: standard input cannot be read: ") + std::strerror(error) + "\n");
+            console.err(std::string("vtsym: standard input cannot be read: ") + std::strerror(error) + "\n");
             allRead = false;
         }
     };

@@ -1,9 +1,8 @@
-// The texts that a command is given, and the answers to them.
+// The texts that a command answers: from the command line or from standard input, one answer a text.
+// Every command on texts takes the same options, which are added here.
 #pragma once
 
 #include "tools/vtsym/io/Console.hpp"
-
-#include <CLI/CLI.hpp>
 
 #include <functional>
 #include <string>
@@ -12,11 +11,13 @@
 
 namespace vtsym {
 
-/// What every command on texts is told.
+class Command;
+
+/// Options of every command on texts.
 struct TextOptions {
-    std::vector<std::string> texts; ///< none, or "-": the lines of standard input
+    std::vector<std::string> texts; ///< empty, or "-": the lines of standard input
     std::string from = "c";
-    std::string to; ///< empty: as `from`
+    std::string to; ///< empty: like `from`
     bool json = false;
 
     [[nodiscard]] bool fromQuill() const { return from == "quill"; }
@@ -29,31 +30,32 @@ struct TextOptions {
 
 /// How a command answers.
 struct Answering {
-    /// Appends the answer to a text: with --json further members of its object, otherwise text without the end of its
-    /// last line.  What it throws is told as the error of that text.
+    /// Appends the answer to a text: with --json further members of its object, otherwise text without a final line
+    /// end. An exception is reported as the error of that text.
     std::function<void(const std::string& text, std::string& answer)> answer;
-    /// Whether answers have several lines; they are kept apart by empty lines then.
+    /// Whether answers have several lines, and are separated by empty ones.
     bool inBlocks = false;
-    /// What is to be told on standard error of the text that was answered last; nullptr for nothing ever.
+    /// Warnings about the text that was answered last; nullptr for a command without warnings.
     const std::vector<std::string>* warnings = nullptr;
-    /// Whether an answer with --json tells the text in members of its own; otherwise `"input"` does.
-    bool tellsInput = false;
+    /// Whether the command writes the text into its JSON answer itself, rather than as `"input"`.
+    bool writesInput = false;
 };
 
-/// Gives a command the texts, --json and --from.
-void addTextOptions(CLI::App& command, TextOptions& options);
-/// Gives a command --from alone.
-void addSourceOption(CLI::App& command, TextOptions& options);
-/// Gives a command --to.
-void addLanguageOption(CLI::App& command, TextOptions& options);
+/// Adds the texts, --json and --from to a command.
+void addTextOptions(Command& command, TextOptions& options, const std::string& texts = "Texts to work on");
+/// Adds the texts, which the help describes with these words, and --json.
+void addTexts(Command& command, TextOptions& options, const std::string& texts = "Texts to work on");
+/// Adds --from.
+void addSourceOption(Command& command, TextOptions& options);
+/// Adds --to.
+void addLanguageOption(Command& command, TextOptions& options);
+/// Adds --bits.
+void addBitsOption(Command& command, bool& bits32);
 
-/// Gives a command --bits.
-void addBitsOption(CLI::App& command, bool& bits32);
-
-/// Whether a text is one name.
+/// Whether a text is an identifier.
 bool isName(std::string_view text);
 
-/// Answers all texts in order.  True when every one had an answer and all input could be read.
+/// Answers all texts in order.  Returns whether every one had an answer and all input could be read.
 bool answerTexts(const TextOptions& options, Console& console, const Answering& answering);
 
 } // namespace vtsym
