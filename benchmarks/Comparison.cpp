@@ -19,7 +19,7 @@ std::deque<Comparison>& comparisons() {
 
 struct Times {
     std::vector<double> seconds;
-    double bytes = 0; ///< a node, where the side tells
+    benchmark::UserCounters figures = {}; ///< what else the side measured
 
     [[nodiscard]] double least() const { return *std::ranges::min_element(seconds); }
 
@@ -58,8 +58,7 @@ public:
             // The name is followed by what the measurement was told, such as /manual_time.
             Times& times = times_[run.run_name.function_name];
             times.seconds.push_back(run.real_accumulated_time / static_cast<double>(run.iterations));
-            if (const auto bytes = run.counters.find("bytes"); bytes != run.counters.end())
-                times.bytes = bytes->second.value;
+            times.figures = run.counters;
         }
     }
 
@@ -85,8 +84,11 @@ private:
         std::printf("%-44s %10s %10s %7.2f %7.2f %6s", (row.name + ", per " + row.unit).c_str(),
                     readable(library.median() / row.items).c_str(), readable(floor.median() / row.items).c_str(),
                     library.median() / floor.median(), library.least() / floor.least(), mark.c_str());
-        if (library.bytes > 0)
-            std::printf("  %.1f bytes a node, floor %.1f", library.bytes, floor.bytes);
+        for (const auto& [name, figure] : library.figures) {
+            std::printf("  %.4g %s", figure.value, name.c_str());
+            if (const auto other = floor.figures.find(name); other != floor.figures.end())
+                std::printf(", floor %.4g", other->second.value);
+        }
         std::printf("\n");
     }
 

@@ -33,16 +33,22 @@ inline double threadSeconds() {
 }
 
 /// Times `run(subject)` for a fresh `subject` from `prepare()` in each iteration; making and destroying it is not
-/// timed.
-template <class Prepare, class Run>
-void measure(benchmark::State& state, Prepare prepare, Run run) {
+/// timed, and neither is `report(subject)`.
+template <class Prepare, class Run, class Report>
+void measure(benchmark::State& state, Prepare prepare, Run run, Report report) {
     for (auto iteration : state) {
         static_cast<void>(iteration);
         auto subject = prepare();
         const double start = threadSeconds();
         run(subject);
         state.SetIterationTime(threadSeconds() - start);
+        report(subject);
     }
+}
+
+template <class Prepare, class Run>
+void measure(benchmark::State& state, Prepare prepare, Run run) {
+    measure(state, prepare, run, [](const auto&) {});
 }
 
 /// Bytes that the program holds from the allocator.

@@ -97,7 +97,8 @@ void newNodes(benchmark::State& state, Prepare prepare) {
     internAll(*table, pairs);
     if (table->size() != symbolCount + nodeCount)
         state.SkipWithError("the nodes are not all there");
-    state.counters["bytes"] = static_cast<double>(bytesInUse() - before) / static_cast<double>(symbolCount + nodeCount);
+    state.counters["bytes a node"] =
+        static_cast<double>(bytesInUse() - before) / static_cast<double>(symbolCount + nodeCount);
 }
 
 template <class Prepare>

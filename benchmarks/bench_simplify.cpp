@@ -7,6 +7,8 @@
 #include "benchmarks/BenchmarkCorpus.hpp"
 #include "benchmarks/Comparison.hpp"
 #include "benchmarks/FloorText.hpp"
+#include "tests/support/generators/RandomCondition.hpp"
+#include "tests/support/oracles/Truth.hpp"
 
 #include <functional>
 #include <memory>
@@ -242,7 +244,97 @@ void shortestFloor(benchmark::State& state, std::int64_t) {
         });
 }
 
+constexpr std::size_t randomConditions = 5000;
+
+/// Conditions of 3 to 12 comparisons over three symbols.
+const std::vector<std::string>& randomTexts() {
+    static const std::vector<std::string> texts = [] {
+        std::mt19937_64 random(19);
+        std::vector<std::string> all;
+        for (std::size_t i = 0; i < randomConditions; ++i)
+            all.push_back(Testing::randomCondition(random, 3 + i % 10, {.lowest = -1, .highest = 2}));
+        return all;
+    }();
+    return texts;
+}
+
+/// The random conditions in a service of its own, and what they become.
+struct RandomCorpus {
+    RandomCorpus() {
+        for (const std::string& text : randomTexts())
+            given.push_back(service->parseC(text));
+    }
+
+    /// Reports how many of the given comparisons are left, and how many results are proven smallest.
+    void report(benchmark::State& state) const {
+        const SymbolicExprTable& table = service->table();
+        std::size_t before = 0;
+        std::size_t after = 0;
+        for (const SymbolicExprId id : given)
+            before += Testing::countComparisons(table, id);
+        for (const SymbolicExprId id : results)
+            after += id == table.getIdTRUE() || id == table.getIdFALSE() ? 0 : Testing::countComparisons(table, id);
+        state.counters["of the comparisons kept"] = static_cast<double>(after) / static_cast<double>(before);
+        if (smallest > 0)
+            state.counters["proven smallest"] = static_cast<double>(smallest) / static_cast<double>(results.size());
+    }
+
+    VCServiceHandle service;
+    std::vector<SymbolicExprId> given;
+    std::vector<SymbolicExprId> results;
+    std::size_t smallest = 0;
+};
+
+std::unique_ptr<RandomCorpus> randomCorpus() {
+    return std::make_unique<RandomCorpus>();
+}
+
+void randomNormalForms(benchmark::State& state, std::int64_t) {
+    measure(
+        state, randomCorpus,
+        [](auto& corpus) {
+            SymbolicExprTable& table = corpus->service->table();
+            const SymbolicExprSimplify simplifier(table);
+            for (const SymbolicExprId id : corpus->given) {
+                SymbolicExprSimplifyVisitor visitor(table, true, simplifier.printer());
+                std::uint64_t passes = 0;
+                corpus->results.push_back(simplifier.simplify(id, passes, visitor));
+                corpus->smallest += visitor.isSmallest(corpus->results.back()) ? 1 : 0;
+            }
+        },
+        [&](const auto& corpus) { corpus->report(state); });
+}
+
+void randomShortestForms(benchmark::State& state, std::int64_t) {
+    measure(
+        state, randomCorpus,
+        [](auto& corpus) {
+            for (const SymbolicExprId id : corpus->given)
+                corpus->results.push_back(corpus->service->shortestCondition(id, false).id());
+        },
+        [&](const auto& corpus) { corpus->report(state); });
+}
+
+void randomFloor(benchmark::State& state, std::int64_t) {
+    measure(
+        state, [] { return std::make_unique<RecordTable>(); },
+        [&](auto& table) {
+            for (const std::string& text : randomTexts())
+                benchmark::DoNotOptimize(readRecords(*table, text));
+        });
+}
+
 const bool registered = [] {
+    compare({.name = "normal forms of random conditions (floor: read)",
+             .library = randomNormalForms,
+             .floor = randomFloor,
+             .items = randomConditions,
+             .unit = "condition"});
+    compare({.name = "shortest forms of random conditions",
+             .library = randomShortestForms,
+             .floor = randomFloor,
+             .items = randomConditions,
+             .unit = "condition"});
     compare({.name = "shortest forms of the corpus (floor: its normal forms)",
              .library = shortestLibrary,
              .floor = shortestFloor,

@@ -23,7 +23,19 @@ inline constexpr std::size_t multipliedLiterals = 50'000;
 inline constexpr std::size_t coverSteps = 50'000;
 inline constexpr std::size_t coverStepsPerLiteral = 64;
 
-/// Nested case distinctions of that search.  Beyond the bound it counts as exhausted.
+/// The search for a smallest sum of products: symbols, points of the grid that its bounds make, boxes that it is picked
+/// from, and integers that a product may leave out between two neighbouring ranges.  A sum beyond the first three stays
+/// as it is and is not proven smallest; products with larger holes are not looked for.
+inline constexpr std::size_t coverAtoms = 12;
+inline constexpr std::size_t coverPoints = 4096;
+inline constexpr std::size_t coverBoxes = 256;
+inline constexpr std::int64_t coverHole = 3;
+
+/// Symbols of a sum of products up to which it is known at once whether the bounds of each are nested, so that no
+/// search is needed.
+inline constexpr std::size_t nestedAtoms = 32;
+
+/// Nested case distinctions of a search for what cubes cover.  Beyond the bound it counts as exhausted.
 inline constexpr std::size_t coverDepth = 200;
 
 /// Nesting of brackets and runs of prefix operators in a text: what the strictest common C compilers read.  One more is
@@ -101,6 +113,12 @@ inline constexpr std::size_t shortenCoverSteps = 4000;
 inline constexpr std::size_t factorRounds = 32;
 inline constexpr std::size_t shortenRounds = 4;
 
+/// Different operands of a chain's operands up to which single comparisons of a range are taken out of them as well.
+inline constexpr std::size_t factoredParts = 64;
+
+/// Comparisons of a form up to which its operands are judged by a truth table.  A longer one is judged by proofs only.
+inline constexpr std::size_t prunedComparisons = 64;
+
 /// Intervals of a set up to which the shortest way to write it is looked for.  Those beyond are written one by one.
 inline constexpr std::size_t writtenIntervals = 64;
 
@@ -112,9 +130,9 @@ inline constexpr std::size_t shortenByProofs = 64;
 inline constexpr std::size_t impliedTries = 1000;
 inline constexpr std::size_t impliedNodes = std::size_t{1} << 16U;
 
-/// Terms of a condition that one comparison is tried for in the place of a group, and literals that each of them is
-/// compared with.  Further ones are not tried.
-inline constexpr std::size_t impliedTerms = 8;
+/// Operands and literals that a group of comparisons is tried to be replaced by one comparison of.  Further ones are
+/// not tried.
+inline constexpr std::size_t impliedOperands = 8;
 inline constexpr std::size_t impliedLiterals = 12;
 
 /// Steps that the checks of all choice sets of a model may cost together: about half a minute.  Beyond the bound what

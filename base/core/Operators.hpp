@@ -152,6 +152,10 @@ inline constexpr OperatorSet comparisonOps = OperatorSet::where([](const Operato
 /// The operators written between their two operands.
 inline constexpr OperatorSet infixOps =
     OperatorSet::where([](const OperatorInfo& r) { return r.form == OperatorForm::Infix; });
+/// The operators that are written as a symbol before, between or after their operands.
+inline constexpr OperatorSet symbolOps = OperatorSet::where([](const OperatorInfo& r) {
+    return r.form == OperatorForm::Infix || r.form == OperatorForm::Prefix || r.form == OperatorForm::Postfix;
+});
 /// Kinds whose every value is a truth value.
 inline constexpr OperatorSet booleanOps = OperatorSet::where([](const OperatorInfo& r) { return r.boolean; });
 /// The four call classes.

@@ -1,3 +1,8 @@
+// Operations on single cubes, and the loop that reduces a cover by joining, absorbing and dropping.
+//
+// Constraints of a cube are sorted by atom, so that two cubes are compared in one walk or by binary search.  The
+// loop ends because every step leaves fewer comparisons or fewer cubes.
+// Relies on: IntegerSet for every question about one atom.
 #include "base/cover/Cover.hpp"
 
 #include "base/core/Limits.hpp"

@@ -86,7 +86,7 @@ struct CoverBudget {
 /// What the search through one cover may cost.
 [[nodiscard]] CoverBudget searchBudget(const Cover& cover) noexcept;
 
-// Each of these makes a cover smaller, if it can, and tells whether it did.
+// Each of these makes a cover smaller, if it can, and reports whether it did.
 
 /// Takes away cubes that hold only where another cube does.
 bool absorb(Cover& cover);
@@ -100,6 +100,18 @@ bool dropCubes(Cover& cover, CoverBudget& budget);
 /// Applies all of these until none makes the cover smaller.  A search that exhausts the budget leaves no trace: the
 /// cover is then joined and absorbed only, and the answer is false.
 bool reduce(Cover& cover, CoverBudget& budget);
+
+/// Ranges of an atom that a smaller cover may be written with.
+enum class Ranges : std::uint8_t {
+    Any,
+    NotOfPoints ///< A == 1 || A == 2 || A == 3 stays as it is, and so does a single product
+};
+
+/// Replaces a cover, in which no cube contains another, by a smallest one if there is one with fewer comparisons: of
+/// those with the fewest comparisons one with the fewest cubes.  Whether no cover has fewer comparisons is proven now;
+/// where it is not, the cover stays as it was.  Products with more integers missing between two ranges than
+/// limits::coverHole are not looked for.
+bool minimize(Cover& cover, CoverBudget& budget, Ranges ranges);
 
 /// Whether the cover holds wherever the cube does; false also when the budget is used up.
 [[nodiscard]] bool covers(const Cover& cover, const Cube& cube, CoverBudget& budget);

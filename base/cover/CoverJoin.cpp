@@ -1,4 +1,9 @@
-// Covers made smaller by comparing cubes with each other.
+// Makes covers smaller by comparing cubes with each other.
+//
+// Absorption looks for a cube below another among those that restrict the rarest atom of the wider one.  Joining
+// groups cubes that are equal but for one atom: the hash of a cube is the sum of its constraints' hashes, so that
+// leaving one out is a subtraction.
+// Cost: linear in the literals where cubes share few atoms, quadratic in the cubes at worst.
 #include "base/cover/CoverOccurrences.hpp"
 
 #include <boost/unordered_map.hpp>

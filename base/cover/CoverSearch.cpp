@@ -1,4 +1,10 @@
-// Covers made smaller by what several cubes cover together.
+// Makes covers smaller by what several cubes cover together.
+//
+// Method: a comparison may go where the other cubes cover what the cube gains, and a cube where they cover all of
+// it.  Whether cubes cover a cube is decided by splitting it at the bounds of one of them until a single cube covers
+// each part (the tautology check of Espresso: Brayton et al., "Logic Minimization Algorithms for VLSI Synthesis",
+// 1984).  Cubes that cannot help are left out first: those that need an atom of which some value is out of reach.
+// Cost: exponential at worst, bounded by the budget and limits::coverDepth; what is not proven stays.
 #include "base/core/Limits.hpp"
 #include "base/cover/CoverOccurrences.hpp"
 

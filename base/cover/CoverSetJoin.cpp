@@ -1,4 +1,8 @@
-// Unions of sets as few products.
+// Writes a union of sets as few products.
+//
+// The union's intervals are pieces; neighbouring pieces with one integer between them may be shorter as one product
+// with a hole.  A piece that consists of points alone is written as points.
+// Cost: sorting the intervals.
 #include "base/cover/Cover.hpp"
 
 #include <algorithm>

@@ -123,6 +123,16 @@ constexpr ScalarRuleIndex scalarRuleIndex(SymbolicOp op) {
     return detail::ruleIndices[static_cast<std::size_t>(op)];
 }
 
+/// The operators that scalars have no value for: those of matrices, and the element-wise logical ones.
+inline constexpr OperatorSet unvaluedOps{
+    SymbolicOp::Power,   SymbolicOp::DotPower,  SymbolicOp::DotMul,       SymbolicOp::DotDiv,    SymbolicOp::LDiv,
+    SymbolicOp::DotLDiv, SymbolicOp::Transpose, SymbolicOp::DotTranspose, SymbolicOp::SingleAnd, SymbolicOp::SingleOr};
+
+static_assert(OperatorSet::where([](const OperatorInfo& row) {
+                  return scalarRuleIndex(row.op) != ScalarRuleIndex::None || unvaluedOps.contains(row.op);
+              }) == symbolOps,
+              "give every operator that is written as a symbol a value, or name it in unvaluedOps");
+
 /// Computes an operator on two scalars; pass the operand of a unary one twice.  A scalar of no type is fatal.
 inline SymbolicScalar evaluateScalars(const ScalarRule& rule, const SymbolicScalar& left, const SymbolicScalar& right) {
     if (left.index() >= scalarTypes || right.index() >= scalarTypes)

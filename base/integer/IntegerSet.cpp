@@ -1,4 +1,9 @@
+// Operations on sorted lists of intervals, each in one walk over the lists.
+//
+// The extreme 64-bit values are the infinities; no walk counts beyond them.
 #include "base/integer/IntegerSet.hpp"
+
+#include "base/core/Check.hpp"
 
 #include <algorithm>
 
@@ -35,7 +40,15 @@ IntegerSet IntegerSet::of(std::vector<Interval> intervals) {
         else
             joined.push_back(next);
     }
+    VTSYM_CHECK(result.isSound());
     return result;
+}
+
+bool IntegerSet::isSound() const noexcept {
+    for (std::size_t i = 0; i < intervals_.size(); ++i)
+        if (intervals_[i].low > intervals_[i].high || (i > 0 && intervals_[i].low - 1 <= intervals_[i - 1].high))
+            return false;
+    return true;
 }
 
 bool IntegerSet::isAll() const noexcept {
@@ -53,6 +66,7 @@ IntegerSet IntegerSet::complement() const {
         next = interval.high + 1;
     }
     result.intervals_.push_back({next, plusInfinity});
+    VTSYM_CHECK(result.isSound());
     return result;
 }
 
@@ -70,6 +84,7 @@ IntegerSet IntegerSet::intersect(const IntegerSet& other) const {
         else
             ++b;
     }
+    VTSYM_CHECK(result.isSound());
     return result;
 }
 

@@ -78,6 +78,9 @@ public:
     bool operator==(const IntegerSet&) const = default;
 
 private:
+    /// Whether the intervals are sorted and neither touch nor are empty.
+    [[nodiscard]] bool isSound() const noexcept;
+
     Intervals intervals_;
 };
 

@@ -1,3 +1,9 @@
+// Reads comparisons as constraints and writes covers as sums of products.
+//
+// A literal that was read is written again wherever its constraint is; of several that mean the same the first by text.
+// Other constraints are written as the fewest comparisons: bounds as <= and >=, missing integers as ~=.
+// Cost: a map look-up for each literal; sorting operands by text for each product and sum.
+// Relies on: RuleContext::resolve for bound members, mayBeReal for what is not an integer.
 #include "base/simplify/Atoms.hpp"
 
 #include "base/core/Chains.hpp"

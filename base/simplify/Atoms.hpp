@@ -34,12 +34,12 @@ public:
     SymbolicExprId write(const Cover& cover);
 
 private:
-    /// Identity of an atom: two operands, or one; `op` tells comparisons of real values apart.
+    /// Identity of an atom: two operands, or one; `op` distinguishes comparisons of real values.
     using Key = std::tuple<SymbolicExprId, SymbolicExprId, SymbolicOp>;
 
     struct Entry {
         Key key;
-        SymbolicExprId left;  ///< operand as it stands in the condition
+        SymbolicExprId left;  ///< operand as the condition has it
         SymbolicExprId right; ///< second operand, or the invalid identifier
     };
 
@@ -57,8 +57,8 @@ private:
     boost::unordered_map<Constraint, SymbolicExprId> forms_; ///< literals that were read
 };
 
-/// The operands of a chain of `op` rooted at a node, each once, in the order of the tree; `repeated` tells whether one
-/// was there twice.  Linear in the number of distinct nodes of the chain.
+/// The operands of a chain of `op` rooted at a node, each once, in the order of the tree; `repeated` reports whether
+/// one was there twice.  Linear in the number of distinct nodes of the chain.
 std::vector<SymbolicExprId> chainOperands(const RuleContext& context, SymbolicOp op, SymbolicExprId root,
                                           bool& repeated);
 

@@ -1,4 +1,9 @@
 // Rules for Not and the comparisons.
+//
+// Literals are compared as integers where both are, otherwise as doubles.  NaN is ordered in a way that hosts rely
+// on: a < b is the opposite of b <= a and so true where one of them is NaN, all other comparisons with NaN but ~=
+// are false; Not of NaN is true.  Operands come first: a comparison of literals is a constant before a Not above it
+// could turn it round.  A symbol is an integer, so a comparison of an operand with itself is a constant.
 #include "base/integer/IntegerSet.hpp"
 #include "base/simplify/LogicalChain.hpp"
 #include "base/simplify/RuleTables.hpp"
@@ -6,23 +11,6 @@
 #include <utility>
 
 namespace VT {
-
-SymbolicExprId applyFirst(std::span<const NodeRule> rules, RuleContext& context, const RuleOperands& operands) {
-    for (const NodeRule& rule : rules) {
-        const SymbolicExprId after = rule.apply(context, operands);
-        if (after == invalidId)
-            continue;
-        if (context.explaining()) {
-            const SymbolicExprId before = operands.op == SymbolicOp::Not ? context.make<SymbolicNotExpr>(operands.a)
-                                          : operands.op == SymbolicOp::UnaryMinus
-                                              ? context.make<SymbolicUnaryMinusExpr>(operands.a)
-                                              : context.makeBinary(operands.op, operands.a, operands.b);
-            context.fired(rule.info, before, after);
-        }
-        return after;
-    }
-    return invalidId;
-}
 
 namespace {
 
@@ -55,14 +43,6 @@ SymbolicExprId deMorgan(RuleContext& context, const RuleOperands& x) {
     const SymbolicOp op = context.op(x.a);
     return op == SymbolicOp::And || op == SymbolicOp::Or ? negateChain(context, x.a) : invalidId;
 }
-
-constexpr OperatorSet notOnly{SymbolicOp::Not};
-constexpr NodeRule notRules[] = {
-    {{notOnly, "negated constant", "~2", "false"}, negatedConstant},
-    {{notOnly, "negated comparison", "~(A < 3)", "A >= 3"}, negatedComparison},
-    {{notOnly, "double negation", "~~~N", "~N"}, doubleNegation},
-    {{notOnly, "De Morgan", "~(A == 1 && B)", "A ~= 1 || ~B"}, deMorgan},
-};
 
 // Comparisons.
 
@@ -142,7 +122,12 @@ SymbolicExprId orientation(RuleContext& context, const RuleOperands& x) {
     return isOriented(context, x) ? invalidId : context.makeBinary(operatorInfo(x.op).mirrored, x.b, x.a);
 }
 
-constexpr NodeRule comparisonRules[] = {
+constexpr OperatorSet notOnly{SymbolicOp::Not};
+constexpr NodeRule table[] = {
+    {{notOnly, "negated constant", "~2", "false"}, negatedConstant},
+    {{notOnly, "negated comparison", "~(A < 3)", "A >= 3"}, negatedComparison},
+    {{notOnly, "double negation", "~~~N", "~N"}, doubleNegation},
+    {{notOnly, "De Morgan", "~(A == 1 && B)", "A ~= 1 || ~B"}, deMorgan},
     {{comparisonOps, "comparison with itself", "A <= A", "true"}, selfComparison},
     {{comparisonOps, "truth value against integer", "(A == 1) < 2", "true"}, truthAgainstInteger},
     {{comparisonOps, "compared numbers", "2 < 3", "true"}, comparedNumbers},
@@ -150,41 +135,20 @@ constexpr NodeRule comparisonRules[] = {
     {{comparisonOps, "orientation", "3 < A", "A > 3"}, orientation},
 };
 
-constexpr RuleInfo truthValueAsNumber{
-    {SymbolicOp::And, SymbolicOp::Or}, "truth value as number", "-(A && 2)", "-(A ~= 0)"};
-
 } // namespace
 
-SymbolicExprId truthAsNumber(RuleContext& context, SymbolicExprId source, SymbolicExprId rebuilt) {
-    if (!context.table().has(source) || !context.isBoolean(source))
-        return rebuilt;
-    if (context.isBoolean(rebuilt) || context.isTrue(rebuilt) || context.isFalse(rebuilt))
-        return rebuilt;
-    const SymbolicExprId value =
-        simplifyComparison(context, SymbolicOp::NotEqual, rebuilt, context.make<SymbolicIntValue>(0));
-    context.fired(truthValueAsNumber, source, value);
-    return value;
+std::span<const NodeRule> comparisonRules() {
+    return table;
 }
 
 SymbolicExprId simplifyNot(RuleContext& context, SymbolicExprId operand) {
-    const RuleOperands operands{SymbolicOp::Not, operand, invalidId, context.resolve(operand), invalidId};
-    const SymbolicExprId result = applyFirst(notRules, context, operands);
+    const SymbolicExprId result = applyRules(context, SymbolicOp::Not, operand);
     return result != invalidId ? result : context.make<SymbolicNotExpr>(operand);
 }
 
 SymbolicExprId simplifyComparison(RuleContext& context, SymbolicOp op, SymbolicExprId a, SymbolicExprId b) {
-    const RuleOperands operands{op, a, b, context.resolve(a), context.resolve(b)};
-    const SymbolicExprId result = applyFirst(comparisonRules, context, operands);
+    const SymbolicExprId result = applyRules(context, op, a, b);
     return result != invalidId ? result : context.makeBinary(op, a, b);
-}
-
-void appendNotRules(std::vector<const RuleInfo*>& out) {
-    appendInfo<NodeRule>(notRules, out);
-}
-
-void appendComparisonRules(std::vector<const RuleInfo*>& out) {
-    appendInfo<NodeRule>(comparisonRules, out);
-    out.push_back(&truthValueAsNumber);
 }
 
 } // namespace VT

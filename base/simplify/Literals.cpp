@@ -1,3 +1,6 @@
+// Combines two literals: exactly in 64 bits for integers, in doubles otherwise.
+//
+// A result that does not fit 32 bits, or is not finite, leaves the expression as it is.
 #include "base/simplify/Literals.hpp"
 
 #include "base/core/Limits.hpp"

@@ -3,7 +3,7 @@
 // Integer arithmetic wraps at 32 bits.  Adding and multiplying integers modulo 2^32 is associative, commutative and
 // distributive, so terms may be gathered in any order; what a rule writes down is exact in 64 bits and written only
 // where it fits 32.  Reals are rounded at each step, so sums of them are folded pair by pair and never regrouped; a
-// real factor is multiplied into a constant beside it, which may round once where evaluation rounds twice.
+// real factor is multiplied into a constant next to it, which may round once where evaluation rounds twice.
 #pragma once
 
 #include "base/simplify/RuleTables.hpp"

@@ -1,5 +1,14 @@
+// Simplifies And and Or chains to sums of products.
+//
+// Method: the operands are read as covers over atoms; an And multiplies its sums out, smallest first, and reduces
+// after each factor.  The outermost sum is then replaced by a smallest one where the search finds it.  Every step is
+// a row of a table, so that an explanation shows it.
+// Cost: bounded by the operand limit, limits::multipliedLiterals for a whole call, and limits::coverSteps for a
+// search.
+// Relies on: Atoms for the way from nodes to covers and back, base/cover for all operations on covers.
 #include "base/simplify/LogicalChain.hpp"
 
+#include "base/core/Check.hpp"
 #include "base/core/Limits.hpp"
 #include "base/simplify/Atoms.hpp"
 #include "base/simplify/RuleTables.hpp"
@@ -49,7 +58,7 @@ struct Chain {
 
     /// Reads the operands in the order of their texts: comparisons into one product, alternatives into covers.
     void read();
-    /// The chain as it stands now.
+    /// The chain in its present state.
     SymbolicExprId write();
 
     /// Gives up beyond the operand limit.
@@ -82,6 +91,7 @@ struct Chain {
     Cube common;                     ///< And: what they say together
     std::vector<Cover> alternatives; ///< And: operands that are sums
     Cover sum;                       ///< Or, and And once it is distributed
+    bool isSmallest = false;         ///< the sum is proven to be so
     CoverBudget budget;              ///< of the rules that an explanation shows one by one
     SymbolicExprId result = invalidId;
 };
@@ -236,6 +246,16 @@ bool redundantProduct(Chain& chain) {
     return dropCubes(chain.sum, chain.budget);
 }
 
+/// Nested sums are multiplied out further; only the outermost one is worth the search.
+bool smallestSum(Chain& chain) {
+    if (!chain.context.isOutermost())
+        return false;
+    const std::size_t before = comparisons(chain.sum);
+    CoverBudget budget{limits::coverSteps};
+    chain.isSmallest = minimize(chain.sum, budget, Ranges::NotOfPoints);
+    return comparisons(chain.sum) < before;
+}
+
 bool operandOrder(Chain& chain) {
     return chain.decide(chain.write());
 }
@@ -249,9 +269,9 @@ constexpr OperatorSet andOnly{SymbolicOp::And};
 constexpr OperatorSet orOnly{SymbolicOp::Or};
 constexpr OperatorSet andOr{SymbolicOp::And, SymbolicOp::Or};
 
-// Both families begin with constants; And goes on to what its comparisons say together and is then distributed into a
-// sum of products, which Or's last rules make smaller until none of them applies.
-constexpr ChainRule andRules[] = {
+// Both operators begin with constants; And goes on to what its comparisons say together and is then distributed into a
+// sum of products.
+constexpr ChainRule chainRules[] = {
     {{andOnly, "false operand of And", "A == 1 && false", "false"}, dominantOperand},
     {{andOnly, "number in And", "2 && A == 1", "A == 1"}, numberOperand},
     {{andOnly, "true operand of And", "A == 1 && true", "A == 1"}, neutralOperand},
@@ -261,9 +281,6 @@ constexpr ChainRule andRules[] = {
     {{andOnly, "common range", "A <= 3 && A >= 3", "A == 3"}, commonRange},
     {{andOnly, "absorbed alternative", "A && (A || B)", "A"}, absorbedAlternative},
     {{andOnly, "distribution", "(A == 1 || A == 2) && B == 3", "A == 1 && B == 3 || A == 2 && B == 3"}, distribution},
-};
-
-constexpr ChainRule orRules[] = {
     {{orOnly, "true operand of Or", "A == 1 || true", "true"}, dominantOperand},
     {{orOnly, "number in Or", "0 || A == 1", "A == 1"}, numberOperand},
     {{orOnly, "false operand of Or", "A == 1 || false", "A == 1"}, neutralOperand},
@@ -271,7 +288,8 @@ constexpr ChainRule orRules[] = {
     {{orOnly, "either keyword", "(sim) || (codegen)", "true"}, oppositeKeywords},
 };
 
-constexpr ChainRule sumRules[] = {
+// Tried again until none of them makes the sum of products smaller.
+constexpr ChainRule reducingRules[] = {
     {{andOr, "joined range", "A == 3 || A > 3", "A >= 3"}, joinedRange},
     {{andOr, "absorbed product", "A || A && B", "A"}, absorbedProduct},
     // A search that exhausts its budget is as if it had not been.
@@ -279,9 +297,14 @@ constexpr ChainRule sumRules[] = {
     {{andOr, "redundant product", "A && B || ~A && C || B && C", "A && B || C && ~A"}, redundantProduct},
 };
 
+constexpr ChainRule smallestRule = {{andOr, "smallest sum", "A > 2 && (C == 0 || C > 1)", "A > 2 && C >= 0 && C ~= 1"},
+                                    smallestSum};
+
 constexpr ChainRule orderRule = {{andOr, "operand order", "B == 2 && A == 1", "A == 1 && B == 2"}, operandOrder};
 
-/// Applies one rule and tells of it.
+constexpr RuleInfo truthValueAsNumber{andOr, "truth value as number", "-(A && 2)", "-(A ~= 0)"};
+
+/// Applies one rule and reports it.
 bool apply(const ChainRule& rule, Chain& chain) {
     const bool changed = rule.apply(chain);
     if (changed && chain.context.explaining()) {
@@ -291,9 +314,12 @@ bool apply(const ChainRule& rule, Chain& chain) {
     return changed;
 }
 
-/// Tries the rules from top to bottom until one decides the chain.
-bool decidedBy(std::span<const ChainRule> rules, Chain& chain) {
-    for (const ChainRule& rule : rules) {
+/// Tries the rules of the chain's operator from top to bottom until one decides it.
+bool decideByRules(Chain& chain) {
+    const SymbolicOp op = chain.op;
+    for (const ChainRule& rule : chainRules) {
+        if (!rule.info.operators.contains(op))
+            continue;
         apply(rule, chain);
         if (chain.result != invalidId)
             return true;
@@ -309,18 +335,27 @@ SymbolicExprId reduceSum(Chain& chain) {
         while (chain.result == invalidId && std::ranges::any_of(rules, helped)) {
         }
     };
-    applyAll(std::span(sumRules).first(2));
+    applyAll(std::span(reducingRules).first(2));
     CoverBudget budget = chain.budget = searchBudget(chain.sum);
     Cover smaller = chain.sum;
     if (chain.result == invalidId && reduce(smaller, budget)) {
         if (chain.context.explaining())
-            applyAll(sumRules);
+            applyAll(reducingRules);
         else
             chain.sum = std::move(smaller);
     }
-    if (chain.result == invalidId)
-        apply(orderRule, chain);
+    if (chain.result != invalidId)
+        return chain.result;
+    apply(smallestRule, chain);
+    apply(orderRule, chain);
+    if (chain.isSmallest)
+        chain.context.setSmallest(chain.result);
     return chain.result;
+}
+
+SymbolicExprId rewriteChain(RuleContext& context, SymbolicExprId root) {
+    Chain chain(context, context.op(root), root);
+    return decideByRules(chain) ? chain.result : reduceSum(chain);
 }
 
 } // namespace
@@ -346,10 +381,11 @@ bool chainIsWithin(const SymbolicExprTable& table, const SymbolicExpr& root, std
 }
 
 SymbolicExprId simplifyChain(RuleContext& context, SymbolicExprId root) {
-    Chain chain(context, context.op(root), root);
-    if (decidedBy(chain.isAnd() ? std::span<const ChainRule>(andRules) : std::span<const ChainRule>(orRules), chain))
-        return chain.result;
-    return reduceSum(chain);
+    if (context.isSmallest(root)) {
+        VTSYM_CHECK(root % 8 != 0 || rewriteChain(context, root) == root); // a sample
+        return root;
+    }
+    return rewriteChain(context, root);
 }
 
 SymbolicExprId negateChain(RuleContext& context, SymbolicExprId root) {
@@ -364,11 +400,24 @@ SymbolicExprId negateChain(RuleContext& context, SymbolicExprId root) {
     return reduceSum(chain);
 }
 
-void appendLogicalRules(std::vector<const RuleInfo*>& out) {
-    appendInfo<ChainRule>(andRules, out);
-    appendInfo<ChainRule>(orRules, out);
-    appendInfo<ChainRule>(sumRules, out);
-    out.push_back(&orderRule.info);
+void appendChainRules(std::vector<const RuleInfo*>& out) {
+    for (const std::span<const ChainRule> rules :
+         {std::span<const ChainRule>(chainRules), std::span<const ChainRule>(reducingRules)})
+        for (const ChainRule& rule : rules)
+            out.push_back(&rule.info);
+    for (const RuleInfo* rule : {&smallestRule.info, &orderRule.info, &truthValueAsNumber})
+        out.push_back(rule);
+}
+
+SymbolicExprId truthAsNumber(RuleContext& context, SymbolicExprId source, SymbolicExprId rebuilt) {
+    if (!context.table().has(source) || !context.isBoolean(source))
+        return rebuilt;
+    if (context.isBoolean(rebuilt) || context.isTrue(rebuilt) || context.isFalse(rebuilt))
+        return rebuilt;
+    const SymbolicExprId value =
+        simplifyComparison(context, SymbolicOp::NotEqual, rebuilt, context.make<SymbolicIntValue>(0));
+    context.fired(truthValueAsNumber, source, value);
+    return value;
 }
 
 } // namespace VT

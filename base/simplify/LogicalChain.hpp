@@ -10,7 +10,7 @@ namespace VT {
 bool chainIsWithin(const SymbolicExprTable& table, const SymbolicExpr& root, std::uint64_t limit);
 
 /// Simplifies the And or Or chain rooted at a node, whose operands are simplified already: to a truth constant, an
-/// operand or a sum of products in the order of texts.  Gives up, and answers the chain as it stands, where the operand
+/// operand or a sum of products in the order of texts.  Gives up, and returns the chain unchanged, where the operand
 /// limit is exceeded.
 SymbolicExprId simplifyChain(RuleContext& context, SymbolicExprId root);
 

@@ -83,8 +83,16 @@ SymbolicExprId reducedFraction(RuleContext& context, const RuleOperands& x) {
     return rest == invalidId ? invalidId : context.makeBinary(SymbolicOp::Multiply, rest, quotient->left());
 }
 
+// Quotients.
+
+SymbolicExprId neutralDivisor(RuleContext& context, const RuleOperands& x) {
+    return context.integer(x.valueB) == 1 ? x.a : invalidId;
+}
+
 constexpr OperatorSet multiplyOnly{SymbolicOp::Multiply};
-constexpr NodeRule multiplyRules[] = {
+constexpr OperatorSet divideOnly{SymbolicOp::Divide};
+
+constexpr NodeRule table[] = {
     {{multiplyOnly, "folded product", "2*3", "6"}, foldedNumbers},
     {{multiplyOnly, "cancelled quotient", "N/M*M", "N"}, cancelledQuotient},
     {{multiplyOnly, "distributed factor", "2*(N + 3)", "2*N + 6"}, distributedFactor},
@@ -92,21 +100,15 @@ constexpr NodeRule multiplyRules[] = {
     {{multiplyOnly, "reduced fraction", "4*(N/2)", "2*N"}, reducedFraction},
     {{multiplyOnly, "neutral factor", "1*N", "N"}, neutralFactor},
     {{multiplyOnly, "zero factor", "N*0", "0"}, zeroFactor},
-};
-
-// Quotients.
-
-SymbolicExprId neutralDivisor(RuleContext& context, const RuleOperands& x) {
-    return context.integer(x.valueB) == 1 ? x.a : invalidId;
-}
-
-constexpr OperatorSet divideOnly{SymbolicOp::Divide};
-constexpr NodeRule divideRules[] = {
     {{divideOnly, "folded quotient", "6/3", "2"}, foldedNumbers},
     {{divideOnly, "neutral divisor", "N/1", "N"}, neutralDivisor},
 };
 
 } // namespace
+
+std::span<const NodeRule> productRules() {
+    return table;
+}
 
 SymbolicExprId simplifyMultiply(RuleContext& context, SymbolicExprId a, SymbolicExprId b) {
     struct Addend {
@@ -122,10 +124,7 @@ SymbolicExprId simplifyMultiply(RuleContext& context, SymbolicExprId a, Symbolic
         const auto* factors = binary(context, product, SymbolicOp::Multiply);
         if (factors == nullptr)
             break;
-        const SymbolicExprId left = factors->left();
-        const SymbolicExprId right = factors->right();
-        const RuleOperands operands{SymbolicOp::Multiply, left, right, context.resolve(left), context.resolve(right)};
-        const SymbolicExprId result = applyFirst(multiplyRules, context, operands);
+        const SymbolicExprId result = applyRules(context, SymbolicOp::Multiply, factors->left(), factors->right());
         if (result == invalidId || result == product)
             break;
         product = result;
@@ -144,14 +143,8 @@ SymbolicExprId simplifyMultiply(RuleContext& context, SymbolicExprId a, Symbolic
 }
 
 SymbolicExprId simplifyDivide(RuleContext& context, SymbolicExprId a, SymbolicExprId b) {
-    const RuleOperands operands{SymbolicOp::Divide, a, b, context.resolve(a), context.resolve(b)};
-    const SymbolicExprId result = applyFirst(divideRules, context, operands);
+    const SymbolicExprId result = applyRules(context, SymbolicOp::Divide, a, b);
     return result != invalidId ? result : context.makeBinary(SymbolicOp::Divide, a, b);
-}
-
-void appendProductRules(std::vector<const RuleInfo*>& out) {
-    appendInfo<NodeRule>(multiplyRules, out);
-    appendInfo<NodeRule>(divideRules, out);
 }
 
 } // namespace VT

@@ -13,7 +13,7 @@
 
 namespace VT {
 
-/// What a rule tells of itself.
+/// The row of a rule.
 struct RuleInfo {
     OperatorSet operators;   ///< the operators at whose nodes the rule is tried
     std::string_view name;   ///< as an explanation shows it

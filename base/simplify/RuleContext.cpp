@@ -1,3 +1,7 @@
+// Answers what rules ask about nodes: bound members, literals, keywords, and where reals take part.
+//
+// Whether an operand may be real is found by a walk with a stack that keeps its answers, so that each node is looked at
+// once in a pass.
 #include "base/simplify/RuleContext.hpp"
 
 #include "base/variants/VariantKeywords.hpp"

@@ -31,6 +31,8 @@ public:
     /// Whether the node at hand is below a comparison or a logical operator, where quotients are truncated; elsewhere
     /// they are exact.
     [[nodiscard]] virtual bool inCondition() const = 0;
+    /// Whether the node at hand is not an operand of And, Or or Not: what it becomes is final.
+    [[nodiscard]] virtual bool isOutermost() const = 0;
     /// Reports that a chain or a distribution is beyond the limit: the pass will not be used.
     virtual void giveUp() = 0;
     /// Whether a comes before b among the operands of a chain: a strict weak order that never depends on how nodes are
@@ -74,8 +76,13 @@ public:
     [[nodiscard]] bool isSimKeyword(SymbolicExprId id) const;
     [[nodiscard]] bool isCodegenKeyword(SymbolicExprId id) const;
 
-    /// Reports applications of rules to the listener; free of cost where nobody listens.
+    /// Whether applications of rules are reported to a listener; they cost nothing where nobody listens.
     [[nodiscard]] bool explaining() const noexcept { return listener_ != nullptr; }
+
+    /// Takes note of a chain that is a sum of products, in order and proven smallest: no rule makes it another one.
+    void setSmallest(SymbolicExprId chain) { smallest_.insert(chain, true); }
+
+    [[nodiscard]] bool isSmallest(SymbolicExprId chain) const { return smallest_.find(chain) != nullptr; }
 
     void fired(const RuleInfo& rule, SymbolicExprId before, SymbolicExprId after);
 
@@ -91,7 +98,8 @@ private:
     bool keywordsOn_;
     RuleListener* listener_ = nullptr;
     std::uint64_t pass_ = 0;
-    IdMap<bool> real_; ///< what mayBeReal() found
+    IdMap<bool> real_;     ///< what mayBeReal() found
+    IdMap<bool> smallest_; ///< chains that were proven to be so
 };
 
 } // namespace VT

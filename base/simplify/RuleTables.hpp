@@ -1,4 +1,7 @@
-// The families of rules, each table in the file that holds its rules.
+// The families of rules, each in the file that holds its table.
+//
+// A rule is a function and a row; its row names the operators at whose nodes it is tried.  It goes into any table whose
+// subject it fits, also where its operator has had no rule so far.
 #pragma once
 
 #include "base/simplify/Rule.hpp"
@@ -24,8 +27,17 @@ struct NodeRule {
     SymbolicExprId (*apply)(RuleContext& context, const RuleOperands& operands);
 };
 
-/// Tries rules from top to bottom; the invalid identifier where none applies.
-SymbolicExprId applyFirst(std::span<const NodeRule> rules, RuleContext& context, const RuleOperands& operands);
+/// The tables: Not and comparisons, sums, products and quotients.
+std::span<const NodeRule> comparisonRules();
+std::span<const NodeRule> sumRules();
+std::span<const NodeRule> productRules();
+
+/// Tries the rules of an operator, table by table, from top to bottom; the invalid identifier where none applies.  `b`
+/// is the invalid identifier for one operand.
+SymbolicExprId applyRules(RuleContext& context, SymbolicOp op, SymbolicExprId a, SymbolicExprId b = invalidId);
+/// What a node becomes by the rules of its operator: the node itself where none applies, or where it has more than two
+/// operands.
+SymbolicExprId applyRules(RuleContext& context, SymbolicExprId id);
 
 /// Not of a simplified operand.
 SymbolicExprId simplifyNot(RuleContext& context, SymbolicExprId operand);
@@ -39,22 +51,11 @@ SymbolicExprId simplifyMultiply(RuleContext& context, SymbolicExprId a, Symbolic
 SymbolicExprId simplifyDivide(RuleContext& context, SymbolicExprId a, SymbolicExprId b);
 /// A chain of +, - and unary minus whose other operands are simplified.
 SymbolicExprId simplifySum(RuleContext& context, SymbolicExprId root);
-/// One + or - of two literals as a literal, anything else as it is.
-SymbolicExprId foldSum(RuleContext& context, SymbolicExprId root);
 /// The operators of such a chain.
 inline constexpr OperatorSet sumOps{SymbolicOp::Plus, SymbolicOp::Minus, SymbolicOp::UnaryMinus};
 
-/// Appends what the rows of a table tell of themselves.
-template <class Rule>
-void appendInfo(std::span<const Rule> rules, std::vector<const RuleInfo*>& out) {
-    for (const Rule& rule : rules)
-        out.push_back(&rule.info);
-}
-
-void appendNotRules(std::vector<const RuleInfo*>& out);
-void appendComparisonRules(std::vector<const RuleInfo*>& out);
-void appendLogicalRules(std::vector<const RuleInfo*>& out);
+/// Appends the rules of chains, which are tried in an order of their own, and those of whole sums.
+void appendChainRules(std::vector<const RuleInfo*>& out);
 void appendSumRules(std::vector<const RuleInfo*>& out);
-void appendProductRules(std::vector<const RuleInfo*>& out);
 
 } // namespace VT

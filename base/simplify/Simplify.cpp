@@ -1,24 +1,16 @@
+// Runs passes over an expression until one changes nothing.
+//
+// Two or three passes are usual; limits::simplifyPasses ends what oscillates.  A pass that gives up leaves what it was
+// given, and one that used up what a call may multiply out leaves the expression as it was before the first pass: so a
+// second call with a budget of its own returns the same.
 #include "base/simplify/Simplify.hpp"
 
 #include "base/core/Chains.hpp"
-#include "base/simplify/RuleTables.hpp"
+#include "base/core/Check.hpp"
 #include "base/util/IdMap.hpp"
 #include "base/variants/VariantKeywords.hpp"
 
 namespace VT {
-
-std::span<const RuleInfo* const> simplificationRules() {
-    static const std::vector<const RuleInfo*> rules = [] {
-        std::vector<const RuleInfo*> all;
-        appendNotRules(all);
-        appendComparisonRules(all);
-        appendLogicalRules(all);
-        appendSumRules(all);
-        appendProductRules(all);
-        return all;
-    }();
-    return rules;
-}
 
 namespace {
 
@@ -55,7 +47,16 @@ bool SymbolicExprSimplify::isVariantKeywordsSimCodegenFeatureOn() const {
 
 SymbolicExprId SymbolicExprSimplify::simplify(SymbolicExprId id, std::uint64_t& passes) const {
     SymbolicExprSimplifyVisitor visitor(table_, keywordsFlag_, printer_);
-    return simplify(id, passes, visitor);
+    const SymbolicExprId result = simplify(id, passes, visitor);
+    VTSYM_CHECK(result % 16 != 0 || passes >= maxIterations_ || keepsItsId(result)); // a sample
+    return result;
+}
+
+bool SymbolicExprSimplify::keepsItsId(SymbolicExprId result) const {
+    std::uint64_t passes = 0;
+    SymbolicExprSimplifyVisitor visitor(table_, keywordsFlag_, printer_);
+    return !table_.isPlain() ||
+           SymbolicExprSimplify(table_, maxIterations_).simplify(result, passes, visitor) == result;
 }
 
 SymbolicExprId SymbolicExprSimplify::simplify(SymbolicExprId id, std::uint64_t& passes,

@@ -48,6 +48,9 @@ public:
     [[nodiscard]] const SymbolicExprPrinter& printer() const noexcept { return printer_; }
 
 private:
+    /// Whether a further call, which no listener hears of, leaves a result as it is.
+    [[nodiscard]] bool keepsItsId(SymbolicExprId result) const;
+
     SymbolicExprTable& table_;
     std::uint64_t maxIterations_;
     bool keywordsFlag_;

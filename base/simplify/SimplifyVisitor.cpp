@@ -1,3 +1,9 @@
+// Rebuilds an expression from its leaves and applies the rules of each node's operator.
+//
+// Chains of And, Or and sums are rebuilt first and simplified at their topmost node, with all operands at hand.  A
+// node in a condition and in a dimension is visited for both, because quotients mean different things there.
+// Cost: linear in the distinct nodes, apart from the chains' own bounds.
+// Relies on: an explicit stack, so that the depth of an expression does not matter.
 #include "base/simplify/SimplifyVisitor.hpp"
 
 #include "base/core/Walk.hpp"
@@ -37,6 +43,8 @@ public:
 
     [[nodiscard]] bool inCondition() const override { return visitor_.inCondition_; }
 
+    [[nodiscard]] bool isOutermost() const override { return !visitor_.inTruth_; }
+
     void giveUp() override { visitor_.gaveUp = true; }
 
     bool multiplies(std::size_t literals) override {
@@ -70,6 +78,7 @@ public:
     ~Pass() {
         visitor_.inChain_ = false;
         visitor_.inCondition_ = false;
+        visitor_.inTruth_ = false;
     }
 
     /// Leaves the rebuilt expression on the visitor's stack, or anything where the visitor gives up.
@@ -124,6 +133,7 @@ private:
         }
         if (known->inChain && !inChain) {
             visitor_.inCondition_ = inCondition;
+            visitor_.inTruth_ = logicalOps.contains(above);
             *known = {visitor_.simplifyTopmost(node, known->id), false};
         }
         visitor_.push(known->id);
@@ -134,6 +144,7 @@ private:
             path_.leave(done.id);
         visitor_.inChain_ = done.inChain;
         visitor_.inCondition_ = done.inCondition;
+        visitor_.inTruth_ = !frames_.empty() && logicalOps.contains(frames_.back().node->op());
         visitor_.visitAs(done.id, *done.node);
         results_[done.inCondition ? 1 : 0].insert(done.id, {visitor_.top(), done.inChain});
     }
@@ -174,6 +185,10 @@ SymbolicExprId SymbolicExprSimplifyVisitor::pass(SymbolicExprId id) {
     const SymbolicExprId result = gaveUp ? id : finishRoot(id, pop());
     unwind(before);
     return result;
+}
+
+bool SymbolicExprSimplifyVisitor::isSmallest(SymbolicExprId result) const {
+    return table().has(result) && (!chainOps.contains(rules_->op(result)) || rules_->isSmallest(result));
 }
 
 /// The result of a pass.  A condition that was reduced to a value is a dimension on its own; where that has a quotient,
@@ -234,7 +249,7 @@ void SymbolicExprSimplifyVisitor::simplifyNode(const Node& node) {
         if (!inChain_)
             push(simplifyTopmost(node, pop()));
         else if constexpr (sumOps.contains(op))
-            push(foldSum(*rules_, pop()));
+            push(applyRules(*rules_, pop()));
     } else if constexpr (op == SymbolicOp::Not) {
         push(simplifyNot(*rules_, pop()));
     } else if constexpr (comparisonOps.contains(op) || op == SymbolicOp::Multiply || op == SymbolicOp::Divide) {
@@ -245,6 +260,7 @@ void SymbolicExprSimplifyVisitor::simplifyNode(const Node& node) {
                                         : simplifyComparison(*rules_, op, a, b));
     } else {
         SymbolicExprXFormVisitor::visit(node);
+        push(applyRules(*rules_, pop()));
     }
 }
 

@@ -37,7 +37,7 @@ public:
 #include "base/core/operators.def"
 #undef VTSYM_OPERATOR
 
-    /// Asked before some rules put `replacement` in the place of `expression`.  The base answers true.
+    /// Asked before some rules replace `expression` by `replacement`.  The base answers true.
     virtual bool confirmRewrite(SymbolicExprId expression, SymbolicExprId replacement);
 
     /// One pass over an expression of the visitor's table: its result, or the expression itself where the pass gave up.
@@ -61,6 +61,10 @@ public:
         return gaveUp && affordable_ == 0;
     }
 
+    /// Whether the result of a pass is proven to have the fewest comparisons of all sums of products; points of a
+    /// symbol that are written one by one count as such.  True for what is not a chain of And or Or.
+    [[nodiscard]] bool isSmallest(SymbolicExprId result) const;
+
     /// Receives the rules that fire in further passes; nullptr for none.
     void setListener(RuleListener* listener) noexcept {
         listener_ = listener;
@@ -83,6 +87,7 @@ private:
     std::size_t affordable_ = limits::multipliedLiterals; ///< literals that may still be multiplied out
     bool inChain_ = false;     ///< the node that is visited goes on in its parent, which is simplified for both
     bool inCondition_ = false; ///< the node that is visited is below a comparison or a logical operator
+    bool inTruth_ = false;     ///< the node that is visited is an operand of And, Or or Not
     std::vector<SymbolicExprId> operands_;
     IdMap<bool> broken_; ///< rebuilt expressions in which an operand is missing
 };

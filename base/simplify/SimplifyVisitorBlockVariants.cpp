@@ -1,3 +1,6 @@
+// Asks a host's customizer before a rewrite, with both expressions as Quill text.
+//
+// Texts are printed only when there is a question.
 #include "base/simplify/SimplifyVisitorBlockVariants.hpp"
 
 namespace VT {

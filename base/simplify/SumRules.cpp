@@ -1,4 +1,10 @@
 // Rules for sums: chains of +, - and unary minus.
+//
+// Method: a chain is read as integer multiples of terms and a constant, from the outside in, so that a shared node
+// costs one visit; it is written in the order in which terms first occur.
+// Cost: linear in the distinct nodes of the chain.
+// Relies on: 64-bit arithmetic that refuses to overflow; a sum with a real literal is folded pair by pair only,
+// because rounding does not commute.
 #include "base/core/Walk.hpp"
 #include "base/integer/IntegerSet.hpp"
 #include "base/simplify/Literals.hpp"
@@ -18,12 +24,6 @@ SymbolicExprId neutralTerm(RuleContext& context, const RuleOperands& x) {
     return x.op == SymbolicOp::Plus && context.integer(x.valueA) == 0 ? x.b : invalidId;
 }
 
-constexpr OperatorSet sumOnly{SymbolicOp::Plus, SymbolicOp::Minus};
-constexpr NodeRule sumRules[] = {
-    {{sumOnly, "folded sum", "1.5 + 2.5", "4"}, foldedNumbers},
-    {{sumOnly, "neutral term", "N + 0", "N"}, neutralTerm},
-};
-
 /// -(-x)
 SymbolicExprId doubleMinus(RuleContext& context, const RuleOperands& x) {
     const SymbolicExpr& operand = context.node(x.a);
@@ -31,7 +31,11 @@ SymbolicExprId doubleMinus(RuleContext& context, const RuleOperands& x) {
                                                   : invalidId;
 }
 
-constexpr NodeRule minusRules[] = {
+constexpr OperatorSet plusMinus{SymbolicOp::Plus, SymbolicOp::Minus};
+
+constexpr NodeRule table[] = {
+    {{plusMinus, "folded sum", "1.5 + 2.5", "4"}, foldedNumbers},
+    {{plusMinus, "neutral term", "N + 0", "N"}, neutralTerm},
     {{{SymbolicOp::UnaryMinus}, "double minus", "-(-N)", "N"}, doubleMinus},
 };
 
@@ -183,19 +187,12 @@ const RuleInfo& LinearSum::rule() const {
 
 } // namespace
 
-SymbolicExprId foldSum(RuleContext& context, SymbolicExprId root) {
-    const SymbolicExpr& node = context.node(root);
-    const bool isBinary = node.isBinaryExpr();
-    const SymbolicExprId a = node.getInput(0);
-    const SymbolicExprId b = isBinary ? node.getInput(1) : invalidId;
-    const RuleOperands operands{node.op(), a, b, context.resolve(a), isBinary ? context.resolve(b) : invalidId};
-    const SymbolicExprId folded =
-        isBinary ? applyFirst(sumRules, context, operands) : applyFirst(minusRules, context, operands);
-    return folded != invalidId ? folded : root;
+std::span<const NodeRule> sumRules() {
+    return table;
 }
 
 SymbolicExprId simplifySum(RuleContext& context, SymbolicExprId root) {
-    const SymbolicExprId folded = foldSum(context, root);
+    const SymbolicExprId folded = applyRules(context, root);
     if (!sumOps.contains(context.op(folded)))
         return folded;
     LinearSum sum;
@@ -207,8 +204,6 @@ SymbolicExprId simplifySum(RuleContext& context, SymbolicExprId root) {
 }
 
 void appendSumRules(std::vector<const RuleInfo*>& out) {
-    appendInfo<NodeRule>(sumRules, out);
-    appendInfo<NodeRule>(minusRules, out);
     for (const RuleInfo* rule : {&gatheredSum, &collectedTerms, &cancelledTerms})
         out.push_back(rule);
 }

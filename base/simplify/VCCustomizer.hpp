@@ -11,9 +11,9 @@
 
 namespace VT {
 
-/// What stands for a parameter: another parameter's name or a value.
+/// What replaces a parameter: another parameter's name or a value.
 using ParameterReplacement = std::variant<std::string, int>;
-/// What stands for parameters while conditions are compared.
+/// What replaces parameters while conditions are compared.
 using ParameterReplacements = std::unordered_map<std::string, ParameterReplacement>;
 
 /// A host's say in simplification.  Exceptions of the operations pass to whoever asked for the simplification, and
@@ -25,13 +25,13 @@ public:
     /// The service has no more use for the customizer.  Called once for each time that it was installed; a customizer
     /// made for the service alone deletes itself here.
     virtual void release() noexcept = 0;
-    /// The condition to decide in the place of `condition`: an expression of the same table, or `condition` itself
+    /// The condition to decide instead of `condition`: an expression of the same table, or `condition` itself
     /// where there is nothing to rewrite.  An identifier that is not of the table counts as nothing to rewrite.
     virtual SymbolicExprId rewrite(SymbolicExprId condition, SymbolicExprTable& table) = 0;
-    /// Whether a simplification may put one expression in the place of another; both as Quill text.
+    /// Whether a simplification may replace one expression by another; both as Quill text.
     virtual bool canReplaceCondition(const std::string& condition, const std::string& replacement) = 0;
 
-    /// What to put in the place of parameters before two conditions are compared, all at once; nothing unless
+    /// What to replace parameters by before two conditions are compared, all at once; nothing unless
     /// overridden.  Names that the conditions have not are ignored.
     virtual ParameterReplacements parameterReplacements() { return {}; }
 

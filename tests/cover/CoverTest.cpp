@@ -136,5 +136,122 @@ RC_GTEST_PROP(Covers, CombineExactly, ()) {
     }
 }
 
+/// The fewest comparisons of a sum of boxes that holds at some points of a small square, by trying them all.
+class SmallestSum {
+public:
+    static constexpr int side = 5; ///< values from -2 to 2, of which the outer ones stand for all beyond
+
+    using Square = std::uint32_t;
+
+    explicit SmallestSum(Square points) : points_(points) {
+        std::vector<IntegerSet> sets;
+        for (unsigned values = 1; values < 1U << side; ++values) {
+            std::vector<IntegerSet::Interval> intervals;
+            for (int value = 0; value < side; ++value)
+                if ((values >> value & 1U) != 0)
+                    intervals.push_back({value == 0 ? IntegerSet::minusInfinity : value - 2,
+                                         value == side - 1 ? IntegerSet::plusInfinity : value - 2});
+            sets.push_back(IntegerSet::of(intervals));
+        }
+        for (const IntegerSet& a : sets)
+            for (const IntegerSet& b : sets)
+                if (const Square held = pointsOf(a, b); (held & ~points) == 0)
+                    boxes_.emplace_back(held, (a.isAll() ? 0 : a.comparisons()) + (b.isAll() ? 0 : b.comparisons()));
+    }
+
+    static Square pointsOf(const IntegerSet& a, const IntegerSet& b) {
+        Square held = 0;
+        for (int x = 0; x < side; ++x)
+            for (int y = 0; y < side; ++y)
+                if (a.contains(x - 2) && b.contains(y - 2))
+                    held |= Square{1} << (x * side + y);
+        return held;
+    }
+
+    /// Whether the points can be held with so many comparisons.
+    [[nodiscard]] bool takes(std::size_t comparisons) const { return takes(points_, comparisons); }
+
+private:
+    [[nodiscard]] bool takes(Square open, std::size_t comparisons) const {
+        if (open == 0)
+            return true;
+        const Square first = open & (~open + 1);
+        return std::ranges::any_of(boxes_, [&](const auto& box) {
+            return (box.first & first) != 0 && box.second <= comparisons &&
+                   takes(open & ~box.first, comparisons - box.second);
+        });
+    }
+
+    Square points_;
+    std::vector<std::pair<Square, std::size_t>> boxes_; ///< points held and comparisons taken
+};
+
+Cover anySmallCover() {
+    Cover cover;
+    for (int i = *rc::gen::inRange(1, 6); i > 0; --i) {
+        Cube cube;
+        for (Atom atom = 0; atom < 2; ++atom) {
+            const SymbolicOp op = static_cast<SymbolicOp>(*rc::gen::inRange(9, 15));
+            if (*rc::gen::inRange(0, 4) != 0)
+                cube.restrict(atom, IntegerSet::satisfying(op, *rc::gen::inRange<std::int64_t>(-1, 2)));
+        }
+        if (!cube.alwaysHolds())
+            cover.push_back(cube);
+    }
+    return cover;
+}
+
+RC_GTEST_PROP(Covers, AreProvenSmallest, ()) {
+    const Cover before = anySmallCover();
+    Cover cover = before;
+    CoverBudget budget{100000};
+    reduce(cover, budget);
+    RC_ASSERT(minimize(cover, budget, Ranges::Any));
+    RC_ASSERT(truth(cover) == truth(before));
+    SmallestSum::Square points = 0;
+    const IntegerSet all = IntegerSet::all();
+    for (const Cube& cube : before)
+        points |= SmallestSum::pointsOf(cube.find(0) == nullptr ? all : *cube.find(0),
+                                        cube.find(1) == nullptr ? all : *cube.find(1));
+    RC_ASSERT(comparisons(cover) == 0 || !SmallestSum(points).takes(comparisons(cover) - 1));
+}
+
+RC_GTEST_PROP(Covers, StayWhereNothingIsProvenOrSmaller, ()) {
+    const Cover before = anyCover();
+    Cover cover = before;
+    CoverBudget budget{*rc::gen::inRange<std::size_t>(0, 300)};
+    const bool isProven = minimize(cover, budget, Ranges::NotOfPoints);
+    RC_ASSERT(truth(cover) == truth(before));
+    RC_ASSERT(cover == before || (isProven && comparisons(cover) < comparisons(before)));
+    const Cover once = cover;
+    CoverBudget further{100000};
+    RC_ASSERT(!isProven || (minimize(cover, further, Ranges::NotOfPoints) && comparisons(cover) <= comparisons(once)));
+}
+
+TEST(Covers, OfAnySizeAreSmallestOrStay) {
+    for (const std::size_t atomCount : {2U, 11U, 12U, 13U, 40U, 4000U}) {
+        // A chain of implications: each atom differs from the next one somewhere.
+        Cover cover;
+        for (Atom atom = 0; atom < atomCount; ++atom) {
+            Cube cube;
+            cube.restrict(atom, IntegerSet::allBut(0));
+            cube.restrict((atom + 1) % static_cast<Atom>(atomCount), IntegerSet::point(0));
+            cover.push_back(cube);
+        }
+        const Cover before = cover;
+        CoverBudget budget{50000};
+        minimize(cover, budget, Ranges::Any);
+        EXPECT_EQ(cover.size(), before.size());
+    }
+    Cover points; // more cells than a word has bits
+    for (std::int64_t value = 0; value < 200; value += 2) {
+        points.emplace_back();
+        points.back().restrict(0, IntegerSet::point(value));
+    }
+    CoverBudget budget{50000};
+    EXPECT_FALSE(minimize(points, budget, Ranges::Any));
+    EXPECT_EQ(points.size(), 100U);
+}
+
 } // namespace
 } // namespace VT::Testing

@@ -1,6 +1,8 @@
 // The shortest forms of conditions, everywhere and where others hold: by tables, on real conditions, and against brute
 // force.
 #include "base/core/Limits.hpp"
+#include "base/core/Make.hpp"
+#include "base/core/Nodes.hpp"
 #include "base/decide/Decider.hpp"
 #include "tests/service/Customizers.hpp"
 #include "tests/support/Cases.hpp"
@@ -12,6 +14,9 @@
 
 #include <boost/algorithm/string/replace.hpp>
 #include <gtest/gtest.h>
+
+#include <functional>
+#include <unordered_set>
 
 namespace VT::Testing {
 namespace {
@@ -90,6 +95,76 @@ TEST(ShortestConditions, AreEqualAndNoLongerInTheirLanguage) {
     }
     EXPECT_GT(shorter, 1500U);
     EXPECT_GT(shorterGiven, 5000U);
+}
+
+/// Visits a condition with one operand of its And, Or and Not replaced by a constant, each in turn, until `visit` is
+/// false.
+void forEachPruned(SymbolicExprTable& table, SymbolicExprId root, const std::function<bool(SymbolicExprId)>& visit) {
+    struct Place {
+        SymbolicExprId id;
+        std::size_t parent; ///< its own place for the root
+        std::size_t side;
+    };
+
+    std::vector<Place> places{{root, 0, 0}};
+    for (std::size_t i = 0; i < places.size(); ++i) { // it grows
+        const SymbolicExpr& node = *table.get(places[i].id);
+        if (node.op() == SymbolicOp::And || node.op() == SymbolicOp::Or || node.op() == SymbolicOp::Not)
+            for (std::size_t side = 0; side < node.getNumInputs(); ++side)
+                places.push_back({node.getInput(side), i, side});
+    }
+    for (std::size_t i = 1; i < places.size(); ++i) {
+        for (SymbolicExprId by : {table.getIdTRUE(), table.getIdFALSE()}) {
+            for (std::size_t at = i; at != 0; at = places[at].parent) {
+                const SymbolicExpr& parent = *table.get(places[places[at].parent].id);
+                const std::size_t side = places[at].side;
+                by = parent.op() == SymbolicOp::Not
+                         ? SymbolicNotExpr(table, by).getId(table)
+                         : makeBinary(table, parent.op(), side == 0 ? by : parent.getInput(0),
+                                      side == 1 ? by : parent.getInput(1));
+            }
+            if (!visit(by))
+                return;
+        }
+    }
+}
+
+/// Judged by a decider of its own, on real and on random conditions.
+TEST(ShortestConditions, HaveNoOperandThatDoesNotCount) {
+    std::vector<std::string> texts;
+    for (const CorpusFile& file : corpusFiles)
+        for (std::string& line : corpusLines(file.name))
+            texts.push_back(std::move(line));
+    std::mt19937_64 random(37);
+    const ConditionShape plain{.symbols = {"A", "B", "C", "D", "E"}};
+    const ConditionShape mixed{.symbols = {"A", "B", "C", "D"}, .symbolPairs = true, .truthValues = true};
+    for (std::size_t round = 0; round < 2000; ++round)
+        texts.push_back(randomCondition(random, 3 + round % 19, round % 4 == 0 ? mixed : plain));
+    const FreshService service;
+    SymbolicExprTable& table = service->table();
+    Decider judge(table);
+    std::size_t judged = 0;
+    std::unordered_set<SymbolicExprId> seen;
+    for (const std::string& text : texts) {
+        SymbolicExprId condition = invalidId;
+        try {
+            condition = service->parseC(text);
+        } catch (const HostDiagnostic&) {
+            continue; // a text that is no condition
+        }
+        const SymbolicExprId shortest = service->shortestCondition(condition, false).id();
+        if (!booleanOps.contains(table.get(shortest)->op()) || countComparisons(table, shortest) > 40 ||
+            !seen.insert(shortest).second)
+            continue;
+        forEachPruned(table, shortest, [&](SymbolicExprId pruned) {
+            ++judged;
+            const bool isEqual = judge.equivalent(pruned, shortest).isYes();
+            EXPECT_FALSE(isEqual) << text << " became " << service->printCExpr(shortest) << " and not "
+                                  << service->printCExpr(pruned);
+            return !isEqual;
+        });
+    }
+    EXPECT_GT(judged, 50000U);
 }
 
 TEST(ShortestConditions, OfAnyLength) {

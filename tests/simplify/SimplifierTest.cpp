@@ -164,7 +164,9 @@ TEST(Rules, EachFiresOnItsExampleAndKeepsTheMeaning) {
             EXPECT_EQ(fired.firings.at(fired.firings.size() - 1).after, after);
         }
         for (const RuleFiring& firing : fired.firings)
-            EXPECT_NE(firing.before, firing.after) << firing.rule->name;
+            EXPECT_TRUE(firing.before != firing.after &&
+                        firing.rule->operators.contains(bench.table.get(firing.before)->op()))
+                << firing.rule->name;
     }
 }
 

@@ -1,4 +1,9 @@
-// Reading: from comparisons to constraints.
+// Reads comparisons as constraints: linear terms restricted to sets of integers.
+//
+// Both sides are read as linear forms, their difference is divided by the greatest common divisor of its factors,
+// and the bound is rounded to the integers that are left.  Forms are kept by node.
+// Cost: linear in the nodes that were not read before.
+// Relies on: exact 64-bit steps (ExactArithmetic); a form beyond the bound of linear forms becomes an unknown.
 #include "base/decide/shorten/ComparedTerms.hpp"
 
 #include "base/core/Walk.hpp"
@@ -14,7 +19,7 @@ namespace VT {
 namespace {
 
 constexpr Atom noAtom = ~Atom{0};
-constexpr SymbolicExprId simulation = invalidId - 1; ///< stands for both keywords
+constexpr SymbolicExprId simulation = invalidId - 1; ///< for both keywords
 
 const IntegerSet zero = IntegerSet::point(0);
 const IntegerSet nonZero = IntegerSet::allBut(0);

@@ -1,4 +1,4 @@
-// Writing: from constraints to comparisons.
+// Writes constraints as comparisons.
 //
 // A set of k intervals is cut into runs of neighbours; a run is written as its bounds without the integers missing
 // between, and the set as an Or of its runs.  The cheapest cut is found by dynamic programming in k^2 steps.
@@ -180,7 +180,7 @@ SymbolicExprId ComparedTerms::literal(Atom atom, const IntegerSet& set) {
 }
 
 /// The comparison of an atom, anew; the invalid identifier where a number is no literal.  Bounds are written as >= and
-/// <=, as > and < where that is asked for, and the parts of a sum stand where they are positive.
+/// <=, as > and < where that is asked for, and each part of a sum on the side where it is positive.
 SymbolicExprId ComparedTerms::compose(Atom atom, const IntegerSet& set, bool strict) {
     const LinearParts& parts = entries_[atom].parts;
     const bool difference = std::ranges::any_of(parts, [](const LinearPart& part) { return part.factor < 0; });
@@ -209,7 +209,7 @@ SymbolicExprId ComparedTerms::compose(Atom atom, const IntegerSet& set, bool str
     return left == invalidId || other == invalidId ? invalidId : makeBinary(table_, op, left, other);
 }
 
-/// The sum of the parts with a sign and of a constant, which stands alone or where it is not 0.
+/// The sum of the parts with a sign and of a constant, which is written where it is not 0, or alone.
 SymbolicExprId ComparedTerms::side(const LinearParts& parts, std::int64_t sign, std::int64_t constant) {
     SymbolicExprId sum = invalidId;
     for (const LinearPart& part : parts) {

@@ -1,3 +1,6 @@
+// Asks the decider for proofs until the steps are used up.
+//
+// A condition is converted once; equal identifiers need no proof.
 #include "base/decide/shorten/ConditionProofs.hpp"
 
 #include <algorithm>

@@ -12,8 +12,8 @@ namespace VT {
 
 /// Proves forms of a condition equal to it where a known condition holds.
 ///
-/// All proofs share one budget of steps.  A question that uses up what is left is the last one: whoever asks further is
-/// told that nothing is proven, at once.
+/// All proofs share one budget of steps.  A question that uses up what is left is the last one: further ones are
+/// answered at once: not proven.
 class ConditionProofs {
 public:
     /// `known` is TRUE where nothing is known.  Quill calls are decided as the operators that they stand for.

@@ -1,3 +1,6 @@
+// Reads a condition as a formula with an explicit stack, each distinct node once.
+//
+// Cost: linear in the operands of all distinct nodes, at most limits::shortenComparisons leaves.
 #include "base/decide/shorten/FormulaReader.hpp"
 
 #include "base/core/Chains.hpp"

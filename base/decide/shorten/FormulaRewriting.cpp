@@ -1,3 +1,10 @@
+// Shortens formulas by algebra: constraints judged by those around them, common parts taken out, smallest sums.
+//
+// Factoring takes out the operand, or the single comparison of a constraint, that saves most, again and again (literal
+// factoring: Brayton, "Factoring logic functions", 1987).  The same code serves And and Or: an operand of an Or is
+// relaxed where the common part fails, one of an And where it holds.
+// Cost: bounded by limits::shortenWork, limits::factorRounds and limits::shortenProducts.
+// Relies on: Formulas for one number for each formula, base/cover for smallest sums.
 #include "base/decide/shorten/FormulaRewriting.hpp"
 
 #include <algorithm>
@@ -23,12 +30,15 @@ void FormulaRewriting::assume(const Constraint& constraint, bool holds) {
     range = range ? range->intersect(set) : std::move(set);
 }
 
-/// A constraint by what is known of its atom: decided, or as few comparisons as will do.
+/// A constraint by what is known of its atom.
 Formula FormulaRewriting::relaxed(Formula leaf) {
+    const Atom atom = formulas_.constraint(leaf).atom;
+    return atom < known_.size() && known_[atom] ? within(leaf, *known_[atom]) : leaf;
+}
+
+/// A constraint where its atom is in a range: decided, or as few comparisons as will do.
+Formula FormulaRewriting::within(Formula leaf, const IntegerSet& range) {
     const Constraint constraint = formulas_.constraint(leaf);
-    if (constraint.atom >= known_.size() || !known_[constraint.atom])
-        return leaf;
-    const IntegerSet& range = *known_[constraint.atom];
     const IntegerSet inside = constraint.set.intersect(range);
     if (inside.empty())
         return Formulas::no;
@@ -109,53 +119,132 @@ Formula FormulaRewriting::inContext(Formula formula, const AtomFacts& facts) {
 
 // Factoring.
 
+/// Single comparisons that a constraint is an And (or an Or) of with others, where it takes several.
+void FormulaRewriting::appendParts(Kind chain, Formula leaf, std::vector<Formula>& out) {
+    if (formulas_.comparisons(leaf) < 2)
+        return;
+    const Constraint constraint = formulas_.constraint(leaf);
+    // The parts of an Or are what the parts of the opposite And are not.
+    const IntegerSet set = chain == Kind::And ? constraint.set : constraint.set.complement();
+    const auto append = [&](const IntegerSet& part) {
+        if (!part.isAll())
+            out.push_back(formulas_.leaf({constraint.atom, chain == Kind::And ? part : part.complement()}));
+    };
+    append({set.low(), IntegerSet::plusInfinity});
+    append({IntegerSet::minusInfinity, set.high()});
+    for (std::size_t i = 1; i < set.intervals().size(); ++i) {
+        const IntegerSet::Interval hole{set.intervals()[i - 1].high + 1, set.intervals()[i].low - 1};
+        if (hole.low == hole.high)
+            append(IntegerSet::allBut(hole.low));
+    }
+}
+
+/// What is left of a chain's operands where a common one is taken out; nothing where it is not one of them, or part of
+/// one.
+std::optional<FormulaRewriting::Quotient> FormulaRewriting::without(Formula chain, Formula common) {
+    const Kind kind = formulas_.kind(chain);
+    const Formulas::Operands& operands = formulas_.operands(chain);
+    if (const auto same = std::ranges::find(operands, common); same != operands.end())
+        return Quotient{static_cast<std::size_t>(same - operands.begin()),
+                        kind == Kind::And ? Formulas::yes : Formulas::no, formulas_.comparisons(common)};
+    if (formulas_.kind(common) != Kind::Leaf)
+        return std::nullopt;
+    const Constraint part = formulas_.constraint(common);
+    const auto own = std::ranges::find_if(operands, [&](Formula each) {
+        return formulas_.kind(each) == Kind::Leaf && formulas_.constraint(each).atom == part.atom;
+    });
+    if (own == operands.end())
+        return std::nullopt;
+    const IntegerSet& set = formulas_.constraint(*own).set;
+    if (kind == Kind::And ? !set.isSubsetOf(part.set) : !part.set.isSubsetOf(set))
+        return std::nullopt;
+    const Formula left = within(*own, kind == Kind::And ? part.set : part.set.complement());
+    const std::uint32_t saved =
+        formulas_.comparisons(*own) - std::min(formulas_.comparisons(*own), formulas_.comparisons(left));
+    return saved == 0 ? std::nullopt
+                      : std::optional(Quotient{static_cast<std::size_t>(own - operands.begin()), left, saved});
+}
+
+/// Comparisons that are saved where a part is taken out of a chain's operands, but for its own.
+std::size_t FormulaRewriting::savedBy(Formula common, Kind inner, const Formulas::Operands& operands) {
+    std::size_t saved = 0;
+    for (const Formula operand : operands)
+        if (formulas_.kind(operand) == inner)
+            if (const auto quotient = without(operand, common))
+                saved += quotient->saved;
+    return saved;
+}
+
+/// The operand that saves most comparisons where it is taken out of a chain's operands; FALSE where none saves any.
+Formula FormulaRewriting::bestCommonOperand(Kind kind, const Formulas::Operands& operands) {
+    const Kind inner = Formulas::opposite(kind);
+    if (std::ranges::count(operands, inner, [&](Formula each) { return formulas_.kind(each); }) < 2)
+        return Formulas::no;
+    boost::unordered_map<Formula, std::size_t> saved;
+    std::vector<Formula> order;
+    const auto add = [&](Formula common, std::size_t comparisons) {
+        std::size_t& sum = saved[common];
+        if (sum == 0)
+            order.push_back(common);
+        sum += comparisons;
+    };
+    for (const Formula operand : operands)
+        if (formulas_.kind(operand) == inner)
+            for (const Formula each : formulas_.operands(operand))
+                add(each, formulas_.comparisons(each));
+    if (!takeWork(order.size()))
+        return Formulas::no;
+    if (order.size() <= limits::factoredParts) {
+        std::vector<Formula> parts;
+        for (const Formula each : order)
+            if (formulas_.kind(each) == Kind::Leaf)
+                appendParts(inner, each, parts);
+        for (const Formula part : parts)
+            if (saved[part] == 0)
+                add(part, 1);
+        for (const Formula common : order)
+            if (formulas_.kind(common) == Kind::Leaf && takeWork(operands.size()))
+                saved[common] = savedBy(common, inner, operands);
+    }
+    std::size_t most = 0;
+    Formula best = Formulas::no;
+    for (const Formula common : order) {
+        if (saved[common] > most + formulas_.comparisons(common)) {
+            most = saved[common] - formulas_.comparisons(common);
+            best = common;
+        }
+    }
+    return best;
+}
+
 /// Takes the operand out that saves most comparisons, until none is in two operands of the chain.
 Formula FormulaRewriting::withCommonOperand(Kind kind, const Formulas::Operands& operands) {
     Formulas::Operands rest = operands;
     const Kind inner = Formulas::opposite(kind);
     for (;;) {
-        boost::unordered_map<Formula, std::size_t> count;
-        std::vector<Formula> order;
-        for (const Formula operand : rest) {
-            if (formulas_.kind(operand) != inner)
-                continue;
-            for (const Formula each : formulas_.operands(operand))
-                if (count[each]++ == 0)
-                    order.push_back(each);
-        }
-        std::size_t most = 0;
-        Formula common = Formulas::no;
-        for (const Formula each : order) {
-            const std::size_t saved = (count[each] - 1) * formulas_.comparisons(each);
-            if (saved > most) {
-                most = saved;
-                common = each;
-            }
-        }
-        if (most == 0 || !takeWork(order.size()))
+        const Formula common = bestCommonOperand(kind, rest);
+        if (common == Formulas::no)
             return formulas_.chain(kind, rest);
         Formulas::Operands next;
-        Formulas::Operands quotient;
+        Formulas::Operands quotients;
         std::optional<std::size_t> place;
         bool isFirst = false; // in the operand that it was met in
         for (const Formula operand : rest) {
-            const bool has =
-                formulas_.kind(operand) == inner &&
-                std::ranges::find(formulas_.operands(operand), common) != formulas_.operands(operand).end();
-            if (!has) {
+            const auto quotient = formulas_.kind(operand) == inner ? without(operand, common) : std::nullopt;
+            if (!quotient) {
                 next.push_back(operand);
                 continue;
             }
             if (!place) {
                 place = next.size();
                 next.push_back(common);
-                isFirst = formulas_.operands(operand).front() == common;
+                isFirst = quotient->place == 0;
             }
             Formulas::Operands left = formulas_.operands(operand);
-            left.erase(std::remove(left.begin(), left.end(), common), left.end());
-            quotient.push_back(formulas_.chain(inner, left));
+            left[quotient->place] = quotient->left;
+            quotients.push_back(formulas_.chain(inner, left));
         }
-        const Formula left = formulas_.chain(kind, quotient);
+        const Formula left = formulas_.chain(kind, quotients);
         next[*place] =
             formulas_.chain(inner, isFirst ? Formulas::Operands{common, left} : Formulas::Operands{left, common});
         rest.swap(next);
@@ -243,6 +332,8 @@ std::optional<Formula> FormulaRewriting::minimalSum(Formula formula) {
     CoverBudget budget{limits::shortenCoverSteps};
     while (joinCubes(*cover) || absorb(*cover) || dropComparisons(*cover, budget) || dropCubes(*cover, budget))
         continue;
+    CoverBudget exact{limits::coverSteps};
+    minimize(*cover, exact, Ranges::Any);
     Formulas::Operands products;
     for (const Cube& cube : *cover) {
         Formulas::Operands factors;

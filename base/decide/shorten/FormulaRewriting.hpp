@@ -42,12 +42,24 @@ private:
         std::size_t done = 0;  ///< results when it was entered
     };
 
+    /// An operand of a chain after a common one was taken out.
+    struct Quotient {
+        std::size_t place;
+        Formula left;
+        std::uint32_t saved; ///< comparisons
+    };
+
     bool takeWork(std::size_t amount);
     void assume(const Constraint& constraint, bool holds);
     Formula relaxed(Formula leaf);
+    Formula within(Formula leaf, const IntegerSet& range);
     void enter(Formula chain);
     Formula leave(const Frame& frame);
     Formula factoredOnce(Formula formula);
+    void appendParts(Kind chain, Formula leaf, std::vector<Formula>& out);
+    std::optional<Quotient> without(Formula chain, Formula common);
+    std::size_t savedBy(Formula common, Kind inner, const Formulas::Operands& operands);
+    Formula bestCommonOperand(Kind kind, const Formulas::Operands& operands);
     Formula withCommonOperand(Kind kind, const Formulas::Operands& operands);
     std::optional<Cover> coverOf(Formula formula);
 

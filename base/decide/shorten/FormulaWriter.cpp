@@ -1,3 +1,8 @@
+// Writes formulas as nodes, from the inside out.
+//
+// Every chain is written plainly and, where it has several negations, as the negation of the opposite chain; the
+// shorter of both serves the chain around it.
+// Cost: linear in the formulas below and their opposites.
 #include "base/decide/shorten/FormulaWriter.hpp"
 
 #include "base/core/Make.hpp"
@@ -54,7 +59,7 @@ bool FormulaWriter::append(Kind kind, Formula operand, std::vector<SymbolicExprI
     return !comparisons.empty();
 }
 
-/// Puts one Not in the place of many.
+/// Replaces many Nots by one.
 void FormulaWriter::drawTogether(Kind kind, std::vector<SymbolicExprId>& operands) {
     const auto isNot = [&](SymbolicExprId id) { return isNegation(id); };
     if (static_cast<std::size_t>(std::ranges::count_if(operands, isNot)) < negationsTogether)

@@ -1,3 +1,7 @@
+// Interns formulas: constraints by content, chains by their operands in any order.
+//
+// A chain is gathered in one walk that joins constraints of one atom; rounds instead of sets mark what was met.
+// Cost: linear in the operands of a chain.
 #include "base/decide/shorten/Formulas.hpp"
 
 #include <algorithm>
@@ -107,7 +111,7 @@ Formula Formulas::chain(Kind kind, std::span<const Formula> operands) {
     }
     for (const Formula operand : gathered_)
         member_[operand] = round_;
-    // The constraints stay where they are, so that redundant operands can be told by them.
+    // The constraints stay where they are, so that redundant operands are found by them.
     std::vector<bool> gone(gathered_.size(), false);
     for (std::size_t i = 0; i < gathered_.size(); ++i)
         gone[i] = isRedundant(kind, gathered_[i]);

@@ -1,3 +1,8 @@
+// Shortens a condition by trial and proof.
+//
+// The condition is taken apart into chains once.  A trial marks an operand as removed, or a group as replaced,
+// builds the text's length and asks for a proof only where that is shorter.
+// Cost: limits::impliedTries proofs and limits::impliedNodes nodes.
 #include "base/decide/shorten/ImpliedCondition.hpp"
 
 #include "base/core/Chains.hpp"
@@ -57,7 +62,7 @@ bool ImpliedCondition::split(SymbolicExprId condition) {
     return true;
 }
 
-/// The condition as it stands, without what was removed.
+/// The condition without what was removed.
 SymbolicExprId ImpliedCondition::build() {
     built_.assign(items_.size(), invalidId);
     for (std::size_t i = items_.size(); i-- > 0;) {
@@ -119,7 +124,7 @@ bool ImpliedCondition::removeOperands() {
     return changed;
 }
 
-/// Puts one comparison in the place of a whole group.
+/// Replaces a whole group by one comparison.
 bool ImpliedCondition::replaceGroups() {
     for (std::size_t i = 0; i < items_.size(); ++i) {
         Item& item = items_[i];
@@ -163,7 +168,7 @@ void ImpliedCondition::collectComparisons(SymbolicExprId condition) {
                     if (literal == nullptr || literal->op() != SymbolicOp::IntValue)
                         continue;
                     auto at = std::ranges::find(operands, operand);
-                    if (at == operands.end() && (root == context_ || operands.size() == limits::impliedTerms))
+                    if (at == operands.end() && (root == context_ || operands.size() == limits::impliedOperands))
                         continue;
                     if (at == operands.end()) {
                         at = operands.insert(at, operand);

@@ -31,10 +31,10 @@ public:
     SymbolicExprId shorten(SymbolicExprId condition);
 
 private:
-    /// An operand of a chain: a chain itself, or anything else as it stands.
+    /// An operand of a chain: a chain itself, or anything else as written.
     struct Item {
-        SymbolicOp op;                     ///< And, Or, or None for what stands as it is
-        SymbolicExprId id;                 ///< of what stands as it is
+        SymbolicOp op;                     ///< And, Or, or None for what is not a chain
+        SymbolicExprId id;                 ///< of what is not a chain
         std::size_t parent;                ///< position, smaller than its own
         std::vector<std::size_t> operands; ///< positions, greater than its own
         bool removed = false;

@@ -1,3 +1,7 @@
+// Runs the search for the shortest form: reads, rewrites, writes, and proves the best.
+//
+// Forms are tried from the shortest on, and the first that is proven equal is returned; so a fault in the algebra can
+// cost length, never the meaning.
 #include "base/decide/shorten/ShortestForm.hpp"
 
 #include "base/decide/shorten/ImpliedCondition.hpp"
@@ -21,6 +25,7 @@ ShortestForm::ShortestForm(SymbolicExprTable& table, const SymbolicExprPrinter& 
       formulas_([this](const Constraint& constraint) { return terms_.comparisons(constraint); }),
       reader_(table, formulas_, terms_),
       rewriting_(formulas_, [this](const Constraint& constraint) { return terms_.comparisons(constraint); }),
+      pruning_(formulas_, [this](const Constraint& constraint) { return terms_.comparisons(constraint); }),
       writer_(table, printer, formulas_, terms_) {}
 
 Formula ShortestForm::simplified(Formula formula) {
@@ -30,6 +35,20 @@ Formula ShortestForm::simplified(Formula formula) {
             break;
         formula = next;
     }
+    return formula;
+}
+
+/// A simplified formula without anything that does not count, as far as atoms are independent.
+Formula ShortestForm::irredundant(Formula formula) {
+    for (std::size_t round = 0; round < limits::shortenRounds; ++round) {
+        const auto pruned = pruning_.pruned(formula);
+        if (pruned == formula)
+            return formula;
+        if (!pruned)
+            break;
+        formula = simplified(*pruned);
+    }
+    isPruned_ = false;
     return formula;
 }
 
@@ -54,7 +73,7 @@ bool ShortestForm::isPlain(Formula formula) const {
     return formulas_.kind(formula) != Kind::Leaf || terms_.isPlain(formulas_.constraint(formula).atom);
 }
 
-/// Puts constants in the places of operands that the known condition decides, or their arithmetic.
+/// Replaces operands by constants that the known condition decides, or their arithmetic.
 Formula ShortestForm::withoutDecided(Formula formula, bool isAnythingKnown) {
     const std::vector<Formula> all = formulas_.below(formula);
     std::vector<Formula> result(all.size());
@@ -145,9 +164,10 @@ bool ShortestForm::considerSums(Formula formula) {
     const auto sum = rewriting_.minimalSum(formula);
     const auto opposite = rewriting_.minimalSum(formulas_.negated(formula));
     if (sum)
-        consider("minimal sum of products, factored", simplified(*sum));
+        consider("minimal sum of products, factored", irredundant(simplified(*sum)));
     if (opposite)
-        consider("minimal product of sums, factored", simplified(formulas_.negated(rewriting_.factored(*opposite))));
+        consider("minimal product of sums, factored",
+                 irredundant(simplified(formulas_.negated(rewriting_.factored(*opposite)))));
     return sum && opposite;
 }
 
@@ -197,6 +217,7 @@ SymbolicExprId ShortestForm::find(SymbolicExprId condition, SymbolicExprId known
     considered_.clear();
     forms_.clear();
     facts_.clear();
+    isPruned_ = true;
     const auto read = reader_.read(condition);
     if (!read) { // too long to look for more than its normal form
         const SymbolicExprId normal = normalForm();
@@ -226,11 +247,12 @@ void ShortestForm::search(SymbolicExprId condition, Formula start, SymbolicExprI
         consider("decided", *decided ? Formulas::yes : Formulas::no);
         return;
     }
+    consider("what does not count left out", irredundant(start));
     const bool complete = considerSums(start);
     const SymbolicExprId normal = normalForm();
     if (const auto other = normal == condition ? std::nullopt : reader_.read(normal))
-        consider("normal form, factored", simplified(other->formula));
-    if (isAnythingKnown || !complete || depends)
+        consider("normal form, factored", irredundant(simplified(other->formula)));
+    if (isAnythingKnown || !complete || depends || !isPruned_)
         shortenByProofs(known);
 }
 

@@ -3,9 +3,10 @@
 // Method: the condition is read as a formula whose leaves are sets of integers (Formulas, ComparedTerms), which joins
 // comparisons of one term.  Constraints are judged by those around them, common operands are taken out.  Where every
 // unknown is then in one comparison, no other form has fewer of them, and the search ends: that is most real
-// conditions.  Otherwise the same is done with a minimal sum of products, with that of the opposite (which is a product
-// of sums) and with the simplifier's normal form, and where comparisons depend on each other through more than sets,
-// operands are taken away one by one with a proof for each.
+// conditions.  Otherwise the same is done with a smallest sum of products, with that of the opposite (which is a
+// product of sums) and with the simplifier's normal form.  What does not count in these forms is found by their truth
+// tables; where those are too large, or comparisons depend on each other through more than sets, operands are taken
+// away one by one with a proof for each.
 //
 // The form with the fewest comparisons, of those the one with the fewest bytes, is proven equal before it is returned.
 //
@@ -14,6 +15,7 @@
 #pragma once
 
 #include "base/decide/shorten/ConditionProofs.hpp"
+#include "base/decide/shorten/FormulaPruning.hpp"
 #include "base/decide/shorten/FormulaReader.hpp"
 #include "base/decide/shorten/FormulaRewriting.hpp"
 #include "base/decide/shorten/FormulaWriter.hpp"
@@ -46,6 +48,7 @@ private:
     };
 
     Formula simplified(Formula formula);
+    Formula irredundant(Formula formula);
     Formula withoutDecided(Formula formula, bool isAnythingKnown);
     void readKnown(SymbolicExprId known);
     [[nodiscard]] bool isReadOnce(Formula formula) const;
@@ -65,8 +68,10 @@ private:
     Formulas formulas_;
     FormulaReader reader_;
     FormulaRewriting rewriting_;
+    FormulaPruning pruning_;
     FormulaWriter writer_;
     AtomFacts facts_;
+    bool isPruned_ = true; ///< every form so far is without redundant operands as far as atoms are independent
     std::vector<Considered> considered_;
     std::vector<ShortForm> forms_;
 };

@@ -1,3 +1,8 @@
+// Prints a condition without what a known one contains or excludes.
+//
+// Facts are literals with a truth value, taken from the known condition's And and from Or below Not.  Each node of the
+// condition is printed as a value, and next to it as what is left of it as a condition.
+// Cost: linear in the distinct nodes of both.
 #include "base/decide/shorten/StringifyImpliedCondition.hpp"
 
 namespace VT {
@@ -12,7 +17,7 @@ StringifyImpliedCondition::StringifyImpliedCondition(const SymbolicExprTable& ta
 
 // What is known.
 
-/// One literal stands for all comparisons that say the same of two operands, and with false for those that deny it.
+/// One literal is used for all comparisons that say the same of two operands, and with false for those that deny it.
 std::pair<StringifyImpliedCondition::Literal, bool> StringifyImpliedCondition::literalOf(SymbolicExprId id,
                                                                                          const SymbolicExpr& node) {
     SymbolicOp op = node.op();
@@ -76,7 +81,7 @@ StringifyImpliedCondition::Verdict StringifyImpliedCondition::verdictOf(Symbolic
     return fact->second == positive ? Verdict::Contained : Verdict::Excluded;
 }
 
-// What is printed.  The stack holds each node as a value; beside it stands what is left of the node as a condition.
+// What is printed.  The stack holds each node as a value; conditions_ holds what is left of it as a condition.
 
 /// What is left of an operand of And, Or or Not.
 StringifyImpliedCondition::Condition StringifyImpliedCondition::operand(SymbolicExprId id,
