@@ -11,6 +11,7 @@
 #include "base/core/Limits.hpp"
 #include "base/core/Nodes.hpp"
 #include "base/core/Operators.hpp"
+#include "base/integer/IntegerSet.hpp"
 #include "base/variants/VariantKeywords.hpp"
 
 #include <boost/unordered_map.hpp>
@@ -23,9 +24,6 @@
 namespace VT {
 
 namespace {
-
-constexpr std::int64_t lowest = std::numeric_limits<std::int64_t>::min();
-constexpr std::int64_t highest = std::numeric_limits<std::int64_t>::max();
 
 /// Whether an expression is a name of an integer: not a truth constant, not a variant keyword.
 bool isName(const SymbolicExprTable& table, SymbolicExprId id) {
@@ -54,20 +52,10 @@ std::optional<NameRange> rangeOf(const SymbolicExprTable& table, SymbolicExprId 
     if (!isName(table, name) || number == nullptr || number->op() != SymbolicOp::IntValue)
         return std::nullopt;
     const std::int64_t value = static_cast<const SymbolicIntValue*>(number)->getValue();
-    switch (op) {
-    case SymbolicOp::Equal:
-        return NameRange{name, value, value};
-    case SymbolicOp::LessThan:
-        return NameRange{name, lowest, value - 1};
-    case SymbolicOp::LessThanEqual:
-        return NameRange{name, lowest, value};
-    case SymbolicOp::GreaterThan:
-        return NameRange{name, value + 1, highest};
-    case SymbolicOp::GreaterThanEqual:
-        return NameRange{name, value, highest};
-    default:
+    const IntegerSet set = IntegerSet::satisfying(op, value);
+    if (set.intervals().size() != 1)
         return std::nullopt;
-    }
+    return NameRange{name, set.intervals().front().low, set.intervals().front().high};
 }
 
 /// Returns the operands of a chain of one operator; nothing where there are more than are looked at.
@@ -149,7 +137,7 @@ std::vector<std::size_t> sortedByRange(const std::vector<NameRanges>& ranges) {
     }
     const auto lowOf = [&](std::size_t position) {
         const auto at = std::ranges::lower_bound(ranges[position], key, {}, &NameRange::name);
-        return at == ranges[position].end() || at->name != key ? highest : at->low;
+        return at == ranges[position].end() || at->name != key ? IntegerSet::plusInfinity : at->low;
     };
     std::vector<std::size_t> sorted(ranges.size());
     std::iota(sorted.begin(), sorted.end(), std::size_t{0});

@@ -71,21 +71,57 @@ inline constexpr double zeroThreshold = 0x1p-26;
 /// may make one more vector as long as the longest; beyond the bound evaluation throws std::length_error.
 inline constexpr std::size_t evaluatedElements = std::size_t{1} << 26U;
 
-/// Steps that one question about conditions may cost: edges of diagrams joined, bounds looked at, nodes evaluated.  At
-/// most about a quarter of a second and 100 MB; real conditions take tens to thousands, ten thousand choices of a set
-/// some hundred thousand.  Beyond the bound the question is undecided.
+/// Steps that one question about conditions may cost: operands read and added up, edges of diagrams joined, literals
+/// propagated, bounds looked at, nodes evaluated.  At most about a quarter of a second and 150 MB; real conditions take
+/// tens to thousands, ten thousand choices of a set some hundred thousand.  Beyond the bound the question is undecided.
 inline constexpr std::uint64_t decisionSteps = std::uint64_t{1} << 21U;
+
+/// Steps that a caller may allow one question: numbers of nodes and edges have 31 bits.  Larger bounds count as this.
+inline constexpr std::uint64_t settableSteps = std::uint64_t{1} << 24U;
+
+/// Slots of an index of diagrams that stay allocated from question to question.  A larger index is freed.
+inline constexpr std::size_t keptSlots = 4096;
+
+/// The largest magnitude of a factor or constant of a linear form of 64 bits; larger ones are big integers.  A path of
+/// differences adds up at most limits::systemUnknowns of them, which leaves every sum within 64 bits.
+inline constexpr std::int64_t formNumber = std::int64_t{1} << 40U;
+inline constexpr std::size_t systemUnknowns = std::size_t{1} << 20U;
+
+/// Floors of floors that are followed to bound one sum; the bits of a mask take 62.  A deeper one is unbounded.
+inline constexpr int nestedFloors = 64;
+
+/// Constraints that one elimination of the Omega test may add while problems are split along variables.  A variable
+/// that adds more is split instead.
+inline constexpr std::int64_t eliminationGrowth = 2;
 
 /// Steps of the further questions of a comparison after one that used up its own, so that a hard pair costs little more
 /// than one question.
 inline constexpr std::uint64_t furtherSteps = std::uint64_t{1} << 17U;
 
-/// Edges of diagrams that are kept between questions, 16 bytes each.  When there are more, all are thrown away before
-/// the next question, which builds anew what it needs.
-inline constexpr std::size_t diagramEdges = std::size_t{1} << 22U;
+/// The part of a question's steps that decision diagrams may take, one in so many, and what they may take in any case.
+/// Beyond the bound a search over the comparisons decides the question with what is left.
+inline constexpr std::uint64_t diagramShare = 2;
+inline constexpr std::uint64_t diagramSteps = std::uint64_t{1} << 12U;
+
+/// Steps to find the smallest witness of a question that is decided.  Beyond the bound, which is lower for questions
+/// that were easy to decide, the smallest found so far is reported.
+inline constexpr std::uint64_t witnessSteps = std::uint64_t{1} << 19U;
+
+/// Numbers and references in the circuits of conditions that are kept between questions, 4 to 8 bytes each.  When there
+/// are more, all are thrown away before the next question, which reads anew what it needs.
+inline constexpr std::size_t circuitSize = std::size_t{1} << 22U;
 
 /// Cases of one arithmetic term that truth values take part in.  A term with more is an unknown of its own.
 inline constexpr std::size_t termCases = 64;
+
+/// Bits of a number in an arithmetic term, and places that a shift to the left moves one.  A term with larger numbers
+/// is an unknown of its own.  Two real literals and their product fit.
+inline constexpr unsigned formBits = 4096;
+
+/// Steps that making a solution of linear constraints small may cost: so many, and so many times what finding it took.
+/// Beyond them the witness is not the smallest.
+inline constexpr std::uint64_t minimizingSteps = 20000;
+inline constexpr std::uint64_t minimizingFactor = 8;
 
 /// Assignments tried to confirm a witness where arithmetic is not understood.  Beyond the bound the question is
 /// undecided.
@@ -135,6 +171,16 @@ inline constexpr std::size_t impliedNodes = std::size_t{1} << 16U;
 inline constexpr std::size_t impliedOperands = 8;
 inline constexpr std::size_t impliedLiterals = 12;
 
+/// Steps that the search for the reasons of one answer may cost: about an eighth of a second.  Beyond the bound what is
+/// left of the premises is reported, not known to be minimal.
+inline constexpr std::uint64_t reasonSteps = std::uint64_t{1} << 20U;
+
+/// Steps that a node interned during that search counts for, so that the steps bound memory too.
+inline constexpr std::uint64_t reasonNodeSteps = 16;
+
+/// Operands of a premise that reasons are looked for among.  A premise with more is one reason as a whole.
+inline constexpr std::size_t reasonOperands = 4096;
+
 /// Steps that the checks of all choice sets of a model may cost together: about half a minute.  Beyond the bound what
 /// is left is undecided.
 inline constexpr std::uint64_t choiceSteps = std::uint64_t{1} << 28U;
@@ -148,6 +194,28 @@ inline constexpr std::size_t rangeOperands = 64;
 
 /// Operands of a choice's condition up to which a redundant one is looked for.
 inline constexpr std::size_t choiceOperands = 64;
+
+/// Steps of the search for the smallest set of choices whose removal ends all overlaps: cases distinguished, each
+/// looked at with all pairs.  Beyond the bound the smallest set found so far is reported, not known to be the smallest.
+inline constexpr std::size_t removalCases = std::size_t{1} << 12U;
+
+/// Earlier choices that a choice is compared with one by one where the first one counts.  More of them are one
+/// condition, of which it is not said which choices hide the later one.
+inline constexpr std::size_t hidingChoices = 256;
+
+/// Unions of choices that are tried to be written as one product.  Further ones are not tried.
+inline constexpr std::size_t choiceMerges = 4096;
+
+/// Choices joined at once in the hope that they are one product, where fewer of them are none.
+inline constexpr std::size_t mergeAhead = 4;
+
+/// Assignments that are evaluated to count those of one condition; values that no comparison distinguishes count as
+/// one. A condition with more is not counted.
+inline constexpr std::size_t countedAssignments = std::size_t{1} << 14U;
+
+/// Nodes that are evaluated to count the assignments of all choices of a set: about half a second.  What is left is not
+/// counted.
+inline constexpr std::uint64_t countedNodes = std::uint64_t{1} << 22U;
 
 /// Steps that decisions about the conditions of one source file may cost: a number for each file, and one for each
 /// condition as it is read.  Real conditions take some hundred, those of long chains over one macro some thousand.
@@ -182,7 +250,7 @@ inline constexpr std::size_t macroNamesFollowed = 1024;
 /// Raw strings without an end in one file that are searched to the end of the file.  Further ones are ordinary strings.
 inline constexpr unsigned endlessRawStrings = 8;
 
-/// Characters of an identifier that the symbol registry makes for generated code: what C99 compilers tell apart.  Longer
+/// Characters of an identifier that the symbol registry makes for generated code: what C99 compilers tell apart. Longer
 /// ones are cut and numbered.
 inline constexpr std::size_t identifierLength = 63;
 

@@ -1,129 +1,316 @@
 // Reads arithmetic inside conditions: as linear forms where it is linear, otherwise as one unknown for each node.
 //
-// A sum or a product by a constant combines forms, guarded case by guarded case. Any other operator on constants is
-// computed. What remains becomes an unknown with the bounds that its operator implies (`a % 8` lies in -7..7, `a & 6`
-// is made of the bits 6) and with what its operands say about 0.
+// A sum or a product by a constant combines forms, guarded case by guarded case. A quotient by a constant, cut toward
+// zero, is a floor on each side of 0, and a remainder is what the quotient leaves. For a 32-bit value, the bits from i
+// to j are 2^i * floor(value / 2^i) - 2^j * floor(value / 2^j) in two's complement, whatever the sign (Warren,
+// "Hacker's Delight", 2012); a mask is the sum of its runs of ones, and | and ^ follow from &. Any other operator on
+// constants is computed. What remains becomes an unknown with what its operands say about 0.
+//
+// Floors are reduced, so that one floor has one unknown: whole multiples of the divisor are taken out of it, common
+// divisors cancel, of its opposite directions one is used, and a floor of one floor is one floor.
 #include "base/core/Limits.hpp"
 #include "base/decide/ConditionReader.hpp"
 #include "base/integer/ExactArithmetic.hpp"
+#include "base/integer/IntegerSet.hpp"
 
 #include <algorithm>
-#include <cstdlib>
+#include <cmath>
+#include <limits>
 
 namespace VT {
 
-/// `a op b` where it is linear again.
-std::optional<LinearForm> ConditionReader::combined(SymbolicOp op, const LinearForm& a, const LinearForm& b) const {
-    switch (op) {
-    case SymbolicOp::Plus:
-        return combine(a, 1, b, 1);
-    case SymbolicOp::Minus:
-        return combine(a, 1, b, -1);
-    case SymbolicOp::Multiply:
-        if (a.isConstant() || b.isConstant())
-            return a.isConstant() ? combine(b, a.constant, {}, 0) : combine(a, b.constant, {}, 0);
-        return std::nullopt;
-    default:
-        break;
-    }
-    if (!a.isConstant() || !b.isConstant())
-        return std::nullopt;
-    const auto value = integerResult(op, a.constant, b.constant);
-    return value && isWithinBound(*value) ? std::optional(LinearForm{{}, *value}) : std::nullopt;
+namespace {
+
+constexpr std::int64_t int32Minimum = std::numeric_limits<std::int32_t>::min();
+constexpr std::int64_t int32Maximum = std::numeric_limits<std::int32_t>::max();
+constexpr OperatorSet bitOps{SymbolicOp::BitAnd, SymbolicOp::BitOr, SymbolicOp::BitXOr};
+
+/// A constant as an operand of 32 bits.
+std::optional<std::int64_t> bitsOf(const RationalForm& form) {
+    const LinearForm* small = form.small();
+    const bool fits = small != nullptr && small->isConstant() && fitsInt(small->constant);
+    return fits ? std::optional(small->constant) : std::nullopt;
 }
+
+} // namespace
 
 ConditionReader::Value ConditionReader::arithmetic(const Frame& frame) {
     const SymbolicOp op = frame.node->op();
     const std::size_t count = operands_.size() - frame.firstOperand;
-    if (op == SymbolicOp::UnaryMinus && operand(frame, 0).kind == Value::Kind::Real)
-        return {Value::Kind::Real, never, -operand(frame, 0).real, {}, {}};
-    for (std::size_t i = 0; i < count; ++i)
-        if (operand(frame, i).kind == Value::Kind::Real || operand(frame, i).kind == Value::Kind::RealTerm)
-            return {Value::Kind::RealTerm, never, 0, {}, {}};
+    bool isReal = false;
+    for (std::size_t i = 0; i < count; ++i) {
+        if (operand(frame, i).kind == Value::Kind::RealTerm)
+            return {Value::Kind::RealTerm};
+        isReal = isReal || operand(frame, i).isReal || operand(frame, i).kind == Value::Kind::Real;
+    }
     if (count == 0 || count > 2)
-        return boundedTerm(frame);
+        return opaque(frame);
+    if (op == SymbolicOp::UnaryMinus && operand(frame, 0).kind == Value::Kind::Real)
+        return ofReal(-operand(frame, 0).real);
+    if (count == 2 && isReal)
+        if (auto folded = ofLiterals(op, operand(frame, 0), operand(frame, 1)))
+            return *std::move(folded);
+    for (std::size_t i = 0; i < count; ++i)
+        if (!std::isfinite(operand(frame, i).real))
+            return {Value::Kind::RealTerm};
+    Value value{Value::Kind::Number};
+    value.isReal = isReal;
     const Cases left = casesOf(operand(frame, 0));
     const Cases right = count == 2 ? casesOf(operand(frame, 1)) : Cases{};
-    Value value{Value::Kind::Number, never, 0, {}, {}};
+    bool isLinear = count == 2 || op == SymbolicOp::UnaryMinus || !isReal;
     for (const Case& x : left) {
-        if (count == 1) {
-            const bool minus = op == SymbolicOp::UnaryMinus;
-            const auto bits = !minus && x.form.isConstant() ? integerResult(op, x.form.constant) : std::nullopt;
-            const auto form = minus  ? combine(x.form, -1, {}, 0)
-                              : bits ? std::optional(LinearForm{{}, *bits})
-                                     : std::nullopt;
-            if (!form)
-                return boundedTerm(frame);
-            addCase(value.cases, x.guard, *form);
-        }
+        if (count == 1)
+            isLinear = isLinear && addUnary(value.cases, op, x);
         for (const Case& y : right) {
-            steps_.take();
-            const auto form = combined(op, x.form, y.form);
-            if (!form || value.cases.size() >= limits::termCases)
-                return boundedTerm(frame);
-            addCase(value.cases, diagrams_.both(x.guard, y.guard), *form);
+            steps_.take(1 + (x.form.size() + y.form.size()) / partsPerStep);
+            isLinear = isLinear && value.cases.size() < limits::termCases &&
+                       addBinary(value.cases, op, circuit_.both(x.guard, y.guard), x.form, y.form, isReal);
         }
+        if (!isLinear)
+            return isReal ? Value{Value::Kind::RealTerm} : opaque(frame);
     }
     return value;
 }
 
-std::optional<std::int64_t> ConditionReader::constantOf(const Value& value) const {
-    const bool one = value.kind == Value::Kind::Number && value.cases.size() == 1;
-    return one && value.cases[0].form.isConstant() ? std::optional(value.cases[0].form.constant) : std::nullopt;
+/// Two literals, one of them a real number, rounded as they are folded.
+std::optional<ConditionReader::Value> ConditionReader::ofLiterals(SymbolicOp op, const Value& a, const Value& b) const {
+    const auto literal = [&](const Value& value) -> std::optional<double> {
+        if (value.kind == Value::Kind::Real)
+            return value.real;
+        const auto constant = value.isReal ? std::nullopt : constantOf(value);
+        const LinearForm* small = constant ? constant->small() : nullptr;
+        return small != nullptr ? std::optional(static_cast<double>(small->constant)) : std::nullopt;
+    };
+    const auto left = literal(a);
+    const auto right = literal(b);
+    const auto folded = left && right ? foldedReals(op, *left, *right) : std::nullopt;
+    return folded ? std::optional(ofReal(*folded)) : std::nullopt;
 }
 
-/// An unknown of its own for a node, within what the operator can give.
-ConditionReader::Value ConditionReader::boundedTerm(const Frame& frame) {
-    const SymbolicOp op = frame.node->op();
-    std::int64_t low = minusInfinite;
-    std::int64_t high = plusInfinite;
-    if (op == SymbolicOp::Modulo) {
-        if (const auto divisor = constantOf(operand(frame, 1)); divisor && *divisor != 0) {
-            high = std::abs(*divisor) - 1;
-            low = -high;
+bool ConditionReader::addUnary(Cases& cases, SymbolicOp op, const Case& a) {
+    std::optional<RationalForm> form;
+    if (op == SymbolicOp::UnaryMinus)
+        form = combine(a.form, -1, {}, 0);
+    if (op == SymbolicOp::BitCompl && (!a.form.isConstant() || bitsOf(a.form))) { // -a - 1
+        requireBits(a.guard, a.form);
+        form = combine(a.form, -1, LinearForm{{}, -1}, 1);
+    }
+    if (form)
+        addCase(cases, a.guard, *form);
+    return form.has_value();
+}
+
+/// Adds `a op b` where the guard holds; false where that is not linear.
+bool ConditionReader::addBinary(Cases& cases, SymbolicOp op, Gate guard, const RationalForm& a, const RationalForm& b,
+                                bool isReal) {
+    if (guard == never)
+        return true;
+    const bool isQuotient = op == SymbolicOp::Divide || op == SymbolicOp::Modulo;
+    const bool isShift = op == SymbolicOp::ShiftLeft || op == SymbolicOp::ShiftRight;
+    std::optional<RationalForm> form;
+    if (a.isConstant() && b.isConstant())
+        form = exactResult(op, a, b, isReal);
+    else if (op == SymbolicOp::Plus || op == SymbolicOp::Minus)
+        form = combine(a, 1, b, op == SymbolicOp::Plus ? 1 : -1);
+    else if (op == SymbolicOp::Multiply && (a.isConstant() || b.isConstant()))
+        form = a.isConstant() ? multiply(b, a) : multiply(a, b);
+    else if (isReal)
+        form = op == SymbolicOp::Divide && b.isConstant() && b.sign() != 0 ? divide(a, b) : std::nullopt;
+    else if (isQuotient && b.isConstant() && b.sign() != 0)
+        return addQuotient(cases, op, guard, a, b);
+    else if ((bitOps.contains(op) || isShift) && bitsOf(b))
+        return addBits(cases, op, guard, a, *bitsOf(b));
+    else if (bitOps.contains(op) && bitsOf(a))
+        return addBits(cases, op, guard, b, *bitsOf(a));
+    if (form)
+        addCase(cases, guard, *form);
+    return form.has_value();
+}
+
+/// A quotient is cut toward zero: a floor of what is not negative, the opposite of a floor elsewhere.
+bool ConditionReader::addQuotient(Cases& cases, SymbolicOp op, Gate guard, const RationalForm& a,
+                                  const RationalForm& b) {
+    const BigInteger divisor = b.integer().value();
+    const BigInteger magnitude = abs(divisor);
+    const Gate notNegative = compare(SymbolicOp::GreaterThanEqual, a);
+    for (const int sign : {1, -1}) {
+        const Gate side = circuit_.both(guard, sign > 0 ? notNegative : opposite(notNegative));
+        if (side == never)
+            continue;
+        const auto positive = combine(a, sign, {}, 0);
+        const auto whole = positive ? floor(*positive, magnitude) : std::nullopt;
+        auto form = whole ? scale(*whole, op == SymbolicOp::Modulo ? magnitude : BigInteger(divisor.sign()),
+                                  sign) // of Modulo: what is taken from a
+                          : std::nullopt;
+        if (form && op == SymbolicOp::Modulo)
+            form = combine(a, 1, *form, -1);
+        if (!form)
+            return false;
+        addCase(cases, side, *form);
+    }
+    return true;
+}
+
+/// Restricts a condition to values whose bits can be taken.
+void ConditionReader::requireBits(Gate guard, const RationalForm& form) {
+    const auto above = combine(form, 1, LinearForm{{}, -int32Maximum}, 1);
+    const auto below = combine(form, 1, LinearForm{{}, -int32Minimum}, 1);
+    if (!above || !below) // beyond all limits
+        return;
+    const Gate within =
+        circuit_.both(compare(SymbolicOp::LessThanEqual, *above), compare(SymbolicOp::GreaterThanEqual, *below));
+    defined_ = circuit_.both(defined_, circuit_.either(opposite(guard), within));
+}
+
+/// A mask or a shift by a constant; a shift to the left is a product of any size.
+bool ConditionReader::addBits(Cases& cases, SymbolicOp op, Gate guard, const RationalForm& form,
+                              std::int64_t constant) {
+    std::optional<RationalForm> bits;
+    if (bitOps.contains(op)) {
+        requireBits(guard, form);
+        bits = masked(form, constant);
+        const RationalForm mask(LinearForm{{}, constant});
+        if (bits && op != SymbolicOp::BitAnd) { // a | m is a + m - (a & m), a ^ m is a + m - 2 * (a & m)
+            const auto sum = combine(form, 1, mask, 1);
+            bits = sum ? combine(*sum, 1, *bits, op == SymbolicOp::BitOr ? -1 : -2) : std::nullopt;
         }
-    } else if (op == SymbolicOp::BitAnd) {
-        for (const std::size_t at : {0U, 1U}) {
-            if (const auto mask = constantOf(operand(frame, at)); mask && *mask >= 0) {
-                low = 0;
-                high = std::min(high, *mask);
-            }
+    } else {
+        const std::int64_t distance = op == SymbolicOp::ShiftLeft ? constant : -constant;
+        if (distance > static_cast<std::int64_t>(limits::formBits))
+            return false;
+        const auto places = static_cast<unsigned>(distance >= 0 ? distance : std::min<std::int64_t>(-distance, 31));
+        const BigInteger factor = BigInteger(1) << places;
+        if (distance < 0)
+            requireBits(guard, form);
+        bits = distance < 0 ? floor(form, factor) : scale(form, factor, 1);
+    }
+    if (bits)
+        addCase(cases, guard, *bits);
+    return bits.has_value();
+}
+
+std::optional<RationalForm> ConditionReader::masked(const RationalForm& form, std::int64_t mask) {
+    if (mask < 0) {                              // all but the other bits
+        const auto others = masked(form, ~mask); // NOLINT(misc-no-recursion): once
+        return others ? combine(form, 1, *others, -1) : std::nullopt;
+    }
+    std::optional<RationalForm> sum = RationalForm();
+    bool inside = false;
+    for (unsigned bit = 0; sum && bit < 32; ++bit) { // bit 31 of a mask is 0 and ends its last run
+        const bool next = (static_cast<std::uint64_t>(mask) >> bit & 1U) != 0;
+        if (next != inside) {
+            const BigInteger power = BigInteger(1) << bit;
+            const auto above = floor(form, power);
+            const auto part = above ? scale(*above, next ? power : BigInteger(-power), 1) : std::nullopt;
+            sum = part ? combine(*sum, 1, *part, 1) : std::nullopt;
         }
-        if (low == 0) {
-            Value value = term(frame.id, low, high);
-            unknowns_.setMask(value.cases.front().form.parts.front().unknown, high);
-            return zeroTested(frame, std::move(value));
+        inside = next;
+    }
+    return sum;
+}
+
+/// Whether a sum is replaced by its opposite, so that one of the two is in use: factors add up to more than 0, or else
+/// the first that is met is positive.  Neither names nor what was read before have a say in it.
+bool ConditionReader::isOpposed(std::span<const WidePart> parts) {
+    BigInteger total = 0;
+    for (const WidePart& part : parts)
+        total += part.factor;
+    if (total != 0 || parts.empty())
+        return total < 0;
+    for (const Unknown unknown : met_) {
+        steps_.take();
+        const auto part = std::ranges::lower_bound(parts, unknown, {}, &WidePart::unknown);
+        if (part != parts.end() && part->unknown == unknown)
+            return part->factor < 0;
+    }
+    return false;
+}
+
+/// The whole part of a form of integers divided by a positive constant.
+std::optional<RationalForm> ConditionReader::floor(const RationalForm& form, const BigInteger& divisor) {
+    if (divisor == 1)
+        return form;
+    const WideForm wide = form.widened();
+    steps_.take(wide.parts.size() + 1);
+    WideForm whole;
+    FloorOf rest{{}, divisor};
+    BigInteger common = divisor;
+    for (const WidePart& part : wide.parts) {
+        BigInteger quotient = VT::floorDivide(BigInteger(2 * part.factor + divisor - 1), BigInteger(2 * divisor));
+        const BigInteger remainder = part.factor - quotient * divisor; // at most half the divisor, up or down
+        if (quotient != 0)
+            whole.parts.push_back({part.unknown, std::move(quotient)});
+        if (remainder == 0)
+            continue;
+        rest.form.parts.push_back({part.unknown, remainder});
+        common = gcd(common, remainder);
+    }
+    // floor((c * r + k) / (c * d)) = floor((r + floor(k / c)) / d)
+    rest.form.constant = VT::floorDivide(wide.constant, common);
+    rest.divisor /= common;
+    for (WidePart& part : rest.form.parts)
+        part.factor /= common;
+    const bool opposed = isOpposed(rest.form.parts);
+    if (opposed) { // floor(f / d) = -floor((-f + d - 1) / d)
+        for (WidePart& part : rest.form.parts)
+            part.factor = -part.factor;
+        rest.form.constant = rest.divisor - 1 - rest.form.constant;
+    }
+    const int sign = opposed ? -1 : 1;
+    const BigInteger shift = VT::floorDivide(rest.form.constant, rest.divisor);
+    rest.form.constant -= shift * rest.divisor;
+    whole.constant = shift * sign;
+    if (rest.form.parts.empty())
+        return scale(RationalForm(std::move(whole)), 1, 1);
+    if (rest.form.parts.size() == 1 && rest.form.parts.front().factor == 1 &&
+        isFloor(rest.form.parts.front().unknown)) { // floor((floor(f / d) + k) / e) = floor((f + k * d) / (d * e))
+        const FloorOf& inner = *unknowns_[rest.form.parts.front().unknown].floor;
+        BigInteger product = inner.divisor * rest.divisor;
+        if (msb(product) < limits::formBits) {
+            BigInteger constant = inner.form.constant + rest.form.constant * inner.divisor;
+            rest = {inner.form, std::move(product)};
+            rest.form.constant = std::move(constant);
         }
     }
-    return zeroTested(frame, term(frame.id, low, high));
+    const Unknown unknown = unknowns_.floor(std::move(rest));
+    met_.push_back(unknown);
+    return combine(RationalForm(std::move(whole)), 1, LinearForm{{{unknown, 1}}, 0}, sign);
 }
 
-/// Adds what is known of where a term is 0: a product where a factor is, bits joined by | where all are, bits joined by
-/// & at least where an operand is.
-ConditionReader::Value ConditionReader::zeroTested(const Frame& frame, Value value) {
+std::optional<RationalForm> ConditionReader::constantOf(const Value& value) const {
+    const bool one = value.kind == Value::Kind::Number && value.cases.size() == 1;
+    return one && value.cases[0].form.isConstant() ? std::optional(value.cases[0].form) : std::nullopt;
+}
+
+/// An unknown of its own for a node. A product is 0 where a factor is, bits joined by | where all are, bits joined by &
+/// at least where an operand is.
+ConditionReader::Value ConditionReader::opaque(const Frame& frame) {
     const SymbolicOp op = frame.node->op();
+    Value value = term(frame.id);
     if (op != SymbolicOp::Multiply && op != SymbolicOp::BitOr && op != SymbolicOp::BitAnd)
         return value;
-    const Diagram a = truthOf(operands_[frame.firstOperand]);
-    const Diagram b = truthOf(operands_[frame.firstOperand + 1]);
+    const Gate a = truthOf(operands_[frame.firstOperand]);
+    const Gate b = truthOf(operands_[frame.firstOperand + 1]);
     if (op == SymbolicOp::BitOr) {
-        value.nonZero = diagrams_.either(a, b);
+        value.nonZero = circuit_.either(a, b);
         return value;
     }
-    const Diagram both = diagrams_.both(a, b);
+    const Gate both = circuit_.both(a, b);
     if (op == SymbolicOp::Multiply) {
         value.nonZero = both;
         return value;
     }
-    Value cases{Value::Kind::Number, never, 0, {}, {}};
+    Value cases{Value::Kind::Number};
     addCase(cases.cases, both, value.cases.front().form);
     addCase(cases.cases, opposite(both), {});
     return cases;
 }
 
-ConditionReader::Value ConditionReader::term(SymbolicExprId node, std::int64_t low, std::int64_t high) {
-    Value value{Value::Kind::Number, never, 0, {}, {}};
-    value.cases.push_back({always, {{{unknowns_.term(node, low, high), 1}}, 0}});
+ConditionReader::Value ConditionReader::term(SymbolicExprId node) {
+    Value value{Value::Kind::Number};
+    const Unknown unknown = unknowns_.term(node, minusInfinite, plusInfinite);
+    met_.push_back(unknown);
+    value.cases.push_back({always, LinearForm{{{unknown, 1}}, 0}});
     return value;
 }
 

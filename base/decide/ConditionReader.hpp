@@ -1,19 +1,21 @@
-// From nodes to diagrams.
+// From nodes to circuits.
 //
 // A node is read as a truth value, or as a number: a list of cases, each a linear form that is the node's value where
 // the case's guard holds.  So A + (B == 1) is A + 1 where B == 1 and A elsewhere, and (A == 1) == (B == 2) needs no
-// rule of its own.  A comparison of two linear forms restricts one quantity: an unknown, the difference of two, or else
-// a sum as an unknown of its own.  Arithmetic that is not linear is an unknown of its own for each node.  What real
-// literals take part in, but for a comparison with one, is a truth value of its own for each comparison.
+// rule of its own.  A quotient by a constant is a floor where it is not negative and the opposite of one elsewhere; the
+// bits of a mask and shifts to the right are floors of divisions by powers of two.  Real literals are exact fractions.
+// A comparison of two linear forms restricts one quantity: an unknown, the difference of two, or else a sum as an
+// unknown of its own.  Arithmetic that is not linear is an unknown of its own for each node, and where a real number
+// takes part in it, a truth value of its own for each comparison.
 //
-// Cost: linear in the distinct nodes, plus what the diagrams cost.  Cases multiply; beyond limits::termCases a term
+// Cost: linear in the distinct nodes, plus what the circuits cost.  Cases multiply; beyond limits::termCases a term
 // becomes an unknown of its own.  Chains of && and || are read as a whole, so that their operands are joined in pairs.
 #pragma once
 
 #include "base/core/Nodes.hpp"
 #include "base/decide/Decision.hpp"
 #include "base/decide/LeafReader.hpp"
-#include "base/decide/diagram/Diagrams.hpp"
+#include "base/decide/circuit/Circuit.hpp"
 
 #include <boost/container/small_vector.hpp>
 
@@ -34,33 +36,43 @@ struct UnknownLeaf {
 [[nodiscard]] bool comesBefore(const Unknowns& unknowns, const UnknownLeaf& a, const UnknownLeaf& b);
 
 struct ReadCondition {
-    Diagram truth = never;
+    Gate truth = never;
+    Gate defined = always; ///< where bits are taken of 32-bit values only; the condition has no value elsewhere
     DecisionBound bound = DecisionBound::None; ///< why it could not be read
     std::vector<UnknownLeaf> leaves;           ///< in the order of their texts
+    std::vector<Unknown> met;                  ///< in the order in which they are met when the condition is read aloud
+    std::vector<SymbolicExprId> calls;         ///< leaves that are functions of their arguments
 };
 
 class ConditionReader {
 public:
-    ConditionReader(const LeafReader& leaves, Unknowns& unknowns, Diagrams& diagrams, Steps& steps);
+    ConditionReader(const LeafReader& leaves, Unknowns& unknowns, Circuit& circuit, Steps& steps);
 
     /// Throws StepsUsedUp.
     ReadCondition read(SymbolicExprId condition);
+    /// That two calls of one function, which are leaves of conditions, have equal values where their arguments are
+    /// equal.
+    ReadCondition readCongruence(SymbolicExprId a, SymbolicExprId b);
 
 private:
+    /// Adding up a part of a sum is that much cheaper than joining an edge of diagrams.
+    static constexpr std::size_t partsPerStep = 8;
+
     /// The form's value where the guard holds.
     struct Case {
-        Diagram guard;
-        LinearForm form;
+        Gate guard;
+        RationalForm form;
     };
 
     using Cases = boost::container::small_vector<Case, 1>;
 
     struct Value {
-        enum class Kind : std::uint8_t { Truth, Number, Real, RealTerm } kind;
-        Diagram truth = never;
+        enum class Kind : std::uint8_t { Truth, Number, Real, RealTerm } kind; ///< Real is a literal
+        Gate truth = never;
         double real = 0;
-        Cases cases;
-        std::optional<Diagram> nonZero; ///< where a number is known to differ from 0, beside what its cases say
+        Cases cases = {};
+        std::optional<Gate> nonZero = {}; ///< where a number is known to differ from 0, beside what its cases say
+        bool isReal = false;              ///< whether a number is real: its quotients are exact
     };
 
     struct Frame {
@@ -76,6 +88,9 @@ private:
         return valueOf(operands_[frame.firstOperand + at]);
     }
 
+    void begin();
+    void walk(SymbolicExprId root);
+    void finish(ReadCondition& result);
     bool enter(SymbolicExprId id);
     bool isWhole(SymbolicExprId id);
     void collectChain(SymbolicOp op, SymbolicExprId root);
@@ -84,38 +99,55 @@ private:
     Value compute(const Frame& frame);
     Value chain(const Frame& frame);
     Value comparison(const Frame& frame);
+    std::optional<Gate> compared(SymbolicOp op, const Value& a, const Value& b);
     Value arithmetic(const Frame& frame);
-    Value term(SymbolicExprId node, std::int64_t low, std::int64_t high);
-    Value boundedTerm(const Frame& frame);
-    Value zeroTested(const Frame& frame, Value value);
-    [[nodiscard]] std::optional<std::int64_t> constantOf(const Value& value) const;
-    std::optional<LinearForm> combined(SymbolicOp op, const LinearForm& a, const LinearForm& b) const;
+    bool isOpposed(std::span<const WidePart> parts);
+    Value term(SymbolicExprId node);
+    Value opaque(const Frame& frame);
+    std::optional<Value> ofLiterals(SymbolicOp op, const Value& a, const Value& b) const;
+    bool addUnary(Cases& cases, SymbolicOp op, const Case& a);
+    bool addBinary(Cases& cases, SymbolicOp op, Gate guard, const RationalForm& a, const RationalForm& b, bool isReal);
+    bool addQuotient(Cases& cases, SymbolicOp op, Gate guard, const RationalForm& a, const RationalForm& b);
+    bool addBits(Cases& cases, SymbolicOp op, Gate guard, const RationalForm& form, std::int64_t constant);
+    std::optional<RationalForm> floor(const RationalForm& form, const BigInteger& divisor);
+    std::optional<RationalForm> masked(const RationalForm& form, std::int64_t mask);
+    void requireBits(Gate guard, const RationalForm& form);
+    [[nodiscard]] std::optional<RationalForm> constantOf(const Value& value) const;
 
-    Diagram truthOf(SymbolicExprId id);
+    Gate truthOf(SymbolicExprId id);
+    Gate ownTruth(SymbolicExprId id);
     Cases casesOf(const Value& value) const;
-    void addCase(Cases& cases, Diagram guard, const LinearForm& form);
+    void addCase(Cases& cases, Gate guard, const RationalForm& form);
     /// Where `form op 0` holds.
-    Diagram compare(SymbolicOp op, const LinearForm& form);
+    Gate compare(SymbolicOp op, const RationalForm& form);
     /// The same for the three operators that the others are the opposites of.
-    Diagram compareDirectly(SymbolicOp op, const LinearForm& form);
-    std::optional<Diagram> compareReal(SymbolicOp op, const LinearForm& form, double real);
+    Gate compareDirectly(SymbolicOp op, const RationalForm& form);
+    Gate compareSmall(SymbolicOp op, const LinearForm& form);
+    Gate compareWide(SymbolicOp op, WideForm form);
 
-    static Value ofTruth(Diagram truth) { return {Value::Kind::Truth, truth, 0, {}, {}}; }
+    [[nodiscard]] bool isFloor(Unknown unknown) const { return unknowns_[unknown].kind == UnknownKind::Floor; }
+
+    static Value ofTruth(Gate truth) { return {Value::Kind::Truth, truth}; }
+
+    static Value ofReal(double real) { return {Value::Kind::Real, never, real}; }
 
     static Value ofNumber(std::int64_t number);
 
     const LeafReader& leafReader_;
     const SymbolicExprTable& table_;
     Unknowns& unknowns_;
-    Diagrams& diagrams_;
+    Circuit& circuit_;
     Steps& steps_;
     IdMap<std::uint32_t> read_; ///< node to position in values_
     IdMap<bool> whole_;         ///< nodes below which no operand is missing
     std::vector<Value> values_;
     std::vector<Frame> frames_;
     std::vector<SymbolicExprId> operands_;
-    std::vector<Diagram> folded_;
+    std::vector<Gate> folded_;
     std::vector<UnknownLeaf> leaves_;
+    std::vector<Unknown> met_;
+    std::vector<SymbolicExprId> calls_;
+    Gate defined_ = always;
     bool missing_ = false;
 };
 

@@ -1,11 +1,16 @@
-// Questions are asked of two kinds of diagrams: those of conditions, which are read once and kept, and those that a
-// question makes of them (a && !b).  All questions come down to whether one diagram can hold.  A question is charged
-// what reading its conditions cost even where they were read before, and the And of two diagrams is remembered within a
-// question only: that makes answers, undecided ones too, independent of earlier questions, for the price of some work
-// done again.
+// Conditions are read into a circuit, once, which is kept.  A question makes of them what has to hold (a && !b), which
+// the circuit simplifies while it is made: conditions that share operands are often decided by that.  What is left gets
+// its levels in the order in which the question mentions them, and is decided by the first of three ways that can: a
+// look at the comparisons, where they are independent; diagrams, for a share of the steps; a search over the
+// comparisons.  A question is charged what reading its conditions cost even where they were read before: that makes
+// answers, undecided ones too, independent of earlier questions.
 #include "base/decide/Decider.hpp"
 
+#include "base/core/Limits.hpp"
 #include "base/decide/ConditionReader.hpp"
+#include "base/decide/circuit/Question.hpp"
+#include "base/decide/search/ConditionSearch.hpp"
+#include "base/decide/witness/CallCongruence.hpp"
 #include "base/decide/witness/WitnessSearch.hpp"
 
 #include <boost/container/small_vector.hpp>
@@ -18,23 +23,24 @@ namespace VT {
 
 namespace {
 
-/// Numbers of nodes and edges have 31 bits.
-constexpr std::uint64_t mostSteps = std::uint64_t{1} << 24U;
-static_assert(limits::decisionSteps <= mostSteps);
+// Numbers of nodes and edges have 31 bits.
+static_assert(limits::decisionSteps <= limits::settableSteps);
 
 } // namespace
 
 struct Decider::State {
     State(const SymbolicExprTable& symbols, const DecisionOptions& asked)
-        : options{asked.keywordsInForce, asked.bits32, std::min(asked.steps, mostSteps)},
+        : options{asked.keywordsInForce, asked.bits32, std::min(asked.steps, limits::settableSteps)},
           questionSteps(options.steps),
           printer(symbols, false),
           leafReader(symbols, asked.keywordsInForce),
           unknowns(symbols, printer, asked.bits32 ? std::numeric_limits<std::int32_t>::min() : minusInfinite,
                    asked.bits32 ? std::numeric_limits<std::int32_t>::max() : plusInfinite),
-          diagrams(unknowns, steps),
-          reader(leafReader, unknowns, diagrams, steps),
-          search(leafReader, unknowns, diagrams, steps) {}
+          circuit(unknowns, steps),
+          reader(leafReader, unknowns, circuit, steps),
+          diagrams(steps),
+          witnesses(leafReader, unknowns, diagrams, steps),
+          search(unknowns, witnesses, steps) {}
 
     struct Read {
         ReadCondition condition;
@@ -45,9 +51,12 @@ struct Decider::State {
 
     const Read& read(SymbolicExprId id);
     bool isReadable(SymbolicExprId id);
-    const Leaves& leavesOf(std::span<const Read* const> conditions);
+    const Leaves& leavesOf(std::span<const ReadCondition* const> conditions);
+    Decision hold(Gate truth, std::span<const ReadCondition* const> conditions);
+    void keepFunctions(Decision& decision, Gate truth, std::span<const ReadCondition* const> conditions);
     template <class Combine>
     Decision decide(std::span<const SymbolicExprId> ids, Combine combine);
+    Decision same();
     void clear();
 
     DecisionOptions options;
@@ -56,9 +65,12 @@ struct Decider::State {
     LeafReader leafReader;
     Steps steps;
     Unknowns unknowns;
-    Diagrams diagrams;
+    Circuit circuit;
     ConditionReader reader;
-    WitnessSearch search;
+    Question question;
+    Diagrams diagrams;
+    WitnessSearch witnesses;
+    ConditionSearch search;
     IdMap<std::unique_ptr<Read>> known;
     Leaves joined;
     std::uint64_t taken = 0;
@@ -73,8 +85,9 @@ Decider::~Decider() = default;
 
 void Decider::State::clear() {
     known.clear();
-    diagrams.clear();
+    circuit.clear();
     unknowns.clear();
+    question.clear();
 }
 
 /// Reads a condition, or charges what reading it cost.
@@ -90,7 +103,6 @@ const Decider::State::Read& Decider::State::read(SymbolicExprId id) {
         steps.take((*before)->steps);
         return **before;
     }
-    diagrams.beginQuestion();
     const std::uint64_t available = steps.left();
     auto fresh = std::make_unique<Read>();
     fresh->condition = reader.read(id);
@@ -111,47 +123,104 @@ bool Decider::State::isReadable(SymbolicExprId id) {
 }
 
 /// The leaves of several conditions, each once.
-const Decider::State::Leaves& Decider::State::leavesOf(std::span<const Read* const> conditions) {
+const Decider::State::Leaves& Decider::State::leavesOf(std::span<const ReadCondition* const> conditions) {
     if (conditions.size() == 1)
-        return conditions.front()->condition.leaves;
+        return conditions.front()->leaves;
     joined.clear();
     const auto before = [&](const UnknownLeaf& a, const UnknownLeaf& b) { return comesBefore(unknowns, a, b); };
     if (conditions.size() == 2) {
-        std::ranges::merge(conditions[0]->condition.leaves, conditions[1]->condition.leaves, std::back_inserter(joined),
-                           before);
+        std::ranges::merge(conditions[0]->leaves, conditions[1]->leaves, std::back_inserter(joined), before);
     } else {
-        for (const Read* read : conditions)
-            joined.insert(joined.end(), read->condition.leaves.begin(), read->condition.leaves.end());
+        for (const ReadCondition* read : conditions)
+            joined.insert(joined.end(), read->leaves.begin(), read->leaves.end());
         std::ranges::sort(joined, before);
     }
     joined.erase(std::unique(joined.begin(), joined.end()), joined.end());
     return joined;
 }
 
-/// Asks whether what `combine` makes of the conditions' diagrams can hold.
+/// Whether what was made of the conditions can hold.
+Decision Decider::State::hold(Gate truth, std::span<const ReadCondition* const> conditions) {
+    if (truth == never)
+        return {Answer::No, DecisionBound::None, std::nullopt};
+    question.begin();
+    for (const ReadCondition* condition : conditions)
+        question.mention(condition->met);
+    question.ask(circuit, unknowns, steps, truth);
+    const Leaves& leaves = leavesOf(conditions);
+    if (auto atOnce = witnesses.findAtOnce(question, leaves))
+        return *std::move(atOnce);
+    try {
+        const Steps::Share share(steps, std::max(steps.total() / limits::diagramShare, limits::diagramSteps));
+        Decision decision = witnesses.find(question, diagrams.of(question), leaves);
+        if (decision.bound != DecisionBound::Steps)
+            return decision;
+    } catch (const StepsUsedUp&) { // the search may take fewer
+    }
+    return search.find(question, leaves);
+}
+
+/// Looks for another witness while the one at hand gives a function two values for equal arguments: each time that two
+/// calls agree where their arguments do becomes part of the question.
+void Decider::State::keepFunctions(Decision& decision, Gate truth, std::span<const ReadCondition* const> conditions) {
+    std::vector<SymbolicExprId> calls;
+    for (const ReadCondition* read : conditions)
+        calls.insert(calls.end(), read->calls.begin(), read->calls.end());
+    if (calls.size() < 2)
+        return;
+    std::ranges::sort(calls, {}, [&](SymbolicExprId call) { return unknowns[unknowns.free(call)].label; });
+    calls.erase(std::unique(calls.begin(), calls.end()), calls.end());
+    if (calls.size() < 2)
+        return;
+    std::vector<const ReadCondition*> all(conditions.begin(), conditions.end());
+    std::vector<std::unique_ptr<ReadCondition>> added;
+    CallCongruence congruence(leafReader, unknowns, steps);
+    while (decision.isYes()) {
+        if (!decision.witness) { // its numbers are too large to evaluate arguments with
+            decision = {Answer::Undecided, DecisionBound::Terms, std::nullopt};
+            return;
+        }
+        const auto pair = congruence.findViolation(calls, *decision.witness);
+        if (!pair)
+            return;
+        added.push_back(std::make_unique<ReadCondition>(reader.readCongruence(pair->first, pair->second)));
+        const ReadCondition& equal = *added.back();
+        if (equal.bound != DecisionBound::None) {
+            decision = {Answer::Undecided, equal.bound, std::nullopt};
+            return;
+        }
+        all.push_back(&equal);
+        const Gate parts[] = {truth, equal.truth, equal.defined};
+        truth = circuit.all(parts);
+        decision = hold(truth, all);
+    }
+}
+
+/// Asks whether what `combine` makes of the conditions can hold.
 template <class Combine>
 Decision Decider::State::decide(std::span<const SymbolicExprId> ids, Combine combine) {
-    if (diagrams.edgesHeld() > limits::diagramEdges)
+    if (circuit.size() > limits::circuitSize)
         clear();
     steps.refill(questionSteps);
     Decision decision;
     try {
-        boost::container::small_vector<const Read*, 4> conditions;
+        boost::container::small_vector<const ReadCondition*, 4> conditions;
         conditions.reserve(ids.size());
         for (const SymbolicExprId id : ids) {
-            conditions.push_back(&read(id));
-            if (conditions.back()->condition.bound != DecisionBound::None)
-                decision.bound = conditions.back()->condition.bound;
+            conditions.push_back(&read(id).condition);
+            if (conditions.back()->bound != DecisionBound::None)
+                decision.bound = conditions.back()->bound;
         }
         if (decision.bound == DecisionBound::None) {
-            diagrams.beginQuestion();
-            boost::container::small_vector<Diagram, 4> truths;
-            truths.reserve(ids.size());
-            for (const Read* condition : conditions)
-                truths.push_back(condition->condition.truth);
-            const Diagram diagram = combine(std::span<const Diagram>(truths.data(), truths.size()));
-            decision =
-                search.find(diagram, diagram == never ? joined : leavesOf({conditions.data(), conditions.size()}));
+            boost::container::small_vector<Gate, 4> truths(ids.size(), always);
+            std::ranges::transform(conditions, truths.begin(), &ReadCondition::truth);
+            Gate truth = combine(std::span<const Gate>(truths.data(), truths.size()));
+            for (const ReadCondition* condition : conditions)
+                if (condition->defined != always)
+                    truth = circuit.both(truth, condition->defined);
+            decision = hold(truth, {conditions.data(), conditions.size()});
+            if (decision.isYes())
+                keepFunctions(decision, truth, {conditions.data(), conditions.size()});
         }
     } catch (const StepsUsedUp&) {
         decision = {Answer::Undecided, DecisionBound::Steps, std::nullopt};
@@ -163,18 +232,23 @@ Decision Decider::State::decide(std::span<const SymbolicExprId> ids, Combine com
     return decision;
 }
 
+/// What needs no reading: a condition agrees with itself.
+Decision Decider::State::same() {
+    taken = 0;
+    return {Answer::Yes, DecisionBound::None, std::nullopt};
+}
+
 Decision Decider::canHold(SymbolicExprId condition) {
-    return state_->decide(std::span(&condition, 1), [](std::span<const Diagram> c) { return c[0]; });
+    return state_->decide(std::span(&condition, 1), [](std::span<const Gate> c) { return c[0]; });
 }
 
 Decision Decider::mustHold(SymbolicExprId condition) {
-    return state_->decide(std::span(&condition, 1), [](std::span<const Diagram> c) { return opposite(c[0]); })
-        .opposite();
+    return state_->decide(std::span(&condition, 1), [](std::span<const Gate> c) { return opposite(c[0]); }).opposite();
 }
 
 Decision Decider::overlaps(SymbolicExprId a, SymbolicExprId b) {
     const SymbolicExprId pair[] = {a, b};
-    return state_->decide(pair, [&](std::span<const Diagram> c) { return state_->diagrams.both(c[0], c[1]); });
+    return state_->decide(pair, [&](std::span<const Gate> c) { return state_->circuit.both(c[0], c[1]); });
 }
 
 Decision Decider::disjoint(SymbolicExprId a, SymbolicExprId b) {
@@ -182,31 +256,37 @@ Decision Decider::disjoint(SymbolicExprId a, SymbolicExprId b) {
 }
 
 Decision Decider::implies(SymbolicExprId a, SymbolicExprId b) {
+    if (a == b && state_->leafReader.table().has(a))
+        return state_->same();
     const SymbolicExprId pair[] = {a, b};
-    return state_->decide(pair, [&](std::span<const Diagram> c) { return state_->diagrams.both(c[0], opposite(c[1])); })
+    return state_->decide(pair, [&](std::span<const Gate> c) { return state_->circuit.both(c[0], opposite(c[1])); })
         .opposite();
 }
 
 Decision Decider::equivalent(SymbolicExprId a, SymbolicExprId b) {
+    if (a == b && state_->leafReader.table().has(a))
+        return state_->same();
     const SymbolicExprId pair[] = {a, b};
-    Diagrams& diagrams = state_->diagrams;
+    Circuit& circuit = state_->circuit;
     return state_
         ->decide(pair,
-                 [&](std::span<const Diagram> c) {
-                     return diagrams.either(diagrams.both(c[0], opposite(c[1])), diagrams.both(opposite(c[0]), c[1]));
+                 [&](std::span<const Gate> c) {
+                     return circuit.either(circuit.both(c[0], opposite(c[1])), circuit.both(opposite(c[0]), c[1]));
                  })
         .opposite();
 }
 
 Decision Decider::equivalentGiven(SymbolicExprId a, SymbolicExprId b, SymbolicExprId known) {
+    if (a == b && state_->leafReader.table().has(a) && state_->leafReader.table().has(known))
+        return state_->same();
     const SymbolicExprId three[] = {a, b, known};
-    Diagrams& diagrams = state_->diagrams;
+    Circuit& circuit = state_->circuit;
     return state_
         ->decide(three,
-                 [&](std::span<const Diagram> c) {
-                     const Diagram onlyA = diagrams.both(c[0], opposite(c[1]));
-                     const Diagram onlyB = diagrams.both(opposite(c[0]), c[1]);
-                     return diagrams.both(c[2], diagrams.either(onlyA, onlyB));
+                 [&](std::span<const Gate> c) {
+                     const Gate onlyA = circuit.both(c[0], opposite(c[1]));
+                     const Gate onlyB = circuit.both(opposite(c[0]), c[1]);
+                     return circuit.both(c[2], circuit.either(onlyA, onlyB));
                  })
         .opposite();
 }
@@ -229,25 +309,26 @@ Relation Decider::classify(SymbolicExprId a, SymbolicExprId b) {
 }
 
 SetDecision Decider::covers(std::span<const SymbolicExprId> conditions) {
-    return {state_->decide(conditions, [&](std::span<const Diagram> c) { return opposite(state_->diagrams.any(c)); })
+    return {state_->decide(conditions, [&](std::span<const Gate> c) { return opposite(state_->circuit.any(c)); })
                 .opposite(),
             std::nullopt};
 }
 
 SetDecision Decider::disjoint(std::span<const SymbolicExprId> conditions) {
-    Diagrams& diagrams = state_->diagrams;
+    Circuit& circuit = state_->circuit;
+    const auto either = [&](Gate a, Gate b) { return opposite(circuit.nested(opposite(a), opposite(b))); };
     // For halves of the set: where one holds, and where two do.
-    const auto two = [&](std::span<const Diagram> c) {
-        std::vector<std::pair<Diagram, Diagram>> level;
+    const auto two = [&](std::span<const Gate> c) {
+        std::vector<std::pair<Gate, Gate>> level;
         level.reserve(c.size());
-        for (const Diagram diagram : c)
-            level.emplace_back(diagram, never);
+        for (const Gate truth : c)
+            level.emplace_back(truth, never);
         while (level.size() > 1) {
             for (std::size_t i = 0; i + 1 < level.size(); i += 2) {
                 const auto [oneA, twoA] = level[i];
                 const auto [oneB, twoB] = level[i + 1];
-                const Diagram twoAB = diagrams.either(diagrams.either(twoA, twoB), diagrams.both(oneA, oneB));
-                level[i / 2] = {diagrams.either(oneA, oneB), twoAB};
+                const Gate twoAB = either(either(twoA, twoB), circuit.nested(oneA, oneB));
+                level[i / 2] = {either(oneA, oneB), twoAB};
             }
             if (level.size() % 2 != 0)
                 level[level.size() / 2] = level.back();
@@ -256,7 +337,7 @@ SetDecision Decider::disjoint(std::span<const SymbolicExprId> conditions) {
         return level.empty() ? never : level.front().second;
     };
     SetDecision decision{state_->decide(conditions, two).opposite(), std::nullopt};
-    if (!decision.isNo())
+    if (!decision.isNo() || !decision.witness)
         return decision;
     std::optional<std::size_t> first;
     for (std::size_t i = 0; i < conditions.size(); ++i) {
@@ -285,14 +366,17 @@ std::optional<bool> Decider::holds(SymbolicExprId condition, const Witness& witn
             simulation = (kind == LeafMeaning::Kind::Simulation) == (each.value != 0) ? 1 : 0;
     }
     TermPlan plan(state_->leafReader, state_->unknowns, condition);
-    const auto value = plan.value([&](Unknown unknown) {
+    const auto valueOf = [&](Unknown unknown) {
         const UnknownInfo& info = state_->unknowns[unknown];
         if (info.kind == UnknownKind::Simulation)
             return simulation;
         const std::int64_t* found = values.find(info.node);
         return found != nullptr ? *found : std::int64_t{0};
-    });
-    return value ? std::optional(*value != 0) : std::nullopt;
+    };
+    if (const auto value = plan.value(valueOf))
+        return *value != 0;
+    const auto exact = plan.exactValue(valueOf); // beyond 64 bits, or with real literals
+    return exact ? std::optional(exact->sign() != 0) : std::nullopt;
 }
 
 std::string Decider::nameOf(SymbolicExprId unknown) const {

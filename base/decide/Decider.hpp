@@ -20,12 +20,14 @@ struct DecisionOptions {
 /// Decides questions about conditions of one table.
 ///
 /// Conditions are over integers: every symbol stands for an integer, a truth value is an integer that is not zero, a
-/// truth value in arithmetic is 1 or 0.  Comparisons of linear terms with integers, with real literals (exactly:
-/// A < 2.5 is A <= 2) and with a symbol plus a constant are understood, sums of several unknowns are solved, and so is
-/// everything that && || ! make of them.
-/// A call is an unknown of its own, whatever its arguments; so is a member, unless a value is bound to it.  Any other
-/// arithmetic is an unknown for each node: equal nodes are equal, and nothing else is known of it but the range of %
-/// and & with a literal.  Quotients are cut toward zero, and bits and shifts are of 32-bit values, where a witness is
+/// truth value in arithmetic is 1 or 0.  Linear arithmetic is decided: sums of integer multiples of any size, quotients
+/// and remainders by constants (cut toward zero), shifts and masks by constants, real literals (exact fractions; an
+/// operation on two literals is rounded), and everything that && || ! make of comparisons of these.  + - * << are exact
+/// over the integers without bounds.  The other operators on bits are of 32-bit values, and an assignment under which
+/// they would get another counts for nothing: the conditions have no value there.
+/// A call is a function of its arguments, except for `defined` and names that begin with `__has_`, which are unknowns
+/// whatever they name; a member is an unknown, unless a value is bound to it.  Any other arithmetic is an unknown for
+/// each node: equal nodes are equal, and a product is 0 where a factor is.  It is evaluated where a witness is
 /// confirmed.
 ///
 /// An answer is proven or it is "undecided"; it depends on the conditions alone, not on what was interned or asked
@@ -62,11 +64,12 @@ public:
 
     /// Whether some condition always holds; the witness of "no" is left out by all.
     SetDecision covers(std::span<const SymbolicExprId> conditions);
-    /// Whether no two hold together; "no" comes with a witness and the first two that hold for it.
+    /// Whether no two hold together; "no" comes with a witness and the first two that hold for it, or with neither
+    /// where the witness has a number beyond 64 bits.
     SetDecision disjoint(std::span<const SymbolicExprId> conditions);
 
     /// Whether a condition holds under an assignment, by evaluation; unknowns that it does not name are 0.  Nothing
-    /// where some value is none: a division by zero, a number beyond 64 bits.
+    /// where some node has no value: a division by zero, bits of a number beyond 32 bits.
     [[nodiscard]] std::optional<bool> holds(SymbolicExprId condition, const Witness& witness);
     /// The text of an unknown of a witness.
     [[nodiscard]] std::string nameOf(SymbolicExprId unknown) const;

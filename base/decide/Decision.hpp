@@ -31,16 +31,16 @@ struct UnknownValue {
 ///
 /// Every witness was confirmed.  It is the smallest: the first unknown is as near to 0 as it can be, then the second,
 /// and so on; of two values equally near the positive one is the smaller.  Two exceptions: where the steps ran out
-/// after a witness was found it may not be the smallest, and where the conditions hold arithmetic that is not
-/// understood (products, quotients, bits) or sums of several unknowns it is the first that was confirmed.  Either way
-/// it does not depend on what was interned or asked before.
+/// after a witness was found it may not be the smallest, and where the conditions hold sums of several unknowns,
+/// quotients, bits or arithmetic that is not understood (products of unknowns) it is the first that was confirmed.
+/// Either way it does not depend on what was interned or asked before.
 using Witness = std::vector<UnknownValue>;
 
 struct Decision {
     Answer answer = Answer::Undecided;
     DecisionBound bound = DecisionBound::None;
     /// The assignment that proves the answer, where one assignment can: that a condition can hold, that an implication
-    /// fails.
+    /// fails.  Left out where the assignment found has a number beyond 64 bits, as for A > 1.0e300.
     std::optional<Witness> witness;
 
     [[nodiscard]] bool isYes() const noexcept { return answer == Answer::Yes; }

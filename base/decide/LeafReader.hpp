@@ -25,8 +25,8 @@ struct LeafMeaning {
 };
 
 /// Reads leaves as the simplifier does: truth constants by name, members by the value bound to them, the variant
-/// keywords as opposites while they are in force.  A call is one unknown whatever its arguments: defined(A) says
-/// nothing about the value of A.
+/// keywords as opposites while they are in force.  A call is one unknown, whose arguments are looked at where another
+/// call of the same function takes part (CallCongruence); defined(A) says nothing about the value of A.
 class LeafReader {
 public:
     LeafReader(const SymbolicExprTable& table, bool keywordsInForce)

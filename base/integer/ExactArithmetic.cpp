@@ -5,6 +5,10 @@
 // compares with the literal's whole part and then asks whether there is a fraction.
 #include "base/integer/ExactArithmetic.hpp"
 
+#include "base/core/Limits.hpp"
+#include "base/integer/Int32.hpp"
+
+#include <algorithm>
 #include <cmath>
 #include <limits>
 
@@ -13,10 +17,6 @@ namespace VT {
 namespace {
 
 using Result = std::optional<std::int64_t>;
-
-constexpr bool fits32(std::int64_t value) noexcept {
-    return value >= std::numeric_limits<std::int32_t>::min() && value <= std::numeric_limits<std::int32_t>::max();
-}
 
 Result product(std::int64_t a, std::int64_t b) {
     std::int64_t result = 0;
@@ -37,12 +37,12 @@ Result power(std::int64_t base, std::int64_t exponent) {
 }
 
 /// A shift to the left, or to the right for a negative distance.
-std::int64_t shifted(std::int64_t value, std::int64_t distance) {
-    if (distance > 31 || distance < -31)
-        return value < 0 && distance < 0 ? -1 : 0;
+Result shifted(std::int64_t value, std::int64_t distance) {
     if (distance < 0)
-        return value >> -distance;
-    return static_cast<std::int32_t>(static_cast<std::uint32_t>(value) << distance);
+        return fitsInt(value) ? Result(value >> std::min<std::int64_t>(-distance, 31)) : std::nullopt;
+    if (distance < 63)
+        return product(value, std::int64_t{1} << distance);
+    return value == 0 ? Result(0) : std::nullopt;
 }
 
 } // namespace
@@ -65,35 +65,79 @@ Result integerResult(SymbolicOp op, std::int64_t a, std::int64_t b) {
         if (b == 0 || b == -1) // the quotient of the smallest value by -1 has no 64 bits
             return b == 0 ? Result() : op == SymbolicOp::Modulo ? Result(0) : product(a, -1);
         return op == SymbolicOp::Divide ? a / b : a % b;
-    case SymbolicOp::BitAnd:
-    case SymbolicOp::BitOr:
-    case SymbolicOp::BitXOr:
     case SymbolicOp::ShiftLeft:
     case SymbolicOp::ShiftRight:
-        break;
-    default:
-        return std::nullopt;
-    }
-    if (!fits32(a) || !fits32(b))
-        return std::nullopt;
-    switch (op) {
-    case SymbolicOp::BitAnd:
-        return a & b;
-    case SymbolicOp::BitOr:
-        return a | b;
-    case SymbolicOp::BitXOr:
-        return a ^ b;
-    default:
+        if (!fitsInt(b))
+            return std::nullopt;
         return shifted(a, op == SymbolicOp::ShiftLeft ? b : -b);
+    case SymbolicOp::BitAnd:
+        return fitsInt(a) && fitsInt(b) ? Result(a & b) : std::nullopt;
+    case SymbolicOp::BitOr:
+        return fitsInt(a) && fitsInt(b) ? Result(a | b) : std::nullopt;
+    case SymbolicOp::BitXOr:
+        return fitsInt(a) && fitsInt(b) ? Result(a ^ b) : std::nullopt;
+    default:
+        return std::nullopt;
     }
 }
 
 Result integerResult(SymbolicOp op, std::int64_t a) {
     if (op == SymbolicOp::UnaryMinus)
         return product(a, -1);
-    if (op == SymbolicOp::BitCompl && fits32(a))
+    if (op == SymbolicOp::BitCompl && fitsInt(a))
         return ~a;
     return std::nullopt;
+}
+
+std::optional<RationalForm> exactResult(SymbolicOp op, const RationalForm& a, const RationalForm& b, bool isReal) {
+    const auto left = a.integer();
+    const auto right = b.integer();
+    switch (op) {
+    case SymbolicOp::Plus:
+        return combine(a, 1, b, 1);
+    case SymbolicOp::Minus:
+        return combine(a, 1, b, -1);
+    case SymbolicOp::Multiply:
+    case SymbolicOp::DotMul:
+        return multiply(a, b);
+    case SymbolicOp::Divide:
+        if (b.sign() == 0)
+            return std::nullopt;
+        if (isReal || !left || !right)
+            return divide(a, b);
+        return RationalForm(BigInteger(*left / *right));
+    case SymbolicOp::Modulo:
+        return left && right && !isReal && *right != 0 ? std::optional(RationalForm(BigInteger(*left % *right)))
+                                                       : std::nullopt;
+    default:
+        break;
+    }
+    if (isReal || !left || !right)
+        return std::nullopt;
+    constexpr std::int64_t longest = limits::formBits;
+    if (op == SymbolicOp::ShiftLeft && *right >= 0 && *right <= longest)
+        return multiply(a, RationalForm(BigInteger(BigInteger(1) << static_cast<unsigned>(*right))));
+    const LinearForm* smallA = a.small();
+    const LinearForm* smallB = b.small();
+    const Result value =
+        smallA != nullptr && smallB != nullptr ? integerResult(op, smallA->constant, smallB->constant) : std::nullopt;
+    return value ? std::optional(RationalForm(BigInteger(*value))) : std::nullopt;
+}
+
+std::optional<double> foldedReals(SymbolicOp op, double a, double b) {
+    const auto finite = [](double value) { return std::isfinite(value) ? std::optional(value) : std::nullopt; };
+    switch (op) {
+    case SymbolicOp::Plus:
+        return finite(a + b);
+    case SymbolicOp::Minus:
+        return finite(a - b);
+    case SymbolicOp::Multiply:
+        return finite(a * b);
+    case SymbolicOp::Divide:
+        return std::fabs(b) >= limits::zeroThreshold ? finite(a / b) : std::nullopt;
+    default:
+        return std::nullopt;
+    }
 }
 
 bool compareExactly(SymbolicOp op, std::int64_t a, double b) {

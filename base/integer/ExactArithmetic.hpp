@@ -2,17 +2,39 @@
 #pragma once
 
 #include "base/core/Operators.hpp"
+#include "base/integer/RationalForm.hpp"
 
 #include <cstdint>
 #include <optional>
 
 namespace VT {
 
-/// `a op b` over the integers; quotients are cut toward zero, bits and shifts are those of 32-bit values.  Nothing
-/// where the result leaves 64 bits, where the value is not an integer (a division by zero, a negative exponent, bits of
-/// a value beyond 32 bits), and for operators that have no value here.
+/// The operators that have exact values here, beside those whose values are truth values.
+inline constexpr OperatorSet exactOps{
+    SymbolicOp::Plus,       SymbolicOp::Minus,    SymbolicOp::UnaryMinus, SymbolicOp::Multiply, SymbolicOp::DotMul,
+    SymbolicOp::Power,      SymbolicOp::DotPower, SymbolicOp::Divide,     SymbolicOp::Modulo,   SymbolicOp::ShiftLeft,
+    SymbolicOp::ShiftRight, SymbolicOp::BitAnd,   SymbolicOp::BitOr,      SymbolicOp::BitXOr,   SymbolicOp::BitCompl};
+
+/// The operators written as a symbol that are unknowns of their own in decisions.
+inline constexpr OperatorSet opaqueOps{SymbolicOp::DotDiv, SymbolicOp::LDiv, SymbolicOp::DotLDiv, SymbolicOp::Transpose,
+                                       SymbolicOp::DotTranspose};
+
+static_assert((exactOps | opaqueOps | booleanOps) == symbolOps,
+              "give every operator that is written as a symbol an exact value, or name it in opaqueOps");
+
+/// `a op b` over the integers; quotients are cut toward zero, a shift to the left multiplies, bits and shifts to the
+/// right are those of 32-bit values.  Nothing where the result leaves 64 bits, where the value is not an integer (a
+/// division by zero, a negative exponent, bits of a value beyond 32 bits), and for operators that have no value here.
 [[nodiscard]] std::optional<std::int64_t> integerResult(SymbolicOp op, std::int64_t a, std::int64_t b);
 [[nodiscard]] std::optional<std::int64_t> integerResult(SymbolicOp op, std::int64_t a);
+
+/// The same for constants of any size; where `isReal` says that one of them is a real number, the quotient is exact.
+/// Nothing beyond limits::formBits.
+[[nodiscard]] std::optional<RationalForm> exactResult(SymbolicOp op, const RationalForm& a, const RationalForm& b,
+                                                      bool isReal);
+
+/// What two literals are folded to, one of them a real number; nothing where that is not finite.
+[[nodiscard]] std::optional<double> foldedReals(SymbolicOp op, double a, double b);
 
 /// The comparison of an integer with a real number, exact; every comparison with NaN but the unequal one fails.
 [[nodiscard]] bool compareExactly(SymbolicOp op, std::int64_t a, double b);

@@ -2,6 +2,7 @@
 #pragma once
 
 #include "base/core/Operators.hpp"
+#include "base/integer/Int32.hpp"
 #include "base/util/ShortVector.hpp"
 
 #include <compare>
@@ -10,11 +11,6 @@
 #include <vector>
 
 namespace VT {
-
-/// Whether a value is one of a literal.
-constexpr bool fitsInt(std::int64_t value) noexcept {
-    return value >= std::numeric_limits<int>::min() && value <= std::numeric_limits<int>::max();
-}
 
 /// A set of unbounded integers as a sorted list of disjoint intervals that do not touch.  Bounds come from 32-bit
 /// constants, so they and their neighbours fit 64 bits; the extreme 64-bit values stand for the infinities.

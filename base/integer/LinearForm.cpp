@@ -1,7 +1,7 @@
 // Adds multiples of linear forms by merging their sorted parts.
 //
-// Every product and sum is checked: a number beyond `largestNumber` refuses the whole combination instead of rounding
-// it. Linear in the parts of both forms.
+// Every product and sum is checked: a number beyond `limits::formNumber` refuses the whole combination instead of
+// rounding it. Linear in the parts of both forms.
 #include "base/integer/LinearForm.hpp"
 
 #include "base/core/Check.hpp"

@@ -1,6 +1,8 @@
 // Sums of integer multiples of unknowns, exact within a bound on every number in them.
 #pragma once
 
+#include "base/core/Limits.hpp"
+
 #include <boost/container/small_vector.hpp>
 
 #include <cstdint>
@@ -11,15 +13,11 @@ namespace VT {
 
 using Unknown = std::uint32_t;
 
-/// The largest magnitude of a factor or constant.  A path of differences adds up at most 2^20 of them, which leaves
-/// every sum within 64 bits.
-inline constexpr std::int64_t largestNumber = std::int64_t{1} << 40U;
-
 inline constexpr std::int64_t minusInfinite = std::numeric_limits<std::int64_t>::min();
 inline constexpr std::int64_t plusInfinite = std::numeric_limits<std::int64_t>::max();
 
 constexpr bool isWithinBound(std::int64_t value) noexcept {
-    return value >= -largestNumber && value <= largestNumber;
+    return value >= -limits::formNumber && value <= limits::formNumber;
 }
 
 struct LinearPart {

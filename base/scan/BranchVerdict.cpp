@@ -10,12 +10,12 @@
 
 #include "base/core/Limits.hpp"
 #include "base/core/Walk.hpp"
+#include "base/decide/reasons/MinimalSubset.hpp"
 #include "base/decide/shorten/ImpliedCondition.hpp"
 
 #include <boost/container_hash/hash.hpp>
 
 #include <algorithm>
-#include <numeric>
 
 namespace VT {
 
@@ -77,10 +77,27 @@ bool BranchJudge::holds(BranchVerdict verdict, SymbolicExprId condition, Symboli
     });
 }
 
-BranchVerdict BranchJudge::decide(const Question& question) {
+/// What a fact says about a condition that it is the same as, or the opposite of.
+BranchVerdictKind BranchJudge::statedBy(std::span<const SymbolicExprId> facts, SymbolicExprId condition) {
+    const auto negates = [&](SymbolicExprId negation, SymbolicExprId of) {
+        const SymbolicExpr* node = table_.get(negation);
+        return node->op() == SymbolicOp::Not && node->getInput(0) == of;
+    };
+    charge(facts.size());
+    for (const SymbolicExprId fact : facts) {
+        if (fact == condition)
+            return BranchVerdictKind::AlwaysTrue;
+        if (negates(fact, condition) || negates(condition, fact))
+            return BranchVerdictKind::Dead;
+    }
+    return BranchVerdictKind::None;
+}
+
+BranchVerdict BranchJudge::decide(const Question& question, std::span<const SymbolicExprId> facts) {
+    const BranchVerdictKind stated = statedBy(facts, question.condition);
     for (const auto kind : {BranchVerdictKind::Dead, BranchVerdictKind::AlwaysTrue}) {
         const BranchVerdict verdict{kind, invalidId};
-        if (holds(verdict, question.condition, question.known))
+        if (stated == BranchVerdictKind::None ? holds(verdict, question.condition, question.known) : stated == kind)
             return proven([&] { return decider_.canHold(question.known); }) ? verdict : BranchVerdict{};
     }
     const SymbolicExprId shorter = shortened(question.condition, question.knownToShorten);
@@ -121,7 +138,7 @@ BranchVerdict BranchJudge::judge(SymbolicExprId condition, const KnownConditions
                             all(known.facts, known.includeLaws, {})};
     auto judged = judged_.find(question);
     if (judged == judged_.end()) {
-        const BranchVerdict verdict = decide(question);
+        const BranchVerdict verdict = decide(question, known.facts);
         judged = judged_.emplace(question, Judged{verdict, limits::branchSteps - stepsLeft_, isUndecided_}).first;
     }
     // An earlier verdict costs again what it cost then, so that a file's findings do not depend on the files before it.
@@ -145,30 +162,15 @@ std::vector<std::size_t> BranchJudge::reasons(SymbolicExprId condition, const Br
                                               const KnownConditions& known) {
     const bool toShorten = verdict.kind == BranchVerdictKind::Removable;
     beginQuestion();
-    const auto suffices = [&](const std::vector<std::size_t>& positions) {
+    const auto suffices = [&](std::span<const std::size_t> positions) {
         std::vector<SymbolicExprId> facts(positions.size());
         std::ranges::transform(positions, facts.begin(), [&](std::size_t at) { return known.facts[at]; });
-        return holds(
-            verdict, condition,
-            all(facts, known.includeLaws, toShorten ? std::span<const SymbolicExprId>() : known.undefinedLaws));
+        const bool isEnough =
+            holds(verdict, condition,
+                  all(facts, known.includeLaws, toShorten ? std::span<const SymbolicExprId>() : known.undefinedLaws));
+        return isEnough ? Answer::Yes : Answer::No;
     };
-    // The last facts that are enough, then without whole runs of them, then without shorter ones.
-    std::vector<std::size_t> kept;
-    for (std::size_t length = 0; length < known.facts.size() && !suffices(kept); length = length * 2 + 1) {
-        kept.resize(std::min(length * 2 + 1, known.facts.size()));
-        std::iota(kept.begin(), kept.end(), known.facts.size() - kept.size());
-    }
-    for (std::size_t length = kept.size(); length > 0; length /= 2) {
-        for (std::size_t i = 0; i < kept.size();) {
-            std::vector<std::size_t> without(kept.begin(), kept.begin() + static_cast<std::ptrdiff_t>(i));
-            const std::size_t rest = std::min(i + length, kept.size());
-            without.insert(without.end(), kept.begin() + static_cast<std::ptrdiff_t>(rest), kept.end());
-            if (suffices(without))
-                kept = std::move(without);
-            else
-                i = rest;
-        }
-    }
+    std::vector<std::size_t> kept = minimalSubset(known.facts.size(), suffices).positions;
     spend(limits::branchSteps - stepsLeft_);
     return kept;
 }

@@ -83,7 +83,8 @@ private:
     template <class Ask>
     bool proven(Ask ask);
     bool holds(BranchVerdict verdict, SymbolicExprId condition, SymbolicExprId known);
-    BranchVerdict decide(const Question& question);
+    BranchVerdictKind statedBy(std::span<const SymbolicExprId> facts, SymbolicExprId condition);
+    BranchVerdict decide(const Question& question, std::span<const SymbolicExprId> facts);
     SymbolicExprId shortened(SymbolicExprId condition, SymbolicExprId known);
 
     SymbolicExprTable& table_;

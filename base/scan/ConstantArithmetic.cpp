@@ -36,30 +36,13 @@ unsigned digitOf(char c) {
 }
 
 std::optional<DirectiveConstant> computeSigned(SymbolicOp op, std::int64_t a, std::int64_t b) {
-    std::int64_t value = 0;
-    switch (op) {
-    case SymbolicOp::Plus:
-        if (__builtin_add_overflow(a, b, &value))
-            return std::nullopt;
-        break;
-    case SymbolicOp::Minus:
-        if (__builtin_sub_overflow(a, b, &value))
-            return std::nullopt;
-        break;
-    case SymbolicOp::Multiply:
-        if (__builtin_mul_overflow(a, b, &value))
-            return std::nullopt;
-        break;
-    case SymbolicOp::Divide:
-    case SymbolicOp::Modulo:
-        if (b == 0 || (a == std::numeric_limits<std::int64_t>::min() && b == -1))
-            return std::nullopt;
-        value = op == SymbolicOp::Divide ? a / b : a % b;
-        break;
-    default:
+    static constexpr OperatorSet arithmetic{SymbolicOp::Plus, SymbolicOp::Minus, SymbolicOp::Multiply,
+                                            SymbolicOp::Divide, SymbolicOp::Modulo};
+    const bool overflows = b == -1 && a == std::numeric_limits<std::int64_t>::min(); // in the remainder too
+    if (!arithmetic.contains(op) || (op == SymbolicOp::Modulo && overflows))
         return std::nullopt;
-    }
-    return DirectiveConstant{static_cast<std::uint64_t>(value), false};
+    const std::optional<std::int64_t> value = integerResult(op, a, b);
+    return value ? std::optional(DirectiveConstant{static_cast<std::uint64_t>(*value), false}) : std::nullopt;
 }
 
 std::optional<DirectiveConstant> computeUnsigned(SymbolicOp op, std::uint64_t a, std::uint64_t b) {

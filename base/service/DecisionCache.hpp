@@ -23,6 +23,7 @@ public:
     struct Key {
         SymbolicExprId a;
         SymbolicExprId b;
+        SymbolicExprId known; ///< the And of the assumptions used
         PairQuestion question;
         unsigned mode; ///< of the decider: ServiceParts::decisionMode()
         bool operator==(const Key&) const = default;
@@ -31,6 +32,7 @@ public:
             std::size_t seed = 0;
             boost::hash_combine(seed, key.a);
             boost::hash_combine(seed, key.b);
+            boost::hash_combine(seed, key.known);
             boost::hash_combine(seed, static_cast<unsigned>(key.question) * 4 + key.mode);
             return seed;
         }

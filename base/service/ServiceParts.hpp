@@ -1,6 +1,7 @@
 // The parts of a VCService: table, parsers, printers, simplifier, deciders and caches.
 #pragma once
 
+#include "base/decide/Assumptions.hpp"
 #include "base/decide/Decider.hpp"
 #include "base/print/ExpressionPrinter.hpp"
 #include "base/service/DecisionCache.hpp"
@@ -66,8 +67,9 @@ struct ServiceParts {
     std::array<SimplifyCache<std::string>, 2> simplifiedFromText; ///< by text
     DecisionCache decisions;
     std::array<std::unique_ptr<Decider>, 4> deciders; ///< by mode
-    bool bits32 = false;                              ///< unknowns are signed 32-bit integers to decisions
-    bool caching;                                     ///< the cache feature when the service was made
+    Assumptions assumptions;
+    bool bits32 = false; ///< unknowns are signed 32-bit integers to decisions
+    bool caching;        ///< the cache feature when the service was made
 };
 
 } // namespace VT

@@ -4,6 +4,7 @@
 
 #include "base/core/Limits.hpp"
 #include "base/decide/Decision.hpp"
+#include "base/decide/reasons/Reasons.hpp"
 #include "base/decide/shorten/ShortForm.hpp"
 #include "base/service/VCServiceHandle.hpp"
 #include "base/service/VCSymbolicExprId.hpp"
@@ -12,6 +13,7 @@
 #include "host/Model.hpp"
 
 #include <memory>
+#include <optional>
 #include <string>
 #include <unordered_map>
 #include <vector>
@@ -175,6 +177,29 @@ public:
     /// Whether no two conditions of a set hold together.
     SetDecision isDisjoint(const std::vector<VCSymbolicExprId>& conditions);
 
+    // Assuming.  While conditions are assumed, every decision is about the assignments for which they hold, and shorter
+    // conditions are equal to the given ones there.  A question uses the assumptions that share names with it, directly
+    // or through other assumptions.  Simplification knows no assumptions.
+
+    /// Assumes a condition from now on; false, without effect, for an identifier that is not of the table.
+    bool assume(const VCSymbolicExprId& condition);
+    /// What is assumed, And operands one by one, in C shape.
+    [[nodiscard]] std::vector<VCSymbolicExprId> assumptions() const;
+    void clearAssumptions();
+
+    // Explaining.  Reasons are And operands of the conditions asked about and of the assumptions, each as written
+    // there; a search for them takes at most limits::reasonSteps.  See Reasons.hpp.
+
+    /// The operands of a, and the assumptions, for which a implies b.
+    Reasons explainImplies(const VCSymbolicExprId& a, const VCSymbolicExprId& b);
+    /// The operands and assumptions for which conditions never hold together; of one condition, for which it never
+    /// holds.
+    Reasons explainDisjoint(const std::vector<VCSymbolicExprId>& conditions);
+    /// Why a condition is equal to what getImpliedCondition() or shortestCondition() made of it where the known one
+    /// holds: the operands of the known condition that are needed, and the operands that went, with those for each.
+    ShorteningReasons explainImpliedCondition(const VCSymbolicExprId& condition, const VCSymbolicExprId& implied,
+                                              const VCSymbolicExprId& known);
+
     /// The simplified condition as a sum of products: the operands of its Or, each once, in the order of their texts.
     /// FALSE is the empty sum.  A part that simplification leaves unexpanded is one operand.
     std::vector<VCSymbolicExprId> computeUniqueOrOperandsId(const VCSymbolicExprId& condition);
@@ -215,6 +240,13 @@ public:
     Decision isTighterThanFromQConditions(const std::string& a, const std::string& b);
     SetDecision coversFromCConditions(const std::vector<std::string>& conditions);
     SetDecision coversFromQConditions(const std::vector<std::string>& conditions);
+    /// The operands as text; nothing where the answer is not proven.
+    std::optional<std::vector<std::string>> explainImpliesFromCConditions(const std::string& a, const std::string& b);
+    std::optional<std::vector<std::string>> explainImpliesFromQConditions(const std::string& a, const std::string& b);
+    std::optional<std::vector<std::string>> explainDisjointFromCConditions(const std::vector<std::string>& conditions);
+    std::optional<std::vector<std::string>> explainDisjointFromQConditions(const std::vector<std::string>& conditions);
+    bool assumeFromCCondition(const std::string& condition);
+    bool assumeFromQCondition(const std::string& condition);
     std::string shortestCExprFromCCondition(const std::string& text);
     std::string shortestQExprFromCCondition(const std::string& text);
     std::string shortestCExprFromQCondition(const std::string& text);
@@ -252,6 +284,8 @@ private:
     Decision ask(PairQuestion question, const VCSymbolicExprId& a, const VCSymbolicExprId& b,
                  std::uint64_t steps = limits::decisionSteps);
     std::vector<VCSymbolicExprId> uniqueOperands(const VCSymbolicExprId& condition, bool ofAnd);
+    std::vector<SymbolicExprId> withAssumptions(const std::vector<VCSymbolicExprId>& conditions);
+    std::optional<std::vector<std::string>> printReasons(const Reasons& reasons, bool isQuill);
     std::vector<VCSymbolicExprId> parseAll(const std::vector<std::string>& texts, bool isQuill);
     std::vector<std::string> operandTexts(const std::string& condition, bool ofAnd, bool isQuill);
     SymbolicExprId simplifyNow(SymbolicExprId condition, bool isQuill);

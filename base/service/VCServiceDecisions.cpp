@@ -4,6 +4,7 @@
 // one decider for each mode (keywords in force, 32-bit unknowns), made when it is first needed.
 // Cost: at most limits::decisionSteps a question; a kept decision is O(1).
 #include "base/core/Check.hpp"
+#include "base/core/Make.hpp"
 #include "base/service/ServiceParts.hpp"
 #include "base/service/VCService.hpp"
 #include "base/variants/VariantKeywords.hpp"
@@ -22,23 +23,34 @@ Decision noCondition() {
 SetDecision askAbout(ServiceParts& parts, SetDecision (Decider::*question)(std::span<const SymbolicExprId>),
                      const std::vector<VCSymbolicExprId>& conditions) {
     std::vector<SymbolicExprId> converted;
-    converted.reserve(conditions.size());
+    converted.reserve(conditions.size() + 1);
     for (const VCSymbolicExprId& condition : conditions) {
         if (!parts.table.has(condition.id()))
             return {noCondition(), std::nullopt};
         converted.push_back(parts.toC(condition.id()));
     }
+    const SymbolicExprId known = parts.assumptions.knownOf(converted);
+    if (known != parts.table.getIdTRUE() && question == &Decider::covers)
+        converted.push_back(makeUnary(parts.table, SymbolicOp::Not, known));
+    else if (known != parts.table.getIdTRUE())
+        for (SymbolicExprId& condition : converted)
+            condition = makeBinary(parts.table, SymbolicOp::And, known, condition);
     return (parts.decider().*question)(converted);
 }
 
 /// Decides a pair anew.  Operators that Quill writes as calls are decided as operators.
 Decision decide(ServiceParts& parts, Decider& decider, const DecisionCache::Key& key, std::uint64_t steps) {
-    const SymbolicExprId first = parts.toC(key.a);
+    const bool isAnythingKnown = key.known != parts.table.getIdTRUE();
     const SymbolicExprId second = parts.toC(key.b);
+    const SymbolicExprId given = parts.toC(key.a);
+    const SymbolicExprId first = isAnythingKnown && key.question != PairQuestion::Differ
+                                     ? makeBinary(parts.table, SymbolicOp::And, key.known, given)
+                                     : given;
     decider.limitSteps(steps);
     Decision decision = key.question == PairQuestion::Both         ? decider.overlaps(first, second)
                         : key.question == PairQuestion::FirstAlone ? decider.implies(first, second).opposite()
-                                                                   : decider.equivalent(first, second).opposite();
+                        : isAnythingKnown ? decider.equivalentGiven(first, second, key.known).opposite()
+                                          : decider.equivalent(first, second).opposite();
     decider.limitSteps(limits::decisionSteps);
     return decision;
 }
@@ -76,11 +88,12 @@ Decision VCService::ask(PairQuestion question, const VCSymbolicExprId& a, const 
     if (!has(a) || !has(b))
         return noCondition();
     const bool ordered = question == PairQuestion::FirstAlone;
-    const DecisionCache::Key key{ordered ? a.id() : std::min(a.id(), b.id()),
-                                 ordered ? b.id() : std::max(a.id(), b.id()), question, parts_->decisionMode()};
-    if (const Decision* known = parts_->caching ? parts_->decisions.find(key) : nullptr) {
-        VTSYM_CHECK_SAMPLED(isAsDecidedAnew(*parts_, key, *known));
-        return *known;
+    const SymbolicExprId pair[] = {ordered ? a.id() : std::min(a.id(), b.id()),
+                                   ordered ? b.id() : std::max(a.id(), b.id())};
+    const DecisionCache::Key key{pair[0], pair[1], parts_->assumptions.knownOf(pair), question, parts_->decisionMode()};
+    if (const Decision* before = parts_->caching ? parts_->decisions.find(key) : nullptr) {
+        VTSYM_CHECK_SAMPLED(isAsDecidedAnew(*parts_, key, *before));
+        return *before;
     }
     Decision decision = decide(*parts_, parts_->decider(), key, steps);
     // What stays undecided with fewer steps may be decided with all.
@@ -91,6 +104,19 @@ Decision VCService::ask(PairQuestion question, const VCSymbolicExprId& a, const 
 
 void VCService::setDecisions32Bit(bool are32Bit) {
     parts_->bits32 = are32Bit;
+}
+
+bool VCService::assume(const VCSymbolicExprId& condition) {
+    return has(condition) && parts_->assumptions.add(condition.id());
+}
+
+std::vector<VCSymbolicExprId> VCService::assumptions() const {
+    const std::vector<SymbolicExprId>& all = parts_->assumptions.all();
+    return {all.begin(), all.end()};
+}
+
+void VCService::clearAssumptions() {
+    parts_->assumptions.clear();
 }
 
 Decision VCService::canHold(const VCSymbolicExprId& condition) {

@@ -27,6 +27,7 @@ ServiceParts::ServiceParts()
       toQuill(table),
       quillPrinter(table, true, true),
       cPrinter(table, false, true),
+      assumptions(table),
       caching(cacheSymExprSimplifyResultsFeature().isOn()) {
     table.addBoolSymbols();
     addSimCodegenVariantKeywordSymbols();

@@ -1,5 +1,6 @@
 // Shortens conditions, everywhere or under a known condition: sets up proofs and search (base/decide/shorten), and
 // falls back to the given form where the result would be longer.
+#include "base/core/Make.hpp"
 #include "base/decide/shorten/ConditionProofs.hpp"
 #include "base/decide/shorten/ShortestForm.hpp"
 #include "base/service/ServiceParts.hpp"
@@ -36,10 +37,13 @@ VCSymbolicExprId VCService::shortestCondition(const VCSymbolicExprId& condition,
         const SymbolicExprId simple = normalForm();
         return printer.textLength(simple) <= printer.textLength(given) ? simple : given;
     }
-    ConditionProofs proofs(parts_->decider(), parts_->toC, given, table.getIdTRUE(), false);
+    const SymbolicExprId assumed = parts_->assumptions.knownOf(std::span(&given, 1));
+    const bool isAnythingAssumed = assumed != table.getIdTRUE();
+    ConditionProofs proofs(parts_->decider(), parts_->toC, given, assumed, isAnythingAssumed);
     ShortestForm search(table, printer, parts_->keywordsInForce(), proofs);
     // Bounds of the unknowns are known facts.
-    const SymbolicExprId result = search.find(given, parts_->bits32 ? table.getIdTRUE() : invalidId, normalForm);
+    const SymbolicExprId result =
+        search.find(given, parts_->bits32 || isAnythingAssumed ? assumed : invalidId, normalForm);
     if (forms != nullptr)
         *forms = search.forms();
     return noLonger(table, printer, result, given);
@@ -51,7 +55,10 @@ VCSymbolicExprId VCService::getImpliedCondition(const VCSymbolicExprId& conditio
         return invalidId;
     SymbolicExprTable& table = parts_->table;
     const SymbolicExprId given = isQuill ? condition.id() : parts_->toC(condition.id());
-    const SymbolicExprId context = isQuill ? known.id() : parts_->toC(known.id());
+    const SymbolicExprId fact = isQuill ? known.id() : parts_->toC(known.id());
+    const SymbolicExprId assumed = parts_->assumptions.knownOf(std::initializer_list<SymbolicExprId>{given, fact});
+    const SymbolicExprId context =
+        assumed == table.getIdTRUE() ? fact : makeBinary(table, SymbolicOp::And, assumed, fact);
     ConditionProofs proofs(parts_->decider(), parts_->toC, given, context, true);
     if (const auto decided = proofs.decided(given))
         return *decided ? table.getIdTRUE() : table.getIdFALSE();

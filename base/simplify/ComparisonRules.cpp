@@ -4,6 +4,7 @@
 // on: a < b is the opposite of b <= a and so true where one of them is NaN, all other comparisons with NaN but ~=
 // are false; Not of NaN is true.  Operands come first: a comparison of literals is a constant before a Not above it
 // could turn it round.  A symbol is an integer, so a comparison of an operand with itself is a constant.
+#include "base/integer/ExactArithmetic.hpp"
 #include "base/integer/IntegerSet.hpp"
 #include "base/simplify/LogicalChain.hpp"
 #include "base/simplify/RuleTables.hpp"
@@ -71,20 +72,8 @@ SymbolicExprId truthAgainstInteger(RuleContext& context, const RuleOperands& x) 
 
 template <class Number>
 bool holds(SymbolicOp op, Number a, Number b) {
-    switch (op) {
-    case SymbolicOp::Equal:
-        return a == b;
-    case SymbolicOp::NotEqual:
-        return a != b;
-    case SymbolicOp::LessThan:
-        return !(b <= a); // so that what is not a number is less
-    case SymbolicOp::LessThanEqual:
-        return a <= b;
-    case SymbolicOp::GreaterThan:
-        return a > b;
-    default:
-        return a >= b;
-    }
+    // What is not a number is less.
+    return op == SymbolicOp::LessThan ? !compareNumbers(SymbolicOp::GreaterThanEqual, a, b) : compareNumbers(op, a, b);
 }
 
 SymbolicExprId comparedNumbers(RuleContext& context, const RuleOperands& x) {

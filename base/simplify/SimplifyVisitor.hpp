@@ -16,8 +16,8 @@ namespace VT {
 /// and Or.
 ///
 /// A chain of one operator is simplified at its topmost node, once, so that a long chain does not cost its square. When
-/// a chain or a distribution is beyond the operand limit, or the rules have multiplied out more than one call may,
-/// gaveUp is set; the result of that pass is not to be used.
+/// a chain or a distribution is beyond the operand limit, or the rules have multiplied out more than one call may, the
+/// pass gives up; its result is not to be used.
 ///
 /// Below a comparison or a logical operator quotients are those of integers, truncated toward zero; elsewhere they are
 /// those of dimensions, which divide exactly.  A pass rebuilds a node that is in both places once for each.  A visit

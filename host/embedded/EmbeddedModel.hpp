@@ -6,6 +6,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <deque>
+#include <optional>
 #include <span>
 #include <string>
 #include <string_view>
@@ -22,6 +23,24 @@ struct TextPlace {
     std::uint64_t line = 0;
     std::uint64_t column = 0;
     std::uint64_t endColumn = 0; ///< after the last one
+};
+
+/// Bytes of a text, from `begin` to before `end`.
+struct TextRange {
+    std::size_t begin = 0;
+    std::size_t end = 0;
+};
+
+/// Which choice of a block is the active one: the one whose condition holds, the first of those, or every one.
+enum class ChoiceRule : std::uint8_t { Unique, First, Collect };
+
+/// The values that a symbol of conditions is declared to have.
+struct DeclaredSymbol {
+    std::string name;
+    TextPlace place;
+    std::optional<std::vector<int>> values = {}; ///< all of them, in any order
+    std::optional<int> min = {};
+    std::optional<int> max = {};
 };
 
 } // namespace VT::Embedded
@@ -45,6 +64,15 @@ public:
     /// The choices of this block, in the order of the model.
     [[nodiscard]] std::span<const VTBlock* const> choices() const noexcept { return choices_; }
 
+    /// The bytes of the block in the file of the model; none for a block that is not from a file.
+    [[nodiscard]] const VT::Embedded::TextRange& textRange() const noexcept { return textRange_; }
+
+    void setTextRange(const VT::Embedded::TextRange& range) noexcept { textRange_ = range; }
+
+    [[nodiscard]] VT::Embedded::ChoiceRule choiceRule() const noexcept { return choiceRule_; }
+
+    void setChoiceRule(VT::Embedded::ChoiceRule rule) noexcept { choiceRule_ = rule; }
+
     /// The names from the top of the model, separated by "/"; of more than eight the last eight, after ".../".
     /// Names are shown fit for a terminal, long ones cut.
     [[nodiscard]] std::string path() const;
@@ -67,8 +95,10 @@ private:
     std::string name_;
     std::string condition_;
     std::vector<const VTBlock*> choices_;
+    VT::Embedded::ChoiceRule choiceRule_ = VT::Embedded::ChoiceRule::Unique;
     VT::Embedded::TextPlace namePlace_;
     VT::Embedded::TextPlace conditionPlace_;
+    VT::Embedded::TextRange textRange_;
 };
 
 /// A port: a signal leaves one block for others.
@@ -125,6 +155,17 @@ public:
 
     [[nodiscard]] const std::deque<vtPort>& ports() const noexcept { return ports_; }
 
+    /// Symbols with declared values, in the order in which they were added.
+    [[nodiscard]] const std::deque<VT::Embedded::DeclaredSymbol>& symbols() const noexcept { return symbols_; }
+
+    /// Adds a symbol without values yet.
+    VT::Embedded::DeclaredSymbol& addSymbol(std::string name, const VT::Embedded::TextPlace& place = {}) {
+        return symbols_.emplace_back(VT::Embedded::DeclaredSymbol{std::move(name), place});
+    }
+
+    /// The symbol that was added last; there is one.
+    [[nodiscard]] VT::Embedded::DeclaredSymbol& lastSymbol() { return symbols_.back(); }
+
     /// The block of a path, "Engine/Diesel", or nullptr.
     [[nodiscard]] const VTBlock* find(std::string_view path) const;
 
@@ -145,5 +186,6 @@ private:
     bool isQuill_ = false;
     std::deque<VTBlock> blocks_;
     std::deque<vtPort> ports_;
+    std::deque<VT::Embedded::DeclaredSymbol> symbols_;
     std::unordered_map<Key, const VTBlock*, KeyHash> named_;
 };

@@ -12,7 +12,9 @@
 
 #include <algorithm>
 #include <array>
+#include <limits>
 #include <optional>
+#include <unordered_set>
 #include <utility>
 
 namespace VT::Embedded {
@@ -86,46 +88,56 @@ private:
 
 // The members of a model.
 
-enum class Part : std::uint8_t { Model, Blocks, Choices, Block, Ports, Port, Destinations };
+enum class Part : std::uint8_t { Model, Blocks, Choices, Block, Ports, Port, Destinations, Symbols, Symbol, Values };
 
-enum class Shape : std::uint8_t { Text, List, TextOrList };
+enum class Shape : std::uint8_t { Text, List, TextOrList, Integer, Object };
 
 struct Member {
     Part in;
     std::string_view name;
     Shape shape;
-    Part list; ///< the part that its list is
+    Part list; ///< the part that its list or object is
 };
 
-constexpr std::array<Member, 14> members{{
+constexpr std::array<Member, 19> members{{
     {Part::Model, "$schema", Shape::Text, {}},
     {Part::Model, "name", Shape::Text, {}},
     {Part::Model, "description", Shape::Text, {}},
     {Part::Model, "language", Shape::Text, {}},
     {Part::Model, "blocks", Shape::List, Part::Blocks},
     {Part::Model, "ports", Shape::List, Part::Ports},
+    {Part::Model, "symbols", Shape::Object, Part::Symbols},
     {Part::Block, "name", Shape::Text, {}},
     {Part::Block, "description", Shape::Text, {}},
     {Part::Block, "condition", Shape::Text, {}},
     {Part::Block, "blocks", Shape::List, Part::Blocks},
     {Part::Block, "choices", Shape::List, Part::Choices},
+    {Part::Block, "policy", Shape::Text, {}},
     {Part::Port, "name", Shape::Text, {}},
     {Part::Port, "from", Shape::Text, {}},
     {Part::Port, "to", Shape::TextOrList, Part::Destinations},
+    {Part::Symbol, "values", Shape::List, Part::Values},
+    {Part::Symbol, "min", Shape::Integer, {}},
+    {Part::Symbol, "max", Shape::Integer, {}},
 }};
 
 bool isObject(Part part) {
-    return part == Part::Model || part == Part::Block || part == Part::Port;
+    return part == Part::Model || part == Part::Block || part == Part::Port || part == Part::Symbol;
 }
 
 std::string_view nameOf(Part part) {
-    return part == Part::Model ? "a model" : part == Part::Block ? "a block" : "a port";
+    return part == Part::Model   ? "a model"
+           : part == Part::Block ? "a block"
+           : part == Part::Port  ? "a port"
+                                 : "a symbol";
 }
 
 std::string inQuotes(std::string_view text) {
     std::string result = "\"";
     return result.append(shownText(text, shownBytes)).append("\"");
 }
+
+constexpr std::string_view integerWanted = "write an integer of 32 bits";
 
 class Reader final : public nlohmann::json_sax<Json> {
 public:
@@ -142,9 +154,12 @@ public:
 
     bool boolean(bool) override { refuse(); }
 
-    bool number_integer(number_integer_t) override { refuse(); }
+    bool number_integer(number_integer_t value) override { return integer(value); }
 
-    bool number_unsigned(number_unsigned_t) override { refuse(); }
+    bool number_unsigned(number_unsigned_t value) override {
+        return integer(
+            static_cast<std::int64_t>(std::min<std::uint64_t>(value, std::numeric_limits<int>::max() + 1ULL)));
+    }
 
     bool number_float(number_float_t, const string_t&) override { refuse(); }
 
@@ -164,6 +179,7 @@ private:
         Part part;
         TextPlace place;                ///< of its bracket
         VTBlock* block = nullptr;       ///< that it is, or that owns the list
+        std::size_t begin = 0;          ///< of its bracket, in bytes
         std::uint64_t index = 0;        ///< elements read before, in a list
         const Member* member = nullptr; ///< whose value comes next, in an object
         std::vector<std::string_view> seen = {};
@@ -199,7 +215,10 @@ private:
     [[nodiscard]] std::string pointer() const;
     void open(Part part, VTBlock* block);
     void close();
+    bool integer(std::int64_t value);
     void setText(const std::string& text);
+    void setPolicy(const std::string& text);
+    void endSymbol();
     void setLanguage(const std::string& text);
     const VTBlock& resolve(const PendingName& name) const;
 
@@ -211,6 +230,7 @@ private:
     std::size_t end_ = 0; ///< after it
     std::vector<Open> open_;
     std::vector<PendingPort> ports_;
+    std::unordered_set<std::string> symbolNames_;
 };
 
 /// Finds the place of the token that the parser has just read.
@@ -230,7 +250,10 @@ std::string Reader::pointer() const {
     constexpr std::size_t shown = 16;
     std::string pointer = open_.size() > shown ? "..." : "";
     for (std::size_t i = open_.size() > shown ? open_.size() - shown : 0; i < open_.size(); ++i) {
-        if (!isObject(open_[i].part))
+        if (open_[i].part == Part::Symbols)
+            pointer.append("/").append(model_.symbols().empty() ? ""
+                                                                : shownText(model_.symbols().back().name, shownBytes));
+        else if (!isObject(open_[i].part))
             pointer.append("/").append(std::to_string(open_[i].index));
         else if (open_[i].member != nullptr)
             pointer.append("/").append(open_[i].member->name);
@@ -243,17 +266,21 @@ void Reader::refuseShape() const {
         fail(R"(a model is an object: write {"name": ..., "blocks": [...]})");
     const Open& top = open_.back();
     if (!isObject(top.part)) {
-        fail(top.part == Part::Destinations ? "write the path of a block, such as \"Engine/Diesel\""
-             : top.part == Part::Ports      ? R"(write a port, {"name": ..., "from": ..., "to": ...})"
-                                            : R"(write a block, {"name": ..., "condition": ...})");
+        fail(top.part == Part::Values         ? std::string(integerWanted)
+             : top.part == Part::Symbols      ? R"(write an object, {"values": [1, 2]} or {"min": 0, "max": 9})"
+             : top.part == Part::Destinations ? "write the path of a block, such as \"Engine/Diesel\""
+             : top.part == Part::Ports        ? R"(write a port, {"name": ..., "from": ..., "to": ...})"
+                                              : R"(write a block, {"name": ..., "condition": ...})");
     }
-    fail(top.member->shape == Shape::Text   ? "write a text in quotes"
-         : top.member->shape == Shape::List ? "write a list, [...]"
-                                            : "write the path of a block, or a list of such paths");
+    fail(top.member->shape == Shape::Text      ? "write a text in quotes"
+         : top.member->shape == Shape::Integer ? std::string(integerWanted)
+         : top.member->shape == Shape::Object  ? R"(write an object, {"NAME": {"values": [1, 2]}})"
+         : top.member->shape == Shape::List    ? "write a list, [...]"
+                                               : "write the path of a block, or a list of such paths");
 }
 
 void Reader::open(Part part, VTBlock* block) {
-    open_.push_back({part, place_, block});
+    open_.push_back({part, place_, block, end_ - 1});
 }
 
 void Reader::close() {
@@ -279,6 +306,10 @@ bool Reader::start_object(std::size_t) {
         ports_.emplace_back();
         ports_.back().place = place_;
         open(Part::Port, nullptr);
+    } else if (top.part == Part::Symbols) {
+        open(Part::Symbol, nullptr);
+    } else if (top.member != nullptr && top.member->shape == Shape::Object) {
+        open(top.member->list, nullptr);
     } else {
         refuseShape();
     }
@@ -287,8 +318,11 @@ bool Reader::start_object(std::size_t) {
 
 bool Reader::start_array(std::size_t) {
     step();
-    if (open_.empty() || open_.back().member == nullptr || open_.back().member->shape == Shape::Text)
+    if (open_.empty() || open_.back().member == nullptr ||
+        (open_.back().member->shape != Shape::List && open_.back().member->shape != Shape::TextOrList))
         refuseShape();
+    if (open_.back().member->list == Part::Values)
+        model_.lastSymbol().values.emplace();
     open(open_.back().member->list, open_.back().block);
     return true;
 }
@@ -296,6 +330,13 @@ bool Reader::start_array(std::size_t) {
 bool Reader::key(string_t& name) {
     step();
     Open& top = open_.back();
+    if (top.part == Part::Symbols) {
+        const bool isNew = symbolNames_.insert(name).second;
+        model_.addSymbol(name, place_);
+        if (!isNew)
+            fail("this symbol is here twice: take one away");
+        return true;
+    }
     const auto* const member =
         std::ranges::find_if(members, [&](const Member& each) { return each.in == top.part && each.name == name; });
     if (member == members.end()) {
@@ -322,7 +363,7 @@ bool Reader::string(string_t& text) {
         ++top.index;
         return true;
     }
-    if (top.member == nullptr || top.member->shape == Shape::List)
+    if (top.member == nullptr || (top.member->shape != Shape::Text && top.member->shape != Shape::TextOrList))
         refuseShape();
     setText(text);
     top.member = nullptr;
@@ -351,7 +392,47 @@ void Reader::setText(const std::string& text) {
         top.block->setVariantCondition(text, place_);
     } else if (member == "language") {
         setLanguage(text);
+    } else if (member == "policy") {
+        setPolicy(text);
     }
+}
+
+void Reader::setPolicy(const std::string& text) {
+    static constexpr std::array<std::string_view, 3> words{"unique", "first", "collect"}; // in the order of ChoiceRule
+    const auto* const word = std::ranges::find(words, text);
+    if (word == words.end())
+        fail("there is no policy " + inQuotes(text) + R"(: write "unique", "first" or "collect")");
+    open_.back().block->setChoiceRule(static_cast<ChoiceRule>(word - words.begin()));
+}
+
+bool Reader::integer(std::int64_t value) {
+    step();
+    const bool isIn = value >= std::numeric_limits<int>::min() && value <= std::numeric_limits<int>::max();
+    const bool isElement = !open_.empty() && open_.back().part == Part::Values;
+    const Member* const member = open_.empty() ? nullptr : open_.back().member;
+    if (!isIn || !(isElement || (member != nullptr && member->shape == Shape::Integer)))
+        refuseShape();
+    DeclaredSymbol& symbol = model_.lastSymbol();
+    if (isElement) {
+        symbol.values->push_back(static_cast<int>(value));
+        ++open_.back().index;
+        return true;
+    }
+    (member->name == "min" ? symbol.min : symbol.max) = static_cast<int>(value);
+    open_.back().member = nullptr;
+    return true;
+}
+
+/// A symbol has at least one value.
+void Reader::endSymbol() {
+    const DeclaredSymbol& symbol = model_.lastSymbol();
+    const auto isIn = [&](int value) {
+        return (!symbol.min || value >= *symbol.min) && (!symbol.max || value <= *symbol.max);
+    };
+    const bool hasValue = symbol.values ? std::ranges::any_of(*symbol.values, isIn)
+                                        : !symbol.min || !symbol.max || *symbol.min <= *symbol.max;
+    if (!hasValue)
+        fail("this symbol has no value: add one, or correct its bounds", symbol.place, pointer());
 }
 
 void Reader::setLanguage(const std::string& text) {
@@ -371,7 +452,11 @@ bool Reader::end_object() {
             if (!has(needed))
                 fail(std::string(nameOf(part)) + " without " + inQuotes(needed) + ": add it", begin, pointer());
     }
+    if (part == Part::Symbol)
+        endSymbol();
     step();
+    if (part == Part::Block)
+        open_.back().block->setTextRange({open_.back().begin, end_});
     close();
     return true;
 }

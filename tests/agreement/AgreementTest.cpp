@@ -202,6 +202,8 @@ TEST(Agreement, OnEveryOperatorInEveryOperandOfEveryOther) {
         const SymbolicExprId other = anyLeaf(table, random, world);
         return operandCount(op) == 1 ? tree(op, id) : position == 0 ? tree(op, id, other) : tree(op, other, id);
     };
+    for (const Op op : valueOperators())
+        ASSERT_TRUE(computed(op, 6, 3)) << "the oracle does not know " << operatorInfo(op).name;
     for (const Op outer : valueOperators())
         for (const Op inner : valueOperators())
             for (std::size_t position = 0; position < operandCount(outer); ++position)

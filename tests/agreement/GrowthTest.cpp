@@ -83,7 +83,8 @@ const std::vector<Family> families{
     {"product",
      [](std::size_t n) { return joined(n, "*", [](std::size_t i) { return "(A+" + number(i) + ")"; }) + "==0"; }},
     {"quotients",
-     [](std::size_t n) { return "A" + joined(n, "", [](std::size_t i) { return "/" + number(i + 2); }) + ">1"; }},
+     [](std::size_t n) { return "A" + joined(n, "", [](std::size_t i) { return "/" + number(i + 2); }) + ">1"; }, 1, 1,
+     2},
     {"shifts",
      [](std::size_t n) {
          return "A" + joined(n, "", [](std::size_t i) { return (i % 2 == 0 ? "<<" : ">>") + number(i % 5); }) + ">1";
@@ -92,7 +93,8 @@ const std::vector<Family> families{
      [](std::size_t n) { return joined(n, "&&", [](std::size_t i) { return "(F&" + number(i + 1) + ")!=0"; }); }, 1, 1,
      3},
     {"truth values as numbers",
-     [](std::size_t n) { return joined(n, "+", [](std::size_t i) { return "(A" + number(i) + ">B)"; }) + ">=2"; }},
+     [](std::size_t n) { return joined(n, "+", [](std::size_t i) { return "(A" + number(i) + ">B)"; }) + ">=2"; }, 1, 1,
+     2},
     {"pairs in another order",
      [](std::size_t n) {
          return joined(n, "||", [n](std::size_t i) { return "A" + number(n - i) + "==1&&B" + number(i) + "==1"; });

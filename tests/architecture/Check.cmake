@@ -1,5 +1,5 @@
-# Checks the layout of the sources: #include lines follow the arrows between the layers, no two files share a name, and no
-# folder holds more files than a reader takes in.  Run as a script.
+# Checks the layout of the sources: #include lines follow the arrows between the layers, no two files share a name, no
+# folder holds more files than a reader takes in, and every bound is in Limits.hpp.  Run as a script.
 
 cmake_policy(VERSION 3.25)
 cmake_path(SET root NORMALIZE ${CMAKE_CURRENT_LIST_DIR}/../..)
@@ -99,10 +99,33 @@ function(inspect_names tree complaints_result)
   set(${complaints_result} "${complaints}" PARENT_SCOPE)
 endfunction()
 
+# The complaints about bounds: a constant whose name says that it is one belongs to Limits.hpp, where its unit and its
+# consequence are.
+function(inspect_bounds tree complaints_result)
+  set(complaints)
+  file(GLOB_RECURSE files RELATIVE ${tree} ${tree}/base/*.?pp ${tree}/parser/*.?pp)
+  foreach(file IN LISTS files)
+    if(file STREQUAL "base/core/Limits.hpp")
+      continue()
+    endif()
+    file(STRINGS ${tree}/${file} lines REGEX "constexpr (std::)?(size_t|u?int[0-9]*_t|unsigned|int|double) [a-zA-Z]+ *(=|{).*[0-9]")
+    foreach(line IN LISTS lines)
+      string(REGEX MATCH "constexpr [a-z0-9_:]+ ([a-zA-Z]+)" matched "${line}")
+      set(name ${CMAKE_MATCH_1})
+      if(name MATCHES "^(most|least|fewest|longest|largest|smallest|deepest|kept|shown|max|min|limit)[A-Z]" OR
+          name MATCHES "(Steps|Rounds|Tries|Limit|Bound)$")
+        list(APPEND complaints "${file}: the bound ${name} belongs to base/core/Limits.hpp")
+      endif()
+    endforeach()
+  endforeach()
+  set(${complaints_result} "${complaints}" PARENT_SCOPE)
+endfunction()
+
 # The check is checked first, by a sample of breaches among what is allowed.
 inspect_includes(${CMAKE_CURRENT_LIST_DIR}/sample count complaints)
 inspect_names(${CMAKE_CURRENT_LIST_DIR}/sample names)
-list(APPEND complaints ${names})
+inspect_bounds(${CMAKE_CURRENT_LIST_DIR}/sample bounds)
+list(APPEND complaints ${names} ${bounds})
 file(STRINGS ${CMAKE_CURRENT_LIST_DIR}/sample/expected.txt expected)
 list(SORT complaints)
 list(SORT expected)
@@ -116,7 +139,8 @@ if(count EQUAL 0)
   message(FATAL_ERROR "no sources found")
 endif()
 inspect_names(${root} names)
-list(APPEND complaints ${names})
+inspect_bounds(${root} bounds)
+list(APPEND complaints ${names} ${bounds})
 if(complaints)
   string(REPLACE ";" "\n  " complaints "${complaints}")
   message(FATAL_ERROR "the layout is broken:\n  ${complaints}")

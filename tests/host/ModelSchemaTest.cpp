@@ -38,11 +38,19 @@ public:
         const std::string type = schema.value("type", "");
         if (type == "string")
             return random_() % 2 == 0 ? "" : "text " + std::to_string(random_() % 9);
+        if (type == "integer")
+            return static_cast<int>(random_()) >> (random_() % 32);
         if (type == "array") {
             Json array = Json::array();
             for (std::size_t left = depth > 0 ? random_() % 4 : 0; left > 0; --left)
                 array.push_back(make(schema["items"], parent, depth - 1));
             return array;
+        }
+        if (!schema.contains("properties")) {
+            Json object = Json::object();
+            for (std::size_t left = random_() % 3; left > 0; --left)
+                object["S" + std::to_string(left)] = make(schema["additionalProperties"], "", depth);
+            return object;
         }
         const auto required = schema.value("required", std::vector<std::string>());
         Json object = Json::object();
@@ -104,7 +112,8 @@ TEST(ModelSchema, DescribesWhatTheReaderAccepts) {
         const std::string errors = schemaErrors(modelSchema, modelSchema, model);
         const std::string said = refusal(model);
         // Only the reader knows the blocks that a path may lead to.
-        if (said.find("path") != std::string::npos || said.find("no block") != std::string::npos)
+        if (said.find("path") != std::string::npos || said.find("no block") != std::string::npos ||
+            said.find("has no value") != std::string::npos) // nor does a schema compare bounds
             continue;
         ASSERT_EQ(errors.empty(), said.empty()) << model.dump() << "\nschema: " << errors << "reader: " << said;
         refused += said.empty() ? 0U : 1U;
@@ -114,8 +123,10 @@ TEST(ModelSchema, DescribesWhatTheReaderAccepts) {
 
 /// A member that only the reader knows is never generated, but the reader lists its members when it refuses one.
 TEST(ModelSchema, NamesEveryMemberThatTheReaderKnows) {
-    const std::map<std::string, std::string> models{
-        {"", R"({"?":1})"}, {"/$defs/block", R"({"blocks":[{"?":1}]})"}, {"/$defs/port", R"({"ports":[{"?":1}]})"}};
+    const std::map<std::string, std::string> models{{"", R"({"?":1})"},
+                                                    {"/$defs/block", R"({"blocks":[{"?":1}]})"},
+                                                    {"/$defs/port", R"({"ports":[{"?":1}]})"},
+                                                    {"/$defs/symbol", R"({"symbols":{"S":{"?":1}}})"}};
     for (const auto& [pointer, model] : models) {
         const std::string said = refusal(Json::parse(model));
         std::istringstream listed(said.substr(said.rfind(" has ") + 5));

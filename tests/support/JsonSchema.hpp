@@ -30,6 +30,8 @@ inline std::string schemaErrors(const nlohmann::json& root, const nlohmann::json
         errors += place + ": is none of the values\n";
     if (schema.contains("minimum") && value < schema["minimum"])
         errors += place + ": is too small\n";
+    if (schema.contains("maximum") && value > schema["maximum"])
+        errors += place + ": is too large\n";
     if (value.is_string() && schema.contains("pattern") &&
         !std::regex_match(value.get<std::string>(), std::regex(schema["pattern"].get<std::string>())))
         errors += place + ": is not of the pattern\n";
@@ -47,10 +49,11 @@ inline std::string schemaErrors(const nlohmann::json& root, const nlohmann::json
         if (!value.contains(name.get<std::string>()))
             errors += place + ": lacks " + name.get<std::string>() + "\n";
     const auto members = schema.value("properties", nlohmann::json::object());
+    const auto others = schema.value("additionalProperties", nlohmann::json(true));
     for (const auto& [name, member] : value.items())
-        if (members.contains(name))
-            errors += schemaErrors(root, members[name], member, place + "/" + name);
-        else if (!schema.value("additionalProperties", true))
+        if (members.contains(name) || others.is_object())
+            errors += schemaErrors(root, members.contains(name) ? members[name] : others, member, place + "/" + name);
+        else if (others == false)
             errors += place + ": has a strange " + name + "\n";
     return errors;
 }

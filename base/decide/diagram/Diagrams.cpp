@@ -8,6 +8,7 @@
 #include "base/decide/diagram/Diagrams.hpp"
 
 #include "base/core/Check.hpp"
+#include "base/core/Limits.hpp"
 #include "base/util/Hash.hpp"
 
 #include <algorithm>
@@ -16,7 +17,7 @@ namespace VT {
 
 namespace {
 
-constexpr std::size_t firstSlots = 256;
+constexpr std::size_t firstSlots = 64;
 
 /// The slot for a hash: its upper half is the well mixed one.
 std::size_t slotFor(std::uint64_t hash, std::size_t slots) noexcept {
@@ -25,19 +26,23 @@ std::size_t slotFor(std::uint64_t hash, std::size_t slots) noexcept {
 
 } // namespace
 
-Diagrams::Diagrams(const Unknowns& unknowns, Steps& steps) : unknowns_(unknowns), steps_(steps) {
-    clear();
+Diagrams::Diagrams(Steps& steps) : steps_(steps) {
+    begin({});
 }
 
-void Diagrams::clear() {
-    nodes_.assign(1, {noQuantity, 0, 0, false});
+void Diagrams::begin(std::span<const LevelInfo> levels) {
+    const auto reset = [](auto& slots) { // memory that one large question needed is not kept for the small ones
+        if (slots.size() > limits::keptSlots)
+            std::remove_reference_t<decltype(slots)>(firstSlots).swap(slots);
+    };
+    reset(index_);
+    reset(known_);
+    nodes_.assign(1, {noLevel, 0, 0, false});
     edges_.clear();
-    index_.assign(firstSlots, 0);
-    known_.assign(firstSlots, {});
-    beginQuestion();
-}
-
-void Diagrams::beginQuestion() {
+    std::ranges::fill(index_, 0);
+    index_.resize(std::max(index_.size(), firstSlots));
+    known_.resize(std::max(known_.size(), firstSlots));
+    levels_ = levels;
     frames_.clear();
     scratch_.clear();
     knownCount_ = 0;
@@ -47,22 +52,35 @@ void Diagrams::beginQuestion() {
     }
 }
 
+Diagram Diagrams::of(const Question& question) {
+    begin(question.levels());
+    std::vector<Diagram>& made = made_;
+    made.clear();
+    for (const Question::Node& node : question.nodes()) {
+        if (question.isComparison(node)) {
+            made.push_back(comparison(node.level, question.ends(node)));
+            continue;
+        }
+        row_.clear();
+        for (const Gate operand : question.operands(node))
+            row_.push_back(made[operand >> 1U] ^ (operand & 1U));
+        made.push_back(all(row_));
+    }
+    return made[question.root() >> 1U] ^ (question.root() & 1U);
+}
+
 // Nodes.
 
-Diagram Diagrams::between(Quantity quantity, std::int64_t low, std::int64_t high) {
-    const QuantityInfo& info = unknowns_.quantity(quantity);
-    if (low > high || low > info.high || high < info.low)
-        return never;
+Diagram Diagrams::comparison(Level level, std::span<const std::int64_t> ends) {
+    steps_.take(ends.size());
     const std::size_t scratch = scratch_.size();
-    if (low > info.low)
-        append(scratch, low - 1, never);
-    if (high < info.high) {
-        append(scratch, high, always);
-        append(scratch, plusInfinite, never);
-    } else {
-        append(scratch, plusInfinite, always);
+    Diagram child = always;
+    for (const std::int64_t end : ends) {
+        append(scratch, end, child);
+        child = opposite(child);
     }
-    return make(quantity, scratch);
+    append(scratch, plusInfinite, child);
+    return make(level, scratch);
 }
 
 /// Adds an edge to those from `scratch` on.
@@ -74,13 +92,12 @@ void Diagrams::append(std::size_t scratch, std::int64_t high, Diagram child) {
 }
 
 /// Whether the edges from `scratch` on are those of a node: in order, up to infinity, no two neighbours alike, and
-/// children that branch on later quantities.
-[[maybe_unused]] bool Diagrams::isReduced(Quantity quantity, std::size_t scratch) const {
+/// children that branch on later levels.
+[[maybe_unused]] bool Diagrams::isReduced(Level level, std::size_t scratch) const {
     for (std::size_t i = scratch; i < scratch_.size(); ++i) {
         const Edge& edge = scratch_[i];
         const bool follows = i == scratch || (scratch_[i - 1].high < edge.high && scratch_[i - 1].child != edge.child);
-        const bool below =
-            isTerminal(edge.child) || unknowns_.key(quantity) < unknowns_.key(this->quantity(edge.child));
+        const bool below = level < this->level(edge.child);
         if (!follows || !below)
             return false;
     }
@@ -88,7 +105,7 @@ void Diagrams::append(std::size_t scratch, std::int64_t high, Diagram child) {
 }
 
 /// The node with the edges from `scratch` on, which are taken away.
-Diagram Diagrams::make(Quantity quantity, std::size_t scratch) {
+Diagram Diagrams::make(Level level, std::size_t scratch) {
     const Diagram flip = scratch_[scratch].child & 1U; // the first edge of a node is never negated
     const std::size_t count = scratch_.size() - scratch;
     if (count == 1) {
@@ -96,8 +113,8 @@ Diagram Diagrams::make(Quantity quantity, std::size_t scratch) {
         scratch_.resize(scratch);
         return only;
     }
-    VTSYM_CHECK(isReduced(quantity, scratch));
-    std::uint64_t hash = hashStep(0, quantity); // quantities and bounds often grow together
+    VTSYM_CHECK(isReduced(level, scratch));
+    std::uint64_t hash = hashStep(0, level); // levels and bounds often grow together
     for (std::size_t i = scratch; i < scratch_.size(); ++i) {
         scratch_[i].child ^= flip;
         hash = hashStep(hashStep(hash, static_cast<std::uint64_t>(scratch_[i].high)), scratch_[i].child);
@@ -109,20 +126,19 @@ Diagram Diagrams::make(Quantity quantity, std::size_t scratch) {
     const auto fresh = scratch_.begin() + static_cast<std::ptrdiff_t>(scratch);
     for (; index_[at] != 0; at = (at + 1) & mask, ++probes_) {
         const Node& node = nodes_[index_[at]];
-        if (node.quantity == quantity && node.count == count &&
+        if (node.level == level && node.count == count &&
             std::equal(fresh, scratch_.end(), edges_.begin() + static_cast<std::ptrdiff_t>(node.first))) {
             scratch_.resize(scratch);
             return index_[at] * 2 + flip;
         }
     }
-    const QuantityInfo& info = unknowns_.quantity(quantity);
-    bool needsChecking = info.isDifference() || unknowns_[info.plus].isComputed();
+    bool needsChecking = levels_[level].isChecked;
     for (auto edge = fresh; edge != scratch_.end(); ++edge)
         needsChecking = needsChecking || this->needsChecking(edge->child);
     const auto number = static_cast<std::uint32_t>(nodes_.size());
     const auto first = static_cast<std::uint32_t>(edges_.size());
     edges_.insert(edges_.end(), fresh, scratch_.end());
-    nodes_.push_back({quantity, first, static_cast<std::uint32_t>(count), needsChecking});
+    nodes_.push_back({level, first, static_cast<std::uint32_t>(count), needsChecking});
     index_[at] = number;
     scratch_.resize(scratch);
     return number * 2 + flip;
@@ -134,7 +150,7 @@ void Diagrams::growIndex() {
     const std::size_t mask = index_.size() - 1;
     for (std::uint32_t number = 1; number < nodes_.size(); ++number) {
         const Node& node = nodes_[number];
-        std::uint64_t hash = hashStep(0, node.quantity);
+        std::uint64_t hash = hashStep(0, node.level);
         for (std::uint32_t i = 0; i < node.count; ++i) {
             const Edge& edge = edges_[node.first + i];
             hash = hashStep(hashStep(hash, static_cast<std::uint64_t>(edge.high)), edge.child);
@@ -196,11 +212,11 @@ bool Diagrams::resolve(Diagram a, Diagram b, Diagram& result) {
 void Diagrams::enter(Diagram a, Diagram b) {
     if (a > b)
         std::swap(a, b);
-    const Quantity quantityA = quantity(a);
-    const Quantity quantityB = quantity(b);
-    const bool inA = quantityA == quantityB || unknowns_.key(quantityA) < unknowns_.key(quantityB);
-    const bool inB = quantityA == quantityB || !inA;
-    frames_.push_back({a, b, inA ? quantityA : quantityB, inA ? 0 : none, inB ? 0 : none,
+    const Level levelA = level(a);
+    const Level levelB = level(b);
+    const bool inA = levelA <= levelB;
+    const bool inB = levelB <= levelA;
+    frames_.push_back({a, b, std::min(levelA, levelB), inA ? 0 : none, inB ? 0 : none,
                        static_cast<std::uint32_t>(scratch_.size()), 0});
 }
 
@@ -216,7 +232,7 @@ Diagram Diagrams::both(Diagram a, Diagram b) {
         if (returned)
             append(frame.scratch, frame.high, result);
         if (returned && frame.high == plusInfinite) {
-            result = make(frame.quantity, frame.scratch);
+            result = make(frame.level, frame.scratch);
             remember(frame.a, frame.b, result);
             frames_.pop_back();
             if (frames_.size() == bottom) {
@@ -243,27 +259,15 @@ Diagram Diagrams::both(Diagram a, Diagram b) {
     }
 }
 
-Diagram Diagrams::fold(std::span<const Diagram> diagrams, Diagram flip) {
-    std::vector<Diagram> level;
-    level.reserve(diagrams.size());
-    for (const Diagram diagram : diagrams)
-        level.push_back(diagram ^ flip);
-    while (level.size() > 1) {
-        for (std::size_t i = 0; i + 1 < level.size(); i += 2)
-            level[i / 2] = both(level[i], level[i + 1]);
-        if (level.size() % 2 != 0)
-            level[level.size() / 2] = level.back();
-        level.resize((level.size() + 1) / 2);
+Diagram Diagrams::all(std::vector<Diagram>& diagrams) {
+    while (diagrams.size() > 1) {
+        for (std::size_t i = 0; i + 1 < diagrams.size(); i += 2)
+            diagrams[i / 2] = both(diagrams[i], diagrams[i + 1]);
+        if (diagrams.size() % 2 != 0)
+            diagrams[diagrams.size() / 2] = diagrams.back();
+        diagrams.resize((diagrams.size() + 1) / 2);
     }
-    return level.empty() ? always : level.front();
-}
-
-Diagram Diagrams::all(std::span<const Diagram> diagrams) {
-    return fold(diagrams, 0);
-}
-
-Diagram Diagrams::any(std::span<const Diagram> diagrams) {
-    return opposite(fold(diagrams, 1));
+    return diagrams.empty() ? always : diagrams.front();
 }
 
 } // namespace VT

@@ -1,13 +1,14 @@
-// The unknowns of conditions, the quantities that comparisons restrict, and their order.
+// The unknowns of conditions, and the quantities that comparisons restrict.
 //
-// A diagram must not depend on what was interned or asked before, so quantities are ordered by text, never by number.
-// The order of unknowns is kept in a tree (one text comparison for each level when an unknown is met for the first
-// time) with labels of 64 bits that leave gaps, so that two quantities are compared as numbers; when a gap is full the
-// labels around it are dealt anew, which changes no order.
+// Witnesses list unknowns in the order of their texts.  That order of free unknowns is kept in a tree (one text
+// comparison for each level when an unknown is met for the first time) with labels of 64 bits that leave gaps, so that
+// two unknowns are compared as numbers; when a gap is full the labels around it are dealt anew, which changes no order.
+//
+// Numbers of unknowns and quantities depend on what was read before; nothing but equality may be concluded from them.
 #pragma once
 
 #include "base/core/Table.hpp"
-#include "base/integer/LinearForm.hpp"
+#include "base/integer/RationalForm.hpp"
 #include "base/print/ExpressionPrinter.hpp"
 #include "base/util/IdMap.hpp"
 
@@ -20,7 +21,7 @@
 
 namespace VT {
 
-/// Something that a diagram branches on: an unknown, or the difference of two.
+/// Something that a comparison restricts: an unknown, or the difference of two.
 using Quantity = std::uint32_t;
 
 inline constexpr Unknown noUnknown = ~Unknown{0};
@@ -30,25 +31,33 @@ enum class UnknownKind : std::uint8_t {
     Free,       ///< a symbol, a call, a member
     Term,       ///< arithmetic whose value follows from other unknowns
     Sum,        ///< a sum of multiples of unknowns
+    Floor,      ///< a sum divided by a constant and rounded toward minus infinity, or a sum with large numbers
+};
+
+/// The whole part of form / divisor; the form is of integers, the divisor positive.
+struct FloorOf {
+    WideForm form;
+    BigInteger divisor;
+    bool operator==(const FloorOf&) const = default;
 };
 
 struct UnknownInfo {
     UnknownKind kind;
-    SymbolicExprId node; ///< of a free unknown or a term
-    LinearParts sum;     ///< of a sum: no common divisor, the first part by text positive
-    std::int64_t low;    ///< no value of the unknown is below
-    std::int64_t high;   ///< or above
-    std::int64_t mask;   ///< every value is made of these bits; 0 where nothing is known
-    std::uint64_t label; ///< grows in the order of unknowns
-    Quantity quantity;   ///< the unknown as a quantity
+    SymbolicExprId node;                            ///< of a free unknown or a term
+    LinearParts sum;                                ///< of a sum: no common divisor, the first part positive
+    std::int64_t low;                               ///< no value of the unknown is below
+    std::int64_t high;                              ///< or above
+    std::uint64_t label = 0;                        ///< of a free one or the keywords: grows in the order of texts
+    Quantity quantity = 0;                          ///< the unknown as a quantity
+    std::shared_ptr<const FloorOf> floor = nullptr; ///< of a floor
 
     /// Whether the value follows from those of free unknowns.
-    [[nodiscard]] bool isComputed() const noexcept { return kind == UnknownKind::Term || kind == UnknownKind::Sum; }
+    [[nodiscard]] bool isComputed() const noexcept { return kind >= UnknownKind::Term; }
 };
 
 struct QuantityInfo {
     Unknown plus;
-    Unknown minus; ///< subtracted, or noUnknown; comes before `plus`
+    Unknown minus; ///< subtracted, or noUnknown
     std::int64_t low;
     std::int64_t high;
 
@@ -65,28 +74,18 @@ public:
     /// @param low,high  bounds that hold for every value of the term
     Unknown term(SymbolicExprId node, std::int64_t low, std::int64_t high);
 
-    /// Tells that every value of a term is made of the bits of a mask.
-    void setMask(Unknown term, std::int64_t mask) { unknowns_[term].mask = mask; }
-
-    /// The sum of the parts, which have no common divisor, and whether it is the sum as given or its opposite.
+    /// The sum of the parts, which have no common divisor, and whether it is the opposite of the sum as given.
     std::pair<Unknown, bool> sum(const LinearParts& parts);
-    /// a - b, or b - a and true: the one that comes later by text minus the other.
+    Unknown floor(FloorOf meaning);
+    /// a - b, or b - a and true.
     std::pair<Quantity, bool> difference(Unknown a, Unknown b);
 
     [[nodiscard]] const UnknownInfo& operator[](Unknown unknown) const { return unknowns_[unknown]; }
 
     [[nodiscard]] const QuantityInfo& quantity(Quantity quantity) const { return quantities_[quantity]; }
 
-    /// Whether an unknown comes before another.
+    /// Whether a free unknown, or the keywords, comes before another by text.
     [[nodiscard]] bool before(Unknown a, Unknown b) const { return unknowns_[a].label < unknowns_[b].label; }
-
-    /// The order of quantities: a difference stands right behind the later of its unknowns.
-    using Key = std::pair<std::uint64_t, std::uint64_t>;
-
-    [[nodiscard]] Key key(Quantity quantity) const {
-        const QuantityInfo& info = quantities_[quantity];
-        return {unknowns_[info.plus].label, info.isDifference() ? unknowns_[info.minus].label : 0};
-    }
 
     [[nodiscard]] std::size_t size() const noexcept { return unknowns_.size(); }
 
@@ -103,9 +102,12 @@ private:
         std::size_t operator()(const LinearParts& parts) const noexcept;
     };
 
+    struct HashOfFloor {
+        std::size_t operator()(const FloorOf& floor) const noexcept;
+    };
+
     [[nodiscard]] int compare(Unknown a, Unknown b) const;
-    [[nodiscard]] int compareSums(const LinearParts& a, const LinearParts& b) const;
-    [[nodiscard]] LinearParts byText(const LinearParts& parts) const;
+    [[nodiscard]] std::pair<std::int64_t, std::int64_t> rangeOf(const LinearParts& parts) const;
     Unknown add(UnknownInfo info);
 
     const SymbolicExprTable& table_;
@@ -117,6 +119,7 @@ private:
     std::set<Unknown, ByText> order_;
     IdMap<Unknown> byNode_;
     boost::unordered_map<LinearParts, Unknown, HashOfParts> sums_;
+    boost::unordered_map<FloorOf, Unknown, HashOfFloor> floors_;
     boost::unordered_map<std::pair<Unknown, Unknown>, Quantity> differences_;
     Unknown simulation_ = noUnknown;
 };

@@ -6,6 +6,7 @@
 // Relies on: exact 64-bit steps (ExactArithmetic); a form beyond the bound of linear forms becomes an unknown.
 #include "base/decide/shorten/ComparedTerms.hpp"
 
+#include "base/core/Limits.hpp"
 #include "base/core/Walk.hpp"
 #include "base/integer/ExactArithmetic.hpp"
 
@@ -106,6 +107,10 @@ ComparedTerms::Number ComparedTerms::compute(SymbolicExprId id, const SymbolicEx
         return opaque;
     const LinearForm& a = numbers_.find(node.getInput(0))->form;
     const LinearForm& b = numbers_.find(node.getInput(count - 1))->form;
+    const std::size_t parts = a.parts.size() + b.parts.size();
+    if (parts > partsLeft_)
+        return opaque;
+    partsLeft_ -= parts;
     std::optional<LinearForm> form;
     if (count == 1 && op == SymbolicOp::UnaryMinus)
         form = combine(a, -1, {}, 0);
@@ -218,7 +223,7 @@ std::optional<Constraint> ComparedTerms::readComparison(SymbolicExprId leaf, Sym
         return Constraint{0, truth(compareExactly(op, a.form.constant, b.real))};
     if (!std::isfinite(b.real))
         return Constraint{0, truth(compareExactly(op, 0, b.real))};
-    if (std::fabs(b.real) > static_cast<double>(largestNumber))
+    if (std::fabs(b.real) > static_cast<double>(limits::formNumber))
         return truthOf(leaf, true, leaf);
     // Between two integers: at most the lower one, or at least the upper one.
     const auto whole = static_cast<std::int64_t>(std::floor(b.real));

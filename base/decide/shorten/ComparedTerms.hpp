@@ -9,6 +9,7 @@
 // range; only where fewer comparisons will do are they put together anew.
 #pragma once
 
+#include "base/core/Limits.hpp"
 #include "base/core/Table.hpp"
 #include "base/cover/Cover.hpp"
 #include "base/decide/LeafReader.hpp"
@@ -107,6 +108,7 @@ private:
     SymbolicExprTable& table_;
     const SymbolicExprPrinter& printer_;
     LeafReader leafReader_;
+    std::size_t partsLeft_ = limits::shortenWork; ///< that sums may add up; beyond it each is an unknown of its own
     IdMap<Number> numbers_;
     IdMap<Unknown> byNode_;
     std::vector<UnknownNode> unknowns_;

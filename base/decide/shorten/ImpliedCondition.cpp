@@ -5,7 +5,6 @@
 // Cost: limits::impliedTries proofs and limits::impliedNodes nodes.
 #include "base/decide/shorten/ImpliedCondition.hpp"
 
-#include "base/core/Chains.hpp"
 #include "base/core/Limits.hpp"
 #include "base/core/Make.hpp"
 #include "base/core/Nodes.hpp"
@@ -27,12 +26,13 @@ ImpliedCondition::ImpliedCondition(SymbolicExprTable& table, const SymbolicExprP
       printer_(printer),
       context_(context),
       isEqual_(std::move(isEqual)),
+      tree_(table),
       triesLeft_(limits::impliedTries),
       nodesLeft_(limits::impliedNodes) {}
 
 SymbolicExprId ImpliedCondition::shorten(SymbolicExprId condition) {
     current_ = condition;
-    if (!split(condition))
+    if (!tree_.split(condition))
         return condition;
     collectComparisons(condition);
     while (removeOperands() || replaceGroups())
@@ -40,49 +40,8 @@ SymbolicExprId ImpliedCondition::shorten(SymbolicExprId condition) {
     return current_;
 }
 
-/// Takes a condition apart into chains; false where it is too large.
-bool ImpliedCondition::split(SymbolicExprId condition) {
-    items_.assign(1, {SymbolicOp::None, condition, 0, {}});
-    for (std::size_t i = 0; i < items_.size(); ++i) {
-        const SymbolicExpr& node = *table_.get(items_[i].id);
-        if (node.op() != SymbolicOp::And && node.op() != SymbolicOp::Or)
-            continue;
-        items_[i].op = node.op();
-        const bool complete = walkChain(
-            table_, items_[i].id, limits::chainOperands - std::min(items_.size(), limits::chainOperands),
-            [&](SymbolicExprId, const SymbolicExpr& link) { return link.op() == node.op(); },
-            [&](SymbolicExprId id, const SymbolicExpr* operand) {
-                items_[i].operands.push_back(items_.size());
-                items_.push_back({SymbolicOp::None, id, i, {}});
-                return operand != nullptr;
-            });
-        if (!complete)
-            return false;
-    }
-    return true;
-}
-
-/// The condition without what was removed.
 SymbolicExprId ImpliedCondition::build() {
-    built_.assign(items_.size(), invalidId);
-    for (std::size_t i = items_.size(); i-- > 0;) {
-        const Item& item = items_[i];
-        if (item.op == SymbolicOp::None) {
-            built_[i] = item.id;
-            continue;
-        }
-        for (const std::size_t operand : item.operands) {
-            if (items_[operand].removed)
-                continue;
-            const SymbolicExprId right = built_[operand];
-            if (built_[i] == invalidId)
-                built_[i] = right;
-            else
-                built_[i] = makeBinary(table_, item.op, built_[i], right);
-            nodesLeft_ -= std::min<std::size_t>(nodesLeft_, 1);
-        }
-    }
-    return built_.front();
+    return tree_.build(built_, nodesLeft_);
 }
 
 /// Keeps a change that makes the condition shorter and leaves it equal.
@@ -101,14 +60,10 @@ bool ImpliedCondition::attempt(Change change, Undo undo) {
     return false;
 }
 
-std::size_t ImpliedCondition::operandsLeft(const Item& item) const {
-    const auto left = std::ranges::count_if(item.operands, [&](std::size_t at) { return !items_[at].removed; });
-    return static_cast<std::size_t>(left);
-}
-
 bool ImpliedCondition::removeOperands() {
+    std::vector<Item>& items = tree_.items();
     build();
-    std::vector<std::size_t> order(items_.size());
+    std::vector<std::size_t> order(items.size());
     std::iota(order.rbegin(), order.rend(), std::size_t{0}); // of two equally long the later one goes
     std::vector<std::uint64_t> lengths;
     for (const SymbolicExprId id : built_)
@@ -116,8 +71,8 @@ bool ImpliedCondition::removeOperands() {
     std::ranges::stable_sort(order, std::ranges::greater(), [&](std::size_t i) { return lengths[i]; });
     bool changed = false;
     for (const std::size_t i : order) {
-        Item& item = items_[i];
-        if (i == 0 || item.removed || operandsLeft(items_[item.parent]) < 2)
+        Item& item = items[i];
+        if (i == 0 || item.removed || tree_.operandsLeft(items[item.parent]) < 2)
             continue;
         changed = attempt([&] { item.removed = true; }, [&] { item.removed = false; }) || changed;
     }
@@ -126,9 +81,10 @@ bool ImpliedCondition::removeOperands() {
 
 /// Replaces a whole group by one comparison.
 bool ImpliedCondition::replaceGroups() {
-    for (std::size_t i = 0; i < items_.size(); ++i) {
-        Item& item = items_[i];
-        if (item.op == SymbolicOp::None || item.removed || operandsLeft(item) < 2)
+    std::vector<Item>& items = tree_.items();
+    for (std::size_t i = 0; i < items.size(); ++i) {
+        Item& item = items[i];
+        if (item.op == SymbolicOp::None || item.removed || tree_.operandsLeft(item) < 2)
             continue;
         build();
         const std::uint64_t length = printer_.textLength(built_[i]);

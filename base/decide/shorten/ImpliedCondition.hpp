@@ -2,6 +2,7 @@
 #pragma once
 
 #include "base/core/Table.hpp"
+#include "base/decide/shorten/ChainTree.hpp"
 #include "base/print/ExpressionPrinter.hpp"
 
 #include <functional>
@@ -31,18 +32,9 @@ public:
     SymbolicExprId shorten(SymbolicExprId condition);
 
 private:
-    /// An operand of a chain: a chain itself, or anything else as written.
-    struct Item {
-        SymbolicOp op;                     ///< And, Or, or None for what is not a chain
-        SymbolicExprId id;                 ///< of what is not a chain
-        std::size_t parent;                ///< position, smaller than its own
-        std::vector<std::size_t> operands; ///< positions, greater than its own
-        bool removed = false;
-    };
+    using Item = ChainTree::Item;
 
-    bool split(SymbolicExprId condition);
     SymbolicExprId build();
-    [[nodiscard]] std::size_t operandsLeft(const Item& item) const;
     template <class Change, class Undo>
     bool attempt(Change change, Undo undo);
     bool removeOperands();
@@ -53,7 +45,7 @@ private:
     const SymbolicExprPrinter& printer_;
     SymbolicExprId context_;
     IsEqual isEqual_;
-    std::vector<Item> items_;
+    ChainTree tree_;
     std::vector<SymbolicExprId> built_;      ///< by item, as of the last build
     std::vector<SymbolicExprId> candidates_; ///< comparisons, the shortest first
     SymbolicExprId current_ = invalidId;

@@ -4,10 +4,11 @@
 // as near to 0 as the ranges allow, and the ranges are tightened after each (Cormen et al., "Introduction to
 // Algorithms", difference constraints).
 //
-// Relies on: every bound is within `largestNumber`, so a path of at most 2^20 of them stays within 64 bits.
+// Relies on: every bound is within `limits::formNumber`, so a path of at most 2^20 of them stays within 64 bits.
 #include "base/decide/solver/DifferenceSystem.hpp"
 
 #include "base/core/Check.hpp"
+#include "base/core/Limits.hpp"
 #include "base/integer/LinearForm.hpp"
 
 #include <algorithm>
@@ -16,16 +17,13 @@ namespace VT {
 
 namespace {
 
-/// A sum of so many numbers within the bound of linear forms stays within 64 bits.
-constexpr std::size_t mostUnknowns = std::size_t{1} << 20U;
-
 /// Looking at a bound is that much cheaper than joining an edge.
 constexpr std::size_t boundsPerStep = 16;
 
 } // namespace
 
 void DifferenceSystem::begin(std::size_t unknowns) {
-    if (unknowns >= mostUnknowns)
+    if (unknowns >= limits::systemUnknowns)
         throw StepsUsedUp{};
     count_ = unknowns + 1;
     bounds_.clear();
@@ -41,7 +39,7 @@ void DifferenceSystem::restrict(Number x, Number y, std::int64_t low, std::int64
 bool DifferenceSystem::canBeMet() {
     distance_.assign(count_, 0);
     // No path without a cycle is shorter, so nothing leaves 64 bits.
-    const std::int64_t shortest = -2 * largestNumber * static_cast<std::int64_t>(count_);
+    const std::int64_t shortest = -2 * limits::formNumber * static_cast<std::int64_t>(count_);
     for (std::size_t round = 0; round <= count_; ++round) {
         steps_.take(bounds_.size() / boundsPerStep + 1);
         bool changed = false;

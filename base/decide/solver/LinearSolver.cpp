@@ -1,525 +1,45 @@
-// Solves linear constraints over the integers.
+// Hands linear constraints to the Omega test, with numbers of 64 bits first, and narrows a solution down to the
+// smallest.
 //
-// Method: the Omega test (Pugh, "The Omega test: a fast and practical integer programming algorithm for dependence
-// analysis", 1991).  Equalities are solved by Euclid's algorithm on their columns, a change of variables that keeps
-// the integers.  Then one variable after the other is eliminated from the inequalities by adding each lower bound to
-// each upper one.  That is exact where all factors of one side are 1; elsewhere the problem becomes alternatives: the
-// dark shadow, whose solutions always extend, and equalities near a lower bound, which catch what it misses.  Where
-// two parallel inequalities leave few values between them, these values are the alternatives instead.
+// Method: a system whose numbers leave 64 bits is solved again from the start with big integers.  A system that takes
+// the Omega test too long, because its constraints multiply, is solved by branch and bound alone.  The smallest
+// solution is found by bisection: the values within a distance of 0 are the more the greater the distance is.
 //
-// Alternatives wait on an explicit stack, each with the eliminations that lead back to the values of its variables.
-//
-// Cost: one step for each factor of a constraint that is written.
+// Cost: that of the Omega test; the smallest solution takes a logarithmic number of them for each variable.
 #include "base/decide/solver/LinearSolver.hpp"
 
-#include "base/core/Check.hpp"
-
-#include <algorithm>
-#include <limits>
-#include <map>
-#include <utility>
+#include "base/core/Limits.hpp"
+#include "base/decide/solver/OmegaTest.hpp"
+#include "base/integer/CheckedInteger.hpp"
 
 namespace VT {
 
 namespace {
 
-/// Thrown where a number leaves 64 bits; never leaves the solver.
-struct Overflow {};
-
-/// A 64-bit integer that throws instead of wrapping.
-class SmallInteger {
-public:
-    SmallInteger(std::int64_t value = 0) : value_(value) {} // NOLINT(google-explicit-constructor): a number is a number
-
-    explicit SmallInteger(const BigInteger& value) {
-        if (value < std::numeric_limits<std::int64_t>::min() || value > std::numeric_limits<std::int64_t>::max())
-            throw Overflow{};
-        value_ = static_cast<std::int64_t>(value);
-    }
-
-    explicit operator BigInteger() const { return value_; }
-
-    friend SmallInteger operator+(SmallInteger a, SmallInteger b) {
-        std::int64_t result = 0;
-        return __builtin_add_overflow(a.value_, b.value_, &result) ? throw Overflow{} : result;
-    }
-
-    friend SmallInteger operator-(SmallInteger a, SmallInteger b) {
-        std::int64_t result = 0;
-        return __builtin_sub_overflow(a.value_, b.value_, &result) ? throw Overflow{} : result;
-    }
-
-    friend SmallInteger operator*(SmallInteger a, SmallInteger b) {
-        std::int64_t result = 0;
-        return __builtin_mul_overflow(a.value_, b.value_, &result) ? throw Overflow{} : result;
-    }
-
-    friend SmallInteger operator/(SmallInteger a, SmallInteger b) {
-        return b.value_ == -1 ? SmallInteger(0) - a : SmallInteger(a.value_ / b.value_);
-    }
-
-    friend SmallInteger operator-(SmallInteger a) { return SmallInteger(0) - a; }
-
-    SmallInteger& operator+=(SmallInteger other) { return *this = *this + other; }
-
-    friend auto operator<=>(SmallInteger, SmallInteger) = default;
-
-private:
-    std::int64_t value_ = 0;
-};
-
-template <class Number>
-Number magnitude(const Number& value) {
-    return value < Number(0) ? Number(-value) : value;
-}
-
-template <class Number>
-Number floorDivide(const Number& value, const Number& divisor) { // the divisor is positive
-    Number quotient = value / divisor;
-    if (Number(quotient * divisor) > value)
-        quotient = quotient - Number(1);
-    return quotient;
-}
-
-template <class Number>
-Number gcdOf(Number a, Number b) {
-    a = magnitude(a);
-    b = magnitude(b);
-    while (b != Number(0)) {
-        Number rest = a - Number(a / b) * b;
-        a = std::move(b);
-        b = std::move(rest);
-    }
-    return a;
-}
-
-/// Factors of the variables, then the constant.
-template <class Number>
-using Row = std::vector<Number>;
-
-/// How a variable follows from the others.
-template <class Number>
-struct Elimination {
-    std::size_t variable;
-    std::vector<Row<Number>> bounds; ///< of the variable, as inequalities; none where `value` says what it is
-    Row<Number> value;               ///< what is to be added to what the variable became; its own factor is 0
-};
-
-template <class Number>
-struct Problem {
-    std::vector<Row<Number>> equalities;
-    std::vector<Row<Number>> inequalities;
-    std::vector<Elimination<Number>> eliminations;
-};
-
-/// A problem, or several: with `equality` reduced by each number from 0 to `last`.
-template <class Number>
-struct Alternatives {
-    Problem<Number> problem;
-    Row<Number> equality; ///< empty where the problem is meant as it is
-    Number last;
-};
-
-template <class Number>
-class Omega {
-public:
-    Omega(std::size_t variables, Steps& steps) : variables_(variables), steps_(steps) {}
-
-    std::optional<std::vector<Number>> solve(Problem<Number> problem) {
-        open_.clear();
-        open_.push_back({std::move(problem), {}, Number(0)});
-        while (!open_.empty()) {
-            Problem<Number> next = takeNext();
-            if (reduce(next, true))
-                return valuesOf(next);
-        }
-        return std::nullopt;
-    }
-
-private:
-    using Line = Row<Number>;
-
-    Problem<Number> takeNext() {
-        Alternatives<Number>& top = open_.back();
-        if (top.equality.empty()) {
-            Problem<Number> only = std::move(top.problem);
-            open_.pop_back();
-            return only;
-        }
-        steps_.take((top.problem.inequalities.size() + 1) * (variables_ + 1));
-        Problem<Number> next = top.problem;
-        next.equalities.push_back(top.equality);
-        next.equalities.back().back() = top.equality.back() - top.last;
-        if (top.last == Number(0))
-            open_.pop_back();
-        else
-            top.last = top.last - Number(1);
-        return next;
-    }
-
-    [[nodiscard]] const Number& constantOf(const Line& row) const { return row.back(); }
-
-    [[nodiscard]] Number gcdOfFactors(const Line& row) const {
-        Number gcd(0);
-        for (std::size_t i = 0; i < variables_; ++i)
-            if (row[i] != Number(0))
-                gcd = gcdOf(gcd, row[i]);
-        return gcd;
-    }
-
-    /// a * factorA + b * factorB
-    Line combined(const Line& a, const Number& factorA, const Line& b, const Number& factorB) {
-        steps_.take(a.size());
-        Line sum(a.size());
-        for (std::size_t i = 0; i < a.size(); ++i)
-            sum[i] = a[i] * factorA + b[i] * factorB;
-        return sum;
-    }
-
-    /// Works on a problem until it has no constraint left (true), or a contradiction or alternatives (false).  Over the
-    /// reals there are no alternatives: every elimination is exact.
-    bool reduce(Problem<Number>& problem, bool overIntegers) {
-        for (;;) {
-            steps_.take();
-            if (!solveEqualities(problem))
-                return false;
-            bool foundEquality = false;
-            if (!tighten(problem, foundEquality))
-                return false;
-            if (foundEquality)
-                continue;
-            if (dropOneSided(problem))
-                continue;
-            if (problem.inequalities.empty())
-                return true;
-            const std::size_t variable = cheapest(problem);
-            if (!overIntegers || isExact(problem, variable)) {
-                eliminate(problem, variable, false);
-                continue;
-            }
-            return split(problem, variable);
-        }
-    }
-
-    // Equalities.
-
-    bool solveEqualities(Problem<Number>& problem) {
-        while (!problem.equalities.empty()) {
-            Line row = std::move(problem.equalities.back());
-            problem.equalities.pop_back();
-            for (;;) {
-                const std::size_t least = leastFactor(row);
-                if (least == variables_) {
-                    if (constantOf(row) != Number(0))
-                        return false;
-                    break;
-                }
-                if (isOnlyFactor(row, least)) {
-                    const Number quotient = constantOf(row) / row[least];
-                    if (quotient * row[least] != constantOf(row))
-                        return false;
-                    fix(problem, least, -quotient);
-                    break;
-                }
-                changeVariables(problem, row, least);
-            }
-        }
-        return true;
-    }
-
-    [[nodiscard]] std::size_t leastFactor(const Line& row) const {
-        std::size_t least = variables_;
-        for (std::size_t i = 0; i < variables_; ++i)
-            if (row[i] != Number(0) && (least == variables_ || magnitude(row[i]) < magnitude(row[least])))
-                least = i;
-        return least;
-    }
-
-    [[nodiscard]] bool isOnlyFactor(const Line& row, std::size_t variable) const {
-        for (std::size_t i = 0; i < variables_; ++i)
-            if (i != variable && row[i] != Number(0))
-                return false;
-        return true;
-    }
-
-    /// Puts x - q·others in the place of x, so that the other factors of `row` become remainders of x's.
-    void changeVariables(Problem<Number>& problem, Line& row, std::size_t variable) {
-        Line shift(variables_ + 1);
-        for (std::size_t i = 0; i < variables_; ++i)
-            if (i != variable && row[i] != Number(0))
-                shift[i] = -Number(row[i] / row[variable]);
-        const auto apply = [&](Line& line) {
-            if (line[variable] == Number(0))
-                return;
-            steps_.take(line.size());
-            for (std::size_t i = 0; i < variables_; ++i)
-                if (shift[i] != Number(0))
-                    line[i] += shift[i] * line[variable];
-        };
-        apply(row);
-        for (Line& line : problem.equalities)
-            apply(line);
-        for (Line& line : problem.inequalities)
-            apply(line);
-        problem.eliminations.push_back({variable, {}, std::move(shift)});
-    }
-
-    void fix(Problem<Number>& problem, std::size_t variable, const Number& value) {
-        for (std::vector<Line>* rows : {&problem.equalities, &problem.inequalities})
-            for (Line& line : *rows) {
-                line.back() += line[variable] * value;
-                line[variable] = Number(0);
-            }
-        Line constant(variables_ + 1);
-        constant.back() = value;
-        problem.eliminations.push_back({variable, {}, std::move(constant)});
-    }
-
-    // Inequalities.
-
-    /// The factors of the opposite direction; a constant behind them is left out.
-    [[nodiscard]] Line oppositeFactors(const Line& row) const {
-        Line opposite(variables_);
-        for (std::size_t i = 0; i < variables_; ++i)
-            opposite[i] = -row[i];
-        return opposite;
-    }
-
-    /// Divides by common factors, keeps the tightest of parallel ones and turns opposite ones that leave one value into
-    /// an equality; false where two contradict each other.
-    bool tighten(Problem<Number>& problem, bool& foundEquality) {
-        std::map<Line, Number> tightest; // constant by factors
-        for (Line& line : problem.inequalities) {
-            steps_.take(line.size());
-            const Number gcd = gcdOfFactors(line);
-            if (gcd == Number(0)) {
-                if (constantOf(line) < Number(0))
-                    return false;
-                continue;
-            }
-            for (std::size_t i = 0; i < variables_; ++i)
-                line[i] = line[i] / gcd;
-            Number constant = floorDivide(line.back(), gcd);
-            line.pop_back();
-            const auto [at, added] = tightest.try_emplace(std::move(line), constant);
-            if (!added && constant < at->second)
-                at->second = std::move(constant);
-        }
-        problem.inequalities.clear();
-        for (auto& [factors, constant] : tightest) {
-            const Line opposite = oppositeFactors(factors);
-            Line line(factors);
-            line.push_back(constant);
-            if (const auto other = tightest.find(opposite); other != tightest.end()) {
-                const Number width = constant + other->second;
-                if (width < Number(0))
-                    return false;
-                if (width == Number(0)) {
-                    if (factors < opposite)
-                        problem.equalities.push_back(std::move(line));
-                    foundEquality = true;
-                    continue;
-                }
-            }
-            problem.inequalities.push_back(std::move(line));
-        }
-        return true;
-    }
-
-    struct Sides {
-        std::size_t lower = 0;
-        std::size_t upper = 0;
-        Number greatestLower{0}; ///< factor
-        Number greatestUpper{0};
-    };
-
-    [[nodiscard]] Sides sidesOf(const Problem<Number>& problem, std::size_t variable) const {
-        Sides sides;
-        for (const Line& line : problem.inequalities) {
-            if (line[variable] > Number(0)) {
-                ++sides.lower;
-                sides.greatestLower = std::max(sides.greatestLower, line[variable]);
-            } else if (line[variable] < Number(0)) {
-                ++sides.upper;
-                sides.greatestUpper = std::max(sides.greatestUpper, magnitude(line[variable]));
-            }
-        }
-        return sides;
-    }
-
-    [[nodiscard]] bool isExact(const Problem<Number>& problem, std::size_t variable) const {
-        const Sides sides = sidesOf(problem, variable);
-        return sides.greatestLower <= Number(1) || sides.greatestUpper <= Number(1);
-    }
-
-    /// Takes away the constraints on a variable that is bounded on one side only: it can always be far enough out.
-    bool dropOneSided(Problem<Number>& problem) {
-        for (std::size_t variable = 0; variable < variables_; ++variable) {
-            const Sides sides = sidesOf(problem, variable);
-            if ((sides.lower == 0) == (sides.upper == 0))
-                continue;
-            takeBounds(problem, variable);
-            return true;
-        }
-        return false;
-    }
-
-    /// Moves the constraints on a variable to the eliminations; returns where they are.
-    const std::vector<Line>& takeBounds(Problem<Number>& problem, std::size_t variable) {
-        const auto first = std::partition(problem.inequalities.begin(), problem.inequalities.end(),
-                                          [&](const Line& line) { return line[variable] == Number(0); });
-        problem.eliminations.push_back(
-            {variable, {std::make_move_iterator(first), std::make_move_iterator(problem.inequalities.end())}, {}});
-        problem.inequalities.erase(first, problem.inequalities.end());
-        return problem.eliminations.back().bounds;
-    }
-
-    /// The variable whose elimination is exact, if any is, and adds the fewest constraints.
-    [[nodiscard]] std::size_t cheapest(const Problem<Number>& problem) const {
-        std::size_t best = variables_;
-        std::pair<bool, std::int64_t> bestCost;
-        Number bestFactor(0);
-        for (std::size_t variable = 0; variable < variables_; ++variable) {
-            const Sides sides = sidesOf(problem, variable);
-            if (sides.lower == 0)
-                continue;
-            const bool exact = sides.greatestLower <= Number(1) || sides.greatestUpper <= Number(1);
-            const auto growth = static_cast<std::int64_t>(sides.lower * sides.upper) -
-                                static_cast<std::int64_t>(sides.lower + sides.upper);
-            const std::pair<bool, std::int64_t> cost{!exact, growth};
-            const Number factor = std::min(sides.greatestLower, sides.greatestUpper);
-            const bool better = exact ? cost < bestCost : bestCost.first && factor < bestFactor;
-            if (best == variables_ || better) {
-                best = variable;
-                bestCost = cost;
-                bestFactor = factor;
-            }
-        }
-        return best;
-    }
-
-    /// Adds each lower bound of a variable to each upper one; `dark` leaves room for an integer between any two.
-    void eliminate(Problem<Number>& problem, std::size_t variable, bool dark) {
-        const std::vector<Line>& bounds = takeBounds(problem, variable);
-        for (const Line& lower : bounds) {
-            if (lower[variable] < Number(0))
-                continue;
-            for (const Line& upper : bounds) {
-                if (upper[variable] > Number(0))
-                    continue;
-                const Number a = magnitude(upper[variable]);
-                const Number& b = lower[variable];
-                Line sum = combined(lower, a, upper, b);
-                if (dark)
-                    sum.back() = sum.back() - Number(a - Number(1)) * Number(b - Number(1));
-                problem.inequalities.push_back(std::move(sum));
-            }
-        }
-    }
-
-    // Alternatives.
-
-    bool split(Problem<Number>& problem, std::size_t variable) {
-        Problem<Number> relaxed{{}, problem.inequalities, {}};
-        if (!reduce(relaxed, false)) // NOLINT(misc-no-recursion): once, since nothing splits over the reals
-            return false;
-        if (splitAlongNarrowest(problem, variable))
-            return false;
-        const Number a = sidesOf(problem, variable).greatestUpper;
-        for (const Line& lower : problem.inequalities)
-            if (const Number& b = lower[variable]; b > Number(1))
-                open_.push_back({problem, lower, floorDivide(Number(Number(a * b) - a - b), a)});
-        eliminate(problem, variable, true);
-        open_.push_back({std::move(problem), {}, Number(0)}); // the dark shadow is tried first
-        return false;
-    }
-
-    /// Alternatives for the values between two opposite constraints, where these are fewer than the splinters.
-    bool splitAlongNarrowest(const Problem<Number>& problem, std::size_t variable) {
-        std::map<Line, const Line*> byFactors;
-        const Line* narrowest = nullptr;
-        Number width(0);
-        for (const Line& line : problem.inequalities) {
-            const Line opposite = oppositeFactors(line);
-            if (const auto other = byFactors.find(opposite); other != byFactors.end()) {
-                const Number between = line.back() + other->second->back();
-                if (narrowest == nullptr || between < width) {
-                    narrowest = &line;
-                    width = between;
-                }
-            }
-            byFactors.emplace(Line(line.begin(), line.end() - 1), &line);
-        }
-        if (narrowest == nullptr || width > sidesOf(problem, variable).greatestLower)
-            return false;
-        open_.push_back({problem, *narrowest, width});
-        return true;
-    }
-
-    // Values.
-
-    std::vector<Number> valuesOf(const Problem<Number>& problem) {
-        std::vector<Number> values(variables_, Number(0));
-        for (std::size_t i = problem.eliminations.size(); i-- > 0;) {
-            const Elimination<Number>& step = problem.eliminations[i];
-            steps_.take((step.bounds.size() + 1) * (variables_ + 1));
-            if (step.bounds.empty())
-                values[step.variable] += sumOf(step.value, step.variable, values);
-            else
-                values[step.variable] = withinBounds(step, values);
-        }
-        return values;
-    }
-
-    Number sumOf(const Line& row, std::size_t without, const std::vector<Number>& values) const {
-        Number sum = row.back();
-        for (std::size_t i = 0; i < variables_; ++i)
-            if (i != without && row[i] != Number(0))
-                sum += row[i] * values[i];
-        return sum;
-    }
-
-    /// The value nearest to 0 that the bounds allow; eliminations leave one.
-    Number withinBounds(const Elimination<Number>& step, const std::vector<Number>& values) const {
-        std::optional<Number> low;
-        std::optional<Number> high;
-        for (const Line& bound : step.bounds) {
-            const Number& factor = bound[step.variable];
-            const Number rest = sumOf(bound, step.variable, values);
-            if (factor > Number(0)) {
-                Number least = -floorDivide(rest, factor);
-                if (!low || least > *low)
-                    low = std::move(least);
-            } else {
-                Number most = floorDivide(rest, Number(-factor));
-                if (!high || most < *high)
-                    high = std::move(most);
-            }
-        }
-        VTSYM_CHECK(!low || !high || *low <= *high);
-        if (low && *low > Number(0))
-            return *low;
-        return high && *high < Number(0) ? *high : Number(0);
-    }
-
-    std::size_t variables_;
-    Steps& steps_;
-    std::vector<Alternatives<Number>> open_;
-};
+/// Splits along a variable before the Omega test takes over, and the part of the steps that it may take then.
+constexpr int fewBranches = 400;
+constexpr std::uint64_t portion = 4;
 
 template <class Number>
 std::optional<std::vector<BigInteger>> solveWith(std::span<const LinearConstraint> constraints, std::size_t variables,
                                                  Steps& steps) {
-    Problem<Number> problem;
+    Omega::Problem<Number> problem;
     for (const LinearConstraint& constraint : constraints) {
-        Row<Number> row(variables + 1);
+        Omega::Row<Number> row(variables + 1);
         for (std::size_t i = 0; i < constraint.factors.size(); ++i)
             row[i] = Number(constraint.factors[i]);
         row.back() = Number(constraint.constant);
         (constraint.relation == LinearConstraint::Relation::Zero ? problem.equalities : problem.inequalities)
             .push_back(std::move(row));
     }
-    const auto values = Omega<Number>(variables, steps).solve(std::move(problem));
+    const auto values = [&] {
+        try {
+            const Steps::Share share(steps, steps.left() / portion);
+            return Omega::OmegaTest<Number>(variables, steps, fewBranches).solve(problem);
+        } catch (const StepsUsedUp&) { // many variables, which the other way may suit
+            return Omega::OmegaTest<Number>(variables, steps, std::numeric_limits<int>::max()).solve(problem);
+        }
+    }();
     if (!values)
         return std::nullopt;
     std::vector<BigInteger> result;
@@ -533,17 +53,30 @@ std::optional<std::vector<BigInteger>> solveWith(std::span<const LinearConstrain
 std::optional<std::vector<BigInteger>> LinearSolver::solve(std::span<const LinearConstraint> constraints,
                                                            std::size_t variables) {
     try {
-        return solveWith<SmallInteger>(constraints, variables, steps_);
+        return solveWith<CheckedInteger>(constraints, variables, steps_);
     } catch (const Overflow&) {
         return solveWith<BigInteger>(constraints, variables, steps_);
     }
 }
 
 std::optional<std::vector<BigInteger>> LinearSolver::solveSmallest(std::span<const LinearConstraint> constraints,
-                                                                   std::size_t variables) {
+                                                                   std::size_t variables, std::size_t minimized) {
+    const std::uint64_t before = steps_.left();
+    auto best = solve(constraints, variables);
+    if (!best)
+        return best;
+    const Steps::Share share(steps_, limits::minimizingSteps + limits::minimizingFactor * (before - steps_.left()));
+    try {
+        minimize(*best, constraints, minimized);
+    } catch (const StepsUsedUp&) { // a solution is at hand
+    }
+    return best;
+}
+
+void LinearSolver::minimize(std::vector<BigInteger>& best, std::span<const LinearConstraint> constraints,
+                            std::size_t minimized) {
     std::vector<LinearConstraint> all(constraints.begin(), constraints.end());
-    auto best = solve(all, variables);
-    for (std::size_t variable = 0; best && variable < variables; ++variable) {
+    for (std::size_t variable = 0; variable < minimized; ++variable) {
         using Compared = LinearConstraint::Relation;
         const auto bound = [&](int factor, const BigInteger& constant, Compared relation) {
             LinearConstraint added{{}, constant, relation};
@@ -553,31 +86,30 @@ std::optional<std::vector<BigInteger>> LinearSolver::solveSmallest(std::span<con
         };
         // The values within a distance of 0 are the more the greater the distance is.
         BigInteger low = 0;
-        BigInteger high = abs((*best)[variable]);
+        BigInteger high = abs(best[variable]);
         const std::size_t before = all.size();
         while (low < high) {
             const BigInteger middle = (low + high) / 2;
             bound(1, middle, Compared::NotNegative);
             bound(-1, middle, Compared::NotNegative);
-            if (auto nearer = solve(all, variables)) {
+            if (auto nearer = solve(all, best.size())) {
                 high = abs((*nearer)[variable]);
-                best = std::move(nearer);
+                best = *std::move(nearer);
             } else {
                 low = middle + 1;
             }
             all.resize(before);
         }
         bound(1, BigInteger(-high), Compared::Zero);
-        if ((*best)[variable] != high) {
-            if (auto positive = solve(all, variables)) {
-                best = std::move(positive);
+        if (best[variable] != high) {
+            if (auto positive = solve(all, best.size())) {
+                best = *std::move(positive);
             } else {
                 all.pop_back();
                 bound(1, high, Compared::Zero);
             }
         }
     }
-    return best;
 }
 
 } // namespace VT

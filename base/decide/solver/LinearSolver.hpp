@@ -5,8 +5,7 @@
 #pragma once
 
 #include "base/decide/Steps.hpp"
-
-#include <boost/multiprecision/cpp_int.hpp>
+#include "base/integer/BigInteger.hpp"
 
 #include <cstdint>
 #include <optional>
@@ -14,8 +13,6 @@
 #include <vector>
 
 namespace VT {
-
-using BigInteger = boost::multiprecision::cpp_int;
 
 /// factors · x + constant, and how it compares with 0.
 struct LinearConstraint {
@@ -37,11 +34,14 @@ public:
     [[nodiscard]] std::optional<std::vector<BigInteger>> solve(std::span<const LinearConstraint> constraints,
                                                                std::size_t variables);
     /// Returns the smallest such values: the first variable is as near to 0 as it can be, of two equally near values
-    /// the positive one; then the second, and so on.  Takes a logarithmic number of solutions for each variable.
+    /// the positive one; then the second, and so on for `minimized` of them.  Takes a logarithmic number of solutions
+    /// for each; where these take many more steps than the first one did, the smallest values found so far.
     [[nodiscard]] std::optional<std::vector<BigInteger>> solveSmallest(std::span<const LinearConstraint> constraints,
-                                                                       std::size_t variables);
+                                                                       std::size_t variables, std::size_t minimized);
 
 private:
+    void minimize(std::vector<BigInteger>& best, std::span<const LinearConstraint> constraints, std::size_t minimized);
+
     Steps& steps_;
 };
 

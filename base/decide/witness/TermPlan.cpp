@@ -1,14 +1,14 @@
 // Flattens a term into a list of nodes, operands before operators, and evaluates it in one pass.
 //
 // The list is ordered by identifier, because operands are interned before their operator. Evaluation yields no value as
-// soon as one node has none; `&&` and `||` do not hide a division by zero on their right. Linear in the distinct nodes,
-// no recursion.
+// soon as one node has none; `&&` and `||` do not hide a division by zero on their right. Integers of 64 bits are
+// computed directly, other numbers as constant forms. Linear in the distinct nodes, no recursion.
 #include "base/decide/witness/TermPlan.hpp"
 
 #include "base/core/Walk.hpp"
 #include "base/integer/ExactArithmetic.hpp"
 
-#include <algorithm>
+#include <cmath>
 
 namespace VT {
 
@@ -62,7 +62,6 @@ TermPlan::TermPlan(const LeafReader& leaves, Unknowns& unknowns, SymbolicExprId 
         position.insert(id, nodes_.size());
         nodes_.push_back(step);
     }
-    results_.resize(nodes_.size());
 }
 
 /// What a shift multiplies or divides by.
@@ -71,68 +70,142 @@ void TermPlan::suggestPower(const LeafMeaning& distance) {
         constants_.push_back(std::int64_t{1} << distance.integer);
 }
 
-std::optional<TermPlan::Result> TermPlan::compute(const Node& node) const {
-    const Result& a = results_[node.a];
-    const Result& b = results_[node.b];
-    const auto truth = [](bool value) { return Result{false, value ? 1 : 0, 0}; };
-    switch (node.op) {
+namespace {
+
+/// The value of logic where there is one: of two truth values.
+std::optional<bool> logicResult(SymbolicOp op, bool a, bool b) {
+    switch (op) {
     case SymbolicOp::Not:
-        return truth(!a.holds());
+        return !a;
     case SymbolicOp::And:
     case SymbolicOp::SingleAnd:
-        return truth(a.holds() && b.holds());
+        return a && b;
     case SymbolicOp::Or:
     case SymbolicOp::SingleOr:
-        return truth(a.holds() || b.holds());
+        return a || b;
     default:
-        break;
-    }
-    if (comparisonOps.contains(node.op)) {
-        if (a.isReal && b.isReal)
-            return truth(compareNumbers(node.op, a.real, b.real));
-        if (a.isReal)
-            return truth(compareExactly(operatorInfo(node.op).mirrored, b.integer, a.real));
-        return truth(b.isReal ? compareExactly(node.op, a.integer, b.real)
-                              : compareNumbers(node.op, a.integer, b.integer));
-    }
-    if (node.op == SymbolicOp::UnaryMinus && a.isReal)
-        return Result{true, 0, -a.real};
-    if (a.isReal || (node.operands > 1 && b.isReal) || node.operands == 0 || node.operands > 2)
         return std::nullopt;
-    const auto value =
-        node.operands == 1 ? integerResult(node.op, a.integer) : integerResult(node.op, a.integer, b.integer);
-    return value ? std::optional(Result{false, *value, 0}) : std::nullopt;
+    }
+}
+
+} // namespace
+
+std::optional<std::int64_t> TermPlan::computeSmall(const Node& node, std::int64_t a, std::int64_t b) {
+    if (const auto truth = logicResult(node.op, a != 0, b != 0))
+        return *truth ? 1 : 0;
+    if (comparisonOps.contains(node.op))
+        return compareNumbers(node.op, a, b) ? 1 : 0;
+    return node.operands == 1 ? integerResult(node.op, a) : integerResult(node.op, a, b);
+}
+
+std::optional<TermPlan::Exact> TermPlan::computeExact(const Node& node, const Exact& a, const Exact& b) {
+    const auto ofTruth = [](bool truth) { return Exact{RationalForm(LinearForm{{}, truth ? 1 : 0})}; };
+    const auto holds = [](const Exact& value) {
+        return value.literal ? *value.literal != 0 : value.number.sign() != 0;
+    };
+    if (const auto truth = logicResult(node.op, holds(a), holds(b)))
+        return ofTruth(*truth);
+    const bool finite = std::isfinite(a.literal.value_or(0)) && std::isfinite(b.literal.value_or(0));
+    if (comparisonOps.contains(node.op)) {
+        if (!finite)
+            return ofTruth(compareNumbers(node.op, a.literal.value_or(0), b.literal.value_or(0)));
+        const auto difference = combine(a.number, 1, b.number, -1);
+        return difference ? std::optional(ofTruth(compareNumbers(node.op, difference->sign(), 0))) : std::nullopt;
+    }
+    if (node.operands == 1 && node.op == SymbolicOp::UnaryMinus && a.literal)
+        return ofReal(-*a.literal);
+    if (!finite)
+        return std::nullopt;
+    const bool isReal = a.isReal || b.isReal;
+    std::optional<RationalForm> number;
+    if (node.operands == 1) {
+        const LinearForm* small = a.number.small();
+        const auto value = small != nullptr && !isReal ? integerResult(node.op, small->constant) : std::nullopt;
+        if (node.op == SymbolicOp::UnaryMinus)
+            number = combine(a.number, -1, {}, 0);
+        else if (value)
+            number = RationalForm(BigInteger(*value));
+        return number ? std::optional(Exact{*std::move(number), isReal}) : std::nullopt;
+    }
+    if (isReal && a.literal && b.literal)
+        if (const auto folded = foldedReals(node.op, *a.literal, *b.literal))
+            return ofReal(*folded);
+    number = exactResult(node.op, a.number, b.number, isReal);
+    if (!number)
+        return std::nullopt;
+    Exact result{*std::move(number), isReal};
+    if (a.literal && b.literal && !isReal && result.number.small() != nullptr)
+        result.literal = static_cast<double>(result.number.small()->constant);
+    return result;
+}
+
+TermPlan::Exact TermPlan::ofReal(double real) {
+    return {std::isfinite(real) ? RationalForm::of(real) : RationalForm(), true, real};
+}
+
+/// Computes all nodes; `leaf` and `compute` give the value of one, if it has any.
+template <class Results, class Leaf, class Compute>
+bool TermPlan::evaluate(Results& results, Leaf leaf, Compute compute) const {
+    results.resize(nodes_.size());
+    for (std::size_t i = 0; i < nodes_.size(); ++i) {
+        const Node& node = nodes_[i];
+        const bool isLeaf = node.leaf.kind != LeafMeaning::Kind::Compound;
+        if (!isLeaf && (node.operands == 0 || node.operands > 2))
+            return false;
+        auto value = isLeaf ? leaf(node) : compute(node, results[node.a], results[node.operands > 1 ? node.b : node.a]);
+        if (!value)
+            return false;
+        results[i] = *std::move(value);
+    }
+    return true;
 }
 
 std::optional<std::int64_t> TermPlan::value(const std::function<std::int64_t(Unknown)>& valueOf) {
-    for (std::size_t i = 0; i < nodes_.size(); ++i) {
-        const Node& node = nodes_[i];
-        Result& result = results_[i];
+    using Kind = LeafMeaning::Kind;
+    const auto leaf = [&](const Node& node) -> std::optional<std::int64_t> {
         switch (node.leaf.kind) {
-        case LeafMeaning::Kind::Integer:
-            result = {false, node.leaf.integer, 0};
-            break;
-        case LeafMeaning::Kind::Real:
-            result = {true, 0, node.leaf.real};
-            break;
-        case LeafMeaning::Kind::Opaque:
+        case Kind::Integer:
+            return node.leaf.integer;
+        case Kind::Real:
+        case Kind::Opaque:
             return std::nullopt;
-        case LeafMeaning::Kind::CodeGeneration:
-            result = {false, 1 - valueOf(node.unknown), 0};
-            break;
-        case LeafMeaning::Kind::Compound: {
-            const auto computed = compute(node);
-            if (!computed)
-                return std::nullopt;
-            result = *computed;
-            break;
-        }
+        case Kind::CodeGeneration:
+            return 1 - valueOf(node.unknown);
         default:
-            result = {false, valueOf(node.unknown), 0};
+            return valueOf(node.unknown);
         }
-    }
-    const Result& last = results_.back();
-    return last.isReal ? std::int64_t{last.holds()} : last.integer;
+    };
+    return evaluate(results_, leaf, computeSmall) ? std::optional(results_.back()) : std::nullopt;
+}
+
+std::optional<RationalForm> TermPlan::exactValue(const std::function<BigInteger(Unknown)>& valueOf) {
+    using Kind = LeafMeaning::Kind;
+    const auto leaf = [&](const Node& node) -> std::optional<Exact> {
+        switch (node.leaf.kind) {
+        case Kind::Integer:
+            return Exact{RationalForm(LinearForm{{}, node.leaf.integer}), false,
+                         static_cast<double>(node.leaf.integer)};
+        case Kind::Real:
+            return ofReal(node.leaf.real);
+        case Kind::Opaque:
+            return std::nullopt;
+        default: {
+            RationalForm number(valueOf(node.unknown));
+            if (node.leaf.kind != Kind::CodeGeneration)
+                return Exact{std::move(number)};
+            const auto opposite = combine(number, -1, LinearForm{{}, 1}, 1);
+            return opposite ? std::optional(Exact{*opposite}) : std::nullopt;
+        }
+        }
+    };
+    std::vector<Exact> results;
+    if (!evaluate(results, leaf, computeExact))
+        return std::nullopt;
+    const Exact& last = results.back();
+    if (!last.isReal)
+        return last.number;
+    const bool holds = last.literal ? *last.literal != 0 : last.number.sign() != 0;
+    return RationalForm(LinearForm{{}, holds ? 1 : 0});
 }
 
 } // namespace VT

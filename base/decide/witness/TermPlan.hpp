@@ -15,9 +15,12 @@ class TermPlan {
 public:
     TermPlan(const LeafReader& leaves, Unknowns& unknowns, SymbolicExprId term);
 
-    /// The value, where every node has one that is exact; the truth of a real number.  `valueOf` gives the values of
-    /// free unknowns.
+    /// The value, where every node has one of 64 bits; nothing where a real literal takes part.  `valueOf` gives the
+    /// values of free unknowns.
     [[nodiscard]] std::optional<std::int64_t> value(const std::function<std::int64_t(Unknown)>& valueOf);
+
+    /// The value, where every node has one, computed at any size and with fractions; the truth of a real number.
+    [[nodiscard]] std::optional<RationalForm> exactValue(const std::function<BigInteger(Unknown)>& valueOf);
 
     /// Free unknowns that the value depends on.
     [[nodiscard]] const std::vector<Unknown>& unknowns() const noexcept { return unknowns_; }
@@ -37,19 +40,22 @@ private:
         std::size_t operands;
     };
 
-    struct Result {
+    /// A number; a literal is rounded with other literals only.
+    struct Exact {
+        RationalForm number = {};
         bool isReal = false;
-        std::int64_t integer = 0;
-        double real = 0;
-
-        [[nodiscard]] bool holds() const { return isReal ? real != 0 : integer != 0; }
+        std::optional<double> literal = {};
     };
 
     void suggestPower(const LeafMeaning& distance);
-    [[nodiscard]] std::optional<Result> compute(const Node& node) const;
+    template <class Results, class Leaf, class Compute>
+    [[nodiscard]] bool evaluate(Results& results, Leaf leaf, Compute compute) const;
+    [[nodiscard]] static std::optional<std::int64_t> computeSmall(const Node& node, std::int64_t a, std::int64_t b);
+    [[nodiscard]] static Exact ofReal(double real);
+    [[nodiscard]] static std::optional<Exact> computeExact(const Node& node, const Exact& a, const Exact& b);
 
     std::vector<Node> nodes_;
-    std::vector<Result> results_;
+    std::vector<std::int64_t> results_;
     std::vector<Unknown> unknowns_;
     std::vector<std::int64_t> constants_;
 };

@@ -1,11 +1,11 @@
 // Confirms witnesses by evaluation where a path restricts arithmetic that the diagrams do not understand.
 //
-// Method: compute each term from the values of its free unknowns and follow the whole diagram. If that fails, change
+// Method: compute each term from the values of its free unknowns and evaluate the whole question. If that fails, change
 // one unknown, then two, to values that the literals suggest (the literals, their neighbours, divisors, sums,
 // differences and products) and ask again.
 //
-// Cost: at most limits::confirmations trials in one question; each costs the nodes of the terms and one path.
-#include "base/decide/solver/LinearSolver.hpp"
+// Cost: at most limits::confirmations trials in one question; each costs the nodes of the terms and of the question.
+#include "base/core/Limits.hpp"
 #include "base/decide/witness/WitnessSearch.hpp"
 
 #include <algorithm>
@@ -14,120 +14,172 @@
 
 namespace VT {
 
-/// Computes the terms from the unknowns that they depend on; false where one has no value.
+namespace {
+
+/// Looking at a node of a question is that much cheaper than joining an edge of diagrams.
+constexpr std::size_t nodesPerStep = 8;
+
+} // namespace
+
+/// Computes the terms from the unknowns that they depend on; false where one has no value of 64 bits.
 bool WitnessSearch::computeTerms(std::vector<std::int64_t>& values) {
     for (const Term& term : terms_) {
-        std::optional<std::int64_t> value = 0;
+        std::optional<std::int64_t> value;
         if (term.plan != nullptr) {
             steps_.take(term.plan->size());
             value = term.plan->value([&](Unknown unknown) { return values[numberOf(unknown)]; });
         } else {
-            for (const LinearPart& part : unknowns_[order_[term.number - 1]].sum) {
-                std::int64_t product = 0;
-                std::int64_t sum = 0;
-                if (__builtin_mul_overflow(part.factor, values[numberOf(part.unknown)], &product) ||
-                    __builtin_add_overflow(*value, product, &sum)) {
-                    value.reset();
-                    break;
-                }
-                value = sum;
-            }
+            value = sumOf(order_[term.number - 1], values);
         }
-        if (!value || !isWithinBound(*value))
+        if (!value)
             return false;
         values[term.number] = *value;
     }
     return true;
 }
 
-/// Follows the whole diagram from its root; the values are those of all unknowns, terms included.
-WitnessSearch::Followed WitnessSearch::follow(const std::vector<std::int64_t>& values) const {
-    Followed path{root_, 0};
-    while (path.end > never) {
-        ++path.edges;
-        const QuantityInfo& info = unknowns_.quantity(diagrams_.quantity(path.end));
-        std::int64_t value = values[numberOf(info.plus)];
-        if (info.isDifference() && __builtin_sub_overflow(value, values[numberOf(info.minus)], &value))
-            return {never, path.edges};
-        path.end = diagrams_.edge(path.end, diagrams_.edgeOf(path.end, value)).child;
-    }
-    return path;
+/// The value of a sum or floor, where its numbers have 64 bits.
+std::optional<std::int64_t> WitnessSearch::sumOf(Unknown unknown, const std::vector<std::int64_t>& values) const {
+    const UnknownInfo& info = unknowns_[unknown];
+    std::int64_t sum = 0;
+    bool fits = true;
+    const auto small = [&](const BigInteger& number) {
+        const bool isSmall = abs(number) <= plusInfinite;
+        fits = fits && isSmall;
+        return isSmall ? static_cast<std::int64_t>(number) : 1;
+    };
+    const auto add = [&](std::int64_t factor, std::int64_t value) {
+        std::int64_t product = 0;
+        const bool overflows =
+            __builtin_mul_overflow(factor, value, &product) || __builtin_add_overflow(sum, product, &sum);
+        fits = fits && !overflows;
+    };
+    for (const LinearPart& part : info.sum)
+        add(part.factor, values[numberOf(part.unknown)]);
+    if (info.floor == nullptr)
+        return fits ? std::optional(sum) : std::nullopt;
+    for (const WidePart& part : info.floor->form.parts)
+        add(small(part.factor), values[numberOf(part.unknown)]);
+    add(small(info.floor->form.constant), 1);
+    const std::int64_t divisor = small(info.floor->divisor);
+    return fits ? std::optional(floorDivide(sum, divisor)) : std::nullopt;
 }
 
-/// Asks the whole diagram with the terms computed; the values are in trial_.
-bool WitnessSearch::confirm(const std::vector<std::int64_t>& values) {
-    trial_ = values;
-    if (!computeTerms(trial_))
-        return false;
-    const Followed path = follow(trial_);
-    steps_.take(path.edges);
-    return path.end == always;
-}
-
-/// Whether a sum lies on this path where the ranges of its parts do not reach.
-bool WitnessSearch::isExcluded() {
-    system_.findRanges();
+/// The same for numbers of any size; whole numbers alone can be compared.
+bool WitnessSearch::computeExactly(std::vector<BigInteger>& values) {
+    const auto at = [&](Unknown unknown) -> const BigInteger& { return values[numberOf(unknown)]; };
     for (const Term& term : terms_) {
         const UnknownInfo& info = unknowns_[order_[term.number - 1]];
-        if (info.kind != UnknownKind::Sum)
+        if (term.plan != nullptr) {
+            steps_.take(term.plan->size());
+            const auto value = term.plan->exactValue(at);
+            const auto integer = value ? value->integer() : std::nullopt;
+            if (!integer)
+                return false;
+            values[term.number] = *integer;
             continue;
-        bool openLow = false;
-        bool openHigh = false;
-        std::int64_t low = 0;
-        std::int64_t high = 0;
-        for (const LinearPart& part : info.sum) {
-            std::int64_t atLow = system_.low(numberOf(part.unknown));
-            std::int64_t atHigh = system_.high(numberOf(part.unknown));
-            if (part.factor < 0)
-                std::swap(atLow, atHigh);
-            const auto add = [&](std::int64_t bound, std::int64_t& sum, bool& open) {
-                std::int64_t product = 0;
-                open = open || bound == minusInfinite || bound == plusInfinite ||
-                       __builtin_mul_overflow(part.factor, bound, &product) ||
-                       __builtin_add_overflow(sum, product, &sum);
-            };
-            add(atLow, low, openLow);
-            add(atHigh, high, openHigh);
         }
-        if ((!openLow && low > system_.high(term.number)) || (!openHigh && high < system_.low(term.number)))
-            return true;
+        BigInteger sum = 0;
+        for (const LinearPart& part : info.sum)
+            sum += part.factor * at(part.unknown);
+        if (info.floor != nullptr) {
+            sum = info.floor->form.constant;
+            for (const WidePart& part : info.floor->form.parts)
+                sum += part.factor * at(part.unknown);
+            sum = floorDivide(sum, info.floor->divisor);
+        }
+        values[term.number] = std::move(sum);
     }
-    return false;
+    return true;
 }
 
-/// Solves the bounds of the path together with the sums that it restricts, exactly; terms are unknowns like any other.
+namespace {
+
+std::int64_t differenceOf(std::int64_t a, std::int64_t b) {
+    std::int64_t result = 0;
+    return __builtin_sub_overflow(a, b, &result) ? (b < 0 ? plusInfinite : minusInfinite) : result;
+}
+
+std::int64_t differenceOf(const BigInteger& a, const BigInteger& b) {
+    return static_cast<std::int64_t>(
+        std::clamp(BigInteger(a - b), BigInteger(minusInfinite), BigInteger(plusInfinite)));
+}
+
+} // namespace
+
+/// Whether the question holds; the values are those of all unknowns, terms included.  Comparisons end at small numbers,
+/// so a large one may be replaced by another on its side.
+template <class Integer>
+bool WitnessSearch::holds(const std::vector<Integer>& values) const {
+    const Integer zero = 0;
+    return question_->holds([&](Level at) {
+        const LevelInfo& level = question_->levels()[at];
+        const auto valueOf = [&](Unknown unknown) -> const Integer& {
+            const Number* number = unknown != noUnknown ? numbers_.find(unknown) : nullptr;
+            return number != nullptr ? values[*number] : zero; // what no path depends on has none
+        };
+        const Integer& plus = valueOf(level.plus);
+        const Integer& minus = valueOf(level.minus);
+        return level.opposed ? differenceOf(minus, plus) : differenceOf(plus, minus);
+    });
+}
+
+template bool WitnessSearch::holds<std::int64_t>(const std::vector<std::int64_t>& values) const;
+
+/// Asks the question with the terms computed; the values are in trial_.
+bool WitnessSearch::confirm(const std::vector<std::int64_t>& values) {
+    trial_ = values;
+    isWide_ = false;
+    isLarge_ = false;
+    if (!computeTerms(trial_))
+        return false;
+    steps_.take(question_->nodes().size() / nodesPerStep + 1);
+    return holds(trial_);
+}
+
+/// The same for numbers of any size.  A witness that has no 64 bits is remembered as such.
+bool WitnessSearch::confirmExactly(std::vector<BigInteger> values) {
+    if (!computeExactly(values))
+        return false;
+    steps_.take(question_->nodes().size() / nodesPerStep + 1);
+    if (!holds(values))
+        return false;
+    trial_.assign(values.size(), 0);
+    for (std::size_t i = 1; i < values.size(); ++i) {
+        const bool fits = values[i] >= minusInfinite && values[i] <= plusInfinite;
+        isLarge_ = isLarge_ || !fits;
+        isWide_ = isWide_ || (!fits && !unknowns_[order_[i - 1]].isComputed());
+        trial_[i] = fits ? static_cast<std::int64_t>(values[i]) : 0;
+    }
+    return true;
+}
+
+/// Solves the constraints of the path exactly; terms are unknowns like any other.
+std::optional<PathSystem::Values> WitnessSearch::solvePath(bool smallest) {
+    pathSystem_.begin();
+    for (const PathRange& range : path_)
+        pathSystem_.restrict(range.plus, range.minus, range.low, range.high);
+    return pathSystem_.solve(numbers_, smallest);
+}
+
 /// A solution counts when evaluation confirms it; the values are in trial_ then.
 WitnessSearch::SumsOnPath WitnessSearch::solveSums() {
-    if (std::ranges::none_of(terms_, [](const Term& term) { return term.plan == nullptr; }))
-        return SumsOnPath::Open;
-    using Compared = LinearConstraint::Relation;
-    const std::size_t variables = order_.size(); // by number - 1
-    std::vector<LinearConstraint> constraints;
-    for (const DifferenceSystem::Bound& bound : system_.bounds()) { // x - y <= most
-        constraints.push_back({std::vector<BigInteger>(variables), bound.most, Compared::NotNegative});
-        if (bound.x != 0)
-            constraints.back().factors[bound.x - 1] -= 1;
-        if (bound.y != 0)
-            constraints.back().factors[bound.y - 1] += 1;
-    }
-    for (const Term& term : terms_) {
-        if (term.plan != nullptr)
-            continue;
-        constraints.push_back({std::vector<BigInteger>(variables), 0, Compared::Zero});
-        constraints.back().factors[term.number - 1] = -1;
-        for (const LinearPart& part : unknowns_[order_[term.number - 1]].sum)
-            constraints.back().factors[numberOf(part.unknown) - 1] += part.factor;
-    }
-    const auto solution = LinearSolver(steps_).solveSmallest(constraints, variables);
+    const auto solution = solvePath(wantsSmallest_);
     if (!solution)
         return SumsOnPath::Unsolvable;
-    std::vector<std::int64_t> values(variables + 1);
-    for (std::size_t i = 0; i < variables; ++i) {
-        if (abs((*solution)[i]) > largestNumber)
-            return SumsOnPath::Open;
-        values[i + 1] = static_cast<std::int64_t>((*solution)[i]);
+    bool fits = true;
+    std::vector<BigInteger> wide(order_.size() + 1);
+    std::vector<std::int64_t> values(order_.size() + 1);
+    for (const auto& [unknown, value] : *solution) {
+        const Number number = numberOf(unknown);
+        wide[number] = value;
+        const bool isSmall = value >= -limits::formNumber && value <= limits::formNumber;
+        fits = fits && isSmall;
+        values[number] = isSmall ? static_cast<std::int64_t>(value) : 0;
     }
-    return confirm(values) ? SumsOnPath::Solved : SumsOnPath::Open;
+    if ((fits && confirm(values)) || confirmExactly(std::move(wide)))
+        return SumsOnPath::Solved;
+    return SumsOnPath::Open;
 }
 
 /// Values that the literals of the path and of the terms suggest, and small ones; smallest first.
@@ -189,9 +241,12 @@ bool WitnessSearch::confirmWith(std::span<const Change> changes) {
     }
     bool confirmed = computeTerms(values);
     if (confirmed) {
-        for (const Term& term : terms_)
-            system_.restrict(term.number, 0, values[term.number], values[term.number]);
-        confirmed = system_.solve(values) && confirm(values);
+        for (const Term& term : terms_) {
+            confirmed = confirmed && isWithinBound(values[term.number]);
+            if (confirmed)
+                restrictSystem(order_[term.number - 1], noUnknown, values[term.number], values[term.number]);
+        }
+        confirmed = confirmed && system_.solve(values) && confirm(values);
     }
     system_.shrink(before);
     if (confirmed)

@@ -1,8 +1,7 @@
 // Walks the paths of a diagram to the smallest assignment that reaches `always`.
 //
 // Method: branch and bound. A frame for each node on the path holds the solution of the bounds so far, which is a lower
-// bound for all assignments below; edges are tried from that solution outwards. Where the diagram branches on unknowns
-// alone, one descent suffices.
+// bound for all assignments below; edges are tried from that solution outwards.
 //
 // Cost: one step for each edge tried plus those of the difference system.
 #include "base/decide/witness/WitnessSearch.hpp"
@@ -15,6 +14,9 @@
 namespace VT {
 
 namespace {
+
+/// A node of a plan takes that many times the memory of an edge of a diagram.
+constexpr std::size_t stepsPerPlanned = 4;
 
 /// The edges of a node from one of them outwards: itself, the one above, the one below, and so on.
 std::size_t outward(std::size_t origin, std::size_t step, std::size_t count) {
@@ -33,93 +35,85 @@ WitnessSearch::WitnessSearch(const LeafReader& leaves, Unknowns& unknowns, Diagr
       unknowns_(unknowns),
       diagrams_(diagrams),
       steps_(steps),
-      system_(steps) {}
+      system_(steps),
+      smallest_(steps),
+      pathSystem_(unknowns, steps) {}
 
-Decision WitnessSearch::find(Diagram diagram, std::span<const UnknownLeaf> leaves) {
+Decision WitnessSearch::find(const Question& question, Diagram diagram, std::span<const UnknownLeaf> leaves) {
+    question_ = &question;
     if (diagram == never)
         return {Answer::No, DecisionBound::None, std::nullopt};
     if (!diagrams_.needsChecking(diagram))
-        return {Answer::Yes, DecisionBound::None, walkDown(diagram, leaves)};
+        return {Answer::Yes, DecisionBound::None, smallestOf(diagram, leaves)};
     DecisionBound bound = DecisionBound::None;
     best_.reset();
     unconfirmed_ = false;
+    first_ = true;
     try {
-        collect(diagram, leaves);
+        collect(diagram, leaves, Order::Mentioned);
         walkPaths(diagram);
     } catch (const StepsUsedUp&) {
         bound = DecisionBound::Steps;
     }
-    if (best_) {
-        VTSYM_CHECK(follow(*best_).end == always);
-        return {Answer::Yes, DecisionBound::None, witness(*best_, leaves)};
+    if (!best_) {
+        if (bound == DecisionBound::None && unconfirmed_)
+            bound = DecisionBound::Terms;
+        return {bound == DecisionBound::None ? Answer::No : Answer::Undecided, bound, std::nullopt};
     }
-    if (bound == DecisionBound::None && unconfirmed_)
-        bound = DecisionBound::Terms;
-    return {bound == DecisionBound::None ? Answer::No : Answer::Undecided, bound, std::nullopt};
-}
-
-// Unknowns alone.
-
-Witness WitnessSearch::walkDown(Diagram diagram, std::span<const UnknownLeaf> leaves) const {
-    Witness result;
-    result.reserve(leaves.size());
-    for (const UnknownLeaf& leaf : leaves) {
-        std::int64_t value = 0;
-        if (!result.empty() && leaf.unknown == (&leaf)[-1].unknown) {
-            // The second keyword, or another spelling of the first.
-            value = (leaf.opposite != (&leaf)[-1].opposite) ? 1 - result.back().value : result.back().value;
-            result.push_back({leaf.node, value});
-            continue;
+    const std::vector<std::int64_t> mentioned = std::move(*best_);
+    bool isWide = isWide_;
+    bool isLarge = isLarge_;
+    const std::vector<Unknown> unknowns = order_;
+    steps_.spellOut([&] {
+        best_.reset();
+        collect(diagram, leaves, Order::Texts);
+        std::vector<std::int64_t> values(order_.size() + 1);
+        for (std::size_t i = 0; i < unknowns.size(); ++i)
+            values[numberOf(unknowns[i])] = mentioned[i + 1];
+        first_ = !terms_.empty();
+        if (!first_)
+            best_ = values;
+        walkPaths(diagram);
+        if (best_) {
+            isWide = isWide_;
+            isLarge = isLarge_;
+        } else {
+            best_ = std::move(values);
         }
-        const Quantity quantity = unknowns_[leaf.unknown].quantity;
-        if (diagram > never && diagrams_.quantity(diagram) == quantity) {
-            const QuantityInfo& info = unknowns_.quantity(quantity);
-            std::optional<std::int64_t> nearest;
-            Diagram below = never;
-            std::int64_t low = info.low;
-            for (std::size_t i = 0; i < diagrams_.edgeCount(diagram); ++i) {
-                const Diagrams::Edge edge = diagrams_.edge(diagram, i);
-                const std::int64_t candidate = std::clamp(std::int64_t{0}, low, std::min(edge.high, info.high));
-                if (edge.child != never && (!nearest || isSmaller(candidate, *nearest))) {
-                    nearest = candidate;
-                    below = edge.child;
-                }
-                low = edge.high == plusInfinite ? edge.high : edge.high + 1;
-            }
-            value = *nearest;
-            diagram = below;
-        }
-        result.push_back({leaf.node, leaf.opposite ? 1 - value : value});
-    }
-    return result;
-}
-
-Witness WitnessSearch::witness(const std::vector<std::int64_t>& values, std::span<const UnknownLeaf> leaves) const {
-    Witness result;
-    result.reserve(leaves.size());
-    for (const UnknownLeaf& leaf : leaves) {
-        const std::int64_t value = values[numberOf(leaf.unknown)];
-        result.push_back({leaf.node, leaf.opposite ? 1 - value : value});
-    }
-    return result;
+    });
+    VTSYM_CHECK(!best_ || isLarge || holds(*best_));
+    if (isWide)
+        return {Answer::Yes, DecisionBound::None, std::nullopt};
+    if (best_)
+        return {Answer::Yes, DecisionBound::None,
+                witness(leaves, [&](Unknown unknown) { return (*best_)[numberOf(unknown)]; })};
+    IdMap<std::int64_t> values;
+    for (std::size_t i = 0; i < unknowns.size(); ++i)
+        values.insert(unknowns[i], mentioned[i + 1]);
+    return {Answer::Yes, DecisionBound::None, witness(leaves, [&](Unknown unknown) { return *values.find(unknown); })};
 }
 
 // Paths.
 
-/// Numbers the unknowns below a diagram and those of the leaves, in their order.
-void WitnessSearch::collect(Diagram diagram, std::span<const UnknownLeaf> leaves) {
-    root_ = diagram;
+void WitnessSearch::beginNumbers() {
     order_.clear();
     numbers_.clear();
     terms_.clear();
     movable_.clear();
+    path_.clear();
     triesLeft_ = limits::confirmations;
-    const auto meet = [&](Unknown unknown) {
-        if (numbers_.find(unknown) == nullptr) {
-            numbers_.insert(unknown, 0);
-            order_.push_back(unknown);
-        }
-    };
+}
+
+void WitnessSearch::meet(Unknown unknown) {
+    if (numbers_.find(unknown) == nullptr) {
+        numbers_.insert(unknown, 0);
+        order_.push_back(unknown);
+    }
+}
+
+/// Numbers the unknowns below a diagram and those of the leaves.
+void WitnessSearch::collect(Diagram diagram, std::span<const UnknownLeaf> leaves, Order order) {
+    beginNumbers();
     IdMap<bool> seen;
     std::vector<Diagram> pending{diagram};
     while (!pending.empty()) {
@@ -129,51 +123,74 @@ void WitnessSearch::collect(Diagram diagram, std::span<const UnknownLeaf> leaves
             continue;
         seen.insert(next >> 1U, true);
         steps_.take(diagrams_.edgeCount(next));
-        const QuantityInfo& info = unknowns_.quantity(diagrams_.quantity(next));
-        meet(info.plus);
-        if (info.isDifference())
-            meet(info.minus);
+        const LevelInfo& level = question_->levels()[diagrams_.level(next)];
+        meet(level.plus);
+        if (level.minus != noUnknown)
+            meet(level.minus);
         for (std::size_t i = 0; i < diagrams_.edgeCount(next); ++i)
             pending.push_back(diagrams_.edge(next, i).child);
     }
+    number(leaves, order);
+}
+
+/// Numbers the unknowns that were met, those of the leaves and what they are computed from.
+void WitnessSearch::number(std::span<const UnknownLeaf> leaves, Order order) {
+    wantsSmallest_ = order == Order::Texts;
     for (const UnknownLeaf& leaf : leaves)
         meet(leaf.unknown);
     std::vector<Unknown> free;                         // what terms are computed from
     for (std::size_t i = 0; i < order_.size(); ++i) {  // NOLINT(modernize-loop-convert): meeting more appends
         const UnknownInfo info = unknowns_[order_[i]]; // a copy, which stays where it is
-        if (info.kind == UnknownKind::Sum) {
-            for (const LinearPart& part : info.sum) {
-                meet(part.unknown);
-                if (!unknowns_[part.unknown].isComputed())
-                    free.push_back(part.unknown);
-            }
-        }
+        const auto meetOperand = [&](Unknown operand) {
+            meet(operand);
+            if (!unknowns_[operand].isComputed())
+                free.push_back(operand);
+        };
+        for (const LinearPart& part : info.sum)
+            meetOperand(part.unknown);
+        if (info.floor != nullptr)
+            for (const WidePart& part : info.floor->form.parts)
+                meetOperand(part.unknown);
         if (info.kind == UnknownKind::Term) {
             terms_.push_back({0, std::make_unique<TermPlan>(leafReader_, unknowns_, info.node)});
-            steps_.take(terms_.back().plan->size());
+            steps_.take(terms_.back().plan->size() * stepsPerPlanned);
             for (const Unknown unknown : terms_.back().plan->unknowns()) {
                 meet(unknown);
                 free.push_back(unknown);
             }
         }
-        if (info.isComputed() && info.kind == UnknownKind::Sum)
+        if (info.isComputed() && info.kind != UnknownKind::Term)
             terms_.push_back({0, nullptr});
         if (info.isComputed())
             terms_.back().number = order_[i]; // for the time being
     }
-    std::ranges::sort(order_, [&](Unknown a, Unknown b) { return unknowns_.before(a, b); });
+    std::ranges::sort(order_, [&](Unknown a, Unknown b) { return comesBefore(a, b, order); });
     for (std::size_t i = 0; i < order_.size(); ++i)
         numbers_.insert(order_[i], static_cast<Number>(i + 1));
+    const auto isSum = [&](const Term& term) { return unknowns_[order_[term.number - 1]].kind == UnknownKind::Sum; };
     for (Term& term : terms_)
         term.number = numberOf(term.number);
-    std::ranges::sort(terms_, {}, &Term::number); // sums come behind the terms that they add up
+    std::ranges::sort(terms_, {}, [&](const Term& term) { return std::pair(isSum(term), term.number); });
     for (const Unknown unknown : free)
         movable_.push_back(numberOf(unknown));
     std::ranges::sort(movable_);
     movable_.erase(std::unique(movable_.begin(), movable_.end()), movable_.end());
     system_.begin(order_.size());
     for (std::size_t i = 0; i < order_.size(); ++i)
-        system_.restrict(static_cast<Number>(i + 1), 0, unknowns_[order_[i]].low, unknowns_[order_[i]].high);
+        restrictSystem(order_[i], noUnknown, unknowns_[order_[i]].low, unknowns_[order_[i]].high);
+}
+
+/// What is computed comes after what it may be computed from, whatever the order.
+bool WitnessSearch::comesBefore(Unknown a, Unknown b, Order order) const {
+    const UnknownKind kindA = unknowns_[a].kind;
+    const UnknownKind kindB = unknowns_[b].kind;
+    if (kindA != kindB && (unknowns_[a].isComputed() || unknowns_[b].isComputed()))
+        return kindA < kindB;
+    if (order == Order::Texts && !unknowns_[a].isComputed())
+        return unknowns_.before(a, b);
+    if (kindA == UnknownKind::Sum && kindB == UnknownKind::Sum) // which are not mentioned themselves
+        return question_->levelOf(unknowns_[a].quantity) < question_->levelOf(unknowns_[b].quantity);
+    return question_->rankOf(a) < question_->rankOf(b);
 }
 
 void WitnessSearch::walkPaths(Diagram diagram) {
@@ -184,10 +201,10 @@ void WitnessSearch::walkPaths(Diagram diagram) {
     enter(diagram);
     while (!frames_.empty()) {
         Frame& frame = frames_.back();
-        system_.shrink(frame.bounds);
+        shrink(frame.bounds);
         solutions_.resize(frame.solutions);
         const std::size_t count = diagrams_.edgeCount(frame.diagram);
-        if (frame.next == count || (!terms_.empty() && best_) || (best_ && !improves(solutions_.back()))) {
+        if (frame.next == count || (first_ && best_) || (best_ && !improves(solutions_.back()))) {
             frames_.pop_back();
             continue;
         }
@@ -197,26 +214,61 @@ void WitnessSearch::walkPaths(Diagram diagram) {
         if (child == never || !take(frame, edge))
             continue;
         if (child == always)
-            reachedTruth();
+            unconfirmed_ = reachedTruth() == PathEnd::Open || unconfirmed_;
         else
             enter(child);
     }
 }
 
 void WitnessSearch::enter(Diagram diagram) {
-    const QuantityInfo& info = unknowns_.quantity(diagrams_.quantity(diagram));
+    const LevelInfo& level = question_->levels()[diagrams_.level(diagram)];
     const std::vector<std::int64_t>& values = solutions_.back();
-    const std::int64_t value = values[numberOf(info.plus)] - (info.isDifference() ? values[numberOf(info.minus)] : 0);
+    std::int64_t value = values[numberOf(level.plus)] - (level.minus != noUnknown ? values[numberOf(level.minus)] : 0);
     frames_.push_back({diagram, diagrams_.edgeOf(diagram, value), 0, system_.size(), solutions_.size()});
+}
+
+void WitnessSearch::restrict(const LevelInfo& level, std::int64_t low, std::int64_t high) {
+    if (level.opposed)
+        restrict(noUnknown, level.plus, low, high);
+    else
+        restrict(level.plus, level.minus, low, high);
+}
+
+void WitnessSearch::restrict(Unknown plus, Unknown minus, std::int64_t low, std::int64_t high) {
+    path_.push_back({plus, minus, low, high, system_.size()});
+    restrictSystem(plus, minus, low, high);
+}
+
+/// Whether the question has the opposite of a sum; the difference system has the same.
+bool WitnessSearch::isOpposed(Unknown unknown) const {
+    const Level level = question_->levelOf(unknowns_[unknown].quantity);
+    return level != noLevel && question_->levels()[level].opposed;
+}
+
+void WitnessSearch::restrictSystem(Unknown plus, Unknown minus, std::int64_t low, std::int64_t high) {
+    if (plus == noUnknown)
+        system_.restrict(numberOf(minus), 0, low, high);
+    else if (isOpposed(plus))
+        system_.restrict(numberOf(plus), 0, high == plusInfinite ? minusInfinite : -high,
+                         low == minusInfinite ? plusInfinite : -low);
+    else
+        system_.restrict(numberOf(plus), minus != noUnknown ? numberOf(minus) : 0, low, high);
+}
+
+/// Takes the latest bounds away.
+void WitnessSearch::shrink(std::size_t size) {
+    while (!path_.empty() && path_.back().bounds >= size)
+        path_.pop_back();
+    system_.shrink(size);
 }
 
 /// Adds the bounds of an edge; false where they cannot be met, or only by what is no better than the witness at hand.
 bool WitnessSearch::take(const Frame& frame, std::size_t edge) {
-    const QuantityInfo& info = unknowns_.quantity(diagrams_.quantity(frame.diagram));
+    const LevelInfo& level = question_->levels()[diagrams_.level(frame.diagram)];
     const std::int64_t low = edge == 0 ? minusInfinite : diagrams_.edge(frame.diagram, edge - 1).high + 1;
+    const std::int64_t high = diagrams_.edge(frame.diagram, edge).high;
     const bool isOrigin = edge == frame.origin;
-    system_.restrict(numberOf(info.plus), info.isDifference() ? numberOf(info.minus) : 0, low,
-                     diagrams_.edge(frame.diagram, edge).high);
+    restrict(level, low, high);
     if (isOrigin)
         return true;
     std::vector<std::int64_t> values;
@@ -233,28 +285,80 @@ bool WitnessSearch::improves(const std::vector<std::int64_t>& values) const {
     return false;
 }
 
-void WitnessSearch::reachedTruth() {
+/// Looks for values within the bounds, whose smallest solution is at hand; they are in best_ then.
+WitnessSearch::PathEnd WitnessSearch::reachedTruth() {
+    isWide_ = false;
+    isLarge_ = false;
     if (terms_.empty()) {
         best_ = solutions_.back();
-        return;
+        return PathEnd::Met;
     }
     if (confirm(solutions_.back())) {
         best_ = trial_;
-        return;
+        return PathEnd::Met;
     }
-    if (isExcluded())
-        return;
     switch (solveSums()) {
     case SumsOnPath::Unsolvable:
-        return;
+        return PathEnd::Excluded;
     case SumsOnPath::Solved:
         best_ = trial_;
-        return;
+        return PathEnd::Met;
     case SumsOnPath::Open:
         break;
     }
-    if (!confirmNear(solutions_.back()))
-        unconfirmed_ = true;
+    return confirmNear(solutions_.back()) ? PathEnd::Met : PathEnd::Open;
+}
+
+// Paths that a search finds.
+
+void WitnessSearch::beginPaths(const Question& question, std::span<const UnknownLeaf> leaves, Order order) {
+    question_ = &question;
+    beginNumbers();
+    steps_.take(question.levels().size());
+    for (const LevelInfo& level : question.levels()) {
+        meet(level.plus);
+        if (level.minus != noUnknown)
+            meet(level.minus);
+    }
+    number(leaves, order);
+}
+
+void WitnessSearch::restrictPaths(Unknown unknown, std::int64_t low, std::int64_t high) {
+    restrict(unknown, noUnknown, low, high);
+}
+
+WitnessSearch::PathEnd WitnessSearch::tryPath(std::span<const LevelRange> ranges) {
+    const std::size_t before = system_.size();
+    for (const LevelRange& range : ranges)
+        restrict(question_->levels()[range.level], range.low, range.high);
+    solutions_.assign(1, {});
+    best_.reset();
+    const PathEnd end = system_.solve(solutions_.back()) ? reachedTruth() : PathEnd::Excluded;
+    shrink(before);
+    if (end == PathEnd::Met) {
+        VTSYM_CHECK(isLarge_ || holds(*best_));
+        isPathWide_ = isWide_;
+        pathValues_.clear();
+        for (std::size_t i = 0; i < order_.size(); ++i)
+            pathValues_.insert(order_[i], (*best_)[i + 1]);
+    }
+    return end;
+}
+
+bool WitnessSearch::excludesPath(std::span<const LevelRange> ranges) {
+    const std::size_t before = system_.size();
+    for (const LevelRange& range : ranges)
+        restrict(question_->levels()[range.level], range.low, range.high);
+    std::vector<std::int64_t> values;
+    const bool excludes = !system_.solve(values) || (!terms_.empty() && !solvePath(false));
+    shrink(before);
+    return excludes;
+}
+
+std::optional<Witness> WitnessSearch::pathWitness(std::span<const UnknownLeaf> leaves) const {
+    if (isPathWide_)
+        return std::nullopt;
+    return witness(leaves, [&](Unknown unknown) { return pathValue(unknown); });
 }
 
 } // namespace VT

@@ -1,5 +1,6 @@
 #include "tests/support/generators/AnyCondition.hpp"
 
+#include "base/eval/ScalarRules.hpp"
 #include "tests/support/generators/AnyNode.hpp"
 
 #include <array>
@@ -29,11 +30,13 @@ Op anyOperator(std::mt19937_64& random) {
 } // namespace
 
 const std::vector<SymbolicOp>& valueOperators() {
-    static const std::vector<SymbolicOp> operators{
-        Op::Plus,        Op::Minus,     Op::UnaryMinus,       Op::Multiply,  Op::Divide,  Op::Modulo,
-        Op::Equal,       Op::NotEqual,  Op::LessThan,         Op::And,       Op::Or,      Op::LessThanEqual,
-        Op::GreaterThan, Op::Not,       Op::GreaterThanEqual, Op::BitAnd,    Op::BitOr,   Op::BitXOr,
-        Op::BitCompl,    Op::ShiftLeft, Op::ShiftRight,       Op::SingleAnd, Op::SingleOr};
+    static const std::vector<SymbolicOp> operators = [] {
+        std::vector<SymbolicOp> valued{Op::SingleAnd, Op::SingleOr};
+        for (const OperatorInfo& row : operatorTable())
+            if (scalarRuleIndex(row.op) != ScalarRuleIndex::None)
+                valued.push_back(row.op);
+        return valued;
+    }();
     return operators;
 }
 

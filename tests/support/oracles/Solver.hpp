@@ -2,17 +2,24 @@
 #pragma once
 
 #include "base/VTSymbolicExpr.hpp"
+#include "base/integer/RationalForm.hpp"
 
+#include <array>
+#include <cstdlib>
+#include <limits>
 #include <map>
+#include <optional>
 #include <stdexcept>
 #include <string>
+#include <vector>
 
 #include <z3.h>
 
 namespace VT::Testing {
 
-/// One context for many questions; a condition is translated once.  Arithmetic beyond + - * by a literal is an unknown
-/// for each node.
+/// One context for many questions; a condition is translated once.  Understood are + - * by a literal, quotients,
+/// remainders and shifts by a literal as in C, masks, and real literals; other arithmetic is an unknown for each node.
+/// Bits are taken of values that fit 32 bits: assignments with others do not count.
 class Solver {
 public:
     explicit Solver(const SymbolicExprTable& table) : table_(table) {
@@ -43,9 +50,19 @@ public:
     /// Whether both can hold together.  As elsewhere a "yes" comes with an assignment, which the solver makes on demand
     /// only, so that asking for it is part of the question.
     bool canHold(Z3_ast a, Z3_ast b) {
+        const std::optional<bool> answer = tryHold(a, b);
+        if (!answer)
+            throw std::logic_error("the solver does not know");
+        return *answer;
+    }
+
+    /// The same; nothing where the solver gives up.
+    std::optional<bool> tryHold(Z3_ast a, Z3_ast b) {
         Z3_solver_push(context_, solver_);
         Z3_solver_assert(context_, solver_, a);
         Z3_solver_assert(context_, solver_, b);
+        for (const Z3_ast domain : domains_)
+            Z3_solver_assert(context_, solver_, domain);
         const Z3_lbool answer = Z3_solver_check(context_, solver_);
         if (answer == Z3_L_TRUE) {
             const Z3_model model = Z3_solver_get_model(context_, solver_);
@@ -53,9 +70,22 @@ public:
             Z3_model_dec_ref(context_, model);
         }
         Z3_solver_pop(context_, solver_, 1);
-        if (answer == Z3_L_UNDEF)
-            throw std::logic_error("the solver does not know");
-        return answer == Z3_L_TRUE;
+        return answer == Z3_L_UNDEF ? std::nullopt : std::optional(answer == Z3_L_TRUE);
+    }
+
+    /// Bounds the work of a question from now on, in the solver's own unit; forgets which values have bits.
+    void limit(unsigned resources) {
+        Z3_params parameters = Z3_mk_params(context_);
+        Z3_params_inc_ref(context_, parameters);
+        Z3_params_set_uint(context_, parameters, Z3_mk_string_symbol(context_, "rlimit"), resources);
+        Z3_solver_set_params(context_, solver_, parameters);
+        Z3_params_dec_ref(context_, parameters);
+    }
+
+    /// Begins with other conditions: those before restrict which assignments count no more.
+    void forget() {
+        domains_.clear();
+        done_.clear();
     }
 
 private:
@@ -94,6 +124,82 @@ private:
         }
     }
 
+    bool isReal(Z3_ast ast) { return Z3_get_sort_kind(context_, Z3_get_sort(context_, ast)) == Z3_REAL_SORT; }
+
+    /// Two numbers as the solver compares and adds them: both real where one is.
+    std::array<Z3_ast, 2> alike(Z3_ast a, Z3_ast b) {
+        if (isReal(a) != isReal(b))
+            (isReal(a) ? b : a) = Z3_mk_int2real(context_, isReal(a) ? b : a);
+        return {a, b};
+    }
+
+    Z3_ast power(std::int64_t exponent) {
+        const std::string text = BigInteger(BigInteger(1) << static_cast<unsigned>(exponent)).str();
+        return Z3_mk_numeral(context_, text.c_str(), integers_);
+    }
+
+    Z3_ast times(Z3_ast a, Z3_ast b) {
+        const Z3_ast both[] = {a, b};
+        return Z3_mk_mul(context_, 2, both);
+    }
+
+    Z3_ast minus(Z3_ast a, Z3_ast b) {
+        const Z3_ast both[] = {a, b};
+        return Z3_mk_sub(context_, 2, both);
+    }
+
+    /// Z3 leaves a remainder that is never negative, C one with the sign of the dividend.
+    Z3_ast quotient(Z3_ast a, std::int64_t divisor) {
+        const Z3_ast by = integer(std::abs(divisor));
+        const Z3_ast whole = Z3_mk_ite(context_, Z3_mk_ge(context_, a, integer(0)), Z3_mk_div(context_, a, by),
+                                       negative(Z3_mk_div(context_, negative(a), by)));
+        return divisor < 0 ? negative(whole) : whole;
+    }
+
+    Z3_ast negative(Z3_ast a) { return Z3_mk_unary_minus(context_, a); }
+
+    /// The ones of a mask, bit by bit.
+    Z3_ast masked(Z3_ast a, std::int32_t mask) {
+        std::vector<Z3_ast> bits{integer(0)};
+        for (int i = 0; i < 31; ++i)
+            if ((mask >> i & 1) != 0)
+                bits.push_back(times(power(i), Z3_mk_mod(context_, Z3_mk_div(context_, a, power(i)), integer(2))));
+        if (mask < 0) // bit 31 counts negative
+            bits.push_back(Z3_mk_ite(context_, Z3_mk_lt(context_, a, integer(0)), negative(power(31)), integer(0)));
+        return Z3_mk_add(context_, static_cast<unsigned>(bits.size()), bits.data());
+    }
+
+    /// Arithmetic with a literal on the right, or nullptr.
+    Z3_ast byLiteral(SymbolicOp op, Z3_ast a, std::int32_t literal) {
+        using Op = SymbolicOp;
+        switch (op) {
+        case Op::Divide:
+            return quotient(a, literal);
+        case Op::Modulo:
+            return minus(a, times(quotient(a, literal), integer(literal)));
+        case Op::ShiftLeft:
+            return times(a, power(literal));
+        default:
+            break;
+        }
+        domains_.push_back(Z3_mk_le(context_, a, integer(std::numeric_limits<std::int32_t>::max())));
+        domains_.push_back(Z3_mk_ge(context_, a, integer(std::numeric_limits<std::int32_t>::min())));
+        const auto ofMask = [&](int factor) { // a + literal - factor * (a & literal)
+            const Z3_ast all[] = {a, integer(literal), times(integer(-factor), masked(a, literal))};
+            return Z3_mk_add(context_, 3, all);
+        };
+        switch (op) {
+        case Op::ShiftRight:
+            return Z3_mk_div(context_, a, power(literal));
+        case Op::BitAnd:
+            return masked(a, literal);
+        case Op::BitOr:
+            return ofMask(1);
+        default:
+            return ofMask(2);
+        }
+    }
+
     Z3_ast build(SymbolicExprId id, const SymbolicExpr& node) {
         using Op = SymbolicOp;
         static const std::map<Op, Z3_ast (*)(Z3_context, Z3_ast, Z3_ast)> comparisons{
@@ -104,6 +210,8 @@ private:
             {Op::Plus, Z3_mk_add}, {Op::Minus, Z3_mk_sub}, {Op::Multiply, Z3_mk_mul},
             {Op::And, Z3_mk_and},  {Op::Or, Z3_mk_or},
         };
+        static constexpr OperatorSet withLiteral{Op::Divide, Op::Modulo, Op::ShiftLeft, Op::ShiftRight,
+                                                 Op::BitAnd, Op::BitOr,  Op::BitXOr};
         const Op op = node.op();
         const auto number = [&](std::size_t i) { return asNumber(node.getInput(i)); };
         if (op == Op::String) {
@@ -112,21 +220,41 @@ private:
         }
         if (op == Op::IntValue)
             return integer(static_cast<const SymbolicIntValue&>(node).getValue());
+        if (op == Op::DoubleValue) {
+            const WideForm value = RationalForm::of(node.getNumValue()).widened();
+            const std::string text = value.constant.str() + "/" + value.denominator.str();
+            return Z3_mk_numeral(context_, text.c_str(), Z3_mk_real_sort(context_));
+        }
         if (op == Op::UnaryMinus)
-            return Z3_mk_unary_minus(context_, number(0));
+            return negative(number(0));
         if (op == Op::Not)
             return Z3_mk_not(context_, asTruth(node.getInput(0)));
-        if (op == Op::NotEqual)
-            return Z3_mk_not(context_, Z3_mk_eq(context_, number(0), number(1)));
-        if (const auto make = comparisons.find(op); make != comparisons.end())
-            return make->second(context_, number(0), number(1));
+        if (withLiteral.contains(op) && table_.get(node.getInput(1))->op() == Op::IntValue && !isReal(number(0)))
+            if (const int literal = static_cast<const SymbolicIntValue*>(table_.get(node.getInput(1)))->getValue();
+                literal != 0 || (op != Op::Divide && op != Op::Modulo))
+                return byLiteral(op, number(0), literal);
+        if (op == Op::NotEqual || comparisons.contains(op)) {
+            const auto [a, b] = alike(number(0), number(1));
+            return op == Op::NotEqual ? Z3_mk_not(context_, Z3_mk_eq(context_, a, b))
+                                      : comparisons.at(op)(context_, a, b);
+        }
         const auto make = chains.find(op);
-        if (make == chains.end() || (op == Op::Multiply && !table_.get(node.getInput(0))->isNumValue() &&
-                                     !table_.get(node.getInput(1))->isNumValue()))
+        if (make == chains.end() ||
+            (op == Op::Multiply && !isConstant(node.getInput(0)) && !isConstant(node.getInput(1))))
             return unknown("term " + std::to_string(id));
-        const auto operand = [&](std::size_t i) { return isTruth(id) ? asTruth(node.getInput(i)) : number(i); };
-        const Z3_ast both[] = {operand(0), operand(1)};
-        return make->second(context_, 2, both);
+        if (isTruth(id)) {
+            const Z3_ast both[] = {asTruth(node.getInput(0)), asTruth(node.getInput(1))};
+            return make->second(context_, 2, both);
+        }
+        return make->second(context_, 2, alike(number(0), number(1)).data());
+    }
+
+    /// Whether literals alone are in a product.
+    [[nodiscard]] bool isConstant(SymbolicExprId id) const {
+        const SymbolicExpr* node = table_.get(id);
+        while (node->op() == SymbolicOp::Multiply && table_.get(node->getInput(1))->isNumValue())
+            node = table_.get(node->getInput(0));
+        return node->isNumValue();
     }
 
     const SymbolicExprTable& table_;
@@ -134,6 +262,7 @@ private:
     Z3_sort integers_;
     Z3_solver solver_;
     std::map<SymbolicExprId, Z3_ast> done_;
+    std::vector<Z3_ast> domains_; ///< values whose bits are taken
 };
 
 } // namespace VT::Testing

@@ -5,7 +5,9 @@
 #include "base/core/Table.hpp"
 #include "base/print/PreprocessorVCExpr.hpp"
 #include "base/transform/QuillConversion.hpp"
+#include "host/Diagnostics.hpp"
 #include "tools/vtsym/answers/Warnings.hpp"
+#include "tools/vtsym/io/CommandLine.hpp"
 
 #include <unordered_set>
 
@@ -34,10 +36,37 @@ bool Conditions::makeRoomFor(const std::string& text) {
     return true;
 }
 
+Conditions::Conditions(bool bits32, const TextOptions& options, std::vector<std::string> assumptions)
+    : bits32_(bits32),
+      assumedIn_(&options),
+      assumptions_(std::move(assumptions)) {
+    renew();
+    if (assumptions_.empty())
+        return;
+    const VT::Reasons contradiction = service().explainDisjoint(service().assumptions());
+    if (!contradiction.isProven)
+        return;
+    std::string texts;
+    for (const VT::SymbolicExprId operand : contradiction.operands)
+        texts.append(texts.empty() ? "" : ", ").append(print(options, operand));
+    throw UsageError("--assume", "the conditions contradict each other: " + texts);
+}
+
+void Conditions::assume(const std::string& text) const {
+    try {
+        service().assume(parse(*assumedIn_, text));
+    } catch (const VT::HostDiagnostic& diagnostic) {
+        throw UsageError("--assume", quotedArgument(text) + " cannot be read: " + diagnostic.what());
+    }
+}
+
 void Conditions::renew() {
     handle_.reset();
     handle_.emplace();
     service().setDecisions32Bit(bits32_);
+    service().clearAssumptions();
+    for (const std::string& text : assumptions_)
+        assume(text);
     textBytes_ = 0;
 }
 

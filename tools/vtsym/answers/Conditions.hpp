@@ -19,6 +19,10 @@ public:
     /// `bits32` makes decisions over signed integers of 32 bits.
     explicit Conditions(bool bits32 = false) : bits32_(bits32) { renew(); }
 
+    /// Answers for the values for which assumptions hold, in the language of the options, which outlive the object.
+    /// Throws UsageError for an assumption that cannot be read, and for assumptions that contradict each other.
+    Conditions(bool bits32, const TextOptions& options, std::vector<std::string> assumptions);
+
     [[nodiscard]] VT::VCService& service() const { return **handle_; }
 
     /// To be called before the service reads a text.  Returns whether the service was renewed.
@@ -52,10 +56,13 @@ public:
 
 private:
     void renew();
+    void assume(const std::string& text) const;
     [[nodiscard]] VT::SymbolicExprId notLonger(const TextOptions& options, VT::SymbolicExprId result,
                                                VT::SymbolicExprId condition) const;
 
     bool bits32_;
+    const TextOptions* assumedIn_ = nullptr;
+    std::vector<std::string> assumptions_;
     std::optional<VT::VCServiceHandle> handle_;
     std::size_t textBytes_ = 0; ///< that the service may have kept
 };

@@ -10,6 +10,9 @@
 
 #include "host/embedded/ModelFile.hpp"
 
+#include <algorithm>
+#include <unordered_set>
+
 namespace vtsym {
 
 namespace {
@@ -23,10 +26,11 @@ not be written.
 
 Examples:
   vtsym check model.json
+  vtsym check --why --merge model.json
   vtsym check --html page.html model.json
   vtsym check --sarif model.json > findings.sarif)";
 
-constexpr std::array<FindingRule, 5> rules{{
+constexpr std::array<FindingRule, 6> rules{{
     {"dead", "A block is never active.",
      "The condition contradicts those of the blocks around it. Correct the condition, or remove the block."},
     {"always-active", "A block is always active.",
@@ -38,6 +42,10 @@ constexpr std::array<FindingRule, 5> rules{{
      "An assignment makes the conditions of two choices hold together. Let one condition exclude the other."},
     {"missing", "No choice is active.",
      "An assignment makes the block active, but no choice of it. Add a choice, or one with \"(default)\"."},
+    {"mergeable", "Choices can be one.",
+     "Together the conditions of the choices are one comparison, or an And. Write them as one choice if they select "
+     "the "
+     "same."},
 }};
 
 struct CheckOptions {
@@ -45,7 +53,8 @@ struct CheckOptions {
     std::string page;
     FindingForm form = FindingForm::Compiler;
     std::size_t mostBytes = vtsym::mostBytes;
-    bool bits32 = false;
+    bool fix = false;
+    ModelCheckOptions check;
 };
 
 void writePage(const std::string& path, const std::string& page, FindingWriter& writer) {
@@ -54,6 +63,56 @@ void writePage(const std::string& path, const std::string& page, FindingWriter& 
     } catch (const FileError& error) {
         writer.problem({path, 0, 0, 0, 0, {}}, error.what());
     }
+}
+
+/// The blocks that a port is joined to, and all blocks around them.
+std::unordered_set<const VTBlock*> joinedBlocks(const VTRootBD& model) {
+    std::unordered_set<const VTBlock*> joined;
+    const auto add = [&](const VTBlock* block) {
+        while (block != nullptr && joined.insert(block).second)
+            block = block->parent();
+    };
+    for (const vtPort& port : model.ports()) {
+        add(&port.source());
+        std::ranges::for_each(port.destinations(), add);
+    }
+    return joined;
+}
+
+/// The dead choices of a set that can be removed: no port is joined to them, and another choice is left.
+std::vector<Removal> removalsOf(const ModelCheck::ChoiceSet& set, const std::unordered_set<const VTBlock*>& joined) {
+    std::vector<Removal> removals;
+    for (const VT::ChoiceFinding& finding : set.report.findings) {
+        const VTBlock& choice = *set.block->choices()[finding.choice];
+        if (finding.fault == VT::ChoiceFault::Dead && !joined.contains(&choice))
+            removals.push_back({choice.textRange().begin, choice.textRange().end});
+    }
+    return removals.size() < set.block->choices().size() ? removals : std::vector<Removal>();
+}
+
+/// Writes the model without redundant operands and dead choices.
+void fix(const std::string& path, const std::string& text, const VTRootBD& model, const ModelCheck& check,
+         FindingWriter& writer) {
+    const std::unordered_set<const VTBlock*> joined = joinedBlocks(model);
+    std::vector<Removal> removals;
+    std::vector<Fix> fixes;
+    const auto collect = [&](const std::vector<Finding>& findings) {
+        for (const Finding& finding : findings)
+            if (finding.fix)
+                fixes.push_back(*finding.fix);
+    };
+    collect(check.otherFindings());
+    for (const ModelCheck::ChoiceSet& set : check.choiceSets()) {
+        collect(set.findings);
+        const std::vector<Removal> ofSet = removalsOf(set, joined);
+        removals.insert(removals.end(), ofSet.begin(), ofSet.end());
+    }
+    if (!fixes.empty() || !removals.empty())
+        try {
+            writeFile(path, fixed(text, std::move(fixes), std::move(removals)));
+        } catch (const FileError& error) {
+            writer.problem({path, 0, 0, 0, 0, {}}, error.what());
+        }
 }
 
 SearchResult check(const CheckOptions& options, Console& console) {
@@ -65,9 +124,12 @@ SearchResult check(const CheckOptions& options, Console& console) {
     try {
         console.working(1);
         VTRootBD model;
-        VT::Embedded::readModel(readFile(options.file, options.mostBytes), model);
-        ModelCheck modelCheck(model, options.file, options.bits32);
+        std::string text = readFile(options.file, options.mostBytes);
+        VT::Embedded::readModel(text, model);
+        ModelCheck modelCheck(model, options.file, options.check);
         modelCheck.run(*writer);
+        if (options.fix)
+            fix(options.file, text, model, modelCheck, *writer);
         if (!options.page.empty())
             writePage(options.page, modelPage(model, modelCheck), *writer);
     } catch (const VT::Embedded::ModelError& error) {
@@ -89,7 +151,13 @@ void addCheck(CommandLine& program) {
                         options->page);
     addSizeOption(command, options->mostBytes);
     addFormOptions(command, options->form);
-    addBitsOption(command, options->bits32);
+    addBitsOption(command, options->check.bits32);
+    addAssumeOption(command, options->check.assumptions);
+    command.addFlag("--why", "Say which operands force each finding, what to remove, and counted assignments",
+                    options->check.why);
+    command.addFlag("--merge", "Find choices that can be one", options->check.merges);
+    command.addFlag("--fix", "Write the model without redundant operands and without dead choices that no port needs",
+                    options->fix);
     command.run = [options](Console& console) { return check(*options, console); };
     command.onError = SearchResult::Failed;
 }

@@ -19,6 +19,8 @@ Examples:
   vtsym compare 'A<B && B<C' 'A<C'
   vtsym compare --from quill 'A == 1 | A == 2' 'A > 0 & A < 3'
   vtsym compare --bits 32 'A < 2147483647' 'A != 2147483647'
+  vtsym compare --why 'Mode == 1 && Gear > 2' 'Sport && Gear <= 1'
+  vtsym compare --assume 'N >= 1 && N <= 64' 'N > 0' 'N != 65'
   vtsym compare --json < pairs.txt)";
 
 /// In the order of VT::RelationKind.
@@ -32,7 +34,9 @@ const char* reasonOf(VT::DecisionBound bound) {
 
 class Comparer {
 public:
-    explicit Comparer(const PairOptions& options) : options_(options), conditions_(options.bits32) {}
+    explicit Comparer(const PairOptions& options)
+        : options_(options),
+          conditions_(options.bits32, options, options.assumptions) {}
 
     void answer(const std::string& text, std::string& out) {
         conditions_.makeRoomFor(text);
@@ -42,9 +46,29 @@ public:
             appendJson(pair, relation, out);
         else
             appendText(relation, out);
+        const VT::Reasons reasons = options_.why ? reasonsOf(pair, relation) : VT::Reasons{};
+        if (reasons.isProven && options_.json)
+            appendMember(out, "because", reasonsJson(conditions_, options_, reasons));
+        else if (reasons.isProven && !reasons.operands.empty())
+            out.append("; because: ").append(reasonsText(conditions_, options_, reasons));
     }
 
 private:
+    /// The operands that force the relation; an overlap needs none.
+    [[nodiscard]] VT::Reasons reasonsOf(const ConditionPair& pair, const VT::Relation& relation) const {
+        VT::VCService& service = conditions_.service();
+        switch (relation.kind) {
+        case VT::RelationKind::Disjoint:
+            return service.explainDisjoint({pair.first, pair.second});
+        case VT::RelationKind::Implies:
+            return service.explainImplies(pair.first, pair.second);
+        case VT::RelationKind::ImpliedBy:
+            return service.explainImplies(pair.second, pair.first);
+        default:
+            return {};
+        }
+    }
+
     void appendText(const VT::Relation& relation, std::string& out) const {
         out.append(relations.at(static_cast<std::size_t>(relation.kind)));
         if (relation.kind == VT::RelationKind::Undecided)

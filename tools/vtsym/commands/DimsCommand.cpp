@@ -1,5 +1,7 @@
 // vtsym dims: dimension expressions in the forms that the host works with: integers, simplified, divisions pulled out.
 // Each text has a table of its own, in which the definitions are bound again.
+#include "base/decide/DimensionProofs.hpp"
+#include "base/decide/reasons/ReasonSearch.hpp"
 #include "base/eval/Eval.hpp"
 #include "base/service/VCSymbols.hpp"
 #include "base/simplify/Simplify.hpp"
@@ -7,9 +9,11 @@
 #include "base/transform/FactorDivision.hpp"
 #include "host/Diagnostics.hpp"
 #include "parser/QuillConverter.hpp"
+#include "parser/SymbolicExprParser.hpp"
 #include "tools/vtsym/answers/ValueText.hpp"
 #include "tools/vtsym/commands/Commands.hpp"
 #include "tools/vtsym/commands/Definitions.hpp"
+#include "tools/vtsym/io/CommandLine.hpp"
 #include "tools/vtsym/io/Json.hpp"
 #include "tools/vtsym/io/Texts.hpp"
 
@@ -28,10 +32,13 @@ exact.
 Examples:
   vtsym dims 'N*2 + N/3'
   vtsym dims -D N=6 -D 'M=N - 1' '[N/2 + M/3, 4]'
+  vtsym dims --assume 'N >= 1 && N <= 64 && N % 4 == 0' --prove 'N*2 >= 8'
   vtsym dims --json < dimensions.txt)";
 
 struct DimsOptions : TextOptions {
     Definitions definitions;
+    std::vector<std::string> assumptions;
+    std::vector<std::string> claims;
 };
 
 /// Reads a dimension expression and turns its numbers into integers.  Throws the first diagnostic of the reader.
@@ -131,6 +138,63 @@ void answer(const DimsOptions& options, const Style& style, const std::string& t
         report.value(*value);
 }
 
+/// Throws UsageError for an assumption that cannot be read.
+void assume(VT::SymbolicExprTable& table, const DimsOptions& options, VT::Assumptions& assumptions) {
+    for (const std::string& text : options.assumptions) {
+        try {
+            assumptions.add(VT::SymbolicExprParser(table, true, true)(text));
+        } catch (const VT::HostDiagnostic& diagnostic) {
+            throw UsageError("--assume", quotedArgument(text) + " cannot be read: " + diagnostic.what());
+        }
+    }
+    VT::Decider decider(table);
+    if (VT::ReasonSearch(table, decider).whyNever(assumptions.all()).isProven)
+        throw UsageError("--assume", "the conditions contradict each other");
+}
+
+/// Answers whether claims hold wherever the assumptions do; returns whether all are decided.
+bool prove(const DimsOptions& options, Console& console) {
+    VT::SymbolicExprTable table;
+    define(table, options);
+    VT::Assumptions assumptions(table);
+    assume(table, options, assumptions);
+    VT::Decider decider(table);
+    VT::DimensionProofs proofs(table, decider, assumptions);
+    bool isDecided = true;
+    for (const std::string& text : options.claims) {
+        VT::SymbolicExprId claim = VT::invalidId;
+        try {
+            claim = VT::SymbolicExprParser(table, true, true)(text);
+        } catch (const VT::HostDiagnostic& diagnostic) {
+            throw UsageError("--prove", quotedArgument(text) + " cannot be read: " + diagnostic.what());
+        }
+        const VT::Decision decision = proofs.holds(claim);
+        isDecided = isDecided && !decision.isUndecided();
+        const char* const answer = decision.isYes() ? "proven" : decision.isNo() ? "refuted" : "undecided";
+        std::string witness;
+        std::string json;
+        for (const VT::UnknownValue& each : decision.witness.value_or(VT::Witness{})) {
+            const std::string name = decider.nameOf(each.unknown);
+            witness.append(witness.empty() ? ": " : ", ").append(name).append("=").append(std::to_string(each.value));
+            json.append(json.empty() ? "" : ",")
+                .append(jsonString(name))
+                .append(":")
+                .append(std::to_string(each.value));
+        }
+        if (!options.json) {
+            console.out(answer + witness + "\n");
+            continue;
+        }
+        std::string out = "{\"claim\":" + jsonString(text);
+        appendMember(out, "answer", jsonString(answer));
+        if (decision.witness)
+            appendMember(out, "witness", "{" + json + "}");
+        console.out(out + "}\n");
+    }
+    console.flush();
+    return isDecided;
+}
+
 } // namespace
 
 void addDims(CommandLine& program) {
@@ -138,11 +202,20 @@ void addDims(CommandLine& program) {
     const auto options = std::make_shared<DimsOptions>();
     addTexts(command, *options);
     addDefinitions(command, options->definitions);
+    addAssumeOption(command, options->assumptions);
+    command.addArguments({"--prove", "Prove or refute a comparison of dimensions, in C; may be repeated", "CLAIM"},
+                         [options](std::vector<std::string> claims) { options->claims = std::move(claims); });
     command.afterOptions = [options] {
         VT::SymbolicExprTable table; // reports wrong definitions before any text is answered
         define(table, *options);
+        VT::Assumptions assumptions(table);
+        assume(table, *options, assumptions);
+        if (options->claims.empty() && !options->assumptions.empty())
+            throw UsageError("--assume", "nothing is proven; add --prove");
     };
-    command.run = [options](Console& console) {
+    command.run = [options](Console& console) -> ExitStatus {
+        if (!options->claims.empty())
+            return prove(*options, console);
         const auto answerText = [&](const std::string& text, std::string& out) {
             answer(*options, console.outStyle(), text, out);
         };

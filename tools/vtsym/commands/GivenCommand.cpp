@@ -14,7 +14,32 @@ constexpr const char* notes =
 Examples:
   vtsym given 'VERSION >= 3' 'VERSION >= 4 && VERSION >= 2'
   vtsym given --to quill '!A' 'A || B != 1'
+  vtsym given --why 'VERSION >= 3 && NET' 'VERSION >= 2 && TLS'
   vtsym given --json < pairs.txt)";
+
+void appendReasons(const Conditions& conditions, const PairOptions& options, const VT::ShorteningReasons& reasons,
+                   std::string& out) {
+    if (!reasons.because.operands.empty())
+        out.append("; because: ").append(reasonsText(conditions, options, reasons.because));
+    for (const VT::LostOperand& lost : reasons.lost) {
+        const std::string facts = reasonsText(conditions, options, lost.because);
+        out.append("; without ").append(conditions.print(options, lost.operand));
+        out.append(": ").append(facts.empty() ? "the rest" : facts);
+    }
+}
+
+void appendReasonsJson(const Conditions& conditions, const PairOptions& options, const VT::ShorteningReasons& reasons,
+                       std::string& out) {
+    appendMember(out, "because", reasonsJson(conditions, options, reasons.because));
+    std::string lost;
+    for (const VT::LostOperand& each : reasons.lost) {
+        lost.append(lost.empty() ? "{" : ",{").append("\"operand\":");
+        lost.append(jsonString(conditions.print(options, each.operand)));
+        appendMember(lost, "because", reasonsJson(conditions, options, each.because));
+        lost.push_back('}');
+    }
+    appendMember(out, "lost", "[" + lost + "]");
+}
 
 } // namespace
 
@@ -24,7 +49,7 @@ void addGiven(CommandLine& program) {
     addPairOptions(command, *options, "KNOWN", "CONDITION");
     addLanguageOption(command, *options);
     command.run = [options](Console& console) {
-        Conditions conditions(options->bits32);
+        Conditions conditions(options->bits32, *options, options->assumptions);
         std::vector<std::string> warnings;
         const auto answer = [&](const std::string& text, std::string& out) {
             conditions.makeRoomFor(text);
@@ -32,13 +57,20 @@ void addGiven(CommandLine& program) {
             const VT::SymbolicExprId result = conditions.shortestGiven(*options, pair.second, pair.first);
             const std::string printed = conditions.print(*options, result);
             warnings = conditions.warnings(*options, result);
+            const VT::ShorteningReasons reasons =
+                options->why ? conditions.service().explainImpliedCondition(pair.second, result, pair.first)
+                             : VT::ShorteningReasons{};
             if (!options->json) {
                 out.append(printed);
+                if (reasons.because.isProven)
+                    appendReasons(conditions, *options, reasons, out);
                 return;
             }
             appendMember(out, "known", jsonString(pair.firstText));
             appendMember(out, "condition", jsonString(pair.secondText));
             appendMember(out, "result", jsonString(printed));
+            if (reasons.because.isProven)
+                appendReasonsJson(conditions, *options, reasons, out);
         };
         return answerTexts(*options, console, {answer, false, &warnings, true});
     };

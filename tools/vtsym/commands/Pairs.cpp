@@ -55,7 +55,12 @@ void addPairOptions(Command& command, PairOptions& options, const std::string& f
     addSourceOption(command, options);
     command.addFlag("--json", "Answer with one JSON object per pair", options.json);
     addBitsOption(command, options.bits32);
-    command.afterOptions = [&options] { joinArguments(options); };
+    addAssumeOption(command, options.assumptions);
+    command.addFlag("--why", "Say which operands, known facts and assumptions force the answer", options.why);
+    command.afterOptions = [&options] {
+        joinArguments(options);
+        const Conditions checked(options.bits32, options, options.assumptions); // before any text is answered
+    };
 }
 
 ConditionPair readPair(const Conditions& conditions, const TextOptions& options, const std::string& text) {
@@ -69,6 +74,20 @@ ConditionPair readPair(const Conditions& conditions, const TextOptions& options,
     if (!errors.empty())
         throw CommandError(std::move(errors));
     return pair;
+}
+
+std::string reasonsText(const Conditions& conditions, const TextOptions& options, const VT::Reasons& reasons) {
+    std::string text;
+    for (const VT::SymbolicExprId operand : reasons.operands)
+        text.append(text.empty() ? "" : ", ").append(conditions.print(options, operand));
+    return text;
+}
+
+std::string reasonsJson(const Conditions& conditions, const TextOptions& options, const VT::Reasons& reasons) {
+    std::string json;
+    for (const VT::SymbolicExprId operand : reasons.operands)
+        json.append(json.empty() ? "" : ",").append(jsonString(conditions.print(options, operand)));
+    return "[" + json + "]";
 }
 
 std::string witnessText(const Conditions& conditions, const TextOptions& options, const VT::Witness& witness) {

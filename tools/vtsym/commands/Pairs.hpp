@@ -16,6 +16,8 @@ struct PairOptions : TextOptions {
     std::optional<std::string> first;
     std::optional<std::string> second;
     bool bits32 = false;
+    bool why = false;
+    std::vector<std::string> assumptions;
 };
 
 /// Two conditions, as written and as read.
@@ -26,11 +28,15 @@ struct ConditionPair {
     VT::SymbolicExprId second;
 };
 
-/// Adds two positionals of these names, --from, --json and --bits.
+/// Adds two positionals of these names, --from, --json, --bits, --assume and --why.
 void addPairOptions(Command& command, PairOptions& options, const std::string& first, const std::string& second);
 
 /// Reads a pair.  Throws CommandError with one error for each condition that cannot be read, placed in the whole text.
 ConditionPair readPair(const Conditions& conditions, const TextOptions& options, const std::string& text);
+
+/// The operands of reasons as text, "A>2, A<=1", and as a JSON list.
+std::string reasonsText(const Conditions& conditions, const TextOptions& options, const VT::Reasons& reasons);
+std::string reasonsJson(const Conditions& conditions, const TextOptions& options, const VT::Reasons& reasons);
 
 /// An assignment as text, "A=3, B=0", and as a JSON object.
 std::string witnessText(const Conditions& conditions, const TextOptions& options, const VT::Witness& witness);

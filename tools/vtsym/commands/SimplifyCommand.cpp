@@ -24,12 +24,14 @@ Examples:
   vtsym simplify --explain '!(A < 3) || A == 2'
   vtsym simplify --normal-form '(A || B) && C'
   vtsym simplify --to quill 'a / b == 1 && x != 2'
+  vtsym simplify --assume 'VERSION >= 3' 'VERSION >= 2 && TLS || VERSION < 1'
   vtsym simplify --json < conditions.txt)";
 
 struct SimplifyOptions : TextOptions {
     bool explain = false;
     bool normalForm = false;
     bool bits32 = false;
+    std::vector<std::string> assumptions;
 };
 
 class Simplifier {
@@ -37,7 +39,7 @@ public:
     Simplifier(const SimplifyOptions& options, const Style& style)
         : options_(options),
           style_(style),
-          conditions_(options.bits32) {}
+          conditions_(options.bits32, options, options.assumptions) {}
 
     void answer(const std::string& text, std::string& out);
 
@@ -94,6 +96,11 @@ void addSimplify(CommandLine& program) {
                     options->explain);
     command.addFlag("--normal-form", "Answer with the sum of products instead", options->normalForm);
     addBitsOption(command, options->bits32);
+    addAssumeOption(command, options->assumptions);
+    command.exclude("--normal-form", "--assume");
+    command.afterOptions = [options] {
+        const Conditions checked(options->bits32, *options, options->assumptions); // before any text is answered
+    };
     command.run = [options](Console& console) {
         Simplifier simplifier(*options, console.outStyle());
         const auto answer = [&](const std::string& text, std::string& out) { simplifier.answer(text, out); };

@@ -26,7 +26,7 @@ public:
 private:
     void add(const Finding& finding) override {
         console().out(console().outStyle().strong(placeText(finding.place) + ":") + " " +
-                      VT::shownText(finding.message) + "\n");
+                      VT::shownText(sentenceOf(finding)) + "\n");
     }
 };
 
@@ -37,6 +37,15 @@ public:
 private:
     void add(const Finding& finding) override;
 };
+
+/// Appends the reasons, where there are any.
+void appendReasons(const Finding& finding, std::string& json) {
+    std::string list;
+    for (const std::string& reason : finding.because)
+        list.append(list.empty() ? "" : ",").append(jsonString(reason));
+    if (!list.empty())
+        appendMember(json, "because", "[" + list + "]");
+}
 
 void JsonWriter::add(const Finding& finding) {
     std::string out = "{\"file\":" + jsonString(finding.place.file);
@@ -49,6 +58,7 @@ void JsonWriter::add(const Finding& finding) {
         appendMember(out, "proposed", jsonString(*finding.proposed));
     if (!finding.witness.empty())
         appendMember(out, "witness", jsonString(finding.witness));
+    appendReasons(finding, out);
     std::string follows;
     for (const RelatedPlace& related : finding.follows) {
         follows.append(follows.empty() ? "{" : ",{").append("\"line\":").append(std::to_string(related.place.line));
@@ -170,6 +180,7 @@ void SarifWriter::add(const Finding& finding) {
         appendMember(properties, "proposed", jsonString(*finding.proposed));
     if (!finding.witness.empty())
         appendMember(properties, "witness", jsonString(finding.witness));
+    appendReasons(finding, properties);
     appendMember(out, "properties", properties + "}");
     console().out(out + "}");
 }
@@ -199,6 +210,50 @@ void SarifWriter::end() {
 }
 
 } // namespace
+
+std::string sentenceOf(const Finding& finding) {
+    std::string sentence = finding.message;
+    for (const std::string& reason : finding.because)
+        sentence.append(&reason == finding.because.data() ? "; because: " : ", ").append(reason);
+    return sentence;
+}
+
+std::string fixed(const std::string& text, std::vector<Fix> fixes, std::vector<Removal> removals) {
+    std::ranges::sort(fixes, {}, [](const Fix& fix) { return std::pair(fix.region.line, fix.region.column); });
+    std::ranges::sort(removals, {}, &Removal::begin);
+    std::string result;
+    std::uint64_t line = 1;
+    std::uint64_t column = 0; // of the code point that the byte belongs to
+    auto fix = fixes.begin();
+    auto removal = removals.begin();
+    for (std::size_t i = 0; i < text.size(); ++i) {
+        const bool begins = (static_cast<unsigned char>(text[i]) & 0xc0U) != 0x80U;
+        column += begins ? 1U : 0U;
+        if (fix != fixes.end() && line == fix->region.line && column == fix->region.endColumn)
+            ++fix;
+        if (removal != removals.end() && i == removal->end)
+            ++removal;
+        const bool isRemoved = removal != removals.end() && i >= removal->begin;
+        const bool isFixed = fix != fixes.end() && line == fix->region.line && column >= fix->region.column;
+        if (isFixed && begins && column == fix->region.column)
+            result.append(fix->text);
+        if (isRemoved && i == removal->begin) {
+            const std::size_t after = text.find_first_not_of(" \t\r\n", removal->end);
+            if (after != std::string::npos && text[after] == ',')
+                removal->end = after + 1;
+            else if (const std::size_t before = result.find_last_not_of(" \t\r\n"); // the last element of the list
+                     before != std::string::npos && result[before] == ',')
+                result.resize(before);
+        }
+        if (!isRemoved && !isFixed)
+            result.push_back(text[i]);
+        if (text[i] == '\n') {
+            ++line;
+            column = 0;
+        }
+    }
+    return result;
+}
 
 void FindingWriter::write(const Finding& finding) {
     add(finding);

@@ -56,8 +56,22 @@ struct Finding {
     std::optional<std::string> proposed; ///< condition to write instead
     std::vector<RelatedPlace> follows;
     std::optional<Fix> fix;
-    std::string witness; ///< "A=3, B=0", or empty
+    std::string witness;                   ///< "A=3, B=0", or empty
+    std::vector<std::string> because = {}; ///< operands that force the finding
 };
+
+/// The message with its reasons.
+std::string sentenceOf(const Finding& finding);
+
+/// Bytes of a text that holds JSON: an element of a list, from `begin` to before `end`.
+struct Removal {
+    std::size_t begin;
+    std::size_t end;
+};
+
+/// Returns a text with fixes of regions in it that do not overlap, each on one line, and without some elements of JSON
+/// lists, each with the comma that separates it from another one.  Linear in the text, plus sorting.
+std::string fixed(const std::string& text, std::vector<Fix> fixes, std::vector<Removal> removals);
 
 enum class FindingForm : std::uint8_t { Compiler, Json, Sarif };
 

@@ -26,6 +26,7 @@ constexpr std::size_t shownAncestors = 8;     ///< whose conditions a finding li
 
 /// In the order of VT::ChoiceFault.
 constexpr std::array<std::string_view, 5> kinds{"dead", "always-active", "redundant", "overlapping", "missing"};
+constexpr std::string_view mergeable = "mergeable";
 
 std::string_view kindOf(VT::ChoiceFault fault) {
     return kinds.at(static_cast<std::size_t>(fault));
@@ -44,6 +45,14 @@ Place regionOf(const std::string& file, const VT::Embedded::TextPlace& place) {
     return {file, place.line, place.column, place.line, place.endColumn, {}};
 }
 
+/// "c0 hides it", "c0, c1 hide it"
+std::string hidingText(std::span<const VTBlock* const> blocks, const std::vector<std::size_t>& hiding) {
+    std::string names;
+    for (const std::size_t choice : hiding)
+        names.append(names.empty() ? "" : ", ").append(blocks[choice]->path());
+    return shown(names) + (hiding.size() == 1 ? " hides it" : " hide it");
+}
+
 Finding findingAt(Place place, VT::ChoiceFault fault, std::string message, std::string condition) {
     Finding finding;
     finding.place = std::move(place);
@@ -55,11 +64,49 @@ Finding findingAt(Place place, VT::ChoiceFault fault, std::string message, std::
 
 } // namespace
 
-ModelCheck::ModelCheck(const VTRootBD& model, std::string file, bool bits32)
+ModelCheck::ModelCheck(const VTRootBD& model, std::string file, const ModelCheckOptions& options)
     : model_(model),
       file_(std::move(file)),
+      options_(options),
       conditions_(*handle_),
-      checker_(*handle_, {.bits32 = bits32}) {}
+      isAssumed_(assume()),
+      checker_(*handle_, checkerOptions()) {}
+
+/// Makes the service assume what the options say; false where that cannot be read.
+bool ModelCheck::assume() {
+    for (const std::string& text : options_.assumptions) {
+        try {
+            model_.isQuill() ? handle_->assumeFromQCondition(text) : handle_->assumeFromCCondition(text);
+        } catch (const VT::HostDiagnostic& diagnostic) {
+            refused_ = diagnostic.what();
+            return false;
+        }
+    }
+    return true;
+}
+
+/// The options, with the values that the model declares.
+VT::ChoiceSetOptions ModelCheck::checkerOptions() {
+    VT::ChoiceSetOptions result{.bits32 = options_.bits32, .reasons = options_.why, .merges = options_.merges};
+    const VT::SymbolicExprTable& table = handle_->table();
+    for (const VT::Embedded::DeclaredSymbol& symbol : model_.symbols()) {
+        VT::SymbolicExprId id = VT::invalidId;
+        try {
+            id = model_.isQuill() ? handle_->parseQ(symbol.name) : handle_->parseC(symbol.name);
+        } catch (const VT::HostDiagnostic&) {
+            unread_.push_back(&symbol);
+            continue;
+        }
+        const VT::SymbolicOp op = table.get(id)->op();
+        const bool isName = op == VT::SymbolicOp::String || op == VT::SymbolicOp::MemberValue;
+        if (!isName || id == table.getIdTRUE() || id == table.getIdFALSE()) {
+            unread_.push_back(&symbol);
+            continue;
+        }
+        result.domains.push_back({id, symbol.values, symbol.min, symbol.max});
+    }
+    return result;
+}
 
 std::string ModelCheck::print(VT::SymbolicExprId condition) const {
     const std::string text = model_.isQuill() ? handle_->printQExpr(condition) : handle_->printCExpr(condition);
@@ -117,6 +164,14 @@ bool ModelCheck::readConditions() {
         problem(placeOf(block), block.path() + ": " + sentence);
         allRead = false;
     };
+    if (!isAssumed_) {
+        problem({file_, 0, 0, 0, 0, {}}, "--assume: " + refused_);
+        allRead = false;
+    }
+    for (const VT::Embedded::DeclaredSymbol* const symbol : unread_) {
+        problem(regionOf(file_, symbol->place), shown(symbol->name) + " is not the name of a symbol.");
+        allRead = false;
+    }
     for (const VTBlock& block : model_.blocks()) {
         if (VT::BlockConditions::isDefault(block) && !block.isChoice())
             refuse(block, "\"(default)\" is for choices alone: write a condition.");
@@ -130,6 +185,19 @@ bool ModelCheck::readConditions() {
         }
     }
     return allRead;
+}
+
+/// Where a block is active by its own condition; of choices the first of which counts, where no earlier one is.
+VT::VCSymbolicExprId ModelCheck::ownAfterOthers(const VTBlock& block) {
+    const VT::VCSymbolicExprId own = conditions_.own(block);
+    if (!block.isChoice() || block.parent()->choiceRule() != VT::Embedded::ChoiceRule::First ||
+        VT::BlockConditions::isDefault(block))
+        return own;
+    VT::SymbolicExprId& before =
+        earlierChoices_.try_emplace(block.parent(), handle_->table().getIdFALSE()).first->second;
+    const VT::VCSymbolicExprId active = handle_->AND(own, handle_->NOT(before, false), false);
+    before = handle_->OR(before, own, false).id();
+    return active;
 }
 
 void ModelCheck::run(FindingWriter& writer) {
@@ -155,8 +223,8 @@ void ModelCheck::run(FindingWriter& writer) {
         if (dead.contains(&block))
             continue;
         const VT::SymbolicExprId around = contextOf(block.parent());
-        contexts_.emplace(
-            &block, followers.contains(&block) ? around : handle_->AND(around, conditions_.own(block), false).id());
+        contexts_.emplace(&block, followers.contains(&block) ? around
+                                                             : handle_->AND(around, ownAfterOthers(block), false).id());
         if (!block.choices().empty())
             note(checkChoices(block), block.choices());
         if (checker_.stepsUsedUp()) {
@@ -191,7 +259,8 @@ VT::ChoiceSetReport ModelCheck::checkChoices(const VTBlock& block) {
         checker_.check(contextOf(&block), choices,
                        defaultChoice == block.choices().end()
                            ? std::nullopt
-                           : std::optional(static_cast<std::size_t>(defaultChoice - block.choices().begin())));
+                           : std::optional(static_cast<std::size_t>(defaultChoice - block.choices().begin())),
+                       static_cast<VT::ChoicePolicy>(block.choiceRule()));
     std::erase_if(report.findings, [&](const VT::ChoiceFinding& finding) {
         const VTBlock& choice = *block.choices()[finding.choice];
         return finding.fault == VT::ChoiceFault::AlwaysActive && choices.size() == 1 &&
@@ -203,12 +272,59 @@ VT::ChoiceSetReport ModelCheck::checkChoices(const VTBlock& block) {
         write(findings, findingOf(block, block.choices(), finding));
     for (const VT::ChoiceFinding& finding : report.undecided)
         reportUndecided(block, block.choices(), finding);
+    writeMerges(block, report, findings);
+    noteAdvice(choiceSets_.back());
     if (!report.allOverlaps && !checker_.stepsUsedUp()) {
         write(findings, findingAt(placeOf(block), VT::ChoiceFault::Overlap,
                                   "more choices of " + block.path() + " overlap than the pairs reported",
                                   block.variantCondition()));
     }
     return report;
+}
+
+void ModelCheck::explain(Finding& finding, const VT::Reasons& reasons) const {
+    for (const VT::SymbolicExprId operand : reasons.operands)
+        finding.because.push_back(shown(print(operand)));
+}
+
+/// Reports on standard error which choices to remove, and how many assignments each one has.
+void ModelCheck::noteAdvice(ChoiceSet& set) {
+    if (!options_.why)
+        return;
+    const auto& choices = set.block->choices();
+    std::string removed;
+    for (const std::size_t choice : set.report.removal.choices)
+        removed.append(removed.empty() ? "" : ", ").append(choices[choice]->name());
+    if (!removed.empty())
+        set.advice.push_back("no choices overlap without " + shown(removed) +
+                             (set.report.removal.isSmallest ? "" : ", which may be more than needed"));
+    std::string counts;
+    for (std::size_t i = 0; i < set.report.assignments.size(); ++i)
+        if (const auto& count = set.report.assignments[i])
+            counts.append(", ").append(choices[i]->name()).append(" ").append(std::to_string(*count));
+    if (set.report.parentAssignments)
+        set.advice.push_back(std::to_string(*set.report.parentAssignments) + " assignments" + shown(counts));
+    for (const std::string& advice : set.advice)
+        writer_->note(set.block->path() + ": " + advice);
+}
+
+void ModelCheck::writeMerges(const VTBlock& set, const VT::ChoiceSetReport& report, std::vector<Finding>& findings) {
+    for (const VT::ChoiceMerge& merge : report.merges) {
+        const VTBlock& first = *set.choices()[merge.choices.front()];
+        Finding finding;
+        finding.place = placeOf(first);
+        finding.kind = mergeable;
+        finding.condition = first.variantCondition();
+        finding.proposed = print(merge.merged);
+        for (const std::size_t choice : merge.choices) {
+            const VTBlock& block = *set.choices()[choice];
+            finding.message += (finding.message.empty() ? "" : ", ") + block.path();
+            if (&block != &first)
+                finding.follows.push_back({placeOf(block), block.variantCondition()});
+        }
+        finding.message = shown(finding.message) + " can be one choice: " + shown(*finding.proposed);
+        write(findings, std::move(finding));
+    }
 }
 
 Finding ModelCheck::findingOf(const VTBlock& set, std::span<const VTBlock* const> blocks,
@@ -225,7 +341,9 @@ Finding ModelCheck::findingOf(const VTBlock& set, std::span<const VTBlock* const
     switch (finding.fault) {
     case VT::ChoiceFault::Dead:
         result.message = path + " is never active: ";
-        if (VT::BlockConditions::isDefault(block))
+        if (!finding.hiddenBy.empty())
+            result.message += hidingText(blocks, finding.hiddenBy);
+        else if (VT::BlockConditions::isDefault(block))
             result.message += "the other choices leave nothing to it";
         else if (checker_.canHold(conditions_.own(block).id()).isYes())
             result.message += condition + " cannot hold" + where + " active";
@@ -252,8 +370,13 @@ Finding ModelCheck::findingOf(const VTBlock& set, std::span<const VTBlock* const
     }
     case VT::ChoiceFault::Missing:
         result.message = "no choice of " + path + " is active for " + witnessText(finding.witness);
+        if (finding.proposed != VT::invalidId) {
+            result.proposed = print(finding.proposed);
+            result.message += "; " + shown(*result.proposed) + " closes the gap";
+        }
         break;
     }
+    explain(result, finding.reasons);
     if (finding.fault != VT::ChoiceFault::Dead)
         result.witness = handle_->printWitness(finding.witness);
     return result;

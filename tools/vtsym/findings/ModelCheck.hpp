@@ -14,6 +14,13 @@
 
 namespace vtsym {
 
+struct ModelCheckOptions {
+    bool bits32 = false;
+    bool why = false;    ///< findings come with reasons, sets with the choices to remove and counted assignments
+    bool merges = false; ///< choices that can be merged are findings
+    std::vector<std::string> assumptions = {}; ///< in the language of the model
+};
+
 /// Checks one model, once.
 class ModelCheck {
 public:
@@ -22,10 +29,11 @@ public:
         const VTBlock* block;
         VT::ChoiceSetReport report;
         std::vector<Finding> findings;
+        std::vector<std::string> advice = {}; ///< sentences on choices to remove and on counted assignments
     };
 
     /// `file` is the name of the file in places.  The model outlives the check.
-    ModelCheck(const VTRootBD& model, std::string file, bool bits32);
+    ModelCheck(const VTRootBD& model, std::string file, const ModelCheckOptions& options);
 
     /// Writes the findings, block by block.  Leaves out the blocks inside of one that is never active.
     void run(FindingWriter& writer);
@@ -49,6 +57,12 @@ private:
     void write(std::vector<Finding>& kept, Finding finding);
     void problem(const Place& place, const std::string& sentence);
     bool readConditions();
+    bool assume();
+    VT::VCSymbolicExprId ownAfterOthers(const VTBlock& block);
+    [[nodiscard]] VT::ChoiceSetOptions checkerOptions();
+    void explain(Finding& finding, const VT::Reasons& reasons) const;
+    void noteAdvice(ChoiceSet& set);
+    void writeMerges(const VTBlock& set, const VT::ChoiceSetReport& report, std::vector<Finding>& findings);
     VT::ChoiceSetReport checkBlock(const VTBlock& block);
     VT::ChoiceSetReport checkChoices(const VTBlock& block);
     void checkPort(const vtPort& port);
@@ -62,11 +76,17 @@ private:
 
     const VTRootBD& model_;
     std::string file_;
+    ModelCheckOptions options_;
+    std::vector<const VT::Embedded::DeclaredSymbol*> unread_; ///< symbols that are not names
+    std::string refused_;                                     ///< why an assumption cannot be read
     VT::VCServiceHandle handle_;
     VT::BlockConditions conditions_;
+    bool isAssumed_; ///< all assumptions were read, before the checker is made
     VT::ChoiceSetChecker checker_;
     /// The condition under which a block is active, without the parts that are implied by the blocks around it.
     std::unordered_map<const VTBlock*, VT::SymbolicExprId> contexts_;
+    /// Where one of the choices before the next one of a block holds, if the first of them counts.
+    std::unordered_map<const VTBlock*, VT::SymbolicExprId> earlierChoices_;
     FindingWriter* writer_ = nullptr;
     std::vector<ChoiceSet> choiceSets_;
     std::vector<Finding> otherFindings_;

@@ -171,7 +171,7 @@ void appendFindings(const std::vector<Finding>& findings, std::string& html) {
     for (std::size_t i = 0; i < std::min(findings.size(), mostFindings); ++i) {
         const Finding& finding = findings[i];
         html.append("<li><span class=\"kind\">").append(finding.kind).append("</span><span>");
-        html.append(escaped(finding.message)).append(" <span class=\"soft\">line ");
+        html.append(escaped(sentenceOf(finding))).append(" <span class=\"soft\">line ");
         html.append(std::to_string(finding.place.line)).append("</span></span></li>\n");
     }
     html.append("</ul>\n");
@@ -190,6 +190,8 @@ void SetPage::append(std::string& html, std::size_t number) {
         html.append(", where <code>").append(escaped(block.variantCondition())).append("</code>");
     html.append("</p>\n");
     appendMatrix(html);
+    for (const std::string& advice : set_.advice)
+        html.append("<p class=\"soft\">").append(escaped(advice)).append("</p>\n");
     if (!set_.report.allOverlaps)
         html.append("<p class=\"soft\">More choices overlap than the pairs shown.</p>\n");
     if (set_.findings.empty() && set_.report.undecided.empty())

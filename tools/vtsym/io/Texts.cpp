@@ -178,6 +178,12 @@ void addLanguageOption(Command& command, TextOptions& options) {
         {"c", "quill", "pp"}, [&options](const std::string& language) { options.to = language; });
 }
 
+void addAssumeOption(Command& command, std::vector<std::string>& assumptions) {
+    command.addArguments(
+        {"--assume", "Answer for the values for which a condition holds; may be repeated", "CONDITION"},
+        [&assumptions](std::vector<std::string> all) { assumptions = std::move(all); });
+}
+
 void addBitsOption(Command& command, bool& bits32) {
     command.addChoice({"--bits", "Take names for signed integers of 32 bits (without bounds unless given)", "BITS"},
                       {"32"}, [&bits32](const std::string&) { bits32 = true; });

@@ -52,6 +52,9 @@ void addLanguageOption(Command& command, TextOptions& options);
 /// Adds --bits.
 void addBitsOption(Command& command, bool& bits32);
 
+/// Adds --assume, which may be written again.
+void addAssumeOption(Command& command, std::vector<std::string>& assumptions);
+
 /// Whether a text is an identifier.
 bool isName(std::string_view text);
 

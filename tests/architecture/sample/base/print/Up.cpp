@@ -1,1 +1,3 @@
 #include "base/core/Up.hpp"
+constexpr std::size_t mostSamples = 8;
+constexpr std::size_t pageSize = 64;

@@ -1,0 +1,302 @@
+// Asks the questions about choices and turns the answers into findings.
+//
+// Method: overlaps are looked for by halves: where no choice of one half overlaps one of the other, one decision
+// settles all pairs; otherwise the larger half is split.  The diagrams of both halves stay with the decider, so the
+// next larger half costs what it adds. Relies on: Decider for every answer, ChoiceRanges to skip decisions.
+#include "base/choices/ChoiceSetState.hpp"
+
+#include "base/core/Chains.hpp"
+#include "base/core/Make.hpp"
+#include "base/decide/reasons/MinimalSubset.hpp"
+#include "base/decide/reasons/ReasonSearch.hpp"
+#include "base/decide/shorten/ConditionProofs.hpp"
+#include "base/decide/shorten/ImpliedCondition.hpp"
+#include "base/decide/shorten/ShortestForm.hpp"
+#include "base/simplify/Simplify.hpp"
+
+#include <algorithm>
+#include <limits>
+
+namespace VT {
+
+ChoiceSetChecker::State::State(VCService& theService, const ChoiceSetOptions& theOptions)
+    : service(theService),
+      table(theService.table()),
+      toC(table),
+      decider(table, {.keywordsInForce = theService.areVariantKeywordsInForce(), .bits32 = theOptions.bits32}),
+      bounds(table),
+      options(theOptions),
+      stepsLeft(theOptions.steps) {
+    for (const SymbolDomain& domain : options.domains)
+        bounds.add(conditionOf(table, domain));
+    for (const VCSymbolicExprId& assumption : service.assumptions()) {
+        bounds.add(assumption.id());
+        assumed.push_back(assumption.id());
+    }
+}
+
+Decision ChoiceSetChecker::State::counted(Decision decision) {
+    stepsLeft -= std::min(stepsLeft, decider.stepsTaken() + 1);
+    if (decision.bound == DecisionBound::Steps)
+        questionSteps = std::max(questionSteps / 4, limits::furtherSteps);
+    return decision;
+}
+
+Decision ChoiceSetChecker::State::ask(Decision (Decider::*question)(SymbolicExprId), SymbolicExprId condition) {
+    if (stepsLeft == 0)
+        return {Answer::Undecided, DecisionBound::Steps, std::nullopt};
+    decider.limitSteps(questionSteps);
+    return counted((decider.*question)(condition));
+}
+
+Decision ChoiceSetChecker::State::ask(Decision (Decider::*question)(SymbolicExprId, SymbolicExprId), SymbolicExprId a,
+                                      SymbolicExprId b) {
+    if (stepsLeft == 0)
+        return {Answer::Undecided, DecisionBound::Steps, std::nullopt};
+    decider.limitSteps(questionSteps);
+    return counted((decider.*question)(a, b));
+}
+
+/// Operands that && || ! leave, counted up to one beyond the bound.
+std::size_t ChoiceSetChecker::State::operandsOf(SymbolicExprId condition) const {
+    static constexpr OperatorSet logicalOps{SymbolicOp::And, SymbolicOp::Or, SymbolicOp::Not};
+    std::size_t count = 0;
+    const bool complete = walkChain(
+        table, condition, limits::choiceOperands,
+        [](SymbolicExprId, const SymbolicExpr& node) { return logicalOps.contains(node.op()); },
+        [&](SymbolicExprId, const SymbolicExpr*) {
+            ++count;
+            return true;
+        });
+    return complete ? count : limits::choiceOperands + 1;
+}
+
+SymbolicExprId ChoiceSetChecker::State::both(SymbolicExprId a, SymbolicExprId b) {
+    return service.AND(a, b, false).id();
+}
+
+/// Where choices with these conditions are asked about.
+ChoiceSetChecker::State::Place ChoiceSetChecker::State::placeIn(SymbolicExprId parent,
+                                                                std::span<const SymbolicExprId> conditions) {
+    std::vector<SymbolicExprId> all(conditions.begin(), conditions.end());
+    all.push_back(parent);
+    Place place{.context = both(bounds.knownOf(all), toC(parent)), .premises = bounds.relevantTo(all)};
+    place.premises.push_back(parent);
+    return place;
+}
+
+/// Adds the choices that come before one and may hide it.
+void ChoiceSetChecker::State::placeAfter(Place& place, std::span<const SymbolicExprId> choices, std::size_t position,
+                                         const std::vector<ChoiceRun>& runs, const std::vector<bool>& isDead,
+                                         SymbolicExprId allBefore) {
+    const auto ranges = rangesOf(table, both(place.context, toC(choices[position])));
+    place.earlier.clear();
+    place.earlierHold.clear();
+    for (const std::size_t near : choicesNear(runs, ranges)) {
+        if (near >= position)
+            break;
+        if (isDead[near])
+            continue;
+        place.earlier.push_back(near);
+        place.earlierHold.push_back(toC(choices[near]));
+        if (place.earlier.size() > limits::hidingChoices) {
+            place.earlier.clear();
+            place.earlierHold.assign(1, allBefore);
+            return;
+        }
+    }
+}
+
+/// The condition without operands that its context makes redundant; itself where there are none.
+SymbolicExprId ChoiceSetChecker::State::shorten(SymbolicExprId context, SymbolicExprId condition) {
+    const std::size_t operands = operandsOf(condition);
+    if (operands < 2 || operands > limits::choiceOperands)
+        return condition;
+    // Literals are taken from a context that is not large.
+    const SymbolicExprId literals = operandsOf(context) > limits::choiceOperands ? table.getIdTRUE() : context;
+    ConditionProofs proofs(decider, toC, condition, context, true, std::min(stepsLeft, limits::shortenSteps));
+    const auto isEqual = [&](SymbolicExprId candidate) { return proofs.isEqual(candidate); };
+    const SymbolicExprId shorter =
+        ImpliedCondition(table, service.simplifier().printer(), literals, isEqual).shorten(condition);
+    stepsLeft -= std::min(stepsLeft, proofs.stepsTaken());
+    return operandsOf(shorter) < operands ? shorter : condition;
+}
+
+/// The reasons that a search finds, where they are asked for.
+template <class Search>
+Reasons ChoiceSetChecker::State::reasonsBy(Search search) {
+    if (!options.reasons || stepsLeft == 0)
+        return {};
+    ReasonSearch reasons(table, decider, std::min(stepsLeft, limits::reasonSteps));
+    Reasons found = search(reasons);
+    stepsLeft -= std::min(stepsLeft, reasons.stepsTaken());
+    return found;
+}
+
+void ChoiceSetChecker::State::add(ChoiceFinding finding, Decision decision, ChoiceSetReport& report) {
+    finding.witness = std::move(decision.witness).value_or(Witness{});
+    finding.bound = decision.bound;
+    (decision.isUndecided() ? report.undecided : report.findings).push_back(std::move(finding));
+}
+
+/// The default choice is active in the gap of the others.
+void ChoiceSetChecker::State::checkDefault(std::size_t position, SymbolicExprId context,
+                                           const std::vector<ChoiceRun>& runs, const Decision& gap,
+                                           ChoiceSetReport& report) {
+    if (!gap.isYes()) {
+        add({.fault = ChoiceFault::Dead, .choice = position}, gap, report);
+        return;
+    }
+    const auto isUnknown = [](const ChoiceFinding& finding) { return finding.fault == ChoiceFault::Dead; };
+    if (runs.back().count > static_cast<std::size_t>(std::ranges::count_if(report.undecided, isUnknown)))
+        return; // another choice can be active
+    Decision others = ask(&Decider::overlaps, context, runs.back().holds);
+    if (others.isYes())
+        return;
+    if (others.isNo())
+        others.witness = gap.witness;
+    add({.fault = ChoiceFault::AlwaysActive, .choice = position}, std::move(others), report);
+}
+
+OrdinaryChoices ChoiceSetChecker::State::ordinaryIn(SymbolicExprId context) {
+    return {table, context, [this](SymbolicExprId known, SymbolicExprId condition) {
+                return ask(&Decider::overlaps, known, condition).isYes() &&
+                       ask(&Decider::implies, known, condition).isNo() && shorten(known, condition) == condition;
+            }};
+}
+
+/// Why a choice is dead: choices that hide it, or operands that contradict each other.
+void ChoiceSetChecker::State::findHiding(ChoiceFinding& finding, const Place& place, SymbolicExprId condition,
+                                         SymbolicExprId holds) {
+    std::vector<SymbolicExprId> premises = place.premises;
+    premises.push_back(condition);
+    if (place.earlierHold.empty() || !ask(&Decider::canHold, holds).isYes()) {
+        finding.reasons = reasonsBy([&](ReasonSearch& search) { return search.whyNever(premises); });
+        return;
+    }
+    std::vector<SymbolicExprId> some;
+    const auto subset = minimalSubset(place.earlierHold.size(), [&](std::span<const std::size_t> positions) {
+        some.clear();
+        for (const std::size_t at : positions)
+            some.push_back(place.earlierHold[at]);
+        return some.empty() ? Answer::No : ask(&Decider::implies, holds, makeChain(table, SymbolicOp::Or, some)).answer;
+    });
+    some.clear();
+    for (const std::size_t at : subset.positions) {
+        if (!place.earlier.empty())
+            finding.hiddenBy.push_back(place.earlier[at]);
+        some.push_back(place.earlierHold[at]);
+    }
+    const SymbolicExprId hiding = makeChain(table, SymbolicOp::Or, some);
+    finding.reasons = reasonsBy([&](ReasonSearch& search) { return search.whyImplied(premises, hiding); });
+}
+
+/// Checks a choice by itself; false where it is dead.
+bool ChoiceSetChecker::State::checkOne(std::size_t position, const Place& place, SymbolicExprId condition,
+                                       ChoiceSetReport& report) {
+    const SymbolicExprId holds = both(place.context, toC(condition));
+    const SymbolicExprId left =
+        place.earlierHold.empty()
+            ? table.getIdTRUE()
+            : makeUnary(table, SymbolicOp::Not, makeChain(table, SymbolicOp::Or, place.earlierHold));
+    Decision active = ask(&Decider::canHold, both(holds, left));
+    if (!active.isYes()) {
+        const bool isDead = active.isNo();
+        ChoiceFinding finding{.fault = ChoiceFault::Dead, .choice = position};
+        if (isDead)
+            findHiding(finding, place, condition, holds);
+        add(std::move(finding), std::move(active), report);
+        return !isDead;
+    }
+    Decision always = ask(&Decider::implies, place.context, both(toC(condition), left));
+    if (!always.isNo()) {
+        always.witness = std::move(active.witness);
+        ChoiceFinding finding{.fault = ChoiceFault::AlwaysActive, .choice = position};
+        finding.reasons = reasonsBy([&](ReasonSearch& search) { return search.whyImplied(place.premises, condition); });
+        add(std::move(finding), std::move(always), report);
+        return true;
+    }
+    if (const SymbolicExprId shorter = shorten(both(place.context, left), condition); shorter != condition) {
+        ChoiceFinding finding{.fault = ChoiceFault::Redundant, .choice = position, .proposed = shorter};
+        finding.reasons = reasonsBy([&](ReasonSearch& search) {
+            std::vector<SymbolicExprId> premises = place.premises;
+            for (const SymbolicExprId earlier : place.earlierHold)
+                premises.push_back(makeUnary(table, SymbolicOp::Not, earlier));
+            return search.whyEqual(premises, condition, shorter);
+        });
+        add(std::move(finding), std::move(active), report);
+    }
+    return true;
+}
+
+void ChoiceSetChecker::State::reportOverlap(std::size_t first, std::size_t second, Decision decision,
+                                            std::span<const SymbolicExprId> holds, ChoiceSetReport& report) {
+    ChoiceFinding finding{
+        .fault = ChoiceFault::Overlap, .choice = std::min(first, second), .other = std::max(first, second)};
+    if (decision.isUndecided()) {
+        add(std::move(finding), std::move(decision), report);
+        return;
+    }
+    finding.witness = std::move(decision.witness).value_or(Witness{});
+    finding.firstCovered = ask(&Decider::implies, holds[finding.choice], holds[finding.other]).isYes();
+    finding.secondCovered = ask(&Decider::implies, holds[finding.other], holds[finding.choice]).isYes();
+    report.findings.push_back(std::move(finding));
+}
+
+void ChoiceSetChecker::State::findOverlaps(const std::vector<ChoiceRun>& runs, std::span<const SymbolicExprId> holds,
+                                           ChoiceSetReport& report) {
+    std::size_t told = 0;
+    std::vector<std::pair<std::size_t, std::size_t>> open;
+    // Small runs come first, so that larger ones are decided from theirs.
+    for (const ChoiceRun& run : runs) {
+        if (run.isSingle())
+            continue;
+        for (open.emplace_back(run.left, run.right); !open.empty();) {
+            const auto [a, b] = open.back();
+            open.pop_back();
+            if (areApart(runs[a].ranges, runs[b].ranges))
+                continue;
+            Decision both = ask(&Decider::overlaps, runs[a].holds, runs[b].holds);
+            if (both.isNo())
+                continue;
+            if (told == options.overlaps || stepsLeft == 0) {
+                report.allOverlaps = false;
+                return;
+            }
+            if (runs[a].isSingle() && runs[b].isSingle()) {
+                reportOverlap(runs[a].left, runs[b].left, std::move(both), holds, report);
+                ++told;
+                continue;
+            }
+            const bool splitsFirst = runs[a].count >= runs[b].count;
+            const ChoiceRun& split = runs[splitsFirst ? a : b];
+            for (const std::size_t half : {split.right, split.left})
+                open.emplace_back(splitsFirst ? half : a, splitsFirst ? b : half);
+        }
+    }
+}
+
+/// Whether the parent can be active where no choice is.  The price of an exact answer grows with the names in the
+/// conditions; when it is too high, values beyond all ranges may still show that there is a gap.
+ChoiceSetChecker::State::Gap ChoiceSetChecker::State::findGap(SymbolicExprId context,
+                                                              const std::vector<ChoiceRun>& runs) {
+    const ChoiceRun& all = runs.back();
+    Decision gap = ask(&Decider::implies, context, all.holds).opposite();
+    if (!gap.isUndecided())
+        return {std::move(gap), true};
+    for (const NameRange& range : all.ranges) {
+        for (const bool isAbove : {true, false}) {
+            const std::int64_t bound = isAbove ? range.high : range.low;
+            if (bound <= std::numeric_limits<int>::min() || bound >= std::numeric_limits<int>::max())
+                continue;
+            const SymbolicIntValue literal(table, static_cast<int>(bound) + (isAbove ? 1 : -1));
+            const SymbolicEqualExpr beyond(table, range.name, literal.getId(table));
+            Decision active = ask(&Decider::overlaps, context, beyond.getId(table));
+            if (active.isYes())
+                return {std::move(active), false};
+        }
+    }
+    return {std::move(gap), false};
+}
+
+} // namespace VT

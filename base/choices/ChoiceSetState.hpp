@@ -1,0 +1,83 @@
+// What the checks of choice sets share: the decider, the bounds of names, and the steps that are left.
+#pragma once
+
+#include "base/choices/AssignmentCounter.hpp"
+#include "base/choices/ChoiceMerges.hpp"
+#include "base/choices/ChoiceRuns.hpp"
+#include "base/choices/ChoiceSetChecker.hpp"
+#include "base/choices/OrdinaryChoices.hpp"
+#include "base/choices/SmallestRemoval.hpp"
+#include "base/core/Table.hpp"
+#include "base/decide/Assumptions.hpp"
+#include "base/decide/Decider.hpp"
+#include "base/service/VCService.hpp"
+#include "base/transform/QuillConversion.hpp"
+
+namespace VT {
+
+struct ChoiceSetChecker::State {
+    State(VCService& theService, const ChoiceSetOptions& theOptions);
+
+    /// Where a choice is asked about.
+    struct Place {
+        SymbolicExprId context;                       ///< its parent is active and names are in bounds; in C shape
+        std::vector<SymbolicExprId> premises;         ///< the same, as written
+        std::vector<SymbolicExprId> earlierHold = {}; ///< what may hide it, in C shape
+        std::vector<std::size_t> earlier = {};        ///< the choices that it is; none where they are too many
+    };
+
+    Decision ask(Decision (Decider::*question)(SymbolicExprId), SymbolicExprId condition);
+    Decision ask(Decision (Decider::*question)(SymbolicExprId, SymbolicExprId), SymbolicExprId a, SymbolicExprId b);
+    Decision counted(Decision decision);
+    [[nodiscard]] std::size_t operandsOf(SymbolicExprId condition) const;
+    static void add(ChoiceFinding finding, Decision decision, ChoiceSetReport& report);
+
+    SymbolicExprId both(SymbolicExprId a, SymbolicExprId b);
+    Place placeIn(SymbolicExprId parent, std::span<const SymbolicExprId> conditions);
+    void placeAfter(Place& place, std::span<const SymbolicExprId> choices, std::size_t position,
+                    const std::vector<ChoiceRun>& runs, const std::vector<bool>& isDead, SymbolicExprId allBefore);
+    bool checkOne(std::size_t position, const Place& place, SymbolicExprId condition, ChoiceSetReport& report);
+    OrdinaryChoices ordinaryIn(SymbolicExprId context);
+    void checkDefault(std::size_t position, SymbolicExprId context, const std::vector<ChoiceRun>& runs,
+                      const Decision& gap, ChoiceSetReport& report);
+    void findHiding(ChoiceFinding& finding, const Place& place, SymbolicExprId condition, SymbolicExprId holds);
+    template <class Search>
+    Reasons reasonsBy(Search search);
+    SymbolicExprId shorten(SymbolicExprId context, SymbolicExprId condition);
+
+    struct Gap {
+        Decision decision; ///< whether there is one
+        bool isExact;      ///< it was decided for all choices at once
+    };
+
+    Gap findGap(SymbolicExprId context, const std::vector<ChoiceRun>& runs);
+    void findOverlaps(const std::vector<ChoiceRun>& runs, std::span<const SymbolicExprId> holds,
+                      ChoiceSetReport& report);
+    void reportOverlap(std::size_t first, std::size_t second, Decision decision, std::span<const SymbolicExprId> holds,
+                       ChoiceSetReport& report);
+
+    // What a set can do about its faults.
+
+    SymbolicExprId shortestGiven(SymbolicExprId context, SymbolicExprId condition);
+    SymbolicExprId missingChoice(SymbolicExprId context, std::span<const SymbolicExprId> choices,
+                                 std::optional<std::size_t> left);
+    static void findRemoval(ChoiceSetReport& report);
+    void findMerges(const Place& place, std::span<const SymbolicExprId> choices, const std::vector<bool>& isDead,
+                    bool inOrder, ChoiceSetReport& report);
+    /// `hiding` holds by choice what hides it, in C shape, under ChoicePolicy::First.
+    void countAssignments(SymbolicExprId parent, std::span<const SymbolicExprId> choices,
+                          std::optional<std::size_t> defaultChoice, std::span<const std::vector<SymbolicExprId>> hiding,
+                          ChoiceSetReport& report);
+
+    VCService& service;
+    SymbolicExprTable& table;
+    SymbolicExprQ2C toC;
+    Decider decider;
+    Assumptions bounds; ///< declared values of names, and what is assumed
+    ChoiceSetOptions options;
+    std::vector<SymbolicExprId> assumed; ///< by the service, in C shape
+    std::uint64_t stepsLeft;
+    std::uint64_t questionSteps = limits::decisionSteps; ///< a quarter after each question of a set that gives up
+};
+
+} // namespace VT

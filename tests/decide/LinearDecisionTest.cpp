@@ -1,0 +1,101 @@
+// Linear arithmetic in decisions: an example for each rule, and random pairs against an independent solver and the
+// evaluator.
+#include "tests/decide/DecisionFixture.hpp"
+#include "tests/support/Cases.hpp"
+#include "tests/support/generators/RandomLinear.hpp"
+#include "tests/support/oracles/Solver.hpp"
+
+#include <chrono>
+#include <cstdlib>
+#include <random>
+
+namespace VT::Testing {
+namespace {
+
+TEST(LinearDecisions, Relations) {
+    const char* const kinds[] = {"equivalent", "disjoint", "implies", "implied by", "overlaps", "undecided"};
+    for (const CaseRow& row : casesOf("decide.txt", "linear", 5)) {
+        SCOPED_TRACE(row[0] + " with " + row[1]);
+        DecisionBench bench;
+        const SymbolicExprId a = bench.parse(row[0]);
+        const SymbolicExprId b = bench.parse(row[1]);
+        const Relation relation = bench.decider.classify(a, b);
+        EXPECT_EQ(kinds[static_cast<std::size_t>(relation.kind)], row[2]);
+        EXPECT_EQ(bench.text(relation.onlyA), row[3]);
+        EXPECT_EQ(bench.text(relation.onlyB), row[4]);
+        for (const auto& [decision, inA, inB] :
+             {std::tuple(&relation.onlyA, true, false), std::tuple(&relation.onlyB, false, true),
+              std::tuple(&relation.both, true, true)}) {
+            if (!decision->witness)
+                continue;
+            EXPECT_EQ(bench.decider.holds(a, *decision->witness), inA);
+            EXPECT_EQ(bench.decider.holds(b, *decision->witness), inB);
+        }
+    }
+}
+
+/// Pairs that the solver decides within its limit agree, and all but a few questions are decided; witnesses hold by
+/// evaluation.
+TEST(LinearDecisions, RandomPairsAgreeWithTheSolver) {
+    const char* asked = std::getenv("VTSYM_LINEAR_PAIRS");
+    const std::size_t pairs = asked != nullptr ? std::strtoul(asked, nullptr, 10) : 200;
+    constexpr unsigned solverResources = 3000000;
+    using Clock = std::chrono::steady_clock;
+    Clock::duration own{};
+    Clock::duration others{};
+    std::size_t given = 0;
+    std::string undecided;
+    std::size_t undecidedCount = 0;
+    for (std::size_t done = 0; done < pairs;) {
+        DecisionBench bench; // a fresh one now and then, so that neither side grows without end
+        Solver solver(bench.table);
+        solver.limit(solverResources);
+        for (int i = 0; i < 200 && done < pairs; ++i, ++done) {
+            std::mt19937_64 random(done);
+            const std::string textA = randomLinear(random);
+            const std::string textB = randomLinear(random);
+            SCOPED_TRACE(std::to_string(done) + ": " + textA + "   " + textB);
+            const SymbolicExprId a = bench.parse(textA);
+            const SymbolicExprId b = bench.parse(textB);
+            const auto begin = Clock::now();
+            const Relation relation = bench.decider.classify(a, b);
+            own += Clock::now() - begin;
+            solver.forget();
+            for (const auto& [decision, inA, inB] :
+                 {std::tuple(&relation.onlyA, true, false), std::tuple(&relation.onlyB, false, true),
+                  std::tuple(&relation.both, true, true)}) {
+                const auto start = Clock::now();
+                const Z3_ast left = inA ? solver.truth(a) : solver.negated(solver.truth(a));
+                const Z3_ast right = inB ? solver.truth(b) : solver.negated(solver.truth(b));
+                const std::optional<bool> known = solver.tryHold(left, right);
+                others += Clock::now() - start;
+                given += known ? 0U : 1U;
+                if (decision->witness) {
+                    ASSERT_EQ(bench.decider.holds(a, *decision->witness), inA);
+                    ASSERT_EQ(bench.decider.holds(b, *decision->witness), inB);
+                }
+                if (known && decision->isUndecided()) {
+                    undecided += " " + std::to_string(done);
+                    ++undecidedCount;
+                } else if (known) {
+                    ASSERT_EQ(decision->answer, *known ? Answer::Yes : Answer::No);
+                }
+            }
+        }
+    }
+    const auto perPair = [&](Clock::duration time) {
+        return std::to_string(std::chrono::duration_cast<std::chrono::nanoseconds>(time).count() /
+                              static_cast<std::int64_t>(1000 * pairs));
+    };
+    RecordProperty("microseconds", perPair(own));
+    RecordProperty("microsecondsOfSolver", perPair(others));
+    EXPECT_LE(undecidedCount * 50, 3 * pairs) << "questions left undecided in pairs" << undecided;
+    EXPECT_LE(given * 20, pairs) << "questions that the solver gave up";
+    if (asked != nullptr)
+        std::puts(
+            ("us a pair: " + perPair(own) + ", solver " + perPair(others) + ", given up by it " + std::to_string(given))
+                .c_str());
+}
+
+} // namespace
+} // namespace VT::Testing
