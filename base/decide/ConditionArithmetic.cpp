@@ -1,7 +1,7 @@
 // Reads arithmetic inside conditions: as linear forms where it is linear, otherwise as one unknown for each node.
 //
 // A sum or a product by a constant combines forms, guarded case by guarded case. A quotient by a constant, cut toward
-// zero, is a floor on each side of 0, and a remainder is what the quotient leaves. For a 32-bit value, the bits from i
+// zero, is a floor on each side of 0, and a remainder is what the quotient leaves. Of any integer, the bits from i
 // to j are 2^i * floor(value / 2^i) - 2^j * floor(value / 2^j) in two's complement, whatever the sign (Warren,
 // "Hacker's Delight", 2012); a mask is the sum of its runs of ones, and | and ^ follow from &. Any other operator on
 // constants is computed. What remains becomes an unknown with what its operands say about 0.
@@ -21,11 +21,9 @@ namespace VT {
 
 namespace {
 
-constexpr std::int64_t int32Minimum = std::numeric_limits<std::int32_t>::min();
-constexpr std::int64_t int32Maximum = std::numeric_limits<std::int32_t>::max();
 constexpr OperatorSet bitOps{SymbolicOp::BitAnd, SymbolicOp::BitOr, SymbolicOp::BitXOr};
 
-/// A constant as an operand of 32 bits.
+/// A constant as a mask or a distance.
 std::optional<std::int64_t> bitsOf(const RationalForm& form) {
     const LinearForm* small = form.small();
     const bool fits = small != nullptr && small->isConstant() && fitsInt(small->constant);
@@ -92,7 +90,6 @@ bool ConditionReader::addUnary(Cases& cases, SymbolicOp op, const Case& a) {
     if (op == SymbolicOp::UnaryMinus)
         form = combine(a.form, -1, {}, 0);
     if (op == SymbolicOp::BitCompl && (!a.form.isConstant() || bitsOf(a.form))) { // -a - 1
-        requireBits(a.guard, a.form);
         form = combine(a.form, -1, LinearForm{{}, -1}, 1);
     }
     if (form)
@@ -151,23 +148,11 @@ bool ConditionReader::addQuotient(Cases& cases, SymbolicOp op, Gate guard, const
     return true;
 }
 
-/// Restricts a condition to values whose bits can be taken.
-void ConditionReader::requireBits(Gate guard, const RationalForm& form) {
-    const auto above = combine(form, 1, LinearForm{{}, -int32Maximum}, 1);
-    const auto below = combine(form, 1, LinearForm{{}, -int32Minimum}, 1);
-    if (!above || !below) // beyond all limits
-        return;
-    const Gate within =
-        circuit_.both(compare(SymbolicOp::LessThanEqual, *above), compare(SymbolicOp::GreaterThanEqual, *below));
-    defined_ = circuit_.both(defined_, circuit_.either(opposite(guard), within));
-}
-
 /// A mask or a shift by a constant; a shift to the left is a product of any size.
 bool ConditionReader::addBits(Cases& cases, SymbolicOp op, Gate guard, const RationalForm& form,
                               std::int64_t constant) {
     std::optional<RationalForm> bits;
     if (bitOps.contains(op)) {
-        requireBits(guard, form);
         bits = masked(form, constant);
         const RationalForm mask(LinearForm{{}, constant});
         if (bits && op != SymbolicOp::BitAnd) { // a | m is a + m - (a & m), a ^ m is a + m - 2 * (a & m)
@@ -176,12 +161,10 @@ bool ConditionReader::addBits(Cases& cases, SymbolicOp op, Gate guard, const Rat
         }
     } else {
         const std::int64_t distance = op == SymbolicOp::ShiftLeft ? constant : -constant;
-        if (distance > static_cast<std::int64_t>(limits::formBits))
+        const std::int64_t places = std::abs(distance); // of a literal
+        if (places > static_cast<std::int64_t>(limits::formBits))
             return false;
-        const auto places = static_cast<unsigned>(distance >= 0 ? distance : std::min<std::int64_t>(-distance, 31));
-        const BigInteger factor = BigInteger(1) << places;
-        if (distance < 0)
-            requireBits(guard, form);
+        const BigInteger factor = BigInteger(1) << static_cast<unsigned>(places);
         bits = distance < 0 ? floor(form, factor) : scale(form, factor, 1);
     }
     if (bits)

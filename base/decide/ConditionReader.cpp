@@ -42,7 +42,6 @@ void ConditionReader::begin() {
     met_.clear();
     calls_.clear();
     whole_.clear();
-    defined_ = always;
     missing_ = false;
 }
 
@@ -66,7 +65,6 @@ void ConditionReader::walk(SymbolicExprId root) {
 
 /// Adds what was met on the way.
 void ConditionReader::finish(ReadCondition& result) {
-    result.defined = defined_;
     std::ranges::sort(leaves_,
                       [&](const UnknownLeaf& x, const UnknownLeaf& y) { return comesBefore(unknowns_, x, y); });
     result.leaves.assign(leaves_.begin(), std::unique(leaves_.begin(), leaves_.end()));

@@ -37,7 +37,6 @@ struct UnknownLeaf {
 
 struct ReadCondition {
     Gate truth = never;
-    Gate defined = always; ///< where bits are taken of 32-bit values only; the condition has no value elsewhere
     DecisionBound bound = DecisionBound::None; ///< why it could not be read
     std::vector<UnknownLeaf> leaves;           ///< in the order of their texts
     std::vector<Unknown> met;                  ///< in the order in which they are met when the condition is read aloud
@@ -111,7 +110,6 @@ private:
     bool addBits(Cases& cases, SymbolicOp op, Gate guard, const RationalForm& form, std::int64_t constant);
     std::optional<RationalForm> floor(const RationalForm& form, const BigInteger& divisor);
     std::optional<RationalForm> masked(const RationalForm& form, std::int64_t mask);
-    void requireBits(Gate guard, const RationalForm& form);
     [[nodiscard]] std::optional<RationalForm> constantOf(const Value& value) const;
 
     Gate truthOf(SymbolicExprId id);
@@ -147,7 +145,6 @@ private:
     std::vector<UnknownLeaf> leaves_;
     std::vector<Unknown> met_;
     std::vector<SymbolicExprId> calls_;
-    Gate defined_ = always;
     bool missing_ = false;
 };
 

@@ -190,8 +190,7 @@ void Decider::State::keepFunctions(Decision& decision, Gate truth, std::span<con
             return;
         }
         all.push_back(&equal);
-        const Gate parts[] = {truth, equal.truth, equal.defined};
-        truth = circuit.all(parts);
+        truth = circuit.both(truth, equal.truth);
         decision = hold(truth, all);
     }
 }
@@ -214,10 +213,7 @@ Decision Decider::State::decide(std::span<const SymbolicExprId> ids, Combine com
         if (decision.bound == DecisionBound::None) {
             boost::container::small_vector<Gate, 4> truths(ids.size(), always);
             std::ranges::transform(conditions, truths.begin(), &ReadCondition::truth);
-            Gate truth = combine(std::span<const Gate>(truths.data(), truths.size()));
-            for (const ReadCondition* condition : conditions)
-                if (condition->defined != always)
-                    truth = circuit.both(truth, condition->defined);
+            const Gate truth = combine(std::span<const Gate>(truths.data(), truths.size()));
             decision = hold(truth, {conditions.data(), conditions.size()});
             if (decision.isYes())
                 keepFunctions(decision, truth, {conditions.data(), conditions.size()});

@@ -22,13 +22,12 @@ struct DecisionOptions {
 /// Conditions are over integers: every symbol stands for an integer, a truth value is an integer that is not zero, a
 /// truth value in arithmetic is 1 or 0.  Linear arithmetic is decided: sums of integer multiples of any size, quotients
 /// and remainders by constants (cut toward zero), shifts and masks by constants, real literals (exact fractions; an
-/// operation on two literals is rounded), and everything that && || ! make of comparisons of these.  + - * << are exact
-/// over the integers without bounds.  The other operators on bits are of 32-bit values, and an assignment under which
-/// they would get another counts for nothing: the conditions have no value there.
-/// A call is a function of its arguments, except for `defined` and names that begin with `__has_`, which are unknowns
-/// whatever they name; a member is an unknown, unless a value is bound to it.  Any other arithmetic is an unknown for
-/// each node: equal nodes are equal, and a product is 0 where a factor is.  It is evaluated where a witness is
-/// confirmed.
+/// operation on two literals is rounded), and everything that && || ! make of comparisons of these.  All of it is exact
+/// over the integers without bounds; their bits are those of two's complement without an end, so that an answer holds
+/// for operands of any width. A call is a function of its arguments, except for `defined` and names that begin with
+/// `__has_`, which are unknowns whatever they name; a member is an unknown, unless a value is bound to it.  Any other
+/// arithmetic is an unknown for each node: equal nodes are equal, and a product is 0 where a factor is.  It is
+/// evaluated where a witness is confirmed.
 ///
 /// An answer is proven or it is "undecided"; it depends on the conditions alone, not on what was interned or asked
 /// before.  Real conditions take microseconds.
@@ -69,7 +68,7 @@ public:
     SetDecision disjoint(std::span<const SymbolicExprId> conditions);
 
     /// Whether a condition holds under an assignment, by evaluation; unknowns that it does not name are 0.  Nothing
-    /// where some node has no value: a division by zero, bits of a number beyond 32 bits.
+    /// where some node has no value: a division by zero, a number beyond 64 bits.
     [[nodiscard]] std::optional<bool> holds(SymbolicExprId condition, const Witness& witness);
     /// The text of an unknown of a witness.
     [[nodiscard]] std::string nameOf(SymbolicExprId unknown) const;

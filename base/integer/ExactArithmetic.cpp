@@ -1,8 +1,8 @@
 // Computes single values as a witness needs them: exactly, or not at all.
 //
 // Sums and products are those of the unbounded integers as long as they fit 64 bits. Quotients truncate toward zero as
-// in C. Bits and shifts are those of 32-bit values. A comparison with a real literal never rounds the integer: it
-// compares with the literal's whole part and then asks whether there is a fraction.
+// in C. Bits are those of two's complement without an end. A comparison with a real literal never rounds the integer:
+// it compares with the literal's whole part and then asks whether there is a fraction.
 #include "base/integer/ExactArithmetic.hpp"
 
 #include "base/core/Limits.hpp"
@@ -39,7 +39,7 @@ Result power(std::int64_t base, std::int64_t exponent) {
 /// A shift to the left, or to the right for a negative distance.
 Result shifted(std::int64_t value, std::int64_t distance) {
     if (distance < 0)
-        return fitsInt(value) ? Result(value >> std::min<std::int64_t>(-distance, 31)) : std::nullopt;
+        return value >> std::min<std::int64_t>(-distance, 63);
     if (distance < 63)
         return product(value, std::int64_t{1} << distance);
     return value == 0 ? Result(0) : std::nullopt;
@@ -71,11 +71,11 @@ Result integerResult(SymbolicOp op, std::int64_t a, std::int64_t b) {
             return std::nullopt;
         return shifted(a, op == SymbolicOp::ShiftLeft ? b : -b);
     case SymbolicOp::BitAnd:
-        return fitsInt(a) && fitsInt(b) ? Result(a & b) : std::nullopt;
+        return a & b;
     case SymbolicOp::BitOr:
-        return fitsInt(a) && fitsInt(b) ? Result(a | b) : std::nullopt;
+        return a | b;
     case SymbolicOp::BitXOr:
-        return fitsInt(a) && fitsInt(b) ? Result(a ^ b) : std::nullopt;
+        return a ^ b;
     default:
         return std::nullopt;
     }
@@ -84,7 +84,7 @@ Result integerResult(SymbolicOp op, std::int64_t a, std::int64_t b) {
 Result integerResult(SymbolicOp op, std::int64_t a) {
     if (op == SymbolicOp::UnaryMinus)
         return product(a, -1);
-    if (op == SymbolicOp::BitCompl && fitsInt(a))
+    if (op == SymbolicOp::BitCompl)
         return ~a;
     return std::nullopt;
 }

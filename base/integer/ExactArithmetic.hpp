@@ -22,9 +22,9 @@ inline constexpr OperatorSet opaqueOps{SymbolicOp::DotDiv, SymbolicOp::LDiv, Sym
 static_assert((exactOps | opaqueOps | booleanOps) == symbolOps,
               "give every operator that is written as a symbol an exact value, or name it in opaqueOps");
 
-/// `a op b` over the integers; quotients are cut toward zero, a shift to the left multiplies, bits and shifts to the
-/// right are those of 32-bit values.  Nothing where the result leaves 64 bits, where the value is not an integer (a
-/// division by zero, a negative exponent, bits of a value beyond 32 bits), and for operators that have no value here.
+/// `a op b` over the integers; quotients are cut toward zero, shifts multiply and divide by powers of two (to the right
+/// rounding down), bits are those of two's complement without an end.  Nothing where the result leaves 64 bits, where
+/// the value is not an integer (a division by zero, a negative exponent), and for operators that have no value here.
 [[nodiscard]] std::optional<std::int64_t> integerResult(SymbolicOp op, std::int64_t a, std::int64_t b);
 [[nodiscard]] std::optional<std::int64_t> integerResult(SymbolicOp op, std::int64_t a);
 

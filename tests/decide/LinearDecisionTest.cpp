@@ -46,6 +46,7 @@ TEST(LinearDecisions, RandomPairsAgreeWithTheSolver) {
     std::size_t given = 0;
     std::string undecided;
     std::size_t undecidedCount = 0;
+    std::size_t unevaluated = 0;
     for (std::size_t done = 0; done < pairs;) {
         DecisionBench bench; // a fresh one now and then, so that neither side grows without end
         Solver solver(bench.table);
@@ -70,9 +71,12 @@ TEST(LinearDecisions, RandomPairsAgreeWithTheSolver) {
                 const std::optional<bool> known = solver.tryHold(left, right);
                 others += Clock::now() - start;
                 given += known ? 0U : 1U;
-                if (decision->witness) {
-                    ASSERT_EQ(bench.decider.holds(a, *decision->witness), inA);
-                    ASSERT_EQ(bench.decider.holds(b, *decision->witness), inB);
+                for (const auto& [id, in] : {std::pair(a, inA), std::pair(b, inB)}) {
+                    if (!decision->witness)
+                        continue;
+                    const std::optional<bool> holds = bench.decider.holds(id, *decision->witness);
+                    unevaluated += holds ? 0U : 1U; // a product in it has more than 64 bits
+                    ASSERT_EQ(holds.value_or(in), in);
                 }
                 if (known && decision->isUndecided()) {
                     undecided += " " + std::to_string(done);
@@ -90,6 +94,7 @@ TEST(LinearDecisions, RandomPairsAgreeWithTheSolver) {
     RecordProperty("microseconds", perPair(own));
     RecordProperty("microsecondsOfSolver", perPair(others));
     EXPECT_LE(undecidedCount * 50, 3 * pairs) << "questions left undecided in pairs" << undecided;
+    EXPECT_LE(unevaluated * 50, pairs) << "witnesses that leave 64 bits";
     EXPECT_LE(given * 20, pairs) << "questions that the solver gave up";
     if (asked != nullptr)
         std::puts(

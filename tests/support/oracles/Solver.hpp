@@ -61,8 +61,6 @@ public:
         Z3_solver_push(context_, solver_);
         Z3_solver_assert(context_, solver_, a);
         Z3_solver_assert(context_, solver_, b);
-        for (const Z3_ast domain : domains_)
-            Z3_solver_assert(context_, solver_, domain);
         const Z3_lbool answer = Z3_solver_check(context_, solver_);
         if (answer == Z3_L_TRUE) {
             const Z3_model model = Z3_solver_get_model(context_, solver_);
@@ -73,7 +71,7 @@ public:
         return answer == Z3_L_UNDEF ? std::nullopt : std::optional(answer == Z3_L_TRUE);
     }
 
-    /// Bounds the work of a question from now on, in the solver's own unit; forgets which values have bits.
+    /// Bounds the work of a question from now on, in the solver's own unit.
     void limit(unsigned resources) {
         Z3_params parameters = Z3_mk_params(context_);
         Z3_params_inc_ref(context_, parameters);
@@ -82,11 +80,8 @@ public:
         Z3_params_dec_ref(context_, parameters);
     }
 
-    /// Begins with other conditions: those before restrict which assignments count no more.
-    void forget() {
-        domains_.clear();
-        done_.clear();
-    }
+    /// Begins with other conditions.
+    void forget() { done_.clear(); }
 
 private:
     Z3_ast integer(std::int64_t value) { return Z3_mk_int64(context_, value, integers_); }
@@ -160,12 +155,12 @@ private:
 
     /// The ones of a mask, bit by bit.
     Z3_ast masked(Z3_ast a, std::int32_t mask) {
+        if (mask < 0)
+            return minus(a, masked(a, ~mask));
         std::vector<Z3_ast> bits{integer(0)};
         for (int i = 0; i < 31; ++i)
             if ((mask >> i & 1) != 0)
                 bits.push_back(times(power(i), Z3_mk_mod(context_, Z3_mk_div(context_, a, power(i)), integer(2))));
-        if (mask < 0) // bit 31 counts negative
-            bits.push_back(Z3_mk_ite(context_, Z3_mk_lt(context_, a, integer(0)), negative(power(31)), integer(0)));
         return Z3_mk_add(context_, static_cast<unsigned>(bits.size()), bits.data());
     }
 
@@ -182,8 +177,6 @@ private:
         default:
             break;
         }
-        domains_.push_back(Z3_mk_le(context_, a, integer(std::numeric_limits<std::int32_t>::max())));
-        domains_.push_back(Z3_mk_ge(context_, a, integer(std::numeric_limits<std::int32_t>::min())));
         const auto ofMask = [&](int factor) { // a + literal - factor * (a & literal)
             const Z3_ast all[] = {a, integer(literal), times(integer(-factor), masked(a, literal))};
             return Z3_mk_add(context_, 3, all);
@@ -262,7 +255,6 @@ private:
     Z3_sort integers_;
     Z3_solver solver_;
     std::map<SymbolicExprId, Z3_ast> done_;
-    std::vector<Z3_ast> domains_; ///< values whose bits are taken
 };
 
 } // namespace VT::Testing
