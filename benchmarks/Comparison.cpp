@@ -55,7 +55,7 @@ public:
                 std::fprintf(stderr, "%s: %s\n", run.benchmark_name().c_str(), run.error_message.c_str());
                 continue;
             }
-            // The name is followed by what the measurement was told, such as /manual_time.
+            // The name is followed by the options of the measurement, such as /manual_time.
             Times& times = times_[run.run_name.function_name];
             times.seconds.push_back(run.real_accumulated_time / static_cast<double>(run.iterations));
             times.figures = run.counters;
@@ -116,7 +116,7 @@ int main(int argc, char** argv) {
     std::string repetitions = "--benchmark_repetitions=9";
     std::string interleaved = "--benchmark_enable_random_interleaving=true";
     std::string shortRuns = "--benchmark_min_time=0.05";
-    // What the caller asks for comes behind, and so wins.
+    // Options of the caller come last, so they win.
     std::vector<char*> arguments{argv[0], repetitions.data(), interleaved.data(), shortRuns.data()};
     arguments.insert(arguments.end(), argv + 1, argv + argc);
     int count = static_cast<int>(arguments.size());

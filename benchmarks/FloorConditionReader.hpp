@@ -186,10 +186,10 @@ private:
             return error == std::errc() ? builder_.integer(integer) : none;
         }
         double real = 0;
-        const auto [behind, failure] = std::from_chars(at_, end_, real);
+        const auto [after, failure] = std::from_chars(at_, end_, real);
         if (failure != std::errc())
             return none;
-        at_ = behind;
+        at_ = after;
         return builder_.real(real);
     }
 

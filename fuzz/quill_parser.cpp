@@ -22,16 +22,16 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
             std::abort();
         return 0;
     }
-    // Every node is within reach, and every token within the text and behind the one before it.
-    std::size_t behind = 0;
+    // Every node is within reach, and every token within the text and after the one before it.
+    std::size_t after = 0;
     std::vector<const PARSER_T<char>::Tree*> pending{tree};
     while (!pending.empty()) {
         const PARSER_T<char>::Tree& node = *pending.back();
         pending.pop_back();
         if (node.kind == PARSER_T<char>::Tree::terminal) {
-            if (node.start < behind || node.text != text + node.start || node.length > size - 1 - node.start)
+            if (node.start < after || node.text != text + node.start || node.length > size - 1 - node.start)
                 std::abort();
-            behind = node.start + node.length;
+            after = node.start + node.length;
         }
         for (std::int32_t i = node.kind == PARSER_T<char>::Tree::nonTerminal ? node.childCount : 0; i-- > 0;)
             pending.push_back(node.children + i);

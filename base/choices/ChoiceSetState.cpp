@@ -245,7 +245,7 @@ void ChoiceSetChecker::State::reportOverlap(std::size_t first, std::size_t secon
 
 void ChoiceSetChecker::State::findOverlaps(const std::vector<ChoiceRun>& runs, std::span<const SymbolicExprId> holds,
                                            ChoiceSetReport& report) {
-    std::size_t told = 0;
+    std::size_t reported = 0;
     std::vector<std::pair<std::size_t, std::size_t>> open;
     // Small runs come first, so that larger ones are decided from theirs.
     for (const ChoiceRun& run : runs) {
@@ -259,13 +259,13 @@ void ChoiceSetChecker::State::findOverlaps(const std::vector<ChoiceRun>& runs, s
             Decision both = ask(&Decider::overlaps, runs[a].holds, runs[b].holds);
             if (both.isNo())
                 continue;
-            if (told == options.overlaps || stepsLeft == 0) {
+            if (reported == options.overlaps || stepsLeft == 0) {
                 report.allOverlaps = false;
                 return;
             }
             if (runs[a].isSingle() && runs[b].isSingle()) {
                 reportOverlap(runs[a].left, runs[b].left, std::move(both), holds, report);
-                ++told;
+                ++reported;
                 continue;
             }
             const bool splitsFirst = runs[a].count >= runs[b].count;

@@ -45,7 +45,7 @@ std::uint64_t hashOf(const Cube& cube) {
     return sum;
 }
 
-/// Joins the cubes of a group, which are equal but for one atom.  Tells whether they became fewer or shorter.
+/// Joins the cubes of a group, which are equal but for one atom.  Returns whether they became fewer or shorter.
 bool joinGroup(Cover& cover, const std::vector<std::size_t>& group, Atom atom, std::vector<bool>& gone,
                std::vector<std::uint64_t>& hashes) {
     std::vector<IntegerSet> sets;

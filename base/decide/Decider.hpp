@@ -55,7 +55,7 @@ public:
     Decision overlaps(SymbolicExprId a, SymbolicExprId b);
     /// Whether a and b agree wherever `known` holds; the witness of "no" is where they differ.
     Decision equivalentGiven(SymbolicExprId a, SymbolicExprId b, SymbolicExprId known);
-    /// How a and b stand to each other, with the three witnesses that there may be.  Three questions; behind one that
+    /// How a and b relate, with the three witnesses that there may be.  Three questions; after one that
     /// gives up, the others may take limits::furtherSteps each.
     Relation classify(SymbolicExprId a, SymbolicExprId b);
 

@@ -58,7 +58,7 @@ struct Decision {
 };
 
 /// How two conditions stand to each other.  What never holds is disjoint from everything and implies everything; the
-/// first kind of this list that is true is the one told.
+/// first kind of this list that is true is reported.
 enum class RelationKind : std::uint8_t { Equivalent, Disjoint, Implies, ImpliedBy, Overlaps, Undecided };
 
 struct Relation {

@@ -103,7 +103,7 @@ TEST(Equality, RealsWithinTheTolerance) {
 }
 
 TEST(Equality, ANaNThatIsInTheTableIsFoundAndOthersAreNot) {
-    // As many as would take minutes if each had to be told from all others.
+    // As many as would take minutes if each had to be compared with all others.
     constexpr SymbolicExprId count = 300'000;
     SymbolicExprTable table, other;
     SymbolicString(table, "false"); // has the hash of NaN

@@ -9,7 +9,7 @@ namespace VT::Testing {
 namespace {
 
 /// Everything that a decision needs, with the ways to decide apart from each other.
-struct SearchBench : DecisionBench {
+struct SearchBench : DecisionFixture {
     SearchBench()
         : printer(table, false),
           leaves(table, false),

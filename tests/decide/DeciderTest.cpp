@@ -1,4 +1,4 @@
-// Answers and witnesses, as they are told.
+// Answers and witnesses as texts.
 #include "base/integer/ExactArithmetic.hpp"
 #include "tests/decide/DecisionFixture.hpp"
 #include "tests/support/Cases.hpp"
@@ -18,7 +18,7 @@ TEST(DecisionOfOne, CanAndMustHold) {
     for (const bool bits32 : {false, true})
         for (const CaseRow& row : casesOf("decide.txt", bits32 ? "of one, in 32 bits" : "of one", 3)) {
             SCOPED_TRACE(row[0]);
-            DecisionBench bench({.bits32 = bits32});
+            DecisionFixture bench({.bits32 = bits32});
             const SymbolicExprId id = bench.parse(row[0]);
             EXPECT_EQ(bench.text(bench.decider.canHold(id)), row[1]);
             EXPECT_EQ(bench.text(bench.decider.mustHold(id)), row[2]);
@@ -27,7 +27,7 @@ TEST(DecisionOfOne, CanAndMustHold) {
 
 TEST(DecisionOfTwo, KeywordsAreOppositesWhileInForce) {
     for (const bool inForce : {false, true}) {
-        DecisionBench bench({.keywordsInForce = inForce});
+        DecisionFixture bench({.keywordsInForce = inForce});
         const SymbolicExprId sim = SymbolicString(bench.table, "(sim)").getId(bench.table);
         const SymbolicExprId codegen = SymbolicString(bench.table, " (codegen) ").getId(bench.table);
         EXPECT_EQ(bench.decider.overlaps(sim, codegen).isYes(), !inForce);
@@ -38,7 +38,7 @@ TEST(DecisionOfTwo, RelationAndWitnesses) {
     const char* const kinds[] = {"equivalent", "disjoint", "implies", "implied by", "overlaps", "undecided"};
     for (const CaseRow& row : casesOf("decide.txt", "of two", 6)) {
         SCOPED_TRACE(row[0] + " with " + row[1]);
-        DecisionBench bench;
+        DecisionFixture bench;
         const Relation relation = bench.decider.classify(bench.parse(row[0]), bench.parse(row[1]));
         EXPECT_EQ(kinds[static_cast<std::size_t>(relation.kind)], row[2]);
         EXPECT_EQ(bench.text(relation.onlyA), row[3]);
@@ -51,7 +51,7 @@ TEST(DecisionOfTwo, RelationAndWitnesses) {
 TEST(DecisionOfSets, CoverAndOverlap) {
     for (const CaseRow& row : casesOf("decide.txt", "of sets", 8)) {
         SCOPED_TRACE(testing::PrintToString(row));
-        DecisionBench bench;
+        DecisionFixture bench;
         std::vector<SymbolicExprId> ids;
         for (std::size_t i = 3; i < row.size() && !row[i].empty(); ++i)
             ids.push_back(bench.parse(row[i]));
@@ -64,7 +64,7 @@ TEST(DecisionOfSets, CoverAndOverlap) {
 }
 
 TEST(DecisionOfSets, ScalesToTenThousandChoices) {
-    DecisionBench bench;
+    DecisionFixture bench;
     std::vector<SymbolicExprId> ids;
     for (int i = 0; i < 10000; ++i)
         ids.push_back(bench.parse("A==" + std::to_string(i * 7919 % 10000) + " && B>0"));
@@ -76,7 +76,7 @@ TEST(DecisionOfSets, ScalesToTenThousandChoices) {
 }
 
 TEST(DecisionBounds, AreTold) {
-    DecisionBench bench;
+    DecisionFixture bench;
     const SymbolicExprId a = bench.parse("A");
     const SymbolicExprId dangling = SymbolicNotExpr(bench.table, invalidId - 1).getId(bench.table);
     for (const SymbolicExprId bad : {invalidId, SymbolicExprId{bench.table.size()}, dangling}) {
@@ -102,7 +102,7 @@ TEST(DecisionBounds, AreTold) {
 
 /// The steps that a question takes, and no fewer, suffice: whether or not its conditions were read before.
 TEST(DecisionBounds, DoNotDependOnEarlierQuestions) {
-    DecisionBench bench;
+    DecisionFixture bench;
     const SymbolicExprId a = bench.parse("A<B && B<C || A==3 && !(C>B+2) || D");
     const SymbolicExprId b = bench.parse("B<C || A<C");
     bench.decider.implies(a, b);
@@ -114,7 +114,7 @@ TEST(DecisionBounds, DoNotDependOnEarlierQuestions) {
                 static_cast<void>(decider.canHold(a));
                 static_cast<void>(decider.overlaps(b, a));
             }
-            // A witness at hand is told even where the proof that it is the smallest was cut short.
+            // A witness at hand is reported even where the proof that it is the smallest was cut short.
             const Decision decision = decider.implies(a, b);
             EXPECT_TRUE(decision.isNo());
             EXPECT_LE(decider.stepsTaken(), needed);
@@ -126,7 +126,7 @@ TEST(DecisionBounds, DoNotDependOnEarlierQuestions) {
 }
 
 TEST(DecisionDepth, IsNotLimitedByTheStack) {
-    DecisionBench bench;
+    DecisionFixture bench;
     SymbolicExprId deep = bench.parse("A");
     SymbolicExprId shared = deep;
     SymbolicExprId sum = deep;
@@ -141,7 +141,7 @@ TEST(DecisionDepth, IsNotLimitedByTheStack) {
 }
 
 TEST(DecisionOfMembers, TakesBoundValues) {
-    DecisionBench bench;
+    DecisionFixture bench;
     const SymbolicExprId condition = bench.parse("s.m > 2");
     EXPECT_EQ(bench.text(bench.decider.mustHold(condition)), "no: s.m=0");
     bench.table.registerValueId(bench.parse("s.m"), bench.parse("3"));

@@ -69,7 +69,7 @@ TEST(DecisionFamilies, StayWithinSteps) {
     };
 
     for (const auto& [name, a, b, kind, most] : families) {
-        DecisionBench bench;
+        DecisionFixture bench;
         const Relation relation = bench.decider.classify(bench.parse(a), bench.parse(b));
         EXPECT_EQ(relation.kind, kind) << name << ": " << bench.text(relation.onlyA) << "; "
                                        << bench.text(relation.onlyB) << "; " << bench.text(relation.both);
@@ -82,7 +82,7 @@ TEST(DecisionFamilies, StayWithinSteps) {
 TEST(DecisionFamilies, RandomClausesAreDecidedAsASolverDoes) {
     std::mt19937_64 random(42);
     for (int round = 0; round < 20; ++round) {
-        DecisionBench bench;
+        DecisionFixture bench;
         Solver solver(bench.table);
         std::string text = randomClauses(random, 50, 210);
         for (int i = 0; i < 10; ++i) // some switches are comparisons that depend on each other
@@ -98,7 +98,7 @@ TEST(DecisionFamilies, RandomClausesAreDecidedAsASolverDoes) {
 }
 
 TEST(DecisionIdentity, NeedsNoReading) {
-    DecisionBench bench;
+    DecisionFixture bench;
     std::mt19937_64 random(43);
     const SymbolicExprId huge = bench.parse(randomClauses(random, 300, 2000));
     bench.decider.limitSteps(0);
@@ -128,7 +128,7 @@ TEST(DecisionOrder, DoesNotDependOnNames) {
             return text;
         };
         SCOPED_TRACE(a + "\n" + b);
-        DecisionBench bench({.steps = std::uint64_t{1} << (8 + random() % 10)});
+        DecisionFixture bench({.steps = std::uint64_t{1} << (8 + random() % 10)});
         const auto ask = [&](const std::string& x, const std::string& y) {
             const Decision decision = bench.decider.implies(bench.parse(x), bench.parse(y));
             return std::pair(decision.answer, bench.decider.stepsTaken());

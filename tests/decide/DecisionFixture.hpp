@@ -13,8 +13,8 @@
 
 namespace VT::Testing {
 
-struct DecisionBench {
-    explicit DecisionBench(const DecisionOptions& options = {}) : decider(table, options) { table.addBoolSymbols(); }
+struct DecisionFixture {
+    explicit DecisionFixture(const DecisionOptions& options = {}) : decider(table, options) { table.addBoolSymbols(); }
 
     SymbolicExprId parse(const std::string& text) { return SymbolicExprParser(table, true, true)(text); }
 

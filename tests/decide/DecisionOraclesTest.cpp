@@ -79,7 +79,7 @@ std::vector<Entry> ofOperators(SymbolicExprTable& table, const std::vector<std::
 }
 
 /// Compares a witness with the first assignment of the world where the truth is `wanted`; an empty text if all is well.
-std::string judge(const DecisionBench& bench, const Entry& entry, const Decision& decision, bool found, bool wanted) {
+std::string judge(const DecisionFixture& bench, const Entry& entry, const Decision& decision, bool found, bool wanted) {
     const auto first = std::ranges::find_if(entry.values, [&](std::int8_t v) { return (v != 0) == wanted; });
     const bool there = first != entry.values.end();
     const std::string what = SymbolicExprPrinter(bench.table, false)(entry.id) + " " + bench.text(decision);
@@ -101,7 +101,7 @@ std::string judge(const DecisionBench& bench, const Entry& entry, const Decision
 }
 
 TEST(BruteForce, EveryConditionOfAtMostThreeOperators) {
-    DecisionBench bench;
+    DecisionFixture bench;
     std::vector<std::vector<Entry>> byOperators{leaves(bench.table)};
     for (int operators = 1; operators <= 3; ++operators)
         byOperators.push_back(ofOperators(bench.table, byOperators));
@@ -121,7 +121,7 @@ TEST(BruteForce, RandomSets) {
     std::mt19937_64 random(20);
     const ConditionShape shape{.lowest = -1, .highest = 2, .symbolPairs = true, .truthValues = true};
     for (int round = 0; round < 300; ++round) {
-        DecisionBench bench;
+        DecisionFixture bench;
         std::vector<SymbolicExprId> set;
         for (std::size_t i = 0; i < 2 + random() % 5; ++i)
             set.push_back(bench.parse(randomCondition(random, 1 + random() % 4, shape)));
@@ -158,7 +158,7 @@ TEST(BruteForce, AnswersDoNotDependOnHistory) {
             texts.push_back(randomCondition(random, 1 + random() % 6, shape) +
                             (i % 2 == 0 ? " || gamma+alpha*2>beta%3" : ""));
         const auto answers = [&](bool otherHistory) {
-            DecisionBench bench;
+            DecisionFixture bench;
             if (otherHistory) {
                 bench.parse("gamma < beta || aardvark > 3 && Delta*2 == alpha");
                 for (auto text = texts.rbegin(); text != texts.rend(); ++text)
@@ -177,7 +177,7 @@ TEST(BruteForce, AnswersDoNotDependOnHistory) {
 }
 
 /// Each "yes" comes with a witness, for which the conditions hold as asked; a solver, if there is one, says the same.
-void expectRight(const DecisionBench& bench, SymbolicExprId a, SymbolicExprId b, const Relation& relation,
+void expectRight(const DecisionFixture& bench, SymbolicExprId a, SymbolicExprId b, const Relation& relation,
                  Solver* solver = nullptr) {
     const auto expectOne = [&](const Decision& decision, bool wantsA, bool wantsB) {
         ASSERT_EQ(decision.isYes(), decision.witness.has_value());
@@ -205,7 +205,7 @@ TEST(AgainstSolver, RandomPairs) {
     const ConditionShape shape{.symbols = {"A", "B", "C", "D"}, .symbolPairs = true, .truthValues = true};
     std::size_t done = 0;
     while (done < pairs) {
-        DecisionBench bench; // a fresh one now and then, so that neither side grows without end
+        DecisionFixture bench; // a fresh one now and then, so that neither side grows without end
         Solver solver(bench.table);
         for (int i = 0; i < 500 && done < pairs; ++i, ++done) {
             static const char* const sums[] = {" || A+2<=C",     " && 3*B-1>D-D+2*B+(C<2)", " && A+B>C+2",
@@ -226,7 +226,7 @@ TEST(AgainstSolver, RandomPairs) {
 
 /// Neighbours among the lines that share a symbol.
 TEST(CorpusPairs, AreDecidedAndWitnessesHold) {
-    DecisionBench bench;
+    DecisionFixture bench;
     std::map<std::string, std::vector<SymbolicExprId>> bySymbol;
     for (const CorpusFile& file : corpusFiles)
         for (const std::string& line : corpusLines(file.name)) {

@@ -10,7 +10,7 @@
 namespace VT::Testing {
 namespace {
 
-struct DimensionBench : DecisionBench {
+struct DimensionBench : DecisionFixture {
     Assumptions assumptions{table};
     DimensionProofs proofs{table, decider, assumptions};
 };

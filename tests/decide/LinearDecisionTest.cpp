@@ -16,7 +16,7 @@ TEST(LinearDecisions, Relations) {
     const char* const kinds[] = {"equivalent", "disjoint", "implies", "implied by", "overlaps", "undecided"};
     for (const CaseRow& row : casesOf("decide.txt", "linear", 5)) {
         SCOPED_TRACE(row[0] + " with " + row[1]);
-        DecisionBench bench;
+        DecisionFixture bench;
         const SymbolicExprId a = bench.parse(row[0]);
         const SymbolicExprId b = bench.parse(row[1]);
         const Relation relation = bench.decider.classify(a, b);
@@ -48,7 +48,7 @@ TEST(LinearDecisions, RandomPairsAgreeWithTheSolver) {
     std::size_t undecidedCount = 0;
     std::size_t unevaluated = 0;
     for (std::size_t done = 0; done < pairs;) {
-        DecisionBench bench; // a fresh one now and then, so that neither side grows without end
+        DecisionFixture bench; // a fresh one now and then, so that neither side grows without end
         Solver solver(bench.table);
         solver.limit(solverResources);
         for (int i = 0; i < 200 && done < pairs; ++i, ++done) {

@@ -69,7 +69,7 @@ protected:
 
     ReasonSearch search(std::uint64_t steps = limits::reasonSteps) { return {bench.table, bench.decider, steps}; }
 
-    DecisionBench bench;
+    DecisionFixture bench;
 };
 
 TEST_F(Reasoning, NamesTheOperandsThatForceAConclusion) {

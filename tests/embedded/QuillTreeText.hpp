@@ -16,7 +16,7 @@ inline bool isOperand(int token) {
 }
 
 /// The tree below the root: operands as they are written, a rule as its code and children in parentheses.  Operators
-/// and brackets, which the code tells already, are left out.
+/// and brackets, which the code says already, are left out.
 inline std::string treeText(const QuillNode& node) { // NOLINT(misc-no-recursion): as deep as the text of a case
     if (node.kind == QuillNode::terminal)
         return isOperand(node.code) ? std::string(node.text, node.length) : "";
@@ -27,8 +27,8 @@ inline std::string treeText(const QuillNode& node) { // NOLINT(misc-no-recursion
     return node.code == 21 ? inputs.substr(1) : "(" + std::to_string(node.code) + inputs + ")";
 }
 
-inline std::string tokenError(const QuillNode& token, std::string_view text, std::size_t behind) {
-    if (token.start < behind || token.start + token.length > text.size() || token.length == 0)
+inline std::string tokenError(const QuillNode& token, std::string_view text, std::size_t after) {
+    if (token.start < after || token.start + token.length > text.size() || token.length == 0)
         return "token out of order";
     if (token.text != text.data() + token.start)
         return "token that does not point to its place";
@@ -43,7 +43,7 @@ inline std::string tokenError(const QuillNode& token, std::string_view text, std
 inline std::string shapeError(const QuillNode& root, std::string_view text) {
     if (root.kind != 1 || root.code != 21 || root.childCount != 1)
         return "no root";
-    std::size_t behind = 0; // end of the last token
+    std::size_t after = 0; // end of the last token
     std::size_t count = 0;
     std::vector<const QuillNode*> pending{&root};
     while (!pending.empty()) {
@@ -52,13 +52,13 @@ inline std::string shapeError(const QuillNode& root, std::string_view text) {
         if (++count > 3 * text.size() + 4)
             return "too many nodes";
         if (node.kind == 0) {
-            const std::string error = tokenError(node, text, behind);
+            const std::string error = tokenError(node, text, after);
             if (!error.empty())
                 return error + " at " + std::to_string(node.start);
-            behind = node.start + node.length;
+            after = node.start + node.length;
             continue;
         }
-        if (node.kind != 1 || node.start < behind || node.start > text.size() ||
+        if (node.kind != 1 || node.start < after || node.start > text.size() ||
             (node.childCount > 0 && node.start > node.children[0].start))
             return "rule " + std::to_string(node.code) + " at the wrong place";
         for (std::int32_t i = node.childCount; i-- > 0;)

@@ -77,7 +77,7 @@ TEST_F(Evaluation, AnswersIdentifiersThatAreNoNodes) {
     EXPECT_THROW(static_cast<void>(visitor.get()), HostDiagnostic);
     EXPECT_THROW(static_cast<void>(visitor.evaluate(onNothing)), HostDiagnostic);
     visitor.execute(table, one);
-    EXPECT_EQ(visitor.get(), SymbolicValue(1));                     // of use behind errors
+    EXPECT_EQ(visitor.get(), SymbolicValue(1));                     // usable after errors
     EXPECT_THROW(static_cast<void>(visitor.get()), HostDiagnostic); // once
     SymbolicExprTable other;                                        // whose nodes are on the same numbers
     const SymbolicExprId two = SymbolicIntValue(other, 2).getId(other);

@@ -55,7 +55,7 @@ void release(void* place) noexcept {
 }
 
 /// Calls with the number of the allocation that fails, from the first on until none fails.  A call that leaves
-/// allocations behind is an error.
+/// allocations after it is an error.
 void forEachFailure(const std::function<void(std::size_t number)>& run) {
     constexpr std::size_t enough = 100000;
     for (std::size_t number = 0; number < enough; ++number) {

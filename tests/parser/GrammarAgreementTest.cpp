@@ -48,7 +48,7 @@ struct TextBuilder {
     static std::string real(double value) { return realText(value); }
 };
 
-/// What is wrong where the two parsers differ on a text; empty where they agree.  Reading stops behind the longest part
+/// What is wrong where the two parsers differ on a text; empty where they agree.  Reading stops after the longest part
 /// of the text that is a condition, but for numbers out of range, of which it reads no part.
 std::string difference(SymbolicExprTable& table, const std::string& text, bool cOperators, bool keywords) {
     static const std::regex beyond("[0-9]{10}|[eE][-+]?[0-9]{3}");

@@ -1,4 +1,4 @@
-// What a scan tells of branches, against a real preprocessor under every definition of the macros of a small world.
+// Findings of a scan compared with a real preprocessor under every definition of the macros of a small world.
 #include "base/scan/SourceScan.hpp"
 #include "tests/preprocessor/Judges.hpp"
 
@@ -30,7 +30,7 @@ struct Branch {
     bool isElse;
 };
 
-/// A file of chains within each other.  Each branch holds its number behind an @.
+/// A file of chains within each other.  Each branch holds its number after an @.
 class RandomSource {
 public:
     /// With `plain`, conditions are those that are decided completely, and nothing changes macros on the way.
@@ -264,13 +264,13 @@ std::size_t offsetOf(const std::string& text, std::uint64_t line, std::uint64_t 
     return at;
 }
 
-void check(const RandomSource& source, bool plain, std::map<BranchFindingKind, int>& told) {
+void check(const RandomSource& source, bool plain, std::map<BranchFindingKind, int>& counts) {
     const std::vector<std::set<int>> worlds = entered(source.text, source.values);
     ASSERT_EQ(worlds.size(), plain ? 343U : 64U);
     std::map<int, BranchFindingKind> found;
     std::vector<BranchFinding> fixes;
     SourceScanner().scan(source.text, false, [&](const BranchFinding& finding) {
-        ++told[finding.kind];
+        ++counts[finding.kind];
         const auto branch =
             std::ranges::find(source.branches, static_cast<std::size_t>(finding.region.line), &Branch::line);
         ASSERT_NE(branch, source.branches.end());
@@ -316,12 +316,12 @@ class Branches : public ::testing::TestWithParam<bool> {};
 
 TEST_P(Branches, AreWhatAPreprocessorMakesOfThem) {
     std::mt19937_64 random(GetParam() ? 1 : 2);
-    std::map<BranchFindingKind, int> told;
+    std::map<BranchFindingKind, int> counts;
     for (int i = 0; i < (GetParam() ? 60 : 300) && !HasFailure(); ++i)
-        check(RandomSource(random, GetParam()), GetParam(), told);
-    std::cout << "dead " << told[BranchFindingKind::Dead] << ", always true " << told[BranchFindingKind::AlwaysTrue]
-              << ", removable " << told[BranchFindingKind::Removable] << "\n";
-    for (const auto& [kind, times] : told)
+        check(RandomSource(random, GetParam()), GetParam(), counts);
+    std::cout << "dead " << counts[BranchFindingKind::Dead] << ", always true " << counts[BranchFindingKind::AlwaysTrue]
+              << ", removable " << counts[BranchFindingKind::Removable] << "\n";
+    for (const auto& [kind, times] : counts)
         EXPECT_GT(times, 10);
 }
 

@@ -12,7 +12,7 @@
 namespace VT::Testing {
 
 /// Throws std::runtime_error with the words of a command that fails.
-inline void run(const Workplace& place, const std::string& command) {
+inline void run(const TemporaryFolder& place, const std::string& command) {
     if (place.run("{ " + command + "; } 2>words") != 0)
         throw std::runtime_error(command + ": " + place.read("words").substr(0, 2000));
 }
@@ -43,7 +43,7 @@ public:
 
     /// A 1 or 0 for each condition, in order.
     [[nodiscard]] std::vector<std::int64_t> decide() const {
-        const Workplace place;
+        const TemporaryFolder place;
         place.write("conditions.h", file_);
         run(place, "cpp -P -undef conditions.h decided");
         return numbers(place.read("decided"));
@@ -56,7 +56,7 @@ private:
 
 /// What the preprocessor makes of a file; a header of the given text is there as "header.h".
 inline std::string preprocessed(const std::string& file, const std::string& header) {
-    const Workplace place;
+    const TemporaryFolder place;
     place.write("file.c", file);
     place.write("header.h", header);
     run(place, "cpp -P -w -undef -std=c2x file.c decided");
@@ -79,7 +79,7 @@ public:
     void add(const std::string& expression) { expressions_.push_back(expression); }
 
     [[nodiscard]] std::vector<std::int64_t> compute(const std::vector<Question>& questions) const {
-        const Workplace place;
+        const TemporaryFolder place;
         place.write("program.c", program());
         std::ostringstream input;
         for (const Question& question : questions) {

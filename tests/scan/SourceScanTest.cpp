@@ -9,18 +9,18 @@ namespace {
 
 /// The findings, one a line.
 std::string findings(const std::string& text, const std::string& kind = {}) {
-    std::string told;
+    std::string report;
     const auto tell = [&](const BranchFinding& found) {
         const char* const kinds[] = {"dead", "always", "removable"};
-        told += told.empty() ? "" : "\n";
-        told += std::to_string(found.region.line) + " " + kinds[static_cast<int>(found.kind)] + " " + found.condition;
+        report += report.empty() ? "" : "\n";
+        report += std::to_string(found.region.line) + " " + kinds[static_cast<int>(found.kind)] + " " + found.condition;
         if (found.kind == BranchFindingKind::Removable)
-            told += " -> " + found.proposed;
+            report += " -> " + found.proposed;
         for (const BranchReason& reason : found.reasons)
-            told += (reason.holds ? " @" : " !") + std::to_string(reason.region.line);
+            report += (reason.holds ? " @" : " !") + std::to_string(reason.region.line);
     };
     SourceScanner({.strictIncludes = kind == "strict"}).scan(text, kind == "C++", tell);
-    return told;
+    return report;
 }
 
 TEST(Findings, AreAsListed) {

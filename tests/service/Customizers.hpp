@@ -35,7 +35,7 @@ private:
     FlagSetting caching_;
 };
 
-/// Does what its functions say and takes note of what it is told.
+/// Does what its functions say and takes note of its arguments.
 class TestCustomizer : public VCCustomizer {
 public:
     void release() noexcept override {

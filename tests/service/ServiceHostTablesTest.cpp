@@ -25,7 +25,7 @@ namespace {
 using Op = SymbolicOp;
 
 /// What the library says of an expression, but for identifiers.
-std::vector<std::string> told(SymbolicExprTable& table, SymbolicExprId id) {
+std::vector<std::string> textsOf(SymbolicExprTable& table, SymbolicExprId id) {
     std::vector<std::string> texts{SymbolicExprPrinter(table, true)(id),
                                    SymbolicExprPrinter(table, false)(SymbolicExprQ2C(table)(id))};
     const SymbolicExprPrinter print(table, false);
@@ -73,7 +73,7 @@ TEST(HostTables, SayTheSameAsTheLibrarysOwn) {
                 return random() % 3 == 0 ? tree.integer(static_cast<int>(random() % 7) - 3)
                                          : tree.name(std::string(1, "abcd"[random() % 4]));
             };
-            const auto texts = told(table, randomTree(table, random, operators, 4, leaf));
+            const auto texts = textsOf(table, randomTree(table, random, operators, 4, leaf));
             if (expected.empty())
                 expected = texts;
             else

@@ -65,15 +65,15 @@ TEST(ServiceLifetime, ReadsTheCacheFeatureOnce) {
 
 using Texts = std::vector<std::string>;
 
-std::string told(const std::string& text) {
+std::string textOf(const std::string& text) {
     return text;
 }
 
-std::string told(const Texts& texts) {
+std::string textOf(const Texts& texts) {
     return texts.empty() ? "none" : boost::algorithm::join(texts, "; ");
 }
 
-std::string told(const Decision& decision) {
+std::string textOf(const Decision& decision) {
     static const char* const answers[] = {"no", "yes", "undecided"};
     const std::string answer = answers[static_cast<std::size_t>(decision.answer)];
     if (!decision.witness)
@@ -86,15 +86,15 @@ std::string told(const Decision& decision) {
 template <auto function>
 std::string answer(VCService& service, const Texts& texts) {
     if constexpr (std::is_invocable_v<decltype(function), VCService&, Texts>)
-        return told(std::invoke(function, service, texts));
+        return textOf(std::invoke(function, service, texts));
     else if constexpr (std::is_invocable_v<decltype(function), VCService&, std::string, std::string>)
-        return told(std::invoke(function, service, texts.at(0), texts.at(1)));
+        return textOf(std::invoke(function, service, texts.at(0), texts.at(1)));
     else if constexpr (std::is_invocable_v<decltype(function), VCService&, std::string, bool, bool>)
-        return told(std::invoke(function, service, texts.at(0), texts.at(1) == "Quill", texts.at(2) == "Quill"));
+        return textOf(std::invoke(function, service, texts.at(0), texts.at(1) == "Quill", texts.at(2) == "Quill"));
     else if constexpr (std::is_invocable_v<decltype(function), VCService&, std::string>)
-        return told(std::invoke(function, service, texts.at(0)));
+        return textOf(std::invoke(function, service, texts.at(0)));
     else
-        return told(std::invoke(function, service, service.parseC(texts.at(0))));
+        return textOf(std::invoke(function, service, service.parseC(texts.at(0))));
 }
 
 #define CALL(name) std::pair(#name, &answer<&VCService::name>)

@@ -44,7 +44,7 @@ TEST(OperandLimit, HoldsAtTheBoundAndGivesUpOneBeyond) {
     using Operands = boost::container::flat_set<SymbolicExprId>;
     for (const SymbolicOp op : {SymbolicOp::And, SymbolicOp::Or}) {
         for (const bool leftDeep : {true, false}) {
-            Workbench bench;
+            SimplifierFixture bench;
             const SymbolicExprId within = chain(bench.table, op, limit, leftDeep);
             const SymbolicExprId beyond = chain(bench.table, op, limit + 1, leftDeep);
             const SymbolicExprId sorted = bench.simplify(within);
@@ -67,7 +67,7 @@ TEST(OperandLimit, HoldsAtTheBoundAndGivesUpOneBeyond) {
 }
 
 TEST(OperandLimit, BoundsDistribution) {
-    Workbench bench;
+    SimplifierFixture bench;
     const std::string within = "(" + joined(25, "||", "A#") + ")&&(" + joined(40, "||", "B#") + ")";
     const std::string beyond = "(" + joined(25, "||", "A#") + ")&&(" + joined(41, "||", "B#") + ")";
     EXPECT_EQ(countComparisons(bench.table, bench.simplify(bench.parse(within))), 2000U);
@@ -75,7 +75,7 @@ TEST(OperandLimit, BoundsDistribution) {
 }
 
 TEST(LongChains, AreReducedWhateverTheirLength) {
-    Workbench bench;
+    SimplifierFixture bench;
     std::string contradiction = "A==0";
     std::string range = "A>0";
     for (int i = 1; i < 20000; ++i) {
@@ -102,7 +102,7 @@ TEST(GrowingFamilies, MakeNoMoreNodesThanTheirBoundAndStayAsTheyAre) {
         const std::size_t size = std::stoul(family[1]);
         for (const std::size_t n : {size / 4, size / 2, size}) {
             SCOPED_TRACE(family[0] + std::to_string(n));
-            Workbench bench;
+            SimplifierFixture bench;
             const SymbolicExprId condition = bench.parse(grown(family, n));
             const std::size_t given = bench.table.size();
             const SymbolicExprId result = bench.simplify(condition);
@@ -111,7 +111,7 @@ TEST(GrowingFamilies, MakeNoMoreNodesThanTheirBoundAndStayAsTheyAre) {
             EXPECT_EQ(bench.simplify(result), result);
             if (n == size)
                 continue;
-            Workbench used; // in which names and parts have other identifiers
+            SimplifierFixture used; // in which names and parts have other identifiers
             used.simplify(used.parse(grown(family, n / 2 + 1)));
             EXPECT_TRUE(used.simplified(grown(family, n)) == SymbolicExprPrinter(bench.table, false)(result));
         }
@@ -120,7 +120,7 @@ TEST(GrowingFamilies, MakeNoMoreNodesThanTheirBoundAndStayAsTheyAre) {
 
 // Each graph has few nodes and more paths than could be walked.
 TEST(SharedGraphs, CostTheirNodes) {
-    Workbench bench;
+    SimplifierFixture bench;
     const Trees tree{bench.table};
     const SymbolicExprId condition = bench.parse("A == 1");
     for (const SymbolicOp op : {SymbolicOp::And, SymbolicOp::Or})
@@ -135,7 +135,7 @@ TEST(SharedGraphs, CostTheirNodes) {
 
 TEST(DeepGraphs, NeedNoDeepStack) {
     using Op = SymbolicOp;
-    Workbench bench;
+    SimplifierFixture bench;
     const Trees tree{bench.table};
     const SymbolicExprId a = bench.parse("A");
     const auto deep = [&](auto wrap) {

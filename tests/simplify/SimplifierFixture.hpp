@@ -10,8 +10,8 @@
 
 namespace VT::Testing {
 
-struct Workbench {
-    Workbench() { table.addBoolSymbols(); }
+struct SimplifierFixture {
+    SimplifierFixture() { table.addBoolSymbols(); }
 
     SymbolicExprId parse(const std::string& text) { return SymbolicExprParser(table, false, true)(text); }
 

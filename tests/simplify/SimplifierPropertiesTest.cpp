@@ -35,7 +35,7 @@ TEST(Simplify, KeepsTheTruthFindsConstantsAndIsAFixedPoint) {
     for (std::uint64_t seed = 0; seed < 2500; ++seed) {
         const ConditionShape& shape = shapes[seed % shapes.size()];
         const std::string text = condition(seed, shape);
-        Workbench bench;
+        SimplifierFixture bench;
         const SymbolicExprId id = bench.parse(text);
         const SymbolicExprId result = bench.simplify(id);
         ASSERT_EQ(bench.simplify(result), result) << text;
@@ -63,7 +63,7 @@ TEST(Simplify, KeepsTheTruthFindsConstantsAndIsAFixedPoint) {
 TEST(Simplify, ProvesThatSumsAreSmallest) {
     std::size_t proven = 0;
     for (std::uint64_t seed = 0; seed < 1000; ++seed) {
-        Workbench bench;
+        SimplifierFixture bench;
         SymbolicExprSimplifyVisitor visitor(bench.table, true, bench.simplifier.printer());
         const SymbolicExprId given = bench.parse(condition(seed, shapes[0]));
         const SymbolicExprId result = bench.simplifier.simplify(given, bench.passes, visitor);
@@ -71,7 +71,7 @@ TEST(Simplify, ProvesThatSumsAreSmallest) {
         EXPECT_EQ(bench.simplify(result), result);
     }
     EXPECT_GT(proven, 990U);
-    Workbench bench; // more symbols than a grid has axes, and each implies the next one
+    SimplifierFixture bench; // more symbols than a grid has axes, and each implies the next one
     std::string cycle = "!V0 && V19";
     for (int i = 1; i < 20; ++i)
         cycle += " || !V" + std::to_string(i) + " && V" + std::to_string(i - 1);
@@ -83,8 +83,8 @@ TEST(Simplify, ProvesThatSumsAreSmallest) {
 RC_GTEST_PROP(Simplify, DoesNotDependOnWhatWasInternedBefore, ()) {
     const auto seed = *rc::gen::arbitrary<std::uint64_t>();
     const std::string text = condition(seed, shapes[1]);
-    Workbench fresh;
-    Workbench used;
+    SimplifierFixture fresh;
+    SimplifierFixture used;
     for (const char* name : {"C", "B>=2", "B", "A>1&&C<2", "A", "3", "1"})
         used.parse(name);
     for (std::uint64_t other = 0; other < 3; ++other)
@@ -101,7 +101,7 @@ TEST(Simplify, KeepsTheValueOfMixedExpressions) {
     std::mt19937_64 random(29);
     std::size_t judged = 0;
     for (int round = 0; round < 20000; ++round) {
-        Workbench bench;
+        SimplifierFixture bench;
         const Trees tree{bench.table};
         const SymbolicExprId before = randomTree(bench.table, random, operators, 2 + round % 4, [&] {
             const std::uint64_t kind = random() % 12;
@@ -150,7 +150,7 @@ TEST(Simplify, SumsAndProductsKeepTheirWrappedValue) {
     for (int i = 0; i < 4000; ++i) {
         const Assignment letters{{"A", static_cast<std::int32_t>(random())}, {"B", i}, {"C", 3}};
         const std::string text = arithmetic(random, 1 + i % 5);
-        Workbench bench;
+        SimplifierFixture bench;
         const SymbolicExprId before = bench.parse(text);
         const SymbolicExprId after = bench.simplify(before);
         ASSERT_EQ(static_cast<std::uint32_t>(valueOf(bench.table, after, letters)),
@@ -165,7 +165,7 @@ TEST(Simplify, SumsAndProductsKeepTheirWrappedValue) {
 TEST(Simplify, RealConditionsReachAFixedPoint) {
     std::size_t read = 0;
     for (const CorpusFile& file : corpusFiles) {
-        Workbench bench;
+        SimplifierFixture bench;
         for (const std::string& line : corpusLines(file.name)) {
             const SymbolicExprId id = VT::Testing::parse(bench.table, line).id;
             if (id == invalidId)

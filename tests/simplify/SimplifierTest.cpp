@@ -16,13 +16,13 @@ namespace {
 
 TEST(Conditions, Become) {
     for (const CaseRow& row : casesOf("simplify.txt", "conditions", 2))
-        EXPECT_EQ(Workbench().simplified(row[0]), row[1]) << row[0];
+        EXPECT_EQ(SimplifierFixture().simplified(row[0]), row[1]) << row[0];
 }
 
 TEST(Keywords, ObeyTheFeatureAndTheOwnersFlag) {
     for (const bool feature : {true, false}) {
         for (const bool flag : {true, false}) {
-            Workbench bench;
+            SimplifierFixture bench;
             const FlagSetting setting(*VTFEAT_VariantKeywordsSimCodegen, feature ? 1 : 0);
             bench.simplifier.setKeywordsFlag(flag);
             EXPECT_EQ(bench.simplified("(sim) && (codegen)") == "false", feature && flag);
@@ -32,7 +32,7 @@ TEST(Keywords, ObeyTheFeatureAndTheOwnersFlag) {
 }
 
 TEST(BoundMembers, DecideAndStay) {
-    Workbench bench;
+    SimplifierFixture bench;
     const SymbolicExprId member = bench.parse("P.x");
     bench.table.registerValueId(member, bench.parse("3"));
     for (const CaseRow& row : casesOf("simplify.txt", "bound members", 2))
@@ -40,7 +40,7 @@ TEST(BoundMembers, DecideAndStay) {
 }
 
 TEST(Driver, CountsPassesAndStopsAtConstants) {
-    Workbench bench;
+    SimplifierFixture bench;
     EXPECT_EQ(bench.simplified("A==1 && A==2"), "false");
     EXPECT_EQ(bench.passes, 1U);
     EXPECT_EQ(bench.simplify(bench.table.size()), invalidId);
@@ -55,7 +55,7 @@ TEST(Driver, CountsPassesAndStopsAtConstants) {
 /// A visitor that agrees with every rewrite or with none, and remembers what it was asked.
 class Asked final : public SymbolicExprSimplifyVisitor {
 public:
-    Asked(Workbench& bench, bool agrees)
+    Asked(SimplifierFixture& bench, bool agrees)
         : SymbolicExprSimplifyVisitor(bench.table, true, bench.simplifier.printer()),
           agrees_(agrees) {}
 
@@ -75,7 +75,7 @@ TEST(Driver, AsksBeforeSelfComparisonsAndDistributionsOnly) {
     for (const CaseRow& row : casesOf("simplify.txt", "questions", 4)) {
         SCOPED_TRACE(row[0]);
         for (const bool agrees : {true, false}) {
-            Workbench bench;
+            SimplifierFixture bench;
             Asked visitor(bench, agrees);
             const SymbolicExprId result = bench.simplifier.simplify(bench.parse(row[0]), bench.passes, visitor);
             EXPECT_EQ(SymbolicExprPrinter(bench.table, false)(result), row[agrees ? 2 : 3]);
@@ -91,7 +91,7 @@ TEST(MissingOperands, StayMissing) {
         if (callOps.contains(op) && operandCount(op) == 1)
             continue;
         for (const SymbolicExprId hole : {invalidId, SymbolicExprId{1} << 40U}) {
-            Workbench bench;
+            SimplifierFixture bench;
             const Trees tree{bench.table};
             const SymbolicExprId contradiction = bench.parse("!(A || !A)");
             std::vector<SymbolicExprId> inputs(operandCount(op).value_or(4), contradiction);
@@ -114,7 +114,7 @@ TEST(MissingOperands, StayMissing) {
             }
         }
     }
-    Workbench bench;
+    SimplifierFixture bench;
     const SymbolicExprId nan =
         SymbolicDoubleValue(bench.table, std::numeric_limits<double>::quiet_NaN()).getId(bench.table);
     const SymbolicExprId sum = SymbolicPlusExpr(bench.table, bench.parse("x"), nan).getId(bench.table);
@@ -151,7 +151,7 @@ TEST(Rules, EachFiresOnItsExampleAndKeepsTheMeaning) {
     for (const RuleInfo* rule : simplificationRules()) {
         SCOPED_TRACE(rule->name);
         EXPECT_TRUE(names.insert(rule->name).second);
-        Workbench bench;
+        SimplifierFixture bench;
         FiredRules fired;
         bench.simplifier.setListener(&fired);
         const SymbolicExprId before = bench.parse(std::string(rule->before));

@@ -15,7 +15,7 @@ struct ParseAnswer {
     SymbolicExprId id = invalidId;
     std::optional<HostDiagnostic> error;
 
-    /// Where reading stopped: behind the text, or the place of the error.
+    /// Where reading stopped: after the text, or the place of the error.
     [[nodiscard]] std::size_t stop(const std::string& text) const {
         return error ? error->offset().value() : text.size();
     }

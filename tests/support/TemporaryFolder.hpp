@@ -12,19 +12,19 @@
 namespace VT::Testing {
 
 /// A directory that lives as long as this.
-class Workplace {
+class TemporaryFolder {
 public:
-    Workplace() {
+    TemporaryFolder() {
         std::string pattern = (std::filesystem::temp_directory_path() / "vtsym-XXXXXX").string();
         if (mkdtemp(pattern.data()) == nullptr)
             throw std::runtime_error("no directory for files");
         path_ = pattern;
     }
 
-    Workplace(const Workplace&) = delete;
-    Workplace& operator=(const Workplace&) = delete;
+    TemporaryFolder(const TemporaryFolder&) = delete;
+    TemporaryFolder& operator=(const TemporaryFolder&) = delete;
 
-    ~Workplace() { std::filesystem::remove_all(path_); }
+    ~TemporaryFolder() { std::filesystem::remove_all(path_); }
 
     /// A name in the directory.
     [[nodiscard]] std::string path(const std::string& name) const { return (path_ / name).string(); }

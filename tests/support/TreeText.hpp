@@ -16,8 +16,8 @@ inline std::string realText(double value) {
     return std::string(digits.begin(), end) + "r";
 }
 
-/// The node kinds by the names of their operators, names and integers as they are, a real with an r behind it, a
-/// member's name behind its owner.  The invalid identifier is "invalid".  Recurses; for small expressions only.
+/// The node kinds by the names of their operators, names and integers as they are, a real with an r after it, a
+/// member's name after its owner.  The invalid identifier is "invalid".  Recurses; for small expressions only.
 inline std::string treeText(const SymbolicExprTable& table, SymbolicExprId id) { // NOLINT(misc-no-recursion)
     const SymbolicExpr* node = table.get(id);
     if (node == nullptr)

@@ -146,7 +146,7 @@ TEST(Check, AgreesWithBruteForce) {
     std::set<std::string> found;
     std::string shortened;
     std::string equivalent;
-    const Workplace place;
+    const TemporaryFolder place;
     place.write("m", Json({{"blocks", blocks}}).dump());
     for (const std::string& line : linesOf(runScript(place, "vtsym check --json m").out)) {
         const Json finding = Json::parse(line);

@@ -29,7 +29,7 @@ std::string spoiled(const std::string& text) {
 }
 
 /// Runs `vtsym` with the words of a command, in which @ stands for a text.
-void expectSafe(const Workplace& place, const std::string& command, const std::string& text,
+void expectSafe(const TemporaryFolder& place, const std::string& command, const std::string& text,
                 const std::string& input = {}, const std::string& flags = {}) {
     const std::string script = "vtsym " + boost::replace_all_copy(command, "@", "'" + text + "'");
     const ProgramResult result = runScript(place, script, input, {"VTSYM_LOG=debug", "VTSYM_FEATURES=" + flags});
@@ -41,7 +41,7 @@ void expectSafe(const Workplace& place, const std::string& command, const std::s
 }
 
 TEST(Output, IsSafeForTerminalsWhateverTheArguments) {
-    const Workplace place;
+    const TemporaryFolder place;
     place.write("m", "{}");
     for (const std::string& text : hostileTexts) {
         for (const CaseRow& row : casesOf(file, "arguments", 1))
@@ -51,7 +51,7 @@ TEST(Output, IsSafeForTerminalsWhateverTheArguments) {
 }
 
 TEST(Output, IsSafeForTerminalsWhateverTheTexts) {
-    const Workplace place;
+    const TemporaryFolder place;
     for (const std::string& text : hostileTexts) {
         const std::string lines = text + "\nA" + text + "\nA == '" + text + "'\nf(\"" + text + "\") % {" + text +
                                   "\n/*" + text + "*/A\nA%" + text + "\n";
@@ -73,7 +73,7 @@ TEST(Output, IsSafeForTerminalsWhateverTheTexts) {
 
 TEST(Output, IsSafeForTerminalsWhateverTheFiles) {
     for (const std::string& text : hostileTexts) {
-        const Workplace place;
+        const TemporaryFolder place;
         place.run("mkdir sources");
         place.write("sources/" + text + ".c", boost::replace_all_copy(casesOf(file, "source", 1)[0][0], "@", text));
         for (const std::string option : {"--summary", "--json", "--sarif"})

@@ -47,7 +47,7 @@ bool isLike(const std::string& text, const std::string& pattern) {
 
 } // namespace
 
-ProgramResult runScript(const Workplace& place, const std::string& script, const std::string& input,
+ProgramResult runScript(const TemporaryFolder& place, const std::string& script, const std::string& input,
                         const Strings& environment) {
     place.write("in", input);
     place.write("script", "vtsym() { '" VTSYM_PROGRAM "' \"$@\"; }\n" + script);
@@ -56,7 +56,7 @@ ProgramResult runScript(const Workplace& place, const std::string& script, const
 }
 
 ProgramResult runProgram(const Strings& arguments, const std::string& input, const Strings& environment) {
-    return runScript(Workplace(), commandOf("vtsym", arguments), input, environment);
+    return runScript(TemporaryFolder(), commandOf("vtsym", arguments), input, environment);
 }
 
 ProgramResult runOnTerminal(const Strings& arguments, const std::string& input, const Strings& environment) {
@@ -110,7 +110,7 @@ void expectTranscript(const std::string& file, const std::map<std::string, std::
     EXPECT_FALSE(commands.empty()) << file;
     for (const auto& [script, input, expected] : commands) {
         SCOPED_TRACE(file + ": " + script + "\n" + input);
-        const Workplace place;
+        const TemporaryFolder place;
         for (const auto& [name, content] : files)
             place.write(name, content);
         const ProgramResult result = runScript(place, script, input);

@@ -18,7 +18,7 @@ struct ProgramResult {
 using Strings = std::vector<std::string>;
 
 /// A shell's script in which `vtsym` is the program, in an environment of little else than what is given.
-ProgramResult runScript(const Workplace& place, const std::string& script, const std::string& input = {},
+ProgramResult runScript(const TemporaryFolder& place, const std::string& script, const std::string& input = {},
                         const Strings& environment = {});
 
 ProgramResult runProgram(const Strings& arguments, const std::string& input = {}, const Strings& environment = {});

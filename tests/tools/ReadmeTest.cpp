@@ -42,7 +42,8 @@ TEST(Documentation, ShowsWhatTheProgramAnswers) {
     for (auto [command, output] : examples) {
         if (const std::size_t run = command.find("./run "); run != std::string::npos)
             command.replace(run, 5, "vtsym");
-        const std::string written = runScript(Workplace(), "exec 2>&1; cd '" + root.string() + "'; " + command).out;
+        const std::string written =
+            runScript(TemporaryFolder(), "exec 2>&1; cd '" + root.string() + "'; " + command).out;
         EXPECT_EQ(withoutEnd(written), withoutEnd(output)) << command;
     }
 }

@@ -18,7 +18,7 @@ const std::string source = casesOf("scan-findings.txt", "source", 1).front().fro
 
 /// The findings themselves are in the transcript.
 TEST(Scan, WritesSarif) {
-    const Workplace place;
+    const TemporaryFolder place;
     place.run("mkdir 'sub dir'");
     place.write("a.c", source);
     place.write("sub dir/%b.hh", "#if true\n#if X\n#elif X == 1\n#endif\n#endif");
@@ -44,7 +44,7 @@ TEST(Scan, KeepsToItsTranscript) {
 }
 
 TEST(Scan, ReportsWhatWasNotDone) {
-    const Workplace place;
+    const TemporaryFolder place;
     const auto scan = [&](const std::string& arguments) { return runScript(place, "vtsym scan " + arguments); };
     place.run("printf '\\0\\1' >binary.c; ln -s nowhere gone.c");
     const ProgramResult unread = scan("--sarif gone.c .");

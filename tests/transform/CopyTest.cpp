@@ -53,7 +53,7 @@ TEST(Copy, IsTheSameGraphOnceOverEveryClass) {
         std::multiset<SymbolicOp> classes, copiedClasses; // no class stands for its twin
         for (SymbolicExprId id = 0; id < target.size(); ++id) {
             copiedClasses.insert(target.get(id)->op());
-            const bool isSymbol = target.get(id)->op() == SymbolicOp::String; // the values of others stay behind
+            const bool isSymbol = target.get(id)->op() == SymbolicOp::String; // the values of others remains
             ASSERT_TRUE(isSymbol || target.isUnsetValue(target.getValueId(id)));
         }
         for (const SymbolicExprId id : copied) {
@@ -138,7 +138,7 @@ TEST(Replacement, AgreesWithAModelOverEveryClass) {
         const std::size_t before = graph.size();
 
         // What every node becomes, as the number of its structure.  Equal structures of different identifiers, which
-        // NaN makes, are no operands of one key, so such a round tells nothing.
+        // NaN makes, are no operands of one key, so such a round shows nothing.
         StructureNumbers structures;
         const std::vector<std::size_t> numbers = structures.of(graph);
         if (std::set(numbers.begin(), numbers.end()).size() != numbers.size())

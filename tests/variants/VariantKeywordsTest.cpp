@@ -67,15 +67,15 @@ TEST(VariantFeatures, FlagsAreDeclaredInOrder) {
     const std::vector<VtFeature*> expected{&VT::cacheSymExprSimplifyResultsFeature(),
                                            &VT::guardIncludesOfVariantDataFeature(), VTFEAT_VariantKeywordsSimCodegen};
     EXPECT_EQ(VtFeature::all(), expected);
-    std::string told;
+    std::string listed;
     for (const VtFeature* flag : expected)
-        told += flag->name() + " " + flag->category() + " " + flag->sourceUnit() + " " +
-                std::to_string(flag->identifier()) + " " + std::to_string(flag->defaultValue()) + "\n";
-    EXPECT_EQ(told, "CacheSymExprSimplifyResults Vantor Variants base/VCService 1788779 1\n"
-                    "GuardIncludesOfVariantData Vantor Variants/Codewright " +
-                        expected[1]->sourceUnit() +
-                        " 1816317 1\nVariantKeywordsSimCodegen Vantor Subsystem and Models [Variants] "
-                        "parser/SymbolicExprParser 1375955 2\n");
+        listed += flag->name() + " " + flag->category() + " " + flag->sourceUnit() + " " +
+                  std::to_string(flag->identifier()) + " " + std::to_string(flag->defaultValue()) + "\n";
+    EXPECT_EQ(listed, "CacheSymExprSimplifyResults Vantor Variants base/VCService 1788779 1\n"
+                      "GuardIncludesOfVariantData Vantor Variants/Codewright " +
+                          expected[1]->sourceUnit() +
+                          " 1816317 1\nVariantKeywordsSimCodegen Vantor Subsystem and Models [Variants] "
+                          "parser/SymbolicExprParser 1375955 2\n");
     for (const std::int32_t value : {-1, 0, 1, 2}) {
         const VT::Testing::FlagSetting setting(*VTFEAT_VariantKeywordsSimCodegen, value);
         EXPECT_EQ(VT::isVariantKeywordsSimCodegenFeatureOn(), value > 0) << value;

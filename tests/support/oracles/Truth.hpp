@@ -32,7 +32,7 @@ std::vector<Step> stepsOf(const SymbolicExprTable& table, SymbolicExprId root, b
 std::optional<std::int64_t> computed(SymbolicOp op, std::int64_t a, std::int64_t b);
 
 /// Integers without bounds (sums and products are right modulo 2^64), where calls and members are worth what the
-/// assignment says of their text; or C, where a call is looked up by the name of its function, `defined(X)` tells
+/// assignment says of their text; or C, where a call is looked up by the name of its function, `defined(X)` says
 /// whether the assignment names X, and the right operands of && and || count only where C computes them.
 enum class Arithmetic : bool { Unbounded, C };
 
