@@ -7,6 +7,7 @@
 
 #include <chrono>
 #include <cstdlib>
+#include <iostream>
 #include <random>
 
 namespace VT::Testing {
@@ -97,9 +98,8 @@ TEST(LinearDecisions, RandomPairsAgreeWithTheSolver) {
     EXPECT_LE(unevaluated * 50, pairs) << "witnesses that leave 64 bits";
     EXPECT_LE(given * 20, pairs) << "questions that the solver gave up";
     if (asked != nullptr)
-        std::puts(
-            ("us a pair: " + perPair(own) + ", solver " + perPair(others) + ", given up by it " + std::to_string(given))
-                .c_str());
+        std::cout << "us a pair: " << perPair(own) << ", solver " << perPair(others) << ", questions given up by it "
+                  << given << ", undecided " << undecidedCount << ", unevaluated witnesses " << unevaluated << "\n";
 }
 
 } // namespace
