@@ -8,7 +8,6 @@
 #include "base/core/Check.hpp"
 #include "base/core/Make.hpp"
 #include "base/core/Nodes.hpp"
-#include "parser/SyntaxActions.hpp"
 
 #include <boost/container/small_vector.hpp>
 

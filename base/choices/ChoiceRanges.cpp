@@ -17,7 +17,6 @@
 #include <boost/unordered_map.hpp>
 
 #include <algorithm>
-#include <limits>
 #include <numeric>
 #include <optional>
 

@@ -6,7 +6,6 @@ cmake_path(SET root NORMALIZE ${CMAKE_CURRENT_LIST_DIR}/../..)
 include(${root}/cmake/Arrows.cmake)
 
 set(most_files 25) # in one folder
-set(one_more 26)
 
 # The layer that a file (its path from the root) belongs to; empty for none.
 function(layer_of file result)
@@ -68,16 +67,15 @@ endfunction()
 # The complaints about names and folders: a header and a source share a name only for one subject.
 function(inspect_names tree complaints_result)
   set(complaints)
-  set(names)
+  math(EXPR too_many "${most_files} + 1")
   file(GLOB_RECURSE files RELATIVE ${tree} ${tree}/base/* ${tree}/parser/* ${tree}/host/* ${tree}/tools/* ${tree}/tests/*
     ${tree}/benchmarks/* ${tree}/fuzz/*)
   list(FILTER files EXCLUDE REGEX "^tests/(data|architecture)/")
   foreach(file IN LISTS files)
     cmake_path(GET file PARENT_PATH folder)
     string(MAKE_C_IDENTIFIER "${folder}" key)
-    list(APPEND folders ${folder})
     math(EXPR files_of_${key} "0${files_of_${key}} + 1")
-    if(files_of_${key} EQUAL ${one_more})
+    if(files_of_${key} EQUAL ${too_many})
       list(APPEND complaints "${folder}: more than ${most_files} files")
     endif()
     cmake_path(GET file FILENAME name)
