@@ -15,13 +15,15 @@ if(VTSYM_CCACHE AND NOT CMAKE_CXX_COMPILER_LAUNCHER)
 endif()
 
 add_library(vtsym_options INTERFACE)
-target_compile_options(vtsym_options INTERFACE -fPIC -Wall -Wextra -Wpedantic -Wconversion -Wshadow
+target_compile_options(vtsym_options INTERFACE -fPIC -Wall -Wextra -Wpedantic -Wconversion
+  $<$<NOT:$<BOOL:${CMAKE_UNITY_BUILD}>>:-Wshadow> # names of several sources in one may shadow each other
   -fmacro-prefix-map=${PROJECT_SOURCE_DIR}/=)
 if(CMAKE_CXX_COMPILER_ID STREQUAL GNU)
   target_compile_options(vtsym_options INTERFACE -fpch-preprocess)
   if(CMAKE_CXX_COMPILER_VERSION VERSION_LESS 13)
     # False alarms inside std::string and Boost.Container once they are inlined; the sanitizers see the real ones.
-    target_compile_options(vtsym_options INTERFACE -Wno-restrict -Wno-stringop-overflow -Wno-stringop-overread)
+    target_compile_options(vtsym_options INTERFACE -Wno-restrict -Wno-stringop-overflow -Wno-stringop-overread
+      $<$<BOOL:${CMAKE_UNITY_BUILD}>:-Wno-array-bounds>)
   endif()
 endif()
 if(VTSYM_WERROR)

@@ -1,10 +1,28 @@
-# Installed: the shared library, its headers, the CMake package, the pkg-config file and the program.
+# Installed: the shared library, its headers, the CMake package, the pkg-config file, and the program with its manual page and
+# completions.
 
 include(CMakePackageConfigHelpers)
 
 install(TARGETS vtsym EXPORT vtsymTargets LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR})
 if(TARGET vtsym_program)
   install(TARGETS vtsym_program RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR})
+
+  # The program writes them itself, so that they show the options that it has.
+  set(pages)
+  function(vtsym_install_page name directory) # arguments of the program
+    set(page ${PROJECT_BINARY_DIR}/pages/${name})
+    add_custom_command(OUTPUT ${page}
+      COMMAND ${CMAKE_COMMAND} -E make_directory ${PROJECT_BINARY_DIR}/pages
+      COMMAND vtsym_program ${ARGN} >${page}
+      DEPENDS vtsym_program VERBATIM)
+    install(FILES ${page} DESTINATION ${directory})
+    set(pages ${pages} ${page} PARENT_SCOPE)
+  endfunction()
+  vtsym_install_page(vtsym.1 ${CMAKE_INSTALL_MANDIR}/man1 man)
+  vtsym_install_page(vtsym ${CMAKE_INSTALL_DATADIR}/bash-completion/completions completion bash)
+  vtsym_install_page(_vtsym ${CMAKE_INSTALL_DATADIR}/zsh/site-functions completion zsh)
+  vtsym_install_page(vtsym.fish ${CMAKE_INSTALL_DATADIR}/fish/vendor_completions.d completion fish)
+  add_custom_target(vtsym_pages ALL DEPENDS ${pages})
 endif()
 
 # The headers that the umbrella header reaches are the public ones.

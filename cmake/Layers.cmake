@@ -63,14 +63,13 @@ target_link_libraries(vtsym PRIVATE ${VTSYM_LAYER_TARGETS} PUBLIC Boost::headers
 target_compile_features(vtsym PUBLIC cxx_std_20)
 target_include_directories(vtsym INTERFACE $<BUILD_INTERFACE:${PROJECT_SOURCE_DIR}>
   $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}/vtsym>)
-set_target_properties(vtsym PROPERTIES VERSION ${PROJECT_VERSION} SOVERSION ${PROJECT_VERSION_MAJOR}
+set_target_properties(vtsym PROPERTIES VERSION ${PROJECT_VERSION} SOVERSION ${VTSYM_ABI}
   LINKER_LANGUAGE CXX LIBRARY_OUTPUT_DIRECTORY ${PROJECT_BINARY_DIR}/lib)
 if(VTSYM_EMBEDDED_HOST AND NOT VTSYM_SANITIZE)
   target_link_options(vtsym PRIVATE -Wl,--no-undefined)
 endif()
 
-# The program needs the embedded host.
-if(VTSYM_EMBEDDED_HOST)
+if(VTSYM_PROGRAM AND VTSYM_EMBEDDED_HOST)
   set(program_sources)
   foreach(layer IN LISTS VTSYM_PROGRAM_LAYERS)
     vtsym_sources(${layer} sources)

@@ -1,9 +1,14 @@
-// The headers of the standard library and of Boost that most sources include; precompiled once for the library and the
-// program.
+// The headers of the standard library and of Boost that most sources include, or that compile longest; precompiled once
+// for the library and the program.
 #include <algorithm>
 #include <array>
 #include <bit>
+#include <boost/container/small_vector.hpp>
+#include <boost/container_hash/hash.hpp>
+#include <boost/multiprecision/cpp_int.hpp>
 #include <boost/unordered_map.hpp>
+#include <boost/unordered_set.hpp>
+#include <charconv>
 #include <cmath>
 #include <compare>
 #include <cstddef>
@@ -13,6 +18,7 @@
 #include <limits>
 #include <map>
 #include <memory>
+#include <numeric>
 #include <optional>
 #include <set>
 #include <span>

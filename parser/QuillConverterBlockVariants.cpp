@@ -13,7 +13,7 @@ namespace {
 
 using ParseTree = SymbolicExprFromQParseTree::ParseTree;
 
-bool isRule(const ParseTree& node, QuillRule code) {
+bool hasRule(const ParseTree& node, QuillRule code) {
     return node.kind == ParseTree::nonTerminal && node.code == static_cast<std::int32_t>(code);
 }
 
@@ -150,9 +150,9 @@ SymbolicExprId SymbolicExprFromQParseTreeBlockVariants::parseArrayBodyNode(const
     static constexpr Rule matrix{QuillRule::Matrix, 0, allChildren, 1, buildMulti<SymbolicMatrixExpr>};
     static constexpr Rule cells{QuillRule::CellArray, 0, allChildren, 1, buildMulti<SymbolicCellArrayExpr>};
     for (std::int32_t i = 0; i < node.childCount; ++i)
-        if (!isRule(node.children[i], QuillRule::Row))
+        if (!hasRule(node.children[i], QuillRule::Row))
             return refuse(node.children[i], text);
-    if (!isRule(node, QuillRule::CellArray))
+    if (!hasRule(node, QuillRule::CellArray))
         return afterOperands(node, matrix, text);
     if (node.childCount > 0)
         return afterOperands(node, cells, text);
@@ -167,7 +167,7 @@ SymbolicExprId SymbolicExprFromQParseTreeBlockVariants::visitCellIndexNode(const
 /// Converts a function: its parameters become one name, `@(p,q)`, which the printer writes before the body.
 SymbolicExprId SymbolicExprFromQParseTreeBlockVariants::visitAnonymousFunction(const ParseTree& node,
                                                                                const char* text) {
-    if (node.childCount < 2 || !isRule(node.children[0], QuillRule::ParameterList))
+    if (node.childCount < 2 || !hasRule(node.children[0], QuillRule::ParameterList))
         return refuse(node, text);
     const ParseTree& parameters = node.children[0];
     std::string head = "@(";

@@ -112,7 +112,7 @@ SymbolicExprId orientation(RuleContext& context, const RuleOperands& x) {
 }
 
 constexpr OperatorSet notOnly{SymbolicOp::Not};
-constexpr NodeRule table[] = {
+constexpr NodeRule comparisonTable[] = {
     {{notOnly, "negated constant", "~2", "false"}, negatedConstant},
     {{notOnly, "negated comparison", "~(A < 3)", "A >= 3"}, negatedComparison},
     {{notOnly, "double negation", "~~~N", "~N"}, doubleNegation},
@@ -127,7 +127,7 @@ constexpr NodeRule table[] = {
 } // namespace
 
 std::span<const NodeRule> comparisonRules() {
-    return table;
+    return comparisonTable;
 }
 
 SymbolicExprId simplifyNot(RuleContext& context, SymbolicExprId operand) {

@@ -92,7 +92,7 @@ SymbolicExprId neutralDivisor(RuleContext& context, const RuleOperands& x) {
 constexpr OperatorSet multiplyOnly{SymbolicOp::Multiply};
 constexpr OperatorSet divideOnly{SymbolicOp::Divide};
 
-constexpr NodeRule table[] = {
+constexpr NodeRule productTable[] = {
     {{multiplyOnly, "folded product", "2*3", "6"}, foldedNumbers},
     {{multiplyOnly, "cancelled quotient", "N/M*M", "N"}, cancelledQuotient},
     {{multiplyOnly, "distributed factor", "2*(N + 3)", "2*N + 6"}, distributedFactor},
@@ -107,7 +107,7 @@ constexpr NodeRule table[] = {
 } // namespace
 
 std::span<const NodeRule> productRules() {
-    return table;
+    return productTable;
 }
 
 SymbolicExprId simplifyMultiply(RuleContext& context, SymbolicExprId a, SymbolicExprId b) {

@@ -33,7 +33,7 @@ SymbolicExprId doubleMinus(RuleContext& context, const RuleOperands& x) {
 
 constexpr OperatorSet plusMinus{SymbolicOp::Plus, SymbolicOp::Minus};
 
-constexpr NodeRule table[] = {
+constexpr NodeRule sumTable[] = {
     {{plusMinus, "folded sum", "1.5 + 2.5", "4"}, foldedNumbers},
     {{plusMinus, "neutral term", "N + 0", "N"}, neutralTerm},
     {{{SymbolicOp::UnaryMinus}, "double minus", "-(-N)", "N"}, doubleMinus},
@@ -188,7 +188,7 @@ const RuleInfo& LinearSum::rule() const {
 } // namespace
 
 std::span<const NodeRule> sumRules() {
-    return table;
+    return sumTable;
 }
 
 SymbolicExprId simplifySum(RuleContext& context, SymbolicExprId root) {

@@ -29,8 +29,9 @@ public:
     /// A name in the directory.
     [[nodiscard]] std::string path(const std::string& name) const { return (path_ / name).string(); }
 
-    /// Writes a file; its path.
+    /// Writes a file and makes the folders that it is in; its path.
     std::string write(const std::string& name, const std::string& content) const {
+        std::filesystem::create_directories((path_ / name).parent_path());
         std::ofstream(path_ / name, std::ios::binary) << content;
         return path(name);
     }

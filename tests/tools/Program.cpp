@@ -60,7 +60,12 @@ ProgramResult runProgram(const Strings& arguments, const std::string& input, con
 }
 
 ProgramResult runOnTerminal(const Strings& arguments, const std::string& input, const Strings& environment) {
-    const std::string command = "exec " + inEnvironment(environment, commandOf(VTSYM_PROGRAM, arguments));
+    return runOnTerminal(TemporaryFolder(), commandOf(VTSYM_PROGRAM, arguments), input, environment);
+}
+
+ProgramResult runOnTerminal(const TemporaryFolder& place, const std::string& program, const std::string& input,
+                            const Strings& environment) {
+    const std::string command = "cd '" + place.path("") + "' && exec " + inEnvironment(environment, program);
     int terminal = -1;
     const pid_t child = forkpty(&terminal, nullptr, nullptr, nullptr);
     if (child == 0) {

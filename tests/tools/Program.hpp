@@ -23,8 +23,10 @@ ProgramResult runScript(const TemporaryFolder& place, const std::string& script,
 
 ProgramResult runProgram(const Strings& arguments, const std::string& input = {}, const Strings& environment = {});
 
-/// What a terminal shows when the program runs on it and the input is typed.
+/// What a terminal shows when the program, or the command of a shell in a folder, runs on it and the input is typed.
 ProgramResult runOnTerminal(const Strings& arguments, const std::string& input, const Strings& environment);
+ProgramResult runOnTerminal(const TemporaryFolder& place, const std::string& program, const std::string& input,
+                            const Strings& environment);
 
 /// Runs the commands of a file of tests/data/cases, each in a folder with the given files, and expects what is written.
 /// The first character of a line says what it is; any other line, or the rest of one after a \, is a line of output:

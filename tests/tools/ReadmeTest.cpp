@@ -13,7 +13,7 @@ namespace fs = std::filesystem;
 const fs::path root = VTSYM_TEST_DATA "/../..";
 
 std::vector<fs::path> pages() {
-    std::vector<fs::path> pages{root / "README.md", root / "CONTRIBUTING.md"};
+    std::vector<fs::path> pages{root / "README.md", root / "CONTRIBUTING.md", root / "THIRD-PARTY.md"};
     for (const fs::directory_entry& entry : fs::recursive_directory_iterator(root / "docs"))
         if (entry.path().extension() == ".md")
             pages.push_back(entry.path());
@@ -58,6 +58,17 @@ TEST(Documentation, LinksToFilesThatExist) {
                 EXPECT_TRUE(fs::exists(page.parent_path() / (*match)[1].str())) << page << ": " << line;
     }
     EXPECT_GT(links, 10U);
+}
+
+TEST(Documentation, NamesTheLicenceOfEveryDependency) {
+    std::ostringstream licences;
+    licences << std::ifstream(root / "THIRD-PARTY.md").rdbuf();
+    for (const fs::directory_entry& list : fs::directory_iterator(root / "cmake/packages")) {
+        std::ifstream stream(list.path());
+        for (std::string package; std::getline(stream, package);)
+            if (!package.empty() && !package.starts_with('#'))
+                EXPECT_NE(licences.str().find("`" + package + "`"), std::string::npos) << package;
+    }
 }
 
 } // namespace

@@ -21,12 +21,15 @@ constexpr int wrongUsage = 2;
 constexpr const char* description =
     "Simplifies, compares and converts conditions, and finds the dead ones in models and in C and C++ sources.";
 
-constexpr const char* notes =
+constexpr const char* programNotes =
     R"(Commands on texts answer every line of standard input by one line; a text without an answer leaves an empty line, and
 standard error says why.
 
 Exit status: 0 every text was answered, 1 some were not, 2 the command line is wrong; of scan and check: 0 no findings,
 1 findings, 2 something could not be read.
+
+Environment: NO_COLOR, when not empty, turns colours off; VTSYM_FEATURES sets feature flags, as --feature does, with commas
+between them; VTSYM_LOG is the least level of messages of the library: debug, info, warning, error or off.
 
 Examples:
   vtsym simplify 'x > 2 && x != 3 && x < 5'
@@ -52,9 +55,9 @@ void complain(Console& console, const std::string& problem) {
 
 /// Reads the command line and runs its command.  `onError` becomes the status for a command that throws.
 int readAndRun(Console& console, std::vector<std::string> arguments, ExitStatus& onError) {
-    CommandLine commandLine(description, VTSYM_VERSION, notes);
+    CommandLine commandLine(description, VTSYM_VERSION, programNotes);
     for (const auto add : {addSimplify, addCompare, addGiven, addCheck, addScan, addConvert, addPreprocess, addTree,
-                           addEval, addDims, addSymbols, addReplace, addRepl, addOperators})
+                           addEval, addDims, addSymbols, addReplace, addRepl, addOperators, addManual, addCompletion})
         add(commandLine);
     addFeatureOption(commandLine);
     if (arguments.empty()) {

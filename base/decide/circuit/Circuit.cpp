@@ -14,12 +14,12 @@ namespace VT {
 
 namespace {
 
-constexpr std::size_t firstSlots = 256;
+constexpr std::size_t firstIndexSlots = 256;
 
 /// How often the Ors of an And are looked at again after one of them left a single operand.
 constexpr int resolutions = 3;
 
-std::size_t slotFor(std::uint64_t hash, std::size_t slots) noexcept {
+std::size_t slotOfHash(std::uint64_t hash, std::size_t slots) noexcept {
     return static_cast<std::size_t>(hash >> 32U) & (slots - 1);
 }
 
@@ -41,7 +41,7 @@ void Circuit::clear() {
     nodes_.assign(1, {noQuantity, 0, 0});
     ends_.clear();
     operands_.clear();
-    index_.assign(firstSlots, 0);
+    index_.assign(firstIndexSlots, 0);
     marks_.assign(1, {});
     byQuantity_.clear();
     gathering_ = 0;
@@ -58,7 +58,7 @@ std::uint64_t Circuit::hashOf(const Node& node) const {
 void Circuit::growIndex() {
     std::vector<std::uint32_t> grown(index_.size() * 2, 0);
     for (std::uint32_t number = 1; number < nodes_.size(); ++number) {
-        std::size_t at = slotFor(hashOf(nodes_[number]), grown.size());
+        std::size_t at = slotOfHash(hashOf(nodes_[number]), grown.size());
         while (grown[at] != 0)
             at = (at + 1) & (grown.size() - 1);
         grown[at] = number;
@@ -71,7 +71,7 @@ Gate Circuit::intern(Quantity quantity, std::span<const Value> values, Values& s
     steps_.take(values.size());
     if ((nodes_.size() + 1) * 2 > index_.size())
         growIndex();
-    std::size_t at = slotFor(hashValues(quantity, values), index_.size());
+    std::size_t at = slotOfHash(hashValues(quantity, values), index_.size());
     for (; index_[at] != 0; at = (at + 1) & (index_.size() - 1), ++probes_) {
         const Node& node = nodes_[index_[at]];
         if (node.quantity == quantity && node.count == values.size() &&

@@ -13,7 +13,7 @@ namespace VT {
 
 namespace {
 
-constexpr std::size_t firstSlots = 64;
+constexpr std::size_t firstTreeSlots = 64;
 constexpr std::size_t searchedValues = 16; ///< without a map
 constexpr std::size_t rowLevels = 64;      ///< and values up to which they are kept in rows
 constexpr std::size_t rowValues = std::size_t{1} << 16U;
@@ -28,8 +28,8 @@ std::uint64_t keyOf(std::int64_t value) {
 void SmallestPath::beginTrees() {
     branches_.assign(1, {});
     if (index_.size() > limits::keptSlots)
-        std::vector<std::uint32_t>(firstSlots).swap(index_);
-    index_.resize(std::max(index_.size(), firstSlots));
+        std::vector<std::uint32_t>(firstTreeSlots).swap(index_);
+    index_.resize(std::max(index_.size(), firstTreeSlots));
     std::ranges::fill(index_, 0);
     values_.assign(1, 0);
     leaves_.clear();

@@ -13,7 +13,7 @@ namespace vtsym {
 
 namespace {
 
-constexpr std::size_t shownBytes = 200; ///< of a condition on the way
+constexpr std::size_t shownConditionBytes = 200; ///< of a condition on the way
 
 /// Records the rules that fire during its life.
 class Listener : public VT::RuleListener {
@@ -68,7 +68,7 @@ std::string Explanation::step(VT::SymbolicExprId condition) const {
     const VT::SymbolicExprPrinter& printer = conditions_.service().simplifier().printer();
     if (const std::uint64_t bytes = printer.textLength(condition); bytes > printedBytes)
         return lengthOfText(bytes);
-    return VT::shownText(conditions_.printUnconverted(condition, options_.toQuill()), shownBytes);
+    return VT::shownText(conditions_.printUnconverted(condition, options_.toQuill()), shownConditionBytes);
 }
 
 void Explanation::appendText(const Style& style, std::string& out) const {

@@ -18,7 +18,7 @@ namespace vtsym {
 namespace {
 
 constexpr const char* lastResult = "ans";
-constexpr std::size_t shownBytes = 80; ///< of an unknown command
+constexpr std::size_t shownWordBytes = 80; ///< of an unknown command
 
 std::string_view trimmed(std::string_view text) {
     constexpr const char* blanks = " \t\r";
@@ -80,7 +80,7 @@ const Session::CommandRow& Session::commandOf(std::string_view word) {
     for (const CommandRow& command : commands)
         if (word == command.word)
             return command;
-    throw CommandError("There is no command " + VT::shownText(word, shownBytes) + "; :help lists them.");
+    throw CommandError("There is no command " + VT::shownText(word, shownWordBytes) + "; :help lists them.");
 }
 
 /// Reads a part of the line.

@@ -1,5 +1,5 @@
 // One sentence for each kind of obstacle, with the expression that it is about.
-// Expressions are cut to shownBytes; a very long one is not printed at all.
+// Expressions are cut to shownExpressionBytes; a very long one is not printed at all.
 #include "tools/vtsym/answers/Warnings.hpp"
 
 #include "base/core/Table.hpp"
@@ -11,7 +11,7 @@ namespace vtsym {
 
 namespace {
 
-constexpr std::size_t shownBytes = 60;
+constexpr std::size_t shownExpressionBytes = 60;
 
 class Wording {
 public:
@@ -38,7 +38,7 @@ std::string Wording::text(VT::SymbolicExprId id) const {
         return "(nothing)";
     if (const std::uint64_t bytes = printer_.textLength(id); bytes > printedBytes)
         return lengthOfText(bytes);
-    return VT::shownText(printer_(id), shownBytes);
+    return VT::shownText(printer_(id), shownExpressionBytes);
 }
 
 std::string Wording::of(const VT::CTextFinding& finding) const {
@@ -58,7 +58,7 @@ std::string Wording::of(const VT::CTextFinding& finding) const {
                text(finding.id);
     case VT::CTextObstacle::SharedMacroName:
         return text(finding.id) + " and " + text(finding.other) + " are both written " +
-               VT::shownText(VT::PreprocessorVCExpr(table_, false).print(finding.id), shownBytes);
+               VT::shownText(VT::PreprocessorVCExpr(table_, false).print(finding.id), shownExpressionBytes);
     case VT::CTextObstacle::VariantKeyword:
         return std::string(where_) + " does not know the variant keyword " + text(finding.id);
     case VT::CTextObstacle::NoSuchName:

@@ -17,7 +17,7 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* notes =
+constexpr const char* checkNotes =
     R"(A model is a JSON file of nested blocks; wherever a block is active, exactly one of its choices should be.
 docs/model.schema.json describes the file.  Every finding is proven, over integers without bounds unless --bits is given.
 
@@ -143,7 +143,7 @@ SearchResult check(const CheckOptions& options, Console& console) {
 } // namespace
 
 void addCheck(CommandLine& program) {
-    Command& command = program.add("check", "Find dead, overlapping and missing choices in a model", notes);
+    Command& command = program.add("check", "Find dead, overlapping and missing choices in a model", checkNotes);
     const auto options = std::make_shared<CheckOptions>();
     command.addArgument({"MODEL", "File of the model"}, options->file);
     command.require("MODEL");

@@ -23,5 +23,7 @@ void addEval(CommandLine& program);
 void addDims(CommandLine& program);
 void addOperators(CommandLine& program);
 void addScan(CommandLine& program);
+void addManual(CommandLine& program);
+void addCompletion(CommandLine& program);
 
 } // namespace vtsym

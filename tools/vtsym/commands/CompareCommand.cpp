@@ -10,7 +10,7 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* notes =
+constexpr const char* compareNotes =
     R"(Conditions are over integers without bounds unless --bits is given.  The relation is exact: equivalent, disjoint,
 implies, implied by or overlaps.  Assignments prove it: for which values the first holds alone, the second alone, or
 both.  A question that takes too many steps stays undecided.
@@ -107,7 +107,7 @@ private:
 
 void addCompare(CommandLine& program) {
     Command& command =
-        program.add("compare", "Compare two conditions: equivalent, disjoint, implied or overlapping", notes);
+        program.add("compare", "Compare two conditions: equivalent, disjoint, implied or overlapping", compareNotes);
     const auto options = std::make_shared<PairOptions>();
     addPairOptions(command, *options, "A", "B");
     command.run = [options](Console& console) {

@@ -9,7 +9,7 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* notes = R"(An operator that a language lacks becomes a call: a % b is rem(a,b) in Quill.
+constexpr const char* convertNotes = R"(An operator that a language lacks becomes a call: a % b is rem(a,b) in Quill.
 
 Examples:
   vtsym convert --to quill '(F & 4) != 0 && a % b == 1'
@@ -21,7 +21,7 @@ Examples:
 
 void addConvert(CommandLine& program) {
     Command& command =
-        program.add("convert", "Translate conditions between C, Quill and preprocessor directives", notes);
+        program.add("convert", "Translate conditions between C, Quill and preprocessor directives", convertNotes);
     const auto options = std::make_shared<TextOptions>();
     addTextOptions(command, *options);
     addLanguageOption(command, *options);

@@ -24,7 +24,7 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* notes =
+constexpr const char* dimsNotes =
     R"(Each answer has a line for every form: the text with integers for its numbers, the simplified form, and that form with
 its divisions pulled outwards; then the symbols and, if all of them are defined, the value.  Divisions are taken to be
 exact.
@@ -198,7 +198,7 @@ bool prove(const DimsOptions& options, Console& console) {
 } // namespace
 
 void addDims(CommandLine& program) {
-    Command& command = program.add("dims", "Rearrange and evaluate dimension expressions in Quill", notes);
+    Command& command = program.add("dims", "Rearrange and evaluate dimension expressions in Quill", dimsNotes);
     const auto options = std::make_shared<DimsOptions>();
     addTexts(command, *options);
     addDefinitions(command, options->definitions);

@@ -15,7 +15,7 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* notes =
+constexpr const char* evalNotes =
     R"(Integers have 32 bits: + - * wrap, / truncates and saturates.  The last definition of a name counts, and a value may use
 other definitions.
 
@@ -67,7 +67,7 @@ void Evaluator::answer(const std::string& text, std::string& out) {
 } // namespace
 
 void addEval(CommandLine& program) {
-    Command& command = program.add("eval", "Evaluate expressions", notes);
+    Command& command = program.add("eval", "Evaluate expressions", evalNotes);
     const auto options = std::make_shared<EvalOptions>();
     const auto evaluator = std::make_shared<std::optional<Evaluator>>();
     addTextOptions(command, *options);

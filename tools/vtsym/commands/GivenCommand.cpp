@@ -8,7 +8,7 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* notes =
+constexpr const char* givenNotes =
     R"(The answer is proven equal to the condition wherever the known one holds; elsewhere it may differ.
 
 Examples:
@@ -44,7 +44,7 @@ void appendReasonsJson(const Conditions& conditions, const PairOptions& options,
 } // namespace
 
 void addGiven(CommandLine& program) {
-    Command& command = program.add("given", "Shorten conditions under a condition that is known to hold", notes);
+    Command& command = program.add("given", "Shorten conditions under a condition that is known to hold", givenNotes);
     const auto options = std::make_shared<PairOptions>();
     addPairOptions(command, *options, "KNOWN", "CONDITION");
     addLanguageOption(command, *options);

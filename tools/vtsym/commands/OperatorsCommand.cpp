@@ -13,7 +13,7 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* notes = R"(A smaller precedence binds tighter.
+constexpr const char* operatorsNotes = R"(A smaller precedence binds tighter.
 
 Examples:
   vtsym operators
@@ -97,7 +97,7 @@ std::string jsonOf(const VT::OperatorInfo& row) {
 } // namespace
 
 void addOperators(CommandLine& program) {
-    Command& command = program.add("operators", "List the operators of expressions", notes);
+    Command& command = program.add("operators", "List the operators of expressions", operatorsNotes);
     const auto json = std::make_shared<bool>(false);
     command.addFlag("--json", "Answer with one JSON object per operator", *json);
     command.run = [json](Console& console) {

@@ -13,7 +13,7 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* notes =
+constexpr const char* preprocessNotes =
     R"(Members become macro names: s.x is s_x.  The condition that always holds is written as 1.
 
 Examples:
@@ -73,7 +73,7 @@ void Preprocessor::answer(const std::string& text, std::string& out) {
 } // namespace
 
 void addPreprocess(CommandLine& program) {
-    Command& command = program.add("pp", "Write conditions for preprocessor directives", notes);
+    Command& command = program.add("pp", "Write conditions for preprocessor directives", preprocessNotes);
     const auto options = std::make_shared<PreprocessOptions>();
     options->to = "pp";
     addTextOptions(command, *options);

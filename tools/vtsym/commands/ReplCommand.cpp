@@ -11,7 +11,7 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* notes =
+constexpr const char* replNotes =
     R"(On a terminal, lines are edited, with a history, and Tab completes names.  Otherwise every line of standard input is
 answered by one line, as by the other commands.  :help lists the commands of the prompt.
 
@@ -43,7 +43,7 @@ bool talk(Session& session, Console& console) {
 } // namespace
 
 void addRepl(CommandLine& program) {
-    Command& command = program.add("repl", "Simplify conditions at a prompt", notes);
+    Command& command = program.add("repl", "Simplify conditions at a prompt", replNotes);
     const auto options = std::make_shared<TextOptions>();
     addSourceOption(command, *options);
     command.run = [options](Console& console) {

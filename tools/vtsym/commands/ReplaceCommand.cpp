@@ -12,7 +12,7 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* notes =
+constexpr const char* replaceNotes =
     R"(All names are replaced at once, so that two can be exchanged.  The names of functions and members stay.
 
 Examples:
@@ -44,7 +44,7 @@ Names takeNames(std::vector<std::string>& arguments) {
 } // namespace
 
 void addReplace(CommandLine& program) {
-    Command& command = program.add("replace", "Replace names in conditions", notes);
+    Command& command = program.add("replace", "Replace names in conditions", replaceNotes);
     const auto options = std::make_shared<TextOptions>();
     const auto names = std::make_shared<Names>();
     addTextOptions(command, *options, "NAME=NAME... and then texts to work on");

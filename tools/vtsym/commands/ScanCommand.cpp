@@ -15,7 +15,7 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* notes =
+constexpr const char* scanNotes =
     R"(Compares every #if, #ifdef, #ifndef, #elif, #elifdef and #elifndef with the directives around it and those before it in
 its chain, and reports branches that no build enters, conditions that always hold, and conditions with a shorter text.
 Directories are searched for C and C++ files.  Nothing is concluded about a macro across a #define or #undef of it, and an
@@ -133,7 +133,7 @@ SearchResult scan(const ScanOptions& options, Console& console) {
 
 void addScan(CommandLine& program) {
     Command& command =
-        program.add("scan", "Find dead, redundant and shortenable preprocessor conditions in C and C++", notes);
+        program.add("scan", "Find dead, redundant and shortenable preprocessor conditions in C and C++", scanNotes);
     const auto options = std::make_shared<ScanOptions>();
     const auto take = [options](std::vector<std::string> paths) { options->paths = std::move(paths); };
     command.addArguments({"PATH", "Files and directories"}, take);

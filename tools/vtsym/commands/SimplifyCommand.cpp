@@ -10,7 +10,7 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* notes =
+constexpr const char* simplifyNotes =
     R"(Every name stands for an integer of any size, and every value but zero is true.  Quotients in conditions are truncated, as
 in C; in dimensions, such as N/2*2, they are exact.
 
@@ -88,7 +88,7 @@ VT::SymbolicExprId Simplifier::answerInDetail(const std::string& text, std::stri
 } // namespace
 
 void addSimplify(CommandLine& program) {
-    Command& command = program.add("simplify", "Find the shortest equal form of conditions", notes);
+    Command& command = program.add("simplify", "Find the shortest equal form of conditions", simplifyNotes);
     const auto options = std::make_shared<SimplifyOptions>();
     addTextOptions(command, *options);
     addLanguageOption(command, *options);

@@ -15,7 +15,7 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* notes =
+constexpr const char* symbolsNotes =
     R"(Symbols are listed as Quill writes them, each once, in the order of their first occurrence.
 
 Examples:
@@ -67,7 +67,7 @@ VT::VCSymbolTypes kindsOf(const SymbolsOptions& options) {
 } // namespace
 
 void addSymbols(CommandLine& program) {
-    Command& command = program.add("symbols", "List the symbols of conditions", notes);
+    Command& command = program.add("symbols", "List the symbols of conditions", symbolsNotes);
     const auto options = std::make_shared<SymbolsOptions>();
     addTextOptions(command, *options);
     const auto take = [options](const std::vector<std::string>& lists) { options->kinds = kindsIn(lists); };

@@ -12,7 +12,7 @@ namespace vtsym {
 
 namespace {
 
-constexpr const char* notes =
+constexpr const char* treeNotes =
     R"(Identifiers count the nodes of a text in the order in which they were made; false is 0 and true is 1.
 
 Examples:
@@ -50,7 +50,7 @@ void answer(const TreeOptions& options, const Style& style, const std::string& t
 } // namespace
 
 void addTree(CommandLine& program) {
-    Command& command = program.add("tree", "Show expressions as trees", notes);
+    Command& command = program.add("tree", "Show expressions as trees", treeNotes);
     const auto options = std::make_shared<TreeOptions>();
     addTextOptions(command, *options);
     command.addFlag("--dot", "Answer with graphs for Graphviz", options->dot);

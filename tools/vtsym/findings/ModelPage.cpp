@@ -17,13 +17,13 @@ namespace {
 constexpr std::size_t mostSets = 200;
 constexpr std::size_t mostColumns = 60;
 constexpr std::size_t denseColumns = 20;
-constexpr std::size_t mostFindings = 200; ///< of one set
-constexpr std::size_t shownBytes = 2000;  ///< of one text
+constexpr std::size_t mostFindings = 200;    ///< of one set
+constexpr std::size_t shownTextBytes = 2000; ///< of one text
 
 /// A text that is safe between tags and in attributes.
 std::string escaped(const std::string& text) {
     std::string html;
-    for (const char c : VT::shownText(text, shownBytes)) {
+    for (const char c : VT::shownText(text, shownTextBytes)) {
         switch (c) {
         case '&':
             html.append("&amp;");

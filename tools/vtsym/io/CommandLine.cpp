@@ -22,7 +22,7 @@ namespace {
 constexpr std::string_view plainMark("\0", 1);
 constexpr std::string_view endMark("\0\0", 2); ///< of an argument after `--`
 
-constexpr std::size_t shownBytes = 80;
+constexpr std::size_t shownArgumentBytes = 80;
 constexpr std::size_t helpColumn = 34; ///< where descriptions begin
 
 /// Marks the arguments that are not options: texts, paths, the values of options, and all that follow `--`, which is
@@ -84,7 +84,7 @@ std::string unexpected(const std::vector<std::string>& arguments) {
 } // namespace
 
 std::string quotedArgument(const std::string& argument) {
-    return "'" + VT::shownText(argument, shownBytes) + "'";
+    return "'" + VT::shownText(argument, shownArgumentBytes) + "'";
 }
 
 void requireOneOf(const std::string& option, const std::string& value, const std::vector<std::string>& words) {
@@ -98,6 +98,36 @@ void requireOneOf(const std::string& option, const std::string& value, const std
 
 const std::string& Command::name() const {
     return app_.get_name();
+}
+
+void Command::hide() {
+    app_.group("");
+}
+
+bool Command::isHidden() const {
+    return app_.get_group().empty();
+}
+
+CommandEntry Command::entry() const {
+    CommandEntry result{app_.get_name(), app_.get_description(), app_.get_footer(), {}};
+    for (const CLI::Option* const option : std::as_const(app_).get_options()) {
+        OptionEntry each;
+        for (const std::string& name : option->get_snames())
+            each.names.push_back("-" + name);
+        for (const std::string& name : option->get_lnames())
+            each.names.push_back("--" + name);
+        if (option->get_positional())
+            each.names.assign(1, option->get_name());
+        each.description = option->get_description();
+        if (option->get_items_expected_max() > 0)
+            each.value = option->get_positional() ? option->get_name() : option->get_type_name();
+        if (const auto words = words_.find(each.names.back()); words != words_.end())
+            each.words = words->second;
+        each.repeats = option->get_multi_option_policy() == CLI::MultiOptionPolicy::TakeAll;
+        each.isRequired = option->get_required();
+        result.options.push_back(std::move(each));
+    }
+    return result;
 }
 
 /// Adds an option past the library's own conversions, which read some texts as signs.
@@ -130,6 +160,7 @@ void Command::addArguments(const OptionHelp& help, std::function<void(std::vecto
 
 void Command::addChoice(const OptionHelp& help, std::vector<std::string> words,
                         std::function<void(const std::string&)> take) {
+    words_.emplace(help.name, words);
     addArgument(help, [name = help.name, words = std::move(words), take = std::move(take)](const std::string& value) {
         requireOneOf(name, value, words);
         take(value);
@@ -154,6 +185,7 @@ void Command::exclude(const std::string& name, const std::string& other) {
 
 CommandLine::CommandLine(const std::string& description, const std::string& version, const std::string& notes)
     : app_(std::make_unique<CLI::App>(description, "vtsym")),
+      version_(version),
       program_(*app_) {
     app_->set_version_flag("--version", "vtsym " + version, "Print the version and exit");
     app_->require_subcommand(1);
@@ -234,6 +266,14 @@ Request CommandLine::read(std::vector<std::string> arguments) {
 
 std::string CommandLine::help() const {
     return app_->help();
+}
+
+ProgramEntry CommandLine::entries() const {
+    ProgramEntry result{program_.entry(), version_, {}};
+    for (const Command& command : commands_)
+        if (!command.isHidden())
+            result.commands.push_back(command.entry());
+    return result;
 }
 
 std::string CommandLine::commandRead() const {

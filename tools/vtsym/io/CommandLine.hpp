@@ -5,10 +5,12 @@
 // syntax for lists, subcommands and the end of a command does not apply to them.
 #pragma once
 
+#include "tools/vtsym/io/CommandEntries.hpp"
 #include "tools/vtsym/io/ExitStatus.hpp"
 
 #include <functional>
 #include <list>
+#include <map>
 #include <memory>
 #include <stdexcept>
 #include <string>
@@ -57,6 +59,11 @@ public:
     Command& operator=(const Command&) = delete;
 
     [[nodiscard]] const std::string& name() const;
+    [[nodiscard]] CommandEntry entry() const;
+
+    /// Leaves the command out of the help, the manual page and completions.
+    void hide();
+    [[nodiscard]] bool isHidden() const;
 
     /// Adds an option that takes one argument.  `take` may throw UsageError.
     void addArgument(const OptionHelp& help, std::function<void(const std::string&)> take);
@@ -84,6 +91,7 @@ private:
     CLI::Option* add(const OptionHelp& help, std::function<void(std::vector<std::string>)> take);
 
     CLI::App& app_;
+    std::map<std::string, std::vector<std::string>> words_; ///< the only values of an option
 };
 
 /// What a command line asks for: a command to run, or a text to print.
@@ -111,6 +119,9 @@ public:
 
     [[nodiscard]] std::string help() const;
 
+    /// The program and its commands, except for hidden ones.
+    [[nodiscard]] ProgramEntry entries() const;
+
     /// The program and the command that was read: "vtsym simplify".
     [[nodiscard]] std::string commandRead() const;
 
@@ -120,6 +131,7 @@ private:
     void mark(std::vector<std::string>& arguments);
 
     std::unique_ptr<CLI::App> app_;
+    std::string version_;
     Command program_;
     std::list<Command> commands_;
 };
