@@ -1,0 +1,50 @@
+# shellcheck shell=sh
+# The binary interface of the library: records it at a release, and compares a build with the last record.
+#
+# A record is what abidw finds in the library and its debugging information, cut down to what the installed headers declare,
+# and beside it the version and the name of the library that it was made from.  abidiff compares two of them: bit 4 of its status
+# is a difference, bit 8 one that breaks programs for certain.  Added symbols are no difference here.
+# Sourced by ./package with `root` set to the repository.
+
+# abi_record LIBRARY HEADERS FILE: writes the record of a library with debugging information.
+abi_record() {
+    abidw --no-corpus-path --no-comp-dir-path --no-show-locs --no-elf-needed --drop-private-types --drop-undefined-syms \
+        --exported-interfaces-only --type-id-style hash --headers-dir "$2" --out-file "$3" "$1"
+}
+
+# soname FILE: the name of a library, or that in a record.
+soname() {
+    case $1 in
+    *.abi) sed -n "s/.*soname='\([^']*\)'.*/\1/p" "$1" | head -n 1 ;;
+    *) objdump -p "$1" | sed -n 's/ *SONAME *//p' ;;
+    esac
+}
+
+# allows_break OLD NEW: whether a program for version OLD may have to be changed for version NEW: before 1.0 where the second
+# number is greater, later where the first is.
+allows_break() {
+    old_major=${1%%.*} new_major=${2%%.*}
+    old_rest=${1#*.} new_rest=${2#*.}
+    [ "$new_major" -gt "$old_major" ] && return 0
+    [ "$new_major" -eq 0 ] && [ "$old_major" -eq 0 ] && [ "${new_rest%%.*}" -gt "${old_rest%%.*}" ]
+}
+
+# abi_gate RECORD OLD-VERSION LIBRARY HEADERS NEW-VERSION: fails when the library breaks programs that were linked with the
+# recorded one, unless its version allows that and it has another name, so that both can be installed.
+abi_gate() {
+    abi_status=0
+    abidiff --no-added-syms --drop-private-types --headers-dir2 "$4" "$1" "$3" || abi_status=$?
+    if [ $((abi_status & 3)) -ne 0 ]; then
+        echo "abidiff failed with status $abi_status" >&2
+        return 1
+    fi
+    [ $((abi_status & 12)) -ne 0 ] || return 0
+    if ! allows_break "$2" "$5"; then
+        echo "the interface above differs from that of $2, which version $5 does not allow: keep it, or raise the version" >&2
+        return 1
+    fi
+    if [ "$(soname "$1")" = "$(soname "$3")" ]; then
+        echo "the interface above differs from that of $2 under one name: raise VTSYM_ABI and the names of the packages" >&2
+        return 1
+    fi
+}

@@ -1,0 +1,33 @@
+#!/bin/sh
+# try-packages.sh DIRECTORY TREE: runs the tests of debian/tests with the packages of a directory.
+#
+# They are installed in a new root of Debian with nothing else in it.  Where none can be made, they are installed on this
+# machine and removed afterwards.
+set -eu
+directory=$1
+tree=$2
+root=$directory/root
+
+remove_root() {
+    rm -rf --one-file-system "$root"
+}
+
+sources=$(grep -ls debian-archive-keyring /etc/apt/sources.list /etc/apt/sources.list.d/*.list /etc/apt/sources.list.d/*.sources || :)
+codename=$(. /etc/os-release && echo "$VERSION_CODENAME")
+# shellcheck disable=SC2086 # words on purpose
+if mmdebstrap --variant=apt --mode=root "$codename" "$root" $sources >"$directory/root.log" 2>&1; then
+    echo 'vtsym: trying the packages in a new root of Debian' >&2
+    trap remove_root EXIT
+    runner="chroot $root"
+else
+    echo 'vtsym: trying the packages on this machine, since no new root can be made (build/package/root.log)' >&2
+    remove_root
+    trap 'apt-get purge -y libvtsym0 libvtsym-dev vtsym >/dev/null' EXIT
+    runner=null
+fi
+# shellcheck disable=SC2086
+autopkgtest --no-built-binaries --output-dir "$directory/tests" "$directory"/*.deb "$tree" -- $runner >"$directory/tests.log" 2>&1 || {
+    cat "$directory/tests.log" >&2
+    exit 1
+}
+grep -E '(PASS|FAIL|SKIP)' "$directory/tests/summary" 
