@@ -16,8 +16,8 @@ set(VTSYM_FOLDERS_text base/text)
 set(VTSYM_FOLDERS_transform base/transform)
 set(VTSYM_FOLDERS_print base/print)
 set(VTSYM_FOLDERS_simplify base/simplify)
-set(VTSYM_FOLDERS_decide base/decide base/decide/circuit base/decide/diagram base/decide/reasons base/decide/search base/decide/shorten
-    base/decide/solver base/decide/witness)
+set(VTSYM_FOLDERS_decide base/decide base/decide/circuit base/decide/diagram base/decide/external base/decide/reasons
+    base/decide/search base/decide/shorten base/decide/solver base/decide/witness)
 set(VTSYM_FOLDERS_eval base/eval)
 set(VTSYM_FOLDERS_parser parser)
 set(VTSYM_FOLDERS_service base/service)

@@ -11,7 +11,6 @@ list(REMOVE_ITEM bench_support ${bench_sources})
 find_package(benchmark REQUIRED)
 find_path(VTSYM_MUPARSER_INCLUDE muParser.h) # a peer to compare with; left out where it is not installed
 find_library(VTSYM_MUPARSER_LIBRARY muparser)
-include(${CMAKE_CURRENT_LIST_DIR}/Z3.cmake)
 add_custom_target(benchmarks)
 if(bench_support)
   add_library(vtsym_bench_support OBJECT EXCLUDE_FROM_ALL ${bench_support})

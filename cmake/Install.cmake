@@ -4,6 +4,9 @@
 include(CMakePackageConfigHelpers)
 
 install(TARGETS vtsym EXPORT vtsymTargets LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR})
+if(TARGET vtsym_z3)
+  install(TARGETS vtsym_z3 LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR}/vtsym COMPONENT z3)
+endif()
 if(TARGET vtsym_program)
   install(TARGETS vtsym_program RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR})
 

@@ -69,6 +69,18 @@ if(VTSYM_EMBEDDED_HOST AND NOT VTSYM_SANITIZE)
   target_link_options(vtsym PRIVATE -Wl,--no-undefined)
 endif()
 
+# The solver for what the library's own procedures leave open, in a library of its own that is loaded on demand.  A
+# header that is installed later is found then: its folder changes.
+target_link_libraries(vtsym PRIVATE ${CMAKE_DL_LIBS})
+include(cmake/Z3.cmake)
+if(VTSYM_Z3)
+  add_library(vtsym_z3 MODULE plugins/z3/Z3Plugin.cpp)
+  target_include_directories(vtsym_z3 PRIVATE ${PROJECT_SOURCE_DIR})
+  target_link_libraries(vtsym_z3 PRIVATE vtsym_options)
+  vtsym_link_z3(vtsym_z3 PRIVATE)
+  set_target_properties(vtsym_z3 PROPERTIES OUTPUT_NAME vtsym-z3 LIBRARY_OUTPUT_DIRECTORY ${PROJECT_BINARY_DIR}/lib/vtsym)
+endif()
+
 # The program needs the embedded host.  What its commands do is a library of their own, which others link too.
 if(VTSYM_PROGRAM AND VTSYM_EMBEDDED_HOST)
   set(tool_sources)
@@ -95,4 +107,7 @@ if(VTSYM_PROGRAM AND VTSYM_EMBEDDED_HOST)
   endforeach()
   set_target_properties(vtsym_program PROPERTIES OUTPUT_NAME vtsym
     RUNTIME_OUTPUT_DIRECTORY ${PROJECT_BINARY_DIR}/bin INSTALL_RPATH $ORIGIN/../${CMAKE_INSTALL_LIBDIR})
+  if(TARGET vtsym_z3)
+    add_dependencies(vtsym_program vtsym_z3)
+  endif()
 endif()

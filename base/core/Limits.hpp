@@ -132,6 +132,24 @@ inline constexpr std::uint64_t minimizingFactor = 8;
 /// undecided.
 inline constexpr std::size_t confirmations = 8192;
 
+/// What one question may cost in another solver, for each of two translations: in the solver's own unit, checks (to
+/// find an assignment that evaluation accepts, and to make it small), nodes and pairs of calls that are written for it,
+/// and megabytes that it may take in the process.  Beyond a bound the question is undecided, or the witness is as small
+/// as it is by then.
+inline constexpr unsigned solverResources = 200'000;
+inline constexpr std::size_t solverChecks = 64;
+inline constexpr std::uint64_t solverNodes = 4096;
+inline constexpr unsigned solverMegabytes = 256;
+
+/// Bits of a value in a question about bits; a question with larger ones is not asked that way.  Bits of an unknown
+/// that the question does not bound: assignments with larger values are not found.
+inline constexpr unsigned solverBits = 128;
+inline constexpr unsigned solverGuessedBits = 8;
+
+/// Questions that one search for a shorter condition, or for reasons, may ask the other solver.  Further ones are
+/// undecided where the library's own procedures leave them open.
+inline constexpr std::size_t searchSolverQuestions = 16;
+
 /// Steps that all proofs for one shorter condition may cost together: about an eighth of a second.  Beyond the bound
 /// the shortest form found so far is the result.
 inline constexpr std::uint64_t shortenSteps = std::uint64_t{1} << 20U;

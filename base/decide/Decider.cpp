@@ -2,13 +2,15 @@
 // the circuit simplifies while it is made: conditions that share operands are often decided by that.  What is left gets
 // its levels in the order in which the question mentions them, and is decided by the first of three ways that can: a
 // look at the comparisons, where they are independent; diagrams, for a share of the steps; a search over the
-// comparisons.  A question is charged what reading its conditions cost even where they were read before: that makes
-// answers, undecided ones too, independent of earlier questions.
+// comparisons.  What stays undecided goes to another solver, if there is one.  A question is charged what reading its
+// conditions cost even where they were read before: that makes answers, undecided ones too, independent of earlier
+// questions.
 #include "base/decide/Decider.hpp"
 
 #include "base/core/Limits.hpp"
 #include "base/decide/ConditionReader.hpp"
 #include "base/decide/circuit/Question.hpp"
+#include "base/decide/external/ExternalSolver.hpp"
 #include "base/decide/search/ConditionSearch.hpp"
 #include "base/decide/witness/CallCongruence.hpp"
 #include "base/decide/witness/WitnessSearch.hpp"
@@ -18,6 +20,7 @@
 #include <algorithm>
 #include <iterator>
 #include <limits>
+#include <utility>
 
 namespace VT {
 
@@ -30,7 +33,7 @@ static_assert(limits::decisionSteps <= limits::settableSteps);
 
 struct Decider::State {
     State(const SymbolicExprTable& symbols, const DecisionOptions& asked)
-        : options{asked.keywordsInForce, asked.bits32, std::min(asked.steps, limits::settableSteps)},
+        : options{asked.keywordsInForce, asked.bits32, std::min(asked.steps, limits::settableSteps), asked.solver},
           questionSteps(options.steps),
           printer(symbols, false),
           leafReader(symbols, asked.keywordsInForce),
@@ -55,12 +58,15 @@ struct Decider::State {
     Decision hold(Gate truth, std::span<const ReadCondition* const> conditions);
     void keepFunctions(Decision& decision, Gate truth, std::span<const ReadCondition* const> conditions);
     template <class Combine>
-    Decision decide(std::span<const SymbolicExprId> ids, Combine combine);
+    Decision decide(AskedOf asked, std::span<const SymbolicExprId> ids, Combine combine);
+    void askSolver(AskedOf asked, std::span<const SymbolicExprId> ids, Decision& decision);
+    std::optional<bool> evaluate(SymbolicExprId condition, const Witness& witness);
     Decision same();
     void clear();
 
     DecisionOptions options;
-    std::uint64_t questionSteps; ///< that a question may cost
+    std::uint64_t questionSteps;                                           ///< that a question may cost
+    std::size_t solverQuestions = std::numeric_limits<std::size_t>::max(); ///< that may go to the solver
     SymbolicExprPrinter printer;
     LeafReader leafReader;
     Steps steps;
@@ -195,9 +201,32 @@ void Decider::State::keepFunctions(Decision& decision, Gate truth, std::span<con
     }
 }
 
-/// Asks whether what `combine` makes of the conditions can hold.
+/// Asks another solver what stayed undecided.
+void Decider::State::askSolver(AskedOf asked, std::span<const SymbolicExprId> ids, Decision& decision) {
+    if (options.solver == nullptr || solverQuestions == 0)
+        return;
+    --solverQuestions;
+    const auto confirms = [&](const Witness& witness, std::span<const SymbolicExprId> calls) {
+        std::vector<bool> truths;
+        for (const SymbolicExprId id : ids) {
+            const auto truth = evaluate(id, witness);
+            if (!truth)
+                return false;
+            truths.push_back(*truth);
+        }
+        steps.refill(questionSteps);
+        return isAsAsked(asked, truths) &&
+               !CallCongruence(leafReader, unknowns, steps).findViolation(calls, witness).has_value();
+    };
+    Decision other = decideExternally(*options.solver, {leafReader, ids, asked, options.bits32,
+                                                        [&](SymbolicExprId id) { return printer(id); }, confirms});
+    if (!other.isUndecided())
+        decision = std::move(other);
+}
+
+/// Asks whether what `combine` makes of the conditions, which is what `asked` says, can hold.
 template <class Combine>
-Decision Decider::State::decide(std::span<const SymbolicExprId> ids, Combine combine) {
+Decision Decider::State::decide(AskedOf asked, std::span<const SymbolicExprId> ids, Combine combine) {
     if (circuit.size() > limits::circuitSize)
         clear();
     steps.refill(questionSteps);
@@ -225,6 +254,15 @@ Decision Decider::State::decide(std::span<const SymbolicExprId> ids, Combine com
         throw;
     }
     taken = questionSteps - steps.left();
+    if (decision.isUndecided() && decision.bound != DecisionBound::NoCondition) {
+        try {
+            askSolver(asked, ids, decision);
+        } catch (const StepsUsedUp&) { // stays undecided
+        } catch (...) {
+            clear();
+            throw;
+        }
+    }
     return decision;
 }
 
@@ -235,16 +273,19 @@ Decision Decider::State::same() {
 }
 
 Decision Decider::canHold(SymbolicExprId condition) {
-    return state_->decide(std::span(&condition, 1), [](std::span<const Gate> c) { return c[0]; });
+    return state_->decide(AskedOf::Holds, std::span(&condition, 1), [](std::span<const Gate> c) { return c[0]; });
 }
 
 Decision Decider::mustHold(SymbolicExprId condition) {
-    return state_->decide(std::span(&condition, 1), [](std::span<const Gate> c) { return opposite(c[0]); }).opposite();
+    return state_
+        ->decide(AskedOf::Fails, std::span(&condition, 1), [](std::span<const Gate> c) { return opposite(c[0]); })
+        .opposite();
 }
 
 Decision Decider::overlaps(SymbolicExprId a, SymbolicExprId b) {
     const SymbolicExprId pair[] = {a, b};
-    return state_->decide(pair, [&](std::span<const Gate> c) { return state_->circuit.both(c[0], c[1]); });
+    return state_->decide(AskedOf::Both, pair,
+                          [&](std::span<const Gate> c) { return state_->circuit.both(c[0], c[1]); });
 }
 
 Decision Decider::disjoint(SymbolicExprId a, SymbolicExprId b) {
@@ -255,7 +296,9 @@ Decision Decider::implies(SymbolicExprId a, SymbolicExprId b) {
     if (a == b && state_->leafReader.table().has(a))
         return state_->same();
     const SymbolicExprId pair[] = {a, b};
-    return state_->decide(pair, [&](std::span<const Gate> c) { return state_->circuit.both(c[0], opposite(c[1])); })
+    return state_
+        ->decide(AskedOf::FirstAlone, pair,
+                 [&](std::span<const Gate> c) { return state_->circuit.both(c[0], opposite(c[1])); })
         .opposite();
 }
 
@@ -265,7 +308,7 @@ Decision Decider::equivalent(SymbolicExprId a, SymbolicExprId b) {
     const SymbolicExprId pair[] = {a, b};
     Circuit& circuit = state_->circuit;
     return state_
-        ->decide(pair,
+        ->decide(AskedOf::Differ, pair,
                  [&](std::span<const Gate> c) {
                      return circuit.either(circuit.both(c[0], opposite(c[1])), circuit.both(opposite(c[0]), c[1]));
                  })
@@ -278,7 +321,7 @@ Decision Decider::equivalentGiven(SymbolicExprId a, SymbolicExprId b, SymbolicEx
     const SymbolicExprId three[] = {a, b, known};
     Circuit& circuit = state_->circuit;
     return state_
-        ->decide(three,
+        ->decide(AskedOf::DifferGiven, three,
                  [&](std::span<const Gate> c) {
                      const Gate onlyA = circuit.both(c[0], opposite(c[1]));
                      const Gate onlyB = circuit.both(opposite(c[0]), c[1]);
@@ -305,7 +348,9 @@ Relation Decider::classify(SymbolicExprId a, SymbolicExprId b) {
 }
 
 SetDecision Decider::covers(std::span<const SymbolicExprId> conditions) {
-    return {state_->decide(conditions, [&](std::span<const Gate> c) { return opposite(state_->circuit.any(c)); })
+    return {state_
+                ->decide(AskedOf::NoneHolds, conditions,
+                         [&](std::span<const Gate> c) { return opposite(state_->circuit.any(c)); })
                 .opposite(),
             std::nullopt};
 }
@@ -332,7 +377,7 @@ SetDecision Decider::disjoint(std::span<const SymbolicExprId> conditions) {
         }
         return level.empty() ? never : level.front().second;
     };
-    SetDecision decision{state_->decide(conditions, two).opposite(), std::nullopt};
+    SetDecision decision{state_->decide(AskedOf::TwoHold, conditions, two).opposite(), std::nullopt};
     if (!decision.isNo() || !decision.witness)
         return decision;
     std::optional<std::size_t> first;
@@ -349,21 +394,24 @@ SetDecision Decider::disjoint(std::span<const SymbolicExprId> conditions) {
 }
 
 std::optional<bool> Decider::holds(SymbolicExprId condition, const Witness& witness) {
-    if (!state_->isReadable(condition))
-        return std::nullopt;
+    return state_->isReadable(condition) ? state_->evaluate(condition, witness) : std::nullopt;
+}
+
+/// The same for a condition without missing operands.
+std::optional<bool> Decider::State::evaluate(SymbolicExprId condition, const Witness& witness) {
     IdMap<std::int64_t> values;
     std::int64_t simulation = 0;
     for (const UnknownValue& each : witness) {
         values.insert(each.unknown, each.value);
-        if (!state_->leafReader.table().has(each.unknown))
+        if (!leafReader.table().has(each.unknown))
             continue;
-        const LeafMeaning::Kind kind = state_->leafReader(each.unknown).kind;
+        const LeafMeaning::Kind kind = leafReader(each.unknown).kind;
         if (kind == LeafMeaning::Kind::Simulation || kind == LeafMeaning::Kind::CodeGeneration)
             simulation = (kind == LeafMeaning::Kind::Simulation) == (each.value != 0) ? 1 : 0;
     }
-    TermPlan plan(state_->leafReader, state_->unknowns, condition);
+    TermPlan plan(leafReader, unknowns, condition);
     const auto valueOf = [&](Unknown unknown) {
-        const UnknownInfo& info = state_->unknowns[unknown];
+        const UnknownInfo& info = unknowns[unknown];
         if (info.kind == UnknownKind::Simulation)
             return simulation;
         const std::int64_t* found = values.find(info.node);
@@ -385,6 +433,10 @@ const DecisionOptions& Decider::options() const noexcept {
 
 void Decider::limitSteps(std::uint64_t steps) noexcept {
     state_->questionSteps = std::min(steps, state_->options.steps);
+}
+
+std::size_t Decider::limitSolver(std::size_t questions) noexcept {
+    return std::exchange(state_->solverQuestions, questions);
 }
 
 std::uint64_t Decider::stepsTaken() const noexcept {

@@ -11,10 +11,13 @@
 
 namespace VT {
 
+class SolverPlugin;
+
 struct DecisionOptions {
     bool keywordsInForce = true; ///< "(sim)" and "(codegen)" are opposites; plain symbols otherwise
     bool bits32 = false;         ///< unknowns are signed 32-bit integers; integers without bounds otherwise
     std::uint64_t steps = limits::decisionSteps; ///< that one question may cost, 2^24 at most
+    SolverPlugin* solver = nullptr; ///< asked what stays undecided: SolverPlugin::installed(), which outlives this
 };
 
 /// Decides questions about conditions of one table.
@@ -27,10 +30,11 @@ struct DecisionOptions {
 /// for operands of any width. A call is a function of its arguments, except for `defined` and names that begin with
 /// `__has_`, which are unknowns whatever they name; a member is an unknown, unless a value is bound to it.  Any other
 /// arithmetic is an unknown for each node: equal nodes are equal, and a product is 0 where a factor is.  It is
-/// evaluated where a witness is confirmed.
+/// evaluated where a witness is confirmed.  A question that this leaves undecided goes to the solver of the options;
+/// with it, products and bits of unknowns are decided within its bounds.
 ///
-/// An answer is proven or it is "undecided"; it depends on the conditions alone, not on what was interned or asked
-/// before.  Real conditions take microseconds.
+/// An answer is proven or it is "undecided"; it depends on the conditions and on whether there is a solver, not on what
+/// was interned or asked before.  Real conditions take microseconds.
 ///
 /// What was read of a condition is kept, and nodes never change; a value that is bound to a member later goes unnoticed
 /// until clear().  A decider is used by one thread at a time; its table outlives it.  Interns nothing.
@@ -76,6 +80,8 @@ public:
     [[nodiscard]] const DecisionOptions& options() const noexcept;
     /// What a further question may cost, at most what the options say.
     void limitSteps(std::uint64_t steps) noexcept;
+    /// How many further questions may go to the solver, any number at first.  Returns how many might have so far.
+    std::size_t limitSolver(std::size_t questions) noexcept;
     /// Steps that the latest question took.
     [[nodiscard]] std::uint64_t stepsTaken() const noexcept;
     /// Forgets everything that was read.

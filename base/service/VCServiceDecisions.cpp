@@ -5,6 +5,7 @@
 // Cost: at most limits::decisionSteps a question; a kept decision is O(1).
 #include "base/core/Check.hpp"
 #include "base/core/Make.hpp"
+#include "base/decide/external/SolverPlugin.hpp"
 #include "base/service/ServiceParts.hpp"
 #include "base/service/VCService.hpp"
 #include "base/variants/VariantKeywords.hpp"
@@ -77,8 +78,9 @@ unsigned ServiceParts::decisionMode() const {
 Decider& ServiceParts::decider() {
     std::unique_ptr<Decider>& decider = deciders.at(decisionMode());
     if (decider == nullptr)
-        decider =
-            std::make_unique<Decider>(table, DecisionOptions{.keywordsInForce = keywordsInForce(), .bits32 = bits32});
+        decider = std::make_unique<Decider>(table, DecisionOptions{.keywordsInForce = keywordsInForce(),
+                                                                   .bits32 = bits32,
+                                                                   .solver = &SolverPlugin::installed()});
     return *decider;
 }
 

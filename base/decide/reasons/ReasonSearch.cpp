@@ -67,7 +67,9 @@ Answer ReasonSearch::ask(const Question& question, std::span<const SymbolicExprI
     const SymbolicExprId known = operands.empty() ? table_.getIdTRUE() : makeChain(table_, SymbolicOp::And, operands);
     const std::uint64_t most = decider_.options().steps;
     decider_.limitSteps(std::min(left_, most));
+    const std::size_t further = decider_.limitSolver(solverQuestions_);
     const Decision decision = question(known);
+    solverQuestions_ = decider_.limitSolver(further);
     decider_.limitSteps(most);
     charge(decider_.stepsTaken() + 1);
     return decision.answer;

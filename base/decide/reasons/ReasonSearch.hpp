@@ -50,6 +50,7 @@ private:
     Decider& decider_;
     std::uint64_t steps_;
     std::uint64_t left_;
+    std::size_t solverQuestions_ = limits::searchSolverQuestions; ///< that may still go to another solver
 };
 
 } // namespace VT

@@ -15,10 +15,12 @@ ConditionProofs::ConditionProofs(Decider& decider, const SymbolicExprQ2C& toC, S
       known_(toC(known)),
       isAnythingKnown_(isAnythingKnown),
       steps_(steps),
-      left_(steps) {}
+      left_(steps),
+      solverQuestions_(decider.limitSolver(limits::searchSolverQuestions)) {}
 
 ConditionProofs::~ConditionProofs() {
     decider_.limitSteps(decider_.options().steps);
+    decider_.limitSolver(solverQuestions_);
 }
 
 template <class Ask>

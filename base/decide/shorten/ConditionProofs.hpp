@@ -13,7 +13,7 @@ namespace VT {
 /// Proves forms of a condition equal to it where a known condition holds.
 ///
 /// All proofs share one budget of steps.  A question that uses up what is left is the last one: further ones are
-/// answered at once: not proven.
+/// answered at once: not proven.  limits::searchSolverQuestions of them may go to another solver.
 class ConditionProofs {
 public:
     /// `known` is TRUE where nothing is known.  Quill calls are decided as the operators that they stand for.
@@ -44,6 +44,7 @@ private:
     bool isAnythingKnown_;
     std::uint64_t steps_;
     std::uint64_t left_;
+    std::size_t solverQuestions_; ///< that the decider may ask after the search
 };
 
 } // namespace VT
