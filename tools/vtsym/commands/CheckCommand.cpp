@@ -30,7 +30,7 @@ Examples:
   vtsym check --html page.html model.json
   vtsym check --sarif model.json > findings.sarif)";
 
-constexpr std::array<FindingRule, 6> rules{{
+constexpr std::array<FindingRule, 6> checkRules{{
     {"dead", "A block is never active.",
      "The condition contradicts those of the blocks around it. Correct the condition, or remove the block."},
     {"always-active", "A block is always active.",
@@ -116,7 +116,7 @@ void fix(const std::string& path, const std::string& text, const VTRootBD& model
 }
 
 SearchResult check(const CheckOptions& options, Console& console) {
-    const std::unique_ptr<FindingWriter> writer = makeFindingWriter(options.form, console, rules);
+    const std::unique_ptr<FindingWriter> writer = makeFindingWriter(options.form, console, checkRules);
     if (!options.page.empty() && isSameFile(options.page, options.file)) {
         writer->problem({options.page, 0, 0, 0, 0, {}}, "is the model: name another file for the page");
         return writer->finish();

@@ -27,7 +27,7 @@ Examples:
   vtsym scan src include
   vtsym scan --sarif src >findings.sarif)";
 
-constexpr auto rules = std::to_array<FindingRule>({
+constexpr auto scanRules = std::to_array<FindingRule>({
     {"dead", "A branch is never entered.",
      "The condition contradicts a directive around the branch or before it in its chain, so that no definition of the "
      "macros enters the branch. Correct the condition, or remove the branch."},
@@ -84,7 +84,7 @@ std::string messageOf(const VT::BranchFinding& found) {
 Finding findingOf(const std::string& file, const VT::BranchFinding& found) {
     Finding finding;
     finding.place = placeOf(file, found.region);
-    finding.kind = rules[static_cast<std::size_t>(found.kind)].kind;
+    finding.kind = scanRules[static_cast<std::size_t>(found.kind)].kind;
     finding.message = messageOf(found);
     finding.condition = found.condition;
     if (!found.proposed.empty())
@@ -97,7 +97,7 @@ Finding findingOf(const std::string& file, const VT::BranchFinding& found) {
 }
 
 SearchResult scan(const ScanOptions& options, Console& console) {
-    const auto writer = makeFindingWriter(options.form, console, rules);
+    const auto writer = makeFindingWriter(options.form, console, scanRules);
     const FileProblem problem = [&](const std::string& path, const std::string& sentence) {
         writer->problem(placeOf(path, {}), sentence);
     };

@@ -205,7 +205,8 @@ std::string fishScript(const ProgramEntry& program) {
     const std::string& name = program.program.name;
     std::string script = "# Completion of " + name + " in fish; written by `" + name + " completion fish`.\n\n" +
                          "complete -c " + name + " -f\n";
-    const std::string none = "complete -c " + name + " -n __fish_use_subcommand";
+    const std::string none =
+        "complete -c " + name + " -n 'not __fish_seen_subcommand_from " + joined(namesOf(program.commands)) + "'";
     writeFishOptions(program.program, none, script);
     for (const CommandEntry& command : program.commands)
         script.append(none + " -a " + command.name + " -d " + shellWord(command.description, "\\") + "\n");
