@@ -4,6 +4,9 @@ import os
 import sys
 from pathlib import Path
 
+from pygments.lexer import RegexLexer
+from pygments.token import Generic
+
 here = Path(__file__).parent
 sys.path.insert(0, str(here))
 root = here.parents[1]
@@ -29,7 +32,7 @@ html_use_index = True
 
 breathe_projects = {"vtsym": str(output / "xml")}
 breathe_default_project = "vtsym"
-breathe_default_members = ("members",)
+breathe_default_members = ("members", "undoc-members")
 breathe_show_include = True
 cpp_id_attributes = ["VTSYM_API"]
 
@@ -37,6 +40,13 @@ cpp_id_attributes = ["VTSYM_API"]
 nitpick_ignore_regex = [("cpp:identifier", r".*")]
 
 highlight_language = "none"
+
+
+class Transcript(RegexLexer):
+    """Commands after `$`, and what they write, which may look like anything."""
+
+    name = "console"
+    tokens = {"root": [(r"^\$ .*\n", Generic.Strong), (r".*\n", Generic.Output)]}
 
 
 def setup(app):
@@ -47,3 +57,4 @@ def setup(app):
         return contnode if isOfDoxygen and node["reftarget"].startswith(("class", "struct", "namespace")) else None
 
     app.connect("missing-reference", plain)
+    app.add_lexer("console", Transcript)
