@@ -1,9 +1,11 @@
 """Settings of the site."""
 
 import os
+import re
 import sys
 from pathlib import Path
 
+import furo
 from pygments.lexer import RegexLexer
 from pygments.token import Generic
 
@@ -22,8 +24,8 @@ myst_heading_anchors = 4
 exclude_patterns = ["site"]
 
 html_theme = "furo"
-html_static_path = ["static"]
-html_css_files = ["site.css"]
+html_static_path = ["static", str(output / "static")]
+html_css_files = ["site.css", "dark.css"]
 html_copy_source = False
 html_show_sphinx = False
 html_show_copyright = False
@@ -40,6 +42,17 @@ cpp_id_attributes = ["VTSYM_API"]
 nitpick_ignore_regex = [("cpp:identifier", r".*")]
 
 highlight_language = "none"
+
+
+def darkColours():
+    """The theme's dark colours for readers whose system is dark; the style sheet that Debian builds has them for its button alone."""
+    sheet = (Path(furo.__file__).parent / "theme/furo/static/styles/furo.css").read_text(encoding="utf-8")
+    colours = re.search(r'body\[data-theme="?dark"?\] *\{(.*?)\}', sheet, re.S)[1]
+    return f'@media (prefers-color-scheme: dark) {{\nbody:not([data-theme="light"]) {{{colours}}}\n}}\n'
+
+
+(output / "static").mkdir(parents=True, exist_ok=True)
+(output / "static" / "dark.css").write_text(darkColours(), encoding="utf-8")
 
 
 class Transcript(RegexLexer):
