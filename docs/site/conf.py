@@ -18,7 +18,7 @@ project = "vtsym"
 copyright = "the authors of vtsym"
 html_title = "vtsym"
 
-extensions = ["myst_parser", "breathe", "railroads"]
+extensions = ["myst_parser", "breathe", "railroads", "sphinx.ext.autodoc"]
 myst_enable_extensions = ["colon_fence", "deflist"]
 myst_heading_anchors = 4
 exclude_patterns = ["site"]
@@ -38,8 +38,13 @@ breathe_default_members = ("members", "undoc-members")
 breathe_show_include = True
 cpp_id_attributes = ["VTSYM_API"]
 
+autodoc_default_options = {"members": True, "undoc-members": True, "show-inheritance": True}
+autodoc_member_order = "bysource"
+autodoc_class_signature = "separated"
+autodoc_preserve_defaults = True
+
 # Names of other libraries, and of what is not public, have no page to point to.
-nitpick_ignore_regex = [("cpp:identifier", r".*")]
+nitpick_ignore_regex = [("cpp:identifier", r".*"), ("py:(class|data|obj)", r".*")]
 
 highlight_language = "none"
 
