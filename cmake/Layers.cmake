@@ -69,22 +69,30 @@ if(VTSYM_EMBEDDED_HOST AND NOT VTSYM_SANITIZE)
   target_link_options(vtsym PRIVATE -Wl,--no-undefined)
 endif()
 
-# The program needs the embedded host.
+# The program needs the embedded host.  What its commands do is a library of their own, which others link too.
 if(VTSYM_EMBEDDED_HOST)
-  set(program_sources)
+  set(tool_sources)
   foreach(layer IN LISTS VTSYM_PROGRAM_LAYERS)
     vtsym_sources(${layer} sources)
-    list(APPEND program_sources ${sources})
+    if(layer STREQUAL program)
+      set(main_sources ${sources})
+    else()
+      list(APPEND tool_sources ${sources})
+    endif()
   endforeach()
   find_package(CLI11 REQUIRED)
   find_library(VTSYM_EDIT_LIBRARY edit REQUIRED)
-  add_executable(vtsym_program ${program_sources})
-  target_precompile_headers(vtsym_program REUSE_FROM vtsym_precompiled)
-  # The program spends its time in the library; more optimisation of its own code would only lengthen the build.
-  target_compile_options(vtsym_program PRIVATE $<$<NOT:$<CONFIG:Debug>>:-O1>)
-  target_compile_definitions(vtsym_program PRIVATE VTSYM_VERSION="${PROJECT_VERSION}")
-  target_link_libraries(vtsym_program PRIVATE vtsym vtsym_options CLI11::CLI11 nlohmann_json::nlohmann_json
+  add_library(vtsym_tool STATIC ${tool_sources})
+  add_executable(vtsym_program ${main_sources})
+  target_link_libraries(vtsym_tool PUBLIC vtsym vtsym_options PRIVATE CLI11::CLI11 nlohmann_json::nlohmann_json
     ${VTSYM_EDIT_LIBRARY})
+  target_compile_definitions(vtsym_tool PUBLIC VTSYM_VERSION="${PROJECT_VERSION}")
+  target_link_libraries(vtsym_program PRIVATE vtsym_tool)
+  foreach(target vtsym_tool vtsym_program)
+    target_precompile_headers(${target} REUSE_FROM vtsym_precompiled)
+    # The program spends its time in the library; more optimisation of its own code would only lengthen the build.
+    target_compile_options(${target} PRIVATE $<$<NOT:$<CONFIG:Debug>>:-O1>)
+  endforeach()
   set_target_properties(vtsym_program PROPERTIES OUTPUT_NAME vtsym
     RUNTIME_OUTPUT_DIRECTORY ${PROJECT_BINARY_DIR}/bin INSTALL_RPATH $ORIGIN/../${CMAKE_INSTALL_LIBDIR})
 endif()

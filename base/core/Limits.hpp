@@ -71,6 +71,11 @@ inline constexpr double zeroThreshold = 0x1p-26;
 /// may make one more vector as long as the longest; beyond the bound evaluation throws std::length_error.
 inline constexpr std::size_t evaluatedElements = std::size_t{1} << 26U;
 
+/// Bytes of the values that an evaluation of many rows works on at once: what fits the cache next to one core.  Fewer
+/// rows are taken at a time where the expression has more values; at least minimumBlockRows, which bound the overhead.
+inline constexpr std::size_t blockBytes = std::size_t{1} << 16U;
+inline constexpr std::size_t minimumBlockRows = 64;
+
 /// Steps that one question about conditions may cost: operands read and added up, edges of diagrams joined, literals
 /// propagated, bounds looked at, nodes evaluated.  At most about a quarter of a second and 150 MB; real conditions take
 /// tens to thousands, ten thousand choices of a set some hundred thousand.  Beyond the bound the question is undecided.

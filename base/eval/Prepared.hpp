@@ -9,11 +9,24 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <functional>
 #include <optional>
+#include <span>
 #include <string>
 #include <vector>
 
 namespace VT {
+
+/// The values of one slot for many evaluations, one for each row.
+struct ValueColumn {
+    enum class Type : std::uint8_t { Bool, Int32, Int64, Double };
+
+    std::size_t slot = 0;
+    Type type = Type::Int32;
+    const void* data =
+        nullptr;               ///< the value of row 0: a byte, an integer of 32 or 64 bits, or a double, at any address
+    std::ptrdiff_t stride = 0; ///< bytes from the value of a row to that of the next one; any number
+};
 
 /// An expression as a list of operations over one array of untagged cells.
 ///
@@ -60,9 +73,27 @@ public:
     /// SymbolicExprEval::eval().
     [[nodiscard]] SymbolicValue run();
 
+    /// Receives the type of the results and returns room for one of each row, aligned for it: bytes that become 0 or 1,
+    /// integers of 32 bits, or doubles.
+    using ResultRoom = std::function<void*(ScalarType type)>;
+
+    /// The values of the expression for many rows: what run() would return with the values of each row set.  A slot
+    /// without a column has the same value in all rows: the one that it holds, or that of its symbol in the table.  Of
+    /// two columns of a slot the later one counts.
+    ///
+    /// Columns are read where they are.  Works on blocks of rows that fit the processor's cache, operator by operator;
+    /// beside the results it takes limits::blockBytes, or what an expression with very many values at once needs for
+    /// blocks of a few rows.
+    ///
+    /// Throws what run() throws; std::out_of_range for a column without a slot, std::invalid_argument for an expression
+    /// that is a vector, and std::range_error for an integer beyond 32 bits, after which the results are unspecified.
+    /// The slots hold what they held, in any case.
+    void runMany(std::span<const ValueColumn> columns, std::size_t rows, const ResultRoom& room);
+
 private:
     friend class SymbolicExprEval;
     friend class PreparedExprLayout;
+    friend class PreparedExprColumns;
 
     PreparedExpr(const SymbolicExprTable& table, SymbolicExprId id);
 

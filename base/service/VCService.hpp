@@ -26,7 +26,7 @@ class SymbolRegistry;
 enum class PairQuestion : std::uint8_t;
 struct ServiceParts;
 
-/// The conditions of a process.  Conditions are over integers: every symbol stands for an integer, a truth value is an
+/// The conditions of a process, or of a part of it.  Conditions are over integers: every symbol stands for an integer, a truth value is an
 /// integer that is not zero.  One structure has one identifier, so that equal conditions have equal identifiers.
 ///
 /// TRUE is printed as the empty text: what holds always needs no condition.  The empty text and "true" are TRUE,
@@ -50,6 +50,9 @@ public:
     /// one that is installed already stays.  Results that were simplified under the previous one stay in the caches.
     void setVCCustomizer(VCCustomizer* customizer);
 
+    /// A service of its own, with a table that no other service knows.  Services of different threads may work at once.
+    VCService();
+    ~VCService();
     VCService(const VCService&) = delete;
     VCService& operator=(const VCService&) = delete;
 
@@ -270,9 +273,6 @@ public:
 
 private:
     friend class VCServiceHandle;
-
-    VCService();
-    ~VCService();
 
     [[nodiscard]] bool has(const VCSymbolicExprId& condition) const noexcept;
     SymbolicExprId parse(const std::string& text, bool isQuill);

@@ -9,12 +9,15 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <array>
 #include <cmath>
+#include <cstring>
 #include <functional>
 #include <limits>
 #include <map>
 #include <random>
 #include <set>
+#include <span>
 
 namespace VT::Testing {
 namespace {
@@ -419,6 +422,137 @@ TEST(Prepared, AnswersWhateverItsSlotsAndTheTableHold) {
     EXPECT_GT(values, 8000U);
     EXPECT_GT(faults, 1000U);
     EXPECT_GT(again, 300U);
+}
+
+/// A column of values of one type, packed or with gaps, in either direction, at any address.
+class Column {
+public:
+    Column(Graph& graph, ValueColumn::Type type, std::size_t rows) : type_(type) {
+        const auto size = static_cast<std::ptrdiff_t>(type == ValueColumn::Type::Bool    ? 1
+                                                      : type == ValueColumn::Type::Int32 ? 4
+                                                                                         : 8);
+        const std::array<std::ptrdiff_t, 4> strides{size, size + 3, -size, 2 * size};
+        stride_ = strides.at(graph.below(strides.size()));
+        bytes_.resize((rows + 2) * static_cast<std::size_t>(size + std::abs(stride_)));
+        first_ = bytes_.data() + graph.below(2) * 4 + (stride_ < 0 ? static_cast<std::ptrdiff_t>(rows) * size : 0);
+        while (values_.size() < rows) {
+            const SymbolicScalar value = graph.anyScalar();
+            std::byte* const to = first_ + static_cast<std::ptrdiff_t>(values_.size()) * stride_;
+            const auto integer = static_cast<std::int32_t>(Wide(value).bits());
+            const std::int64_t wide = integer;
+            const double real = value.toDouble();
+            const unsigned char byte = integer == 0 ? 0 : graph.below(2) == 0 ? 1 : 255;
+            if (type == ValueColumn::Type::Bool) {
+                std::memcpy(to, &byte, 1);
+                values_.emplace_back(byte != 0);
+            } else if (type == ValueColumn::Type::Double) {
+                std::memcpy(to, &real, 8);
+                values_.emplace_back(real);
+            } else {
+                type == ValueColumn::Type::Int32 ? std::memcpy(to, &integer, 4) : std::memcpy(to, &wide, 8);
+                values_.emplace_back(integer);
+            }
+        }
+    }
+
+    [[nodiscard]] ValueColumn of(std::size_t slot) const { return {slot, type_, first_, stride_}; }
+
+    [[nodiscard]] const SymbolicScalar& operator[](std::size_t row) const { return values_[row]; }
+
+private:
+    ValueColumn::Type type_;
+    std::ptrdiff_t stride_;
+    std::vector<std::byte> bytes_;
+    std::byte* first_;
+    std::vector<SymbolicScalar> values_;
+};
+
+/// The values of a run over columns, or the key of what is reported.
+Outcome manyOf(PreparedExpr& prepared, std::span<const ValueColumn> columns, std::size_t rows) {
+    std::vector<double> room(rows + 1);
+    ScalarType type = ScalarType::Bool;
+    try {
+        prepared.runMany(columns, rows, [&](ScalarType settled) {
+            type = settled;
+            return room.data();
+        });
+    } catch (const std::invalid_argument&) {
+        return {"vector"};
+    } catch (const HostDiagnostic& diagnostic) {
+        return {diagnostic.messageId().substr(diagnostic.messageId().rfind(':') + 1)};
+    }
+    Outcome outcome;
+    for (std::size_t row = 0; row < rows; ++row)
+        if (type == ScalarType::Double)
+            outcome.values.emplace_back(room[row]);
+        else if (type == ScalarType::Int)
+            outcome.values.emplace_back(reinterpret_cast<const std::int32_t*>(room.data())[row]);
+        else
+            outcome.values.emplace_back(reinterpret_cast<const unsigned char*>(room.data())[row] == 1);
+    return outcome;
+}
+
+// Every row is what one run with its values is, for every operator, type, stride and block.
+TEST(Prepared, RunsManyRowsAsItRunsEach) {
+    std::size_t values = 0, faults = 0;
+    for (unsigned seed = 0; seed < 1500; ++seed) {
+        Graph graph(seed, false);
+        for (const SymbolicExprId symbol : graph.symbols)
+            if (graph.below(20) != 0)
+                graph.table.registerValueId(symbol, literal(graph.table, graph.anyScalar()));
+        PreparedExpr prepared = SymbolicExprEval(graph.table).prepare(graph.nodes[graph.nodes.size() - 1 - seed % 3]);
+        const std::size_t rows = graph.below(10) == 0 ? 9000 + graph.below(300) : graph.below(70);
+        std::vector<Column> columns;
+        std::vector<ValueColumn> given;
+        for (std::size_t slot = 0; slot < prepared.slotCount(); ++slot)
+            if (graph.below(4) != 0) {
+                columns.emplace_back(graph, static_cast<ValueColumn::Type>(graph.below(4)), rows);
+                given.push_back(columns.back().of(slot));
+            } else if (graph.below(2) == 0) {
+                prepared.set(slot, graph.anyScalar());
+            }
+        const PreparedExpr before = prepared;
+        const Outcome many = manyOf(prepared, given, rows);
+        ASSERT_EQ(manyOf(prepared, given, rows), many);
+        PreparedExpr each = before;
+        for (std::size_t row = 0; row < std::max<std::size_t>(rows, 1); ++row) {
+            for (std::size_t i = 0; i < given.size(); ++i)
+                each.set(given[i].slot, rows == 0 ? SymbolicScalar(1) : columns[i][row]);
+            const Outcome one = outcomeOf([&] { return each.run(); });
+            ASSERT_EQ(many.error, one.isVector ? "vector" : one.error) << seed;
+            if (one.isVector || !one.error.empty() || rows == 0)
+                break;
+            ASSERT_EQ(many.values[row], one.values.front())
+                << seed << ", row " << row << ": " << shown(many.values[row]) << " " << shown(one.values.front());
+        }
+        ++(many.error.empty() ? values : faults);
+        PreparedExpr after = prepared, same = before; // the slots hold what they held
+        ASSERT_EQ(outcomeOf([&] { return after.run(); }), outcomeOf([&] { return same.run(); })) << seed;
+    }
+    EXPECT_GT(values, 700U);
+    EXPECT_GT(faults, 100U);
+}
+
+TEST(Prepared, RefusesColumnsThatDoNotFit) {
+    SymbolicExprTable table;
+    PreparedExpr prepared = SymbolicExprEval(table).prepare(readTree(table, "Plus(a,1)"));
+    std::vector<std::int64_t> wide(5000, 7);
+    const ValueColumn column{0, ValueColumn::Type::Int64, wide.data(), 8};
+    std::vector<std::int32_t> room(wide.size());
+    const auto toRoom = [&](ScalarType) { return room.data(); };
+    prepared.runMany({&column, 1}, wide.size(), toRoom);
+    EXPECT_EQ(room, std::vector<std::int32_t>(wide.size(), 8));
+    wide[4321] = 2147483648;
+    try {
+        prepared.runMany({&column, 1}, wide.size(), toRoom);
+        ADD_FAILURE() << "an integer beyond 32 bits";
+    } catch (const std::range_error& error) {
+        EXPECT_STREQ(error.what(), "the integer 2147483648 in row 4321 of a column does not fit 32 bits");
+    }
+    const ValueColumn elsewhere{1, ValueColumn::Type::Int64, wide.data(), 8};
+    EXPECT_THROW(prepared.runMany({&elsewhere, 1}, 1, toRoom), std::out_of_range);
+    prepared.setInt(0, 4);
+    EXPECT_EQ(prepared.run(), SymbolicValue(5));
 }
 
 } // namespace

@@ -75,16 +75,24 @@ std::string fixed(const std::string& text, std::vector<Fix> fixes, std::vector<R
 
 enum class FindingForm : std::uint8_t { Compiler, Json, Sarif };
 
-/// Writes findings as they are found, and counts them.  Throws OutputError.
-class FindingWriter {
+/// Receives what a search finds.
+class FindingListener {
 public:
-    virtual ~FindingWriter() = default;
+    virtual ~FindingListener() = default;
 
-    void write(const Finding& finding);
-    /// Reports on standard error that a place could not be searched completely; the search fails.
-    void problem(const Place& place, const std::string& sentence);
-    /// Reports a remark about the whole search on standard error; the search does not fail.
-    void note(const std::string& sentence);
+    virtual void write(const Finding& finding) = 0;
+    /// A place could not be searched completely; the search fails.
+    virtual void problem(const Place& place, const std::string& sentence) = 0;
+    /// A remark about the whole search; the search does not fail.
+    virtual void note(const std::string& sentence) = 0;
+};
+
+/// Writes findings as they are found, and counts them.  Problems and notes go to standard error.  Throws OutputError.
+class FindingWriter : public FindingListener {
+public:
+    void write(const Finding& finding) override;
+    void problem(const Place& place, const std::string& sentence) override;
+    void note(const std::string& sentence) override;
     /// Ends the output, after which nothing may be written.  Returns the outcome.
     SearchResult finish();
 

@@ -200,7 +200,7 @@ VT::VCSymbolicExprId ModelCheck::ownAfterOthers(const VTBlock& block) {
     return active;
 }
 
-void ModelCheck::run(FindingWriter& writer) {
+void ModelCheck::run(FindingListener& writer) {
     writer_ = &writer;
     if (!readConditions())
         return;

@@ -36,7 +36,7 @@ public:
     ModelCheck(const VTRootBD& model, std::string file, const ModelCheckOptions& options);
 
     /// Writes the findings, block by block.  Leaves out the blocks inside of one that is never active.
-    void run(FindingWriter& writer);
+    void run(FindingListener& writer);
 
     /// The sets in the order of the model, as far as they were checked.
     [[nodiscard]] const std::vector<ChoiceSet>& choiceSets() const noexcept { return choiceSets_; }
@@ -87,7 +87,7 @@ private:
     std::unordered_map<const VTBlock*, VT::SymbolicExprId> contexts_;
     /// Where one of the choices before the next one of a block holds, if the first of them counts.
     std::unordered_map<const VTBlock*, VT::SymbolicExprId> earlierChoices_;
-    FindingWriter* writer_ = nullptr;
+    FindingListener* writer_ = nullptr;
     std::vector<ChoiceSet> choiceSets_;
     std::vector<Finding> otherFindings_;
     std::vector<std::string> problems_;

@@ -1,0 +1,18 @@
+// The operators of evaluation over columns of values.
+#pragma once
+
+#include "base/eval/Execute.hpp"
+
+#include <cstddef>
+#include <cstdint>
+
+namespace VT::detail {
+
+/// Computes an operator for each row.  Operands and results are arrays of bool, std::int32_t or double, aligned for
+/// their type; the results overlap no operand.  An operator of one operand ignores the second.
+using ColumnLoop = void (*)(const void* left, const void* right, void* result, std::size_t rows) noexcept;
+
+/// The loop of an operation's code.
+ColumnLoop columnLoop(std::uint32_t code) noexcept;
+
+} // namespace VT::detail
