@@ -85,6 +85,9 @@ public:
     void problem(const Place& place, const std::string& sentence);
     /// Reports a remark about the whole search on standard error; the search does not fail.
     void note(const std::string& sentence);
+    /// Writes sentences about a place that are no findings.  `members` are those of a JSON object about them, each
+    /// after a comma.
+    void remark(const Place& place, std::span<const std::string> sentences, const std::string& members);
     /// Ends the output, after which nothing may be written.  Returns the outcome.
     SearchResult finish();
 
@@ -104,6 +107,8 @@ private:
     virtual void addProblem(const Place&, const std::string&) {}
 
     virtual void addNote(const std::string&) {}
+
+    virtual void addRemark(const Place&, std::span<const std::string> sentences, const std::string& members) = 0;
 
     virtual void end() {}
 
