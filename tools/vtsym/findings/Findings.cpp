@@ -30,6 +30,11 @@ private:
         console().out(console().outStyle().strong(placeText(finding.place) + ":") + " " +
                       VT::shownText(sentenceOf(finding)) + "\n");
     }
+
+    void addRemark(const Place& place, std::span<const std::string> sentences, const std::string&) override {
+        for (const std::string& sentence : sentences)
+            console().out(console().outStyle().strong(placeText(place) + ":") + " " + VT::shownText(sentence) + "\n");
+    }
 };
 
 class JsonWriter : public FindingWriter {
@@ -38,6 +43,12 @@ public:
 
 private:
     void add(const Finding& finding) override;
+
+    void addRemark(const Place& place, std::span<const std::string>, const std::string& members) override {
+        std::string out = "{\"file\":" + jsonString(place.file);
+        appendMember(out, "line", std::to_string(place.line));
+        console().out(out + members + "}\n");
+    }
 };
 
 /// Appends the reasons, where there are any.
@@ -127,6 +138,7 @@ private:
     void add(const Finding& finding) override;
     void addProblem(const Place& place, const std::string& sentence) override;
     void addNote(const std::string& sentence) override;
+    void addRemark(const Place& place, std::span<const std::string> sentences, const std::string& members) override;
     void end() override;
     void addNotification(std::string_view level, const std::string& sentence, const std::string& further);
 
@@ -233,6 +245,11 @@ void SarifWriter::addNote(const std::string& sentence) {
     addNotification("note", sentence, {});
 }
 
+void SarifWriter::addRemark(const Place& place, std::span<const std::string> sentences, const std::string&) {
+    for (const std::string& sentence : sentences)
+        addNotification("note", sentence, ",\"locations\":[" + jsonLocation(place) + "]");
+}
+
 /// `further` are members to add to the level and the message.
 void SarifWriter::addNotification(std::string_view level, const std::string& sentence, const std::string& further) {
     notifications_.append(notifications_.empty() ? "\n{" : ",\n{").append("\"level\":").append(jsonString(level));
@@ -321,6 +338,10 @@ void FindingWriter::problem(const Place& place, const std::string& sentence) {
 void FindingWriter::note(const std::string& sentence) {
     console_.err("vtsym: " + VT::shownText(sentence) + "\n");
     addNote(sentence);
+}
+
+void FindingWriter::remark(const Place& place, std::span<const std::string> sentences, const std::string& members) {
+    addRemark(place, sentences, members);
 }
 
 SearchResult FindingWriter::finish() {

@@ -95,6 +95,8 @@ public:
     virtual void problem(const Place& place, const std::string& sentence) = 0;
     /// A remark about the whole search; the search does not fail.
     virtual void note(const std::string& sentence) = 0;
+    /// Sentences about a place that are no findings.  `members` are those of a JSON object about them, each after a comma.
+    virtual void remark(const Place& place, std::span<const std::string> sentences, const std::string& members) = 0;
 };
 
 /// Writes findings as they are found, and counts them.  Problems and notes go to standard error.  Throws OutputError.
@@ -103,6 +105,7 @@ public:
     void write(const Finding& finding) override;
     void problem(const Place& place, const std::string& sentence) override;
     void note(const std::string& sentence) override;
+    void remark(const Place& place, std::span<const std::string> sentences, const std::string& members) override;
     /// Ends the output, after which nothing may be written.  Returns the outcome.
     SearchResult finish();
 
@@ -122,6 +125,8 @@ private:
     virtual void addProblem(const Place&, const std::string&) {}
 
     virtual void addNote(const std::string&) {}
+
+    virtual void addRemark(const Place&, std::span<const std::string> sentences, const std::string& members) = 0;
 
     virtual void end() {}
 
