@@ -29,6 +29,6 @@ struct ParsedNumber {
 
 } // namespace VT
 
-/// Reads a text that is one decimal number (`2`, `2.`, `.5`, `-1.5e-7`), rounded to the nearest value, ties to even.  A
+/// Reads a text that is one decimal number (2, 2., .5 or -1.5e-7), rounded to the nearest value, ties to even.  A
 /// number that is too small becomes zero.  Linear in the length of the text.
 VTSYM_API VT::ParsedNumber vtsv_strtod(std::string_view text);

@@ -17,7 +17,7 @@ namespace VT {
 VTSYM_API std::size_t plainCharacter(std::string_view text);
 
 /// The beginning of a text, fit for a terminal or a log: about `bound` bytes at most, cut between characters and ended
-/// by "..." where it goes on.  Bytes that are not part of a plainCharacter() are shown as \xNN.
+/// by "..." where it goes on.  Bytes that are not part of a plainCharacter() are shown as `\xNN`.
 VTSYM_API std::string shownText(std::string_view text, std::size_t bound = std::string_view::npos);
 
 } // namespace VT

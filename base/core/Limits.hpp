@@ -254,6 +254,28 @@ inline constexpr std::uint64_t branchDecisionSteps = std::uint64_t{1} << 16U;
 /// Nodes that a scanner keeps from file to file.  When there are more, the next file begins anew.
 inline constexpr std::size_t scanNodes = std::size_t{1} << 20U;
 
+/// Conditions that are assumed of every build and compared with one condition of a source file: those that share a
+/// macro with it, then those that share one with these.  Further ones are not used for it.
+inline constexpr std::size_t relatedAssumptions = 64;
+
+/// Configurations of a build that one source file is scanned for.  Further ones are left out, which is counted.
+inline constexpr std::size_t scanConfigurations = 32;
+
+/// Tokens that macros of a build may become where the value of a term is computed.  Beyond it the value is not known.
+inline constexpr std::size_t expandedTokens = std::size_t{1} << 14U;
+
+/// Pairs of tokens that are compared to keep what a shorter condition shares with the longer one as it is written: a
+/// few milliseconds.  Beyond it the whole condition is written anew.
+inline constexpr std::size_t comparedTokens = std::size_t{1} << 20U;
+
+/// Results of one SARIF log, which services that take such logs reject beyond 25,000.  Those of the lower levels are
+/// left out first, which a note counts.
+inline constexpr std::size_t sarifResults = 25'000;
+
+/// Operands of the facts around a branch and of its condition from which the fewest that force a finding are picked.
+/// Of more, those of directives alone are named.
+inline constexpr std::size_t whyOperands = 256;
+
 /// Facts of branches around a condition that it is compared with: between one and two windows of those about one macro,
 /// and of all together a total weight, a fact about several macros as much as several.  Further ones are left out.
 inline constexpr std::size_t factWindow = 128;

@@ -38,7 +38,7 @@ void BranchContext::pop(std::size_t size) {
     }
 }
 
-std::vector<std::size_t> BranchContext::related(const DirectiveCondition& condition) {
+std::vector<std::size_t> BranchContext::related(const std::vector<MacroUnknownId>& unknowns) {
     // Between one and two windows, so that neighbours in a long chain look at the same facts and share decisions.
     constexpr std::size_t window = limits::factWindow;
     std::vector<std::size_t> result;
@@ -55,8 +55,8 @@ std::vector<std::size_t> BranchContext::related(const DirectiveCondition& condit
         weight += own;
         result.push_back(fact);
     };
-    const auto addAbout = [&](const std::vector<MacroUnknownId>& unknowns) {
-        for (const MacroUnknownId unknown : unknowns) {
+    const auto addAbout = [&](const std::vector<MacroUnknownId>& asked) {
+        for (const MacroUnknownId unknown : asked) {
             const std::uint32_t group = unknowns_[unknown].group;
             if (group >= byGroup_.size() || groupMarks_[group] == question_)
                 continue;
@@ -67,18 +67,15 @@ std::vector<std::size_t> BranchContext::related(const DirectiveCondition& condit
                 add(about[i]);
         }
     };
-    addAbout(condition.unknowns);
+    addAbout(unknowns);
     for (std::size_t i = 0; i < result.size() && weight < limits::factWeight; ++i)
         addAbout(facts_[result[i]].unknowns);
     std::ranges::sort(result);
     return result;
 }
 
-BranchContext::Laws BranchContext::laws(const DirectiveCondition& condition, const std::vector<std::size_t>& facts) {
+BranchContext::Laws BranchContext::laws(std::vector<MacroUnknownId> asked) {
     using Kind = MacroUnknown::Kind;
-    std::vector<MacroUnknownId> asked = condition.unknowns;
-    for (const std::size_t fact : facts)
-        asked.insert(asked.end(), facts_[fact].unknowns.begin(), facts_[fact].unknowns.end());
     std::erase_if(asked, [&](MacroUnknownId id) {
         return unknowns_[id].kind != Kind::Value && unknowns_[id].kind != Kind::Defined;
     });

@@ -17,6 +17,7 @@ struct BranchFact {
     std::size_t begin; ///< the directive, in bytes
     std::size_t end;
     std::vector<MacroUnknownId> unknowns;
+    std::vector<PartSpelling> spellings{}; ///< in the directive's tokens; kept where reasons are written
 };
 
 /// The facts of the open chains of one file, found by the macros that they are about.
@@ -29,14 +30,18 @@ public:
     [[nodiscard]] const BranchFact& operator[](std::size_t at) const { return facts_[at]; }
 
     void push(BranchFact fact);
+
+    /// Keeps how the parts of the last fact are written.
+    void keepSpellings(std::vector<PartSpelling> spellings) { facts_.back().spellings = std::move(spellings); }
+
     /// Turns the last fact into its opposite.
     void negateLast();
     void pop(std::size_t size);
 
-    /// Returns the positions of the facts that are related to a condition, in order: those about the same macros, those
+    /// Returns the positions of the facts that are related to unknowns, in order: those about the same macros, those
     /// about the macros of these, and so on up to limits::factWeight.  Of more than limits::factWindow about one macro,
     /// the latest.
-    std::vector<std::size_t> related(const DirectiveCondition& condition);
+    std::vector<std::size_t> related(const std::vector<MacroUnknownId>& unknowns);
 
     /// How unknowns depend on each other.
     struct Laws {
@@ -44,8 +49,8 @@ public:
         std::vector<SymbolicExprId> undefinedLaws; ///< a macro that is not defined is 0
     };
 
-    /// Returns the laws about the unknowns of a condition and of facts.  n log n in these unknowns.
-    Laws laws(const DirectiveCondition& condition, const std::vector<std::size_t>& facts);
+    /// Returns the laws about unknowns.  n log n in these.
+    Laws laws(std::vector<MacroUnknownId> unknowns);
 
 private:
     SymbolicExprTable& table_;

@@ -10,7 +10,6 @@
 
 #include "base/core/Limits.hpp"
 #include "base/core/Walk.hpp"
-#include "base/decide/reasons/MinimalSubset.hpp"
 #include "base/decide/shorten/ImpliedCondition.hpp"
 
 #include <boost/container_hash/hash.hpp>
@@ -158,19 +157,20 @@ void BranchJudge::spend(std::uint64_t steps) {
     steps_ += steps;
 }
 
-std::vector<std::size_t> BranchJudge::reasons(SymbolicExprId condition, const BranchVerdict& verdict,
-                                              const KnownConditions& known) {
+MinimalSubset BranchJudge::reasons(SymbolicExprId condition, const BranchVerdict& verdict,
+                                   const KnownConditions& known) {
     const bool toShorten = verdict.kind == BranchVerdictKind::Removable;
     beginQuestion();
     const auto suffices = [&](std::span<const std::size_t> positions) {
         std::vector<SymbolicExprId> facts(positions.size());
         std::ranges::transform(positions, facts.begin(), [&](std::size_t at) { return known.facts[at]; });
+        isUndecided_ = false;
         const bool isEnough =
             holds(verdict, condition,
                   all(facts, known.includeLaws, toShorten ? std::span<const SymbolicExprId>() : known.undefinedLaws));
-        return isEnough ? Answer::Yes : Answer::No;
+        return isEnough ? Answer::Yes : isUndecided_ ? Answer::Undecided : Answer::No;
     };
-    std::vector<std::size_t> kept = minimalSubset(known.facts.size(), suffices).positions;
+    MinimalSubset kept = minimalSubset(known.facts.size(), suffices);
     spend(limits::branchSteps - stepsLeft_);
     return kept;
 }

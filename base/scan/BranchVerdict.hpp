@@ -2,7 +2,9 @@
 #pragma once
 
 #include "base/core/Limits.hpp"
+#include "base/core/Nodes.hpp"
 #include "base/decide/Decider.hpp"
+#include "base/decide/reasons/MinimalSubset.hpp"
 #include "base/print/ExpressionPrinter.hpp"
 
 #include <functional>
@@ -48,9 +50,12 @@ public:
 
     /// Judges a condition under known ones.  Yields None where the known ones contradict each other.
     BranchVerdict judge(SymbolicExprId condition, const KnownConditions& known);
-    /// Returns the positions of the facts that a verdict follows from, the fewest found within the steps.
-    std::vector<std::size_t> reasons(SymbolicExprId condition, const BranchVerdict& verdict,
-                                     const KnownConditions& known);
+    /// Returns the positions of the facts that a verdict follows from, the fewest found within the steps.  The verdict
+    /// that a condition is dead may be about TRUE, where the condition is among the facts.
+    MinimalSubset reasons(SymbolicExprId condition, const BranchVerdict& verdict, const KnownConditions& known);
+
+    /// Interns the opposite of a condition.
+    SymbolicExprId negated(SymbolicExprId condition) { return SymbolicNotExpr(table_, condition).getId(table_); }
 
     /// Number of conditions with an undecided question, and steps of all questions.
     [[nodiscard]] std::uint64_t givenUp() const noexcept { return givenUp_; }

@@ -8,60 +8,16 @@
 #include "base/scan/DirectiveCondition.hpp"
 
 #include "base/core/Limits.hpp"
+#include "base/decide/shorten/ImpliedCondition.hpp"
+#include "base/scan/DirectiveOperators.hpp"
 
 #include <algorithm>
-#include <array>
+#include <limits>
 #include <utility>
 
 namespace VT {
 
 namespace {
-
-constexpr std::uint8_t loosest = 255;
-
-constexpr auto infixOperators = std::to_array<std::pair<std::string_view, SymbolicOp>>({
-    {"&&", SymbolicOp::And},
-    {"||", SymbolicOp::Or},
-    {"==", SymbolicOp::Equal},
-    {"!=", SymbolicOp::NotEqual},
-    {">=", SymbolicOp::GreaterThanEqual},
-    {"<=", SymbolicOp::LessThanEqual},
-    {">", SymbolicOp::GreaterThan},
-    {"<", SymbolicOp::LessThan},
-    {"+", SymbolicOp::Plus},
-    {"-", SymbolicOp::Minus},
-    {"*", SymbolicOp::Multiply},
-    {"/", SymbolicOp::Divide},
-    {"%", SymbolicOp::Modulo},
-    {"&", SymbolicOp::BitAnd},
-    {"|", SymbolicOp::BitOr},
-    {"^", SymbolicOp::BitXOr},
-    {"<<", SymbolicOp::ShiftLeft},
-    {">>", SymbolicOp::ShiftRight},
-    {"and", SymbolicOp::And},
-    {"or", SymbolicOp::Or},
-    {"not_eq", SymbolicOp::NotEqual},
-    {"bitand", SymbolicOp::BitAnd},
-    {"bitor", SymbolicOp::BitOr},
-    {"xor", SymbolicOp::BitXOr},
-});
-
-SymbolicOp infixOf(const DirectiveToken& token) {
-    const bool mayBe = token.kind == DirectiveTokenKind::Operator || token.kind == DirectiveTokenKind::Name;
-    const auto* const known =
-        std::ranges::find(infixOperators, token.text, [](const auto& each) -> std::string_view { return each.first; });
-    return mayBe && known != infixOperators.end() ? known->second : SymbolicOp::None;
-}
-
-/// Returns the operator of a prefix; Plus for a plus, None for other tokens.
-SymbolicOp prefixOf(const DirectiveToken& token) {
-    const std::string_view text = token.text;
-    return text == "!" || text == "not"     ? SymbolicOp::Not
-           : text == "-"                    ? SymbolicOp::UnaryMinus
-           : text == "~" || text == "compl" ? SymbolicOp::BitCompl
-           : text == "+"                    ? SymbolicOp::Plus
-                                            : SymbolicOp::None;
-}
 
 /// Whether the file does not determine the meaning of a token: #machine(x), a name that may be spelled in another way.
 bool isUncertain(const DirectiveToken& token) {
@@ -98,7 +54,9 @@ DirectiveCondition DirectiveConditionReader::read(const Directive& directive) {
     } else if (tokens_[0].kind != DirectiveTokenKind::Name) {
         readAsWhole();
     } else {
-        condition_.node = use(unknowns_.defined(states_.nameOf(tokens_[0].text)));
+        const MacroUnknownId defined = unknowns_.defined(states_.nameOf(tokens_[0].text));
+        noteDefined(defined, tokens_[0].text);
+        condition_.node = use(defined);
         if (directive.kind == DirectiveKind::Ifndef || directive.kind == DirectiveKind::Elifndef)
             condition_.node = SymbolicNotExpr(table_, condition_.node).getId(table_);
     }
@@ -113,7 +71,9 @@ void DirectiveConditionReader::readAsWhole() {
     condition_ = {};
     condition_.understood = false;
     const auto last = static_cast<std::uint32_t>(tokens_.size() - 1);
-    condition_.node = use(unknowns_.term(text(0, last, true), text(0, last, false), macros(0, last)));
+    const MacroUnknownId whole = unknowns_.term(text(0, last, true), text(0, last, false), macros(0, last));
+    noteValue(whole, 0, last);
+    condition_.node = use(whole);
 }
 
 // Reading.
@@ -132,7 +92,7 @@ bool DirectiveConditionReader::parse() {
             if (isWord(token) && prefix != SymbolicOp::None && isSign(i + 1)) // in C a name: not - 1
                 return false;
             if (token.text == "(")
-                operations_.push_back({SymbolicOp::None, true, loosest, i});
+                operations_.push_back({SymbolicOp::None, true, loosestPrecedence, i});
             else if (prefix != SymbolicOp::None)
                 operations_.push_back({prefix, true, operatorInfo(SymbolicOp::Not).precedence, i});
             else if (readOperand(i))
@@ -150,7 +110,7 @@ bool DirectiveConditionReader::parse() {
     }
     if (operandExpected)
         return false;
-    reduceTo(loosest - 1);
+    reduceTo(loosestPrecedence - 1);
     if (!operations_.empty())
         return false;
     const Operand& whole = operands_.back();
@@ -212,6 +172,7 @@ bool DirectiveConditionReader::readDefined(std::uint32_t& token) {
         (bracketed && !is(token + 1, ")")))
         return false;
     const MacroUnknownId defined = unknowns_.defined(states_.nameOf(tokens_[token].text));
+    noteDefined(defined, tokens_[token].text);
     token += bracketed ? 1 : 0;
     operands_.push_back(truthOf(use(defined), first, token));
     return true;
@@ -242,7 +203,7 @@ bool DirectiveConditionReader::readInfix(std::uint32_t token) {
 }
 
 bool DirectiveConditionReader::closeParenthesis(std::uint32_t token) {
-    reduceTo(loosest - 1);
+    reduceTo(loosestPrecedence - 1);
     if (operations_.empty())
         return false;
     operands_.back().first = operations_.back().token;
@@ -296,17 +257,73 @@ SymbolicExprId DirectiveConditionReader::truth(const Operand& operand) {
 
 /// Returns the symbol of a value or a term.
 SymbolicExprId DirectiveConditionReader::symbol(const Operand& operand) {
-    if (operand.kind == Operand::Kind::Value)
-        return use(unknowns_.value(states_.nameOf(tokens_[operand.innerFirst].text)));
-    const std::string shown = text(operand.innerFirst, operand.innerLast, false);
-    return use(unknowns_.term(text(operand.innerFirst, operand.innerLast, true),
+    const auto unknownOf = [&] {
+        if (operand.kind == Operand::Kind::Value)
+            return unknowns_.value(states_.nameOf(tokens_[operand.innerFirst].text));
+        const std::string shown = text(operand.innerFirst, operand.innerLast, false);
+        return unknowns_.term(text(operand.innerFirst, operand.innerLast, true),
                               operand.compound ? "(" + shown + ")" : shown,
-                              macros(operand.innerFirst, operand.innerLast)));
+                              macros(operand.innerFirst, operand.innerLast));
+    };
+    const MacroUnknownId unknown = unknownOf();
+    noteValue(unknown, operand.innerFirst, operand.innerLast);
+    return use(unknown);
 }
 
 SymbolicExprId DirectiveConditionReader::use(MacroUnknownId unknown) {
     condition_.unknowns.push_back(unknown);
     return unknowns_[unknown].node;
+}
+
+// Values under the macros of a build.
+
+/// What the build says about a macro where a condition is read.
+const BuildMacros::Macro* DirectiveConditionReader::macroOf(std::string_view name) {
+    const BuildMacros::Macro* const macro = build_->find(name);
+    if (macro == nullptr)
+        return nullptr;
+    const MacroStates::State state = states_.stateOf(states_.nameOf(name));
+    const bool isChanged = state.version != 0 || state.derived || state.varies;
+    return isChanged || (!macro->isDefined && state.epoch != 0) ? nullptr : macro;
+}
+
+/// Returns the value of tokens, and the macros that it follows from.
+std::optional<DirectiveConstant> DirectiveConditionReader::known(std::uint32_t first, std::uint32_t last,
+                                                                 std::vector<std::string>& macros) {
+    if (build_ == nullptr)
+        return std::nullopt;
+    std::vector<std::string_view> used;
+    const auto value = BuildMacros::valueOf(
+        tokens_.subspan(first, last - first + 1), [this](std::string_view name) { return macroOf(name); },
+        truthConstants_, &used);
+    for (const std::string_view name : used)
+        if (macroOf(name) != nullptr && std::ranges::find(macros, name) == macros.end())
+            macros.emplace_back(name);
+    return value;
+}
+
+void DirectiveConditionReader::noteValue(MacroUnknownId unknown, std::uint32_t first, std::uint32_t last) {
+    std::vector<std::string> macros;
+    const auto value = known(first, last, macros);
+    if (!value)
+        return;
+    // Unknowns are compared with integers from 0 to the largest int alone.
+    constexpr int most = std::numeric_limits<int>::max();
+    const SymbolicExprId node = unknowns_[unknown].node;
+    const SymbolicExprId fact = value->isNegative() ? compareWith(table_, SymbolicOp::LessThan, node, 0)
+                                : value->bits > static_cast<std::uint64_t>(most)
+                                    ? compareWith(table_, SymbolicOp::GreaterThan, node, most)
+                                    : compareWith(table_, SymbolicOp::Equal, node, static_cast<int>(value->bits));
+    condition_.known.push_back({unknown, fact, std::move(macros)});
+}
+
+void DirectiveConditionReader::noteDefined(MacroUnknownId unknown, std::string_view macro) {
+    const BuildMacros::Macro* const known = build_ == nullptr ? nullptr : macroOf(macro);
+    if (known == nullptr)
+        return;
+    const SymbolicExprId node = unknowns_[unknown].node;
+    condition_.known.push_back(
+        {unknown, known->isDefined ? node : SymbolicNotExpr(table_, node).getId(table_), {std::string(macro)}});
 }
 
 // Texts.

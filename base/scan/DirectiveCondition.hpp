@@ -8,12 +8,15 @@
 // calls of macros, __has_include() and the like.  Constants are computed.  A condition with a macro that the file
 // defines as an expression without parentheses is an unknown as a whole.
 //
+// An unknown whose value the macros of a build determine comes with that value, as a fact.
+//
 // A constant that is a condition by itself (#if 0, #if 1 && A) is a switch set by hand: nothing follows from it.
 #pragma once
 
 #include "base/scan/ConstantArithmetic.hpp"
 #include "base/scan/DirectiveReader.hpp"
 #include "base/scan/MacroUnknowns.hpp"
+#include "base/scan/build/BuildMacros.hpp"
 
 #include <optional>
 #include <string>
@@ -28,6 +31,13 @@ struct PartSpelling {
     std::uint32_t last;
 };
 
+/// The value of an unknown under the macros of a build.
+struct BuildFact {
+    MacroUnknownId unknown;
+    SymbolicExprId node;             ///< holds: `N == 4`, `defined(N)`
+    std::vector<std::string> macros; ///< that it follows from
+};
+
 /// A condition that was read: its node, the unknowns in it, and how its parts are written.
 struct DirectiveCondition {
     SymbolicExprId node = invalidId;
@@ -35,7 +45,8 @@ struct DirectiveCondition {
     bool understood = true;               ///< false for a condition that is one unknown
     bool bracketed = false;               ///< && is in parentheses between ||
     std::vector<MacroUnknownId> unknowns; ///< each once
-    std::vector<PartSpelling> spellings;  ///< of the parts that && and || join
+    std::vector<PartSpelling> spellings;  ///< of the parts that && and || join, and of the chains of these
+    std::vector<BuildFact> known;         ///< about the unknowns
 };
 
 /// Returns the text of tokens, with one blank where there was any; if `compact`, only where the tokens would join.
@@ -44,13 +55,15 @@ std::string spelledTokens(std::span<const DirectiveToken> tokens, bool compact =
 /// Reads conditions of one file, in its order.
 class DirectiveConditionReader {
 public:
-    /// With `truthConstants`, true and false are constants, as in C++; unknowns otherwise.
+    /// With `truthConstants`, true and false are constants, as in C++; unknowns otherwise.  `build` has the macros that
+    /// are defined before the file, or is nullptr.
     DirectiveConditionReader(SymbolicExprTable& table, MacroStates& states, MacroUnknowns& unknowns,
-                             bool truthConstants)
+                             bool truthConstants, const BuildMacros* build = nullptr)
         : table_(table),
           states_(states),
           unknowns_(unknowns),
-          truthConstants_(truthConstants) {}
+          truthConstants_(truthConstants),
+          build_(build) {}
 
     /// The condition of a directive that has one.  Linear in its tokens.
     DirectiveCondition read(const Directive& directive);
@@ -91,6 +104,10 @@ private:
     SymbolicExprId truth(const Operand& operand);
     SymbolicExprId symbol(const Operand& operand);
     SymbolicExprId use(MacroUnknownId unknown);
+    std::optional<DirectiveConstant> known(std::uint32_t first, std::uint32_t last, std::vector<std::string>& macros);
+    void noteValue(MacroUnknownId unknown, std::uint32_t first, std::uint32_t last);
+    void noteDefined(MacroUnknownId unknown, std::string_view macro);
+    const BuildMacros::Macro* macroOf(std::string_view name);
     void readAsWhole();
 
     [[nodiscard]] std::string text(std::uint32_t first, std::uint32_t last, bool compact);
@@ -100,6 +117,7 @@ private:
     MacroStates& states_;
     MacroUnknowns& unknowns_;
     bool truthConstants_;
+    const BuildMacros* build_;
     std::span<const DirectiveToken> tokens_;
     DirectiveCondition condition_;
     std::vector<Operand> operands_;

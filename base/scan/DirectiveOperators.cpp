@@ -1,12 +1,63 @@
-// Applies the operators of directives' conditions to operands that were read.  O(1), or the length of a text where an
-// operand becomes an unknown.
+// Reads the operators of directives' conditions, and applies them to operands that were read.  O(1), or the length of a
+// text where an operand becomes an unknown.
+#include "base/scan/DirectiveOperators.hpp"
+
 #include "base/decide/shorten/ImpliedCondition.hpp"
 #include "base/scan/DirectiveCondition.hpp"
 
 #include <algorithm>
+#include <array>
 #include <limits>
+#include <utility>
 
 namespace VT {
+
+namespace {
+
+constexpr auto infixOperators = std::to_array<std::pair<std::string_view, SymbolicOp>>({
+    {"&&", SymbolicOp::And},
+    {"||", SymbolicOp::Or},
+    {"==", SymbolicOp::Equal},
+    {"!=", SymbolicOp::NotEqual},
+    {">=", SymbolicOp::GreaterThanEqual},
+    {"<=", SymbolicOp::LessThanEqual},
+    {">", SymbolicOp::GreaterThan},
+    {"<", SymbolicOp::LessThan},
+    {"+", SymbolicOp::Plus},
+    {"-", SymbolicOp::Minus},
+    {"*", SymbolicOp::Multiply},
+    {"/", SymbolicOp::Divide},
+    {"%", SymbolicOp::Modulo},
+    {"&", SymbolicOp::BitAnd},
+    {"|", SymbolicOp::BitOr},
+    {"^", SymbolicOp::BitXOr},
+    {"<<", SymbolicOp::ShiftLeft},
+    {">>", SymbolicOp::ShiftRight},
+    {"and", SymbolicOp::And},
+    {"or", SymbolicOp::Or},
+    {"not_eq", SymbolicOp::NotEqual},
+    {"bitand", SymbolicOp::BitAnd},
+    {"bitor", SymbolicOp::BitOr},
+    {"xor", SymbolicOp::BitXOr},
+});
+
+} // namespace
+
+SymbolicOp infixOf(const DirectiveToken& token) {
+    const bool mayBe = token.kind == DirectiveTokenKind::Operator || token.kind == DirectiveTokenKind::Name;
+    const auto* const known =
+        std::ranges::find(infixOperators, token.text, [](const auto& each) -> std::string_view { return each.first; });
+    return mayBe && known != infixOperators.end() ? known->second : SymbolicOp::None;
+}
+
+SymbolicOp prefixOf(const DirectiveToken& token) {
+    const std::string_view text = token.text;
+    return text == "!" || text == "not"     ? SymbolicOp::Not
+           : text == "-"                    ? SymbolicOp::UnaryMinus
+           : text == "~" || text == "compl" ? SymbolicOp::BitCompl
+           : text == "+"                    ? SymbolicOp::Plus
+                                            : SymbolicOp::None;
+}
 
 DirectiveConditionReader::Operand DirectiveConditionReader::prefixed(const Operation& operation, const Operand& a) {
     const std::uint32_t first = operation.token;
@@ -36,12 +87,7 @@ DirectiveConditionReader::Operand DirectiveConditionReader::joined(SymbolicOp op
         const SymbolicExprId right = truth(b);
         const SymbolicExprId node = op == SymbolicOp::And ? SymbolicAndExpr(table_, left, right).getId(table_)
                                                           : SymbolicOrExpr(table_, left, right).getId(table_);
-        return {.kind = Operand::Kind::Truth,
-                .first = a.first,
-                .last = b.last,
-                .innerFirst = a.first,
-                .innerLast = b.last,
-                .truth = node};
+        return truthOf(node, a.first, b.last);
     }
     Operand result{.compound = true, .first = a.first, .last = b.last, .innerFirst = a.first, .innerLast = b.last};
     if (a.kind == Operand::Kind::Constant && b.kind == Operand::Kind::Constant) {
@@ -92,6 +138,18 @@ DirectiveConditionReader::Operand DirectiveConditionReader::difference(SymbolicO
         names.push_back(name);
     const MacroUnknownId unknown = unknowns_.comparison((swapped ? keyB : keyA) + "\n=\n" + (swapped ? keyA : keyB),
                                                         shown(swapped ? b : a), shown(swapped ? a : b), names);
+    std::vector<std::string> known;
+    const auto valueA = this->known(a.first, a.last, known);
+    const auto valueB = this->known(b.first, b.last, known);
+    if (valueA && valueB) {
+        const auto is = [&](SymbolicOp order) { return computeConstant(order, *valueA, *valueB)->bits != 0; };
+        const SymbolicOp order = is(SymbolicOp::LessThan)      ? SymbolicOp::LessThan
+                                 : is(SymbolicOp::GreaterThan) ? SymbolicOp::GreaterThan
+                                                               : SymbolicOp::Equal;
+        const SymbolicOp ordered = swapped ? operatorInfo(order).mirrored : order;
+        condition_.known.push_back(
+            {unknown, compareWith(table_, ordered, unknowns_[unknown].node, 0), std::move(known)});
+    }
     const SymbolicExprId node = compareWith(table_, swapped ? operatorInfo(op).mirrored : op, use(unknown), 0);
     return truthOf(node, std::min(a.first, b.first), std::max(a.last, b.last));
 }

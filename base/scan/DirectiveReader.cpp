@@ -139,6 +139,14 @@ std::size_t DirectiveReader::afterComment(std::size_t place) const {
     return text_.size();
 }
 
+/// Returns the place after a comment, and notes it, once.
+std::size_t DirectiveReader::passComment(std::size_t place) {
+    const std::size_t end = afterComment(place);
+    if (comments_ != nullptr && (comments_->empty() || comments_->back().begin < place))
+        comments_->push_back({place, end});
+    return end;
+}
+
 /// Returns the place after a literal; the end of its line for a literal without an end.
 std::size_t DirectiveReader::afterQuoted(std::size_t place) const {
     const char quote = text_[place++];
@@ -185,7 +193,7 @@ bool DirectiveReader::skipBlanks() {
         const Class kind = classOf(text_[place_]);
         const std::size_t next = kind == Class::Blank                            ? place_ + 1
                                  : kind == Class::Backslash                      ? afterSplices(place_)
-                                 : kind == Class::Slash && beginsComment(place_) ? afterComment(place_)
+                                 : kind == Class::Slash && beginsComment(place_) ? passComment(place_)
                                                                                  : place_;
         if (next == place_)
             break;
@@ -223,7 +231,7 @@ std::size_t DirectiveReader::skipLine() {
             break;
         }
         case Class::Slash:
-            place_ = beginsComment(place_) ? afterComment(place_) : place_ + 1;
+            place_ = beginsComment(place_) ? passComment(place_) : place_ + 1;
             break;
         case Class::Quote:
             place_ = afterQuoted(place_);

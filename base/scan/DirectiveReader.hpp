@@ -57,6 +57,12 @@ struct Directive {
     std::span<const DirectiveToken> tokens; ///< after the keyword; of code from the pragma operator on
 };
 
+/// A comment, in bytes.
+struct CommentPlace {
+    std::size_t begin;
+    std::size_t end;
+};
+
 /// Reads the directives of a text one by one, as a C preprocessor finds them: after line splices and comments, not in
 /// comments, string literals, character constants and raw strings.  Blanks between a backslash and the end of its line
 /// are ignored.  Trigraphs are not replaced.  An `import` at the beginning of a line is an inclusion.  A literal that
@@ -70,6 +76,9 @@ class VTSYM_API DirectiveReader {
 public:
     explicit DirectiveReader(std::string_view text);
 
+    /// Appends the comments that are passed from now on, in order, to a list that outlives the reader.
+    void noteComments(std::vector<CommentPlace>* comments) noexcept { comments_ = comments; }
+
     /// Reads the next directive of the kinds above; false at the end.  Tokens are valid until the next call.
     bool next(Directive& directive);
 
@@ -79,6 +88,7 @@ private:
     [[nodiscard]] std::size_t afterSplices(std::size_t place) const;
     [[nodiscard]] bool beginsComment(std::size_t place) const;
     [[nodiscard]] std::size_t afterComment(std::size_t place) const;
+    std::size_t passComment(std::size_t place);
     [[nodiscard]] std::size_t afterQuoted(std::size_t place) const;
     [[nodiscard]] std::size_t afterRawString(std::size_t quote);
     [[nodiscard]] std::size_t afterHeaderName(std::size_t place) const;
@@ -98,6 +108,7 @@ private:
     std::uint64_t line_ = 1;
     bool commentPassed_ = false;
     unsigned endlessRawStrings_ = 0;
+    std::vector<CommentPlace>* comments_ = nullptr;
     std::vector<DirectiveToken> tokens_;
     std::deque<std::string> joined_; ///< tokens with splices inside
 };

@@ -1,6 +1,8 @@
 // Finds branches of C and C++ files that are never entered, always entered, or entered by a condition that is too long.
 #pragma once
 
+#include "base/scan/build/BuildMacros.hpp"
+#include "base/scan/report/ConditionEdit.hpp"
 #include "host/Export.hpp"
 
 #include <cstdint>
@@ -23,18 +25,29 @@ struct SourceRegion {
     bool operator==(const SourceRegion&) const = default;
 };
 
-/// What is wrong with the condition of a branch.
+/// What is wrong with the condition of a branch, the worse kinds first.
 enum class BranchFindingKind : std::uint8_t {
     Dead,       ///< the branch is never entered
     AlwaysTrue, ///< it is entered whenever its directive is reached
     Removable,  ///< a shorter condition enters it in the same cases
+    SpelledOut, ///< it repeats that those before it in its chain do not hold: a matter of taste
 };
 
-/// A directive that a finding follows from.
+/// Where a reason comes from.
+enum class BranchReasonKind : std::uint8_t {
+    Directive,  ///< of the file
+    Build,      ///< a definition of the build
+    Assumption, ///< a condition that is assumed
+};
+
+/// What a finding follows from.
 struct BranchReason {
-    SourceRegion region;
-    std::string directive; ///< "#if A > 2"
+    SourceRegion region;   ///< a definition has the line in its file alone, or 0; an assumption has none
+    std::string directive; ///< "#if A > 2", "-DN=4", "N >= 1"
     bool holds;            ///< at the finding: true for a directive around it, false for one before it in its chain
+    BranchReasonKind kind = BranchReasonKind::Directive;
+    std::string file{}; ///< of a definition
+    bool operator==(const BranchReason&) const = default;
 };
 
 /// A finding about one directive, with the directives that prove it.
@@ -45,13 +58,19 @@ struct BranchFinding {
     std::string condition; ///< "defined(A)"; empty for #else
     std::string proposed;  ///< a condition to write instead; empty for #else
     std::vector<BranchReason> reasons;
-    std::optional<SourceRegion> replaced; ///< the region to replace by `replacement` for the proposed condition
-    std::string replacement;
+    std::optional<SourceRegion> replaced; ///< the region to replace by `edit.text` for the proposed condition
+    SourceEdit edit;                      ///< the same in bytes; comments, blanks and line splices stay
+    /// The operands that force the finding, as written or negated; none unless they are asked for.
+    std::vector<std::string> because{};
+    bool isMinimal = false; ///< without any one of them the finding does not follow
+    /// Configurations of the build that the finding holds for, by number; none for one that holds in every build.
+    std::vector<std::size_t> configurations{};
 };
 
 /// Options of a scanner, for all of its files.
 struct SourceScanOptions {
     bool strictIncludes = false; ///< whether an included file may change any macro, not only undefined ones
+    bool why = false;            ///< whether findings come with the operands that force them
 };
 
 /// Totals over all files of a scanner.
@@ -60,22 +79,35 @@ struct SourceScanCounts {
     std::uint64_t unread = 0;    ///< conditions that were read as one unknown
     std::uint64_t undecided = 0; ///< conditions about which a decision took too many steps and was given up
     std::uint64_t steps = 0;     ///< that decisions took
+    std::uint64_t leftOut = 0;   ///< configurations of files beyond limits::scanConfigurations
+};
+
+/// A file to scan.
+struct SourceFile {
+    std::string_view text; ///< any bytes
+    bool isCpp = false;    ///< whether true and false are constants; otherwise they are macros like others
+    /// The configurations that the file is built in; none where nothing is known.
+    std::vector<const BuildMacros*> configurations{};
 };
 
 /// Compares the condition of every #if, #ifdef, #ifndef, #elif, #elifdef and #elifndef with those around it and those
 /// before it in its chain.
 ///
-/// Every finding holds for every build: for macros defined as integers of 64 bits, signed or unsigned, and for macros
-/// that are not defined.  A macro that is defined or undefined on the way to a branch is a new unknown after it; so is
-/// one that the file defines by such a macro.  Macros that other files define are assumed to be self-contained: in
-/// parentheses where they are expressions, and independent of macros that this file changes.  An included or imported
-/// file may define macros that are not defined.  Macros that join tokens, or that depend on the place where they are
-/// read, are new unknowns with each reading.
+/// Every finding of a file without configurations holds for every build: for macros defined as integers of 64 bits,
+/// signed or unsigned, and for macros that are not defined.  A macro that is defined or undefined on the way to a
+/// branch is a new unknown after it; so is one that the file defines by such a macro.  Macros that other files define
+/// are assumed to be self-contained: in parentheses where they are expressions, and independent of macros that this
+/// file changes.  An included or imported file may define macros that are not defined.  Macros that join tokens, or
+/// that depend on the place where they are read, are new unknowns with each reading.
 ///
 /// Nothing is reported about a file that preprocessors read in different ways (trigraphs, carriage returns that end
 /// lines), about #if 0 and #if 1, which are switches, about code that they switch off, or inside dead branches.  A
 /// defined(X) beside a use of X is not reported as redundant: that X is 0 where it is not defined serves to find dead
 /// branches, not to shorten conditions.
+///
+/// With configurations, a file is scanned without them first, and then for each: macros are what the build defines,
+/// until the file changes them.  Definitions stay through included files.  Assumptions are conditions that hold for
+/// macros that the file did not change, wherever they are read.
 ///
 /// A scanner keeps its decisions from file to file.  It is used by one thread at a time.
 class VTSYM_API SourceScanner {
@@ -85,12 +117,17 @@ public:
     SourceScanner& operator=(SourceScanner&&) noexcept;
     ~SourceScanner();
 
+    /// Assumes a condition, as #if has them, in every file from now on.  Returns what is wrong with it, a part of a
+    /// sentence that follows its quotation; nothing where it is assumed.
+    std::optional<std::string> assume(std::string_view condition);
+    /// Whether all assumptions can hold together, as far as that is decided.
+    [[nodiscard]] bool assumptionsCanHold();
+
     /// Reports the findings of a file in the order of its lines.  The text may be any bytes.  About linear in the text:
-    /// beyond limits::scanSteps for a file and limits::scanStepsPerBranch for each condition, conditions are given up.
-    /// The findings of a file do not depend on the files scanned before it.
-    ///
-    /// @param isCpp   whether true and false are constants; otherwise they are macros like others
-    /// @param report  called for each finding
+    /// beyond limits::scanSteps for a file and limits::scanStepsPerBranch for each condition, conditions are given up;
+    /// so for each of its configurations.  The findings of a file do not depend on the files scanned before it.
+    void scan(const SourceFile& file, const std::function<void(const BranchFinding&)>& report);
+    /// The same for a file without configurations.
     void scan(std::string_view text, bool isCpp, const std::function<void(const BranchFinding&)>& report);
 
     /// Totals of all files so far.

@@ -195,6 +195,8 @@ public:
 
     /// The operands of a, and the assumptions, for which a implies b.
     Reasons explainImplies(const VCSymbolicExprId& a, const VCSymbolicExprId& b);
+    /// Why two conditions are equivalent: explainImplies() both ways.
+    EquivalenceReasons explainEquivalent(const VCSymbolicExprId& a, const VCSymbolicExprId& b);
     /// The operands and assumptions for which conditions never hold together; of one condition, for which it never
     /// holds.
     Reasons explainDisjoint(const std::vector<VCSymbolicExprId>& conditions);
@@ -246,6 +248,11 @@ public:
     /// The operands as text; nothing where the answer is not proven.
     std::optional<std::vector<std::string>> explainImpliesFromCConditions(const std::string& a, const std::string& b);
     std::optional<std::vector<std::string>> explainImpliesFromQConditions(const std::string& a, const std::string& b);
+    /// The operands of a that force b, and those of b that force a.
+    std::optional<std::pair<std::vector<std::string>, std::vector<std::string>>>
+    explainEquivalentFromCConditions(const std::string& a, const std::string& b);
+    std::optional<std::pair<std::vector<std::string>, std::vector<std::string>>>
+    explainEquivalentFromQConditions(const std::string& a, const std::string& b);
     std::optional<std::vector<std::string>> explainDisjointFromCConditions(const std::vector<std::string>& conditions);
     std::optional<std::vector<std::string>> explainDisjointFromQConditions(const std::vector<std::string>& conditions);
     bool assumeFromCCondition(const std::string& condition);
@@ -286,6 +293,8 @@ private:
     std::vector<VCSymbolicExprId> uniqueOperands(const VCSymbolicExprId& condition, bool ofAnd);
     std::vector<SymbolicExprId> withAssumptions(const std::vector<VCSymbolicExprId>& conditions);
     std::optional<std::vector<std::string>> printReasons(const Reasons& reasons, bool isQuill);
+    std::optional<std::pair<std::vector<std::string>, std::vector<std::string>>>
+    printReasons(const EquivalenceReasons& reasons, bool isQuill);
     std::vector<VCSymbolicExprId> parseAll(const std::vector<std::string>& texts, bool isQuill);
     std::vector<std::string> operandTexts(const std::string& condition, bool ofAnd, bool isQuill);
     SymbolicExprId simplifyNow(SymbolicExprId condition, bool isQuill);

@@ -25,6 +25,10 @@ Reasons VCService::explainImplies(const VCSymbolicExprId& a, const VCSymbolicExp
     return ReasonSearch(parts_->table, parts_->decider()).whyImplied(premises, b.id());
 }
 
+EquivalenceReasons VCService::explainEquivalent(const VCSymbolicExprId& a, const VCSymbolicExprId& b) {
+    return {explainImplies(a, b), explainImplies(b, a)};
+}
+
 Reasons VCService::explainDisjoint(const std::vector<VCSymbolicExprId>& conditions) {
     for (const VCSymbolicExprId& condition : conditions)
         if (!has(condition))
@@ -62,6 +66,27 @@ std::optional<std::vector<std::string>> VCService::explainImpliesFromQConditions
                                                                                  const std::string& b) {
     const SymbolicExprId first = parse(a, true);
     return printReasons(explainImplies(first, parse(b, true)), true);
+}
+
+std::optional<std::pair<std::vector<std::string>, std::vector<std::string>>>
+VCService::printReasons(const EquivalenceReasons& reasons, bool isQuill) {
+    auto first = printReasons(reasons.secondFromFirst, isQuill);
+    auto second = printReasons(reasons.firstFromSecond, isQuill);
+    if (!first || !second)
+        return std::nullopt;
+    return std::pair(*std::move(first), *std::move(second));
+}
+
+std::optional<std::pair<std::vector<std::string>, std::vector<std::string>>>
+VCService::explainEquivalentFromCConditions(const std::string& a, const std::string& b) {
+    const SymbolicExprId first = parse(a, false);
+    return printReasons(explainEquivalent(first, parse(b, false)), false);
+}
+
+std::optional<std::pair<std::vector<std::string>, std::vector<std::string>>>
+VCService::explainEquivalentFromQConditions(const std::string& a, const std::string& b) {
+    const SymbolicExprId first = parse(a, true);
+    return printReasons(explainEquivalent(first, parse(b, true)), true);
 }
 
 std::optional<std::vector<std::string>>

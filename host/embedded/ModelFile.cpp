@@ -7,6 +7,8 @@
 #include "host/embedded/ModelFile.hpp"
 
 #include "host/Text.hpp"
+#include "host/embedded/ModelMembers.hpp"
+#include "host/embedded/TextPlaces.hpp"
 
 #include <nlohmann/json.hpp>
 
@@ -24,120 +26,6 @@ namespace {
 using Json = nlohmann::json;
 
 constexpr std::size_t shownBytes = 80;
-
-// Where the reader is in a text.
-
-/// Records how far the parser has read, which it does not report.
-class CountingIterator {
-public:
-    using iterator_category = std::input_iterator_tag;
-    using value_type = char;
-    using difference_type = std::ptrdiff_t;
-    using pointer = const char*;
-    using reference = const char&;
-
-    CountingIterator(const char* at, const char*& furthest) : at_(at), furthest_(&furthest) {}
-
-    reference operator*() const { return *at_; }
-
-    CountingIterator& operator++() {
-        *furthest_ = ++at_;
-        return *this;
-    }
-
-    bool operator==(const CountingIterator& other) const { return at_ == other.at_; }
-
-    bool operator!=(const CountingIterator& other) const { return at_ != other.at_; }
-
-private:
-    const char* at_;
-    const char** furthest_;
-};
-
-/// Lines and columns of a text, asked for from front to back.
-class Places {
-public:
-    explicit Places(const std::string& text) : text_(text) {}
-
-    /// The place of the bytes from begin to end, which hold no line break.
-    TextPlace of(std::size_t begin, std::size_t end) {
-        const std::uint64_t first = advance(begin);
-        const std::uint64_t line = line_;
-        return {line, first, advance(end)};
-    }
-
-private:
-    std::uint64_t advance(std::size_t to) {
-        for (; at_ < to && at_ < text_.size(); ++at_) {
-            const auto byte = static_cast<unsigned char>(text_[at_]);
-            if (byte == '\n') {
-                ++line_;
-                column_ = 1;
-            } else if ((byte & 0xc0U) != 0x80U) {
-                ++column_;
-            }
-        }
-        return column_;
-    }
-
-    const std::string& text_;
-    std::size_t at_ = 0;
-    std::uint64_t line_ = 1;
-    std::uint64_t column_ = 1;
-};
-
-// The members of a model.
-
-enum class Part : std::uint8_t { Model, Blocks, Choices, Block, Ports, Port, Destinations, Symbols, Symbol, Values };
-
-enum class Shape : std::uint8_t { Text, List, TextOrList, Integer, Object };
-
-struct Member {
-    Part in;
-    std::string_view name;
-    Shape shape;
-    Part list; ///< the part that its list or object is
-};
-
-constexpr std::array<Member, 19> members{{
-    {Part::Model, "$schema", Shape::Text, {}},
-    {Part::Model, "name", Shape::Text, {}},
-    {Part::Model, "description", Shape::Text, {}},
-    {Part::Model, "language", Shape::Text, {}},
-    {Part::Model, "blocks", Shape::List, Part::Blocks},
-    {Part::Model, "ports", Shape::List, Part::Ports},
-    {Part::Model, "symbols", Shape::Object, Part::Symbols},
-    {Part::Block, "name", Shape::Text, {}},
-    {Part::Block, "description", Shape::Text, {}},
-    {Part::Block, "condition", Shape::Text, {}},
-    {Part::Block, "blocks", Shape::List, Part::Blocks},
-    {Part::Block, "choices", Shape::List, Part::Choices},
-    {Part::Block, "policy", Shape::Text, {}},
-    {Part::Port, "name", Shape::Text, {}},
-    {Part::Port, "from", Shape::Text, {}},
-    {Part::Port, "to", Shape::TextOrList, Part::Destinations},
-    {Part::Symbol, "values", Shape::List, Part::Values},
-    {Part::Symbol, "min", Shape::Integer, {}},
-    {Part::Symbol, "max", Shape::Integer, {}},
-}};
-
-bool isObject(Part part) {
-    return part == Part::Model || part == Part::Block || part == Part::Port || part == Part::Symbol;
-}
-
-std::string_view nameOf(Part part) {
-    return part == Part::Model   ? "a model"
-           : part == Part::Block ? "a block"
-           : part == Part::Port  ? "a port"
-                                 : "a symbol";
-}
-
-std::string inQuotes(std::string_view text) {
-    std::string result = "\"";
-    return result.append(shownText(text, shownBytes)).append("\"");
-}
-
-constexpr std::string_view integerWanted = "write an integer of 32 bits";
 
 class Reader final : public nlohmann::json_sax<Json> {
 public:
@@ -265,18 +153,7 @@ void Reader::refuseShape() const {
     if (open_.empty())
         fail(R"(a model is an object: write {"name": ..., "blocks": [...]})");
     const Open& top = open_.back();
-    if (!isObject(top.part)) {
-        fail(top.part == Part::Values         ? std::string(integerWanted)
-             : top.part == Part::Symbols      ? R"(write an object, {"values": [1, 2]} or {"min": 0, "max": 9})"
-             : top.part == Part::Destinations ? "write the path of a block, such as \"Engine/Diesel\""
-             : top.part == Part::Ports        ? R"(write a port, {"name": ..., "from": ..., "to": ...})"
-                                              : R"(write a block, {"name": ..., "condition": ...})");
-    }
-    fail(top.member->shape == Shape::Text      ? "write a text in quotes"
-         : top.member->shape == Shape::Integer ? std::string(integerWanted)
-         : top.member->shape == Shape::Object  ? R"(write an object, {"NAME": {"values": [1, 2]}})"
-         : top.member->shape == Shape::List    ? "write a list, [...]"
-                                               : "write the path of a block, or a list of such paths");
+    fail(isObject(top.part) ? valueWanted(*top.member) : elementWanted(top.part));
 }
 
 void Reader::open(Part part, VTBlock* block) {
@@ -337,15 +214,9 @@ bool Reader::key(string_t& name) {
             fail("this symbol is here twice: take one away");
         return true;
     }
-    const auto* const member =
-        std::ranges::find_if(members, [&](const Member& each) { return each.in == top.part && each.name == name; });
-    if (member == members.end()) {
-        std::string known;
-        for (const Member& each : members)
-            if (each.in == top.part && each.name != "$schema")
-                known.append(known.empty() ? "" : ", ").append(each.name);
-        fail("there is no member " + inQuotes(name) + "; " + std::string(nameOf(top.part)) + " has " + known);
-    }
+    const Member* const member = memberOf(top.part, name);
+    if (member == nullptr)
+        fail(noMember(top.part, name));
     top.member = member;
     if (std::ranges::find(top.seen, member->name) != top.seen.end())
         fail("this member is here twice: take one away");

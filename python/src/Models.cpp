@@ -26,6 +26,10 @@ public:
 
     void note(const std::string& sentence) override { notes.push_back(sentence); }
 
+    void remark(const Place&, std::span<const std::string> sentences, const std::string&) override {
+        notes.insert(notes.end(), sentences.begin(), sentences.end());
+    }
+
     std::vector<Finding> findings;
     std::vector<Problem> problems;
     std::vector<std::string> notes;

@@ -52,6 +52,44 @@ public:
             addChain(-1, 0);
     }
 
+    /// What a build says about the macros: an option or a file that defines one of them, a condition.
+    struct Build {
+        std::string macro;   ///< empty where nothing is defined
+        std::string value;   ///< one of the values
+        std::string option;  ///< for -D; empty for -U and for a file
+        std::string file;    ///< of definitions
+        std::string assumed; ///< empty for nothing
+    };
+
+    Build build() {
+        Build made;
+        if (below(4) != 0) {
+            made.macro = macros[below(macros.size())];
+            made.value = values[below(values.size())];
+            const std::string body = oneOf(made.value, "(" + made.value + ")", made.value + " + 0", "SAME");
+            const std::string definition = "#define " + made.macro + " " + body + "\n";
+            if (made.value.empty())
+                made.file = below(2) == 0 ? "" : "#define " + made.macro + " 1\n#undef " + made.macro + "\n";
+            else if (below(2) == 0 && body != "SAME")
+                made.option = made.macro + "=" + body;
+            else
+                made.file = oneOf("#define SAME " + made.value + "\n" + definition,
+                                  "#define SAME " + made.value + "\n#if SAME == " + made.value + "\n" + definition +
+                                      "#else\n#define " + made.macro + " 7\n#endif\n",
+                                  "#if UNKNOWN\n#define " + made.macro + " 7\n#else\n#endif\n#define SAME " +
+                                      made.value + "\n#undef " + made.macro + "\n" + definition);
+        }
+        if (below(3) != 0)
+            made.assumed = oneOf(atom(), atom() + " || " + atom(), "!(" + atom() + " && " + atom() + ")");
+        const bool isOdd =
+            made.assumed.find("#m") != std::string::npos || made.assumed.find("not") != std::string::npos ||
+            std::ranges::any_of(derived,
+                                [&](const std::string& each) { return made.assumed.find(each) != std::string::npos; });
+        if (isOdd || made.assumed.find_first_of("FJ\\\u00e9") != std::string::npos)
+            made.assumed.clear(); // not about A, B and C alone
+        return made;
+    }
+
     std::string text;
     std::vector<Branch> branches;
     Values values = allValues; ///< of A, B and C
@@ -156,7 +194,7 @@ private:
             return atom();
         if (below(4) == 0)
             return "!(" + condition(depth - 1) + ")";
-        const std::string op = oneOf(" && ", " || ", "&& \\\n");
+        const std::string op = oneOf(" && ", " || ", "&& \\\n", oneOf(" /* c */ && ", "||/*\n*/", " &\\\n&"));
         return "(" + condition(depth - 1) + ")" + op + (below(2) == 0 ? atom() : "(" + condition(depth - 1) + ")");
     }
 
@@ -204,8 +242,9 @@ private:
     bool few_ = !plain_ && below(2) == 0; ///< conditions are about two of them
 };
 
-/// The branches that are entered, for every definition.
-std::vector<std::set<int>> entered(std::string text, const Values& values) {
+/// The branches that are entered, for every definition.  With `assumed`, a -1 is among them where that condition does
+/// not hold before the file, or after a header.
+std::vector<std::set<int>> entered(std::string text, const Values& values, const std::string& assumed = {}) {
     const auto pragma = [](const std::string& what, const std::string& name) {
         return "#pragma " + what + "_macro(\"" + name + "\")\n";
     };
@@ -228,11 +267,16 @@ std::vector<std::set<int>> entered(std::string text, const Values& values) {
     std::string all;
     std::vector<std::size_t> digits(macros.size());
     for (bool more = true; more;) {
-        all += begin;
+        std::string definitions = begin;
         for (std::size_t i = 0; i < macros.size(); ++i)
             if (!values[digits[i]].empty())
-                all += "#define " + macros[i] + " " + values[digits[i]] + "\n";
-        all += "@@\n#line 1\n" + text;
+                definitions += "#define " + macros[i] + " " + values[digits[i]] + "\n";
+        all += "@@\n";
+        if (!assumed.empty()) {
+            const std::string check = "#if !(" + assumed + ")\n@-1\n#endif\n";
+            all += definitions + check + "#include \"header.h\"\n" + check;
+        }
+        all += definitions + "#line 1\n" + text;
         more = false;
         for (std::size_t i = 0; i < digits.size() && !more; ++i) {
             digits[i] = (digits[i] + 1) % values.size();
@@ -264,6 +308,57 @@ std::size_t offsetOf(const std::string& text, std::uint64_t line, std::uint64_t 
     return at;
 }
 
+/// What is found with the knowledge of a build is true of every world that agrees with it.
+void checkBuild(const RandomSource& source, const RandomSource::Build& build,
+                std::map<BranchFindingKind, int>& counts) {
+    const std::vector<std::set<int>> worlds = entered(source.text, source.values, build.assumed);
+    BuildMacros known;
+    bool isTaken = true;
+    if (!build.option.empty())
+        isTaken = known.define(build.option);
+    else if (!build.file.empty())
+        known.addFile("macros.h", build.file, false);
+    else if (!build.macro.empty())
+        isTaken = known.undefine(build.macro);
+    ASSERT_TRUE(isTaken);
+    SourceScanner scanner;
+    ASSERT_TRUE(build.assumed.empty() || !scanner.assume(build.assumed)) << build.assumed;
+    SourceFile file{source.text};
+    file.configurations = {&known};
+    scanner.scan(file, [&](const BranchFinding& finding) {
+        ++counts[finding.kind];
+        const auto branch =
+            std::ranges::find(source.branches, static_cast<std::size_t>(finding.region.line), &Branch::line);
+        ASSERT_NE(branch, source.branches.end());
+        const int number = static_cast<int>(branch - source.branches.begin());
+        for (std::size_t i = 0; i < worlds.size(); ++i) {
+            std::size_t digits = i;
+            for (const std::string& name : macros) {
+                const std::string& value = source.values[digits % source.values.size()];
+                if (name == build.macro && value != build.value && !finding.configurations.empty())
+                    digits = ~std::size_t{0};
+                if (digits == ~std::size_t{0})
+                    break;
+                digits /= source.values.size();
+            }
+            if (digits == ~std::size_t{0} || worlds[i].contains(-1))
+                continue;
+            const bool isIn = worlds[i].contains(number);
+            const std::string shown = finding.directive + " with " + build.option + " " + build.file + " and " +
+                                      build.assumed + "\n" + source.text;
+            ASSERT_FALSE(finding.kind == BranchFindingKind::Dead && isIn) << shown;
+            ASSERT_FALSE(finding.proposed == "1" && isReached(*branch, worlds[i]) && !isIn) << shown;
+        }
+    });
+}
+
+std::size_t commentsIn(const std::string& text) {
+    std::size_t count = 0;
+    for (std::size_t at = 0; (at = text.find("/*", at)) != std::string::npos; ++at)
+        ++count;
+    return count;
+}
+
 void check(const RandomSource& source, bool plain, std::map<BranchFindingKind, int>& counts) {
     const std::vector<std::set<int>> worlds = entered(source.text, source.values);
     ASSERT_EQ(worlds.size(), plain ? 343U : 64U);
@@ -275,23 +370,28 @@ void check(const RandomSource& source, bool plain, std::map<BranchFindingKind, i
             std::ranges::find(source.branches, static_cast<std::size_t>(finding.region.line), &Branch::line);
         ASSERT_NE(branch, source.branches.end());
         const int number = static_cast<int>(branch - source.branches.begin());
-        found[number] = finding.kind;
+        found[number] = finding.proposed == "1" ? BranchFindingKind::AlwaysTrue : finding.kind;
         for (const std::set<int>& world : worlds) {
             const bool isIn = world.contains(number);
             ASSERT_FALSE(finding.kind == BranchFindingKind::Dead && isIn) << finding.directive << "\n" << source.text;
-            ASSERT_FALSE(finding.kind == BranchFindingKind::AlwaysTrue && isReached(*branch, world) && !isIn)
-                << finding.directive << "\n"
-                << source.text;
+            ASSERT_FALSE(finding.proposed == "1" && isReached(*branch, world) && !isIn) << finding.directive << "\n"
+                                                                                        << source.text;
         }
         if (finding.replaced)
             fixes.push_back(finding);
     });
-    std::string mended = source.text; // all at once
-    for (auto fix = fixes.rbegin(); fix != fixes.rend(); ++fix) {
-        const std::size_t begin = offsetOf(mended, fix->replaced->line, fix->replaced->column);
-        const std::size_t end = offsetOf(mended, fix->replaced->endLine, fix->replaced->endColumn);
-        mended.replace(begin, end - begin, fix->replacement);
-    }
+    std::vector<SourceEdit> edits;
+    for (const BranchFinding& fix : fixes)
+        edits.push_back(fix.edit);
+    const std::string mended = withEdits(source.text, edits); // all at once
+    EXPECT_EQ(commentsIn(mended), commentsIn(source.text)) << mended;
+    SourceScanner().scan(mended, false, [&](const BranchFinding& finding) {
+        const std::size_t number = mended.find('@', offsetOf(mended, finding.region.line, finding.region.column));
+        const int branch = std::stoi(mended.substr(number + 1));
+        EXPECT_TRUE(!finding.replaced || !found.contains(branch)) << finding.directive << "\n"
+                                                                  << source.text << "\n"
+                                                                  << mended;
+    });
     const bool moves = source.text.find("__COUNTER__") != std::string::npos || // changes where something is left out
                        source.text.find("__LINE__") != std::string::npos;
     EXPECT_TRUE(moves || entered(mended, source.values) == worlds) << source.text << "\nis not\n" << mended;
@@ -321,6 +421,17 @@ TEST_P(Branches, AreWhatAPreprocessorMakesOfThem) {
         check(RandomSource(random, GetParam()), GetParam(), counts);
     std::cout << "dead " << counts[BranchFindingKind::Dead] << ", always true " << counts[BranchFindingKind::AlwaysTrue]
               << ", removable " << counts[BranchFindingKind::Removable] << "\n";
+    for (const auto& [kind, times] : counts)
+        EXPECT_GT(times, 10);
+}
+
+TEST(BranchesOfBuilds, AreWhatAPreprocessorMakesOfThem) {
+    std::mt19937_64 random(3);
+    std::map<BranchFindingKind, int> counts;
+    for (int i = 0; i < 300 && !::testing::Test::HasFailure(); ++i) {
+        RandomSource source(random, false);
+        checkBuild(source, source.build(), counts);
+    }
     for (const auto& [kind, times] : counts)
         EXPECT_GT(times, 10);
 }

@@ -7,25 +7,73 @@
 namespace VT::Testing {
 namespace {
 
+/// A finding as a line.
+std::string lineOf(const BranchFinding& found) {
+    const char* const kinds[] = {"dead", "always", "removable", "spelled-out"};
+    std::string line =
+        std::to_string(found.region.line) + " " + kinds[static_cast<int>(found.kind)] + " " + found.condition;
+    if (found.proposed != "0" && found.proposed != "1" && !found.proposed.empty())
+        line += " -> " + found.proposed;
+    for (const BranchReason& reason : found.reasons)
+        line += (reason.holds ? " @" : " !") +
+                (reason.kind == BranchReasonKind::Directive ? std::to_string(reason.region.line) : reason.directive);
+    for (std::size_t i = 0; i < found.because.size(); ++i)
+        line += (i == 0 ? " because " : ", ") + found.because[i];
+    for (const std::size_t configuration : found.configurations)
+        line += " #" + std::to_string(configuration + 1);
+    return line;
+}
+
 /// The findings, one a line.
-std::string findings(const std::string& text, const std::string& kind = {}) {
+std::string findings(SourceScanner scanner, const SourceFile& file) {
     std::string report;
-    const auto tell = [&](const BranchFinding& found) {
-        const char* const kinds[] = {"dead", "always", "removable"};
-        report += report.empty() ? "" : "\n";
-        report += std::to_string(found.region.line) + " " + kinds[static_cast<int>(found.kind)] + " " + found.condition;
-        if (found.kind == BranchFindingKind::Removable)
-            report += " -> " + found.proposed;
-        for (const BranchReason& reason : found.reasons)
-            report += (reason.holds ? " @" : " !") + std::to_string(reason.region.line);
-    };
-    SourceScanner({.strictIncludes = kind == "strict"}).scan(text, kind == "C++", tell);
+    scanner.scan(file, [&](const BranchFinding& found) { report += (report.empty() ? "" : "\n") + lineOf(found); });
     return report;
+}
+
+std::string findings(const std::string& text, const std::string& kind = {}) {
+    return findings(SourceScanner({.strictIncludes = kind == "strict", .why = kind == "why"}), {text, kind == "C++"});
 }
 
 TEST(Findings, AreAsListed) {
     for (const CaseRow& row : casesOf("scan-findings.txt", "findings", 4))
         EXPECT_EQ(findings(row[1], row[3]), row[2]) << row[0] << "\n" << row[1];
+}
+
+/// Words of a list, each after the blank before it.
+std::vector<std::string> wordsOf(const std::string& list, const std::string& separator) {
+    std::vector<std::string> words;
+    for (std::size_t at = 0; at <= list.size();) {
+        const std::size_t end = std::min(list.find(separator, at), list.size());
+        words.push_back(list.substr(at, end - at));
+        at = end + separator.size();
+    }
+    return words;
+}
+
+TEST(Findings, OfBuilds) {
+    for (const CaseRow& row : casesOf("scan-builds.txt", "builds", 4)) {
+        SourceScanner scanner({.why = true});
+        std::vector<BuildMacros> builds;
+        for (const std::string& configuration : wordsOf(row[1], " | ")) {
+            builds.emplace_back();
+            for (const std::string& option : wordsOf(configuration, "; ")) {
+                if (option.starts_with("-D"))
+                    EXPECT_TRUE(builds.back().define(option.substr(2))) << option;
+                else if (option.starts_with("-U"))
+                    EXPECT_TRUE(builds.back().undefine(option.substr(2))) << option;
+                else if (option.starts_with("assume "))
+                    EXPECT_EQ(scanner.assume(option.substr(7)), std::nullopt) << option;
+                else
+                    builds.back().addFile("c.h", option, true);
+            }
+        }
+        SourceFile file{row[2], true};
+        for (const BuildMacros& build : builds)
+            if (!build.empty())
+                file.configurations.push_back(&build);
+        EXPECT_EQ(findings(std::move(scanner), file), row[3]) << row[0] << "\n" << row[2];
+    }
 }
 
 TEST(Findings, OfLongFiles) {

@@ -59,6 +59,7 @@ TEST(Assumptions, RestrictEveryAnswer) {
             expect(!seen.onlyA && !seen.both, service->canHold(a));
         }
         EXPECT_EQ(service->explainImplies(a, b).isProven, !seen.onlyA);
+        EXPECT_EQ(service->explainEquivalent(a, b).firstFromSecond.isProven, !seen.onlyB);
         EXPECT_EQ(service->explainDisjoint({a, b}).isProven, !seen.both);
         EXPECT_TRUE(service->explainImpliedCondition(a, implied, b).because.isProven);
         shortened += service->printCExpr(shortest).size() < service->printCExpr(a).size() ? 1U : 0U;
@@ -85,6 +86,11 @@ TEST(Assumptions, HaveASayWhereTheyShareNames) {
     EXPECT_EQ(service->explainDisjointFromQConditions({"D", "rem(N,4) == 2 && E"}),
               (std::vector<std::string>{"rem(N,4)==0", "rem(N,4)==2"}));
     EXPECT_FALSE(service->explainImpliesFromQConditions("D", "E"));
+    const auto bothWays = service->explainEquivalentFromQConditions("E && rem(N,2) == 0", "E");
+    ASSERT_TRUE(bothWays);
+    EXPECT_EQ(bothWays->first, std::vector<std::string>{"E"});
+    EXPECT_EQ(bothWays->second, (std::vector<std::string>{"rem(N,4)==0", "E"}));
+    EXPECT_FALSE(service->explainEquivalentFromCConditions("E && D", "E"));
     service->clearAssumptions();
     EXPECT_TRUE(service->impliesFromCConditions("true", "A < C - 1").isNo());
     EXPECT_TRUE(service->assumeFromCCondition("false"));

@@ -114,6 +114,7 @@ TEST(Check, AgreesWithBruteForce) {
     };
     Json blocks = Json::array();
     std::set<std::string> expected;
+    std::map<std::string, std::vector<unsigned>> overlaps; // by set: the two bits of each pair
     const auto expectUsed = [&](const std::string& name, const Truths& truths, const Truths& around) {
         if (truths.none() || truths == around)
             expected.insert((truths.none() ? "dead " : "always-active ") + name);
@@ -136,14 +137,17 @@ TEST(Check, AgreesWithBruteForce) {
                 continue;
             expectUsed(name + "/" + choice, active.back(), parent);
             for (std::size_t i = 0; i + 1 < active.size(); ++i)
-                if ((active[i] & active.back()).any())
+                if ((active[i] & active.back()).any()) {
+                    overlaps[name].push_back(1U << i | 1U << (active.size() - 1));
                     expected.insert("overlapping " + name + "/" + std::to_string(i) + " " + name + "/" + choice);
+                }
         }
         if (missing.any())
             expected.insert("missing " + name);
         blocks.push_back({{"name", name}, {"condition", condition}, {"choices", choices}});
     }
     std::set<std::string> found;
+    std::ptrdiff_t removals = 0;
     std::string shortened;
     std::string equivalent;
     const TemporaryFolder place;
@@ -151,6 +155,20 @@ TEST(Check, AgreesWithBruteForce) {
     for (const std::string& line : linesOf(runScript(place, "vtsym check --json m").out)) {
         const Json finding = Json::parse(line);
         const std::string kind = finding["kind"];
+        if (kind == "choices") {
+            const std::string name = finding["name"];
+            const auto ends = [&](unsigned removed) {
+                return std::ranges::all_of(overlaps[name], [&](unsigned pair) { return (pair & removed) != 0; });
+            };
+            unsigned removed = 0;
+            for (const std::string path : finding["remove"])
+                removed |= 1U << std::stoul(path.substr(name.size() + 1));
+            ASSERT_TRUE(finding["smallest"] && ends(removed) && overlaps[name].size() > 1) << line;
+            for (unsigned other = 0; other < 32; ++other)
+                ASSERT_TRUE(!ends(other) || std::popcount(other) >= std::popcount(removed)) << line;
+            ++removals;
+            continue;
+        }
         if (kind == "redundant") {
             const Json& around = finding["follows"];
             const std::string context = around.empty() ? "(" : "(" + around[0]["text"].get<std::string>() + ") && (";
@@ -162,6 +180,7 @@ TEST(Check, AgreesWithBruteForce) {
                          " " + finding["name"].get<std::string>());
     }
     EXPECT_EQ(found, expected);
+    EXPECT_EQ(removals, std::ranges::count_if(overlaps, [](const auto& each) { return each.second.size() > 1; }));
     EXPECT_GT(found.size(), 1000U);
     EXPECT_GT(equivalent.size(), 1000U);
     EXPECT_EQ(runProgram({"compare"}, shortened).out, equivalent);

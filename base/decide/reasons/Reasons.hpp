@@ -16,6 +16,12 @@ struct Reasons {
     std::vector<SymbolicExprId> operands = {}; ///< in the order of the premises, as written there
 };
 
+/// Why two conditions hold for the same assignments.
+struct EquivalenceReasons {
+    Reasons secondFromFirst; ///< operands of the first that force the second
+    Reasons firstFromSecond; ///< and the other way round
+};
+
 /// An operand that a condition can lose where another one is known to hold.
 struct LostOperand {
     SymbolicExprId operand; ///< as written

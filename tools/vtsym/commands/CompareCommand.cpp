@@ -1,5 +1,6 @@
 // vtsym compare: the relation of two conditions, with the assignments that prove it.
 // The decider answers; this prints its decision as text or JSON.
+#include "tools/vtsym/answers/ReasonText.hpp"
 #include "tools/vtsym/commands/Commands.hpp"
 #include "tools/vtsym/commands/Pairs.hpp"
 #include "tools/vtsym/io/Json.hpp"
@@ -46,6 +47,8 @@ public:
             appendJson(pair, relation, out);
         else
             appendText(relation, out);
+        if (options_.why && relation.kind == VT::RelationKind::Equivalent)
+            appendBothWays(conditions_.service().explainEquivalent(pair.first, pair.second), out);
         const VT::Reasons reasons = options_.why ? reasonsOf(pair, relation) : VT::Reasons{};
         if (reasons.isProven && options_.json)
             appendMember(out, "because", reasonsJson(conditions_, options_, reasons));
@@ -67,6 +70,25 @@ private:
         default:
             return {};
         }
+    }
+
+    /// Why each of two equivalent conditions implies the other.
+    void appendBothWays(const VT::EquivalenceReasons& reasons, std::string& out) const {
+        std::string json;
+        const auto append = [&](const std::string& which, const char* member, const VT::Reasons& each) {
+            if (!each.isProven)
+                return;
+            if (options_.json)
+                appendMember(json, member, reasonsJson(conditions_, options_, each));
+            else if (each.operands.empty())
+                out.append("; " + which + " always holds");
+            else
+                out.append("; " + which + " because: ").append(reasonsText(conditions_, options_, each));
+        };
+        append("second", "a", reasons.secondFromFirst);
+        append("first", "b", reasons.firstFromSecond);
+        if (!json.empty())
+            appendMember(out, "because", "{" + json.substr(1) + "}");
     }
 
     void appendText(const VT::Relation& relation, std::string& out) const {

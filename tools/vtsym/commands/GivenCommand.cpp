@@ -1,5 +1,6 @@
 // vtsym given: conditions shortened under a condition that is known to hold.
 // The result is proven equal wherever the known condition holds.
+#include "tools/vtsym/answers/ReasonText.hpp"
 #include "tools/vtsym/commands/Commands.hpp"
 #include "tools/vtsym/commands/Pairs.hpp"
 #include "tools/vtsym/io/Json.hpp"
@@ -16,30 +17,6 @@ Examples:
   vtsym given --to quill '!A' 'A || B != 1'
   vtsym given --why 'VERSION >= 3 && NET' 'VERSION >= 2 && TLS'
   vtsym given --json < pairs.txt)";
-
-void appendReasons(const Conditions& conditions, const PairOptions& options, const VT::ShorteningReasons& reasons,
-                   std::string& out) {
-    if (!reasons.because.operands.empty())
-        out.append("; because: ").append(reasonsText(conditions, options, reasons.because));
-    for (const VT::LostOperand& lost : reasons.lost) {
-        const std::string facts = reasonsText(conditions, options, lost.because);
-        out.append("; without ").append(conditions.print(options, lost.operand));
-        out.append(": ").append(facts.empty() ? "the rest" : facts);
-    }
-}
-
-void appendReasonsJson(const Conditions& conditions, const PairOptions& options, const VT::ShorteningReasons& reasons,
-                       std::string& out) {
-    appendMember(out, "because", reasonsJson(conditions, options, reasons.because));
-    std::string lost;
-    for (const VT::LostOperand& each : reasons.lost) {
-        lost.append(lost.empty() ? "{" : ",{").append("\"operand\":");
-        lost.append(jsonString(conditions.print(options, each.operand)));
-        appendMember(lost, "because", reasonsJson(conditions, options, each.because));
-        lost.push_back('}');
-    }
-    appendMember(out, "lost", "[" + lost + "]");
-}
 
 } // namespace
 

@@ -76,20 +76,6 @@ ConditionPair readPair(const Conditions& conditions, const TextOptions& options,
     return pair;
 }
 
-std::string reasonsText(const Conditions& conditions, const TextOptions& options, const VT::Reasons& reasons) {
-    std::string text;
-    for (const VT::SymbolicExprId operand : reasons.operands)
-        text.append(text.empty() ? "" : ", ").append(conditions.print(options, operand));
-    return text;
-}
-
-std::string reasonsJson(const Conditions& conditions, const TextOptions& options, const VT::Reasons& reasons) {
-    std::string json;
-    for (const VT::SymbolicExprId operand : reasons.operands)
-        json.append(json.empty() ? "" : ",").append(jsonString(conditions.print(options, operand)));
-    return "[" + json + "]";
-}
-
 std::string witnessText(const Conditions& conditions, const TextOptions& options, const VT::Witness& witness) {
     std::string text;
     for (const VT::UnknownValue& each : witness) {

@@ -37,6 +37,10 @@ constexpr auto scanRules = std::to_array<FindingRule>({
     {"removable", "A condition has a shorter text that enters the branch in the same cases.",
      "The directives around the branch and before it in its chain make a part of the condition redundant. Correct the "
      "condition, or write the shorter one."},
+    {"spelled-out", "A condition repeats that those before it in its chain do not hold.",
+     "An #elif is reached only where the conditions before it in its chain do not hold, so that a part of its "
+     "condition "
+     "says so again. That is a matter of taste: keep it, or write the shorter condition."},
 });
 
 struct ScanOptions {
@@ -91,8 +95,8 @@ Finding findingOf(const std::string& file, const VT::BranchFinding& found) {
         finding.proposed = found.proposed;
     for (const VT::BranchReason& reason : found.reasons)
         finding.follows.push_back({placeOf(file, reason.region), reason.directive});
-    if (found.replaced && VT::shownText(found.replacement) == found.replacement) // a log can hold only UTF-8
-        finding.fix = Fix{"Write the shorter condition.", placeOf(file, *found.replaced), found.replacement};
+    if (found.replaced && VT::shownText(found.edit.text) == found.edit.text) // a log can hold only UTF-8
+        finding.fix = Fix{"Write the shorter condition.", placeOf(file, *found.replaced), found.edit.text};
     return finding;
 }
 

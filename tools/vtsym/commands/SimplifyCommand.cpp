@@ -2,6 +2,7 @@
 // Explanations and JSON count passes, so they bypass the caches of the service.
 #include "tools/vtsym/answers/Conditions.hpp"
 #include "tools/vtsym/answers/Explanation.hpp"
+#include "tools/vtsym/answers/ReasonText.hpp"
 #include "tools/vtsym/commands/Commands.hpp"
 #include "tools/vtsym/io/Json.hpp"
 #include "tools/vtsym/io/Texts.hpp"
@@ -25,11 +26,13 @@ Examples:
   vtsym simplify --normal-form '(A || B) && C'
   vtsym simplify --to quill 'a / b == 1 && x != 2'
   vtsym simplify --assume 'VERSION >= 3' 'VERSION >= 2 && TLS || VERSION < 1'
+  vtsym simplify --why --assume 'VERSION >= 3' 'VERSION >= 2 && TLS'
   vtsym simplify --json < conditions.txt)";
 
 struct SimplifyOptions : TextOptions {
     bool explain = false;
     bool normalForm = false;
+    bool why = false;
     bool bits32 = false;
     std::vector<std::string> assumptions;
 };
@@ -47,6 +50,7 @@ public:
 
 private:
     VT::SymbolicExprId answerInDetail(const std::string& text, std::string& out) const;
+    void explainShorter(VT::SymbolicExprId condition, VT::SymbolicExprId result, std::string& out) const;
 
     const SimplifyOptions& options_;
     const Style& style_;
@@ -67,6 +71,22 @@ void Simplifier::answer(const std::string& text, std::string& out) {
                                        : conditions_.printShortest(options_, result, condition));
     }
     warnings_ = conditions_.warnings(options_, result);
+    if (options_.why)
+        explainShorter(conditions_.parse(options_, text), result, out);
+}
+
+/// Appends which operands went, and why; nothing where the condition stays as it is.
+void Simplifier::explainShorter(VT::SymbolicExprId condition, VT::SymbolicExprId result, std::string& out) const {
+    VT::VCService& service = conditions_.service();
+    const VT::ShorteningReasons reasons =
+        condition == result ? VT::ShorteningReasons{}
+                            : service.explainImpliedCondition(condition, result, service.table().getIdTRUE());
+    if (!reasons.because.isProven)
+        return;
+    if (options_.json)
+        appendReasonsJson(conditions_, options_, reasons, out);
+    else
+        appendReasons(conditions_, options_, reasons, out);
 }
 
 /// Bypasses the caches of the service, which keep only results.
@@ -95,9 +115,13 @@ void addSimplify(CommandLine& program) {
     command.addFlag("--explain", "Show the rules that fired, pass by pass, and how the shortest form was reached",
                     options->explain);
     command.addFlag("--normal-form", "Answer with the sum of products instead", options->normalForm);
+    command.addFlag("--why", "Say which operands went, and which assumptions or other operands make them redundant",
+                    options->why);
     addBitsOption(command, options->bits32);
     addAssumeOption(command, options->assumptions);
     command.exclude("--normal-form", "--assume");
+    command.exclude("--why", "--normal-form");
+    command.exclude("--why", "--explain");
     command.afterOptions = [options] {
         const Conditions checked(options->bits32, *options, options->assumptions); // before any text is answered
     };

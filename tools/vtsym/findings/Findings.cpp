@@ -1,12 +1,14 @@
-// One writer for each form.  Findings are written as soon as they are found; a SARIF log keeps only its notifications
-// until the end, so that memory does not grow with the number of findings.
+// One writer for each form.  Findings are written as soon as they are found, but for a SARIF log, which keeps what it
+// may hold until the end: where there is more, notes are left out before warnings.
 #include "tools/vtsym/findings/Findings.hpp"
 
+#include "base/core/Limits.hpp"
 #include "host/Text.hpp"
 #include "tools/vtsym/io/CommandLine.hpp"
 #include "tools/vtsym/io/Json.hpp"
 
 #include <algorithm>
+#include <array>
 
 namespace vtsym {
 
@@ -28,6 +30,11 @@ private:
         console().out(console().outStyle().strong(placeText(finding.place) + ":") + " " +
                       VT::shownText(sentenceOf(finding)) + "\n");
     }
+
+    void addRemark(const Place& place, std::span<const std::string> sentences, const std::string&) override {
+        for (const std::string& sentence : sentences)
+            console().out(console().outStyle().strong(placeText(place) + ":") + " " + VT::shownText(sentence) + "\n");
+    }
 };
 
 class JsonWriter : public FindingWriter {
@@ -36,6 +43,12 @@ public:
 
 private:
     void add(const Finding& finding) override;
+
+    void addRemark(const Place& place, std::span<const std::string>, const std::string& members) override {
+        std::string out = "{\"file\":" + jsonString(place.file);
+        appendMember(out, "line", std::to_string(place.line));
+        console().out(out + members + "}\n");
+    }
 };
 
 /// Appends the reasons, where there are any.
@@ -47,10 +60,29 @@ void appendReasons(const Finding& finding, std::string& json) {
         appendMember(json, "because", "[" + list + "]");
 }
 
+/// Appends what is known of a finding beyond one scan in one build.
+void appendState(const Finding& finding, std::string& json) {
+    if (!finding.state.empty())
+        appendMember(json, "state", jsonString(finding.state));
+    if (finding.configurations.empty())
+        return;
+    std::string list;
+    for (const std::size_t configuration : finding.configurations)
+        list.append(list.empty() ? "" : ",").append(std::to_string(configuration));
+    appendMember(json, "configurations", "[" + list + "]");
+    appendMember(json, "of_configurations", std::to_string(finding.ofConfigurations));
+}
+
+std::string_view levelText(FindingLevel level) {
+    return level == FindingLevel::Note ? "note" : "warning";
+}
+
 void JsonWriter::add(const Finding& finding) {
     std::string out = "{\"file\":" + jsonString(finding.place.file);
     appendMember(out, "line", std::to_string(finding.place.line));
     appendMember(out, "kind", jsonString(finding.kind));
+    if (!finding.fingerprint.empty())
+        appendMember(out, "fingerprint", jsonString(finding.fingerprint));
     if (!finding.place.name.empty())
         appendMember(out, "name", jsonString(finding.place.name));
     appendMember(out, "condition", jsonString(finding.condition));
@@ -59,9 +91,15 @@ void JsonWriter::add(const Finding& finding) {
     if (!finding.witness.empty())
         appendMember(out, "witness", jsonString(finding.witness));
     appendReasons(finding, out);
+    appendState(finding, out);
     std::string follows;
     for (const RelatedPlace& related : finding.follows) {
-        follows.append(follows.empty() ? "{" : ",{").append("\"line\":").append(std::to_string(related.place.line));
+        std::string place;
+        if (related.place.file != finding.place.file && !related.place.file.empty())
+            appendMember(place, "file", jsonString(related.place.file));
+        if (related.place.line != 0)
+            appendMember(place, "line", std::to_string(related.place.line));
+        follows.append(follows.empty() ? "{" : ",{").append(place.empty() ? "\"build\":true" : place.substr(1));
         if (!related.place.name.empty())
             appendMember(follows, "name", jsonString(related.place.name));
         appendMember(follows, "text", jsonString(related.text));
@@ -100,13 +138,15 @@ private:
     void add(const Finding& finding) override;
     void addProblem(const Place& place, const std::string& sentence) override;
     void addNote(const std::string& sentence) override;
+    void addRemark(const Place& place, std::span<const std::string> sentences, const std::string& members) override;
     void end() override;
     void addNotification(std::string_view level, const std::string& sentence, const std::string& further);
 
     std::span<const FindingRule> rules_;
     std::string notifications_;
     bool successful_ = true;
-    bool first_ = true;
+    std::array<std::vector<std::pair<std::uint64_t, std::string>>, 2> results_; ///< numbered, by level
+    std::uint64_t added_ = 0;
 };
 
 std::string jsonRegion(const Place& place) {
@@ -151,7 +191,8 @@ SarifWriter::SarifWriter(Console& console, std::span<const FindingRule> rules) :
         out.append(&rule == rules.data() ? "{" : ",{").append("\"id\":").append(jsonString(rule.kind));
         appendMember(out, "shortDescription", jsonMessage(rule.summary));
         appendMember(out, "fullDescription", jsonMessage(rule.help));
-        appendMember(out, "defaultConfiguration", R"({"level":"warning"})");
+        appendMember(out, "help", jsonMessage(rule.help));
+        appendMember(out, "defaultConfiguration", "{\"level\":" + jsonString(levelText(rule.level)) + "}");
         out.push_back('}');
     }
     console.out(out + R"(]}},"columnKind":"unicodeCodePoints","results":[)");
@@ -159,30 +200,40 @@ SarifWriter::SarifWriter(Console& console, std::span<const FindingRule> rules) :
 
 void SarifWriter::add(const Finding& finding) {
     const auto rule = std::ranges::find(rules_, finding.kind, &FindingRule::kind);
-    std::string out = first_ ? "\n{" : ",\n{";
-    first_ = false;
-    out.append("\"ruleId\":").append(jsonString(finding.kind));
+    std::vector<std::pair<std::uint64_t, std::string>>& results = results_.at(static_cast<std::size_t>(finding.level));
+    ++added_;
+    if (results.size() == VT::limits::sarifResults)
+        return;
+    std::string out = "{\"ruleId\":" + jsonString(finding.kind);
     appendMember(out, "ruleIndex", std::to_string(rule - rules_.begin()));
-    appendMember(out, "level", "\"warning\"");
+    appendMember(out, "level", jsonString(levelText(finding.level)));
     appendMember(out, "message", jsonMessage(finding.message + "."));
     appendMember(out, "locations", "[" + jsonLocation(finding.place) + "]");
     if (!finding.follows.empty()) {
         std::string related;
         for (const RelatedPlace& each : finding.follows)
-            related.append(related.empty() ? "" : ",")
-                .append(jsonLocation(each.place, ",\"message\":" + jsonMessage(each.text)));
-        appendMember(out, "relatedLocations", "[" + related + "]");
+            if (!each.place.file.empty())
+                related.append(related.empty() ? "" : ",")
+                    .append(jsonLocation(each.place, ",\"message\":" + jsonMessage(each.text)));
+        if (!related.empty())
+            appendMember(out, "relatedLocations", "[" + related + "]");
     }
     if (finding.fix)
         appendMember(out, "fixes", "[" + jsonFix(*finding.fix) + "]");
+    if (!finding.fingerprint.empty())
+        appendMember(out, "partialFingerprints", "{\"vtsym/v1\":" + jsonString(finding.fingerprint) + "}");
+    if (!finding.state.empty())
+        appendMember(out, "baselineState", jsonString(finding.state));
     std::string properties = "{\"condition\":" + jsonString(finding.condition);
     if (finding.proposed)
         appendMember(properties, "proposed", jsonString(*finding.proposed));
     if (!finding.witness.empty())
         appendMember(properties, "witness", jsonString(finding.witness));
     appendReasons(finding, properties);
+    if (!finding.configurations.empty())
+        appendState(finding, properties);
     appendMember(out, "properties", properties + "}");
-    console().out(out + "}");
+    results.emplace_back(added_, out + "}");
 }
 
 void SarifWriter::addProblem(const Place& place, const std::string& sentence) {
@@ -194,6 +245,11 @@ void SarifWriter::addNote(const std::string& sentence) {
     addNotification("note", sentence, {});
 }
 
+void SarifWriter::addRemark(const Place& place, std::span<const std::string> sentences, const std::string&) {
+    for (const std::string& sentence : sentences)
+        addNotification("note", sentence, ",\"locations\":[" + jsonLocation(place) + "]");
+}
+
 /// `further` are members to add to the level and the message.
 void SarifWriter::addNotification(std::string_view level, const std::string& sentence, const std::string& further) {
     notifications_.append(notifications_.empty() ? "\n{" : ",\n{").append("\"level\":").append(jsonString(level));
@@ -202,6 +258,19 @@ void SarifWriter::addNotification(std::string_view level, const std::string& sen
 }
 
 void SarifWriter::end() {
+    constexpr std::size_t most = VT::limits::sarifResults;
+    auto& [notes, warnings] = results_;
+    notes.resize(std::min(notes.size(), most - warnings.size()));
+    if (const std::uint64_t written = notes.size() + warnings.size(); written < added_)
+        note(std::to_string(added_ - written) + " of " + std::to_string(added_) +
+             " results are left out, since a log holds " + std::to_string(most) +
+             ": scan fewer folders at once, or fewer kinds");
+    const char* separator = "\n";
+    for (auto a = notes.begin(), b = warnings.begin(); a != notes.end() || b != warnings.end();) {
+        auto& next = b == warnings.end() || (a != notes.end() && a->first < b->first) ? a : b;
+        console().out(separator + (next++)->second);
+        separator = ",\n";
+    }
     std::string out = "\n],\"invocations\":[{\"executionSuccessful\":";
     out.append(successful_ ? "true" : "false");
     if (!notifications_.empty())
@@ -269,6 +338,10 @@ void FindingWriter::problem(const Place& place, const std::string& sentence) {
 void FindingWriter::note(const std::string& sentence) {
     console_.err("vtsym: " + VT::shownText(sentence) + "\n");
     addNote(sentence);
+}
+
+void FindingWriter::remark(const Place& place, std::span<const std::string> sentences, const std::string& members) {
+    addRemark(place, sentences, members);
 }
 
 SearchResult FindingWriter::finish() {

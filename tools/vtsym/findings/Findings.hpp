@@ -31,7 +31,7 @@ struct Place {
 /// Another place that a finding follows from.
 struct RelatedPlace {
     Place place;
-    std::string text; ///< of the condition or directive there
+    std::string text; ///< of the condition or directive there, or of what is known of the build
 };
 
 /// A change that resolves a finding: replaces a region, which has a line and columns, by a text.
@@ -41,11 +41,15 @@ struct Fix {
     std::string text;
 };
 
+/// How much a finding matters, the least first.
+enum class FindingLevel : std::uint8_t { Note, Warning };
+
 /// A kind of findings.
 struct FindingRule {
     std::string_view kind;    ///< "dead"
     std::string_view summary; ///< a sentence
     std::string_view help;    ///< meaning and remedy, in sentences
+    FindingLevel level = FindingLevel::Warning;
 };
 
 struct Finding {
@@ -58,6 +62,12 @@ struct Finding {
     std::optional<Fix> fix;
     std::string witness;                   ///< "A=3, B=0", or empty
     std::vector<std::string> because = {}; ///< operands that force the finding
+    FindingLevel level = FindingLevel::Warning;
+    std::string fingerprint = {}; ///< of the content, the same wherever it moves; empty for none
+    std::string state = {};       ///< against another state of the file: "new", "unchanged", "absent"; empty for none
+    /// Configurations of the build that the finding holds for, from 1, of so many; none where it holds in every build.
+    std::vector<std::size_t> configurations = {};
+    std::size_t ofConfigurations = 0;
 };
 
 /// The message with its reasons.
@@ -85,6 +95,8 @@ public:
     virtual void problem(const Place& place, const std::string& sentence) = 0;
     /// A remark about the whole search; the search does not fail.
     virtual void note(const std::string& sentence) = 0;
+    /// Sentences about a place that are no findings.  `members` are those of a JSON object about them, each after a comma.
+    virtual void remark(const Place& place, std::span<const std::string> sentences, const std::string& members) = 0;
 };
 
 /// Writes findings as they are found, and counts them.  Problems and notes go to standard error.  Throws OutputError.
@@ -93,6 +105,7 @@ public:
     void write(const Finding& finding) override;
     void problem(const Place& place, const std::string& sentence) override;
     void note(const std::string& sentence) override;
+    void remark(const Place& place, std::span<const std::string> sentences, const std::string& members) override;
     /// Ends the output, after which nothing may be written.  Returns the outcome.
     SearchResult finish();
 
@@ -112,6 +125,8 @@ private:
     virtual void addProblem(const Place&, const std::string&) {}
 
     virtual void addNote(const std::string&) {}
+
+    virtual void addRemark(const Place&, std::span<const std::string> sentences, const std::string& members) = 0;
 
     virtual void end() {}
 

@@ -20,13 +20,11 @@ namespace vtsym {
 
 namespace {
 
-constexpr std::size_t shownBytes = 200;       ///< of a condition in a sentence
 constexpr std::size_t visitedAncestors = 256; ///< in search of conditions that a finding follows from
 constexpr std::size_t shownAncestors = 8;     ///< whose conditions a finding lists
 
 /// In the order of VT::ChoiceFault.
 constexpr std::array<std::string_view, 5> kinds{"dead", "always-active", "redundant", "overlapping", "missing"};
-constexpr std::string_view mergeable = "mergeable";
 
 std::string_view kindOf(VT::ChoiceFault fault) {
     return kinds.at(static_cast<std::size_t>(fault));
@@ -38,7 +36,7 @@ bool isUnconditional(const VTBlock& block) {
 }
 
 std::string shown(const std::string& text) {
-    return VT::shownText(text, shownBytes);
+    return VT::shownText(text, shownInSentence);
 }
 
 Place regionOf(const std::string& file, const VT::Embedded::TextPlace& place) {
@@ -273,7 +271,7 @@ VT::ChoiceSetReport ModelCheck::checkChoices(const VTBlock& block) {
     for (const VT::ChoiceFinding& finding : report.undecided)
         reportUndecided(block, block.choices(), finding);
     writeMerges(block, report, findings);
-    noteAdvice(choiceSets_.back());
+    writeAdvice(choiceSets_.back());
     if (!report.allOverlaps && !checker_.stepsUsedUp()) {
         write(findings, findingAt(placeOf(block), VT::ChoiceFault::Overlap,
                                   "more choices of " + block.path() + " overlap than the pairs reported",
@@ -285,46 +283,6 @@ VT::ChoiceSetReport ModelCheck::checkChoices(const VTBlock& block) {
 void ModelCheck::explain(Finding& finding, const VT::Reasons& reasons) const {
     for (const VT::SymbolicExprId operand : reasons.operands)
         finding.because.push_back(shown(print(operand)));
-}
-
-/// Reports on standard error which choices to remove, and how many assignments each one has.
-void ModelCheck::noteAdvice(ChoiceSet& set) {
-    if (!options_.why)
-        return;
-    const auto& choices = set.block->choices();
-    std::string removed;
-    for (const std::size_t choice : set.report.removal.choices)
-        removed.append(removed.empty() ? "" : ", ").append(choices[choice]->name());
-    if (!removed.empty())
-        set.advice.push_back("no choices overlap without " + shown(removed) +
-                             (set.report.removal.isSmallest ? "" : ", which may be more than needed"));
-    std::string counts;
-    for (std::size_t i = 0; i < set.report.assignments.size(); ++i)
-        if (const auto& count = set.report.assignments[i])
-            counts.append(", ").append(choices[i]->name()).append(" ").append(std::to_string(*count));
-    if (set.report.parentAssignments)
-        set.advice.push_back(std::to_string(*set.report.parentAssignments) + " assignments" + shown(counts));
-    for (const std::string& advice : set.advice)
-        writer_->note(set.block->path() + ": " + advice);
-}
-
-void ModelCheck::writeMerges(const VTBlock& set, const VT::ChoiceSetReport& report, std::vector<Finding>& findings) {
-    for (const VT::ChoiceMerge& merge : report.merges) {
-        const VTBlock& first = *set.choices()[merge.choices.front()];
-        Finding finding;
-        finding.place = placeOf(first);
-        finding.kind = mergeable;
-        finding.condition = first.variantCondition();
-        finding.proposed = print(merge.merged);
-        for (const std::size_t choice : merge.choices) {
-            const VTBlock& block = *set.choices()[choice];
-            finding.message += (finding.message.empty() ? "" : ", ") + block.path();
-            if (&block != &first)
-                finding.follows.push_back({placeOf(block), block.variantCondition()});
-        }
-        finding.message = shown(finding.message) + " can be one choice: " + shown(*finding.proposed);
-        write(findings, std::move(finding));
-    }
 }
 
 Finding ModelCheck::findingOf(const VTBlock& set, std::span<const VTBlock* const> blocks,

@@ -14,10 +14,13 @@
 
 namespace vtsym {
 
+inline constexpr std::size_t shownInSentence = 200;        ///< of a condition in a sentence about a model
+inline constexpr std::string_view mergeable = "mergeable"; ///< the kind of choices that can be one
+
 struct ModelCheckOptions {
     bool bits32 = false;
-    bool why = false;    ///< findings come with reasons, sets with the choices to remove and counted assignments
-    bool merges = false; ///< choices that can be merged are findings
+    bool why = false;                          ///< findings come with reasons, sets with counted assignments
+    bool merges = false;                       ///< choices that can be merged are findings
     std::vector<std::string> assumptions = {}; ///< in the language of the model
 };
 
@@ -61,7 +64,7 @@ private:
     VT::VCSymbolicExprId ownAfterOthers(const VTBlock& block);
     [[nodiscard]] VT::ChoiceSetOptions checkerOptions();
     void explain(Finding& finding, const VT::Reasons& reasons) const;
-    void noteAdvice(ChoiceSet& set);
+    void writeAdvice(ChoiceSet& set);
     void writeMerges(const VTBlock& set, const VT::ChoiceSetReport& report, std::vector<Finding>& findings);
     VT::ChoiceSetReport checkBlock(const VTBlock& block);
     VT::ChoiceSetReport checkChoices(const VTBlock& block);

@@ -1,6 +1,6 @@
 // Lines and columns of a file.  Columns are counted from the beginning of the line, in code points; a byte that is not
 // UTF-8 counts as one.  Nothing is kept: findings are few.
-#include "base/scan/SourcePlaces.hpp"
+#include "base/scan/report/SourcePlaces.hpp"
 
 #include <algorithm>
 

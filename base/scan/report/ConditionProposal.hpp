@@ -9,6 +9,12 @@
 
 namespace VT {
 
+/// Returns the text of a part of a condition that is not a chain of && or ||: as it is written in the tokens, or a
+/// comparison or a question in ordinary spelling.  Nothing where the part has no such text.
+std::optional<std::string> partText(const SymbolicExprTable& table, const MacroUnknowns& unknowns,
+                                    const std::vector<PartSpelling>& spellings, std::span<const DirectiveToken> tokens,
+                                    SymbolicExprId part);
+
 /// Returns the text of `proposal`, which was made from parts of `condition`: the parts as they are written in its
 /// tokens, and further comparisons in ordinary spelling.  Nothing where a part has no such text.
 std::optional<std::string> proposalText(const SymbolicExprTable& table, const MacroUnknowns& unknowns,

@@ -1,20 +1,17 @@
 // Writes shortened conditions in the words of their author: parts are looked up by node among the spellings of the
 // condition, and && and || between them are written with an explicit stack.  Linear in the shorter condition, times the
 // spellings.
-#include "base/scan/ConditionProposal.hpp"
+#include "base/scan/report/ConditionProposal.hpp"
 
 #include <algorithm>
 
 namespace VT {
 
-namespace {
-
-/// Returns the text of a part that is not a chain of && or ||.
 std::optional<std::string> partText(const SymbolicExprTable& table, const MacroUnknowns& unknowns,
-                                    const DirectiveCondition& condition, std::span<const DirectiveToken> tokens,
+                                    const std::vector<PartSpelling>& spellings, std::span<const DirectiveToken> tokens,
                                     SymbolicExprId part) {
-    const auto spelling = std::ranges::find(condition.spellings, part, &PartSpelling::part);
-    if (spelling != condition.spellings.end())
+    const auto spelling = std::ranges::find(spellings, part, &PartSpelling::part);
+    if (spelling != spellings.end())
         return spelledTokens(tokens.subspan(spelling->first, spelling->last - spelling->first + 1));
     const SymbolicExpr& node = *table.get(part);
     if (!comparisonOps.contains(node.op()))
@@ -31,8 +28,6 @@ std::optional<std::string> partText(const SymbolicExprTable& table, const MacroU
     text.append(" ").append(operatorInfo(node.op()).c).append(" ");
     return text.append(ofTwo ? unknown->right : std::to_string(value));
 }
-
-} // namespace
 
 std::optional<std::string> proposalText(const SymbolicExprTable& table, const MacroUnknowns& unknowns,
                                         const DirectiveCondition& condition, std::span<const DirectiveToken> tokens,
@@ -54,7 +49,7 @@ std::optional<std::string> proposalText(const SymbolicExprTable& table, const Ma
         }
         const SymbolicExpr& node = *table.get(piece.id);
         if (node.op() != SymbolicOp::And && node.op() != SymbolicOp::Or) {
-            const auto text = partText(table, unknowns, condition, tokens, piece.id);
+            const auto text = partText(table, unknowns, condition.spellings, tokens, piece.id);
             if (!text)
                 return std::nullopt;
             result.append(*text);

@@ -1,0 +1,105 @@
+// Picks and writes the operands that force a finding.
+//
+// Method: conditions are split at && and at negated ||, then the judge picks a minimal part of the operands, as it
+// picks directives.  What always holds (the laws) is no operand. Cost: at most limits::branchSteps for
+// limits::whyOperands operands.
+#include "base/scan/report/BranchWhy.hpp"
+
+#include "base/core/Limits.hpp"
+#include "base/scan/report/DirectiveTexts.hpp"
+
+#include <algorithm>
+
+namespace VT {
+
+namespace {
+
+struct Forcing {
+    SymbolicExprId node;
+    bool negated;
+    std::size_t condition; ///< that it is of
+};
+
+/// Appends the operands of a condition, in its order; false where there are too many.
+bool split(const SymbolicExprTable& table, std::size_t condition, SymbolicExprId id, std::vector<Forcing>& operands) {
+    std::vector<Forcing> open{{id, false, condition}};
+    while (!open.empty()) {
+        const Forcing next = open.back();
+        open.pop_back();
+        const SymbolicExpr& node = *table.get(next.node);
+        if (node.op() == SymbolicOp::Not) {
+            open.push_back({node.getInput(0), !next.negated, condition});
+        } else if (node.op() == (next.negated ? SymbolicOp::Or : SymbolicOp::And)) {
+            open.push_back({node.getInput(1), next.negated, condition});
+            open.push_back({node.getInput(0), next.negated, condition});
+        } else if (operands.size() == limits::whyOperands) {
+            return false;
+        } else {
+            operands.push_back(next);
+        }
+        if (open.size() > limits::whyOperands)
+            return false;
+    }
+    return true;
+}
+
+/// Whether `!` before a text would negate a part of it alone.
+bool needsBrackets(std::string_view text) {
+    std::size_t depth = 0;
+    for (const char c : text) {
+        depth += c == '(' ? 1U : 0U;
+        depth -= c == ')' && depth > 0 ? 1U : 0U;
+        if (depth == 0 && std::string_view("=<>&|+-*/%^?! ").find(c) != std::string_view::npos)
+            return true;
+    }
+    return false;
+}
+
+std::string textOf(const SymbolicExprTable& table, const MacroUnknowns& unknowns, const SpelledCondition& condition,
+                   const Forcing& operand) {
+    const auto spelled = partText(table, unknowns, condition.spellings, condition.tokens, operand.node);
+    std::string text;
+    if (spelled)
+        text = *spelled;
+    else if (const MacroUnknown* const unknown = unknowns.find(operand.node))
+        text = unknown->kind == MacroUnknown::Kind::Defined ? "defined(" + unknown->left + ")" : unknown->left;
+    else
+        text = spelledTokens(condition.tokens);
+    if (!operand.negated)
+        return text;
+    return needsBrackets(text) ? "!(" + text + ")" : "!" + text;
+}
+
+} // namespace
+
+BranchWhy whyOf(const SymbolicExprTable& table, const MacroUnknowns& unknowns, BranchJudge& judge,
+                SymbolicExprId condition, const BranchVerdict& verdict, const std::vector<SpelledCondition>& conditions,
+                KnownConditions known) {
+    std::vector<Forcing> operands;
+    for (std::size_t i = 0; i < conditions.size(); ++i)
+        if (!conditions[i].texts.empty())
+            operands.push_back({conditions[i].node, false, i});
+        else if (!split(table, i, conditions[i].node, operands))
+            return {};
+    if (operands.size() > limits::whyOperands)
+        return {};
+    known.facts.clear();
+    for (const Forcing& operand : operands)
+        known.facts.push_back(operand.negated ? judge.negated(operand.node) : operand.node);
+    const MinimalSubset kept = judge.reasons(condition, verdict, known);
+    BranchWhy why{{}, kept.isMinimal};
+    for (const std::size_t at : kept.positions) {
+        const SpelledCondition& of = conditions[operands[at].condition];
+        const auto add = [&](const std::string& text) {
+            if (std::ranges::find(why.operands, text) == why.operands.end())
+                why.operands.push_back(quotedDirective(text));
+        };
+        if (of.texts.empty())
+            add(textOf(table, unknowns, of, operands[at]));
+        else
+            std::ranges::for_each(of.texts, add);
+    }
+    return why;
+}
+
+} // namespace VT
