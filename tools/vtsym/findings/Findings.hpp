@@ -64,7 +64,8 @@ struct Finding {
     std::vector<std::string> because = {}; ///< operands that force the finding
     FindingLevel level = FindingLevel::Warning;
     std::string fingerprint = {}; ///< of the content, the same wherever it moves; empty for none
-    std::string state = {};       ///< against another state of the file: "new", "unchanged", "absent"; empty for none
+    /// Against another state of the file: "new", "unchanged", "absent", "updated"; empty where there is none.
+    std::string state = {};
     /// Configurations of the build that the finding holds for, from 1, of so many; none where it holds in every build.
     std::vector<std::size_t> configurations = {};
     std::size_t ofConfigurations = 0;
@@ -91,6 +92,10 @@ public:
     virtual ~FindingWriter() = default;
 
     void write(const Finding& finding);
+
+    /// Writes what is no finding of this state: the search finds nothing by it.
+    void remark(const Finding& finding) { add(finding); }
+
     /// Reports on standard error that a place could not be searched completely; the search fails.
     void problem(const Place& place, const std::string& sentence);
     /// Reports a remark about the whole search on standard error; the search does not fail.
