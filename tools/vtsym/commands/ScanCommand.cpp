@@ -228,10 +228,14 @@ void Scan::fix(const std::string& path, const std::string& text, const std::vect
     for (const FileFinding& each : found) {
         if (!settings_.baseline.empty() && baseline_.covers(each.finding, today_, options_.days))
             continue;
-        if (each.edit && (edits.empty() || edits.back().end <= each.edit->begin))
-            edits.push_back(*each.edit);
-        else if (!each.edit && !options_.dryRun)
+        if (!each.edit && !options_.dryRun)
             writer_->write(each.finding);
+        if (!each.edit)
+            continue;
+        if (!edits.empty() &&
+            each.edit->begin < edits.back().end) // of the same condition: what the build adds is later
+            edits.pop_back();
+        edits.push_back(*each.edit);
     }
     fixed_ += edits.size();
     if (options_.dryRun) {

@@ -27,6 +27,12 @@ std::string absolutePath(const fs::path& path) {
     return fs::absolute(path).lexically_normal().string();
 }
 
+/// A path as messages show it: from the working directory where it is below that.
+std::string shownPath(const std::string& path) {
+    const fs::path near = fs::path(path).lexically_proximate(fs::current_path());
+    return near.empty() || *near.begin() == ".." ? path : near.string();
+}
+
 /// The argument of an option at a position of a command, joined or next to it; the position is moved to it.
 std::optional<std::string> argumentOf(const std::vector<std::string>& words, std::size_t& at, std::string_view option) {
     if (!words[at].starts_with(option))
@@ -107,7 +113,7 @@ CompileCommands CompileCommands::read(std::string_view json, const std::function
             if (isNew)
                 known->second = readFile(path, mostBytes);
         } catch (const FileError& error) {
-            problem(path + " " + error.what() + ": macros that are not defined may be defined there");
+            problem(shownPath(path) + " " + error.what() + ": macros that are not defined may be defined there");
         }
         return known->second;
     };
@@ -131,7 +137,7 @@ CompileCommands CompileCommands::read(std::string_view json, const std::function
             for (const std::string& each : files) {
                 const std::string path = absolutePath(fs::path(command.folder) / each);
                 if (const std::optional<std::string>& text = textOf(path))
-                    build.addFile(path, *text, isCppPath(file));
+                    build.addFile(shownPath(path), *text, isCppPath(file));
                 else
                     build.forgetUndefined();
             }

@@ -85,7 +85,13 @@ std::vector<Change> changesOf(const std::vector<std::string_view>& lines, std::s
             edit.begin -= begin;
             edit.end -= begin;
         }
-        changes.push_back({line, end, VT::withEdits(text.substr(begin, offset(end) - begin), own)});
+        std::string written = VT::withEdits(text.substr(begin, offset(end) - begin), own);
+        std::size_t same = 0; // lines at the beginning
+        while (same < end - line && std::string_view(written).starts_with(lines[line + same])) {
+            written.erase(0, lines[line + same].size());
+            ++same;
+        }
+        changes.push_back({line + same, end, std::move(written)});
         line = end - 1;
         first = last;
     }

@@ -58,11 +58,13 @@ std::string reasonText(const VT::BranchReason& reason) {
 }
 
 /// "since '#if A' (line 1) holds and '#if B' (line 2) does not hold here".
-std::string reasonsText(const std::vector<VT::BranchReason>& reasons) {
+std::string reasonsText(const VT::BranchFinding& found) {
+    const std::vector<VT::BranchReason>& reasons = found.reasons;
     std::string text = "since ";
     for (std::size_t i = 0; i < reasons.size(); ++i)
         text.append(i == 0 ? "" : i + 1 == reasons.size() ? " and " : ", ").append(reasonText(reasons[i]));
-    return reasons.back().kind == VT::BranchReasonKind::Directive ? text + " here" : text;
+    text.append(reasons.back().kind == VT::BranchReasonKind::Directive ? " here" : "");
+    return found.hasOtherReasons ? text + " or for other reasons" : text;
 }
 
 std::string messageOf(const VT::BranchFinding& found) {
@@ -71,14 +73,14 @@ std::string messageOf(const VT::BranchFinding& found) {
     if (found.kind == VT::BranchFindingKind::Dead) {
         text.append("is dead");
         alone = ", the condition contradicts itself";
-    } else if (found.proposed == "1") {
+    } else if (found.kind != VT::BranchFindingKind::Removable && found.proposed == "1") {
         text.append("always holds");
         alone = ", whatever the macros are";
     } else {
         text.append("can be '").append(found.directive, 0, found.directive.find(' ') + 1).append(found.proposed);
         text.append("'");
     }
-    return found.reasons.empty() ? text + alone : text + ", " + reasonsText(found.reasons);
+    return found.reasons.empty() ? text + alone : text + ", " + reasonsText(found);
 }
 
 /// Whether a log, which holds UTF-8, can hold a text.

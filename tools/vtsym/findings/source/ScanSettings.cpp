@@ -25,7 +25,8 @@ constexpr const char* usualKindsExclude = "spelled-out";
 
 /// A path of a settings file, from where the program is.
 std::string pathIn(const std::string& folder, const std::string& path) {
-    return folder.empty() || fs::path(path).is_absolute() ? path : (fs::path(folder) / path).string();
+    return folder.empty() || fs::path(path).is_absolute() ? path
+                                                          : (fs::path(folder) / path).lexically_normal().string();
 }
 
 /// Reads the members of the table [scan].
