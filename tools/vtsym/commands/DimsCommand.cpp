@@ -21,12 +21,12 @@
 #include <optional>
 #include <string_view>
 
-    namespace vtsym {
+namespace vtsym {
 
-    namespace {
+namespace {
 
-    constexpr const char* notes =
-        R"(Each answer has a line for every form: the text with integers for its numbers, the simplified form, and that form with
+constexpr const char* notes =
+    R"(Each answer has a line for every form: the text with integers for its numbers, the simplified form, and that form with
 its divisions pulled outwards; then the symbols and, if all of them are defined, the value.  Divisions are taken to be
 exact.
 
@@ -36,195 +36,192 @@ Examples:
   vtsym dims --assume 'N >= 1 && N <= 64 && N % 4 == 0' --prove 'N*2 >= 8'
   vtsym dims --json < dimensions.txt)";
 
-    struct DimsOptions : TextOptions {
-        Definitions definitions;
-        std::vector<std::string> assumptions;
-        std::vector<std::string> claims;
-    };
+struct DimsOptions : TextOptions {
+    Definitions definitions;
+    std::vector<std::string> assumptions;
+    std::vector<std::string> claims;
+};
 
-    /// Reads a dimension expression and turns its numbers into integers.  Throws the first diagnostic of the reader.
-    VT::SymbolicExprId readDimension(VT::SymbolicExprTable& table, const std::string& text) {
-        VT::VTSymbolicExprErrorChecker checker;
-        const VT::SymbolicExprId id = VT::SymbolicExprFromQParseTree(table, checker)(text);
-        if (!checker.diagnostics().empty())
-            throw VT::HostDiagnostic(checker.diagnostics().front());
-        return VT::SymbolicExprCast2Int(table).cast2Int(id);
+/// Reads a dimension expression and turns its numbers into integers.  Throws the first diagnostic of the reader.
+VT::SymbolicExprId readDimension(VT::SymbolicExprTable& table, const std::string& text) {
+    VT::VTSymbolicExprErrorChecker checker;
+    const VT::SymbolicExprId id = VT::SymbolicExprFromQParseTree(table, checker)(text);
+    if (!checker.diagnostics().empty())
+        throw VT::HostDiagnostic(checker.diagnostics().front());
+    return VT::SymbolicExprCast2Int(table).cast2Int(id);
+}
+
+void define(VT::SymbolicExprTable& table, const DimsOptions& options) {
+    table.addBoolSymbols();
+    bindDefinitions(table, options.definitions,
+                    [&table](const std::string& text) { return readDimension(table, text); });
+}
+
+std::vector<std::string> symbolsOf(const VT::SymbolicExprTable& table, VT::SymbolicExprId id) {
+    using enum VT::VCSymbolType;
+    std::vector<std::string> symbols;
+    VT::VCSymbolsOfSymbolicExpr(table, {Identifier, BoundMember, UnboundMember}).getSymbols(id, symbols);
+    std::erase_if(symbols, [](const std::string& name) { return name == "true" || name == "false"; });
+    return symbols;
+}
+
+/// The value, or nullopt where a symbol has no value.
+std::optional<VT::SymbolicValue> valueOf(const VT::SymbolicExprTable& table, VT::SymbolicExprId id) {
+    std::vector<VT::SymbolicExprId> unbound;
+    VT::VCSymbolsOfSymbolicExpr(table, {VT::VCSymbolType::UnboundMember}).getSymbolIds(id, unbound);
+    if (!unbound.empty())
+        return std::nullopt;
+    try {
+        return VT::SymbolicExprEval(table).eval(id);
+    } catch (const VT::HostDiagnostic& diagnostic) {
+        if (diagnostic.messageId() != "Vantor:SymbolicDims:UnboundSymbol")
+            throw;
+        return std::nullopt;
+    }
+}
+
+/// Appends the lines, or the JSON members, of one answer.
+class Report {
+public:
+    Report(std::string& out, bool json, const Style& style) : out_(out), json_(json), style_(style) {}
+
+    void text(std::string_view name, const std::string& text) {
+        json_ ? member(name, jsonString(text)) : line(name, text);
     }
 
-    void define(VT::SymbolicExprTable& table, const DimsOptions& options) {
-        table.addBoolSymbols();
-        bindDefinitions(table, options.definitions,
-                        [&table](const std::string& text) { return readDimension(table, text); });
+    void list(std::string_view name, const std::vector<std::string>& texts) {
+        std::string list;
+        for (const std::string& text : texts)
+            list.append(list.empty() ? "" : json_ ? "," : ", ").append(json_ ? jsonString(text) : text);
+        if (json_)
+            member(name, "[" + list + "]");
+        else if (!texts.empty())
+            line(name, list);
     }
 
-    std::vector<std::string> symbolsOf(const VT::SymbolicExprTable& table, VT::SymbolicExprId id) {
-        using enum VT::VCSymbolType;
-        std::vector<std::string> symbols;
-        VT::VCSymbolsOfSymbolicExpr(table, {Identifier, BoundMember, UnboundMember}).getSymbols(id, symbols);
-        std::erase_if(symbols, [](const std::string& name) { return name == "true" || name == "false"; });
-        return symbols;
+    void value(const VT::SymbolicValue& value) {
+        if (json_)
+            member("type", jsonString(typeText(value)));
+        json_ ? member("value", valueText(value, true)) : line("value", style_.good(valueText(value, false)));
     }
 
-    /// The value, or nullopt where a symbol has no value.
-    std::optional<VT::SymbolicValue> valueOf(const VT::SymbolicExprTable& table, VT::SymbolicExprId id) {
-        std::vector<VT::SymbolicExprId> unbound;
-        VT::VCSymbolsOfSymbolicExpr(table, {VT::VCSymbolType::UnboundMember}).getSymbolIds(id, unbound);
-        if (!unbound.empty())
-            return std::nullopt;
+private:
+    static constexpr std::size_t nameColumns = 12;
+
+    void member(std::string_view name, std::string_view value) { appendMember(out_, name, value); }
+
+    void line(std::string_view name, std::string_view text) {
+        out_.append(begun_ ? "\n" : "").append(style_.name(name));
+        out_.append(nameColumns - name.size(), ' ').append(text);
+        begun_ = true;
+    }
+
+    std::string& out_;
+    bool json_;
+    const Style& style_;
+    bool begun_ = false;
+};
+
+void answer(const DimsOptions& options, const Style& style, const std::string& text, std::string& out) {
+    VT::SymbolicExprTable table;
+    define(table, options);
+    const VT::SymbolicExprId cast = readDimension(table, text);
+    const std::optional<VT::SymbolicValue> value = valueOf(table, cast);
+    std::uint64_t passes = 0;
+    const VT::SymbolicExprId simplified = VT::SymbolicExprSimplify(table).simplify(cast, passes);
+    const VT::SymbolicExprPrinter printer(table, true);
+    Report report(out, options.json, style);
+    report.text("cast", printer(cast));
+    report.text("simplified", printer(simplified));
+    report.text("factored", printer(VT::SymbolicExprFactorDivision(table).factorDivision(simplified)));
+    report.list("symbols", symbolsOf(table, cast));
+    if (value)
+        report.value(*value);
+}
+
+/// Throws UsageError for an assumption that cannot be read.
+void assume(VT::SymbolicExprTable& table, const DimsOptions& options, VT::Assumptions& assumptions) {
+    for (const std::string& text : options.assumptions) {
         try {
-            return VT::SymbolicExprEval(table).eval(id);
+            assumptions.add(VT::SymbolicExprParser(table, true, true)(text));
         } catch (const VT::HostDiagnostic& diagnostic) {
-            if (diagnostic.messageId() != "Vantor:SymbolicDims:UnboundSymbol")
-                throw;
-            return std::nullopt;
+            throw UsageError("--assume", quotedArgument(text) + " cannot be read: " + diagnostic.what());
         }
     }
+    VT::Decider decider(table);
+    if (VT::ReasonSearch(table, decider).whyNever(assumptions.all()).isProven)
+        throw UsageError("--assume", "the conditions contradict each other");
+}
 
-    /// Appends the lines, or the JSON members, of one answer.
-    class Report {
-    public:
-        Report(std::string& out, bool json, const Style& style) : out_(out), json_(json), style_(style) {}
-
-        void text(std::string_view name, const std::string& text) {
-            json_ ? member(name, jsonString(text)) : line(name, text);
+/// Answers whether claims hold wherever the assumptions do; returns whether all are decided.
+bool prove(const DimsOptions& options, Console& console) {
+    VT::SymbolicExprTable table;
+    define(table, options);
+    VT::Assumptions assumptions(table);
+    assume(table, options, assumptions);
+    VT::Decider decider(table, {.solver = &VT::SolverPlugin::installed()});
+    VT::DimensionProofs proofs(table, decider, assumptions);
+    bool isDecided = true;
+    for (const std::string& text : options.claims) {
+        VT::SymbolicExprId claim = VT::invalidId;
+        try {
+            claim = VT::SymbolicExprParser(table, true, true)(text);
+        } catch (const VT::HostDiagnostic& diagnostic) {
+            throw UsageError("--prove", quotedArgument(text) + " cannot be read: " + diagnostic.what());
         }
-
-        void list(std::string_view name, const std::vector<std::string>& texts) {
-            std::string list;
-            for (const std::string& text : texts)
-                list.append(list.empty() ? "" : json_ ? "," : ", ").append(json_ ? jsonString(text) : text);
-            if (json_)
-                member(name, "[" + list + "]");
-            else if (!texts.empty())
-                line(name, list);
+        const VT::Decision decision = proofs.holds(claim);
+        isDecided = isDecided && !decision.isUndecided();
+        const char* const answer = decision.isYes() ? "proven" : decision.isNo() ? "refuted" : "undecided";
+        std::string witness;
+        std::string json;
+        for (const VT::UnknownValue& each : decision.witness.value_or(VT::Witness{})) {
+            const std::string name = decider.nameOf(each.unknown);
+            witness.append(witness.empty() ? ": " : ", ").append(name).append("=").append(std::to_string(each.value));
+            json.append(json.empty() ? "" : ",")
+                .append(jsonString(name))
+                .append(":")
+                .append(std::to_string(each.value));
         }
-
-        void value(const VT::SymbolicValue& value) {
-            if (json_)
-                member("type", jsonString(typeText(value)));
-            json_ ? member("value", valueText(value, true)) : line("value", style_.good(valueText(value, false)));
+        if (!options.json) {
+            console.out(answer + witness + "\n");
+            continue;
         }
-
-    private:
-        static constexpr std::size_t nameColumns = 12;
-
-        void member(std::string_view name, std::string_view value) { appendMember(out_, name, value); }
-
-        void line(std::string_view name, std::string_view text) {
-            out_.append(begun_ ? "\n" : "").append(style_.name(name));
-            out_.append(nameColumns - name.size(), ' ').append(text);
-            begun_ = true;
-        }
-
-        std::string& out_;
-        bool json_;
-        const Style& style_;
-        bool begun_ = false;
-    };
-
-    void answer(const DimsOptions& options, const Style& style, const std::string& text, std::string& out) {
-        VT::SymbolicExprTable table;
-        define(table, options);
-        const VT::SymbolicExprId cast = readDimension(table, text);
-        const std::optional<VT::SymbolicValue> value = valueOf(table, cast);
-        std::uint64_t passes = 0;
-        const VT::SymbolicExprId simplified = VT::SymbolicExprSimplify(table).simplify(cast, passes);
-        const VT::SymbolicExprPrinter printer(table, true);
-        Report report(out, options.json, style);
-        report.text("cast", printer(cast));
-        report.text("simplified", printer(simplified));
-        report.text("factored", printer(VT::SymbolicExprFactorDivision(table).factorDivision(simplified)));
-        report.list("symbols", symbolsOf(table, cast));
-        if (value)
-            report.value(*value);
+        std::string out = "{\"claim\":" + jsonString(text);
+        appendMember(out, "answer", jsonString(answer));
+        if (decision.witness)
+            appendMember(out, "witness", "{" + json + "}");
+        console.out(out + "}\n");
     }
+    console.flush();
+    return isDecided;
+}
 
-    /// Throws UsageError for an assumption that cannot be read.
-    void assume(VT::SymbolicExprTable& table, const DimsOptions& options, VT::Assumptions& assumptions) {
-        for (const std::string& text : options.assumptions) {
-            try {
-                assumptions.add(VT::SymbolicExprParser(table, true, true)(text));
-            } catch (const VT::HostDiagnostic& diagnostic) {
-                throw UsageError("--assume", quotedArgument(text) + " cannot be read: " + diagnostic.what());
-            }
-        }
-        VT::Decider decider(table);
-        if (VT::ReasonSearch(table, decider).whyNever(assumptions.all()).isProven)
-            throw UsageError("--assume", "the conditions contradict each other");
-    }
+} // namespace
 
-    /// Answers whether claims hold wherever the assumptions do; returns whether all are decided.
-    bool prove(const DimsOptions& options, Console& console) {
-        VT::SymbolicExprTable table;
-        define(table, options);
+void addDims(CommandLine& program) {
+    Command& command = program.add("dims", "Rearrange and evaluate dimension expressions in Quill", notes);
+    const auto options = std::make_shared<DimsOptions>();
+    addTexts(command, *options);
+    addDefinitions(command, options->definitions);
+    addAssumeOption(command, options->assumptions);
+    command.addArguments({"--prove", "Prove or refute a comparison of dimensions, in C; may be repeated", "CLAIM"},
+                         [options](std::vector<std::string> claims) { options->claims = std::move(claims); });
+    command.afterOptions = [options] {
+        VT::SymbolicExprTable table; // reports wrong definitions before any text is answered
+        define(table, *options);
         VT::Assumptions assumptions(table);
-        assume(table, options, assumptions);
-        VT::Decider decider(table, {.solver = &VT::SolverPlugin::installed()});
-        VT::DimensionProofs proofs(table, decider, assumptions);
-        bool isDecided = true;
-        for (const std::string& text : options.claims) {
-            VT::SymbolicExprId claim = VT::invalidId;
-            try {
-                claim = VT::SymbolicExprParser(table, true, true)(text);
-            } catch (const VT::HostDiagnostic& diagnostic) {
-                throw UsageError("--prove", quotedArgument(text) + " cannot be read: " + diagnostic.what());
-            }
-            const VT::Decision decision = proofs.holds(claim);
-            isDecided = isDecided && !decision.isUndecided();
-            const char* const answer = decision.isYes() ? "proven" : decision.isNo() ? "refuted" : "undecided";
-            std::string witness;
-            std::string json;
-            for (const VT::UnknownValue& each : decision.witness.value_or(VT::Witness{})) {
-                const std::string name = decider.nameOf(each.unknown);
-                witness.append(witness.empty() ? ": " : ", ")
-                    .append(name)
-                    .append("=")
-                    .append(std::to_string(each.value));
-                json.append(json.empty() ? "" : ",")
-                    .append(jsonString(name))
-                    .append(":")
-                    .append(std::to_string(each.value));
-            }
-            if (!options.json) {
-                console.out(answer + witness + "\n");
-                continue;
-            }
-            std::string out = "{\"claim\":" + jsonString(text);
-            appendMember(out, "answer", jsonString(answer));
-            if (decision.witness)
-                appendMember(out, "witness", "{" + json + "}");
-            console.out(out + "}\n");
-        }
-        console.flush();
-        return isDecided;
-    }
-
-    } // namespace
-
-    void addDims(CommandLine & program) {
-        Command& command = program.add("dims", "Rearrange and evaluate dimension expressions in Quill", notes);
-        const auto options = std::make_shared<DimsOptions>();
-        addTexts(command, *options);
-        addDefinitions(command, options->definitions);
-        addAssumeOption(command, options->assumptions);
-        command.addArguments({"--prove", "Prove or refute a comparison of dimensions, in C; may be repeated", "CLAIM"},
-                             [options](std::vector<std::string> claims) { options->claims = std::move(claims); });
-        command.afterOptions = [options] {
-            VT::SymbolicExprTable table; // reports wrong definitions before any text is answered
-            define(table, *options);
-            VT::Assumptions assumptions(table);
-            assume(table, *options, assumptions);
-            if (options->claims.empty() && !options->assumptions.empty())
-                throw UsageError("--assume", "nothing is proven; add --prove");
+        assume(table, *options, assumptions);
+        if (options->claims.empty() && !options->assumptions.empty())
+            throw UsageError("--assume", "nothing is proven; add --prove");
+    };
+    command.run = [options](Console& console) -> ExitStatus {
+        if (!options->claims.empty())
+            return prove(*options, console);
+        const auto answerText = [&](const std::string& text, std::string& out) {
+            answer(*options, console.outStyle(), text, out);
         };
-        command.run = [options](Console& console) -> ExitStatus {
-            if (!options->claims.empty())
-                return prove(*options, console);
-            const auto answerText = [&](const std::string& text, std::string& out) {
-                answer(*options, console.outStyle(), text, out);
-            };
-            return answerTexts(*options, console, {answerText, !options->json});
-        };
-    }
+        return answerTexts(*options, console, {answerText, !options->json});
+    };
+}
 
 } // namespace vtsym

@@ -38,6 +38,9 @@ ConditionPair readPair(const Conditions& conditions, const TextOptions& options,
 std::string reasonsText(const Conditions& conditions, const TextOptions& options, const VT::Reasons& reasons);
 std::string reasonsJson(const Conditions& conditions, const TextOptions& options, const VT::Reasons& reasons);
 
+/// What to do so that a solver is asked what stays undecided, after a "; "; nothing where one was.
+std::string solverAdvice();
+
 /// An assignment as text, "A=3, B=0", and as a JSON object.
 std::string witnessText(const Conditions& conditions, const TextOptions& options, const VT::Witness& witness);
 std::string witnessJson(const Conditions& conditions, const TextOptions& options, const VT::Witness& witness);
