@@ -10,6 +10,7 @@
 #include "base/decide/Decider.hpp"
 #include "base/decide/Decision.hpp"
 #include "base/decide/DimensionProofs.hpp"
+#include "base/decide/external/SolverPlugin.hpp"
 #include "base/decide/reasons/ReasonSearch.hpp"
 #include "base/decide/shorten/StringifyImpliedCondition.hpp"
 #include "base/eval/Eval.hpp"

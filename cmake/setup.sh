@@ -17,12 +17,16 @@ quietly() {
     fi
 }
 
+# packages_of LIST...: the packages of cmake/packages/LIST.txt.
+packages_of() {
+    for list in "$@"; do
+        sed -e 's/#.*//' -e '/^$/d' "$root/cmake/packages/$list.txt"
+    done | sort -u
+}
+
 # missing_packages LIST...: the packages of cmake/packages/LIST.txt that are not installed.
 missing_packages() {
-    for list in "$@"; do
-        sed 's/#.*//' "$root/cmake/packages/$list.txt"
-    done | sort -u | while read -r package; do
-        [ -n "$package" ] || continue
+    packages_of "$@" | while read -r package; do
         case $installed in
         *" $package "*) ;;
         *) printf '%s ' "$package" ;;

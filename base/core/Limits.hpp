@@ -136,7 +136,7 @@ inline constexpr std::size_t confirmations = 8192;
 /// find an assignment that evaluation accepts, and to make it small), nodes and pairs of calls that are written for it,
 /// and megabytes that it may take in the process.  Beyond a bound the question is undecided, or the witness is as small
 /// as it is by then.
-inline constexpr unsigned solverResources = 200'000;
+inline constexpr unsigned solverResources = 1'000'000;
 inline constexpr std::size_t solverChecks = 64;
 inline constexpr std::uint64_t solverNodes = 4096;
 inline constexpr unsigned solverMegabytes = 256;

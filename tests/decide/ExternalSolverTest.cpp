@@ -60,7 +60,7 @@ TEST(ExternalSolver, AgreesWithBruteForce) {
                pick({"==", "<", ">=", "!=", "=="}) + term();
     };
     constexpr std::int64_t reach = 4;
-    constexpr std::size_t rounds = 400;
+    constexpr std::size_t rounds = 200;
     std::size_t asked = 0;
     std::size_t decided = 0;
     for (std::size_t i = 0; i < rounds; ++i) {

@@ -14,7 +14,7 @@ namespace {
 constexpr const char* compareNotes =
     R"(Conditions are over integers without bounds unless --bits is given.  The relation is exact: equivalent, disjoint,
 implies, implied by or overlaps.  Assignments prove it: for which values the first holds alone, the second alone, or
-both.  A question that takes too many steps stays undecided.
+both.  A question that takes too many steps, or has products and bits of unknowns that no solver decides, stays undecided.
 
 Examples:
   vtsym compare 'A<B && B<C' 'A<C'
@@ -28,9 +28,10 @@ Examples:
 constexpr std::array<const char*, 6> relations{"equivalent", "disjoint", "implies",
                                                "implied by", "overlaps", "undecided"};
 
-const char* reasonOf(VT::DecisionBound bound) {
-    return bound == VT::DecisionBound::Steps ? ": it takes too many steps"
-                                             : ": it depends on arithmetic beyond linear terms";
+std::string reasonOf(VT::DecisionBound bound) {
+    const char* const reason = bound == VT::DecisionBound::Steps ? ": it takes too many steps"
+                                                                 : ": it depends on arithmetic beyond linear terms";
+    return reason + solverAdvice();
 }
 
 class Comparer {
