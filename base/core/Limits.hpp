@@ -90,9 +90,12 @@ inline constexpr std::size_t systemUnknowns = std::size_t{1} << 20U;
 /// Floors of floors that are followed to bound one sum; the bits of a mask take 62.  A deeper one is unbounded.
 inline constexpr int nestedFloors = 64;
 
-/// Constraints that one elimination of the Omega test may add while problems are split along variables.  A variable
-/// that adds more is split instead.
+/// Constraints that the elimination of one variable may add.  A variable that adds more is left to the search for an
+/// integer point.
 inline constexpr std::int64_t eliminationGrowth = 2;
+
+/// Splits of a body in that search before it is made round anew with the exact widths of all its slabs.
+inline constexpr std::size_t firstBranches = 64;
 
 /// Steps of the further questions of a comparison after one that used up its own, so that a hard pair costs little more
 /// than one question.
