@@ -79,6 +79,12 @@ inline constexpr std::uint64_t decisionSteps = std::uint64_t{1} << 21U;
 /// Steps that a caller may allow one question: numbers of nodes and edges have 31 bits.  Larger bounds count as this.
 inline constexpr std::uint64_t settableSteps = std::uint64_t{1} << 24U;
 
+/// Steps that all questions of one command may cost together: about ten seconds at most, and further ones for each line
+/// of its input, since commands read files of any length.  Real conditions take tens to thousands.  Once they are used
+/// up, questions are undecided.
+inline constexpr std::uint64_t commandSteps = std::uint64_t{1} << 26U;
+inline constexpr std::uint64_t commandStepsPerLine = std::uint64_t{1} << 13U;
+
 /// Slots of an index of diagrams that stay allocated from question to question.  A larger index is freed.
 inline constexpr std::size_t keptSlots = 4096;
 

@@ -29,8 +29,9 @@ namespace VT {
 template <class Number>
 struct Elimination {
     std::size_t variable;
-    std::vector<IntegerRows::Row<Number>> bounds; ///< of the variable, as inequalities; none where `value` says what it is
-    IntegerRows::Row<Number> value;               ///< what is to be added to what the variable became; its own factor is 0
+    std::vector<IntegerRows::Row<Number>>
+        bounds;                     ///< of the variable, as inequalities; none where `value` says what it is
+    IntegerRows::Row<Number> value; ///< what is to be added to what the variable became; its own factor is 0
 };
 
 template <class Number>
@@ -135,7 +136,8 @@ private:
     [[nodiscard]] std::size_t leastFactor(const Line& row) const {
         std::size_t least = variables_;
         for (std::size_t i = 0; i < variables_; ++i)
-            if (row[i] != Number(0) && (least == variables_ || IntegerRows::magnitude(row[i]) < IntegerRows::magnitude(row[least])))
+            if (row[i] != Number(0) &&
+                (least == variables_ || IntegerRows::magnitude(row[i]) < IntegerRows::magnitude(row[least])))
                 least = i;
         return least;
     }
@@ -311,8 +313,7 @@ private:
                 continue;
             for (const Line& upper : bounds)
                 if (upper[variable] < Number(0))
-                    problem.inequalities.push_back(
-                        combined(lower, Number(-upper[variable]), upper, lower[variable]));
+                    problem.inequalities.push_back(combined(lower, Number(-upper[variable]), upper, lower[variable]));
         }
     }
 

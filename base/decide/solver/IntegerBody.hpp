@@ -48,15 +48,7 @@ public:
         if (fraction(real, variables_) == variables_)
             return whole(real, variables_);
         findDirection();
-        if (!tighten(real, false))
-            return std::nullopt;
-        try {
-            return solveBounded(limits::firstBranches);
-        } catch (const TooManyBranches&) { // bounds that others imply may make the body look wide
-            if (!tighten(real, true))
-                return std::nullopt;
-            return solveBounded(std::numeric_limits<std::size_t>::max());
-        }
+        return boundAll(real) ? solveBounded() : std::nullopt;
     }
 
 private:
@@ -116,26 +108,21 @@ private:
         }
     }
 
-    /// Finds upper bounds of the sums that have none and are not open, or the least and the greatest values of all;
-    /// false where there is no integer between them.
-    bool tighten(Simplex<Number>& real, bool all) {
+    /// Finds upper bounds of the sums that have none and are not open; false where there is no integer below one.
+    bool boundAll(Simplex<Number>& real) {
         for (std::size_t i = 0; i < slabs_.size(); ++i) {
             Bounds<Number>& bounds = slabs_[i].bounds;
-            if (isOpen_[i] || (bounds.high && !all))
+            if (isOpen_[i] || bounds.high)
                 continue;
             bounds.high = real.greatest(variables_ + i);
-            if (all)
-                bounds.low = real.least(variables_ + i);
             if (*bounds.high < *bounds.low)
                 return false;
             real.restrict(variables_ + i, bounds);
-            if (all && !real.solve())
-                return false;
         }
         return true;
     }
 
-    std::optional<Row> solveBounded(std::size_t mostBranches) {
+    std::optional<Row> solveBounded() {
         std::vector<LatticeBasis::Row> sums;
         std::vector<Bounds<Number>> bounds;
         for (std::size_t i = 0; i < slabs_.size(); ++i) {
@@ -153,7 +140,7 @@ private:
         for (std::size_t i = 0; i < sums.size(); ++i)
             for (std::size_t j = 0; j < rank; ++j)
                 changed[i][j] = Number(basis.factor(i, j));
-        const auto inner = branch(changed, rank, bounds, mostBranches);
+        const auto inner = solveRound(changed, rank, bounds);
         if (!inner)
             return std::nullopt;
         std::vector<BigInteger> wide;
@@ -178,6 +165,69 @@ private:
         for (BigInteger& weight : weights)
             weight = finer * widest / weight;
         return weights;
+    }
+
+    /// Searches a body whose slabs are about as wide.
+    std::optional<Row> solveRound(const std::vector<Row>& sums, std::size_t variables,
+                                  const std::vector<Bounds<Number>>& bounds) {
+        try {
+            return branch(sums, variables, bounds, limits::firstBranches);
+        } catch (const TooManyBranches&) { // it may be flat in a direction that no slab shows
+            return solveFlat(sums, variables, bounds);
+        }
+    }
+
+    /// Searches a body in variables that change little between its corners: the first least.
+    std::optional<Row> solveFlat(const std::vector<Row>& sums, std::size_t variables,
+                                 const std::vector<Bounds<Number>>& bounds) {
+        const std::vector<LatticeBasis::Row> corners = cornersOf(sums, variables, bounds);
+        LatticeBasis basis(corners, variables, steps_);
+        basis.reduce(variables, LatticeBasis::Row(corners.size(), 1));
+        std::vector<Row> changed(sums.size(), Row(variables));
+        for (std::size_t j = 0; j < variables; ++j) { // the last one is split first
+            const auto column = basis.dual(variables - 1 - j);
+            for (std::size_t i = 0; i < sums.size(); ++i)
+                for (std::size_t k = 0; k < variables; ++k)
+                    changed[i][j] += sums[i][k] * Number(column[k]);
+        }
+        const auto inner = branch(changed, variables, bounds, std::numeric_limits<std::size_t>::max());
+        if (!inner)
+            return std::nullopt;
+        Row values(variables, Number(0));
+        for (std::size_t j = 0; j < variables; ++j) {
+            const auto column = basis.dual(variables - 1 - j);
+            for (std::size_t k = 0; k < variables; ++k)
+                values[k] += (*inner)[j] * Number(column[k]);
+        }
+        return values;
+    }
+
+    /// How corners of a body in many directions lie from one of them, in small fractions of 1; then the unit vectors,
+    /// so that no direction is left out.
+    std::vector<LatticeBasis::Row> cornersOf(const std::vector<Row>& sums, std::size_t variables,
+                                             const std::vector<Bounds<Number>>& bounds) {
+        constexpr unsigned fractionBits = 16;
+        Simplex<Number> real(sums, variables, steps_);
+        for (std::size_t i = 0; i < bounds.size(); ++i)
+            real.restrict(variables + i, bounds[i]);
+        std::vector<LatticeBasis::Row> corners;
+        if (real.solve())
+            for (std::size_t i = 0; i < variables + sums.size(); ++i)
+                for (const bool up : {true, false}) {
+                    static_cast<void>(up ? real.greatest(i) : real.least(i));
+                    const BigInteger denominator(real.denominator());
+                    corners.emplace_back();
+                    for (std::size_t j = 0; j < variables; ++j)
+                        corners.back().push_back((BigInteger(real.numerator(j)) << fractionBits) / denominator);
+                }
+        for (std::size_t i = corners.size(); i-- > 0;)
+            for (std::size_t j = 0; j < variables; ++j)
+                corners[i][j] -= corners[0][j];
+        for (std::size_t j = 0; j < variables; ++j) {
+            corners.emplace_back(variables);
+            corners.back()[j] = 1;
+        }
+        return corners;
     }
 
     struct Branch {

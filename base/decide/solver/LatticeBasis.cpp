@@ -15,11 +15,12 @@ LatticeBasis::LatticeBasis(std::span<const Row> sums, std::size_t variables, Ste
     : steps_(steps),
       sums_(sums.size()),
       variables_(variables),
-      columns_(variables, Row(sums.size() + variables)) {
+      columns_(variables, Row(sums.size() + 2 * variables)) {
     for (std::size_t j = 0; j < variables; ++j) {
         for (std::size_t i = 0; i < sums_; ++i)
             columns_[j][i] = sums[i][j];
         columns_[j][sums_ + j] = 1;
+        columns_[j][sums_ + variables + j] = 1;
     }
 }
 
@@ -28,6 +29,9 @@ void LatticeBasis::subtract(std::size_t from, std::size_t column, const BigInteg
     for (std::size_t i = 0; i < sums_ + variables_; ++i)
         if (columns_[column][i] != 0)
             columns_[from][i] -= times * columns_[column][i];
+    for (std::size_t i = sums_ + variables_; i < columns_[from].size(); ++i)
+        if (columns_[from][i] != 0)
+            columns_[column][i] += times * columns_[from][i];
 }
 
 std::size_t LatticeBasis::separate() {
@@ -69,7 +73,8 @@ void LatticeBasis::orthogonalize(std::size_t rank, std::span<const BigInteger> w
                 if (columns_[k][i] != 0 && columns_[j][i] != 0)
                     product += weights[i] * weights[i] * columns_[k][i] * columns_[j][i];
             for (std::size_t i = 0; i < j; ++i)
-                product = (determinants_[i + 1] * product - coefficients_[k][i] * coefficients_[j][i]) / determinants_[i];
+                product =
+                    (determinants_[i + 1] * product - coefficients_[k][i] * coefficients_[j][i]) / determinants_[i];
             charge(steps_, sums_ + 2 * j, product);
             (j < k ? coefficients_[k][j] : determinants_[k + 1]) = std::move(product);
         }

@@ -5,8 +5,8 @@
 // the sums have rank, by Euclid's algorithm, and one that makes these columns short and nearly orthogonal (Lenstra,
 // Lenstra and Lovász, "Factoring polynomials with rational coefficients", 1982, in integers: Cohen, "A Course in
 // Computational Algebraic Number Theory", 1993, algorithm 2.6.7).  In such variables a body holds few integers between
-// its bounds in any direction of an axis, if it holds few at all (Krishnamoorthy and Pataki, "Column basis reduction and
-// decomposable knapsack problems", 2009).
+// its bounds in any direction of an axis, if it holds few at all (Krishnamoorthy and Pataki, "Column basis reduction
+// and decomposable knapsack problems", 2009).
 //
 // Cost: polynomial in the variables and in the length of the numbers; steps for the numbers written.
 #pragma once
@@ -34,6 +34,11 @@ public:
     /// The factor of y in a sum.
     [[nodiscard]] const BigInteger& factor(std::size_t sum, std::size_t y) const { return columns_[y][sum]; }
 
+    /// The column of x that shows y: the product of both is y.
+    [[nodiscard]] std::span<const BigInteger> dual(std::size_t y) const {
+        return std::span(columns_[y]).subspan(sums_ + variables_);
+    }
+
     /// x for values of the first y, the others being 0.
     [[nodiscard]] Row original(std::span<const BigInteger> y) const;
 
@@ -46,7 +51,7 @@ private:
     Steps& steps_;
     std::size_t sums_;
     std::size_t variables_;
-    std::vector<Row> columns_; ///< factors in the sums, then the column of the basis
+    std::vector<Row> columns_; ///< factors in the sums, the column of the basis, and that of the dual basis
 
     // Of the orthogonal basis after Gram and Schmidt: coefficients, times determinants[column + 1].
     std::vector<Row> coefficients_;

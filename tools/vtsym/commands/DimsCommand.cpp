@@ -158,7 +158,9 @@ bool prove(const DimsOptions& options, Console& console) {
     define(table, options);
     VT::Assumptions assumptions(table);
     assume(table, options, assumptions);
+    VT::Budget budget(VT::limits::commandSteps);
     VT::Decider decider(table);
+    decider.share(&budget);
     VT::DimensionProofs proofs(table, decider, assumptions);
     bool isDecided = true;
     for (const std::string& text : options.claims) {
