@@ -84,6 +84,12 @@ inline constexpr std::uint64_t decisionSteps = std::uint64_t{1} << 21U;
 /// Steps that a caller may allow one question: numbers of nodes and edges have 31 bits.  Larger bounds count as this.
 inline constexpr std::uint64_t settableSteps = std::uint64_t{1} << 24U;
 
+/// Steps that all questions of one command may cost together: about ten seconds at most, and further ones for each line
+/// of its input, since commands read files of any length.  Real conditions take tens to thousands.  Once they are used
+/// up, questions are undecided.
+inline constexpr std::uint64_t commandSteps = std::uint64_t{1} << 26U;
+inline constexpr std::uint64_t commandStepsPerLine = std::uint64_t{1} << 13U;
+
 /// Slots of an index of diagrams that stay allocated from question to question.  A larger index is freed.
 inline constexpr std::size_t keptSlots = 4096;
 
@@ -95,9 +101,12 @@ inline constexpr std::size_t systemUnknowns = std::size_t{1} << 20U;
 /// Floors of floors that are followed to bound one sum; the bits of a mask take 62.  A deeper one is unbounded.
 inline constexpr int nestedFloors = 64;
 
-/// Constraints that one elimination of the Omega test may add while problems are split along variables.  A variable
-/// that adds more is split instead.
+/// Constraints that the elimination of one variable may add.  A variable that adds more is left to the search for an
+/// integer point.
 inline constexpr std::int64_t eliminationGrowth = 2;
+
+/// Splits of a body in that search before it is made round anew with the exact widths of all its slabs.
+inline constexpr std::size_t firstBranches = 64;
 
 /// Steps of the further questions of a comparison after one that used up its own, so that a hard pair costs little more
 /// than one question.

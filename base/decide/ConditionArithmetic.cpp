@@ -32,31 +32,38 @@ std::optional<std::int64_t> bitsOf(const RationalForm& form) {
 } // namespace
 
 ConditionReader::Value ConditionReader::arithmetic(const Frame& frame) {
-    const SymbolicOp op = frame.node->op();
     const std::size_t count = operands_.size() - frame.firstOperand;
-    bool isReal = false;
-    for (std::size_t i = 0; i < count; ++i) {
-        if (operand(frame, i).kind == Value::Kind::RealTerm)
-            return {Value::Kind::RealTerm};
-        isReal = isReal || operand(frame, i).isReal || operand(frame, i).kind == Value::Kind::Real;
-    }
-    if (count == 0 || count > 2)
+    if (count == 0 || count > 2) {
+        for (std::size_t i = 0; i < count; ++i)
+            if (operand(frame, i).kind == Value::Kind::RealTerm)
+                return {Value::Kind::RealTerm};
         return opaque(frame);
-    if (op == SymbolicOp::UnaryMinus && operand(frame, 0).kind == Value::Kind::Real)
-        return ofReal(-operand(frame, 0).real);
-    if (count == 2 && isReal)
-        if (auto folded = ofLiterals(op, operand(frame, 0), operand(frame, 1)))
-            return *std::move(folded);
-    for (std::size_t i = 0; i < count; ++i)
-        if (!std::isfinite(operand(frame, i).real))
-            return {Value::Kind::RealTerm};
-    Value value{Value::Kind::Number};
+    }
+    auto value = joined(frame.node->op(), operand(frame, 0), count == 2 ? &operand(frame, 1) : nullptr);
+    return value ? *std::move(value) : opaque(frame);
+}
+
+/// What an operator makes of one or two values; nothing where that is an unknown of its own.
+std::optional<ConditionReader::Value> ConditionReader::joined(SymbolicOp op, const Value& a, const Value* b) {
+    using Kind = Value::Kind;
+    const auto any = [&](auto is) { return is(a) || (b != nullptr && is(*b)); };
+    if (any([](const Value& value) { return value.kind == Kind::RealTerm; }))
+        return Value{Kind::RealTerm};
+    const bool isReal = any([](const Value& value) { return value.isReal || value.kind == Kind::Real; });
+    if (op == SymbolicOp::UnaryMinus && a.kind == Kind::Real)
+        return ofReal(-a.real);
+    if (b != nullptr && isReal)
+        if (auto folded = ofLiterals(op, a, *b))
+            return folded;
+    if (any([](const Value& value) { return !std::isfinite(value.real); }))
+        return Value{Kind::RealTerm};
+    Value value{Kind::Number};
     value.isReal = isReal;
-    const Cases left = casesOf(operand(frame, 0));
-    const Cases right = count == 2 ? casesOf(operand(frame, 1)) : Cases{};
-    bool isLinear = count == 2 || op == SymbolicOp::UnaryMinus || !isReal;
+    const Cases left = casesOf(a);
+    const Cases right = b != nullptr ? casesOf(*b) : Cases{};
+    bool isLinear = b != nullptr || op == SymbolicOp::UnaryMinus || !isReal;
     for (const Case& x : left) {
-        if (count == 1)
+        if (b == nullptr)
             isLinear = isLinear && addUnary(value.cases, op, x);
         for (const Case& y : right) {
             steps_.take(1 + (x.form.size() + y.form.size()) / partsPerStep);
@@ -64,8 +71,60 @@ ConditionReader::Value ConditionReader::arithmetic(const Frame& frame) {
                        addBinary(value.cases, op, circuit_.both(x.guard, y.guard), x.form, y.form, isReal);
         }
         if (!isLinear)
-            return isReal ? Value{Value::Kind::RealTerm} : opaque(frame);
+            return isReal ? std::optional(Value{Kind::RealTerm}) : std::nullopt;
     }
+    return value;
+}
+
+/// A long sum; what cannot be added up at once is joined from left to right.
+ConditionReader::Value ConditionReader::sum(const Frame& frame) {
+    std::vector<SymbolicOp> ops(operands_.size() - frame.firstOperand);
+    const SymbolicExpr* node = frame.node;
+    for (std::size_t i = ops.size(); i-- > 1; node = table_.get(node->getInput(0)))
+        ops[i] = node->op();
+    if (auto whole = addedUp(frame, ops))
+        return *std::move(whole);
+    std::optional<Value> value = operand(frame, 0);
+    for (std::size_t i = 1; i < ops.size() && value; ++i)
+        value = joined(ops[i], *value, &operand(frame, i));
+    return value ? *std::move(value) : term(frame.id);
+}
+
+/// The sum of small forms without cases; nothing where there are others.
+std::optional<ConditionReader::Value> ConditionReader::addedUp(const Frame& frame,
+                                                               std::span<const SymbolicOp> ops) const {
+    if (ops.size() > limits::systemUnknowns)
+        return std::nullopt;
+    std::vector<LinearPart> parts;
+    LinearForm all;
+    for (std::size_t i = 0; i < ops.size(); ++i) {
+        const Value& value = operand(frame, i);
+        const bool isPlain = value.kind == Value::Kind::Number && !value.isReal && value.cases.size() == 1;
+        const LinearForm* form = isPlain ? value.cases.front().form.small() : nullptr;
+        if (form == nullptr || value.cases.front().guard != always)
+            return std::nullopt;
+        steps_.take(1 + form->parts.size() / partsPerStep);
+        const int sign = i > 0 && ops[i] == SymbolicOp::Minus ? -1 : 1;
+        all.constant += sign * form->constant;
+        for (const LinearPart& part : form->parts)
+            parts.push_back({part.unknown, sign * part.factor});
+    }
+    if (parts.size() > limits::systemUnknowns)
+        return std::nullopt;
+    std::ranges::sort(parts, {}, &LinearPart::unknown);
+    bool isSmall = isWithinBound(all.constant);
+    for (auto part = parts.begin(); part != parts.end();) {
+        LinearPart joined{part->unknown, 0};
+        for (; part != parts.end() && part->unknown == joined.unknown; ++part)
+            joined.factor += part->factor;
+        isSmall = isSmall && isWithinBound(joined.factor);
+        if (joined.factor != 0)
+            all.parts.push_back(joined);
+    }
+    if (!isSmall)
+        return std::nullopt;
+    Value value{Value::Kind::Number};
+    value.cases.push_back({always, std::move(all)});
     return value;
 }
 
@@ -128,9 +187,12 @@ bool ConditionReader::addQuotient(Cases& cases, SymbolicOp op, Gate guard, const
                                   const RationalForm& b) {
     const BigInteger divisor = b.integer().value();
     const BigInteger magnitude = abs(divisor);
-    const Gate notNegative = compare(SymbolicOp::GreaterThanEqual, a);
+    // Of 0 both sides are right, so that a quotient of a quotient is on the side of that.
+    const Gate below = circuit_.both(guard, compare(SymbolicOp::LessThan, a));
+    const bool isNeverAbove = below != never && circuit_.both(guard, compare(SymbolicOp::GreaterThan, a)) == never;
+    const Gate above = isNeverAbove ? never : circuit_.both(guard, compare(SymbolicOp::GreaterThanEqual, a));
     for (const int sign : {1, -1}) {
-        const Gate side = circuit_.both(guard, sign > 0 ? notNegative : opposite(notNegative));
+        const Gate side = sign > 0 ? above : isNeverAbove ? guard : below;
         if (side == never)
             continue;
         const auto positive = combine(a, sign, {}, 0);
@@ -213,7 +275,7 @@ std::optional<RationalForm> ConditionReader::floor(const RationalForm& form, con
     if (divisor == 1)
         return form;
     const WideForm wide = form.widened();
-    steps_.take(wide.parts.size() + 1);
+    charge(wide);
     WideForm whole;
     FloorOf rest{{}, divisor};
     BigInteger common = divisor;
@@ -252,6 +314,7 @@ std::optional<RationalForm> ConditionReader::floor(const RationalForm& form, con
             BigInteger constant = inner.form.constant + rest.form.constant * inner.divisor;
             rest = {inner.form, std::move(product)};
             rest.form.constant = std::move(constant);
+            charge(rest.form);
         }
     }
     const Unknown unknown = unknowns_.floor(std::move(rest));

@@ -148,7 +148,7 @@ Gate ConditionReader::compareWide(SymbolicOp op, WideForm form) {
         const BigInteger most = floorDivide(BigInteger(-form.constant), BigInteger(abs(part.factor)));
         const FloorOf& floor = *unknowns_[part.unknown].floor;
         form = floor.form;
-        steps_.take(form.parts.size() + 1);
+        charge(form);
         if (part.factor > 0) {
             form.constant -= floor.divisor * most + floor.divisor - 1;
             continue;
@@ -157,6 +157,7 @@ Gate ConditionReader::compareWide(SymbolicOp op, WideForm form) {
             each.factor = -each.factor;
         form.constant = -form.constant - floor.divisor * most;
     }
+    charge(form);
     BigInteger divisor = 0;
     for (const WidePart& part : form.parts)
         divisor = gcd(divisor, part.factor);

@@ -15,6 +15,10 @@ namespace VT {
 namespace {
 
 constexpr OperatorSet chainOps{SymbolicOp::And, SymbolicOp::Or, SymbolicOp::SingleAnd, SymbolicOp::SingleOr};
+constexpr OperatorSet sumOps{SymbolicOp::Plus, SymbolicOp::Minus};
+
+/// Operands of a sum that is read as a whole.  The parts of a shorter one are read one by one, and known afterwards.
+constexpr std::size_t longSum = 16;
 
 } // namespace
 
@@ -104,15 +108,18 @@ bool ConditionReader::enter(SymbolicExprId id) {
     }
     const SymbolicExpr* node = table_.get(id);
     const std::size_t first = operands_.size();
+    bool isSum = false;
     if (chainOps.contains(node->op())) {
         collectChain(node->op(), id);
+    } else if (sumOps.contains(node->op()) && collectSum(id)) {
+        isSum = true;
     } else {
         for (std::size_t i = 0; i < node->getNumInputs(); ++i) {
             operands_.push_back(node->getInput(i));
             missing_ = missing_ || !table_.hasOperand(id, operands_.back());
         }
     }
-    frames_.push_back({id, node, first, first});
+    frames_.push_back({id, node, first, first, isSum});
     return false;
 }
 
@@ -147,6 +154,31 @@ void ConditionReader::collectChain(SymbolicOp op, SymbolicExprId root) {
             return !missing_;
         },
         [](SymbolicExprId) {});
+}
+
+/// Appends the operands of a long sum from left to right; false for a short one.
+bool ConditionReader::collectSum(SymbolicExprId root) {
+    added_.clear();
+    SymbolicExprId id = root;
+    for (;;) {
+        const SymbolicExpr* node = table_.get(id);
+        if (!sumOps.contains(node->op()) || node->getNumInputs() != 2 || (id != root && read_.find(id) != nullptr))
+            break;
+        const SymbolicExprId left = node->getInput(0);
+        const SymbolicExprId right = node->getInput(1);
+        missing_ = missing_ || !table_.hasOperand(id, left) || !table_.hasOperand(id, right);
+        if (missing_)
+            return false;
+        added_.push_back(right);
+        id = left;
+        if (added_.size() > longSum)
+            steps_.take();
+    }
+    if (added_.size() < longSum)
+        return false;
+    operands_.push_back(id);
+    operands_.insert(operands_.end(), added_.rbegin(), added_.rend());
+    return true;
 }
 
 void ConditionReader::store(SymbolicExprId id, Value value) {
@@ -201,7 +233,7 @@ ConditionReader::Value ConditionReader::compute(const Frame& frame) {
         return comparison(frame);
     if (op == SymbolicOp::Not)
         return ofTruth(opposite(truthOf(operands_[frame.firstOperand])));
-    return arithmetic(frame);
+    return frame.isSum ? sum(frame) : arithmetic(frame);
 }
 
 ConditionReader::Value ConditionReader::chain(const Frame& frame) {

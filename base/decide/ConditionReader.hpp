@@ -9,7 +9,8 @@
 // takes part in it, a truth value of its own for each comparison.
 //
 // Cost: linear in the distinct nodes, plus what the circuits cost.  Cases multiply; beyond limits::termCases a term
-// becomes an unknown of its own.  Chains of && and || are read as a whole, so that their operands are joined in pairs.
+// becomes an unknown of its own.  Chains of && and || are read as a whole, so that their operands are joined in pairs,
+// and so are long sums, whose parts are sorted once.
 #pragma once
 
 #include "base/core/Nodes.hpp"
@@ -79,7 +80,11 @@ private:
         const SymbolicExpr* node;
         std::size_t firstOperand; ///< in operands_
         std::size_t next;
+        bool isSum = false; ///< a long one, whose operands are those of the whole chain
     };
+
+    /// Takes steps for work on a form.
+    void charge(const WideForm& form) { steps_.take(1 + costOf(form) / partsPerStep); }
 
     [[nodiscard]] const Value& valueOf(SymbolicExprId id) const { return values_[*read_.find(id)]; }
 
@@ -93,6 +98,7 @@ private:
     bool enter(SymbolicExprId id);
     bool isWhole(SymbolicExprId id);
     void collectChain(SymbolicOp op, SymbolicExprId root);
+    bool collectSum(SymbolicExprId root);
     void store(SymbolicExprId id, Value value);
     Value leaf(SymbolicExprId id, const LeafMeaning& meaning);
     Value compute(const Frame& frame);
@@ -100,6 +106,9 @@ private:
     Value comparison(const Frame& frame);
     std::optional<Gate> compared(SymbolicOp op, const Value& a, const Value& b);
     Value arithmetic(const Frame& frame);
+    Value sum(const Frame& frame);
+    std::optional<Value> addedUp(const Frame& frame, std::span<const SymbolicOp> ops) const;
+    std::optional<Value> joined(SymbolicOp op, const Value& a, const Value* b);
     bool isOpposed(std::span<const WidePart> parts);
     Value term(SymbolicExprId node);
     Value opaque(const Frame& frame);
@@ -141,6 +150,7 @@ private:
     std::vector<Value> values_;
     std::vector<Frame> frames_;
     std::vector<SymbolicExprId> operands_;
+    std::vector<SymbolicExprId> added_; ///< of a long sum, from right to left
     std::vector<Gate> folded_;
     std::vector<UnknownLeaf> leaves_;
     std::vector<Unknown> met_;

@@ -56,16 +56,21 @@ struct Decider::State {
     bool isReadable(SymbolicExprId id);
     const Leaves& leavesOf(std::span<const ReadCondition* const> conditions);
     Decision hold(Gate truth, std::span<const ReadCondition* const> conditions);
+    void confine(Decision& decision, Gate truth, std::span<const ReadCondition* const> conditions);
+    void makeSmallest(Decision& decision, Gate truth, std::span<const ReadCondition* const> conditions);
     void keepFunctions(Decision& decision, Gate truth, std::span<const ReadCondition* const> conditions);
     template <class Combine>
     Decision decide(AskedOf asked, std::span<const SymbolicExprId> ids, Combine combine);
     void askSolver(AskedOf asked, std::span<const SymbolicExprId> ids, Decision& decision);
     std::optional<bool> evaluate(SymbolicExprId condition, const Witness& witness);
     Decision same();
+    void begin();
+    std::uint64_t end();
     void clear();
 
     DecisionOptions options;
-    std::uint64_t questionSteps;                                           ///< that a question may cost
+    std::uint64_t questionSteps; ///< that a question may cost
+    Budget* budget = nullptr;    ///< of several questions
     std::size_t solverQuestions = std::numeric_limits<std::size_t>::max(); ///< that may go to the solver
     SymbolicExprPrinter printer;
     LeafReader leafReader;
@@ -79,6 +84,7 @@ struct Decider::State {
     ConditionSearch search;
     IdMap<std::unique_ptr<Read>> known;
     Leaves joined;
+    bool isSmallest = true; ///< the latest witness, by the way in which it was found
     std::uint64_t taken = 0;
 };
 
@@ -94,6 +100,19 @@ void Decider::State::clear() {
     circuit.clear();
     unknowns.clear();
     question.clear();
+}
+
+/// Begins a question with the steps that it may cost.
+void Decider::State::begin() {
+    steps.refill(budget == nullptr ? questionSteps : std::min(questionSteps, budget->left()));
+}
+
+/// Ends it; returns the steps that it took.
+std::uint64_t Decider::State::end() {
+    const std::uint64_t all = steps.total() - steps.left();
+    if (budget != nullptr)
+        budget->take(all + 1);
+    return all;
 }
 
 /// Reads a condition, or charges what reading it cost.
@@ -117,10 +136,13 @@ const Decider::State::Read& Decider::State::read(SymbolicExprId id) {
 }
 
 bool Decider::State::isReadable(SymbolicExprId id) {
-    steps.refill(questionSteps);
+    begin();
     try {
-        return read(id).condition.bound == DecisionBound::None;
+        const bool isRead = read(id).condition.bound == DecisionBound::None;
+        end();
+        return isRead;
     } catch (const StepsUsedUp&) {
+        end();
         return false;
     } catch (...) {
         clear();
@@ -154,20 +176,76 @@ Decision Decider::State::hold(Gate truth, std::span<const ReadCondition* const> 
         question.mention(condition->met);
     question.ask(circuit, unknowns, steps, truth);
     const Leaves& leaves = leavesOf(conditions);
+    isSmallest = true;
     if (auto atOnce = witnesses.findAtOnce(question, leaves))
         return *std::move(atOnce);
     try {
         const Steps::Share share(steps, std::max(steps.total() / limits::diagramShare, limits::diagramSteps));
         Decision decision = witnesses.find(question, diagrams.of(question), leaves);
+        isSmallest = !witnesses.hasTerms();
         if (decision.bound != DecisionBound::Steps)
             return decision;
     } catch (const StepsUsedUp&) { // the search may take fewer
     }
-    return search.find(question, leaves);
+    Decision decision = search.find(question, leaves);
+    isSmallest = !witnesses.hasTerms();
+    return decision;
 }
 
-/// Looks for another witness while the one at hand gives a function two values for equal arguments: each time that two
-/// calls agree where their arguments do becomes part of the question.
+/// Looks for a witness with numbers of 64 bits where the one that was found has larger ones.
+void Decider::State::confine(Decision& decision, Gate truth, std::span<const ReadCondition* const> conditions) {
+    steps.spellOut([&] {
+        std::vector<Gate> truths{truth};
+        for (const UnknownLeaf& leaf : Leaves(leavesOf(conditions)))
+            truths.push_back(circuit.between(unknowns[leaf.unknown].quantity, -limits::formNumber, limits::formNumber));
+        Decision confined = hold(circuit.all(truths), conditions);
+        if (confined.isYes())
+            decision = std::move(confined);
+    });
+}
+
+/// Makes the witness the smallest, one name after the other: questions with narrower and narrower bounds on it.  Not
+/// where terms take part, whose values may not exist where these bounds leave them out of the question.
+void Decider::State::makeSmallest(Decision& decision, Gate truth, std::span<const ReadCondition* const> conditions) {
+    for (const ReadCondition* read : conditions)
+        if (std::ranges::any_of(read->met, [&](Unknown met) { return unknowns[met].kind == UnknownKind::Term; }))
+            return;
+    steps.spellOut([&] {
+        const Leaves leaves = leavesOf(conditions); // a copy, since further questions follow
+        for (std::size_t i = 0; i < leaves.size(); ++i) {
+            const Quantity quantity = unknowns[leaves[i].unknown].quantity;
+            if (unknowns[leaves[i].unknown].kind != UnknownKind::Free)
+                continue;
+            const auto valueAtHand = [&] { return (*decision.witness)[i].value; };
+            // Whether a witness lies within bounds, which is then at hand.
+            const auto holdsWithin = [&](std::int64_t low, std::int64_t high) {
+                Decision nearer = hold(circuit.both(truth, circuit.between(quantity, low, high)), conditions);
+                const bool isFound = nearer.isYes() && nearer.witness;
+                if (!isFound && !nearer.isNo())
+                    throw StepsUsedUp{};
+                if (isFound)
+                    decision = std::move(nearer);
+                return isFound;
+            };
+            if (!isWithinBound(valueAtHand()))
+                return;
+            std::int64_t low = 0;
+            std::int64_t high = std::abs(valueAtHand());
+            for (std::int64_t middle = high - 1; low < high; middle = low + (high - low) / 2) { // mostly it is smallest
+                if (holdsWithin(-middle, middle))
+                    high = std::abs(valueAtHand());
+                else
+                    low = middle + 1;
+            }
+            if (valueAtHand() < 0)
+                holdsWithin(high, high);
+            truth = circuit.both(truth, circuit.between(quantity, valueAtHand(), valueAtHand()));
+        }
+    });
+}
+
+/// Looks for another witness while the one at hand gives a function two values for equal arguments: that the
+/// calls at fault agree where their arguments do becomes part of the question.
 void Decider::State::keepFunctions(Decision& decision, Gate truth, std::span<const ReadCondition* const> conditions) {
     std::vector<SymbolicExprId> calls;
     for (const ReadCondition* read : conditions)
@@ -186,17 +264,21 @@ void Decider::State::keepFunctions(Decision& decision, Gate truth, std::span<con
             decision = {Answer::Undecided, DecisionBound::Terms, std::nullopt};
             return;
         }
-        const auto pair = congruence.findViolation(calls, *decision.witness);
-        if (!pair)
+        const auto violations = congruence.findViolations(calls, *decision.witness);
+        if (violations.empty())
             return;
-        added.push_back(std::make_unique<ReadCondition>(reader.readCongruence(pair->first, pair->second)));
-        const ReadCondition& equal = *added.back();
-        if (equal.bound != DecisionBound::None) {
-            decision = {Answer::Undecided, equal.bound, std::nullopt};
-            return;
+        std::vector<Gate> truths{truth};
+        for (const auto& [first, second] : violations) {
+            added.push_back(std::make_unique<ReadCondition>(reader.readCongruence(first, second)));
+            const ReadCondition& equal = *added.back();
+            if (equal.bound != DecisionBound::None) {
+                decision = {Answer::Undecided, equal.bound, std::nullopt};
+                return;
+            }
+            all.push_back(&equal);
+            truths.push_back(equal.truth);
         }
-        all.push_back(&equal);
-        truth = circuit.both(truth, equal.truth);
+        truth = circuit.all(truths);
         decision = hold(truth, all);
     }
 }
@@ -214,9 +296,12 @@ void Decider::State::askSolver(AskedOf asked, std::span<const SymbolicExprId> id
                 return false;
             truths.push_back(*truth);
         }
-        steps.refill(questionSteps);
-        return isAsAsked(asked, truths) &&
-               !CallCongruence(leafReader, unknowns, steps).findViolation(calls, witness).has_value();
+        begin();
+        const bool isConfirmed =
+            isAsAsked(asked, truths) &&
+            !CallCongruence(leafReader, unknowns, steps).findViolation(calls, witness).has_value();
+        taken += end();
+        return isConfirmed;
     };
     Decision other = decideExternally(*options.solver, {leafReader, ids, asked, options.bits32,
                                                         [&](SymbolicExprId id) { return printer(id); }, confirms});
@@ -229,7 +314,7 @@ template <class Combine>
 Decision Decider::State::decide(AskedOf asked, std::span<const SymbolicExprId> ids, Combine combine) {
     if (circuit.size() > limits::circuitSize)
         clear();
-    steps.refill(questionSteps);
+    begin();
     Decision decision;
     try {
         boost::container::small_vector<const ReadCondition*, 4> conditions;
@@ -244,8 +329,13 @@ Decision Decider::State::decide(AskedOf asked, std::span<const SymbolicExprId> i
             std::ranges::transform(conditions, truths.begin(), &ReadCondition::truth);
             const Gate truth = combine(std::span<const Gate>(truths.data(), truths.size()));
             decision = hold(truth, {conditions.data(), conditions.size()});
+            const std::span<const ReadCondition* const> all(conditions.data(), conditions.size());
+            if (decision.isYes() && !decision.witness)
+                confine(decision, truth, all);
+            if (decision.isYes() && decision.witness && !isSmallest)
+                makeSmallest(decision, truth, all);
             if (decision.isYes())
-                keepFunctions(decision, truth, {conditions.data(), conditions.size()});
+                keepFunctions(decision, truth, all);
         }
     } catch (const StepsUsedUp&) {
         decision = {Answer::Undecided, DecisionBound::Steps, std::nullopt};
@@ -253,7 +343,7 @@ Decision Decider::State::decide(AskedOf asked, std::span<const SymbolicExprId> i
         clear();
         throw;
     }
-    taken = questionSteps - steps.left();
+    taken = end();
     if (decision.isUndecided() && decision.bound != DecisionBound::NoCondition) {
         try {
             askSolver(asked, ids, decision);
@@ -437,6 +527,10 @@ void Decider::limitSteps(std::uint64_t steps) noexcept {
 
 std::size_t Decider::limitSolver(std::size_t questions) noexcept {
     return std::exchange(state_->solverQuestions, questions);
+}
+
+void Decider::share(Budget* budget) noexcept {
+    state_->budget = budget;
 }
 
 std::uint64_t Decider::stepsTaken() const noexcept {

@@ -3,6 +3,7 @@
 
 #include "base/core/Limits.hpp"
 #include "base/core/Table.hpp"
+#include "base/decide/Budget.hpp"
 #include "base/decide/Decision.hpp"
 
 #include <memory>
@@ -82,6 +83,9 @@ public:
     void limitSteps(std::uint64_t steps) noexcept;
     /// How many further questions may go to the solver, any number at first.  Returns how many might have so far.
     std::size_t limitSolver(std::size_t questions) noexcept;
+    /// Takes the steps of further questions from a budget as well, which outlives them; nullptr ends that.  What the
+    /// budget has left bounds a question like its own steps do.
+    void share(Budget* budget) noexcept;
     /// Steps that the latest question took.
     [[nodiscard]] std::uint64_t stepsTaken() const noexcept;
     /// Forgets everything that was read.

@@ -55,20 +55,33 @@ public:
 
     /// Work that depends on how unknowns are spelt: it may take several times what the question took so far, and at
     /// most that is charged.  So the spelling changes what a question costs by no more than a factor of two, and never
-    /// whether it is decided.
+    /// whether it is decided.  Such work inside of such work shares its steps.
     template <class Work>
     void spellOut(Work work) {
+        if (isSpelling_) {
+            try {
+                work();
+            } catch (const StepsUsedUp&) {
+                left_ = 0;
+            }
+            return;
+        }
         constexpr std::uint64_t times = 8;
         constexpr std::uint64_t always = 8192;
         const std::uint64_t spent = total_ - left_ - kept_;
         const std::uint64_t before = left_;
         const std::uint64_t allowed = std::min(times * spent + always, limits::witnessSteps);
         left_ = allowed;
+        isSpelling_ = true;
         try {
             work();
         } catch (const StepsUsedUp&) { // what was found by then counts
             left_ = 0;
+        } catch (...) {
+            isSpelling_ = false;
+            throw;
         }
+        isSpelling_ = false;
         const std::uint64_t taken = allowed - left_;
         left_ = before - std::min({before, spent, taken});
     }
@@ -77,6 +90,7 @@ private:
     std::uint64_t left_ = 0;
     std::uint64_t total_ = 0;
     std::uint64_t kept_ = 0; ///< by shares
+    bool isSpelling_ = false;
 };
 
 } // namespace VT

@@ -116,6 +116,20 @@ std::optional<RationalForm> exactResult(SymbolicOp op, const RationalForm& a, co
     constexpr std::int64_t longest = limits::formBits;
     if (op == SymbolicOp::ShiftLeft && *right >= 0 && *right <= longest)
         return multiply(a, RationalForm(BigInteger(BigInteger(1) << static_cast<unsigned>(*right))));
+    switch (op) {
+    case SymbolicOp::ShiftRight:
+        if (*right >= 0 && *right <= longest)
+            return RationalForm(floorDivide(*left, BigInteger(BigInteger(1) << static_cast<unsigned>(*right))));
+        break;
+    case SymbolicOp::BitAnd: // of packaged integers too, bits are those of two's complement without an end
+        return RationalForm(BigInteger(*left & *right));
+    case SymbolicOp::BitOr:
+        return RationalForm(BigInteger(*left | *right));
+    case SymbolicOp::BitXOr:
+        return RationalForm(BigInteger(*left ^ *right));
+    default:
+        break;
+    }
     const LinearForm* smallA = a.small();
     const LinearForm* smallB = b.small();
     const Result value =

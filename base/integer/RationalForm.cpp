@@ -58,6 +58,17 @@ std::optional<RationalForm> withinLimits(WideForm form) {
 
 } // namespace
 
+std::size_t costOf(const WideForm& form) {
+    const auto cost = [](const BigInteger& number) {
+        const std::size_t words = number.backend().size();
+        return words * words;
+    };
+    std::size_t sum = cost(form.constant) + cost(form.denominator);
+    for (const WidePart& part : form.parts)
+        sum += cost(part.factor);
+    return sum;
+}
+
 RationalForm::RationalForm(WideForm form) {
     if (form.denominator != 1) {
         BigInteger divisor = gcd(form.denominator, form.constant);

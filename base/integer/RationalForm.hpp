@@ -29,6 +29,9 @@ struct WideForm {
     bool operator==(const WideForm&) const = default;
 };
 
+/// What an operation on a form costs, in those on numbers of 64 bits: common divisors take the square of the words.
+[[nodiscard]] std::size_t costOf(const WideForm& form);
+
 class RationalForm {
 public:
     RationalForm() = default; ///< 0
@@ -58,8 +61,8 @@ public:
     /// -1, 0 or 1 for a constant.
     [[nodiscard]] int sign() const;
 
-    /// Parts and constant: what an operation on the form costs.
-    [[nodiscard]] std::size_t size() const noexcept { return 1 + (wide_ ? wide_->parts.size() : small_.parts.size()); }
+    /// What an operation on the form costs.
+    [[nodiscard]] std::size_t size() const { return wide_ ? costOf(*wide_) : 1 + small_.parts.size(); }
 
     bool operator==(const RationalForm& other) const;
 

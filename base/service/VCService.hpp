@@ -3,6 +3,7 @@
 #pragma once
 
 #include "base/core/Limits.hpp"
+#include "base/decide/Budget.hpp"
 #include "base/decide/Decision.hpp"
 #include "base/decide/reasons/Reasons.hpp"
 #include "base/decide/shorten/ShortForm.hpp"
@@ -159,6 +160,9 @@ public:
 
     /// Whether decisions are over the signed 32-bit integers from now on; over all integers at first.
     void setDecisions32Bit(bool are32Bit);
+    /// Takes the steps of all further decisions from a budget as well, which outlives the service or is replaced;
+    /// nullptr ends that.  Decisions beyond it are undecided.
+    void shareBudget(Budget* budget);
     /// Whether there is an assignment for which the condition holds; whether it holds for all.
     Decision canHold(const VCSymbolicExprId& condition);
     Decision mustHold(const VCSymbolicExprId& condition);

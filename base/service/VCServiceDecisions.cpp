@@ -81,6 +81,7 @@ Decider& ServiceParts::decider() {
         decider = std::make_unique<Decider>(table, DecisionOptions{.keywordsInForce = keywordsInForce(),
                                                                    .bits32 = bits32,
                                                                    .solver = &SolverPlugin::installed()});
+    decider->share(budget);
     return *decider;
 }
 
@@ -97,15 +98,20 @@ Decision VCService::ask(PairQuestion question, const VCSymbolicExprId& a, const 
         VTSYM_CHECK_SAMPLED(isAsDecidedAnew(*parts_, key, *before));
         return *before;
     }
+    const std::uint64_t allowed = parts_->budget != nullptr ? std::min(steps, parts_->budget->left()) : steps;
     Decision decision = decide(*parts_, parts_->decider(), key, steps);
     // What stays undecided with fewer steps may be decided with all.
-    if (parts_->caching && (steps == limits::decisionSteps || !decision.isUndecided()))
+    if (parts_->caching && (allowed == limits::decisionSteps || !decision.isUndecided()))
         parts_->decisions.insert(key, decision);
     return decision;
 }
 
 void VCService::setDecisions32Bit(bool are32Bit) {
     parts_->bits32 = are32Bit;
+}
+
+void VCService::shareBudget(Budget* budget) {
+    parts_->budget = budget;
 }
 
 bool VCService::assume(const VCSymbolicExprId& condition) {

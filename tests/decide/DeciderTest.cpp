@@ -125,6 +125,29 @@ TEST(DecisionBounds, DoNotDependOnEarlierQuestions) {
         }
 }
 
+TEST(DecisionBounds, AreSharedByDecidersOfOneBudget) {
+    DecisionFixture bench;
+    Budget budget(20'000);
+    std::uint64_t taken = 0;
+    std::size_t decided = 0;
+    std::size_t asked = 0;
+    for (; budget.left() > 0; ++asked) {
+        ASSERT_LT(asked, 20'000U);
+        Decider decider(bench.table);
+        decider.share(&budget);
+        const Decision decision = decider.canHold(bench.parse("A<B && B<" + std::to_string(asked) + " || A==C"));
+        taken += decider.stepsTaken();
+        decided += decision.isYes() ? 1U : 0U;
+        EXPECT_TRUE(decision.isYes() || budget.left() == 0);
+    }
+    EXPECT_LE(taken, 20'000U);
+    EXPECT_GE(decided + 1, asked);
+    bench.decider.share(&budget);
+    EXPECT_EQ(bench.text(bench.decider.canHold(bench.parse("A<B"))), "undecided steps");
+    budget.add(1000);
+    EXPECT_TRUE(bench.decider.canHold(bench.parse("A<B")).isYes());
+}
+
 TEST(DecisionDepth, IsNotLimitedByTheStack) {
     DecisionFixture bench;
     SymbolicExprId deep = bench.parse("A");

@@ -65,7 +65,6 @@ TEST(LinearSolver, FindsTheSmallestSolution) {
 }
 
 TEST(LinearSolver, IsExactBeyond64Bits) {
-    std::size_t solved = 0;
     for (std::size_t round = 0; round < 400; ++round) {
         std::mt19937_64 random(round);
         const std::size_t variables = 2 + round % 3;
@@ -79,12 +78,8 @@ TEST(LinearSolver, IsExactBeyond64Bits) {
         }
         Steps steps;
         steps.refill(1U << 22U);
-        try { // narrow bodies with large numbers may take too many steps
-            const auto found = LinearSolver(steps).solve(system, variables);
-            ASSERT_TRUE(found && holds(system, *found)) << "seed " << round;
-            ++solved;
-        } catch (const StepsUsedUp&) {
-        }
+        const auto found = LinearSolver(steps).solve(system, variables);
+        ASSERT_TRUE(found && holds(system, *found)) << "seed " << round;
         steps.refill(1U << 22U);
         LinearConstraint even = constraint(random, variables, 70); // twice a sum is never odd
         even.relation = Compared::Zero;
@@ -94,7 +89,6 @@ TEST(LinearSolver, IsExactBeyond64Bits) {
         system.push_back(even);
         ASSERT_FALSE(LinearSolver(steps).solve(system, variables)) << "seed " << round;
     }
-    EXPECT_GT(solved, 300U);
 }
 
 } // namespace

@@ -9,37 +9,26 @@
 #include "base/decide/solver/LinearSolver.hpp"
 
 #include "base/core/Limits.hpp"
-#include "base/decide/solver/OmegaTest.hpp"
+#include "base/decide/solver/ConstraintReduction.hpp"
 #include "base/integer/CheckedInteger.hpp"
 
 namespace VT {
 
 namespace {
 
-/// Splits along a variable before the Omega test takes over, and the part of the steps that it may take then.
-constexpr int fewBranches = 400;
-constexpr std::uint64_t portion = 4;
-
 template <class Number>
 std::optional<std::vector<BigInteger>> solveWith(std::span<const LinearConstraint> constraints, std::size_t variables,
                                                  Steps& steps) {
-    Omega::Problem<Number> problem;
+    Problem<Number> problem;
     for (const LinearConstraint& constraint : constraints) {
-        Omega::Row<Number> row(variables + 1);
+        IntegerRows::Row<Number> row(variables + 1);
         for (std::size_t i = 0; i < constraint.factors.size(); ++i)
             row[i] = Number(constraint.factors[i]);
         row.back() = Number(constraint.constant);
         (constraint.relation == LinearConstraint::Relation::Zero ? problem.equalities : problem.inequalities)
             .push_back(std::move(row));
     }
-    const auto values = [&] {
-        try {
-            const Steps::Share share(steps, steps.left() / portion);
-            return Omega::OmegaTest<Number>(variables, steps, fewBranches).solve(problem);
-        } catch (const StepsUsedUp&) { // many variables, which the other way may suit
-            return Omega::OmegaTest<Number>(variables, steps, std::numeric_limits<int>::max()).solve(problem);
-        }
-    }();
+    const auto values = ConstraintReduction<Number>(variables, steps).solve(std::move(problem));
     if (!values)
         return std::nullopt;
     std::vector<BigInteger> result;

@@ -35,8 +35,8 @@ bool isFunctionCall(const SymbolicExprTable& table, SymbolicExprId id) {
     return text != "defined" && !text.starts_with("__has_");
 }
 
-std::optional<std::pair<SymbolicExprId, SymbolicExprId>>
-CallCongruence::findViolation(std::span<const SymbolicExprId> calls, const Witness& witness) {
+std::vector<std::pair<SymbolicExprId, SymbolicExprId>>
+CallCongruence::findViolations(std::span<const SymbolicExprId> calls, const Witness& witness) {
     const SymbolicExprTable& table = leaves_.table();
     IdMap<std::int64_t> values;
     std::int64_t simulation = 0;
@@ -78,20 +78,19 @@ CallCongruence::findViolation(std::span<const SymbolicExprId> calls, const Witne
         return a.arguments != b.arguments ? a.arguments < b.arguments : a.position < b.position;
     };
     std::ranges::sort(all, before);
-    const Call* first = nullptr;
-    const Call* second = nullptr;
+    std::vector<std::pair<std::size_t, std::size_t>> violations;
     for (std::size_t i = 1; i < all.size(); ++i) {
         const Call& a = all[i - 1];
         const Call& b = all[i];
-        if (a.name == b.name && a.arguments == b.arguments && a.value != b.value &&
-            (first == nullptr || a.position < first->position)) {
-            first = &a;
-            second = &b;
-        }
+        if (a.name == b.name && a.arguments == b.arguments && a.value != b.value)
+            violations.emplace_back(a.position, b.position);
     }
-    if (first == nullptr)
-        return std::nullopt;
-    return std::pair(calls[first->position], calls[second->position]);
+    std::ranges::sort(violations);
+    std::vector<std::pair<SymbolicExprId, SymbolicExprId>> pairs;
+    pairs.reserve(violations.size());
+    for (const auto& [first, second] : violations)
+        pairs.emplace_back(calls[first], calls[second]);
+    return pairs;
 }
 
 } // namespace VT

@@ -6,9 +6,9 @@
 #include "base/decide/Steps.hpp"
 #include "base/decide/diagram/Unknowns.hpp"
 
-#include <optional>
 #include <span>
 #include <utility>
+#include <vector>
 
 namespace VT {
 
@@ -23,10 +23,11 @@ public:
           unknowns_(unknowns),
           steps_(steps) {}
 
-    /// Two of the calls that a witness gives two values, though they call one function with arguments that are equal
-    /// under the witness; unknowns that it does not name are 0.  A step for each node of the arguments.
-    [[nodiscard]] std::optional<std::pair<SymbolicExprId, SymbolicExprId>>
-    findViolation(std::span<const SymbolicExprId> calls, const Witness& witness);
+    /// Calls that a witness gives two values, though they call one function with arguments that are equal under the
+    /// witness: pairs that tie all such calls together.  Unknowns that the witness does not name are 0.  A step for
+    /// each node of the arguments.
+    [[nodiscard]] std::vector<std::pair<SymbolicExprId, SymbolicExprId>>
+    findViolations(std::span<const SymbolicExprId> calls, const Witness& witness);
 
 private:
     const LeafReader& leaves_;

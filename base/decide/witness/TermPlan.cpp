@@ -123,6 +123,8 @@ std::optional<TermPlan::Exact> TermPlan::computeExact(const Node& node, const Ex
         const auto value = small != nullptr && !isReal ? integerResult(node.op, small->constant) : std::nullopt;
         if (node.op == SymbolicOp::UnaryMinus)
             number = combine(a.number, -1, {}, 0);
+        else if (node.op == SymbolicOp::BitCompl && a.number.isInteger() && !isReal)
+            number = combine(a.number, -1, LinearForm{{}, -1}, 1);
         else if (value)
             number = RationalForm(BigInteger(*value));
         return number ? std::optional(Exact{*std::move(number), isReal}) : std::nullopt;

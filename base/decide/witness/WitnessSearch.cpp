@@ -41,6 +41,7 @@ WitnessSearch::WitnessSearch(const LeafReader& leaves, Unknowns& unknowns, Diagr
 
 Decision WitnessSearch::find(const Question& question, Diagram diagram, std::span<const UnknownLeaf> leaves) {
     question_ = &question;
+    terms_.clear();
     if (diagram == never)
         return {Answer::No, DecisionBound::None, std::nullopt};
     if (!diagrams_.needsChecking(diagram))

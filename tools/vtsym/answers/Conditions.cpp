@@ -29,6 +29,7 @@ std::string visible(std::string text) {
 } // namespace
 
 bool Conditions::makeRoomFor(const std::string& text) {
+    budget_->add(VT::limits::commandStepsPerLine);
     textBytes_ += text.size() + cacheEntryBytes;
     if (service().table().size() < fullTable && textBytes_ < fullTexts)
         return false;
@@ -64,6 +65,7 @@ void Conditions::renew() {
     handle_.reset();
     handle_.emplace();
     service().setDecisions32Bit(bits32_);
+    service().shareBudget(budget_.get());
     service().clearAssumptions();
     for (const std::string& text : assumptions_)
         assume(text);

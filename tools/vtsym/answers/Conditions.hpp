@@ -6,6 +6,7 @@
 #include "tools/vtsym/io/Texts.hpp"
 
 #include <cstddef>
+#include <memory>
 #include <optional>
 #include <string>
 #include <vector>
@@ -63,6 +64,7 @@ private:
     bool bits32_;
     const TextOptions* assumedIn_ = nullptr;
     std::vector<std::string> assumptions_;
+    std::unique_ptr<VT::Budget> budget_ = std::make_unique<VT::Budget>(VT::limits::commandSteps); ///< of all services
     std::optional<VT::VCServiceHandle> handle_;
     std::size_t textBytes_ = 0; ///< that the service may have kept
 };

@@ -159,7 +159,9 @@ bool prove(const DimsOptions& options, Console& console) {
     define(table, options);
     VT::Assumptions assumptions(table);
     assume(table, options, assumptions);
+    VT::Budget budget(VT::limits::commandSteps);
     VT::Decider decider(table, {.solver = &VT::SolverPlugin::installed()});
+    decider.share(&budget);
     VT::DimensionProofs proofs(table, decider, assumptions);
     bool isDecided = true;
     for (const std::string& text : options.claims) {

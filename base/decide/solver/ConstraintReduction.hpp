@@ -1,25 +1,18 @@
-// Solves linear constraints over the integers in numbers of one kind.
+// Reduces linear constraints over the integers until none is left, or until a core is left for a search.
 //
-// Method: the Omega test (Pugh, "The Omega test: a fast and practical integer programming algorithm for dependence
-// analysis", 1991).  Equalities are solved by Euclid's algorithm on their columns, a change of variables that keeps
-// the integers.  Then one variable after the other is eliminated from the inequalities by adding each lower bound to
-// each upper one.  That is exact where all factors of one side are 1; elsewhere the problem becomes alternatives: the
-// dark shadow, whose solutions always extend, and equalities near a lower bound, which catch what it misses.  Where
-// two parallel inequalities leave few values between them, these values are the alternatives instead.
+// Method: equalities are solved by Euclid's algorithm on their columns, a change of variables that keeps the integers.
+// Inequalities are divided by common factors and rounded; two opposite ones that leave one value are an equality.  Then
+// one variable after the other is eliminated by adding each lower bound to each upper one, where that is exact, because
+// all factors of one side are 1 (Pugh, "The Omega test: a fast and practical integer programming algorithm for
+// dependence analysis", 1991), and adds next to no constraints.  What is left is searched for an integer point
+// (IntegerBody).  The eliminations lead back to the values of all variables.
 //
-// The number of constraints and of alternatives explodes where many variables are tied together or factors are large.
-// So variables are eliminated only where that adds next to no constraints at first, and a problem is split at a
-// variable that has a fraction in a solution over the real numbers (branch and bound, Land and Doig, 1960), which finds
-// solutions fast where there is room for them but need not end.  After some such splits the Omega test takes over.
-//
-// Alternatives wait on an explicit stack, each with the eliminations that lead back to the values of its variables.
-//
-// Cost: one step for every few factors of a constraint that is looked at.
+// Cost: steps for the factors of every constraint that is looked at, and those of the search.
 #pragma once
 
 #include "base/core/Check.hpp"
 #include "base/core/Limits.hpp"
-#include "base/decide/solver/Simplex.hpp"
+#include "base/decide/solver/IntegerBody.hpp"
 
 #include <algorithm>
 #include <cstddef>
@@ -30,108 +23,49 @@
 #include <utility>
 #include <vector>
 
-namespace VT::Omega {
-
-template <class Number>
-Number magnitude(const Number& value) {
-    return value < Number(0) ? Number(-value) : value;
-}
-
-template <class Number>
-Number floorDivide(const Number& value, const Number& divisor) { // the divisor is positive
-    Number quotient = value / divisor;
-    if (Number(quotient * divisor) > value)
-        quotient = quotient - Number(1);
-    return quotient;
-}
-
-template <class Number>
-Number gcdOf(Number a, Number b) {
-    a = magnitude(a);
-    b = magnitude(b);
-    while (b != Number(0)) {
-        Number rest = a - Number(a / b) * b;
-        a = std::move(b);
-        b = std::move(rest);
-    }
-    return a;
-}
-
-/// Factors of the variables, then the constant.
-template <class Number>
-using Row = std::vector<Number>;
+namespace VT {
 
 /// How a variable follows from the others.
 template <class Number>
 struct Elimination {
     std::size_t variable;
-    std::vector<Row<Number>> bounds; ///< of the variable, as inequalities; none where `value` says what it is
-    Row<Number> value;               ///< what is to be added to what the variable became; its own factor is 0
+    std::vector<IntegerRows::Row<Number>>
+        bounds;                     ///< of the variable, as inequalities; none where `value` says what it is
+    IntegerRows::Row<Number> value; ///< what is to be added to what the variable became; its own factor is 0
 };
 
 template <class Number>
 struct Problem {
-    std::vector<Row<Number>> equalities;
-    std::vector<Row<Number>> inequalities;
+    std::vector<IntegerRows::Row<Number>> equalities;
+    std::vector<IntegerRows::Row<Number>> inequalities;
     std::vector<Elimination<Number>> eliminations;
 };
 
-/// A problem, or several: with `equality` reduced by each number from 0 to `last`.
+/// Solves one problem in numbers of one kind.
 template <class Number>
-struct Alternatives {
-    Problem<Number> problem;
-    Row<Number> equality; ///< empty where the problem is meant as it is
-    Number last;
-};
-
-/// Solves one problem after the other; each takes steps.
-template <class Number>
-class OmegaTest {
+class ConstraintReduction {
 public:
-    /// @param branches  problems that are split along a variable before they are split in a way that ends
-    OmegaTest(std::size_t variables, Steps& steps, int branches)
-        : variables_(variables),
-          steps_(steps),
-          branches_(branches) {}
+    ConstraintReduction(std::size_t variables, Steps& steps) : variables_(variables), steps_(steps) {}
 
     /// Values of the variables, or nothing where the constraints have no solution.  Throws StepsUsedUp.
     std::optional<std::vector<Number>> solve(Problem<Number> problem) {
-        open_.clear();
-        open_.push_back({std::move(problem), {}, Number(0)});
-        while (!open_.empty()) {
-            Problem<Number> next = takeNext();
-            if (reduce(next))
-                return valuesOf(next);
+        if (!reduce(problem))
+            return std::nullopt;
+        std::vector<Number> core(variables_, Number(0));
+        if (!problem.inequalities.empty()) {
+            auto found = solveCore(problem);
+            if (!found)
+                return std::nullopt;
+            core = *std::move(found);
         }
-        return std::nullopt;
+        return valuesOf(problem, std::move(core));
     }
 
 private:
-    using Line = Row<Number>;
+    using Line = IntegerRows::Row<Number>;
 
     /// Takes steps for factors that are looked at or written.
-    void charge(std::size_t factors) {
-        constexpr std::size_t factorsPerStep = 8;
-        steps_.take(1 + factors / factorsPerStep);
-    }
-
-    Problem<Number> takeNext() {
-        Alternatives<Number>& top = open_.back();
-        if (top.equality.empty()) {
-            Problem<Number> only = std::move(top.problem);
-            open_.pop_back();
-            return only;
-        }
-        charge((top.problem.inequalities.size() + 1) * (variables_ + 1));
-        Problem<Number> next = top.problem;
-        next.equalities.push_back(top.equality);
-        next.equalities.back().back() = top.equality.back() - top.last;
-        if (top.last == Number(0))
-            open_.pop_back();
-        else
-            top.last = top.last - Number(1);
-        return next;
-    }
+    void charge(const Line& row) { IntegerRows::charge(steps_, row.size(), row.back()); }
 
     [[nodiscard]] const Number& constantOf(const Line& row) const { return row.back(); }
 
@@ -139,20 +73,20 @@ private:
         Number gcd(0);
         for (std::size_t i = 0; i < variables_; ++i)
             if (row[i] != Number(0))
-                gcd = gcdOf(gcd, row[i]);
+                gcd = IntegerRows::gcdOf(gcd, row[i]);
         return gcd;
     }
 
     /// a * factorA + b * factorB
     Line combined(const Line& a, const Number& factorA, const Line& b, const Number& factorB) {
-        charge(a.size());
+        charge(a);
         Line sum(a.size());
         for (std::size_t i = 0; i < a.size(); ++i)
             sum[i] = a[i] * factorA + b[i] * factorB;
         return sum;
     }
 
-    /// Works on a problem until it has no constraint left (true), or a contradiction or alternatives (false).
+    /// Works on a problem until it has no constraint left, or a core; false where it has a contradiction.
     bool reduce(Problem<Number>& problem) {
         for (;;) {
             steps_.take();
@@ -161,19 +95,15 @@ private:
             bool foundEquality = false;
             if (!tighten(problem, foundEquality))
                 return false;
-            if (foundEquality)
-                continue;
-            if (dropOneSided(problem))
+            if (foundEquality || dropOneSided(problem))
                 continue;
             if (problem.inequalities.empty())
                 return true;
             const std::size_t variable = cheapest(problem);
             const Sides sides = sidesOf(problem, variable);
-            if (sides.isExact() && (branches_ == 0 || sides.growth() <= limits::eliminationGrowth)) {
-                eliminate(problem, variable, false);
-                continue;
-            }
-            return split(problem, variable);
+            if (!sides.isExact() || sides.growth() > limits::eliminationGrowth)
+                return true;
+            eliminate(problem, variable);
         }
     }
 
@@ -206,7 +136,8 @@ private:
     [[nodiscard]] std::size_t leastFactor(const Line& row) const {
         std::size_t least = variables_;
         for (std::size_t i = 0; i < variables_; ++i)
-            if (row[i] != Number(0) && (least == variables_ || magnitude(row[i]) < magnitude(row[least])))
+            if (row[i] != Number(0) &&
+                (least == variables_ || IntegerRows::magnitude(row[i]) < IntegerRows::magnitude(row[least])))
                 least = i;
         return least;
     }
@@ -227,7 +158,7 @@ private:
         const auto apply = [&](Line& line) {
             if (line[variable] == Number(0))
                 return;
-            charge(line.size());
+            charge(line);
             for (std::size_t i = 0; i < variables_; ++i)
                 if (shift[i] != Number(0))
                     line[i] += shift[i] * line[variable];
@@ -266,7 +197,7 @@ private:
     bool tighten(Problem<Number>& problem, bool& foundEquality) {
         std::map<Line, Number> tightest; // constant by factors
         for (Line& line : problem.inequalities) {
-            charge(line.size());
+            charge(line);
             const Number gcd = gcdOfFactors(line);
             if (gcd == Number(0)) {
                 if (constantOf(line) < Number(0))
@@ -275,7 +206,7 @@ private:
             }
             for (std::size_t i = 0; i < variables_; ++i)
                 line[i] = line[i] / gcd;
-            Number constant = floorDivide(line.back(), gcd);
+            Number constant = IntegerRows::floorDivide(line.back(), gcd);
             line.pop_back();
             const auto [at, added] = tightest.try_emplace(std::move(line), constant);
             if (!added && constant < at->second)
@@ -324,7 +255,7 @@ private:
                 sides.greatestLower = std::max(sides.greatestLower, line[variable]);
             } else if (line[variable] < Number(0)) {
                 ++sides.upper;
-                sides.greatestUpper = std::max(sides.greatestUpper, magnitude(line[variable]));
+                sides.greatestUpper = std::max(sides.greatestUpper, IntegerRows::magnitude(line[variable]));
             }
         }
         return sides;
@@ -374,107 +305,56 @@ private:
         return best;
     }
 
-    /// Adds each lower bound of a variable to each upper one; `dark` leaves room for an integer between any two.
-    void eliminate(Problem<Number>& problem, std::size_t variable, bool dark) {
+    /// Adds each lower bound of a variable to each upper one.
+    void eliminate(Problem<Number>& problem, std::size_t variable) {
         const std::vector<Line>& bounds = takeBounds(problem, variable);
         for (const Line& lower : bounds) {
             if (lower[variable] < Number(0))
                 continue;
-            for (const Line& upper : bounds) {
-                if (upper[variable] > Number(0))
-                    continue;
-                const Number a = magnitude(upper[variable]);
-                const Number& b = lower[variable];
-                Line sum = combined(lower, a, upper, b);
-                if (dark)
-                    sum.back() = sum.back() - Number(a - Number(1)) * Number(b - Number(1));
-                problem.inequalities.push_back(std::move(sum));
-            }
+            for (const Line& upper : bounds)
+                if (upper[variable] < Number(0))
+                    problem.inequalities.push_back(combined(lower, Number(-upper[variable]), upper, lower[variable]));
         }
     }
 
-    // Alternatives.
+    // The core.
 
-    bool split(Problem<Number>& problem, std::size_t variable) {
-        const auto real = Simplex<Number>(problem.inequalities, variables_, steps_).solve();
-        if (!real)
-            return false;
-        if (branches_ > 0) {
-            --branches_;
-            branch(problem, *real);
-            return false;
-        }
-        if (splitAlongNarrowest(problem, variable))
-            return false;
-        const Number a = sidesOf(problem, variable).greatestUpper;
-        for (const Line& lower : problem.inequalities)
-            if (const Number& b = lower[variable]; b > Number(1))
-                open_.push_back({problem, lower, floorDivide(Number(Number(a * b) - a - b), a)});
-        eliminate(problem, variable, true);
-        open_.push_back({std::move(problem), {}, Number(0)}); // the dark shadow is tried first
-        return false;
-    }
-
-    /// Alternatives below and above the value of a variable that is no integer in a real solution, the nearer one
-    /// first; where there is none, the solution itself.
-    void branch(Problem<Number>& problem, const RealPoint<Number>& real) {
-        std::size_t variable = 0;
-        Number whole(0);
-        for (; variable < variables_; ++variable) {
-            whole = floorDivide(real.numerators[variable], real.denominator);
-            if (whole * real.denominator != real.numerators[variable])
-                break;
-        }
-        if (variable == variables_) {
-            for (std::size_t i = 0; i < variables_; ++i) {
-                problem.equalities.emplace_back(variables_ + 1);
-                problem.equalities.back()[i] = Number(1);
-                problem.equalities.back().back() = -Number(real.numerators[i] / real.denominator);
-            }
-            open_.push_back({std::move(problem), {}, Number(0)});
-            return;
-        }
-        const Number fraction = real.numerators[variable] - whole * real.denominator;
-        const bool nearAbove = Number(fraction + fraction) > real.denominator;
-        charge((problem.inequalities.size() + 1) * (variables_ + 1));
-        for (const bool above : {!nearAbove, nearAbove}) {
-            Problem<Number> half = problem;
-            half.inequalities.emplace_back(variables_ + 1);
-            half.inequalities.back()[variable] = Number(above ? 1 : -1);
-            half.inequalities.back().back() = above ? Number(-whole - Number(1)) : whole;
-            open_.push_back({std::move(half), {}, Number(0)});
-        }
-    }
-
-    /// Alternatives for the values between two opposite constraints, where these are fewer than the splinters.
-    bool splitAlongNarrowest(const Problem<Number>& problem, std::size_t variable) {
-        std::map<Line, const Line*> byFactors;
-        const Line* narrowest = nullptr;
-        Number width(0);
+    /// Searches for values of the variables that are left; the others are 0.
+    std::optional<std::vector<Number>> solveCore(const Problem<Number>& problem) {
+        std::vector<std::size_t> left;
+        for (std::size_t i = 0; i < variables_; ++i)
+            if (std::ranges::any_of(problem.inequalities, [&](const Line& line) { return line[i] != Number(0); }))
+                left.push_back(i);
+        std::map<Line, Bounds<Number>> slabs; // by factors
         for (const Line& line : problem.inequalities) {
-            const Line opposite = oppositeFactors(line);
-            if (const auto other = byFactors.find(opposite); other != byFactors.end()) {
-                const Number between = line.back() + other->second->back();
-                if (narrowest == nullptr || between < width) {
-                    narrowest = &line;
-                    width = between;
-                }
-            }
-            byFactors.emplace(Line(line.begin(), line.end() - 1), &line);
+            Line factors;
+            for (const std::size_t variable : left)
+                factors.push_back(line[variable]);
+            Line opposite(factors.size());
+            std::ranges::transform(factors, opposite.begin(), [](const Number& factor) { return -factor; });
+            if (const auto other = slabs.find(opposite); other != slabs.end())
+                other->second.high = constantOf(line);
+            else
+                slabs[std::move(factors)].low = -constantOf(line);
         }
-        if (narrowest == nullptr || width > sidesOf(problem, variable).greatestLower)
-            return false;
-        open_.push_back({problem, *narrowest, width});
-        return true;
+        std::vector<typename IntegerBody<Number>::Slab> all;
+        for (const auto& [factors, bounds] : slabs)
+            all.push_back({factors, bounds});
+        const auto core = IntegerBody<Number>(std::move(all), left.size(), steps_).solve();
+        if (!core)
+            return std::nullopt;
+        std::vector<Number> values(variables_, Number(0));
+        for (std::size_t i = 0; i < left.size(); ++i)
+            values[left[i]] = (*core)[i];
+        return values;
     }
 
     // Values.
 
-    std::vector<Number> valuesOf(const Problem<Number>& problem) {
-        std::vector<Number> values(variables_, Number(0));
+    std::vector<Number> valuesOf(const Problem<Number>& problem, std::vector<Number> values) {
         for (std::size_t i = problem.eliminations.size(); i-- > 0;) {
             const Elimination<Number>& step = problem.eliminations[i];
-            charge((step.bounds.size() + 1) * (variables_ + 1));
+            steps_.take(1 + step.bounds.size() * variables_ / 8);
             if (step.bounds.empty())
                 values[step.variable] += sumOf(step.value, step.variable, values);
             else
@@ -499,11 +379,11 @@ private:
             const Number& factor = bound[step.variable];
             const Number rest = sumOf(bound, step.variable, values);
             if (factor > Number(0)) {
-                Number least = -floorDivide(rest, factor);
+                Number least = -IntegerRows::floorDivide(rest, factor);
                 if (!low || least > *low)
                     low = std::move(least);
             } else {
-                Number most = floorDivide(rest, Number(-factor));
+                Number most = IntegerRows::floorDivide(rest, Number(-factor));
                 if (!high || most < *high)
                     high = std::move(most);
             }
@@ -516,8 +396,6 @@ private:
 
     std::size_t variables_;
     Steps& steps_;
-    std::vector<Alternatives<Number>> open_;
-    int branches_; ///< left
 };
 
-} // namespace VT::Omega
+} // namespace VT
