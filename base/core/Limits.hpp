@@ -31,6 +31,9 @@ inline constexpr std::size_t coverPoints = 4096;
 inline constexpr std::size_t coverBoxes = 256;
 inline constexpr std::int64_t coverHole = 3;
 
+/// Comparisons of an And up to which each restricts its symbol at once; those of a longer one are gathered first.
+inline constexpr std::size_t restrictedOneByOne = 32;
+
 /// Symbols of a sum of products up to which it is known at once whether the bounds of each are nested, so that no
 /// search is needed.
 inline constexpr std::size_t nestedAtoms = 32;
@@ -186,6 +189,13 @@ inline constexpr std::size_t factoredParts = 64;
 
 /// Comparisons of a form up to which its operands are judged by a truth table.  A longer one is judged by proofs only.
 inline constexpr std::size_t prunedComparisons = 64;
+
+/// Points that a formula's comparisons tell apart, up to which the smallest formula is searched; a multiple of 64.  The
+/// search may look at so many subproblems, of about a microsecond each, and remembers so many that failed; real and
+/// random conditions take some tens.  Beyond a bound the smallest form that algebra found is the result.
+inline constexpr std::size_t factorPoints = 256;
+inline constexpr std::size_t factorSteps = 2000;
+inline constexpr std::size_t factorFailures = 64;
 
 /// Intervals of a set up to which the shortest way to write it is looked for.  Those beyond are written one by one.
 inline constexpr std::size_t writtenIntervals = 64;

@@ -1,4 +1,4 @@
-// Takes what does not count out of a formula, by its truth table.
+// Takes what does not count out of a formula, by its truth table, and has it searched for smaller formulas.
 //
 // The constraints cut the integers of each atom into cells; a formula is evaluated at all points of their grid at
 // once, a bit each.  From the outside in it follows where the value of an operand decides that of the formula;
@@ -6,7 +6,8 @@
 // change that saves most is made first, and the rest is judged anew.
 // Cost: the occurrences of operands times the words of a truth table for each change, within limits::coverPoints and
 // limits::prunedComparisons.
-// Relies on: Grid.  Atoms count as independent; what depends on each other through more is left to proofs.
+// Relies on: Grid, FactorSearch.  Atoms count as independent; what depends on each other through more is left to
+// proofs.
 #include "base/decide/shorten/FormulaPruning.hpp"
 
 #include "base/core/Limits.hpp"
@@ -177,6 +178,48 @@ std::optional<Formula> FormulaPruning::pruned(Formula formula) {
             return formula;
         formula = best;
     }
+}
+
+// Smaller formulas.
+
+/// The formula that a search found, operands in the order in which their atoms were met.
+Formula FormulaPruning::written(const Factored& items) {
+    struct Part {
+        Formula formula;
+        Atom first; ///< the first atom in it
+    };
+
+    boost::container::small_vector<Part, 16> parts;
+    for (const FactoredItem& item : items) {
+        if (item.kind == FactoredItem::Kind::Comparison) {
+            const Axis& axis = grid_.axes()[item.axis];
+            parts.push_back({formulas_.leaf({axis.atom(), axis.setOf(item.cells)}), axis.atom()});
+            continue;
+        }
+        Part b = parts.back();
+        parts.pop_back();
+        Part& a = parts.back();
+        if (b.first < a.first)
+            std::swap(a, b);
+        const Formula operands[] = {a.formula, b.formula};
+        a.formula = formulas_.chain(item.kind == FactoredItem::Kind::And ? Kind::And : Kind::Or, operands);
+    }
+    return parts.back().formula;
+}
+
+FormulaPruning::Smaller FormulaPruning::smaller(Formula formula) {
+    if (formulas_.kind(formula) == Kind::Constant || formulas_.kind(formula) == Kind::Leaf ||
+        formulas_.comparisons(formula) > limits::prunedComparisons || !readGrid(formula))
+        return {formula, formulas_.comparisons(formula) == 1};
+    evaluate(formula);
+    const Points& on = valueOf(formula);
+    Points off(grid_.words(), 0);
+    grid_.points(grid_.boxOf(Cube()), off.data());
+    for (std::size_t word = 0; word < off.size(); ++word)
+        off[word] &= ~on[word];
+    const FactorAnswer answer = searchFactored(grid_, {on.data(), on.size()}, {off.data(), off.size()},
+                                               formulas_.comparisons(formula), limits::factorSteps);
+    return {answer.formula ? written(*answer.formula) : formula, answer.isProven};
 }
 
 } // namespace VT

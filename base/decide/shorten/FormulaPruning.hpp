@@ -1,7 +1,7 @@
-// Formulas without anything that does not count.
+// Formulas without anything that does not count, and formulas of the fewest comparisons.
 #pragma once
 
-#include "base/cover/CoverGrid.hpp"
+#include "base/cover/FactorSearch.hpp"
 #include "base/decide/shorten/Formulas.hpp"
 
 #include <optional>
@@ -19,6 +19,16 @@ public:
     /// of fewer comparisons, whatever values the atoms have.  Nothing where it has more than limits::prunedComparisons
     /// or differs at more points than limits::coverPoints.
     std::optional<Formula> pruned(Formula formula);
+
+    struct Smaller {
+        Formula formula;
+        bool isSmallest; ///< whether it is proven that none has fewer comparisons
+    };
+
+    /// A formula of the same meaning with fewer comparisons; the formula itself where none is found within
+    /// limits::factorSteps and limits::factorPoints.
+
+    Smaller smaller(Formula formula);
 
 private:
     using Kind = Formulas::Kind;
@@ -39,6 +49,7 @@ private:
     void appendOperands(std::size_t parent);
     [[nodiscard]] Formula replaced(std::size_t occurrence, Formula by);
     [[nodiscard]] std::optional<Formula> shorterFor(const Occurrence& occurrence);
+    Formula written(const Factored& items);
     [[nodiscard]] std::optional<Formula> cheaper(const Occurrence& leaf);
 
     Formulas& formulas_;

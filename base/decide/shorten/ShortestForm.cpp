@@ -171,10 +171,24 @@ bool ShortestForm::considerSums(Formula formula) {
     return sum && opposite;
 }
 
+/// The form of the fewest comparisons so far.
+Formula ShortestForm::fewest() const {
+    const auto count = [&](const Considered& each) { return formulas_.comparisons(each.formula); };
+    return std::ranges::min_element(considered_, {}, count)->formula;
+}
+
+/// Considers a form of fewer comparisons than those so far; whether none has fewer where atoms are independent.
+bool ShortestForm::considerFewest() {
+    const Formula before = fewest();
+    const auto [smaller, isSmallest] = pruning_.smaller(before);
+    if (smaller != before)
+        consider("fewest comparisons", isSmallest ? smaller : irredundant(smaller));
+    return isSmallest;
+}
+
 /// Takes operands away from the best form so far.
 void ShortestForm::shortenByProofs(SymbolicExprId known) {
-    const auto count = [&](const Considered& each) { return formulas_.comparisons(each.formula); };
-    const Formula fewest = std::ranges::min_element(considered_, {}, count)->formula;
+    const Formula fewest = this->fewest();
     if (formulas_.comparisons(fewest) > limits::shortenByProofs || formulas_.kind(fewest) == Kind::Constant)
         return;
     const SymbolicExprId start = writer_.writePlainly(fewest);
@@ -248,7 +262,10 @@ void ShortestForm::search(SymbolicExprId condition, Formula start, SymbolicExprI
         return;
     }
     consider("what does not count left out", irredundant(start));
+    if (considerFewest() && !isAnythingKnown && !depends && isPruned_)
+        return;
     const bool complete = considerSums(start);
+    considerFewest();
     const SymbolicExprId normal = normalForm();
     if (const auto other = normal == condition ? std::nullopt : reader_.read(normal))
         consider("normal form, factored", irredundant(simplified(other->formula)));

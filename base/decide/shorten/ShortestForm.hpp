@@ -3,10 +3,11 @@
 // Method: the condition is read as a formula whose leaves are sets of integers (Formulas, ComparedTerms), which joins
 // comparisons of one term.  Constraints are judged by those around them, common operands are taken out.  Where every
 // unknown is then in one comparison, no other form has fewer of them, and the search ends: that is most real
-// conditions.  Otherwise the same is done with a smallest sum of products, with that of the opposite (which is a
-// product of sums) and with the simplifier's normal form.  What does not count in these forms is found by their truth
-// tables; where those are too large, or comparisons depend on each other through more than sets, operands are taken
-// away one by one with a proof for each.
+// conditions.  Otherwise what does not count is found by a truth table, and formulas of fewer comparisons are searched
+// (FactorSearch), which mostly ends in a proof that there are none.  Where it does not, the same is done with a
+// smallest sum of products, with that of the opposite (which is a product of sums) and with the simplifier's normal
+// form.  Where truth tables are too large, or comparisons depend on each other through more than sets, operands are
+// taken away one by one with a proof for each.
 //
 // The form with the fewest comparisons, of those the one with the fewest bytes, is proven equal before it is returned.
 //
@@ -58,6 +59,8 @@ private:
                 const std::function<SymbolicExprId()>& normalForm);
     bool considerSums(Formula formula);
     void consider(std::string_view way, Formula formula);
+    [[nodiscard]] Formula fewest() const;
+    bool considerFewest();
     void shortenByProofs(SymbolicExprId known);
     SymbolicExprId best(SymbolicExprId condition, std::size_t comparisons);
 
