@@ -29,6 +29,7 @@ void merge(std::vector<BranchFinding>& all, std::vector<BranchFinding> found, st
             all.push_back(std::move(finding));
         } else if (!same->configurations.empty()) { // not in every build
             same->configurations.push_back(configuration);
+            same->hasOtherReasons = same->hasOtherReasons || same->reasons != finding.reasons;
         }
     }
 }

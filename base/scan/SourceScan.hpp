@@ -65,6 +65,7 @@ struct BranchFinding {
     bool isMinimal = false; ///< without any one of them the finding does not follow
     /// Configurations of the build that the finding holds for, by number; none for one that holds in every build.
     std::vector<std::size_t> configurations{};
+    bool hasOtherReasons = false; ///< in some of the configurations
 };
 
 /// Options of a scanner, for all of its files.

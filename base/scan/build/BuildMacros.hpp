@@ -62,7 +62,8 @@ public:
     static std::optional<DirectiveConstant> valueOf(std::span<const DirectiveToken> tokens, const Lookup& lookup,
                                                     bool isCpp, std::vector<std::string_view>* used = nullptr);
 
-    bool operator==(const BuildMacros& other) const { return key_ == other.key_; }
+    /// A text that is equal for equal macros.
+    [[nodiscard]] const std::string& key() const noexcept { return key_; }
 
 private:
     void set(std::string name, Macro macro);

@@ -32,6 +32,19 @@ std::string_view contentOf(std::string_view comment) {
     return trimmed(comment);
 }
 
+/// Returns a text with one blank for any run of them.
+std::string onOneLine(std::string_view text) {
+    std::string line;
+    for (const char c : text) {
+        const bool isBlank = blanks.find(c) != std::string_view::npos;
+        if (!isBlank)
+            line.push_back(c);
+        else if (!line.ends_with(' '))
+            line.push_back(' ');
+    }
+    return line;
+}
+
 /// Reads what follows the mark: `keep KIND..., REASON`.
 void readRequest(std::string_view request, Suppression& suppression) {
     const std::size_t comma = request.find(',');
@@ -50,7 +63,7 @@ void readRequest(std::string_view request, Suppression& suppression) {
         isFirst = false;
         words = trimmed(words.substr(end));
     }
-    suppression.reason = reason;
+    suppression.reason = onOneLine(reason);
     suppression.isMalformed = !keeps || reason.empty();
 }
 
@@ -78,7 +91,7 @@ std::vector<Suppression> readSuppressions(std::string_view text) {
             const std::string_view content = contentOf(text.substr(place.begin, place.end - place.begin));
             if (!content.starts_with(mark))
                 continue;
-            Suppression suppression{regionOf(text, anchor, line, place.begin, place.end), std::string(content), {}};
+            Suppression suppression{regionOf(text, anchor, line, place.begin, place.end), onOneLine(content), {}};
             anchor = place.begin;
             line = suppression.region.line;
             readRequest(content.substr(mark.size()), suppression);

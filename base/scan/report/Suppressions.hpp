@@ -17,7 +17,7 @@ namespace VT {
 ///     // vtsym: keep dead removable, generated
 ///
 /// It names the kinds of findings to keep quiet about, or none for all, and after the comma a reason.
-struct Suppression {
+struct VTSYM_API Suppression {
     SourceRegion region;               ///< of the comment
     std::string text;                  ///< of the comment, without its marks
     std::optional<std::uint64_t> line; ///< of the directive; nothing where there is none

@@ -1,14 +1,23 @@
-// vtsym scan: reads C and C++ files and prints the findings of SourceScanner as messages, JSON or SARIF with fixes.
-// A file that cannot be read is reported and does not end the scan; the status is 2 then.
-#include "base/scan/SourceScan.hpp"
-#include "host/Text.hpp"
+// vtsym scan: reads C and C++ files and prints the findings of SourceScanner as messages, JSON or SARIF with fixes,
+// writes their fixes, or compares two states of a repository. A file that cannot be read is reported and does not end
+// the scan; the status is 2 then.
+#include "base/core/Limits.hpp"
 #include "tools/vtsym/commands/Commands.hpp"
-#include "tools/vtsym/findings/Findings.hpp"
 #include "tools/vtsym/findings/SourceFiles.hpp"
+#include "tools/vtsym/findings/source/Baseline.hpp"
+#include "tools/vtsym/findings/source/GitRepository.hpp"
+#include "tools/vtsym/findings/source/Patch.hpp"
+#include "tools/vtsym/findings/source/ScanRules.hpp"
+#include "tools/vtsym/findings/source/SourceChanges.hpp"
+#include "tools/vtsym/findings/source/SourceChecker.hpp"
 #include "tools/vtsym/io/CommandLine.hpp"
 #include "tools/vtsym/io/Files.hpp"
 
-#include <array>
+#include <algorithm>
+#include <charconv>
+#include <filesystem>
+#include <fnmatch.h>
+#include <limits>
 #include <utility>
 
 namespace vtsym {
@@ -19,118 +28,300 @@ constexpr const char* notes =
     R"(Compares every #if, #ifdef, #ifndef, #elif, #elifdef and #elifndef with the directives around it and those before it in
 its chain, and reports branches that no build enters, conditions that always hold, and conditions with a shorter text.
 Directories are searched for C and C++ files.  Nothing is concluded about a macro across a #define or #undef of it, and an
-included file may define what is not defined.  #if 0 and #if 1 are left alone.
+included file may define what is not defined.  #if 0 and #if 1 are left alone.  A comment at a directive, such as
+/* vtsym: keep, REASON */, suppresses what is found there.  Settings are read from .vtsym.toml.
 
-Exit status: 0 no findings, 1 findings, 2 a path could not be read, with or without findings in others.
+Exit status: 0 no findings; 1 findings, of --fix those that it left, of --diff new ones; 2 the command line is wrong or a
+path could not be read, with or without findings in others.
 
 Examples:
   vtsym scan src include
+  vtsym scan --why --assume 'VERSION >= 3' src
+  vtsym scan --compile-commands build/compile_commands.json src
+  vtsym scan --fix --dry-run src | git apply
+  vtsym scan --diff main..HEAD
   vtsym scan --sarif src >findings.sarif)";
 
-constexpr auto rules = std::to_array<FindingRule>({
-    {"dead", "A branch is never entered.",
-     "The condition contradicts a directive around the branch or before it in its chain, so that no definition of the "
-     "macros enters the branch. Correct the condition, or remove the branch."},
-    {"always-true", "A condition always holds.",
-     "The directives around the branch and before it in its chain imply the condition, so that later branches of the "
-     "chain are dead. Correct the condition, or remove it."},
-    {"removable", "A condition has a shorter text that enters the branch in the same cases.",
-     "The directives around the branch and before it in its chain make a part of the condition redundant. Correct the "
-     "condition, or write the shorter one."},
-    {"spelled-out", "A condition repeats that those before it in its chain do not hold.",
-     "An #elif is reached only where the conditions before it in its chain do not hold, so that a part of its "
-     "condition "
-     "says so again. That is a matter of taste: keep it, or write the shorter condition."},
-});
-
 struct ScanOptions {
-    std::vector<std::string> paths;
-    std::size_t mostBytes = vtsym::mostBytes;
-    bool strictIncludes = false;
+    ScanSettings settings; ///< of the command line, then with those of the project
+    std::string config;
+    bool hasSeverity = false;
     bool summary = false;
+    bool fix = false;
+    bool dryRun = false;
+    std::string written; ///< baseline to write
+    std::string range;   ///< of states to compare
+    std::size_t days = std::numeric_limits<std::size_t>::max();
     FindingForm form = FindingForm::Compiler;
 };
 
-Place placeOf(const std::string& file, const VT::SourceRegion& region) {
-    return {file, region.line, region.column, region.endLine, region.endColumn, {}};
-}
-
-/// "since '#if A' (line 1) holds and '#if B' (line 2) does not hold here".
-std::string reasonsText(const std::vector<VT::BranchReason>& reasons) {
-    std::string text = "since ";
-    for (std::size_t i = 0; i < reasons.size(); ++i) {
-        text.append(i == 0 ? "" : i + 1 == reasons.size() ? " and " : ", ").append("'").append(reasons[i].directive);
-        text.append("' (line ").append(std::to_string(reasons[i].region.line)).append(")");
-        text.append(reasons[i].holds ? " holds" : " does not hold");
+/// Whether a pattern leaves a path out, or a folder above it.
+bool isExcluded(const std::string& path, const std::vector<std::string>& patterns) {
+    for (std::size_t end = path.size(); end != std::string::npos && end != 0; end = path.rfind('/', end - 1)) {
+        const std::string part = path.substr(0, end);
+        if (std::ranges::any_of(
+                patterns, [&](const std::string& pattern) { return fnmatch(pattern.c_str(), part.c_str(), 0) == 0; }))
+            return true;
     }
-    return text + " here";
+    return false;
 }
 
-std::string messageOf(const VT::BranchFinding& found) {
-    std::string text = "'" + found.directive + "' ";
-    const char* alone = "";
-    switch (found.kind) {
-    case VT::BranchFindingKind::Dead:
-        text.append("is dead");
-        alone = ", the condition contradicts itself";
-        break;
-    case VT::BranchFindingKind::AlwaysTrue:
-        text.append("always holds");
-        alone = ", whatever the macros are";
-        break;
-    default:
-        text.append("can be '").append(found.directive, 0, found.directive.find(' ') + 1).append(found.proposed);
-        text.append("'");
+/// Whether a path is one of those given, or below one; any where none is given.
+bool isBelow(const std::string& path, const std::vector<std::string>& given) {
+    return given.empty() || std::ranges::any_of(given, [&](const std::string& each) {
+               const std::string above = std::filesystem::path(each).lexically_normal().string();
+               const bool isFolder = above.ends_with('/');
+               return above == "." || path == above || path.starts_with(isFolder ? above : above + "/");
+           });
+}
+
+/// Reads a baseline; an empty one where it is to be written and is not there.
+Baseline baselineAt(const std::string& path, bool mayBeMissing) {
+    if (path.empty() || (mayBeMissing && !std::filesystem::exists(path)))
+        return {};
+    return Baseline::read(readFile(path, mostBytes));
+}
+
+/// One run of the command.
+class Scan {
+public:
+    Scan(const ScanOptions& options, Console& console)
+        : options_(options),
+          settings_(options.settings),
+          console_(console),
+          writer_(makeFindingWriter(options.form, console, scanRules())),
+          checker_(settings_, [this](const std::string& sentence) { writer_->note(sentence); }) {}
+
+    SearchResult run();
+    /// Compares two states of the repository.
+    SearchResult compare();
+
+private:
+    void problem(const std::string& path, const std::string& sentence) {
+        writer_->problem({path, 0, 0, 0, 0, {}}, sentence);
     }
-    return found.reasons.empty() ? text + alone : text + ", " + reasonsText(found.reasons);
+
+    bool readBaselines();
+    void scan(const std::string& path);
+    void report(const FileFinding& found);
+    void fix(const std::string& path, const std::string& text, const std::vector<FileFinding>& found);
+    void writeSummary() const;
+
+    const ScanOptions& options_;
+    const ScanSettings& settings_;
+    Console& console_;
+    std::unique_ptr<FindingWriter> writer_;
+    SourceChecker checker_;
+    Baseline baseline_; ///< accepted before
+    Baseline written_;
+    std::chrono::sys_days today_ = today();
+    std::uint64_t files_ = 0;
+    std::uint64_t fixed_ = 0;
+};
+
+bool Scan::readBaselines() {
+    const std::string& known = settings_.baseline;
+    try {
+        baseline_ = baselineAt(known, false);
+        written_ = baselineAt(options_.written, true);
+        return true;
+    } catch (const FileError& error) {
+        problem(known.empty() ? options_.written : known, error.what());
+        return false;
+    }
 }
 
-Finding findingOf(const std::string& file, const VT::BranchFinding& found) {
-    Finding finding;
-    finding.place = placeOf(file, found.region);
-    finding.kind = rules[static_cast<std::size_t>(found.kind)].kind;
-    finding.message = messageOf(found);
-    finding.condition = found.condition;
-    if (!found.proposed.empty())
-        finding.proposed = found.proposed;
-    for (const VT::BranchReason& reason : found.reasons)
-        finding.follows.push_back({placeOf(file, reason.region), reason.directive});
-    if (found.replaced && VT::shownText(found.edit.text) == found.edit.text) // a log can hold only UTF-8
-        finding.fix = Fix{"Write the shorter condition.", placeOf(file, *found.replaced), found.edit.text};
-    return finding;
-}
-
-SearchResult scan(const ScanOptions& options, Console& console) {
-    const auto writer = makeFindingWriter(options.form, console, rules);
-    const FileProblem problem = [&](const std::string& path, const std::string& sentence) {
-        writer->problem(placeOf(path, {}), sentence);
+SearchResult Scan::run() {
+    if (!readBaselines())
+        return writer_->finish();
+    const FileProblem report = [this](const std::string& path, const std::string& sentence) {
+        problem(path, sentence);
     };
-    VT::SourceScanner scanner({.strictIncludes = options.strictIncludes});
-    std::uint64_t files = 0;
-    for (const std::string& path : sourceFiles(options.paths, problem)) {
-        std::string text;
+    for (const std::string& path : sourceFiles(settings_.paths, report))
+        if (!isExcluded(path, settings_.excluded))
+            scan(path);
+    if (files_ == 0 && !writer_->failed())
+        problem(settings_.paths.front(), "there is no C or C++ file: name a folder of sources, or a file");
+    if (const std::uint64_t undecided = checker_.counts().undecided; undecided > 0)
+        writer_->note(std::to_string(undecided) + " decisions were given up: findings that depend on them are missing");
+    if (const std::uint64_t leftOut = checker_.counts().leftOut; leftOut > 0)
+        writer_->note(std::to_string(leftOut) + " configurations of files were left out: a file is scanned for " +
+                      std::to_string(VT::limits::scanConfigurations));
+    if (const std::size_t gone = baseline_.notFound(); gone > 0)
+        writer_->note(std::to_string(gone) + " findings of " + settings_.baseline +
+                      " are not found any more: write it again with --write-baseline");
+    if (!options_.written.empty()) {
         try {
-            text = readFile(path, options.mostBytes);
+            writeFile(options_.written, written_.text());
         } catch (const FileError& error) {
-            problem(path, error.what());
+            problem(options_.written, error.what());
+        }
+    }
+    const SearchResult result = writer_->finish();
+    if (options_.fix && !options_.dryRun)
+        console_.err("vtsym: " + std::to_string(fixed_) + " conditions were written anew\n");
+    if (options_.summary)
+        writeSummary();
+    return result;
+}
+
+SearchResult Scan::compare() {
+    GitRepository repository;
+    std::size_t counted[2] = {0, 0}; // findings that remain, that are fixed
+    for (const ChangedFile& file : repository.changes(options_.range)) {
+        if (!isSourcePath(file.path) || isExcluded(file.path, settings_.excluded) ||
+            !isBelow(file.path, settings_.paths))
+            continue;
+        std::string texts[2];
+        try {
+            const std::string* const blobs[] = {&file.blobBefore, &file.blob};
+            for (std::size_t i = 0; i < 2; ++i)
+                texts[i] = blobs[i]->empty() ? "" : repository.read(*blobs[i], settings_.mostBytes);
+        } catch (const FileError& error) {
+            problem(file.path, error.what());
             continue;
         }
-        ++files;
-        scanner.scan(text, isCppPath(path),
-                     [&](const VT::BranchFinding& found) { writer->write(findingOf(path, found)); });
+        for (const Finding& finding : changesOf(checker_, {file.path, texts[0], texts[1], file.lines})) {
+            if (finding.state == "new") {
+                writer_->write(finding);
+                continue;
+            }
+            writer_->remark(finding);
+            if (finding.state != "updated")
+                ++counted[finding.state == "absent" ? 1 : 0];
+        }
     }
-    if (files == 0 && !writer->failed())
-        problem(options.paths.front(), "there is no C or C++ file: name a folder of sources, or a file");
-    if (const std::uint64_t undecided = scanner.counts().undecided; undecided > 0)
-        writer->note(std::to_string(undecided) + " decisions were given up: findings that depend on them are missing");
-    const SearchResult result = writer->finish();
-    if (options.summary) {
-        const VT::SourceScanCounts& counts = scanner.counts();
-        console.err("vtsym: " + std::to_string(files) + " files, " + std::to_string(counts.branches) + " branches, " +
-                    std::to_string(writer->found()) + " findings; " + std::to_string(counts.unread) +
-                    " conditions not understood, " + std::to_string(counts.undecided) + " decisions given up\n");
-    }
+    const std::uint64_t found = writer_->found();
+    const SearchResult result = writer_->finish();
+    if (options_.summary)
+        console_.err("vtsym: " + std::to_string(found) + " new findings, " + std::to_string(counted[0]) + " remain, " +
+                     std::to_string(counted[1]) + " are fixed\n");
     return result;
+}
+
+void Scan::scan(const std::string& path) {
+    std::string text;
+    try {
+        text = readFile(path, settings_.mostBytes);
+    } catch (const FileError& error) {
+        problem(path, error.what());
+        return;
+    }
+    ++files_;
+    const std::vector<FileFinding> found = checker_.check(path, text);
+    if (options_.fix)
+        fix(path, text, found);
+    else
+        std::ranges::for_each(found, [this](const FileFinding& each) { report(each); });
+}
+
+void Scan::report(const FileFinding& found) {
+    if (!options_.written.empty())
+        written_.accept(found.finding, today_);
+    else if (settings_.baseline.empty() || !baseline_.covers(found.finding, today_, options_.days))
+        writer_->write(found.finding);
+}
+
+/// Writes the proposals into a file, or their patch.  What has no proposal is reported.
+void Scan::fix(const std::string& path, const std::string& text, const std::vector<FileFinding>& found) {
+    std::vector<VT::SourceEdit> edits;
+    for (const FileFinding& each : found) {
+        if (!settings_.baseline.empty() && baseline_.covers(each.finding, today_, options_.days))
+            continue;
+        if (!each.edit && !options_.dryRun)
+            writer_->write(each.finding);
+        if (!each.edit)
+            continue;
+        if (!edits.empty() &&
+            each.edit->begin < edits.back().end) // of the same condition: what the build adds is later
+            edits.pop_back();
+        edits.push_back(*each.edit);
+    }
+    fixed_ += edits.size();
+    if (options_.dryRun) {
+        console_.out(patchOf(path, text, edits));
+    } else if (!edits.empty()) {
+        try {
+            writeFile(path, VT::withEdits(text, edits));
+        } catch (const FileError& error) {
+            problem(path, error.what());
+        }
+    }
+}
+
+void Scan::writeSummary() const {
+    const VT::SourceScanCounts& counts = checker_.counts();
+    console_.err("vtsym: " + std::to_string(files_) + " files, " + std::to_string(counts.branches) + " branches, " +
+                 std::to_string(writer_->found()) + " findings; " + std::to_string(counts.unread) +
+                 " conditions not understood, " + std::to_string(counts.undecided) + " decisions given up\n");
+}
+
+/// Joins the options with the settings of the project.
+void readProject(ScanOptions& options) {
+    std::error_code error;
+    const std::string path = options.config.empty() ? settingsName : options.config;
+    if (!options.config.empty() || std::filesystem::is_regular_file(path, error)) {
+        try {
+            options.settings = joined(readSettings(path), options.settings, options.hasSeverity);
+        } catch (const FileError& problem) {
+            throw UsageError(path, problem.what());
+        }
+    }
+    if (options.settings.paths.empty() && options.range.empty())
+        throw UsageError("PATH is required");
+    if (options.dryRun && !options.fix)
+        throw UsageError("--dry-run", "there is nothing to do without --fix");
+}
+
+void addReportOptions(Command& command, const std::shared_ptr<ScanOptions>& options) {
+    addFormOptions(command, options->form);
+    command.addArgument(
+        {"--kinds", "Report these kinds, separated by commas; all or usual for many (usual unless given)", "KINDS"},
+        [options](const std::string& list) { options->settings.kinds = kindsOf("--kinds", list); });
+    command.addArgument({"--severity", "Report nothing below: note or warning (note unless given)", "LEVEL"},
+                        [options](const std::string& name) {
+                            options->settings.severity = levelOf("--severity", name);
+                            options->hasSeverity = true;
+                        });
+    command.addFlag("--why", "Add the operands that force each finding", options->settings.why);
+    command.addArgument({"--baseline", "Report only what this file does not accept", "FILE"},
+                        options->settings.baseline);
+    command.addArgument({"--baseline-days", "Report what was accepted more days ago, too", "DAYS"},
+                        [options](const std::string& text) {
+                            const char* const end = text.data() + text.size();
+                            if (const auto [at, error] = std::from_chars(text.data(), end, options->days);
+                                error != std::errc() || at != end)
+                                throw UsageError("--baseline-days", quotedArgument(text) + " is not a number of days");
+                        });
+    command.addArgument({"--write-baseline", "Accept all findings, and write them to this file", "FILE"},
+                        options->written);
+    command.addArgument({"--diff", "Compare two states of a git repository instead", "A..B"}, options->range);
+    command.addFlag("--fix", "Write the proposals into the files", options->fix);
+    command.addFlag("--dry-run", "With --fix: print a patch instead", options->dryRun);
+    command.addFlag("--summary", "Report on standard error how much was read", options->summary);
+}
+
+void addBuildOptions(Command& command, const std::shared_ptr<ScanOptions>& options) {
+    const auto all = [](std::vector<std::string>& list) {
+        return [&list](std::vector<std::string> values) { list = std::move(values); };
+    };
+    ScanSettings& settings = options->settings;
+    command.addArguments({"-D", "Scan for a build that defines a macro", "NAME[=VALUE]"}, all(settings.defines));
+    command.addArguments({"-U", "Scan for a build in which a macro is not defined", "NAME"}, all(settings.undefines));
+    command.addArguments({"--imacros", "Scan for a build with the macros of a file", "FILE"}, all(settings.macroFiles));
+    command.addArgument({"--compile-commands", "Scan for the builds of a compilation database", "FILE"},
+                        settings.compileCommands);
+    command.addArguments({"--assume", "Scan for builds in which a condition holds, or those of a file", "CONDITION"},
+                         [&settings](const std::vector<std::string>& arguments) {
+                             for (const std::string& argument : arguments) {
+                                 try {
+                                     addAssumption(settings.assumptions, argument);
+                                 } catch (const FileError& error) {
+                                     throw UsageError("--assume", argument + " " + error.what());
+                                 }
+                             }
+                         });
+    command.addFlag("--strict-includes", "Assume that an included file changes any macro", settings.strictIncludes);
 }
 
 } // namespace
@@ -139,14 +330,23 @@ void addScan(CommandLine& program) {
     Command& command =
         program.add("scan", "Find dead, redundant and shortenable preprocessor conditions in C and C++", notes);
     const auto options = std::make_shared<ScanOptions>();
-    const auto take = [options](std::vector<std::string> paths) { options->paths = std::move(paths); };
+    const auto take = [options](std::vector<std::string> paths) { options->settings.paths = std::move(paths); };
     command.addArguments({"PATH", "Files and directories"}, take);
-    command.require("PATH");
-    addFormOptions(command, options->form);
-    addSizeOption(command, options->mostBytes);
-    command.addFlag("--strict-includes", "Assume that an included file changes any macro", options->strictIncludes);
-    command.addFlag("--summary", "Report on standard error how much was read", options->summary);
-    command.run = [options](Console& console) { return scan(*options, console); };
+    addReportOptions(command, options);
+    addBuildOptions(command, options);
+    addSizeOption(command, options->settings.mostBytes);
+    command.addArguments(
+        {"--exclude", "Leave out paths, or folders, of a pattern", "PATTERN"},
+        [options](std::vector<std::string> patterns) { options->settings.excluded = std::move(patterns); });
+    command.addArgument({"--config", "Read settings from this file rather than .vtsym.toml", "FILE"}, options->config);
+    command.exclude("--write-baseline", "--fix");
+    command.afterOptions = [options] { readProject(*options); };
+    for (const char* const other : {"--fix", "--baseline", "--write-baseline"})
+        command.exclude("--diff", other);
+    command.run = [options](Console& console) -> ExitStatus {
+        Scan scan(*options, console);
+        return options->range.empty() ? scan.run() : scan.compare();
+    };
     command.onError = SearchResult::Failed;
 }
 

@@ -281,7 +281,11 @@ void SarifWriter::end() {
 } // namespace
 
 std::string sentenceOf(const Finding& finding) {
-    std::string sentence = finding.message;
+    std::string sentence = finding.state == "new"         ? "new: "
+                           : finding.state == "unchanged" ? "remains: "
+                           : finding.state == "absent"    ? "fixed: "
+                                                          : "";
+    sentence.append(finding.message);
     for (const std::string& reason : finding.because)
         sentence.append(&reason == finding.because.data() ? "; because: " : ", ").append(reason);
     return sentence;

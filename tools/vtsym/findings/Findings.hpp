@@ -64,7 +64,8 @@ struct Finding {
     std::vector<std::string> because = {}; ///< operands that force the finding
     FindingLevel level = FindingLevel::Warning;
     std::string fingerprint = {}; ///< of the content, the same wherever it moves; empty for none
-    std::string state = {};       ///< against another state of the file: "new", "unchanged", "absent"; empty for none
+    /// Against another state of the file: "new", "unchanged", "absent", "updated"; empty where there is none.
+    std::string state = {};
     /// Configurations of the build that the finding holds for, from 1, of so many; none where it holds in every build.
     std::vector<std::size_t> configurations = {};
     std::size_t ofConfigurations = 0;
@@ -106,6 +107,10 @@ public:
     void problem(const Place& place, const std::string& sentence) override;
     void note(const std::string& sentence) override;
     void remark(const Place& place, std::span<const std::string> sentences, const std::string& members) override;
+
+    /// Writes what is no finding of this state: the search finds nothing by it.
+    void remark(const Finding& finding) { add(finding); }
+
     /// Ends the output, after which nothing may be written.  Returns the outcome.
     SearchResult finish();
 

@@ -18,11 +18,6 @@ constexpr auto cppExtensions =
                                      ".h++", ".hh", ".hpp", ".hxx", ".inl", ".ipp", ".ixx",  ".tcc", ".tpp", ".txx"});
 constexpr auto otherExtensions = std::to_array<std::string_view>({".c", ".h"});
 
-bool isSource(const fs::path& path) {
-    const std::string extension = path.extension().string();
-    return isCppPath(path.native()) || std::ranges::find(otherExtensions, extension) != otherExtensions.end();
-}
-
 /// A path without redundant parts.  A path with `..` stays as it is, since the part before may be a link.
 std::string tidied(const fs::path& path) {
     return std::ranges::find(path, fs::path("..")) == path.end() ? path.lexically_normal().string() : path.string();
@@ -43,7 +38,7 @@ void addBelow(const fs::path& directory, std::vector<std::string>& files, const 
                 problem(entries->path().string(), "cannot be read: " + unknown.message());
             else if (fs::is_directory(status))
                 open.push_back(entries->path());
-            else if (fs::is_regular_file(status) && isSource(entries->path()))
+            else if (fs::is_regular_file(status) && isSourcePath(entries->path().native()))
                 files.push_back(tidied(entries->path()));
             entries.increment(error);
         }
@@ -58,6 +53,11 @@ void addBelow(const fs::path& directory, std::vector<std::string>& files, const 
 bool isCppPath(std::string_view path) {
     const std::string extension = fs::path(path).extension().string();
     return std::ranges::find(cppExtensions, extension) != cppExtensions.end();
+}
+
+bool isSourcePath(std::string_view path) {
+    const std::string extension = fs::path(path).extension().string();
+    return isCppPath(path) || std::ranges::find(otherExtensions, extension) != otherExtensions.end();
 }
 
 std::vector<std::string> sourceFiles(const std::vector<std::string>& paths, const FileProblem& problem) {

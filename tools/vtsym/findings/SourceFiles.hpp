@@ -12,6 +12,9 @@ namespace vtsym {
 /// Whether a path has an extension that only C++ uses; .h and .c are read as C.
 bool isCppPath(std::string_view path);
 
+/// Whether a path has an extension of C or C++.
+bool isSourcePath(std::string_view path);
+
 /// Receives a path that could not be read, and the reason.
 using FileProblem = std::function<void(const std::string& path, const std::string& sentence)>;
 

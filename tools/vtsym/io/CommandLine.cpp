@@ -35,6 +35,8 @@ std::vector<std::string> marked(std::span<const std::string> arguments) {
             ended = true;
         else if (ended)
             result.push_back(std::string(endMark) + argument);
+        else if (argument == "-imacros") // as compilers write it
+            result.push_back("-" + argument);
         else if (!argument.starts_with('-') || argument == "-")
             result.push_back(std::string(plainMark) + argument);
         else

@@ -1,0 +1,123 @@
+// vtsym scan in projects: settings, baselines, fixes, states of a repository, and what services take.
+#include "base/core/Limits.hpp"
+#include "tests/support/JsonSchema.hpp"
+#include "tests/tools/Program.hpp"
+
+#include <gmock/gmock.h>
+#include <random>
+#include <regex>
+#include <set>
+
+namespace VT::Testing {
+namespace {
+
+using Json = nlohmann::json;
+
+TEST(ScanProjects, KeepToTheirTranscript) {
+    expectTranscript("program-scan-projects.txt");
+}
+
+/// Chains of conditions with comments, splices and line ends of both kinds.
+class Sources {
+public:
+    std::string next() {
+        const std::string end = below(3) == 0 ? "\r\n" : "\n";
+        std::string text;
+        for (std::size_t i = below(30); i > 0; --i)
+            text += chain(3) + "\n";
+        if (below(3) == 0)
+            text += "int last;";
+        std::string ended;
+        for (const char c : text)
+            ended += c == '\n' ? end : std::string(1, c);
+        return ended;
+    }
+
+private:
+    std::size_t below(std::size_t bound) { return std::uniform_int_distribution<std::size_t>(0, bound - 1)(random_); }
+
+    std::string oneOf(const std::vector<std::string>& texts) { return texts[below(texts.size())]; }
+
+    std::string condition() {
+        std::string text = oneOf({"A", "defined(B)", "C > 2", "(A == 1)", "!A"});
+        for (std::size_t i = below(4); i > 0; --i)
+            text +=
+                oneOf({" && ", " || ", " && \\\n    ", " /* a */ && ", "&&/* b\n */", " && /* c */ \\\n /* d */ "}) +
+                oneOf({"A", "defined B", "C>1", "(A || C)", "!defined(A)"});
+        return text;
+    }
+
+    std::string chain(std::size_t depth) {
+        if (depth == 0 || below(3) == 0)
+            return oneOf({"", "int x;", "/* text */", "\nint y;\n\n\n\n\n"});
+        std::string text =
+            oneOf({"#if ", " # if ", "#if /* e */ "}) + condition() + oneOf({"", " // f", " /* g */"}) + "\n";
+        if (below(4) == 0)
+            text = oneOf({"#ifdef A", "#ifndef /* h */ B // i", "# ifdef B"}) + "\n";
+        text += chain(depth - 1) + "\n";
+        if (below(2) == 0)
+            text += "#elif " + condition() + "\n" + chain(depth - 1) + "\n";
+        if (below(3) == 0)
+            text += "#else\n" + chain(depth - 1) + "\n";
+        return text + "#endif";
+    }
+
+    std::mt19937_64 random_{7};
+};
+
+TEST(ScanProjects, FixesArePatchesThatGitApplies) {
+    const TemporaryFolder place;
+    Sources sources;
+    place.run("mkdir -p fixed/d patched");
+    for (int i = 0; i < 60; ++i)
+        place.write("fixed/" + std::string(i % 2 == 0 ? "" : "d/") + std::to_string(i) + ".h", sources.next());
+    const ProgramResult result = runScript(place, R"(cp -r fixed/* patched; cd patched
+vtsym scan --fix --dry-run --kinds all . >../patch; git apply --whitespace=nowarn ../patch || exit 3
+cd ../fixed; vtsym scan --fix --kinds all . >../left; cd ..; grep -vc "'#else' is dead" left && exit 5
+diff -r fixed patched || exit 4
+cd fixed; vtsym scan --kinds all . >../again; grep -c '^@@' ../patch)");
+    EXPECT_EQ(result.status, 0) << result.out << result.err;
+    EXPECT_EQ(place.read("again"), "") << "what was fixed is found again";
+    EXPECT_GT(std::stoi(result.out), 100);
+}
+
+TEST(ScanProjects, LogsHoldWhatServicesTake) {
+    const TemporaryFolder place;
+    std::string text;
+    for (std::size_t i = 0; i < limits::sarifResults + 10; ++i)
+        text += "#if A && A\n#endif\n";
+    const std::string dead = "#ifdef B\n#ifndef B\n#endif\n#endif\n";
+    place.write("a.c", text + dead + dead);
+    const ProgramResult all = runScript(place, "vtsym scan --sarif a.c");
+    EXPECT_THAT(all.err, ::testing::HasSubstr("12 of 25012 results are left out"));
+    const Json log = Json::parse(all.out);
+    const Json& results = log["runs"][0]["results"];
+    ASSERT_EQ(results.size(), limits::sarifResults);
+    EXPECT_EQ(results.back()["ruleId"], "dead");
+    EXPECT_EQ(log["runs"][0]["invocations"][0]["toolExecutionNotifications"][0]["level"], "note");
+    std::set<std::string> fingerprints;
+    for (const Json& each : results)
+        fingerprints.insert(each["partialFingerprints"]["vtsym/v1"].get<std::string>());
+    EXPECT_EQ(fingerprints.size(), results.size());
+}
+
+TEST(ScanProjects, MessagesAreWhatTheProblemMatcherReads) {
+    const TemporaryFolder place;
+    place.write("a:1.c", "#ifdef A\n#ifdef A // vtsym: keep\n#endif\n#elif X && X\n#endif\n");
+    const Json matcher = Json::parse(std::ifstream(VTSYM_TEST_DATA "/../../examples/ci/problem-matcher.json"));
+    const Json& pattern = matcher["problemMatcher"][0]["pattern"][0];
+    const std::regex expression(pattern["regexp"].get<std::string>());
+    const std::vector<std::string> lines = linesOf(runScript(place, "vtsym scan a:1.c").out);
+    std::vector<std::string> numbers;
+    for (const std::string& line : lines) {
+        std::smatch match;
+        ASSERT_TRUE(std::regex_match(line, match, expression)) << line;
+        EXPECT_EQ(match[pattern["file"].get<std::size_t>()], "a:1.c");
+        numbers.push_back(match[pattern["line"].get<std::size_t>()]);
+        EXPECT_EQ("a:1.c:" + numbers.back() + ": " + match[pattern["message"].get<std::size_t>()].str(), line);
+    }
+    EXPECT_THAT(numbers, ::testing::ElementsAre("2", "2", "4"));
+}
+
+} // namespace
+} // namespace VT::Testing

@@ -1,0 +1,52 @@
+// What a scan is to do: options of the command line, and the file .vtsym.toml of a project.
+#pragma once
+
+#include "tools/vtsym/findings/Findings.hpp"
+#include "tools/vtsym/io/Files.hpp"
+
+#include <cstddef>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace vtsym {
+
+/// The file of a project's settings, in the folder where the program starts.
+inline constexpr const char* settingsName = ".vtsym.toml";
+
+struct ScanSettings {
+    std::vector<std::string> paths;    ///< files and folders
+    std::vector<std::string> excluded; ///< patterns of paths, as a shell has them
+    std::vector<std::string> kinds;    ///< of findings that are reported; empty for the usual ones
+    FindingLevel severity = FindingLevel::Note;
+    bool strictIncludes = false;
+    bool why = false;
+    std::vector<std::string> defines;   ///< texts after -D
+    std::vector<std::string> undefines; ///< names
+    std::vector<std::string> macroFiles;
+    std::vector<std::string> assumptions; ///< conditions
+    std::string compileCommands;
+    std::string baseline;
+    std::size_t mostBytes = vtsym::mostBytes;
+};
+
+/// Reads a file of settings: its table [scan].  Paths in it are relative to its folder.  Throws FileError for a file
+/// that cannot be read, or says something else.
+ScanSettings readSettings(const std::string& path);
+
+/// Adds what the command line says to the settings of a project: paths, kinds and a severity replace those of the
+/// project, everything else is added.
+ScanSettings joined(ScanSettings project, const ScanSettings& commandLine, bool hasSeverity);
+
+/// Adds an assumption: a condition, or the conditions of a file, one a line, without those that begin with # and empty
+/// ones.  A file is an argument that ends in `.assume`, or the path of a regular file.  Throws FileError.
+void addAssumption(std::vector<std::string>& conditions, const std::string& argument);
+
+/// Returns the kinds of a list such as "dead,always-true", or of "all".  Throws UsageError about the option for an
+/// unknown one.
+std::vector<std::string> kindsOf(const std::string& option, const std::string& list);
+
+/// Returns a level by its name; throws UsageError about the option.
+FindingLevel levelOf(const std::string& option, const std::string& name);
+
+} // namespace vtsym

@@ -1,0 +1,130 @@
+// Scans files as the settings of a project say.
+//
+// Method: all findings of a file, those that are not asked for included, are compared with its suppressions; one that
+// covers none of them is a finding itself.
+// Cost: that of the scanner.
+#include "tools/vtsym/findings/source/SourceChecker.hpp"
+
+#include "base/core/Limits.hpp"
+#include "base/scan/report/Suppressions.hpp"
+#include "tools/vtsym/findings/SourceFiles.hpp"
+#include "tools/vtsym/findings/source/Fingerprints.hpp"
+#include "tools/vtsym/findings/source/ScanRules.hpp"
+#include "tools/vtsym/io/CommandLine.hpp"
+
+#include <algorithm>
+
+namespace vtsym {
+
+namespace {
+
+/// Why a suppression cannot be read; nothing where it can.
+std::optional<std::string> problemOf(const VT::Suppression& suppression) {
+    if (suppression.isMalformed)
+        return "write vtsym: keep, and after a comma the reason";
+    if (!suppression.line)
+        return "there is no condition on its line or the next";
+    for (const std::string& kind : suppression.kinds)
+        if (scanRule(kind) == nullptr)
+            return "there is no kind " + quotedArgument(kind);
+    return std::nullopt;
+}
+
+} // namespace
+
+SourceChecker::SourceChecker(const ScanSettings& settings, const CompileCommands::Problem& problem)
+    : settings_(settings),
+      scanner_({.strictIncludes = settings.strictIncludes, .why = settings.why}),
+      kinds_(settings.kinds.empty() ? kindsOf("--kinds", "usual") : settings.kinds) {
+    for (const std::string& condition : settings.assumptions)
+        if (const auto wrong = scanner_.assume(condition))
+            throw UsageError("--assume", quotedArgument(condition) + " " + *wrong);
+    if (!scanner_.assumptionsCanHold())
+        throw UsageError("--assume", "the conditions contradict each other; leave out some of them");
+    for (const std::string& path : settings.macroFiles) {
+        try {
+            macroFiles_.push_back({path, readFile(path, settings.mostBytes)});
+        } catch (const FileError& error) {
+            throw UsageError("--imacros", path + " " + error.what());
+        }
+    }
+    addOptions(build_);
+    if (settings.compileCommands.empty())
+        return;
+    try {
+        const std::string database = readFile(settings.compileCommands, settings.mostBytes);
+        commands_ = CompileCommands::read(
+            database, [this](VT::BuildMacros& build) { addOptions(build); }, problem);
+    } catch (const FileError& error) {
+        throw UsageError("--compile-commands", settings.compileCommands + " " + error.what());
+    }
+}
+
+/// Adds the macros that options define.
+void SourceChecker::addOptions(VT::BuildMacros& build) const {
+    for (const std::string& definition : settings_.defines) {
+        const std::string name = definition.substr(0, definition.find_first_of("=("));
+        if (std::ranges::find(settings_.undefines, name) != settings_.undefines.end())
+            throw UsageError("-D", quotedArgument(name) + " is undefined by -U too; leave out one of them");
+        if (!build.define(definition))
+            throw UsageError("-D", quotedArgument(definition) + " does not begin with a name; write NAME=VALUE");
+    }
+    for (const std::string& name : settings_.undefines)
+        if (!build.undefine(name))
+            throw UsageError("-U", quotedArgument(name) + " is not a name");
+    for (const MacroFile& file : macroFiles_)
+        build.addFile(file.path, file.text, isCppPath(file.path));
+}
+
+bool SourceChecker::isAsked(const Finding& finding) const {
+    return finding.level >= settings_.severity && std::ranges::find(kinds_, finding.kind) != kinds_.end();
+}
+
+std::vector<FileFinding> SourceChecker::check(const std::string& path, std::string_view text) {
+    VT::SourceFile file{text, isCppPath(path)};
+    if (commands_)
+        file.configurations = commands_->of(path);
+    if (file.configurations.empty() && !build_.empty())
+        file.configurations = {&build_};
+    const std::size_t configurations = std::min(file.configurations.size(), VT::limits::scanConfigurations);
+
+    const std::vector<VT::Suppression> suppressions = VT::readSuppressions(text);
+    std::vector<bool> isUsed(suppressions.size(), false);
+    std::vector<Finding> findings;
+    std::vector<std::optional<VT::SourceEdit>> edits;
+    std::vector<bool> isKept;
+    const auto add = [&](Finding finding, std::optional<VT::SourceEdit> edit, bool isReported) {
+        findings.push_back(std::move(finding));
+        edits.push_back(std::move(edit));
+        isKept.push_back(isReported && isAsked(findings.back()));
+    };
+    const std::uint64_t undecidedBefore = scanner_.counts().undecided;
+    scanner_.scan(file, [&](const VT::BranchFinding& found) {
+        Finding finding = findingOf(path, found, configurations);
+        bool isSuppressed = false;
+        for (std::size_t i = 0; i < suppressions.size(); ++i) {
+            if (!suppressions[i].covers(found.region.line, finding.kind))
+                continue;
+            isUsed[i] = true;
+            isSuppressed = true;
+        }
+        const bool isInEvery = found.configurations.empty() || found.configurations.size() == configurations;
+        add(std::move(finding), found.replaced && isInEvery ? std::optional(found.edit) : std::nullopt, !isSuppressed);
+    });
+    const bool isDecided = scanner_.counts().undecided == undecidedBefore;
+    for (std::size_t i = 0; i < suppressions.size(); ++i) {
+        if (const auto problem = problemOf(suppressions[i]))
+            add(malformedSuppression(path, suppressions[i], *problem), {}, true);
+        else if (!isUsed[i] && isDecided)
+            add(staleSuppression(path, suppressions[i]), {}, true);
+    }
+    addFingerprints(findings); // whatever is asked for
+    std::vector<FileFinding> asked;
+    for (std::size_t i = 0; i < findings.size(); ++i)
+        if (isKept[i])
+            asked.push_back({std::move(findings[i]), std::move(edits[i])});
+    std::ranges::stable_sort(asked, {}, [](const FileFinding& each) { return each.finding.place.line; });
+    return asked;
+}
+
+} // namespace vtsym
