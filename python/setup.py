@@ -22,7 +22,11 @@ class CMakeBuild(build_ext):
         if not (BUILD / "build.ninja").exists():
             subprocess.run(["cmake", "--preset", "python"], cwd=ROOT, check=True)
         subprocess.run(["cmake", "--build", BUILD, "--target", "vtsym_python", "vtsym_program"], check=True)
-        subprocess.run(["cmake", "--install", BUILD, "--component", "python", "--prefix", package, "--strip"], check=True)
+        for component in ("python_module", "python_wheel"):
+            install = ["cmake", "--install", BUILD, "--component", component, "--prefix", package, "--strip"]
+            subprocess.run(install, check=True)
+        for link in filter(Path.is_symlink, list(package.iterdir())):
+            link.resolve().replace(link)  # a wheel has no links: the name that is loaded stays
 
 
 def version() -> str:

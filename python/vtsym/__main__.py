@@ -9,9 +9,9 @@ from typing import NoReturn
 
 
 def main() -> NoReturn:
-    """Becomes the program, with the same arguments."""
+    """Becomes the program, with the same arguments: the one of a wheel, or the installed one."""
     program = Path(__file__).parent / "vtsym"
-    os.execv(program, ["vtsym", *sys.argv[1:]])
+    os.execvp(program if program.exists() else "vtsym", ["vtsym", *sys.argv[1:]])
 
 
 if __name__ == "__main__":
