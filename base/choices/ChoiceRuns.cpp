@@ -44,19 +44,23 @@ std::vector<ChoiceRun> joinedInHalves(SymbolicExprTable& table, std::span<const 
     return runs;
 }
 
-std::vector<std::size_t> choicesNear(const std::vector<ChoiceRun>& runs, const NameRanges& ranges) {
+std::optional<std::vector<std::size_t>> choicesNear(const std::vector<ChoiceRun>& runs, const NameRanges& ranges,
+                                                    std::size_t most,
+                                                    const std::function<bool(std::size_t)>& isWanted) {
     std::vector<std::size_t> near;
     for (std::vector<std::size_t> open{runs.size() - 1}; !open.empty();) {
         const ChoiceRun& run = runs[open.back()];
         open.pop_back();
         if (run.count == 0 || areApart(run.ranges, ranges))
             continue;
-        if (run.isSingle()) {
+        if (!run.isSingle()) {
+            open.push_back(run.left);
+            open.push_back(run.right);
+        } else if (isWanted(run.left)) {
+            if (near.size() == most)
+                return std::nullopt;
             near.push_back(run.left);
-            continue;
         }
-        open.push_back(run.left);
-        open.push_back(run.right);
     }
     std::ranges::sort(near);
     return near;

@@ -3,6 +3,8 @@
 
 #include "base/choices/ChoiceRanges.hpp"
 
+#include <functional>
+#include <optional>
 #include <span>
 #include <vector>
 
@@ -23,7 +25,9 @@ struct ChoiceRun {
 /// to, so the last run is all of them.  Interns one node for each run.
 std::vector<ChoiceRun> joinedInHalves(SymbolicExprTable& table, std::span<const SymbolicExprId> holds);
 
-/// Returns the positions, in ascending order, of the choices that ranges do not show to be apart from these.
-std::vector<std::size_t> choicesNear(const std::vector<ChoiceRun>& runs, const NameRanges& ranges);
+/// Returns the positions, in ascending order, of the wanted choices that ranges do not show to be apart from these;
+/// nothing where there are more than `most`.
+std::optional<std::vector<std::size_t>> choicesNear(const std::vector<ChoiceRun>& runs, const NameRanges& ranges,
+                                                    std::size_t most, const std::function<bool(std::size_t)>& isWanted);
 
 } // namespace VT

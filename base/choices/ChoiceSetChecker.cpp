@@ -38,7 +38,7 @@ ChoiceSetReport ChoiceSetChecker::check(SymbolicExprId parent, std::span<const S
     }
     State::Place place = state.placeIn(parent, choices);
     const SymbolicExprId context = place.context;
-    state.questionSteps = limits::decisionSteps;
+    state.begin(choices.size());
     const Decision parentHolds = state.ask(&Decider::canHold, context);
     report.parentNeverHolds = parentHolds.isNo();
     if (report.parentNeverHolds || choices.empty())
@@ -49,33 +49,42 @@ ChoiceSetReport ChoiceSetChecker::check(SymbolicExprId parent, std::span<const S
     for (std::size_t i = 0; i < choices.size(); ++i)
         if (i != defaultChoice)
             holds[i] = state.both(context, state.toC(choices[i]));
-    std::vector<bool> isDead(choices.size(), false);
-    SymbolicExprId allBefore = table.getIdFALSE();
+    std::vector<SymbolicExprId> conditions(choices.size());
+    std::ranges::transform(choices, conditions.begin(), [&](SymbolicExprId id) { return state.toC(id); });
+    ChoiceBoxes boxes(table, parentHolds.isYes() ? context : invalidId, conditions, state.options.bits32);
+    State::EarlierChoices earlier(choices.size(), table.getIdFALSE());
     std::vector<std::vector<SymbolicExprId>> hiding(policy == ChoicePolicy::First ? choices.size() : 0);
     const std::vector<ChoiceRun> inOrder =
         policy == ChoicePolicy::First ? joinedInHalves(state.table, holds) : std::vector<ChoiceRun>();
     for (std::size_t i = 0; i < choices.size(); ++i) {
         if (i == defaultChoice)
             continue;
-        if (policy == ChoicePolicy::First) {
-            state.placeAfter(place, choices, i, inOrder, isDead, allBefore);
+        Answer isActive = state.counted(boxes, boxes.isFaultless(i)) ? Answer::Yes : Answer::Undecided;
+        if (policy == ChoicePolicy::First && (isActive != Answer::Yes || !state.options.domains.empty())) {
+            state.placeAfter(place, conditions, i, inOrder, earlier);
             hiding[i] = place.earlierHold;
         }
-        const SymbolicExprId condition = state.toC(choices[i]);
-        isDead[i] = !(place.earlierHold.empty() && ordinary.contains(condition)) &&
-                    !state.checkOne(i, place, choices[i], report);
-        if (policy == ChoicePolicy::First && !isDead[i])
-            allBefore = state.service.OR(allBefore, condition, false).id();
-        if (isDead[i])
+        if (isActive != Answer::Yes && place.earlierHold.empty() && ordinary.contains(conditions[i]))
+            isActive = Answer::Yes;
+        if (isActive != Answer::Yes)
+            isActive = state.checkOne(i, place, choices[i], boxes, report);
+        if (isActive == Answer::No) {
+            earlier.isDead[i] = true;
             holds[i] = table.getIdFALSE();
+        } else if (policy == ChoicePolicy::First) {
+            earlier.anyHolds = state.service.OR(earlier.anyHolds, conditions[i], false).id();
+            earlier.isAnyActive = earlier.isAnyActive || isActive == Answer::Yes;
+            boxes.hide(i);
+        }
     }
+    std::vector<bool>& isDead = earlier.isDead;
     const std::vector<ChoiceRun> runs = joinedInHalves(state.table, holds);
-    auto [gap, isExact] = state.findGap(context, runs);
+    auto [gap, isExact] = state.findGap(context, runs, boxes);
     if (defaultChoice)
         state.checkDefault(*defaultChoice, context, runs, gap, report);
     if (policy == ChoicePolicy::Unique) {
         const std::size_t firstOverlap = report.findings.size();
-        state.findOverlaps(runs, holds, report);
+        state.findOverlaps(runs, holds, boxes, report);
         std::sort(report.findings.begin() + static_cast<std::ptrdiff_t>(firstOverlap), report.findings.end(),
                   [](const ChoiceFinding& a, const ChoiceFinding& b) {
                       return std::pair(a.choice, a.other) < std::pair(b.choice, b.other);
@@ -103,10 +112,13 @@ ChoiceSetReport ChoiceSetChecker::checkCondition(SymbolicExprId parent, Symbolic
         return report;
     }
     const State::Place place = state.placeIn(parent, std::span(&condition, 1));
-    state.questionSteps = limits::decisionSteps;
+    state.begin(1);
     report.parentNeverHolds = state.ask(&Decider::canHold, place.context).isNo();
-    if (!report.parentNeverHolds)
-        state.checkOne(0, place, condition, report);
+    if (!report.parentNeverHolds) {
+        const SymbolicExprId inC = state.toC(condition);
+        ChoiceBoxes boxes(state.table, place.context, std::span(&inC, 1), state.options.bits32);
+        state.checkOne(0, place, condition, boxes, report);
+    }
     return report;
 }
 

@@ -19,6 +19,12 @@
 
 namespace VT {
 
+namespace {
+
+const Decision no{Answer::No, DecisionBound::None, std::nullopt}; ///< without a witness
+
+} // namespace
+
 ChoiceSetChecker::State::State(VCService& theService, const ChoiceSetOptions& theOptions)
     : service(theService),
       table(theService.table()),
@@ -35,25 +41,41 @@ ChoiceSetChecker::State::State(VCService& theService, const ChoiceSetOptions& th
     }
 }
 
+/// Begins a set with so many choices.
+void ChoiceSetChecker::State::begin(std::size_t choices) {
+    questionSteps = limits::decisionSteps;
+    setLeft = limits::setSteps + choices * limits::setStepsPerChoice;
+}
+
+void ChoiceSetChecker::State::take(std::uint64_t steps) {
+    stepsLeft -= std::min(stepsLeft, steps);
+    setLeft -= std::min(setLeft, steps);
+}
+
+/// What one question of a set may take.
+std::uint64_t ChoiceSetChecker::State::share() const {
+    return std::min(stepsLeft, std::max(limits::leastSetSteps, setLeft / 8));
+}
+
 Decision ChoiceSetChecker::State::counted(Decision decision) {
-    stepsLeft -= std::min(stepsLeft, decider.stepsTaken() + 1);
+    take(decider.stepsTaken() + 1);
     if (decision.bound == DecisionBound::Steps)
         questionSteps = std::max(questionSteps / 4, limits::furtherSteps);
     return decision;
 }
 
 Decision ChoiceSetChecker::State::ask(Decision (Decider::*question)(SymbolicExprId), SymbolicExprId condition) {
-    if (stepsLeft == 0)
+    if (stepsLeft == 0 || setLeft == 0)
         return {Answer::Undecided, DecisionBound::Steps, std::nullopt};
-    decider.limitSteps(questionSteps);
+    decider.limitSteps(std::min(questionSteps, share()));
     return counted((decider.*question)(condition));
 }
 
 Decision ChoiceSetChecker::State::ask(Decision (Decider::*question)(SymbolicExprId, SymbolicExprId), SymbolicExprId a,
                                       SymbolicExprId b) {
-    if (stepsLeft == 0)
+    if (stepsLeft == 0 || setLeft == 0)
         return {Answer::Undecided, DecisionBound::Steps, std::nullopt};
-    decider.limitSteps(questionSteps);
+    decider.limitSteps(std::min(questionSteps, share()));
     return counted((decider.*question)(a, b));
 }
 
@@ -86,25 +108,21 @@ ChoiceSetChecker::State::Place ChoiceSetChecker::State::placeIn(SymbolicExprId p
 }
 
 /// Adds the choices that come before one and may hide it.
-void ChoiceSetChecker::State::placeAfter(Place& place, std::span<const SymbolicExprId> choices, std::size_t position,
-                                         const std::vector<ChoiceRun>& runs, const std::vector<bool>& isDead,
-                                         SymbolicExprId allBefore) {
-    const auto ranges = rangesOf(table, both(place.context, toC(choices[position])));
+void ChoiceSetChecker::State::placeAfter(Place& place, std::span<const SymbolicExprId> conditions, std::size_t position,
+                                         const std::vector<ChoiceRun>& runs, const EarlierChoices& earlier) {
+    const auto ranges = rangesOf(table, both(place.context, conditions[position]));
+    const auto near = choicesNear(runs, ranges, limits::hidingChoices,
+                                  [&](std::size_t choice) { return choice < position && !earlier.isDead[choice]; });
+    place.isHidden = earlier.isAnyActive;
     place.earlier.clear();
     place.earlierHold.clear();
-    for (const std::size_t near : choicesNear(runs, ranges)) {
-        if (near >= position)
-            break;
-        if (isDead[near])
-            continue;
-        place.earlier.push_back(near);
-        place.earlierHold.push_back(toC(choices[near]));
-        if (place.earlier.size() > limits::hidingChoices) {
-            place.earlier.clear();
-            place.earlierHold.assign(1, allBefore);
-            return;
-        }
+    if (!near) {
+        place.earlierHold.assign(1, earlier.anyHolds);
+        return;
     }
+    place.earlier = *near;
+    for (const std::size_t choice : *near)
+        place.earlierHold.push_back(conditions[choice]);
 }
 
 /// The condition without operands that its context makes redundant; itself where there are none.
@@ -114,11 +132,11 @@ SymbolicExprId ChoiceSetChecker::State::shorten(SymbolicExprId context, Symbolic
         return condition;
     // Literals are taken from a context that is not large.
     const SymbolicExprId literals = operandsOf(context) > limits::choiceOperands ? table.getIdTRUE() : context;
-    ConditionProofs proofs(decider, toC, condition, context, true, std::min(stepsLeft, limits::shortenSteps));
+    ConditionProofs proofs(decider, toC, condition, context, true, std::min(share(), limits::shortenSteps));
     const auto isEqual = [&](SymbolicExprId candidate) { return proofs.isEqual(candidate); };
     const SymbolicExprId shorter =
         ImpliedCondition(table, service.simplifier().printer(), literals, isEqual).shorten(condition);
-    stepsLeft -= std::min(stepsLeft, proofs.stepsTaken());
+    take(proofs.stepsTaken());
     return operandsOf(shorter) < operands ? shorter : condition;
 }
 
@@ -167,15 +185,25 @@ OrdinaryChoices ChoiceSetChecker::State::ordinaryIn(SymbolicExprId context) {
 
 /// Why a choice is dead: choices that hide it, or operands that contradict each other.
 void ChoiceSetChecker::State::findHiding(ChoiceFinding& finding, const Place& place, SymbolicExprId condition,
-                                         SymbolicExprId holds) {
+                                         SymbolicExprId holds, ChoiceBoxes& boxes) {
     std::vector<SymbolicExprId> premises = place.premises;
     premises.push_back(condition);
-    if (place.earlierHold.empty() || !ask(&Decider::canHold, holds).isYes()) {
+    if (place.earlierHold.empty() || !isActiveAlone(finding.choice, holds, boxes)) {
         finding.reasons = reasonsBy([&](ReasonSearch& search) { return search.whyNever(premises); });
         return;
     }
     std::vector<SymbolicExprId> some;
+    std::vector<std::size_t> earlier;
     const auto subset = minimalSubset(place.earlierHold.size(), [&](std::span<const std::size_t> positions) {
+        earlier.clear();
+        for (const std::size_t at : positions)
+            if (!place.earlier.empty())
+                earlier.push_back(place.earlier[at]);
+        const Answer shows =
+            counted(boxes, earlier.size() == positions.size() ? boxes.isActiveWithout(finding.choice, earlier)
+                                                              : Answer::Undecided);
+        if (shows != Answer::Undecided)
+            return shows == Answer::No ? Answer::Yes : Answer::No;
         some.clear();
         for (const std::size_t at : positions)
             some.push_back(place.earlierHold[at]);
@@ -191,32 +219,53 @@ void ChoiceSetChecker::State::findHiding(ChoiceFinding& finding, const Place& pl
     finding.reasons = reasonsBy([&](ReasonSearch& search) { return search.whyImplied(premises, hiding); });
 }
 
-/// Checks a choice by itself; false where it is dead.
-bool ChoiceSetChecker::State::checkOne(std::size_t position, const Place& place, SymbolicExprId condition,
-                                       ChoiceSetReport& report) {
+/// Whether a choice is active where those before it do not count.
+bool ChoiceSetChecker::State::isActiveAlone(std::size_t position, SymbolicExprId holds, ChoiceBoxes& boxes) {
+    const Answer seen = counted(boxes, boxes.isActiveWithout(position, {}));
+    return seen == Answer::Yes || (seen == Answer::Undecided && ask(&Decider::canHold, holds).isYes());
+}
+
+/// Whether a choice is active where those before it do not count, and at first by values for which it holds at all.
+Decision ChoiceSetChecker::State::findActive(const Place& place, SymbolicExprId holds, SymbolicExprId left) {
+    if (place.earlierHold.empty() || !place.earlier.empty())
+        return ask(&Decider::canHold, both(holds, left));
+    Decision alone = ask(&Decider::canHold, holds);
+    if (!alone.isYes() || (alone.witness && decider.holds(left, *alone.witness).value_or(false)))
+        return alone;
+    return ask(&Decider::canHold, both(holds, left));
+}
+
+/// Checks a choice by itself; whether it can be active.
+Answer ChoiceSetChecker::State::checkOne(std::size_t position, const Place& place, SymbolicExprId condition,
+                                         ChoiceBoxes& boxes, ChoiceSetReport& report) {
     const SymbolicExprId holds = both(place.context, toC(condition));
     const SymbolicExprId left =
         place.earlierHold.empty()
             ? table.getIdTRUE()
             : makeUnary(table, SymbolicOp::Not, makeChain(table, SymbolicOp::Or, place.earlierHold));
-    Decision active = ask(&Decider::canHold, both(holds, left));
+    const bool isHidden = !place.earlierHold.empty() && counted(boxes, boxes.isActive(position)) == Answer::No;
+    Decision active = isHidden ? no : findActive(place, holds, left);
     if (!active.isYes()) {
-        const bool isDead = active.isNo();
+        const Answer answer = active.answer;
         ChoiceFinding finding{.fault = ChoiceFault::Dead, .choice = position};
-        if (isDead)
-            findHiding(finding, place, condition, holds);
+        if (active.isNo())
+            findHiding(finding, place, condition, holds, boxes);
         add(std::move(finding), std::move(active), report);
-        return !isDead;
+        return answer;
     }
-    Decision always = ask(&Decider::implies, place.context, both(toC(condition), left));
+    // An earlier choice that is active somewhere hides it there.
+    Decision always = place.isHidden ? no : ask(&Decider::implies, place.context, both(toC(condition), left));
     if (!always.isNo()) {
         always.witness = std::move(active.witness);
         ChoiceFinding finding{.fault = ChoiceFault::AlwaysActive, .choice = position};
         finding.reasons = reasonsBy([&](ReasonSearch& search) { return search.whyImplied(place.premises, condition); });
         add(std::move(finding), std::move(always), report);
-        return true;
+        return Answer::Yes;
     }
-    if (const SymbolicExprId shorter = shorten(both(place.context, left), condition); shorter != condition) {
+    // Many earlier choices are left out, as their proofs would take more than the finding is worth.
+    const bool isCrowded = place.earlier.empty() && !place.earlierHold.empty();
+    const SymbolicExprId around = isCrowded ? place.context : both(place.context, left);
+    if (const SymbolicExprId shorter = shorten(around, condition); shorter != condition) {
         ChoiceFinding finding{.fault = ChoiceFault::Redundant, .choice = position, .proposed = shorter};
         finding.reasons = reasonsBy([&](ReasonSearch& search) {
             std::vector<SymbolicExprId> premises = place.premises;
@@ -226,7 +275,7 @@ bool ChoiceSetChecker::State::checkOne(std::size_t position, const Place& place,
         });
         add(std::move(finding), std::move(active), report);
     }
-    return true;
+    return Answer::Yes;
 }
 
 void ChoiceSetChecker::State::reportOverlap(std::size_t first, std::size_t second, Decision decision,
@@ -243,8 +292,26 @@ void ChoiceSetChecker::State::reportOverlap(std::size_t first, std::size_t secon
     report.findings.push_back(std::move(finding));
 }
 
+/// Whether some choice of a run overlaps one of another.  Undecided where that is cheaper to see from their halves.
+Decision ChoiceSetChecker::State::overlapOf(const ChoiceRun& a, const ChoiceRun& b, ChoiceBoxes& boxes) {
+    if (a.isSingle() && b.isSingle()) {
+        if (counted(boxes, boxes.overlap(a.left, b.left)) == Answer::No)
+            return no;
+        return ask(&Decider::overlaps, a.holds, b.holds);
+    }
+    if (setLeft == 0)
+        return {Answer::Undecided, DecisionBound::Steps, std::nullopt};
+    const std::size_t count = a.count + b.count;
+    if (boxes.areKnown() && count <= limits::overlapRun)
+        return {};
+    decider.limitSteps(std::min(share(), boxes.areKnown() ? count * limits::overlapSteps : questionSteps));
+    Decision decision = decider.overlaps(a.holds, b.holds);
+    take(decider.stepsTaken() + 1);
+    return decision;
+}
+
 void ChoiceSetChecker::State::findOverlaps(const std::vector<ChoiceRun>& runs, std::span<const SymbolicExprId> holds,
-                                           ChoiceSetReport& report) {
+                                           ChoiceBoxes& boxes, ChoiceSetReport& report) {
     std::size_t reported = 0;
     std::vector<std::pair<std::size_t, std::size_t>> open;
     // Small runs come first, so that larger ones are decided from theirs.
@@ -256,10 +323,10 @@ void ChoiceSetChecker::State::findOverlaps(const std::vector<ChoiceRun>& runs, s
             open.pop_back();
             if (areApart(runs[a].ranges, runs[b].ranges))
                 continue;
-            Decision both = ask(&Decider::overlaps, runs[a].holds, runs[b].holds);
+            Decision both = overlapOf(runs[a], runs[b], boxes);
             if (both.isNo())
                 continue;
-            if (reported == options.overlaps || stepsLeft == 0) {
+            if (reported == options.overlaps || stepsLeft == 0 || setLeft == 0) {
                 report.allOverlaps = false;
                 return;
             }
@@ -279,8 +346,14 @@ void ChoiceSetChecker::State::findOverlaps(const std::vector<ChoiceRun>& runs, s
 /// Whether the parent can be active where no choice is.  The price of an exact answer grows with the names in the
 /// conditions; when it is too high, values beyond all ranges may still show that there is a gap.
 ChoiceSetChecker::State::Gap ChoiceSetChecker::State::findGap(SymbolicExprId context,
-                                                              const std::vector<ChoiceRun>& runs) {
+                                                              const std::vector<ChoiceRun>& runs, ChoiceBoxes& boxes) {
     const ChoiceRun& all = runs.back();
+    std::vector<std::size_t> choices;
+    for (const ChoiceRun& run : runs)
+        if (run.count == 1)
+            choices.push_back(run.left);
+    if (counted(boxes, boxes.isGap(choices)) == Answer::No)
+        return {no, true};
     Decision gap = ask(&Decider::implies, context, all.holds).opposite();
     if (!gap.isUndecided())
         return {std::move(gap), true};

@@ -2,6 +2,7 @@
 #pragma once
 
 #include "base/choices/AssignmentCounter.hpp"
+#include "base/choices/ChoiceBoxes.hpp"
 #include "base/choices/ChoiceMerges.hpp"
 #include "base/choices/ChoiceRuns.hpp"
 #include "base/choices/ChoiceSetChecker.hpp"
@@ -24,23 +25,48 @@ struct ChoiceSetChecker::State {
         std::vector<SymbolicExprId> premises;         ///< the same, as written
         std::vector<SymbolicExprId> earlierHold = {}; ///< what may hide it, in C shape
         std::vector<std::size_t> earlier = {};        ///< the choices that it is; none where they are too many
+        bool isHidden = false;                        ///< an earlier choice is active somewhere
+    };
+
+    /// The choices of a set that come before one.
+    struct EarlierChoices {
+        EarlierChoices(std::size_t choices, SymbolicExprId none) : isDead(choices, false), anyHolds(none) {}
+
+        std::vector<bool> isDead; ///< by choice
+        SymbolicExprId anyHolds;  ///< where one of them does
+        bool isAnyActive = false; ///< one of them is active somewhere
     };
 
     Decision ask(Decision (Decider::*question)(SymbolicExprId), SymbolicExprId condition);
     Decision ask(Decision (Decider::*question)(SymbolicExprId, SymbolicExprId), SymbolicExprId a, SymbolicExprId b);
+    void begin(std::size_t choices);
+    void take(std::uint64_t steps);
+    [[nodiscard]] std::uint64_t share() const;
     Decision counted(Decision decision);
+
+    /// An answer from boxes, whose steps count.
+    template <class Result>
+    Result counted(ChoiceBoxes& boxes, Result result) {
+        take(boxes.takeSteps());
+        return result;
+    }
+
     [[nodiscard]] std::size_t operandsOf(SymbolicExprId condition) const;
     static void add(ChoiceFinding finding, Decision decision, ChoiceSetReport& report);
 
     SymbolicExprId both(SymbolicExprId a, SymbolicExprId b);
     Place placeIn(SymbolicExprId parent, std::span<const SymbolicExprId> conditions);
-    void placeAfter(Place& place, std::span<const SymbolicExprId> choices, std::size_t position,
-                    const std::vector<ChoiceRun>& runs, const std::vector<bool>& isDead, SymbolicExprId allBefore);
-    bool checkOne(std::size_t position, const Place& place, SymbolicExprId condition, ChoiceSetReport& report);
+    void placeAfter(Place& place, std::span<const SymbolicExprId> conditions, std::size_t position,
+                    const std::vector<ChoiceRun>& runs, const EarlierChoices& earlier);
+    Answer checkOne(std::size_t position, const Place& place, SymbolicExprId condition, ChoiceBoxes& boxes,
+                    ChoiceSetReport& report);
     OrdinaryChoices ordinaryIn(SymbolicExprId context);
     void checkDefault(std::size_t position, SymbolicExprId context, const std::vector<ChoiceRun>& runs,
                       const Decision& gap, ChoiceSetReport& report);
-    void findHiding(ChoiceFinding& finding, const Place& place, SymbolicExprId condition, SymbolicExprId holds);
+    void findHiding(ChoiceFinding& finding, const Place& place, SymbolicExprId condition, SymbolicExprId holds,
+                    ChoiceBoxes& boxes);
+    Decision findActive(const Place& place, SymbolicExprId holds, SymbolicExprId left);
+    bool isActiveAlone(std::size_t position, SymbolicExprId holds, ChoiceBoxes& boxes);
     template <class Search>
     Reasons reasonsBy(Search search);
     SymbolicExprId shorten(SymbolicExprId context, SymbolicExprId condition);
@@ -50,8 +76,9 @@ struct ChoiceSetChecker::State {
         bool isExact;      ///< it was decided for all choices at once
     };
 
-    Gap findGap(SymbolicExprId context, const std::vector<ChoiceRun>& runs);
-    void findOverlaps(const std::vector<ChoiceRun>& runs, std::span<const SymbolicExprId> holds,
+    Gap findGap(SymbolicExprId context, const std::vector<ChoiceRun>& runs, ChoiceBoxes& boxes);
+    Decision overlapOf(const ChoiceRun& a, const ChoiceRun& b, ChoiceBoxes& boxes);
+    void findOverlaps(const std::vector<ChoiceRun>& runs, std::span<const SymbolicExprId> holds, ChoiceBoxes& boxes,
                       ChoiceSetReport& report);
     void reportOverlap(std::size_t first, std::size_t second, Decision decision, std::span<const SymbolicExprId> holds,
                        ChoiceSetReport& report);
@@ -77,6 +104,7 @@ struct ChoiceSetChecker::State {
     ChoiceSetOptions options;
     std::vector<SymbolicExprId> assumed; ///< by the service, in C shape
     std::uint64_t stepsLeft;
+    std::uint64_t setLeft = limits::setSteps;            ///< of the set that is being checked
     std::uint64_t questionSteps = limits::decisionSteps; ///< a quarter after each question of a set that gives up
 };
 

@@ -197,6 +197,29 @@ inline constexpr std::size_t choiceOverlaps = 1000;
 /// condition has no ranges, so that it is compared with every other choice.
 inline constexpr std::size_t rangeOperands = 64;
 
+/// Names that the choices of a set compare with integers, up to which questions about them are answered by boxes.
+/// Steps of all such questions about a set, each a comparison of a box with a part of the values, and those that one of
+/// them may take in any case.  Beyond these bounds a decision answers.
+inline constexpr std::size_t boxAtoms = 64;
+inline constexpr std::uint64_t boxSteps = std::uint64_t{1} << 22U;
+inline constexpr std::uint64_t leastBoxSteps = std::uint64_t{1} << 11U;
+
+/// Values found before that are tried first where boxes are to leave some out, and how often each moves out of a box.
+inline constexpr std::size_t recentPoints = 4;
+inline constexpr std::size_t boxMoves = 12;
+
+/// Steps that the checks of one choice set may cost: a number for each set and one for each choice, about a second for
+/// five thousand.  A question takes an eighth of what is left at most, and so many in any case.  Beyond the bound what
+/// is left is undecided.
+inline constexpr std::uint64_t setSteps = std::uint64_t{1} << 22U;
+inline constexpr std::uint64_t setStepsPerChoice = std::uint64_t{1} << 10U;
+inline constexpr std::uint64_t leastSetSteps = std::uint64_t{1} << 10U;
+
+/// Choices of two runs that are compared pair by pair where boxes answer, and steps of a decision about larger runs for
+/// each choice in them.  Beyond the steps their halves are looked at.
+inline constexpr std::size_t overlapRun = 32;
+inline constexpr std::uint64_t overlapSteps = 64;
+
 /// Operands of a choice's condition up to which a redundant one is looked for.
 inline constexpr std::size_t choiceOperands = 64;
 

@@ -1,0 +1,274 @@
+// Reads choices as unions of boxes, and answers from them.
+//
+// Method: an operand that compares one name with integers becomes a set of them, an And a box, an Or of Ands a list of
+// boxes within the context.  BoxUnion finds points that boxes leave out.
+// Cost: linear in the operands to read; all questions together limits::boxSteps, beyond which each takes a few.
+#include "base/choices/ChoiceBoxes.hpp"
+
+#include "base/core/Chains.hpp"
+#include "base/core/Limits.hpp"
+#include "base/core/Nodes.hpp"
+#include "base/core/Walk.hpp"
+#include "base/transform/Symbols.hpp"
+#include "base/variants/VariantKeywords.hpp"
+
+#include <algorithm>
+#include <limits>
+#include <utility>
+
+namespace VT {
+
+namespace {
+
+std::optional<int> integerOf(const SymbolicExprTable& table, SymbolicExprId id) {
+    const SymbolicExpr* const node = table.has(id) ? table.get(id) : nullptr;
+    if (node == nullptr || node->op() != SymbolicOp::IntValue)
+        return std::nullopt;
+    return static_cast<const SymbolicIntValue*>(node)->getValue();
+}
+
+/// Whether a node is a name of an integer.
+bool isName(const SymbolicExprTable& table, SymbolicExprId id) {
+    const SymbolicExpr* const node = table.has(id) ? table.get(id) : nullptr;
+    return node != nullptr && node->op() == SymbolicOp::String && id != table.getIdTRUE() && id != table.getIdFALSE() &&
+           !VariantKeywords::isVariantKeyword(static_cast<const SymbolicString*>(node)->getName(), false);
+}
+
+/// The operands of a chain; nothing where one is missing or there are more than are looked at.
+std::optional<std::vector<SymbolicExprId>> operandsOf(const SymbolicExprTable& table, SymbolicExprId chain,
+                                                      SymbolicOp op, std::size_t most) {
+    std::vector<SymbolicExprId> operands;
+    const bool isComplete = walkChain(
+        table, chain, most, [op](SymbolicExprId, const SymbolicExpr& node) { return node.op() == op; },
+        [&](SymbolicExprId id, const SymbolicExpr* node) {
+            operands.push_back(id);
+            return node != nullptr;
+        });
+    return isComplete ? std::optional(std::move(operands)) : std::nullopt;
+}
+
+} // namespace
+
+ChoiceBoxes::ChoiceBoxes(const SymbolicExprTable& table, SymbolicExprId context,
+                         std::span<const SymbolicExprId> choices, bool bits32)
+    : table_(table) {
+    for (const SymbolicExprId choice : choices)
+        areAllRead_ = forms_.emplace_back(formOf(choice)).has_value() && areAllRead_;
+    atomCount_ = atoms_.size();
+    isUsable_ = atomCount_ <= limits::boxAtoms && readContext(context);
+    if (!isUsable_)
+        return;
+    constexpr std::int64_t least = std::numeric_limits<std::int32_t>::min();
+    constexpr std::int64_t most = std::numeric_limits<std::int32_t>::max();
+    for (Atom atom = 0; bits32 && atom < atomCount_; ++atom)
+        isUsable_ = context_.restrict(atom, IntegerSet(least, most)) && isUsable_;
+    for (std::optional<Form>& form : forms_) {
+        if (!form)
+            continue;
+        for (Product& product : *form) {
+            product.box = context_;
+            for (const Operand& operand : product.operands)
+                product.isEmpty = product.isEmpty || !product.box.restrict(operand.allows.atom, operand.allows.set);
+        }
+    }
+    hiding_.emplace(atomCount_);
+    none_.emplace(atomCount_);
+}
+
+Atom ChoiceBoxes::atomOf(SymbolicExprId name) {
+    if (const Atom* const atom = atoms_.find(name))
+        return *atom;
+    return atoms_.insert(name, static_cast<Atom>(atoms_.size()));
+}
+
+/// What an operand that compares one name with integers allows.
+std::optional<Constraint> ChoiceBoxes::constraintOf(SymbolicExprId operand) {
+    const auto ofComparison = [&](const SymbolicExpr& node) -> std::optional<Constraint> {
+        const OperatorInfo& row = operatorInfo(node.op());
+        const bool isMirrored = isName(table_, node.getInput(1));
+        const SymbolicExprId name = node.getInput(isMirrored ? 1 : 0);
+        const std::optional<int> value = integerOf(table_, node.getInput(isMirrored ? 0 : 1));
+        if (!value || !isName(table_, name))
+            return std::nullopt;
+        return Constraint{atomOf(name), IntegerSet::satisfying(isMirrored ? row.mirrored : row.op, *value)};
+    };
+    const auto ofOperand = [&](const SymbolicExpr& node, std::size_t position) -> const Constraint* {
+        const auto* const found = constraints_.find(node.getInput(position));
+        return found != nullptr && *found ? &**found : nullptr;
+    };
+    const auto ofNode = [&](SymbolicExprId id, const SymbolicExpr& node) -> std::optional<Constraint> {
+        if (comparisonOps.contains(node.op()))
+            return ofComparison(node);
+        if (isName(table_, id))
+            return Constraint{atomOf(id), IntegerSet::allBut(0)};
+        const bool isOr = node.op() == SymbolicOp::Or;
+        if (node.op() != SymbolicOp::Not && node.op() != SymbolicOp::And && !isOr)
+            return std::nullopt;
+        const Constraint* const first = ofOperand(node, 0);
+        if (first == nullptr || node.op() == SymbolicOp::Not)
+            return first == nullptr ? std::nullopt : std::optional(Constraint{first->atom, first->set.complement()});
+        const Constraint* const second = ofOperand(node, 1);
+        if (second == nullptr || second->atom != first->atom)
+            return std::nullopt;
+        return Constraint{first->atom, isOr ? first->set.unite(second->set) : first->set.intersect(second->set)};
+    };
+    std::vector<WalkFrame> stack;
+    walkUnknown(
+        table_, operand, stack,
+        [&](SymbolicExprId id, const SymbolicExpr*) { return constraints_.find(id) != nullptr; },
+        [&](SymbolicExprId id, const SymbolicExpr& node, const SymbolicExpr*) {
+            constraints_.insert(id, ofNode(id, node));
+        },
+        [](SymbolicExprId, const SymbolicExpr*) {});
+    const auto* const found = constraints_.find(operand);
+    return found != nullptr ? *found : std::nullopt;
+}
+
+std::optional<ChoiceBoxes::Operand> ChoiceBoxes::operandOf(SymbolicExprId operand) {
+    auto allows = constraintOf(operand);
+    if (!allows)
+        return std::nullopt;
+    Operand result{std::move(*allows)};
+    const auto parts = operandsOf(table_, operand, SymbolicOp::Or, limits::rangeOperands);
+    if (!parts || parts->size() < 2)
+        return parts ? std::optional(std::move(result)) : std::nullopt;
+    for (const SymbolicExprId left : *parts) {
+        if (table_.get(left)->op() == SymbolicOp::And)
+            return std::nullopt;
+        IntegerSet others;
+        for (const SymbolicExprId part : *parts)
+            if (part != left)
+                others = others.unite(constraintOf(part)->set);
+        result.shorter.push_back(std::move(others));
+    }
+    return result;
+}
+
+std::optional<ChoiceBoxes::Form> ChoiceBoxes::formOf(SymbolicExprId choice) {
+    const auto products = operandsOf(table_, choice, SymbolicOp::Or, limits::rangeOperands);
+    if (!products)
+        return std::nullopt;
+    Form form;
+    std::size_t count = 0;
+    for (const SymbolicExprId product : *products) {
+        const auto operands = operandsOf(table_, product, SymbolicOp::And, limits::rangeOperands);
+        if (!operands || (count += operands->size()) > limits::rangeOperands)
+            return std::nullopt;
+        form.emplace_back();
+        for (const SymbolicExprId operand : *operands) {
+            if (operand == table_.getIdTRUE())
+                continue;
+            auto read = operandOf(operand);
+            if (!read)
+                return std::nullopt;
+            form.back().operands.push_back(std::move(*read));
+        }
+    }
+    return form;
+}
+
+/// Reads the operands of the context that compare one name with integers; false where another one has a name in common
+/// with a choice, or with such an operand.
+bool ChoiceBoxes::readContext(SymbolicExprId context) {
+    const auto operands = operandsOf(table_, context, SymbolicOp::And, limits::reasonOperands);
+    if (!operands)
+        return false;
+    std::vector<SymbolicExprId> others;
+    for (const SymbolicExprId operand : *operands) {
+        if (operand == table_.getIdTRUE())
+            continue;
+        const std::optional<Constraint> allows = constraintOf(operand);
+        if (!allows)
+            others.push_back(operand);
+        else if (allows->atom < atomCount_ && !context_.restrict(allows->atom, allows->set))
+            return false;
+    }
+    std::vector<SymbolicExprId> names;
+    SymbolsOfSymbolicExpr symbols(table_);
+    for (const SymbolicExprId other : others)
+        symbols.getSymbolIds(other, names);
+    return std::ranges::none_of(names, [&](SymbolicExprId name) {
+        const Atom* const atom = atoms_.find(name);
+        return atom != nullptr && *atom < atomCount_;
+    });
+}
+
+std::vector<Cube> ChoiceBoxes::boxesOf(std::size_t choice) const {
+    std::vector<Cube> boxes;
+    for (const Product& product : *forms_[choice])
+        if (!product.isEmpty)
+            boxes.push_back(product.box);
+    return boxes;
+}
+
+Answer ChoiceBoxes::overlap(std::size_t a, std::size_t b) const {
+    if (!isKnown(a) || !isKnown(b))
+        return Answer::Undecided;
+    for (const Product& first : *forms_[a])
+        for (const Product& second : *forms_[b])
+            if (!first.isEmpty && !second.isEmpty && first.box.intersects(second.box))
+                return Answer::Yes;
+    return Answer::No;
+}
+
+/// Looks for a point of a region that is in none of some boxes.
+BoxGap ChoiceBoxes::ask(BoxUnion& boxes, const Cube& region, std::span<const Cube> further) {
+    const std::uint64_t most = std::max(limits::leastBoxSteps, left_ / 16);
+    std::uint64_t left = most;
+    BoxGap gap = boxes.gap(region, further, left);
+    steps_ += most - left;
+    left_ -= std::min(left_, most - left);
+    return gap;
+}
+
+/// Whether a choice is active where none of some boxes is.
+Answer ChoiceBoxes::leaves(std::size_t choice, BoxUnion& boxes, std::span<const Cube> further) {
+    Answer answer = Answer::No;
+    for (const Cube& box : boxesOf(choice)) {
+        const Answer gap = ask(boxes, box, further).answer;
+        if (gap == Answer::Yes)
+            return gap;
+        answer = gap == Answer::Undecided ? gap : answer;
+    }
+    return answer;
+}
+
+Answer ChoiceBoxes::isActiveWithout(std::size_t choice, std::span<const std::size_t> others) {
+    std::vector<Cube> boxes;
+    for (const std::size_t other : others) {
+        if (!isKnown(other))
+            return Answer::Undecided;
+        const std::vector<Cube> ofOther = boxesOf(other);
+        boxes.insert(boxes.end(), ofOther.begin(), ofOther.end());
+    }
+    return isKnown(choice) ? leaves(choice, *none_, boxes) : Answer::Undecided;
+}
+
+Answer ChoiceBoxes::isGap(std::span<const std::size_t> choices) {
+    if (!isUsable_ || !std::ranges::all_of(choices, [&](std::size_t choice) { return isKnown(choice); }))
+        return Answer::Undecided;
+    BoxUnion all(atomCount_);
+    for (const std::size_t choice : choices)
+        for (const Cube& box : boxesOf(choice))
+            all.add(box);
+    return ask(all, context_, {}).answer;
+}
+
+void ChoiceBoxes::hide(std::size_t choice) {
+    if (!isKnown(choice)) {
+        areHidingKnown_ = false;
+        return;
+    }
+    for (const Cube& box : boxesOf(choice))
+        hiding_->add(box);
+}
+
+Answer ChoiceBoxes::isActive(std::size_t choice) {
+    return isKnown(choice) && areHidingKnown_ ? leaves(choice, *hiding_, {}) : Answer::Undecided;
+}
+
+std::uint64_t ChoiceBoxes::takeSteps() {
+    return std::exchange(steps_, 0);
+}
+
+} // namespace VT
