@@ -101,7 +101,7 @@ public:
 private:
     template <class Part, class... Fields>
     Part* make(const Fields&... fields) {
-        static_assert(std::is_trivially_destructible_v<Part> && alignof(Part) <= alignof(void*));
+        static_assert(std::is_trivially_destructible_v<Part> && alignof(Part) <= Arena::alignment);
         return new (arena_.allocate(sizeof(Part))) Part{fields...};
     }
 

@@ -105,7 +105,7 @@ std::vector<ChoiceMerge> ChoiceMerges::find(std::span<const SymbolicExprId> choi
             for (const std::size_t choice : members)
                 ranges.push_back(rangesOf(table_, says(choice)));
             const std::vector<std::size_t> byRange = sortedByRange(ranges);
-            std::ranges::transform(byRange, sorted.begin(), [&](std::size_t at) { return members[at]; });
+            std::ranges::transform(byRange, sorted.begin(), [&all = members](std::size_t at) { return all[at]; });
         }
         std::erase_if(sorted, [&](std::size_t choice) { return isMerged[choice]; });
         for (std::size_t i = 0; i < sorted.size();) {

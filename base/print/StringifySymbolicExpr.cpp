@@ -191,8 +191,8 @@ void StringifySymbolicExpr::replaceOperands(std::size_t count, Build build) {
 
 Text StringifySymbolicExpr::integer(int value) {
     std::array<char, std::numeric_limits<int>::digits10 + 3> digits{};
-    const auto end = std::to_chars(digits.data(), digits.data() + digits.size(), value).ptr;
-    return texts_.bytes({digits.data(), end});
+    const char* const end = std::to_chars(digits.data(), digits.data() + digits.size(), value).ptr;
+    return texts_.bytes({digits.data(), static_cast<std::size_t>(end - digits.data())});
 }
 
 void StringifySymbolicExpr::appendInteger(int value) {

@@ -130,7 +130,7 @@ void TextPool::throwTooLong() {
 }
 
 Text TextPool::bytes(std::string_view bytes) {
-    const std::size_t position = bytes_.size();
+    const std::uint64_t position = bytes_.size();
     if (bytes.size() > headBytes)
         std::memcpy(bytes_.extend(bytes.size()), bytes.data(), bytes.size());
     Record& run = add();

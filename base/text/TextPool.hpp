@@ -95,7 +95,9 @@ private:
         Bracket close;
         Separator separator;
 
-        [[nodiscard]] std::size_t position() const noexcept { return first | static_cast<std::size_t>(second) << 32U; }
+        [[nodiscard]] std::size_t position() const noexcept {
+            return static_cast<std::size_t>(first | static_cast<std::uint64_t>(second) << 32U);
+        }
     };
 
     struct Pending {

@@ -10,6 +10,9 @@ namespace VT {
 /// Hands out storage from chunks that it frees together.  Never moves what it handed out.
 class Arena {
 public:
+    /// Of every storage: enough for pointers and for numbers of 64 bits.
+    static constexpr std::size_t alignment = alignof(std::max_align_t) < 8 ? alignof(std::max_align_t) : 8;
+
     /// Uninitialised storage for an object no more aligned than a pointer.  Throws std::bad_alloc.
     void* allocate(std::size_t bytes) {
         bytes = (bytes + alignment - 1) & ~(alignment - 1);
@@ -28,7 +31,6 @@ public:
     }
 
 private:
-    static constexpr std::size_t alignment = alignof(void*);
     static constexpr std::size_t firstChunk = std::size_t{1} << 12U;
     static constexpr std::size_t lastChunkSize = std::size_t{1} << 20U;
 

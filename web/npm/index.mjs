@@ -1,0 +1,7 @@
+// The engine with the compiled module of this package.
+import createModule from './engine.cjs';
+import { openWith, VtsymError } from './vtsym.mjs';
+
+export { VtsymError };
+
+export const open = () => openWith(createModule);
