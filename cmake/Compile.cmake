@@ -23,7 +23,7 @@ if(CMAKE_CXX_COMPILER_ID STREQUAL GNU)
   if(CMAKE_CXX_COMPILER_VERSION VERSION_LESS 13)
     # False alarms inside std::string and Boost.Container once they are inlined; the sanitizers see the real ones.
     target_compile_options(vtsym_options INTERFACE -Wno-restrict -Wno-stringop-overflow -Wno-stringop-overread
-      $<$<BOOL:${CMAKE_UNITY_BUILD}>:-Wno-array-bounds>)
+      -Wno-array-bounds)
   endif()
 endif()
 if(VTSYM_WERROR)
