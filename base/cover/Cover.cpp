@@ -96,20 +96,33 @@ CoverBudget searchBudget(const Cover& cover) noexcept {
     return {limits::coverSteps + limits::coverStepsPerLiteral * comparisons(cover)};
 }
 
+namespace {
+
+void join(Cover& cover) {
+    while (joinCubes(cover) || absorb(cover)) {
+    }
+}
+
+} // namespace
+
 bool reduce(Cover& cover, CoverBudget& budget) {
-    const auto join = [](Cover& sum) {
-        while (joinCubes(sum) || absorb(sum)) {
-        }
-    };
     join(cover);
+    return reduceJoined(cover, budget);
+}
+
+bool reduceJoined(Cover& cover, CoverBudget& budget) {
     if (budget.exhausted())
         return false;
+    if (cover.size() < 2)
+        return true;
     Cover smaller = cover;
-    while (dropComparisons(smaller, budget) || dropCubes(smaller, budget))
+    bool any = false;
+    for (; dropComparisons(smaller, budget) || dropCubes(smaller, budget); any = true)
         join(smaller);
     if (budget.exhausted())
         return false;
-    cover = std::move(smaller);
+    if (any)
+        cover = std::move(smaller);
     return true;
 }
 

@@ -29,7 +29,7 @@ std::size_t hash_value(const Constraint& constraint) noexcept;
 /// nothing; the product without constraints always holds.
 class Cube {
 public:
-    using Constraints = ShortVector<Constraint, 2>;
+    using Constraints = ShortVector<Constraint, 3>;
 
     [[nodiscard]] const Constraints& constraints() const noexcept { return constraints_; }
 
@@ -100,6 +100,8 @@ bool dropCubes(Cover& cover, CoverBudget& budget);
 /// Applies all of these until none makes the cover smaller.  A search that exhausts the budget leaves no trace: the
 /// cover is then joined and absorbed only, and the answer is false.
 bool reduce(Cover& cover, CoverBudget& budget);
+/// The same for a cover that neither joinCubes() nor absorb() makes smaller.
+bool reduceJoined(Cover& cover, CoverBudget& budget);
 
 /// Ranges of an atom that a smaller cover may be written with.
 enum class Ranges : std::uint8_t {

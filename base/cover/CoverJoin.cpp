@@ -84,17 +84,23 @@ bool equalButFor(const Cube& a, const Cube& b, Atom atom) {
 }
 
 /// Of the cubes that restrict an atom, those that say the same but for it, in groups of two and more.
-std::vector<std::vector<std::size_t>> groupsButFor(const Cover& cover, Atom atom,
-                                                   const std::vector<std::size_t>& members,
+std::vector<std::vector<std::size_t>> groupsButFor(const Cover& cover, Atom atom, Occurrences::Cubes members,
                                                    const std::vector<bool>& gone,
                                                    const std::vector<std::uint64_t>& hashes) {
+    boost::container::small_vector<std::pair<std::uint64_t, std::size_t>, 32> rest; // hash of the other constraints
+    for (const std::size_t i : members)
+        if (const IntegerSet* set = gone[i] ? nullptr : cover[i].find(atom))
+            rest.emplace_back(hashes[i] - hash_value(Constraint{atom, *set}), i);
+    // Mostly there is no group.
+    auto sorted = rest;
+    std::ranges::sort(sorted);
+    const auto isSame = [](const auto& a, const auto& b) { return a.first == b.first; };
     std::vector<std::vector<std::size_t>> groups;
+    if (std::ranges::adjacent_find(sorted, isSame) == sorted.end())
+        return groups;
     boost::unordered_map<std::uint64_t, std::size_t> byHash;
-    for (const std::size_t i : members) {
-        const IntegerSet* set = gone[i] ? nullptr : cover[i].find(atom);
-        if (set == nullptr)
-            continue;
-        const auto [at, added] = byHash.try_emplace(hashes[i] - hash_value(Constraint{atom, *set}), groups.size());
+    for (const auto& [hash, i] : rest) {
+        const auto [at, added] = byHash.try_emplace(hash, groups.size());
         if (added)
             groups.emplace_back();
         std::vector<std::size_t>& group = groups[at->second];

@@ -3,38 +3,54 @@
 
 #include "base/cover/Cover.hpp"
 
+#include <boost/container/small_vector.hpp>
+
 #include <algorithm>
+#include <span>
 
 namespace VT {
 
-/// Which cubes restrict an atom.
+/// Which cubes restrict an atom, in one list sorted by atom.
 class Occurrences {
 public:
+    using Cubes = std::span<const std::size_t>;
+
     explicit Occurrences(const Cover& cover) {
+        ends_.assign(1, 0);
+        for (const Cube& cube : cover) {
+            for (const Constraint& c : cube.constraints()) {
+                if (c.atom + 1 >= ends_.size())
+                    ends_.resize(c.atom + 2, 0);
+                ++ends_[c.atom + 1];
+            }
+        }
+        for (std::size_t atom = 1; atom < ends_.size(); ++atom)
+            ends_[atom] += ends_[atom - 1];
+        cubes_.resize(ends_.back(), boost::container::default_init);
+        Places next = ends_;
         for (std::size_t i = 0; i < cover.size(); ++i)
             for (const Constraint& c : cover[i].constraints())
-                at(c.atom).push_back(i);
+                cubes_[next[c.atom]++] = i;
     }
 
-    [[nodiscard]] const std::vector<std::size_t>& of(Atom atom) const { return byAtom_[atom]; }
+    [[nodiscard]] Cubes of(Atom atom) const {
+        return {cubes_.data() + ends_[atom], ends_[std::size_t{atom} + 1] - ends_[atom]};
+    }
 
     /// The cubes that restrict the rarest atom of a cube; every cube below it is among them.
-    [[nodiscard]] const std::vector<std::size_t>& candidatesBelow(const Cube& cube) const {
+    [[nodiscard]] Cubes candidatesBelow(const Cube& cube) const {
         const auto rarest =
             std::ranges::min_element(cube.constraints(), {}, [this](const Constraint& c) { return of(c.atom).size(); });
         return of(rarest->atom);
     }
 
-    [[nodiscard]] std::size_t atoms() const noexcept { return byAtom_.size(); }
+    [[nodiscard]] std::size_t atoms() const noexcept { return ends_.size() - 1; }
 
 private:
-    std::vector<std::size_t>& at(Atom atom) {
-        if (atom >= byAtom_.size())
-            byAtom_.resize(atom + 1);
-        return byAtom_[atom];
-    }
+    using Places = boost::container::small_vector<std::size_t, 16>;
 
-    std::vector<std::vector<std::size_t>> byAtom_;
+    Places ends_; ///< where the cubes of each atom begin, and end
+    boost::container::small_vector<std::size_t, 32> cubes_;
 };
 
 /// Takes the marked cubes away; the others keep their order.

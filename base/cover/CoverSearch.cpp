@@ -8,8 +8,9 @@
 #include "base/core/Limits.hpp"
 #include "base/cover/CoverOccurrences.hpp"
 
+#include <boost/container/flat_map.hpp>
+
 #include <algorithm>
-#include <map>
 #include <optional>
 
 namespace VT {
@@ -40,23 +41,26 @@ public:
     void remove(std::size_t index) { gone_[index] = true; }
 
 private:
-    /// What candidates say about each atom within a cube.
-    using Reach = std::map<Atom, std::vector<Interval>>;
+    using Cubes = boost::container::small_vector<const Cube*, 16>;
+    using Intervals = boost::container::small_vector<Interval, 16>;
+
+    /// What candidates say about each atom within a cube, sorted by atom.
+    using Reach = boost::container::small_flat_map<Atom, Intervals, 4>;
 
     /// Whether the cubes that restrict an atom leave none of its values out.
     bool spans(Atom atom) const {
-        std::vector<Interval> intervals;
+        Intervals intervals;
         for (const std::size_t i : occurrences_.of(atom)) {
             const IntegerSet& set = *cover_[i].find(atom);
             intervals.insert(intervals.end(), set.intervals().begin(), set.intervals().end());
         }
-        return IntegerSet::of(std::move(intervals)).isAll();
+        return reaches(intervals, {IntegerSet::minusInfinity, IntegerSet::plusInfinity});
     }
 
     /// The cubes that may help: a cube that restricts an atom of which some value is out of reach helps only where the
     /// atom is restricted already.
-    std::vector<const Cube*> candidates(const Cube& cube, std::size_t skip) {
-        std::vector<bool> near(cover_.size(), false);
+    Cubes candidates(const Cube& cube, std::size_t skip) {
+        boost::container::small_vector<bool, 32> near(cover_.size(), false);
         for (const std::size_t i : everywhere_)
             near[i] = true;
         for (const Constraint& c : cube.constraints()) {
@@ -67,7 +71,7 @@ private:
             for (const std::size_t i : occurrences_.of(c.atom))
                 near[i] = true;
         }
-        std::vector<const Cube*> result;
+        Cubes result;
         for (std::size_t i = 0; i < near.size(); ++i) {
             if (!near[i] || i == skip || gone_[i])
                 continue;
@@ -83,8 +87,8 @@ private:
     }
 
     // NOLINTNEXTLINE(misc-no-recursion): the depth has a bound
-    bool search(const Cube& cube, const std::vector<const Cube*>& cubes, std::size_t depth) {
-        std::vector<const Cube*> touching;
+    bool search(const Cube& cube, const Cubes& cubes, std::size_t depth) {
+        Cubes touching;
         if (depth > limits::coverDepth)
             budget_.steps = 0;
         for (const Cube* other : cubes) {
@@ -110,7 +114,7 @@ private:
 
     /// Where some value of an atom is out of reach of all cubes that restrict it, the others must cover that slice and
     /// so the whole: those cubes do not help.
-    void dropUnhelpful(const Cube& cube, std::vector<const Cube*>& cubes) {
+    void dropUnhelpful(const Cube& cube, Cubes& cubes) {
         for (bool again = true; again && !cubes.empty();) {
             Reach reach;
             for (const Cube* other : cubes) {
@@ -122,19 +126,37 @@ private:
             }
             again = false;
             for (auto& [atom, intervals] : reach) {
-                const IntegerSet reached = IntegerSet::of(std::move(intervals));
                 const IntegerSet* within = cube.find(atom);
-                if (within != nullptr ? within->isSubsetOf(reached) : reached.isAll())
+                const bool isReached =
+                    within == nullptr
+                        ? reaches(intervals, {IntegerSet::minusInfinity, IntegerSet::plusInfinity})
+                        : std::ranges::all_of(within->intervals(), [&, &taken = intervals](const Interval& interval) {
+                              return reaches(taken, interval);
+                          });
+                if (isReached)
                     continue;
-                const Atom beyond = atom;
-                again = std::erase_if(cubes,
-                                      [&](const Cube* other) {
-                                          const IntegerSet* set = other->find(beyond);
-                                          return set != nullptr && restricts(cube, {beyond, *set});
-                                      }) > 0 ||
-                        again;
+                const auto kept = std::remove_if(cubes.begin(), cubes.end(), [&, beyond = atom](const Cube* other) {
+                    const IntegerSet* set = other->find(beyond);
+                    return set != nullptr && !(within != nullptr && within->isSubsetOf(*set));
+                });
+                again = again || kept != cubes.end();
+                cubes.erase(kept, cubes.end());
             }
         }
+    }
+
+    /// Whether some intervals hold all of one between them; sorts them.
+    static bool reaches(Intervals& intervals, const Interval& all) {
+        std::ranges::sort(intervals);
+        std::int64_t next = all.low; // the first integer that is not reached yet
+        for (const Interval& interval : intervals) {
+            if (interval.low > next)
+                return false;
+            if (interval.high >= all.high)
+                return true;
+            next = std::max(next, interval.high + 1);
+        }
+        return false;
     }
 
     static bool restricts(const Cube& cube, const Constraint& constraint) {
@@ -148,9 +170,9 @@ private:
 
     const Cover& cover_;
     Occurrences occurrences_;
-    std::vector<bool> gone_;
-    std::vector<bool> spanned_;           ///< by atom
-    std::vector<std::size_t> everywhere_; ///< cubes that may help anywhere
+    boost::container::small_vector<bool, 32> gone_;
+    boost::container::small_vector<bool, 32> spanned_;           ///< by atom
+    boost::container::small_vector<std::size_t, 32> everywhere_; ///< cubes that may help anywhere
     CoverBudget& budget_;
 };
 

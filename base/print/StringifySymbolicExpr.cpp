@@ -90,12 +90,21 @@ std::string StringifySymbolicExpr::get() const {
     return textOf(top());
 }
 
+namespace {
+
+/// What is kept of a printed expression.
+StringifySymbolicExpr::Printed unpacked(const auto& known) {
+    return {static_cast<SymbolicOp>(known.opAndOne - 1), known.text, known.precedence, known.inCall};
+}
+
+} // namespace
+
 /// Pushes an expression that was met before; whether it was.
 bool StringifySymbolicExpr::pushKnown(SymbolicExprId id) {
     const Known* const met = known_.find(id);
     if (met == nullptr || met->opAndOne == 0)
         return false;
-    push({static_cast<SymbolicOp>(met->opAndOne - 1), met->text, met->precedence, met->inCall});
+    push(unpacked(*met));
     return true;
 }
 
@@ -110,9 +119,9 @@ StringifySymbolicExpr::Printed StringifySymbolicExpr::printed(SymbolicExprId id)
 
 /// The same while a walk may be under way.
 StringifySymbolicExpr::Printed StringifySymbolicExpr::printedOnce(SymbolicExprId id) {
+    if (const Known* const met = known_.find(id); met != nullptr && met->opAndOne != 0)
+        return unpacked(*met);
     const StackDepth depth(stack_);
-    if (pushKnown(id))
-        return stack_.back();
     if (texts_.size() == 0) {
         const std::size_t nodes = std::min<std::size_t>(id, firstNodes);
         texts_.reserve(nodes);

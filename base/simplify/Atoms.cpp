@@ -2,7 +2,7 @@
 //
 // A literal that was read is written again wherever its constraint is; of several that mean the same the first by text.
 // Other constraints are written as the fewest comparisons: bounds as <= and >=, missing integers as ~=.
-// Cost: a map look-up for each literal; sorting operands by text for each product and sum.
+// Cost: a search among a few literals, or a map look-up, for each; sorting operands by text for each product and sum.
 // Relies on: RuleContext::resolve for bound members, mayBeReal for what is not an integer.
 #include "base/simplify/Atoms.hpp"
 
@@ -21,13 +21,31 @@ const IntegerSet nonZero = IntegerSet::allBut(0);
 
 // From nodes to constraints.
 
+Atom Atoms::atomOf(const Key& key, SymbolicExprId left, SymbolicExprId right) {
+    const auto next = static_cast<Atom>(entries_.size());
+    for (Atom atom = 0; atom < next && atom < few; ++atom)
+        if (entries_[atom].key == key)
+            return atom;
+    const Atom atom = next < few ? next : byKey_.try_emplace(key, next).first->second;
+    if (atom == next)
+        entries_.push_back({key, left, right});
+    return atom;
+}
+
+/// The literal that writes a constraint: the given one where there was none.
+SymbolicExprId& Atoms::formOf(const Constraint& constraint, SymbolicExprId literal) {
+    const auto at = std::ranges::find(forms_, constraint, &Form::constraint);
+    if (at != forms_.end())
+        return at->literal;
+    if (forms_.size() < few)
+        return forms_.emplace_back(Form{constraint, literal}).literal;
+    return furtherForms_.try_emplace(constraint, literal).first->second;
+}
+
 Constraint Atoms::enter(const Key& key, SymbolicExprId left, SymbolicExprId right, IntegerSet set,
                         SymbolicExprId literal) {
-    const auto [at, added] = byKey_.try_emplace(key, static_cast<Atom>(entries_.size()));
-    if (added)
-        entries_.push_back({key, left, right});
-    Constraint constraint{at->second, std::move(set)};
-    SymbolicExprId& form = forms_.try_emplace(constraint, literal).first->second;
+    Constraint constraint{atomOf(key, left, right), std::move(set)};
+    SymbolicExprId& form = formOf(constraint, literal);
     if (form != literal && context_.sortsBefore(literal, form))
         form = literal;
     return constraint;
@@ -84,8 +102,11 @@ bool Atoms::readProduct(SymbolicExprId product, Cube& cube) {
 // From constraints to nodes.
 
 SymbolicExprId Atoms::known(const Constraint& constraint) const {
-    const auto form = forms_.find(constraint);
-    return form == forms_.end() ? invalidId : form->second;
+    const auto at = std::ranges::find(forms_, constraint, &Form::constraint);
+    if (at != forms_.end())
+        return at->literal;
+    const auto further = furtherForms_.empty() ? furtherForms_.end() : furtherForms_.find(constraint);
+    return further == furtherForms_.end() ? invalidId : further->second;
 }
 
 SymbolicExprId Atoms::compare(const Entry& entry, SymbolicOp op, std::int64_t constant) {
@@ -187,7 +208,9 @@ SymbolicExprId foldLeft(RuleContext& context, SymbolicOp op, const std::vector<S
 }
 
 void sortByText(const RuleContext& context, std::vector<SymbolicExprId>& operands) {
-    std::ranges::sort(operands, [&](SymbolicExprId a, SymbolicExprId b) { return context.sortsBefore(a, b); });
+    const auto isBefore = [&](SymbolicExprId a, SymbolicExprId b) { return context.sortsBefore(a, b); };
+    if (!std::ranges::is_sorted(operands, isBefore)) // a result that is simplified again
+        std::ranges::sort(operands, isBefore);
 }
 
 } // namespace VT

@@ -4,6 +4,7 @@
 #include "base/cover/Cover.hpp"
 #include "base/simplify/RuleContext.hpp"
 
+#include <boost/container/small_vector.hpp>
 #include <boost/unordered_map.hpp>
 
 #include <map>
@@ -43,6 +44,8 @@ private:
         SymbolicExprId right; ///< second operand, or the invalid identifier
     };
 
+    Atom atomOf(const Key& key, SymbolicExprId left, SymbolicExprId right);
+    SymbolicExprId& formOf(const Constraint& constraint, SymbolicExprId literal);
     Constraint enter(const Key& key, SymbolicExprId left, SymbolicExprId right, IntegerSet set, SymbolicExprId literal);
     Constraint readComparison(SymbolicExprId literal, const SymbolicBinaryExpr& comparison);
     [[nodiscard]] SymbolicExprId known(const Constraint& constraint) const;
@@ -51,10 +54,19 @@ private:
     SymbolicExprId negateTruth(SymbolicExprId value);
     SymbolicExprId single(const Constraint& constraint);
 
+    /// A literal that was read.
+    struct Form {
+        Constraint constraint;
+        SymbolicExprId literal;
+    };
+
+    static constexpr std::size_t few = 16; ///< most conditions have fewer, which are compared one by one
+
     RuleContext& context_;
-    std::vector<Entry> entries_;
-    std::map<Key, Atom> byKey_;
-    boost::unordered_map<Constraint, SymbolicExprId> forms_; ///< literals that were read
+    boost::container::small_vector<Entry, 8> entries_;
+    std::map<Key, Atom> byKey_; ///< of the entries after the first few
+    boost::container::small_vector<Form, few> forms_;
+    boost::unordered_map<Constraint, SymbolicExprId> furtherForms_;
 };
 
 /// The operands of a chain of `op` rooted at a node, each once, in the order of the tree; `repeated` reports whether

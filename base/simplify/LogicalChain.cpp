@@ -91,6 +91,7 @@ struct Chain {
     Cube common;                     ///< And: what they say together
     std::vector<Cover> alternatives; ///< And: operands that are sums
     Cover sum;                       ///< Or, and And once it is distributed
+    bool isReduced = false;          ///< no reducing rule makes the sum smaller
     bool isSmallest = false;         ///< the sum is proven to be so
     CoverBudget budget;              ///< of the rules that an explanation shows one by one
     SymbolicExprId result = invalidId;
@@ -99,7 +100,9 @@ struct Chain {
 void Chain::read() {
     isRead = true;
     sortByText(context, operands);
-    std::map<Atom, std::vector<IntegerSet::Interval>> excluded; // by the comparisons of an And
+    // What the comparisons of a long And exclude is gathered, so that sets of many intervals are made once.
+    const bool isLong = operands.size() > limits::restrictedOneByOne;
+    std::map<Atom, std::vector<IntegerSet::Interval>> excluded;
     for (const SymbolicExprId operand : operands) {
         if (!isAnd()) {
             Cube product;
@@ -116,9 +119,13 @@ void Chain::read() {
             alternatives.push_back(std::move(cover));
         } else {
             const Constraint constraint = atoms.read(operand);
+            ++written;
+            if (!isLong) {
+                impossible = !common.restrict(constraint.atom, constraint.set) || impossible;
+                continue;
+            }
             const IntegerSet others = constraint.set.complement();
             std::ranges::copy(others.intervals(), std::back_inserter(excluded[constraint.atom]));
-            ++written;
         }
     }
     for (auto& [atom, intervals] : excluded)
@@ -213,7 +220,7 @@ bool multiplyOut(Chain& chain, std::vector<Cover> factors) {
         if (!chain.bounded(chain.sum.size() * factor.size()) || !chain.affords(literals))
             return false;
         chain.sum = product(chain.sum, factor);
-        reduce(chain.sum, budget);
+        chain.isReduced = reduce(chain.sum, budget);
     }
     return true;
 }
@@ -335,14 +342,18 @@ SymbolicExprId reduceSum(Chain& chain) {
         while (chain.result == invalidId && std::ranges::any_of(rules, helped)) {
         }
     };
-    applyAll(std::span(reducingRules).first(2));
-    CoverBudget budget = chain.budget = searchBudget(chain.sum);
-    Cover smaller = chain.sum;
-    if (chain.result == invalidId && reduce(smaller, budget)) {
-        if (chain.context.explaining())
-            applyAll(reducingRules);
-        else
-            chain.sum = std::move(smaller);
+    if (chain.isReduced) {
+        chain.bounded(chain.sum.size());
+    } else {
+        applyAll(std::span(reducingRules).first(2));
+        CoverBudget budget = chain.budget = searchBudget(chain.sum);
+        if (chain.result == invalidId && chain.context.explaining()) {
+            Cover smaller = chain.sum;
+            if (reduceJoined(smaller, budget))
+                applyAll(reducingRules);
+        } else if (chain.result == invalidId) {
+            reduceJoined(chain.sum, budget);
+        }
     }
     if (chain.result != invalidId)
         return chain.result;

@@ -29,6 +29,12 @@ IntegerSet truth(bool holds) {
     return holds ? IntegerSet::all() : IntegerSet();
 }
 
+/// A form times a power of two.
+std::optional<LinearForm> shiftedLeft(const LinearForm& form, std::int64_t places) {
+    const auto power = places < 0 ? std::nullopt : integerResult(SymbolicOp::ShiftLeft, 1, places);
+    return power && isWithinBound(*power) ? combine(form, *power, {}, 0) : std::nullopt;
+}
+
 } // namespace
 
 ComparedTerms::ComparedTerms(SymbolicExprTable& table, const SymbolicExprPrinter& printer, bool keywordsInForce)
@@ -118,6 +124,8 @@ ComparedTerms::Number ComparedTerms::compute(SymbolicExprId id, const SymbolicEx
         form = combine(a, 1, b, op == SymbolicOp::Plus ? 1 : -1);
     else if (op == SymbolicOp::Multiply && (a.isConstant() || b.isConstant()))
         form = a.isConstant() ? combine(b, a.constant, {}, 0) : combine(a, b.constant, {}, 0);
+    else if (op == SymbolicOp::ShiftLeft && !a.isConstant() && b.isConstant())
+        form = shiftedLeft(a, b.constant);
     else if (a.isConstant() && b.isConstant())
         if (const auto value = count == 1 ? integerResult(op, a.constant) : integerResult(op, a.constant, b.constant);
             value && isWithinBound(*value))
