@@ -71,7 +71,7 @@ const Cube* BoxUnion::coverOf(const BoxPoint& point, Atom first, std::span<const
         }
         left_.resize(left);
     }
-    steps -= std::min<std::uint64_t>(steps, 1 + boxes_.size() / 16 + left_.size() / 4);
+    steps -= std::min<std::uint64_t>(steps, 1 + boxes_.size() / 256 + left_.size() / 32);
     const auto isIn = [&](std::uint32_t box) {
         for (Atom atom = 0; atom < atoms_; ++atom)
             if (point[atom] < lows_[atom][box] || point[atom] > highs_[atom][box])

@@ -59,6 +59,11 @@ ChoiceSetReport ChoiceSetChecker::check(SymbolicExprId parent, std::span<const S
     for (std::size_t i = 0; i < choices.size(); ++i) {
         if (i == defaultChoice)
             continue;
+        if (state.setLeft == 0) {
+            State::add({.fault = ChoiceFault::Dead, .choice = i},
+                       {Answer::Undecided, DecisionBound::Steps, std::nullopt}, report);
+            continue;
+        }
         Answer isActive = state.counted(boxes, boxes.isFaultless(i)) ? Answer::Yes : Answer::Undecided;
         if (policy == ChoicePolicy::First && (isActive != Answer::Yes || !state.options.domains.empty())) {
             state.placeAfter(place, conditions, i, inOrder, earlier);

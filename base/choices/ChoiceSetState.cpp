@@ -114,6 +114,7 @@ void ChoiceSetChecker::State::placeAfter(Place& place, std::span<const SymbolicE
     const auto near = choicesNear(runs, ranges, limits::hidingChoices,
                                   [&](std::size_t choice) { return choice < position && !earlier.isDead[choice]; });
     place.isHidden = earlier.isAnyActive;
+    place.before = position;
     place.earlier.clear();
     place.earlierHold.clear();
     if (!near) {
@@ -229,6 +230,7 @@ bool ChoiceSetChecker::State::isActiveAlone(std::size_t position, SymbolicExprId
 Decision ChoiceSetChecker::State::findActive(const Place& place, SymbolicExprId holds, SymbolicExprId left) {
     if (place.earlierHold.empty() || !place.earlier.empty())
         return ask(&Decider::canHold, both(holds, left));
+    take(place.before); // they are all looked at
     Decision alone = ask(&Decider::canHold, holds);
     if (!alone.isYes() || (alone.witness && decider.holds(left, *alone.witness).value_or(false)))
         return alone;

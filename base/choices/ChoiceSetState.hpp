@@ -25,6 +25,7 @@ struct ChoiceSetChecker::State {
         std::vector<SymbolicExprId> premises;         ///< the same, as written
         std::vector<SymbolicExprId> earlierHold = {}; ///< what may hide it, in C shape
         std::vector<std::size_t> earlier = {};        ///< the choices that it is; none where they are too many
+        std::size_t before = 0;                       ///< the number of all choices before it
         bool isHidden = false;                        ///< an earlier choice is active somewhere
     };
 

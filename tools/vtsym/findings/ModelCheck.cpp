@@ -23,6 +23,8 @@ namespace {
 constexpr std::size_t visitedAncestors = 256; ///< in search of conditions that a finding follows from
 constexpr std::size_t shownAncestors = 8;     ///< whose conditions a finding lists
 
+constexpr std::size_t shownUndecided = 20; ///< questions about one set
+
 /// In the order of VT::ChoiceFault.
 constexpr std::array<std::string_view, 5> kinds{"dead", "always-active", "redundant", "overlapping", "missing"};
 
@@ -268,8 +270,11 @@ VT::ChoiceSetReport ModelCheck::checkChoices(const VTBlock& block) {
     std::vector<Finding>& findings = choiceSets_.back().findings;
     for (const VT::ChoiceFinding& finding : report.findings)
         write(findings, findingOf(block, block.choices(), finding));
-    for (const VT::ChoiceFinding& finding : report.undecided)
-        reportUndecided(block, block.choices(), finding);
+    for (std::size_t i = 0; i < std::min(report.undecided.size(), shownUndecided); ++i)
+        reportUndecided(block, block.choices(), report.undecided[i]);
+    if (report.undecided.size() > shownUndecided && !checker_.stepsUsedUp())
+        problem(placeOf(block), "Of " + block.path() + " " + std::to_string(report.undecided.size() - shownUndecided) +
+                                    " more questions stay undecided.");
     writeMerges(block, report, findings);
     writeAdvice(choiceSets_.back());
     if (!report.allOverlaps && !checker_.stepsUsedUp()) {
