@@ -136,8 +136,8 @@ inline constexpr std::size_t solverChecks = 64;
 inline constexpr std::uint64_t solverNodes = 1024;
 inline constexpr unsigned solverMegabytes = 256;
 
-/// Bits of a number in a question for it, where each unknown counts as so many: the degree of products.  A larger number
-/// is one that nothing is known of.
+/// Bits of a number in a question for it, where each unknown counts as so many: the degree of products.  A larger
+/// number is one that nothing is known of.
 inline constexpr unsigned solverNumberBits = 4096;
 inline constexpr unsigned solverUnknownBits = 128;
 
