@@ -146,12 +146,21 @@ inline constexpr std::size_t confirmations = 8192;
 
 /// What one question may cost in another solver, for each of two translations: in the solver's own unit, checks (to
 /// find an assignment that evaluation accepts, and to make it small), nodes and pairs of calls that are written for it,
-/// and megabytes that it may take in the process.  Beyond a bound the question is undecided, or the witness is as small
-/// as it is by then.
-inline constexpr unsigned solverResources = 1'000'000;
+/// which it reads in quadratic time, and megabytes that it may take in the process.  Beyond a bound the question is
+/// undecided, or the witness is as small as it is by then.
+inline constexpr unsigned solverResources = 500'000;
 inline constexpr std::size_t solverChecks = 64;
-inline constexpr std::uint64_t solverNodes = 4096;
+inline constexpr std::uint64_t solverNodes = 1024;
 inline constexpr unsigned solverMegabytes = 256;
+
+/// Bits of a number in a question for it, where each unknown counts as so many: the degree of products.  A larger
+/// number is one that nothing is known of.
+inline constexpr unsigned solverNumberBits = 4096;
+inline constexpr unsigned solverUnknownBits = 128;
+
+/// Products and quotients in a question about bits, each counted with the square of its bits.  A question with more is
+/// not asked that way.
+inline constexpr std::size_t solverProductBits = std::size_t{1} << 15U;
 
 /// Bits of a value in a question about bits; a question with larger ones is not asked that way.  Bits of an unknown
 /// that the question does not bound: assignments with larger values are not found.

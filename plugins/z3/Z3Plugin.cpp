@@ -24,16 +24,13 @@ struct vtsym_problem {
         : width_(options.width),
           left_(options.resources),
           context_(makeContext(), Z3_del_context),
-          solvers_{Z3_mk_simple_solver(context_.get()), Z3_mk_simple_solver(context_.get())} {
+          solvers_{makeSolver(), makeSolver()} {
         Z3_set_error_handler(context_.get(), [](Z3_context, Z3_error_code) {});
-        for (const Z3_solver solver : solvers_)
-            Z3_solver_inc_ref(context_.get(), solver);
         setLimits();
         const Z3_sort sort = width_ == 0 ? Z3_mk_int_sort(context_.get()) : Z3_mk_bv_sort(context_.get(), width_);
         for (unsigned i = 0; i < options.unknowns; ++i) {
             names_.push_back(Z3_mk_string_symbol(context_.get(), ("u" + std::to_string(i)).c_str()));
             unknowns_.push_back(Z3_mk_func_decl(context_.get(), names_.back(), 0, nullptr, sort));
-            Z3_inc_ref(context_.get(), Z3_func_decl_to_ast(context_.get(), unknowns_.back()));
         }
     }
 
@@ -98,6 +95,13 @@ private:
     static Z3_context makeContext() {
         const Configuration configuration;
         return Z3_mk_context(configuration.made);
+    }
+
+    /// A solver is counted before the context makes another object.
+    Z3_solver makeSolver() {
+        const Z3_solver solver = Z3_mk_simple_solver(context_.get());
+        Z3_solver_inc_ref(context_.get(), solver);
+        return solver;
     }
 
     /// What is left for the next check.  An interrupt ends the program rather than the check.

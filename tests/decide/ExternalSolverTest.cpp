@@ -17,11 +17,7 @@ TEST(ExternalSolver, AnswersWithTheSmallestAssignment) {
     for (const CaseRow& row : casesOf("solver.txt", "can hold", 2)) {
         DecisionFixture fixture(with(SolverPlugin::installed()));
         const SymbolicExprId condition = fixture.parse(row[0]);
-        const Decision decision = fixture.decider.canHold(condition);
-        EXPECT_EQ(fixture.text(decision), row[1]) << row[0];
-        if (decision.isYes()) {
-            EXPECT_TRUE(fixture.holdsFor(condition, decision)) << row[0];
-        }
+        EXPECT_EQ(fixture.text(fixture.decider.canHold(condition)), row[1]) << row[0];
     }
 }
 
@@ -30,7 +26,7 @@ TEST(ExternalSolver, AnswersEveryKindOfQuestion) {
         DecisionFixture fixture({.bits32 = row[5] == "32", .solver = &SolverPlugin::installed()});
         Decider& decider = fixture.decider;
         const SymbolicExprId a = fixture.parse(row[1]);
-        const SymbolicExprId b = fixture.parse(row[2]);
+        const SymbolicExprId b = row[2].empty() ? fixture.table.getIdTRUE() : fixture.parse(row[2]);
         const SymbolicExprId known = row[3].empty() ? fixture.table.getIdTRUE() : fixture.parse(row[3]);
         const SymbolicExprId three[] = {a, b, known};
         const std::span pair(three, 2);
@@ -60,7 +56,7 @@ TEST(ExternalSolver, AgreesWithBruteForce) {
                pick({"==", "<", ">=", "!=", "=="}) + term();
     };
     constexpr std::int64_t reach = 4;
-    constexpr std::size_t rounds = 200;
+    constexpr std::size_t rounds = 400;
     std::size_t asked = 0;
     std::size_t decided = 0;
     for (std::size_t i = 0; i < rounds; ++i) {
@@ -135,7 +131,7 @@ TEST(SolverPlugin, WithWrongAssignmentsIsNotBelieved) {
     EXPECT_EQ(wrong.fault(), "");
     // A right one among wrong ones counts: 1001 is the first value, and the smallest that the plugin ever says.
     EXPECT_EQ(answerOf(wrong, "X*X == 1002001"), "yes: X=1001");
-    EXPECT_EQ(answerOf(wrong, "X*Y*X == 7 && X*Y > 6"), "undecided terms");
+    EXPECT_EQ(answerOf(wrong, "X*X == 3*Y*Y + 2"), "undecided terms");
 }
 
 } // namespace

@@ -4,6 +4,7 @@
 #include "base/core/Make.hpp"
 #include "base/core/Nodes.hpp"
 #include "base/decide/Decider.hpp"
+#include "base/decide/external/SolverPlugin.hpp"
 #include "tests/service/Customizers.hpp"
 #include "tests/support/Cases.hpp"
 #include "tests/support/Parsing.hpp"
@@ -58,7 +59,7 @@ std::vector<std::string> someConditions() {
 TEST(ShortestConditions, AreEqualAndNoLongerInTheirLanguage) {
     const FreshService service;
     SymbolicExprTable& table = service->table();
-    Decider judge(table);
+    Decider judge(table, {.solver = &SolverPlugin::installed()}); // which the service may ask, too
     std::size_t shorter = 0;
     std::size_t shorterGiven = 0;
     SymbolicExprId previous = table.getIdTRUE();

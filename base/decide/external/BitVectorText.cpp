@@ -57,7 +57,7 @@ public:
         if (!writeAll() || failed_)
             return std::nullopt;
         const std::size_t width = isColumnwise_ ? widest_ + comparisons_ + 1 : widest_ + 1;
-        if (width > limits::solverBits)
+        if (width > limits::solverBits || products_ * width * width > limits::solverProductBits)
             return std::nullopt;
         out_.width = static_cast<unsigned>(width);
         const std::string digits = std::to_string(width);
@@ -187,11 +187,13 @@ private:
             return of("bvsub", larger + 1);
         case SymbolicOp::Multiply:
         case SymbolicOp::DotMul:
+            ++products_;
             return of("bvmul", a.bits + b.bits);
         case SymbolicOp::Divide:
         case SymbolicOp::Modulo:
             if (!b.integer || *b.integer == 0)
                 only(compound("not", compound("=", b.name, literal(0))));
+            ++products_;
             return of(op == SymbolicOp::Divide ? "bvsdiv" : "bvsrem", a.bits + 1);
         case SymbolicOp::ShiftLeft:
         case SymbolicOp::ShiftRight:
@@ -222,6 +224,7 @@ private:
     bool failed_ = false;
     unsigned widest_ = 1;
     std::size_t comparisons_ = 0;
+    std::size_t products_ = 0; ///< and quotients
     std::map<SymbolicExprId, Bounds> bounds_;
     std::map<std::int64_t, std::size_t> literals_;
 };

@@ -45,9 +45,24 @@ public:
     }
 
 private:
-    static Term ofInteger(std::string text) { return {std::move(text), Sort::Number}; }
+    static constexpr unsigned realBits = 1100; ///< of the smallest real literal
 
-    Term integer(std::int64_t value) override { return ofInteger(decimal(value)); }
+    /// A number, or one that nothing is known of where it is too large.
+    Term sized(std::string text, Sort sort, unsigned bits) {
+        if (bits > limits::solverNumberBits) {
+            text = declare(sort);
+            bits = limits::solverUnknownBits;
+        }
+        Term term{std::move(text), sort};
+        term.bits = bits;
+        return term;
+    }
+
+    Term ofInteger(std::string text, unsigned bits) { return sized(std::move(text), Sort::Number, bits); }
+
+    Term integer(std::int64_t value) override { return ofInteger(decimal(value), 64); }
+
+    Term anyInteger() { return ofInteger(anything(), limits::solverUnknownBits); }
 
     /// The exact value of a finite double: digits * 2^exponent.
     Term real(double value) override {
@@ -57,7 +72,9 @@ private:
         const std::string whole = compound("to_real", decimal(static_cast<std::int64_t>(std::ldexp(fraction, digits))));
         exponent -= digits;
         const std::string power = compound("to_real", powerOfTwo(static_cast<unsigned>(std::abs(exponent))));
-        return {compound(exponent < 0 ? "/" : "*", whole, power), Sort::Rational, value};
+        Term term = sized(compound(exponent < 0 ? "/" : "*", whole, power), Sort::Rational, realBits);
+        term.literal = value;
+        return term;
     }
 
     static std::string powerOfTwo(unsigned exponent) {
@@ -71,6 +88,7 @@ private:
     }
 
     void restrict(Term& unknown, SymbolicExprId) override {
+        unknown.bits = limits::solverUnknownBits;
         if (source_.bits32)
             SmtWriter::write(
                 {"(assert (and (<= (- 2147483648) ", unknown.name, ") (<= ", unknown.name, " 2147483647)))\n"});
@@ -107,11 +125,11 @@ private:
             return literal(-*a.integer);
         if (a.literal && a.sort == Sort::Rational)
             return real(-*a.literal);
-        return {compound("-", a.name), a.sort};
+        return sized(compound("-", a.name), a.sort, a.bits);
     }
 
     Term complement(const Term& a) override {
-        return a.sort == Sort::Number ? ofInteger(compound("-", "(- 1)", a.name)) : Term();
+        return a.sort == Sort::Number ? ofInteger(compound("-", "(- 1)", a.name), a.bits + 1) : Term();
     }
 
     Term comparison(SymbolicOp op, const Term& a, const Term& b) override {
@@ -128,31 +146,32 @@ private:
             if (value && isWithinBound(*value))
                 return literal(*value);
         }
+        const unsigned larger = std::max(a.bits, b.bits) + 1;
         switch (op) {
         case SymbolicOp::Plus:
-            return ofInteger(compound("+", a.name, b.name));
+            return ofInteger(compound("+", a.name, b.name), larger);
         case SymbolicOp::Minus:
-            return ofInteger(compound("-", a.name, b.name));
+            return ofInteger(compound("-", a.name, b.name), larger);
         case SymbolicOp::Multiply:
         case SymbolicOp::DotMul:
-            return ofInteger(compound("*", a.name, b.name));
+            return ofInteger(compound("*", a.name, b.name), a.bits + b.bits);
         case SymbolicOp::Power:
         case SymbolicOp::DotPower:
             return power(a, b);
         case SymbolicOp::Divide:
         case SymbolicOp::Modulo:
-            return ofInteger(division(op == SymbolicOp::Divide, a, b));
+            return ofInteger(division(op == SymbolicOp::Divide, a, b), a.bits);
         case SymbolicOp::ShiftLeft:
         case SymbolicOp::ShiftRight:
-            return ofInteger(shift(op == SymbolicOp::ShiftLeft, a, b));
+            return shift(op == SymbolicOp::ShiftLeft, a, b);
         case SymbolicOp::BitAnd:
-            return ofInteger(shared(a, b));
+            return ofInteger(shared(a, b), larger);
         case SymbolicOp::BitOr:
-            return ofInteger(joined({"(- (+ ", a.name, " ", b.name, ") ", shared(a, b), ")"}));
+            return ofInteger(joined({"(- (+ ", a.name, " ", b.name, ") ", shared(a, b), ")"}), larger);
         case SymbolicOp::BitXOr:
-            return ofInteger(joined({"(- (+ ", a.name, " ", b.name, ") (* 2 ", shared(a, b), "))"}));
+            return ofInteger(joined({"(- (+ ", a.name, " ", b.name, ") (* 2 ", shared(a, b), "))"}), larger);
         default:
-            return ofInteger(anything());
+            return anyInteger();
         }
     }
 
@@ -162,7 +181,7 @@ private:
             if (const auto folded = foldedReals(op, *a.literal, *b.literal))
                 return real(*folded);
         const auto exactly = [&](const char* function) {
-            return Term{compound(function, asRational(a), asRational(b)), Sort::Rational};
+            return sized(compound(function, asRational(a), asRational(b)), Sort::Rational, a.bits + b.bits);
         };
         switch (op) {
         case SymbolicOp::Plus:
@@ -186,11 +205,11 @@ private:
     Term power(const Term& a, const Term& b) {
         constexpr std::int64_t most = 8;
         if (!b.integer || *b.integer < 0 || *b.integer > most)
-            return ofInteger(anything());
+            return anyInteger();
         std::string product = "(* 1";
         for (std::int64_t i = 0; i < *b.integer; ++i)
             product.append(" ").append(a.name);
-        return ofInteger(product + ")");
+        return ofInteger(product + ")", static_cast<unsigned>(*b.integer + 1) * a.bits);
     }
 
     /// C cuts toward zero, `div` rounds so that the remainder is not negative: both agree for a dividend that is not.
@@ -213,14 +232,16 @@ private:
 
     /// A shift multiplies by a power of two, or divides by it and rounds down; a negative distance turns it round.  Of
     /// large unknown distances only the size of the result is stated.
-    std::string shift(bool isLeft, const Term& a, const Term& b) {
+    Term shift(bool isLeft, const Term& a, const Term& b) {
         constexpr std::int64_t far = 32;
         const auto by = [&](std::int64_t places) {
             const std::string power = powerOfTwo(static_cast<unsigned>(std::abs(places)));
             return compound(isLeft == (places >= 0) ? "*" : "div", a.name, power);
         };
+        if (b.integer && std::abs(*b.integer) > limits::solverNumberBits)
+            return anyInteger();
         if (b.integer)
-            return std::abs(*b.integer) <= limits::formBits ? by(*b.integer) : anything();
+            return ofInteger(by(*b.integer), a.bits + static_cast<unsigned>(std::abs(*b.integer)));
         const std::string beyond = anything();
         const std::string notNegative = compound(">=", a.name, "0");
         const std::string product = compound("*", a.name, powerOfTwo(far));
@@ -235,7 +256,7 @@ private:
         std::string result = beyond;
         for (std::int64_t places = far; places-- > 1 - far;)
             result = choose(compound("=", b.name, decimal(places)), by(places), result);
-        return result;
+        return ofInteger(std::move(result), a.bits + static_cast<unsigned>(far));
     }
 
     /// a & b.

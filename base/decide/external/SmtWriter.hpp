@@ -65,7 +65,7 @@ protected:
         Sort sort = Sort::Unclear;          ///< Unclear has no name, and a truth of its own where one is asked for
         std::optional<double> literal = {}; ///< literals are rounded with each other
         std::optional<std::int64_t> integer = {}; ///< the value of an integer literal
-        unsigned bits = 0;                        ///< that hold every value, in two's complement; for bit vectors
+        unsigned bits = 0; ///< of its values: exact for bit vectors, a measure of size for integers
     };
 
     explicit SmtWriter(const SmtSource& source) : source_(source), table_(source.leaves.table()) {}

@@ -1,7 +1,8 @@
 /* The interface between the library and a solver that it loads at run time.
  *
- * Plain C, so that another compiler may build a plugin.  A plugin exports one function, which returns a table that lives
- * as long as the process.  No function throws.  One thread at a time uses a problem; several threads may each use one.
+ * Plain C, so that another compiler may build a plugin.  A plugin exports one function, which returns a table that
+ * lives as long as the process.  No function throws.  One thread at a time uses a problem; several threads may each use
+ * one.
  */
 #ifndef VTSYM_SOLVER_INTERFACE_H
 #define VTSYM_SOLVER_INTERFACE_H
