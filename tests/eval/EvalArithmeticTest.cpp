@@ -502,7 +502,7 @@ TEST(Prepared, RunsManyRowsAsItRunsEach) {
             if (graph.below(20) != 0)
                 graph.table.registerValueId(symbol, literal(graph.table, graph.anyScalar()));
         PreparedExpr prepared = SymbolicExprEval(graph.table).prepare(graph.nodes[graph.nodes.size() - 1 - seed % 3]);
-        const std::size_t rows = graph.below(10) == 0 ? 9000 + graph.below(300) : graph.below(70);
+        const std::size_t rows = graph.below(10) == 0 ? 2100 + graph.below(300) : graph.below(70);
         std::vector<Column> columns;
         std::vector<ValueColumn> given;
         for (std::size_t slot = 0; slot < prepared.slotCount(); ++slot)
