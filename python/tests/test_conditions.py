@@ -190,6 +190,7 @@ def test_full_tables_are_followed_by_others(monkeypatch: pytest.MonkeyPatch) -> 
         every = every | (symbol == i)
         assert condition.equivalent(f"A == {i}")
     assert len(tables) > 5 and every.evaluate(A=1999) and not every.evaluate(A=2000)
+    assert symbol._table.integer(123) < 0  # the full table grew no further
     assert str(every) == " || ".join(f"A=={i}" for i in range(2000))
 
 

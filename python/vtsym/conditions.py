@@ -5,7 +5,7 @@ from __future__ import annotations
 from typing import TYPE_CHECKING, Any, Iterable, Mapping, Union
 
 from vtsym import _vtsym
-from vtsym._nodes import DEFAULT, OPERATORS, Node, Value, combine, literal, make, number_in
+from vtsym._nodes import DEFAULT, OPERATORS, Node, Value, combine, in_room, literal, make, number_in
 from vtsym.results import Decision, Reasons, Relation, SetDecision
 
 if TYPE_CHECKING:
@@ -292,7 +292,12 @@ class Expression(Node):
         if isinstance(other, Expression):
             return other
         if isinstance(other, (int, float)):
-            return make(Expression, self._table, literal(self._table, other))
+            table = self._table
+            number = literal(table, other)
+            while number < 0:
+                table, _ = in_room(self)
+                number = literal(table, other)
+            return make(Expression, table, number)
         return None
 
     def _infix(self, op: int, other: Operand) -> Expression:
