@@ -27,7 +27,7 @@ using VT::SymbolicExprId;
 ///
 /// Nodes are never freed.  A table that is full makes no more of them by combining: the caller goes on with the
 /// successor, which knows the same assumptions, and the full one goes with the last object that holds it.
-class Table : public std::enable_shared_from_this<Table> {
+class Table {
 public:
     Table(bool bits32, std::size_t capacity);
 
@@ -76,7 +76,7 @@ private:
     VT::VCService service_;
     std::optional<Dimensions> dimensions_;
     VT::IdMap<std::uint64_t> hashes_;
-    std::weak_ptr<Table> successor_;
+    std::shared_ptr<Table> successor_; ///< until that one is full
 };
 
 /// Uses a table for a moment; Python waits.
