@@ -297,9 +297,8 @@ void Decider::State::askSolver(AskedOf asked, std::span<const SymbolicExprId> id
             truths.push_back(*truth);
         }
         begin();
-        const bool isConfirmed =
-            isAsAsked(asked, truths) &&
-            !CallCongruence(leafReader, unknowns, steps).findViolation(calls, witness).has_value();
+        const bool isConfirmed = isAsAsked(asked, truths) &&
+                                 CallCongruence(leafReader, unknowns, steps).findViolations(calls, witness).empty();
         taken += end();
         return isConfirmed;
     };

@@ -7,7 +7,15 @@
 #include "base/eval/ColumnLoops.hpp"
 
 #include <array>
+#include <limits>
 #include <type_traits>
+
+// Compiles a function for processors with wide registers, where the compiler can.
+#ifdef __x86_64__
+#define VTSYM_WIDE [[gnu::target("avx2")]]
+#else
+#define VTSYM_WIDE
+#endif
 
 namespace VT::detail {
 
@@ -17,7 +25,7 @@ template <ScalarType Type>
 using ValueOf = std::remove_const_t<decltype(cellValue<Type>({}))>;
 
 template <ScalarType Left, ScalarType Right, class Function>
-void loop(const void* left, const void* right, void* result, std::size_t rows) noexcept {
+[[gnu::always_inline]] inline void apply(const void* left, const void* right, void* result, std::size_t rows) {
     using Answer = decltype(Function()(ValueOf<Left>(), ValueOf<Right>()));
     const auto* const a = static_cast<const ValueOf<Left>*>(left);
     const auto* const b = static_cast<const ValueOf<Right>*>(right);
@@ -26,32 +34,50 @@ void loop(const void* left, const void* right, void* result, std::size_t rows) n
         answers[i] = Function()(a[i], b[i]);
 }
 
-/// The same for an operator that takes its operand twice.
-template <ScalarType Type, class Function>
-void loopOfOne(const void* operand, const void*, void* result, std::size_t rows) noexcept {
-    loop<Type, Type, Function>(operand, operand, result, rows);
+template <std::size_t Operands, ScalarType Left, ScalarType Right, class Function>
+void loop(const void* left, const void* right, void* result, std::size_t rows) noexcept {
+    apply<Left, typeOfSecond(Operands, Left, Right), Function>(left, Operands == 1 ? left : right, result, rows);
 }
 
+/// The same, compiled for wide registers.  Results are the same: only the number of rows at a time differs.
 template <std::size_t Operands, ScalarType Left, ScalarType Right, class Function>
-constexpr ColumnLoop loopOfTypes(Function) {
-    if constexpr (Operands == 1)
-        return loopOfOne<Left, Function>;
-    else
-        return loop<Left, Right, Function>;
+VTSYM_WIDE void wideLoop(const void* left, const void* right, void* result, std::size_t rows) noexcept {
+    apply<Left, typeOfSecond(Operands, Left, Right), Function>(left, Operands == 1 ? left : right, result, rows);
+}
+
+/// The plain loop and the wide one.
+using Loops = std::array<ColumnLoop, 2>;
+
+template <std::size_t Operands, ScalarType Left, ScalarType Right, class Function>
+constexpr Loops loopsOfTypes(Function) {
+    return {loop<Operands, Left, Right, Function>, wideLoop<Operands, Left, Right, Function>};
 }
 
 template <std::size_t Operands, class Function>
-constexpr std::array<ColumnLoop, typePairs> loopsOf(Function f) {
+constexpr std::array<Loops, typePairs> loopsOf(Function f) {
     using enum ScalarType;
-    return {loopOfTypes<Operands, Bool, Bool>(f),    loopOfTypes<Operands, Bool, Int>(f),
-            loopOfTypes<Operands, Bool, Double>(f),  loopOfTypes<Operands, Int, Bool>(f),
-            loopOfTypes<Operands, Int, Int>(f),      loopOfTypes<Operands, Int, Double>(f),
-            loopOfTypes<Operands, Double, Bool>(f),  loopOfTypes<Operands, Double, Int>(f),
-            loopOfTypes<Operands, Double, Double>(f)};
+    return {loopsOfTypes<Operands, Bool, Bool>(f),    loopsOfTypes<Operands, Bool, Int>(f),
+            loopsOfTypes<Operands, Bool, Double>(f),  loopsOfTypes<Operands, Int, Bool>(f),
+            loopsOfTypes<Operands, Int, Int>(f),      loopsOfTypes<Operands, Int, Double>(f),
+            loopsOfTypes<Operands, Double, Bool>(f),  loopsOfTypes<Operands, Double, Int>(f),
+            loopsOfTypes<Operands, Double, Double>(f)};
+}
+
+[[gnu::always_inline]] inline void unify(const double* values, double* __restrict to, std::size_t rows) {
+    for (std::size_t i = 0; i < rows; ++i)
+        to[i] = values[i] != values[i] ? std::numeric_limits<double>::quiet_NaN() : values[i];
+}
+
+void unifyPlainly(const double* values, double* to, std::size_t rows) noexcept {
+    unify(values, to, rows);
+}
+
+VTSYM_WIDE void unifyWidely(const double* values, double* to, std::size_t rows) noexcept {
+    unify(values, to, rows);
 }
 
 /// In the order of ScalarRuleIndex, as operationCode() counts.
-constexpr auto loops = std::to_array<std::array<ColumnLoop, typePairs>>({
+constexpr auto loops = std::to_array<std::array<Loops, typePairs>>({
 #define VTSYM_RULE(Op, Operands, Function) loopsOf<Operands>([](auto a, auto b) { return rules::Function(a, b); }),
     VTSYM_SCALAR_RULES(VTSYM_RULE)
 #undef VTSYM_RULE
@@ -59,8 +85,20 @@ constexpr auto loops = std::to_array<std::array<ColumnLoop, typePairs>>({
 
 } // namespace
 
-ColumnLoop columnLoop(std::uint32_t code) noexcept {
-    return loops[code / typePairs][code % typePairs];
+ColumnLoop columnLoop(std::uint32_t code, bool wide) noexcept {
+    return loops[code / typePairs][code % typePairs][wide ? 1 : 0];
+}
+
+bool hasWideRegisters() noexcept {
+#ifdef __x86_64__
+    return __builtin_cpu_supports("avx2") != 0;
+#else
+    return false;
+#endif
+}
+
+void copyVisible(const double* values, double* to, std::size_t rows, bool wide) noexcept {
+    wide ? unifyWidely(values, to, rows) : unifyPlainly(values, to, rows);
 }
 
 } // namespace VT::detail

@@ -10,9 +10,7 @@
 
 #include <algorithm>
 #include <bit>
-#include <cmath>
 #include <cstring>
-#include <limits>
 #include <stdexcept>
 #include <string>
 
@@ -147,7 +145,8 @@ std::uint32_t PreparedExprColumns::takeBuffer() {
     return buffer;
 }
 
-/// Gives each operation a buffer for its results, but the last one of the root, which writes to the caller's room.
+/// Gives each operation a buffer for its results, but that of the root, which writes bools and integers to the caller's
+/// room.
 void PreparedExprColumns::placeOperations() {
     const auto first = static_cast<std::uint32_t>(expression_.firstResult_);
     const auto count = static_cast<std::uint32_t>(expression_.operations_.size() - 1);
@@ -161,8 +160,8 @@ void PreparedExprColumns::placeOperations() {
     for (std::uint32_t i = 0; i < count; ++i) {
         const detail::Operation& operation = expression_.operations_[i];
         const std::uint32_t result = first + i;
-        lines_.push_back({detail::columnLoop(operation.code), operation.left, operation.right, result});
-        if (result != root)
+        lines_.push_back({detail::columnLoop(operation.code, isWide_), operation.left, operation.right, result});
+        if (result != root || resultType() == ScalarType::Double)
             buffers_[result] = takeBuffer();
         // Only now, so that results never overlap operands.
         for (const std::uint32_t cell : {operation.left, operation.right})
@@ -223,15 +222,14 @@ void PreparedExprColumns::run(std::size_t rows, void* results) {
         for (const Source& source : sources_)
             read(source, first, count);
         for (const Line& line : lines_) {
-            void* const to = line.result == root ? out : buffer(buffers_[line.result]);
+            void* const to = buffers_[line.result] == none ? out : buffer(buffers_[line.result]);
             line.loop(values_[line.left], values_[line.right], to, count);
         }
-        if (root < expression_.firstResult_) // no operation
-            std::memcpy(out, values_[root], count * bytesOf(type));
         if (type == ScalarType::Double)
-            std::transform(
-                reinterpret_cast<double*>(out), reinterpret_cast<double*>(out) + count, reinterpret_cast<double*>(out),
-                [](double value) { return std::isnan(value) ? std::numeric_limits<double>::quiet_NaN() : value; });
+            detail::copyVisible(static_cast<const double*>(values_[root]), reinterpret_cast<double*>(out), count,
+                                isWide_);
+        else if (root < expression_.firstResult_) // no operation
+            std::memcpy(out, values_[root], count * bytesOf(type));
     }
 }
 

@@ -47,6 +47,7 @@ private:
     [[nodiscard]] std::byte* buffer(std::uint32_t number) noexcept;
 
     const PreparedExpr& expression_;
+    bool isWide_ = detail::hasWideRegisters();
     std::vector<Source> sources_;
     std::vector<Line> lines_;
     std::vector<std::uint32_t> buffers_;   ///< numbers, by cell

@@ -81,14 +81,13 @@ auto multiply(L a, R b) {
 }
 
 /// The quotient of doubles; a divisor that counts as zero, or is NaN, makes an infinity of the dividend's sign, that of
-/// zero included.
+/// zero included.  Divides in any case and chooses then, so that loops over it have no branch.
 inline double quotient(double a, double b) {
     constexpr double infinity = std::numeric_limits<double>::infinity();
-    if (std::fabs(b) >= limits::zeroThreshold)
-        return a / b;
-    if (a >= 0)
-        return infinity;
-    return a < 0 ? -infinity : a;
+    const bool isDivisor = std::fabs(b) >= limits::zeroThreshold;
+    const double quotient = a / (isDivisor ? b : 1.0);
+    const double bound = a >= 0 ? infinity : a < 0 ? -infinity : a;
+    return isDivisor ? quotient : bound;
 }
 
 /// Integers divide toward zero and saturate.  A zero divisor yields a bound by the dividend's sign; only 0/0 of two

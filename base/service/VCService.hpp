@@ -27,8 +27,9 @@ class SymbolRegistry;
 enum class PairQuestion : std::uint8_t;
 struct ServiceParts;
 
-/// The conditions of a process, or of a part of it.  Conditions are over integers: every symbol stands for an integer, a truth value is an
-/// integer that is not zero.  One structure has one identifier, so that equal conditions have equal identifiers.
+/// The conditions of a process, or of a part of it.  Conditions are over integers: every symbol stands for an integer,
+/// a truth value is an integer that is not zero.  One structure has one identifier, so that equal conditions have equal
+/// identifiers.
 ///
 /// TRUE is printed as the empty text: what holds always needs no condition.  The empty text and "true" are TRUE,
 /// "false" is FALSE, exactly so and without a parser; every other text is read by the grammar of its language, whose

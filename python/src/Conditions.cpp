@@ -23,7 +23,7 @@ namespace vtsym::python {
 
 namespace {
 
-/// What combining returns instead of an identifier where the table is full.
+/// What combining, and making literals, returns instead of an identifier where the table is full.
 constexpr std::int64_t full = -1;
 
 std::int64_t numberOf(SymbolicExprId id) {
@@ -70,6 +70,12 @@ std::int64_t symbol(Table& table, const std::string& name) {
     if (isTruth || (op != VT::SymbolicOp::String && op != VT::SymbolicOp::MemberValue))
         throw std::invalid_argument("not a name: " + name);
     return numberOf(id);
+}
+
+template <class Node, class Value>
+std::int64_t literal(Table& table, Value value) {
+    const Brief use(table);
+    return table.isFull() ? full : numberOf(Node(table.nodes(), value).getId(table.nodes()));
 }
 
 /// One node; the service decides what constants do to conditions.
@@ -147,18 +153,10 @@ void addConditions(TableClass& table) {
         .def("symbol", &symbol, py::arg("name"))
         .def("combine", &combine, py::arg("op"), py::arg("a"), py::arg("b"))
         .def(
-            "integer",
-            [](Table& self, int value) {
-                const Brief use(self);
-                return VT::SymbolicIntValue(self.nodes(), value).getId(self.nodes());
-            },
+            "integer", [](Table& self, int value) { return literal<VT::SymbolicIntValue>(self, value); },
             py::arg("value"))
         .def(
-            "real",
-            [](Table& self, double value) {
-                const Brief use(self);
-                return VT::SymbolicDoubleValue(self.nodes(), value).getId(self.nodes());
-            },
+            "real", [](Table& self, double value) { return literal<VT::SymbolicDoubleValue>(self, value); },
             py::arg("value"))
         .def(
             "truth",

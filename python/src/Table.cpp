@@ -93,8 +93,11 @@ std::vector<SymbolicExprId> Table::adopt(Table& source, std::span<const Symbolic
 }
 
 std::shared_ptr<Table> Table::successor(SymbolicExprId first) {
-    if (auto known = successor_.lock())
-        return known;
+    if (successor_ != nullptr) {
+        const std::lock_guard lock(successor_->mutex);
+        if (!successor_->isFull())
+            return successor_;
+    }
     auto made = std::make_shared<Table>(bits32_, capacity_);
     std::vector<SymbolicExprId> assumed;
     for (const VT::VCSymbolicExprId& condition : service_.assumptions())

@@ -175,8 +175,8 @@ def test_assumptions() -> None:
         context.assume("N < 0")
 
 
-def test_full_tables_are_followed_by_others(monkeypatch: pytest.MonkeyPatch) -> None:
-    from vtsym import _nodes, _vtsym
+def test_full_tables_are_followed_by_others() -> None:
+    from vtsym import _vtsym
 
     context = Context()
     context._room.table = _vtsym.Table(False, 200)
@@ -190,6 +190,10 @@ def test_full_tables_are_followed_by_others(monkeypatch: pytest.MonkeyPatch) -> 
         every = every | (symbol == i)
         assert condition.equivalent(f"A == {i}")
     assert len(tables) > 5 and every.evaluate(A=1999) and not every.evaluate(A=2000)
+    for i in range(2000):  # questions about what a full table holds are asked in another one
+        assert (symbol > 0).implies(f"A > -{i} - 1") and not vtsym.parse("A > 0").replace({"A": i}).symbols
+        tables.add((symbol > 0)._table)
+    assert symbol._table.integer(123) < 0  # the full table grew no further
     assert str(every) == " || ".join(f"A=={i}" for i in range(2000))
 
 

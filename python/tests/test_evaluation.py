@@ -2,8 +2,6 @@
 
 from __future__ import annotations
 
-import random
-
 import numpy
 import pytest
 from conftest import RandomConditions, cases
@@ -122,7 +120,7 @@ def test_columns_that_do_not_fit() -> None:
 
 
 def test_random_types_beside_numpy() -> None:
-    rng = numpy.random.default_rng(random.Random(5).randrange(1000))
+    rng = numpy.random.default_rng(5)
     a, b = rng.integers(-1000, 1000, (2, 10_000)).astype(numpy.int32)
     x = rng.normal(size=10_000)
     columns = {"a": a, "b": b, "x": x}

@@ -119,18 +119,23 @@ def number_in(table: _vtsym.Table, node: Node) -> int:
     return node._id if node._table is table else table.adopt(node._table, node._id)
 
 
+def in_room(node: Node) -> tuple[_vtsym.Table, int]:
+    """The node's own table, or the successor that has room, and the node's number there."""
+    table, number = node._table, node._id
+    while table.is_full():
+        roomier = table.successor(number)
+        number = roomier.adopt(table, number)
+        table = roomier
+    return table, number
+
+
 def combine(kind: type[N], op: int, first: Node, second: Node) -> N:
     """Makes a node of an operator; an operator of one operand takes it twice."""
     table = first._table
-    a = first._id
-    b = second._id if second._table is table else table.adopt(second._table, second._id)
-    made = table.combine(op, a, b)
-    while made < 0:  # the table is full
-        roomier = table.successor(a)
-        a = roomier.adopt(table, a)
-        b = roomier.adopt(table, b)
-        table = roomier
-        made = table.combine(op, a, b)
+    made = table.combine(op, first._id, second._id) if second._table is table else -1
+    while made < 0:  # another table, or a full one
+        table, a = in_room(first)
+        made = table.combine(op, a, number_in(table, second))
     node = object.__new__(kind)
     node._table = table
     node._id = made
@@ -138,7 +143,7 @@ def combine(kind: type[N], op: int, first: Node, second: Node) -> N:
 
 
 def literal(table: _vtsym.Table, value: Value) -> int:
-    """The number of a literal, or of a truth constant."""
+    """The number of a literal, or of a truth constant; below 0 in a full table."""
     if isinstance(value, bool):
         return table.truth(value)
     if isinstance(value, int):

@@ -5,7 +5,7 @@ from __future__ import annotations
 from typing import TYPE_CHECKING, Any, Iterable, Mapping, Union
 
 from vtsym import _vtsym
-from vtsym._nodes import DEFAULT, OPERATORS, Node, Value, combine, literal, make, number_in
+from vtsym._nodes import DEFAULT, OPERATORS, N, Node, Value, combine, in_room, literal, make, number_in
 from vtsym.results import Decision, Reasons, Relation, SetDecision
 
 if TYPE_CHECKING:
@@ -106,16 +106,14 @@ class Condition(Node):
             return make(Condition, other._table, other._id)
         return make(Condition, self._table, self._table.truth(other))
 
-    def _number_of(self, other: AnyCondition) -> int:
-        """The number of another condition in the table of this one."""
+    def _beside(self, other: AnyCondition) -> tuple[_vtsym.Table, int, int]:
+        """A table with room, and the numbers of this condition and another one in it."""
+        table, number = in_room(self)
         if isinstance(other, str):
-            return self._table.parse(other, False)
+            return table, number, table.parse(other, False)
         if not isinstance(other, Node):
             raise TypeError(f"a condition or its text is needed, not {type(other).__name__}")
-        return number_in(self._table, other)
-
-    def _made(self, number: int) -> Condition:
-        return make(Condition, self._table, number)
+        return table, number, number_in(table, other)
 
     # Rewriting
 
@@ -136,7 +134,8 @@ class Condition(Node):
         >>> str(vtsym.parse("A < 3 || A > 3").simplify())
         'A!=3'
         """
-        return self._made(self._table.simplify(self._id))
+        table, number = in_room(self)
+        return make(Condition, table, table.simplify(number))
 
     def shortest(self) -> Condition:
         """The shortest form found that is proven equal for all integers.
@@ -145,7 +144,8 @@ class Condition(Node):
         >>> str(vtsym.parse("A*2 > B && B > A*2 - 2").shortest())
         '2*A==B+1'
         """
-        return self._made(self._table.shortest(self._id))
+        table, number = in_room(self)
+        return make(Condition, table, table.shortest(number))
 
     def given(self, known: AnyCondition) -> Condition:
         """The shortest form found that is equal wherever ``known`` holds.
@@ -154,7 +154,8 @@ class Condition(Node):
         >>> str(vtsym.parse("Mode != 2 && (Mode > 2 || Sport)").given("Mode == 1 || Mode == 2"))
         'Mode!=2 && Sport'
         """
-        return self._made(self._table.given(self._id, self._number_of(known)))
+        table, number, fact = self._beside(known)
+        return make(Condition, table, table.given(number, fact))
 
     def replace(self, replacements: Mapping[str, str | Operand]) -> Condition:
         """The condition with names replaced, all at once, by other names, numbers or expressions.
@@ -163,7 +164,7 @@ class Condition(Node):
         >>> str(vtsym.parse("A > B").replace({"A": "B", "B": 7}))
         'B>7'
         """
-        return self._made(self._table.replace(self._id, _numbers_of(self._table, replacements)))
+        return _replaced(self, replacements)
 
     # Deciding
 
@@ -174,15 +175,18 @@ class Condition(Node):
         >>> vtsym.parse("A > 17 && A < 391 && A*B == 391").can_hold().witness
         {'A': 23, 'B': 17}
         """
-        return Decision._of(self._table.can_hold(self._id))
+        table, number = in_room(self)
+        return Decision._of(table.can_hold(number))
 
     def must_hold(self) -> Decision:
         """Whether it holds for all values."""
-        return Decision._of(self._table.must_hold(self._id))
+        table, number = in_room(self)
+        return Decision._of(table.must_hold(number))
 
     def implies(self, other: AnyCondition) -> Decision:
         """Whether the other one holds wherever this one does."""
-        return Decision._of(self._table.implies(self._id, self._number_of(other)))
+        table, a, b = self._beside(other)
+        return Decision._of(table.implies(a, b))
 
     def equivalent(self, other: AnyCondition) -> Decision:
         """Whether both hold for the same values.
@@ -191,11 +195,13 @@ class Condition(Node):
         >>> bool(vtsym.parse("A > 2 && A < 4").equivalent("A == 3"))
         True
         """
-        return Decision._of(self._table.equivalent(self._id, self._number_of(other)))
+        table, a, b = self._beside(other)
+        return Decision._of(table.equivalent(a, b))
 
     def disjoint(self, other: AnyCondition) -> Decision:
         """Whether the two never hold together."""
-        return Decision._of(self._table.disjoint(self._id, self._number_of(other)))
+        table, a, b = self._beside(other)
+        return Decision._of(table.disjoint(a, b))
 
     def compare(self, other: AnyCondition) -> Relation:
         """How the two relate, with the values that prove it and the operands that force it.
@@ -205,21 +211,16 @@ class Condition(Node):
         >>> relation.kind, relation.reasons.operands
         ('disjoint', (Condition('Gear>2'), Condition('Gear<=1')))
         """
-        table = self._table
-        number = self._number_of(other)
-        kind, bound, first, second, both = table.compare(self._id, number)
+        table, a, b = self._beside(other)
+        kind, bound, first, second, both = table.compare(a, b)
         reasons: Reasons | None = None
         if kind == "disjoint":
-            reasons = self._reasons(table.why_disjoint([self._id, number]))
+            reasons = _reasons(table, table.why_disjoint([a, b]))
         elif kind == "implies":
-            reasons = self._reasons(table.why_implies(self._id, number))
+            reasons = _reasons(table, table.why_implies(a, b))
         elif kind == "implied by":
-            reasons = self._reasons(table.why_implies(number, self._id))
+            reasons = _reasons(table, table.why_implies(b, a))
         return Relation(kind, bound, Decision._of(first), Decision._of(second), Decision._of(both), reasons)
-
-    def _reasons(self, raw: tuple[bool, bool, list[int]]) -> Reasons | None:
-        is_proven, is_minimal, operands = raw
-        return Reasons(tuple(map(self._made, operands)), is_minimal) if is_proven else None
 
     # Evaluating
 
@@ -292,7 +293,12 @@ class Expression(Node):
         if isinstance(other, Expression):
             return other
         if isinstance(other, (int, float)):
-            return make(Expression, self._table, literal(self._table, other))
+            table = self._table
+            number = literal(table, other)
+            while number < 0:
+                table, _ = in_room(self)
+                number = literal(table, other)
+            return make(Expression, table, number)
         return None
 
     def _infix(self, op: int, other: Operand) -> Expression:
@@ -417,7 +423,8 @@ class Expression(Node):
         >>> str((vtsym.Symbol("A") - vtsym.Symbol("B") + vtsym.Symbol("A")).simplify())
         '2*A-B'
         """
-        return make(Expression, self._table, self._table.simplify(self._id))
+        table, number = in_room(self)
+        return make(Expression, table, table.simplify(number))
 
     def factored(self) -> Expression:
         """The form in which divisions are pulled outwards, as quotients of dimensions are exact.
@@ -426,11 +433,12 @@ class Expression(Node):
         >>> str(vtsym.dimension("N*2 + N/3").factored())
         '(N*2*3+N)/3'
         """
-        return make(Expression, self._table, self._table.factored(self._id))
+        table, number = in_room(self)
+        return make(Expression, table, table.factored(number))
 
     def replace(self, replacements: Mapping[str, str | Operand]) -> Expression:
         """The expression with names replaced, all at once; see :meth:`Condition.replace`."""
-        return make(Expression, self._table, self._table.replace(self._id, _numbers_of(self._table, replacements)))
+        return _replaced(make(Expression, self._table, self._id), replacements)
 
     def evaluate(self, values: Mapping[str, Any] | None = None, /, **named: Any) -> Any:
         """The value: a bool, an int, a float, or a list of these for a list of dimensions.
@@ -528,22 +536,29 @@ def disjoint(conditions: Iterable[Condition]) -> SetDecision:
 
 def _about_set(conditions: Iterable[Condition], question: str) -> SetDecision:
     members = list(conditions)
-    table = members[0]._table if members else DEFAULT.get()
+    table = in_room(members[0])[0] if members else DEFAULT.get()
     raw, pair = getattr(table, question)([number_in(table, member) for member in members])
     return SetDecision(Decision._of(raw), pair)
 
 
-def _numbers_of(table: _vtsym.Table, replacements: Mapping[str, str | Operand]) -> dict[int, int]:
+def _reasons(table: _vtsym.Table, raw: tuple[bool, bool, list[int]]) -> Reasons | None:
+    is_proven, is_minimal, operands = raw
+    return Reasons(tuple(make(Condition, table, each) for each in operands), is_minimal) if is_proven else None
+
+
+def _replaced(node: N, replacements: Mapping[str, str | Operand]) -> N:
+    table, number = in_room(node)
     numbers: dict[int, int] = {}
     for name, value in replacements.items():
         if isinstance(value, str):
-            number = table.symbol(value)
+            other = table.symbol(value)
         elif isinstance(value, Node):
-            number = number_in(table, value)
+            other = number_in(table, value)
         else:
-            number = literal(table, value)
-        numbers[table.symbol(name)] = number
-    return numbers
+            room = DEFAULT.get()
+            other = table.adopt(room, literal(room, value))
+        numbers[table.symbol(name)] = other
+    return make(type(node), table, table.replace(number, numbers))
 
 
 def _restored_condition(parts: list[tuple[int, Any, list[int]]]) -> Condition:

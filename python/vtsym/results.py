@@ -3,9 +3,7 @@
 from __future__ import annotations
 
 from dataclasses import dataclass, field
-from typing import TYPE_CHECKING, Dict, Optional, Tuple
-
-from typing import Literal
+from typing import TYPE_CHECKING, Dict, Literal, Optional, Tuple
 
 if TYPE_CHECKING:
     from vtsym.conditions import Condition

@@ -1,5 +1,6 @@
 // Every operator on every pair of corner values, and expressions in every way of evaluation, against arithmetic written
 // down again over wide integers.
+#include "base/eval/ColumnLoops.hpp"
 #include "base/eval/Eval.hpp"
 #include "base/eval/EvalVisitor.hpp"
 #include "tests/support/TreeReader.hpp"
@@ -501,7 +502,7 @@ TEST(Prepared, RunsManyRowsAsItRunsEach) {
             if (graph.below(20) != 0)
                 graph.table.registerValueId(symbol, literal(graph.table, graph.anyScalar()));
         PreparedExpr prepared = SymbolicExprEval(graph.table).prepare(graph.nodes[graph.nodes.size() - 1 - seed % 3]);
-        const std::size_t rows = graph.below(10) == 0 ? 9000 + graph.below(300) : graph.below(70);
+        const std::size_t rows = graph.below(10) == 0 ? 2100 + graph.below(300) : graph.below(70);
         std::vector<Column> columns;
         std::vector<ValueColumn> given;
         for (std::size_t slot = 0; slot < prepared.slotCount(); ++slot)
@@ -531,6 +532,40 @@ TEST(Prepared, RunsManyRowsAsItRunsEach) {
     }
     EXPECT_GT(values, 700U);
     EXPECT_GT(faults, 100U);
+}
+
+// The loops for wide registers leave the same bytes as those for every processor.
+TEST(ColumnLoops, AreTheSameForWideRegisters) {
+    if (!detail::hasWideRegisters())
+        GTEST_SKIP() << "this processor has no wide registers";
+    constexpr std::size_t rows = 1000;
+    std::array<std::vector<double>, scalarTypes> columns; // room for each type
+    std::mt19937_64 random(1);
+    for (std::size_t type = 0; type < scalarTypes; ++type) {
+        columns.at(type).resize(2 * rows);
+        for (std::size_t i = 0; i < 2 * rows; ++i) {
+            const SymbolicScalar value = corners()[random() % corners().size()];
+            if (type == 0)
+                reinterpret_cast<bool*>(columns[0].data())[i] = value.toDouble() > 0;
+            else if (type == 1)
+                reinterpret_cast<std::int32_t*>(columns[1].data())[i] = static_cast<std::int32_t>(Wide(value).bits());
+            else
+                columns[2][i] = visibleScalar(value.toDouble()).getDouble();
+        }
+    }
+    for (std::uint32_t code = 0; code < detail::endCode; ++code) {
+        const void* const left = columns.at(code % detail::typePairs / scalarTypes).data();
+        const auto& operand = columns.at(code % scalarTypes);
+        std::vector<double> plain(rows), wide(rows);
+        detail::columnLoop(code, false)(left, operand.data(), plain.data(), rows);
+        detail::columnLoop(code, true)(left, operand.data(), wide.data(), rows);
+        const ScalarRule& rule = scalarRules.at(static_cast<std::size_t>(detail::ruleOfCode(code)));
+        if (rule.by[code % detail::typePairs / scalarTypes][code % scalarTypes].result == ScalarType::Double) {
+            detail::copyVisible(std::vector(plain).data(), plain.data(), rows, false);
+            detail::copyVisible(std::vector(wide).data(), wide.data(), rows, true);
+        }
+        ASSERT_EQ(std::memcmp(plain.data(), wide.data(), rows * sizeof(double)), 0) << code;
+    }
 }
 
 TEST(Prepared, RefusesColumnsThatDoNotFit) {
