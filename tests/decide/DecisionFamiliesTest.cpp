@@ -125,7 +125,8 @@ TEST(DecisionFamilies, HostileTextsStayWithinSteps) {
          Answer::No, 40000},
         {"a long sum of multiples", repeated(many, "", "+", multiples) + "==5", Answer::Yes, 500000},
         {"calls with equal arguments", repeated(few, "", "&&", ones) + "&&" + repeated(few, "", "&&", calls),
-         Answer::No, 200000},
+         Answer::No, 800000},
+        {"calls with different values", repeated(250, "", "&&", calls), Answer::Yes, limits::decisionSteps},
         {"guarded comparisons", repeated(few, "", "&&", guarded), Answer::Yes, 2000000},
         {"sums of two names", repeated(many, "", "&&", tied), Answer::No, 140000},
     };
