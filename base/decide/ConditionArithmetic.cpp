@@ -281,7 +281,11 @@ std::optional<RationalForm> ConditionReader::floor(const RationalForm& form, con
     BigInteger common = divisor;
     for (const WidePart& part : wide.parts) {
         BigInteger quotient = VT::floorDivide(BigInteger(2 * part.factor + divisor - 1), BigInteger(2 * divisor));
-        const BigInteger remainder = part.factor - quotient * divisor; // at most half the divisor, up or down
+        BigInteger remainder = part.factor - quotient * divisor; // at most half the divisor, up or down
+        if (wide.parts.size() == 1 && part.factor < 0 && 2 * remainder == divisor) { // -X / 2 is like X / 2
+            remainder -= divisor;
+            ++quotient;
+        }
         if (quotient != 0)
             whole.parts.push_back({part.unknown, std::move(quotient)});
         if (remainder == 0)

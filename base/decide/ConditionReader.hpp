@@ -56,7 +56,7 @@ public:
 
 private:
     /// Adding up a part of a sum is that much cheaper than joining an edge of diagrams.
-    static constexpr std::size_t partsPerStep = 8;
+    static constexpr std::size_t partsPerStep = 4;
 
     /// The form's value where the guard holds.
     struct Case {

@@ -59,9 +59,10 @@ std::optional<RationalForm> withinLimits(WideForm form) {
 } // namespace
 
 std::size_t costOf(const WideForm& form) {
+    constexpr std::size_t call = 8;
     const auto cost = [](const BigInteger& number) {
         const std::size_t words = number.backend().size();
-        return words * words;
+        return call + words * words;
     };
     std::size_t sum = cost(form.constant) + cost(form.denominator);
     for (const WidePart& part : form.parts)

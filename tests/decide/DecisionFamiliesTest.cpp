@@ -78,6 +78,72 @@ TEST(DecisionFamilies, StayWithinSteps) {
     }
 }
 
+/// A beginning and further texts, an operator between them, until there are so many bytes.
+std::string repeated(std::size_t bytes, const std::string& begin, const std::string& op,
+                     const std::function<std::string(int)>& text) {
+    std::string all = begin;
+    for (int i = 0; all.size() < bytes; ++i)
+        all += (i > 0 || !begin.empty() ? op : "") + text(i);
+    return all;
+}
+
+/// Texts that are made to be hard: what is decided, and in how many steps.
+TEST(DecisionFamilies, HostileTextsStayWithinSteps) {
+    const auto name = [](int i) { return "a" + std::to_string(i); };
+    const auto number = [](int i) { return std::to_string(i); };
+    const auto quotients = [](int) { return std::string("3*2%1000"); };
+    const auto halves = [](int) { return std::string("2"); };
+    const auto masks = [&](int i) { return number(255 + i % 7) + "|" + number(i % 31); };
+    const auto multiples = [&](int i) { return number(i * 7919 % 1000 + 1) + "*" + name(i); };
+    const auto calls = [&](int i) { return "f(" + name(i) + ")==" + number(i); };
+    const auto ones = [&](int i) { return name(i) + "==1"; };
+    const auto guarded = [&](int i) {
+        return "(defined(M" + number(i) + ")&&M" + number(i) + ">=" + number(i) + "||" + name(i % 10) + "<" +
+               number(i * 37 % 100) + ")";
+    };
+    const auto tied = [&](int i) {
+        return number(i * 7919 % 1000003 + 17) + "*" + name(i % 6) + "-" + number(i * 104729 % 1000033 + 13) + "*" +
+               name((i + 1 + i / 6) % 6) + ">" + number(i * 31);
+    };
+    constexpr std::size_t few = 1000;
+    constexpr std::size_t many = 60000;
+
+    const struct {
+        const char* name;
+        std::string text;
+        Answer answer;
+        std::uint64_t most;
+    } families[] = {
+        {"quotients and remainders", repeated(few, "X", "/", quotients) + "==7", Answer::No, 600000},
+        {"many quotients and remainders", repeated(many, "X", "/", quotients) + "==7", Answer::Undecided,
+         limits::decisionSteps},
+        {"halves", repeated(few, "X", "/", halves) + "==0", Answer::Yes, 200000},
+        {"masks", repeated(many, "X", "&", masks) + "==7", Answer::Yes, 300000},
+        {"a sum of names", repeated(few, "", "+", name) + ">5", Answer::Yes, 15000},
+        {"a long sum of names", repeated(many, "", "+", name) + ">5", Answer::Yes, 600000},
+        {"two long sums", repeated(many / 2, "", "+", name) + ">5&&" + repeated(many / 2, "", "+", name) + "<3",
+         Answer::No, 40000},
+        {"a long sum of multiples", repeated(many, "", "+", multiples) + "==5", Answer::Yes, 500000},
+        {"calls with equal arguments", repeated(few, "", "&&", ones) + "&&" + repeated(few, "", "&&", calls),
+         Answer::No, 800000},
+        {"calls with different values", repeated(250, "", "&&", calls), Answer::Yes, limits::decisionSteps},
+        {"guarded comparisons", repeated(few, "", "&&", guarded), Answer::Yes, 2000000},
+        {"sums of two names", repeated(many, "", "&&", tied), Answer::No, 140000},
+    };
+
+    for (const auto& [title, text, answer, most] : families) {
+        DecisionFixture bench;
+        const SymbolicExprId id = bench.parse(text);
+        const Decision decision = bench.decider.canHold(id);
+        EXPECT_EQ(decision.answer, answer) << title << ": " << bench.decider.stepsTaken();
+        EXPECT_LE(bench.decider.stepsTaken(), most) << title;
+        RecordProperty(title, std::to_string(bench.decider.stepsTaken()));
+        if (decision.witness) {
+            EXPECT_EQ(bench.decider.holds(id, *decision.witness), true) << title;
+        }
+    }
+}
+
 /// Conditions at the threshold where half can hold, against a solver.
 TEST(DecisionFamilies, RandomClausesAreDecidedAsASolverDoes) {
     std::mt19937_64 random(42);

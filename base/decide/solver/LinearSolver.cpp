@@ -1,11 +1,11 @@
-// Hands linear constraints to the Omega test, with numbers of 64 bits first, and narrows a solution down to the
+// Hands linear constraints to the reduction, with numbers of 64 bits first, and narrows a solution down to the
 // smallest.
 //
-// Method: a system whose numbers leave 64 bits is solved again from the start with big integers.  A system that takes
-// the Omega test too long, because its constraints multiply, is solved by branch and bound alone.  The smallest
+// Method: a system whose numbers leave 64 bits is solved again from the start with big integers.  The smallest
 // solution is found by bisection: the values within a distance of 0 are the more the greater the distance is.
 //
-// Cost: that of the Omega test; the smallest solution takes a logarithmic number of them for each variable.
+// Cost: that of the reduction and of the search for an integer point; the smallest solution takes a logarithmic number
+// of them for each variable.
 #include "base/decide/solver/LinearSolver.hpp"
 
 #include "base/core/Limits.hpp"

@@ -1,8 +1,8 @@
 // Compares the calls of a witness by their functions and the values of their arguments.
 //
 // Arguments are evaluated under the witness, and calls are sorted by name and values, so that the calls to compare are
-// neighbours. A call with an argument without a value is equal to no other. The pair that is found depends on the
-// calls' order alone. n log n comparisons of argument lists.
+// neighbours. A call with an argument without a value is equal to no other. What is found depends on the calls'
+// order alone. n log n comparisons of argument lists, and one for each pair of neighbours with equal ones.
 #include "base/decide/witness/CallCongruence.hpp"
 
 #include "base/core/Nodes.hpp"
@@ -14,6 +14,9 @@
 namespace VT {
 
 namespace {
+
+/// Pairs that one look at a witness reports.  Further ones are found with the next witness.
+constexpr std::size_t atOnce = 4096;
 
 struct Call {
     SymbolicExprId name;
@@ -79,11 +82,16 @@ CallCongruence::findViolations(std::span<const SymbolicExprId> calls, const Witn
     };
     std::ranges::sort(all, before);
     std::vector<std::pair<std::size_t, std::size_t>> violations;
-    for (std::size_t i = 1; i < all.size(); ++i) {
-        const Call& a = all[i - 1];
-        const Call& b = all[i];
-        if (a.name == b.name && a.arguments == b.arguments && a.value != b.value)
-            violations.emplace_back(a.position, b.position);
+    for (std::size_t i = 0; i < all.size(); ++i) {
+        const Call& a = all[i];
+        for (std::size_t j = i + 1; j < all.size() && violations.size() < atOnce; ++j) {
+            const Call& b = all[j];
+            steps_.take();
+            if (a.name != b.name || a.arguments != b.arguments)
+                break;
+            if (a.value != b.value)
+                violations.emplace_back(a.position, b.position);
+        }
     }
     std::ranges::sort(violations);
     std::vector<std::pair<SymbolicExprId, SymbolicExprId>> pairs;

@@ -230,7 +230,6 @@ std::vector<std::int64_t> WitnessSearch::candidates(const std::vector<std::int64
 bool WitnessSearch::confirmWith(std::span<const Change> changes) {
     if (triesLeft_ == 0)
         return false;
-    --triesLeft_;
     const std::size_t before = system_.size();
     for (const auto& [at, value] : changes)
         base_[at].second = value;
@@ -241,6 +240,7 @@ bool WitnessSearch::confirmWith(std::span<const Change> changes) {
     }
     bool confirmed = computeTerms(values);
     if (confirmed) {
+        --triesLeft_;
         for (const Term& term : terms_) {
             confirmed = confirmed && isWithinBound(values[term.number]);
             if (confirmed)
@@ -286,11 +286,12 @@ bool WitnessSearch::confirmNear(const std::vector<std::int64_t>& solution) {
             }
         }
     }
+    const std::size_t kept = triesLeft_ / 2; // for other paths
     base_ = zeros;
     for (std::size_t i = movable_.size(); i-- > 1;) { // what one sum gains another may have to lose
         for (std::size_t j = i; j-- > 0;) {
             for (const std::int64_t value : possible[j])
-                if (confirmWith(std::array{Change(j, value), Change(i, -value)}))
+                if (triesLeft_ > kept && confirmWith(std::array{Change(j, value), Change(i, -value)}))
                     return true;
             base_ = zeros;
         }
@@ -301,7 +302,7 @@ bool WitnessSearch::confirmNear(const std::vector<std::int64_t>& solution) {
                 for (std::size_t j = i; j-- > 0;) {
                     for (std::size_t a = 0; a < std::min(reach, possible[j].size()); ++a) {
                         for (std::size_t b = 0; b < std::min(reach, possible[i].size()); ++b) {
-                            if (triesLeft_ == 0)
+                            if (triesLeft_ <= kept)
                                 return false;
                             base_ = base;
                             if (confirmWith(std::array{Change(j, possible[j][a]), Change(i, possible[i][b])}))
