@@ -120,6 +120,7 @@ Finding findingOf(const std::string& file, const VT::BranchFinding& found, std::
     finding.message = messageOf(found);
     finding.condition = found.condition;
     finding.because = found.because;
+    finding.redundant = found.redundant;
     if (!found.proposed.empty())
         finding.proposed = found.proposed;
     for (const VT::BranchReason& reason : found.reasons) {
