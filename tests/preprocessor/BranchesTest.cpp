@@ -473,6 +473,48 @@ TEST_P(Branches, AreWhatAPreprocessorMakesOfThem) {
         EXPECT_GT(times, 10);
 }
 
+/// The operands of a reason force a finding, and without any one of them another definition is there.
+TEST(ReasonsOfBranches, AreTheFewestOperands) {
+    std::mt19937_64 random(5);
+    std::size_t asked = 0;
+    for (int i = 0; i < 40 && !::testing::Test::HasFailure(); ++i) {
+        const RandomSource source(random, true);
+        std::string questions;
+        std::vector<std::pair<bool, std::string>> expected; // whether the answer is yes for some definition
+        const auto ask = [&](const std::vector<std::string>& operands, bool isYes) {
+            std::string condition = "1";
+            for (const std::string& operand : operands)
+                condition += " && (" + operand + ")";
+            questions += "#if " + condition + "\n@" + std::to_string(expected.size()) + "\n#endif\n";
+            expected.emplace_back(isYes, condition);
+        };
+        SourceScanner({.why = true}).scan(source.text, false, [&](const BranchFinding& finding) {
+            const bool isDead = finding.kind == BranchFindingKind::Dead;
+            if ((!isDead && finding.proposed != "1") || finding.condition.empty() || finding.because.empty())
+                return;
+            EXPECT_TRUE(finding.isMinimal);
+            std::vector<std::string> operands = finding.because;
+            if (!isDead)
+                operands.push_back("!(" + finding.condition + ")");
+            ask(operands, false);
+            for (std::size_t left = 0; left < finding.because.size(); ++left) {
+                std::vector<std::string> others = operands;
+                others.erase(others.begin() + static_cast<std::ptrdiff_t>(left));
+                ask(others, true);
+            }
+        });
+        std::set<int> answers;
+        for (const std::set<int>& world : entered(questions, source.values))
+            answers.insert(world.begin(), world.end());
+        for (std::size_t question = 0; question < expected.size(); ++question)
+            EXPECT_EQ(answers.contains(static_cast<int>(question)), expected[question].first)
+                << expected[question].second << "\n"
+                << source.text;
+        asked += expected.size();
+    }
+    EXPECT_GT(asked, 500U);
+}
+
 TEST(ChangedBranches, AreBuiltInOtherCases) {
     std::mt19937_64 random(4);
     std::size_t reported = 0;

@@ -53,6 +53,8 @@ void appendTexts(const char* name, const std::vector<std::string>& texts, std::s
 void appendReasons(const Finding& finding, std::string& json) {
     appendTexts("redundant", finding.redundant, json);
     appendTexts("because", finding.because, json);
+    if (finding.mayNeedFewer)
+        appendMember(json, "minimal", "false");
 }
 
 /// Appends what is known of a finding beyond one scan in one build.
@@ -280,7 +282,7 @@ std::string sentenceOf(const Finding& finding) {
             sentence.append(&text == texts.data() ? what : ", ").append(text);
     };
     append("; redundant: ", finding.redundant);
-    append("; because: ", finding.because);
+    append(finding.mayNeedFewer ? "; because, perhaps of fewer: " : "; because: ", finding.because);
     return sentence;
 }
 
