@@ -295,7 +295,7 @@ std::optional<DirectiveConstant> DirectiveConditionReader::known(std::uint32_t f
     std::vector<std::string_view> used;
     const auto value = BuildMacros::valueOf(
         tokens_.subspan(first, last - first + 1), [this](std::string_view name) { return macroOf(name); },
-        truthConstants_, &used);
+        truthConstants_, valueBudget_, &used);
     for (const std::string_view name : used)
         if (macroOf(name) != nullptr && std::ranges::find(macros, name) == macros.end())
             macros.emplace_back(name);

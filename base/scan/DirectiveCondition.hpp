@@ -118,6 +118,7 @@ private:
     MacroUnknowns& unknowns_;
     bool truthConstants_;
     const BuildMacros* build_;
+    BuildMacros::Budget valueBudget_{}; ///< for all conditions
     std::span<const DirectiveToken> tokens_;
     DirectiveCondition condition_;
     std::vector<Operand> operands_;

@@ -217,6 +217,11 @@ void FileScan::judgeBranch(const Directive& directive, const DirectiveCondition&
         BranchWhy why = this->why(directive, condition, verdict, known, reasons);
         result.because = std::move(why.operands);
         result.isMinimal = why.isMinimal;
+        if (verdict.kind == BranchVerdictKind::Removable) {
+            const SpelledCondition spelled{
+                condition.node, {directive.tokens.begin(), directive.tokens.end()}, condition.spellings};
+            result.redundant = lostOperands(table_, unknowns_, spelled, verdict.shorter);
+        }
     }
     Chain& chain = chains_.back();
     chain.silent = verdict.kind == BranchVerdictKind::Dead;

@@ -9,30 +9,54 @@
 #include "base/scan/FileScan.hpp"
 
 #include <algorithm>
+#include <unordered_map>
 #include <utility>
 
 namespace VT {
 
 namespace {
 
-/// Adds the findings of a configuration to those of the file.
-void merge(std::vector<BranchFinding>& all, std::vector<BranchFinding> found, std::size_t configuration) {
-    const std::size_t known = all.size();
-    for (BranchFinding& finding : found) {
-        const auto end = all.begin() + static_cast<std::ptrdiff_t>(known);
-        const auto same = std::find_if(all.begin(), end, [&](const BranchFinding& other) {
-            return other.region.line == finding.region.line && other.kind == finding.kind &&
-                   other.proposed == finding.proposed;
-        });
-        if (same == end) {
-            finding.configurations = {configuration};
-            all.push_back(std::move(finding));
-        } else if (!same->configurations.empty()) { // not in every build
-            same->configurations.push_back(configuration);
-            same->hasOtherReasons = same->hasOtherReasons || same->reasons != finding.reasons;
+/// The findings of one file in all of its configurations.
+class FileFindings {
+public:
+    /// Adds the findings of a configuration; nothing for those that hold in every build.
+    void add(std::vector<BranchFinding> found, std::optional<std::size_t> configuration) {
+        const std::size_t known = all_.size();
+        for (BranchFinding& finding : found) {
+            BranchFinding* const same = configuration ? find(finding, known) : nullptr;
+            if (same == nullptr) {
+                if (configuration)
+                    finding.configurations = {*configuration};
+                byLine_.emplace(finding.region.line, all_.size());
+                all_.push_back(std::move(finding));
+            } else if (!same->configurations.empty()) { // not in every build
+                same->configurations.push_back(*configuration);
+                same->hasOtherReasons = same->hasOtherReasons || same->reasons != finding.reasons;
+            }
         }
     }
-}
+
+    /// All in the order of their lines.
+    std::vector<BranchFinding> take() {
+        std::ranges::stable_sort(all_, {}, [](const BranchFinding& finding) { return finding.region.line; });
+        return std::move(all_);
+    }
+
+private:
+    /// Returns a finding about the same directive that is equal, among the first `known`.
+    BranchFinding* find(const BranchFinding& finding, std::size_t known) {
+        const auto [begin, end] = byLine_.equal_range(finding.region.line);
+        for (auto each = begin; each != end; ++each) {
+            BranchFinding& other = all_[each->second];
+            if (each->second < known && other.kind == finding.kind && other.proposed == finding.proposed)
+                return &other;
+        }
+        return nullptr;
+    }
+
+    std::vector<BranchFinding> all_;
+    std::unordered_multimap<std::uint64_t, std::size_t> byLine_; ///< positions
+};
 
 } // namespace
 
@@ -87,13 +111,13 @@ bool SourceScanner::assumptionsCanHold() {
 }
 
 void SourceScanner::scan(const SourceFile& file, const std::function<void(const BranchFinding&)>& report) {
-    std::vector<BranchFinding> all = state_->scan(file, nullptr);
+    FileFindings all;
+    all.add(state_->scan(file, nullptr), std::nullopt);
     const std::size_t most = std::min(file.configurations.size(), limits::scanConfigurations);
     for (std::size_t i = 0; i < most; ++i)
-        merge(all, state_->scan(file, file.configurations[i]), i);
+        all.add(state_->scan(file, file.configurations[i]), i);
     state_->counts.leftOut += file.configurations.size() - most;
-    std::ranges::stable_sort(all, {}, [](const BranchFinding& finding) { return finding.region.line; });
-    std::ranges::for_each(all, report);
+    std::ranges::for_each(all.take(), report);
 }
 
 void SourceScanner::scan(std::string_view text, bool isCpp, const std::function<void(const BranchFinding&)>& report) {

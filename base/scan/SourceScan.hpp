@@ -63,6 +63,8 @@ struct BranchFinding {
     /// The operands that force the finding, as written or negated; none unless they are asked for.
     std::vector<std::string> because{};
     bool isMinimal = false; ///< without any one of them the finding does not follow
+    /// Operands that a shorter condition leaves out, as written; none unless they are asked for.
+    std::vector<std::string> redundant{};
     /// Configurations of the build that the finding holds for, by number; none for one that holds in every build.
     std::vector<std::size_t> configurations{};
     bool hasOtherReasons = false; ///< in some of the configurations

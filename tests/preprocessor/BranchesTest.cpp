@@ -1,5 +1,7 @@
 // Findings of a scan compared with a real preprocessor under every definition of the macros of a small world.
 #include "base/scan/SourceScan.hpp"
+#include "base/scan/changes/BranchMeanings.hpp"
+#include "base/scan/report/Suppressions.hpp"
 #include "tests/preprocessor/Judges.hpp"
 
 #include <gtest/gtest.h>
@@ -28,6 +30,7 @@ struct Branch {
     int parent; ///< -1 for none
     std::vector<int> earlier;
     bool isElse;
+    bool isKept; ///< a comment suppresses its findings
 };
 
 /// A file of chains within each other.  Each branch holds its number after an @.
@@ -88,6 +91,31 @@ public:
         if (isOdd || made.assumed.find_first_of("FJ\\\u00e9") != std::string::npos)
             made.assumed.clear(); // not about A, B and C alone
         return made;
+    }
+
+    /// The text with another condition of one branch.
+    struct Rewritten {
+        std::string text;
+        ChangedLines lines;
+    };
+
+    Rewritten rewritten() {
+        std::vector<std::size_t> candidates;
+        for (std::size_t i = 0; i < branches.size(); ++i)
+            if (!branches[i].isElse)
+                candidates.push_back(i);
+        const std::size_t at = candidates[below(candidates.size())];
+        const Branch& branch = branches[at];
+        std::size_t begin = 0;
+        for (std::size_t line = 1; line < branch.line; ++line)
+            begin = text.find('\n', begin) + 1;
+        const std::size_t end = text.find("@" + std::to_string(at) + "\n", begin);
+        const std::string fresh = std::string(branch.earlier.empty() ? "#if " : "#elif ") + condition(2) + "\n";
+        const auto lines = [](const std::string& part) {
+            return static_cast<std::uint64_t>(std::ranges::count(part, '\n'));
+        };
+        return {text.substr(0, begin) + fresh + text.substr(end),
+                {branch.line, lines(text.substr(begin, end - begin)), branch.line, lines(fresh)}};
     }
 
     std::string text;
@@ -208,9 +236,15 @@ private:
 
     void addBranch(const std::string& directive, int parent, const std::vector<int>& earlier, std::size_t depth) {
         const int number = static_cast<int>(branches.size());
-        branches.push_back(
-            {static_cast<std::size_t>(std::ranges::count(text, '\n')) + 1, parent, earlier, directive == "#else"});
-        add(directive);
+        const std::size_t keep = plain_ ? 9 : below(9);
+        if (keep == 0)
+            add(oneOf("// vtsym: keep, above", "/* vtsym: keep dead,\n above */  "));
+        branches.push_back({static_cast<std::size_t>(std::ranges::count(text, '\n')) + 1, parent, earlier,
+                            directive == "#else", keep < 2});
+        add(directive + (keep == 1
+                             ? oneOf(" // vtsym: keep, \\\n here", " /* vtsym: keep, here */", "/*vtsym:keep,here\n*/")
+                         : keep == 2 ? " // a vtsym: keep, in prose"
+                                     : ""));
         add("@" + std::to_string(number));
         for (std::size_t i = below(depth == 0 ? 3 : 2); i > 0 && depth < 3; --i) {
             if (!plain_ && below(3) == 0)
@@ -359,7 +393,21 @@ std::size_t commentsIn(const std::string& text) {
     return count;
 }
 
+void checkSuppressions(const RandomSource& source) {
+    std::set<std::uint64_t> expected;
+    for (const Branch& branch : source.branches)
+        if (branch.isKept)
+            expected.insert(branch.line);
+    std::set<std::uint64_t> read;
+    for (const Suppression& suppression : readSuppressions(source.text)) {
+        EXPECT_FALSE(suppression.isMalformed) << suppression.text;
+        read.insert(suppression.line.value_or(0));
+    }
+    EXPECT_EQ(read, expected) << source.text;
+}
+
 void check(const RandomSource& source, bool plain, std::map<BranchFindingKind, int>& counts) {
+    checkSuppressions(source);
     const std::vector<std::set<int>> worlds = entered(source.text, source.values);
     ASSERT_EQ(worlds.size(), plain ? 343U : 64U);
     std::map<int, BranchFindingKind> found;
@@ -423,6 +471,81 @@ TEST_P(Branches, AreWhatAPreprocessorMakesOfThem) {
               << ", removable " << counts[BranchFindingKind::Removable] << "\n";
     for (const auto& [kind, times] : counts)
         EXPECT_GT(times, 10);
+}
+
+/// The operands of a reason force a finding, and without any one of them another definition is there.
+TEST(ReasonsOfBranches, AreTheFewestOperands) {
+    std::mt19937_64 random(5);
+    std::size_t asked = 0;
+    for (int i = 0; i < 40 && !::testing::Test::HasFailure(); ++i) {
+        const RandomSource source(random, true);
+        std::string questions;
+        std::vector<std::pair<bool, std::string>> expected; // whether the answer is yes for some definition
+        const auto ask = [&](const std::vector<std::string>& operands, bool isYes) {
+            std::string condition = "1";
+            for (const std::string& operand : operands)
+                condition += " && (" + operand + ")";
+            questions += "#if " + condition + "\n@" + std::to_string(expected.size()) + "\n#endif\n";
+            expected.emplace_back(isYes, condition);
+        };
+        SourceScanner({.why = true}).scan(source.text, false, [&](const BranchFinding& finding) {
+            const bool isDead = finding.kind == BranchFindingKind::Dead;
+            if ((!isDead && finding.proposed != "1") || finding.condition.empty() || finding.because.empty())
+                return;
+            EXPECT_TRUE(finding.isMinimal);
+            std::vector<std::string> operands = finding.because;
+            if (!isDead)
+                operands.push_back("!(" + finding.condition + ")");
+            ask(operands, false);
+            for (std::size_t left = 0; left < finding.because.size(); ++left) {
+                std::vector<std::string> others = operands;
+                others.erase(others.begin() + static_cast<std::ptrdiff_t>(left));
+                ask(others, true);
+            }
+        });
+        std::set<int> answers;
+        for (const std::set<int>& world : entered(questions, source.values))
+            answers.insert(world.begin(), world.end());
+        for (std::size_t question = 0; question < expected.size(); ++question)
+            EXPECT_EQ(answers.contains(static_cast<int>(question)), expected[question].first)
+                << expected[question].second << "\n"
+                << source.text;
+        asked += expected.size();
+    }
+    EXPECT_GT(asked, 500U);
+}
+
+TEST(ChangedBranches, AreBuiltInOtherCases) {
+    std::mt19937_64 random(4);
+    std::size_t reported = 0;
+    std::size_t unchanged = 0;
+    for (int i = 0; i < 60 && !::testing::Test::HasFailure(); ++i) {
+        RandomSource source(random, true);
+        const RandomSource::Rewritten fresh = source.rewritten();
+        const std::vector<std::set<int>> before = entered(source.text, source.values);
+        const std::vector<std::set<int>> after = entered(fresh.text, source.values);
+        std::set<int> found;
+        for (const ChangedBranch& changed : changedBranches(source.text, fresh.text, false, {fresh.lines})) {
+            const std::size_t at = offsetOf(fresh.text, changed.region.line, 1);
+            found.insert(std::stoi(fresh.text.substr(fresh.text.find('@', at) + 1)));
+        }
+        reported += found.size();
+        for (std::size_t k = 0; k < source.branches.size(); ++k) {
+            const int number = static_cast<int>(k);
+            bool differs = false;
+            for (std::size_t world = 0; world < before.size(); ++world)
+                differs = differs || before[world].contains(number) != after[world].contains(number);
+            unchanged += differs ? 0U : 1U;
+            bool isReported = false; // or one around it
+            for (int each = number; each >= 0; each = source.branches[static_cast<std::size_t>(each)].parent)
+                isReported = isReported || found.contains(each);
+            EXPECT_TRUE(differs ? isReported : !found.contains(number)) << number << "\n"
+                                                                        << source.text << "\nand\n"
+                                                                        << fresh.text;
+        }
+    }
+    EXPECT_GT(reported, 30U);
+    EXPECT_GT(unchanged, 100U);
 }
 
 TEST(BranchesOfBuilds, AreWhatAPreprocessorMakesOfThem) {

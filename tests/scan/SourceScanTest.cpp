@@ -17,6 +17,8 @@ std::string lineOf(const BranchFinding& found) {
     for (const BranchReason& reason : found.reasons)
         line += (reason.holds ? " @" : " !") +
                 (reason.kind == BranchReasonKind::Directive ? std::to_string(reason.region.line) : reason.directive);
+    for (const std::string& operand : found.redundant)
+        line += " without " + operand;
     for (std::size_t i = 0; i < found.because.size(); ++i)
         line += (i == 0 ? " because " : ", ") + found.because[i];
     for (const std::size_t configuration : found.configurations)
@@ -74,6 +76,23 @@ TEST(Findings, OfBuilds) {
                 file.configurations.push_back(&build);
         EXPECT_EQ(findings(std::move(scanner), file), row[3]) << row[0] << "\n" << row[2];
     }
+}
+
+TEST(Findings, OfMacrosThatGrow) {
+    BuildMacros build;
+    const auto name = [](int i) { return "A" + std::to_string(i); };
+    EXPECT_TRUE(build.define("A0=1"));
+    for (int i = 1; i < 60; ++i)
+        EXPECT_TRUE(build.define(name(i) + "=(" + name(i - 1) + "+" + name(i - 1) + ")"));
+    SourceFile file{"#if A5 == 32\n#elif A59 == 0\n#endif", true};
+    file.configurations = {&build};
+    EXPECT_EQ(findings(SourceScanner(), file).find("1 always A5 == 32"), 0U);
+    std::string many;
+    for (int i = 0; i < 20'000; ++i)
+        many += "#if A59 + " + std::to_string(i) + "\n#endif\n";
+    file.text = many;
+    EXPECT_EQ(findings(SourceScanner(), file), "");
+    EXPECT_FALSE(build.define("1") || build.define("") || build.undefine("A B") || build.undefine(""));
 }
 
 TEST(Findings, OfLongFiles) {

@@ -120,6 +120,7 @@ void BuildMacros::addFile(const std::string& name, std::string_view text, bool i
     }
     const auto lookup = [this](std::string_view macro) { return find(macro); };
     Branches branches;
+    Budget budget;
     DirectiveReader reader(text);
     for (Directive directive; reader.next(directive);) {
         const std::span<const DirectiveToken> tokens = directive.tokens;
@@ -128,7 +129,7 @@ void BuildMacros::addFile(const std::string& name, std::string_view text, bool i
             return macro == nullptr ? std::nullopt : std::optional(macro->isDefined);
         };
         const auto holds = [&]() -> std::optional<bool> {
-            const auto value = valueOf(tokens, lookup, isCpp);
+            const auto value = valueOf(tokens, lookup, isCpp, budget);
             return value ? std::optional(value->bits != 0) : std::nullopt;
         };
         const auto opposite = [](std::optional<bool> value) { return value ? std::optional(!*value) : value; };

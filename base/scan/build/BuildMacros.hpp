@@ -1,9 +1,11 @@
 // The macros that a build defines before a file: options -D and -U, and files of definitions.
 #pragma once
 
+#include "base/core/Limits.hpp"
 #include "base/scan/ConstantArithmetic.hpp"
 #include "base/scan/DirectiveReader.hpp"
 
+#include <cstdint>
 #include <functional>
 #include <memory>
 #include <optional>
@@ -57,10 +59,17 @@ public:
     /// What is known of a macro at a place of a file; nullptr for nothing.
     using Lookup = std::function<const Macro*(std::string_view name)>;
 
-    /// Computes an expression of a directive.  Nothing where its value is not known.  Appends the names of the macros
-    /// that were looked up to `used`.  Linear in the tokens that the macros become, up to limits::expandedTokens.
+    /// What computing values has cost, and may cost, in tokens.
+    struct Budget {
+        std::uint64_t left = limits::scanSteps;
+    };
+
+    /// Computes an expression of a directive.  Nothing where its value is not known, or the budget is used up.  Appends
+    /// the names of the macros that were looked up to `used`, each once.  Linear in the tokens that the macros become,
+    /// up to limits::expandedTokens.
     static std::optional<DirectiveConstant> valueOf(std::span<const DirectiveToken> tokens, const Lookup& lookup,
-                                                    bool isCpp, std::vector<std::string_view>* used = nullptr);
+                                                    bool isCpp, Budget& budget,
+                                                    std::vector<std::string_view>* used = nullptr);
 
     /// A text that is equal for equal macros.
     [[nodiscard]] const std::string& key() const noexcept { return key_; }

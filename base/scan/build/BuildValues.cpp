@@ -9,6 +9,7 @@
 #include "base/scan/build/BuildMacros.hpp"
 
 #include <algorithm>
+#include <unordered_set>
 
 namespace VT {
 
@@ -19,9 +20,11 @@ using Value = std::optional<DirectiveConstant>;
 /// The tokens of an expression, with macros that stand for tokens expanded.
 class Expansion {
 public:
-    Expansion(std::span<const DirectiveToken> tokens, const BuildMacros::Lookup& lookup)
+    Expansion(std::span<const DirectiveToken> tokens, const BuildMacros::Lookup& lookup, BuildMacros::Budget& budget)
         : lookup_(lookup),
-          frames_{{tokens, {}}} {}
+          frames_{{tokens, {}}},
+          budget_(budget),
+          left_(std::min<std::uint64_t>(limits::expandedTokens, budget.left)) {}
 
     /// The next token; nullptr at the end and beyond the bound.
     const DirectiveToken* peek() {
@@ -33,6 +36,7 @@ public:
     void skip() {
         frames_.back().tokens = frames_.back().tokens.subspan(1);
         --left_;
+        --budget_.left;
     }
 
     /// Whether the end was reached rather than the bound.
@@ -66,14 +70,15 @@ private:
 
     const BuildMacros::Lookup& lookup_;
     std::vector<Frame> frames_;
-    std::size_t left_ = limits::expandedTokens;
+    BuildMacros::Budget& budget_;
+    std::uint64_t left_;
 };
 
 class Evaluation {
 public:
     Evaluation(std::span<const DirectiveToken> tokens, const BuildMacros::Lookup& lookup, bool isCpp,
-               std::vector<std::string_view>* used)
-        : tokens_(tokens, lookup),
+               BuildMacros::Budget& budget, std::vector<std::string_view>* used)
+        : tokens_(tokens, lookup, budget),
           isCpp_(isCpp),
           used_(used) {}
 
@@ -94,7 +99,7 @@ private:
     void reduceTo(std::uint8_t precedence);
 
     const BuildMacros::Macro* find(std::string_view name) {
-        if (used_ != nullptr && std::ranges::find(*used_, name) == used_->end())
+        if (used_ != nullptr && found_.insert(name).second)
             used_->push_back(name);
         return tokens_.find(name);
     }
@@ -104,6 +109,7 @@ private:
     Expansion tokens_;
     bool isCpp_;
     std::vector<std::string_view>* used_;
+    std::unordered_set<std::string_view> found_; ///< in `used_`
     std::vector<Value> values_;
     std::vector<Operation> operations_;
     bool operandRead_ = false; ///< rather than replaced by tokens to read
@@ -253,8 +259,8 @@ Value Evaluation::run() {
 } // namespace
 
 std::optional<DirectiveConstant> BuildMacros::valueOf(std::span<const DirectiveToken> tokens, const Lookup& lookup,
-                                                      bool isCpp, std::vector<std::string_view>* used) {
-    return Evaluation(tokens, lookup, isCpp, used).run();
+                                                      bool isCpp, Budget& budget, std::vector<std::string_view>* used) {
+    return Evaluation(tokens, lookup, isCpp, budget, used).run();
 }
 
 } // namespace VT

@@ -102,4 +102,34 @@ BranchWhy whyOf(const SymbolicExprTable& table, const MacroUnknowns& unknowns, B
     return why;
 }
 
+std::vector<std::string> lostOperands(const SymbolicExprTable& table, const MacroUnknowns& unknowns,
+                                      const SpelledCondition& condition, SymbolicExprId shorter) {
+    const auto operandsOf = [&table](SymbolicExprId id) {
+        std::vector<SymbolicExprId> operands;
+        std::vector<SymbolicExprId> open{id};
+        while (!open.empty() && operands.size() + open.size() <= limits::whyOperands) {
+            const SymbolicExprId next = open.back();
+            open.pop_back();
+            const SymbolicExpr& node = *table.get(next);
+            if (node.op() != SymbolicOp::And && node.op() != SymbolicOp::Or) {
+                operands.push_back(next);
+                continue;
+            }
+            open.push_back(node.getInput(1));
+            open.push_back(node.getInput(0));
+        }
+        return open.empty() ? operands : std::vector<SymbolicExprId>();
+    };
+    std::vector<SymbolicExprId> kept = operandsOf(shorter);
+    std::vector<std::string> lost;
+    for (const SymbolicExprId operand : operandsOf(condition.node)) {
+        const auto same = std::ranges::find(kept, operand);
+        if (same == kept.end())
+            lost.push_back(quotedDirective(textOf(table, unknowns, condition, {operand, false, 0})));
+        else
+            kept.erase(same);
+    }
+    return lost;
+}
+
 } // namespace VT

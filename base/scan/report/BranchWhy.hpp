@@ -29,4 +29,9 @@ BranchWhy whyOf(const SymbolicExprTable& table, const MacroUnknowns& unknowns, B
                 SymbolicExprId condition, const BranchVerdict& verdict, const std::vector<SpelledCondition>& conditions,
                 KnownConditions known);
 
+/// The operands of && and || that a shorter form of a condition leaves out, as written; none of more than
+/// limits::whyOperands.
+std::vector<std::string> lostOperands(const SymbolicExprTable& table, const MacroUnknowns& unknowns,
+                                      const SpelledCondition& condition, SymbolicExprId shorter);
+
 } // namespace VT

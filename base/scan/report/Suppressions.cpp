@@ -64,6 +64,7 @@ void readRequest(std::string_view request, Suppression& suppression) {
         words = trimmed(words.substr(end));
     }
     suppression.reason = onOneLine(reason);
+    suppression.asksToKeep = keeps;
     suppression.isMalformed = !keeps || reason.empty();
 }
 
@@ -119,6 +120,7 @@ std::vector<Suppression> readSuppressions(std::string_view text) {
         waiting = found.size();
     }
     readUpTo(comments.size());
+    std::erase_if(found, [](const Suppression& each) { return !each.line && !each.asksToKeep; }); // prose
     return found;
 }
 

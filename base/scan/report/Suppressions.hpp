@@ -21,6 +21,7 @@ struct VTSYM_API Suppression {
     SourceRegion region;               ///< of the comment
     std::string text;                  ///< of the comment, without its marks
     std::optional<std::uint64_t> line; ///< of the directive; nothing where there is none
+    bool asksToKeep = false;           ///< its first word is `keep`; others count at a directive alone
     bool isMalformed = false;          ///< the comment cannot be read
     std::vector<std::string> kinds{};  ///< empty for all
     std::string reason{};

@@ -51,13 +51,21 @@ private:
     }
 };
 
-/// Appends the reasons, where there are any.
-void appendReasons(const Finding& finding, std::string& json) {
+/// Appends a list of texts, where there are any.
+void appendTexts(const char* name, const std::vector<std::string>& texts, std::string& json) {
     std::string list;
-    for (const std::string& reason : finding.because)
-        list.append(list.empty() ? "" : ",").append(jsonString(reason));
+    for (const std::string& text : texts)
+        list.append(list.empty() ? "" : ",").append(jsonString(text));
     if (!list.empty())
-        appendMember(json, "because", "[" + list + "]");
+        appendMember(json, name, "[" + list + "]");
+}
+
+/// Appends the operands that a finding is about.
+void appendReasons(const Finding& finding, std::string& json) {
+    appendTexts("redundant", finding.redundant, json);
+    appendTexts("because", finding.because, json);
+    if (finding.mayNeedFewer)
+        appendMember(json, "minimal", "false");
 }
 
 /// Appends what is known of a finding beyond one scan in one build.
@@ -286,8 +294,12 @@ std::string sentenceOf(const Finding& finding) {
                            : finding.state == "absent"    ? "fixed: "
                                                           : "";
     sentence.append(finding.message);
-    for (const std::string& reason : finding.because)
-        sentence.append(&reason == finding.because.data() ? "; because: " : ", ").append(reason);
+    const auto append = [&sentence](const char* what, const std::vector<std::string>& texts) {
+        for (const std::string& text : texts)
+            sentence.append(&text == texts.data() ? what : ", ").append(text);
+    };
+    append("; redundant: ", finding.redundant);
+    append(finding.mayNeedFewer ? "; because, perhaps of fewer: " : "; because: ", finding.because);
     return sentence;
 }
 

@@ -60,8 +60,10 @@ struct Finding {
     std::optional<std::string> proposed; ///< condition to write instead
     std::vector<RelatedPlace> follows;
     std::optional<Fix> fix;
-    std::string witness;                   ///< "A=3, B=0", or empty
-    std::vector<std::string> because = {}; ///< operands that force the finding
+    std::string witness;                     ///< "A=3, B=0", or empty
+    std::vector<std::string> because = {};   ///< operands that force the finding
+    bool mayNeedFewer = false;               ///< not all operands were shown to be needed
+    std::vector<std::string> redundant = {}; ///< operands that the proposal leaves out
     FindingLevel level = FindingLevel::Warning;
     std::string fingerprint = {}; ///< of the content, the same wherever it moves; empty for none
     /// Against another state of the file: "new", "unchanged", "absent", "updated"; empty where there is none.

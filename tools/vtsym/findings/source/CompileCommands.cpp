@@ -10,6 +10,8 @@
 #include <array>
 #include <filesystem>
 #include <optional>
+#include <set>
+#include <utility>
 
 namespace vtsym {
 
@@ -94,12 +96,6 @@ std::vector<std::string> shellWords(std::string_view command) {
     return words;
 }
 
-void CompileCommands::addTo(Builds& builds, VT::BuildMacros build) {
-    const auto isSame = [&build](const auto& other) { return other->key() == build.key(); };
-    if (std::ranges::none_of(builds, isSame))
-        builds.push_back(std::make_shared<const VT::BuildMacros>(std::move(build)));
-}
-
 CompileCommands CompileCommands::read(std::string_view json, const std::function<void(VT::BuildMacros&)>& further,
                                       const Problem& problem) {
     const Json entries = Json::parse(json, nullptr, false);
@@ -117,7 +113,8 @@ CompileCommands CompileCommands::read(std::string_view json, const std::function
         }
         return known->second;
     };
-    std::map<std::string, VT::BuildMacros> ofOthers; // by key
+    std::map<std::string, VT::BuildMacros> ofOthers;    // by key
+    std::set<std::pair<std::string, std::string>> seen; // files and keys
     for (const Json& entry : entries) {
         const Compilation command = commandOf(entry);
         const std::string file = absolutePath(fs::path(command.folder) / command.file);
@@ -146,7 +143,8 @@ CompileCommands CompileCommands::read(std::string_view json, const std::function
         VT::BuildMacros ofOther = build;
         ofOther.forgetUndefined();
         ofOthers.emplace(ofOther.key(), std::move(ofOther));
-        addTo(commands.byFile_[file], std::move(build));
+        if (seen.emplace(file, build.key()).second)
+            commands.byFile_[file].push_back(std::make_shared<const VT::BuildMacros>(std::move(build)));
     }
     for (auto& [key, build] : ofOthers)
         commands.ofOthers_.push_back(std::make_shared<const VT::BuildMacros>(std::move(build)));

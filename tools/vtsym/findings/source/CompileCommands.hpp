@@ -34,8 +34,6 @@ public:
 private:
     using Builds = std::vector<std::shared_ptr<const VT::BuildMacros>>;
 
-    static void addTo(Builds& builds, VT::BuildMacros build);
-
     std::map<std::string, Builds> byFile_; ///< by absolute path
     Builds ofOthers_;
 };

@@ -120,6 +120,8 @@ Finding findingOf(const std::string& file, const VT::BranchFinding& found, std::
     finding.message = messageOf(found);
     finding.condition = found.condition;
     finding.because = found.because;
+    finding.redundant = found.redundant;
+    finding.mayNeedFewer = !found.because.empty() && !found.isMinimal;
     if (!found.proposed.empty())
         finding.proposed = found.proposed;
     for (const VT::BranchReason& reason : found.reasons) {

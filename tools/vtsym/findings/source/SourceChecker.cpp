@@ -13,6 +13,7 @@
 #include "tools/vtsym/io/CommandLine.hpp"
 
 #include <algorithm>
+#include <unordered_map>
 
 namespace vtsym {
 
@@ -89,6 +90,10 @@ std::vector<FileFinding> SourceChecker::check(const std::string& path, std::stri
     const std::size_t configurations = std::min(file.configurations.size(), VT::limits::scanConfigurations);
 
     const std::vector<VT::Suppression> suppressions = VT::readSuppressions(text);
+    std::unordered_multimap<std::uint64_t, std::size_t> byLine; // of directives
+    for (std::size_t i = 0; i < suppressions.size(); ++i)
+        if (suppressions[i].line)
+            byLine.emplace(*suppressions[i].line, i);
     std::vector<bool> isUsed(suppressions.size(), false);
     std::vector<Finding> findings;
     std::vector<std::optional<VT::SourceEdit>> edits;
@@ -102,10 +107,11 @@ std::vector<FileFinding> SourceChecker::check(const std::string& path, std::stri
     scanner_.scan(file, [&](const VT::BranchFinding& found) {
         Finding finding = findingOf(path, found, configurations);
         bool isSuppressed = false;
-        for (std::size_t i = 0; i < suppressions.size(); ++i) {
-            if (!suppressions[i].covers(found.region.line, finding.kind))
+        const auto [begin, end] = byLine.equal_range(found.region.line);
+        for (auto each = begin; each != end; ++each) {
+            if (!suppressions[each->second].covers(found.region.line, finding.kind))
                 continue;
-            isUsed[i] = true;
+            isUsed[each->second] = true;
             isSuppressed = true;
         }
         const bool isInEvery = found.configurations.empty() || found.configurations.size() == configurations;
