@@ -16,7 +16,7 @@ if(TARGET vtsym_program)
     set(page ${PROJECT_BINARY_DIR}/pages/${name})
     add_custom_command(OUTPUT ${page}
       COMMAND ${CMAKE_COMMAND} -E make_directory ${PROJECT_BINARY_DIR}/pages
-      COMMAND vtsym_program ${ARGN} >${page}
+      COMMAND vtsym_program ${ARGN} > ${page}
       DEPENDS vtsym_program VERBATIM)
     install(FILES ${page} DESTINATION ${directory})
     set(pages ${pages} ${page} PARENT_SCOPE)

@@ -9,7 +9,7 @@
 namespace {
 
 constexpr std::size_t shownNames = 8; ///< of a path
-constexpr std::size_t shownBytes = 80;
+constexpr std::size_t shownNameBytes = 80;
 
 } // namespace
 
@@ -20,7 +20,7 @@ std::string VTBlock::path() const {
         blocks.push_back(block);
     std::string path = block != nullptr ? "..." : "";
     for (; !blocks.empty(); blocks.pop_back())
-        path.append(path.empty() ? "" : "/").append(VT::shownText(blocks.back()->name_, shownBytes));
+        path.append(path.empty() ? "" : "/").append(VT::shownText(blocks.back()->name_, shownNameBytes));
     return path;
 }
 
@@ -49,7 +49,7 @@ std::string VTRootBD::nameBlock(VTBlock& block, std::string name, const VT::Embe
     if (name.find('/') != std::string::npos)
         return "a name holds \"/\", which separates the names of a path: write another character";
     if (const auto same = named_.find({block.parent_, name}); same != named_.end() && same->second != &block)
-        return "there is another " + VT::shownText(name, shownBytes) +
+        return "there is another " + VT::shownText(name, shownNameBytes) +
                " beside this one: give one of them another name";
     named_.erase({block.parent_, block.name_});
     block.name_ = std::move(name);

@@ -7,14 +7,14 @@ namespace VT::Embedded {
 
 namespace {
 
-constexpr std::size_t shownBytes = 80;
+constexpr std::size_t shownQuoteBytes = 80;
 constexpr const char* integerWanted = "write an integer of 32 bits";
 
 } // namespace
 
 std::string inQuotes(std::string_view text) {
     std::string result = "\"";
-    return result.append(shownText(text, shownBytes)).append("\"");
+    return result.append(shownText(text, shownQuoteBytes)).append("\"");
 }
 
 std::string valueWanted(const Member& member) {

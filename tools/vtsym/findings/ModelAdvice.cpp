@@ -12,7 +12,7 @@ namespace vtsym {
 
 namespace {
 
-std::string shown(const std::string& text) {
+std::string shownShort(const std::string& text) {
     return VT::shownText(text, shownInSentence);
 }
 
@@ -37,10 +37,10 @@ void ModelCheck::writeAdvice(ChoiceSet& set) {
         removedJson.append(removedJson.empty() ? "" : ",").append(jsonString(choices[choice]->path()));
     }
     if (std::ranges::count(report.findings, VT::ChoiceFault::Overlap, &VT::ChoiceFinding::fault) > 1) {
-        set.advice.push_back("no choices overlap without " + shown(removed) +
+        set.advice.push_back("no choices overlap without " + shownShort(removed) +
                              (report.removal.isSmallest ? "" : ", which may be more than needed"));
         if (!report.allOverlaps)
-            set.advice.back() = "of the pairs reported none overlaps without " + shown(removed);
+            set.advice.back() = "of the pairs reported none overlaps without " + shownShort(removed);
         appendMember(members, "remove", "[" + removedJson + "]");
         appendMember(members, "smallest", report.removal.isSmallest ? "true" : "false");
     }
@@ -54,7 +54,7 @@ void ModelCheck::writeAdvice(ChoiceSet& set) {
             countsJson.append(countsJson.empty() ? "" : ",").append(jsonString(choices[i]->path()));
             countsJson.append(":").append(jsonCount(count));
         }
-        set.advice.push_back(std::to_string(*report.parentAssignments) + " assignments" + shown(counts));
+        set.advice.push_back(std::to_string(*report.parentAssignments) + " assignments" + shownShort(counts));
         appendMember(members, "assignments", jsonCount(report.parentAssignments));
         appendMember(members, "by_choice", "{" + countsJson + "}");
     }
@@ -80,7 +80,7 @@ void ModelCheck::writeMerges(const VTBlock& set, const VT::ChoiceSetReport& repo
             if (&block != &first)
                 finding.follows.push_back({placeOf(block), block.variantCondition()});
         }
-        finding.message = shown(finding.message) + " can be one choice: " + shown(*finding.proposed);
+        finding.message = shownShort(finding.message) + " can be one choice: " + shownShort(*finding.proposed);
         write(findings, std::move(finding));
     }
 }
