@@ -1,5 +1,5 @@
-// The README and the pages of docs/ show what the program answers, their links lead to files, and every message that a user may
-// meet has a paragraph.
+// The README and the pages of docs/ show what the program answers, their links lead to files, and every message that a
+// user may meet has a paragraph.
 #include "tests/tools/Program.hpp"
 
 #include <filesystem>

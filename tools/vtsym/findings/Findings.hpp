@@ -98,7 +98,8 @@ public:
     virtual void problem(const Place& place, const std::string& sentence) = 0;
     /// A remark about the whole search; the search does not fail.
     virtual void note(const std::string& sentence) = 0;
-    /// Sentences about a place that are no findings.  `members` are those of a JSON object about them, each after a comma.
+    /// Sentences about a place that are no findings.  `members` are those of a JSON object about them, each after a
+    /// comma.
     virtual void remark(const Place& place, std::span<const std::string> sentences, const std::string& members) = 0;
 };
 
