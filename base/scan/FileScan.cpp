@@ -209,10 +209,11 @@ void FileScan::judgeBranch(const Directive& directive, const DirectiveCondition&
                                    : verdict.kind == BranchVerdictKind::AlwaysTrue ? BranchFindingKind::AlwaysTrue
                                                                                    : BranchFindingKind::Removable,
                                    directive);
-    for (const std::size_t at : reasons)
+    for (const std::size_t at : reasons) {
         for (BranchReason& reason : reasonsOf(known, at))
             if (std::ranges::find(result.reasons, reason) == result.reasons.end())
                 result.reasons.push_back(std::move(reason));
+    }
     if (input_.options.why) {
         BranchWhy why = this->why(directive, condition, verdict, known, reasons);
         result.because = std::move(why.operands);
@@ -290,10 +291,11 @@ std::vector<BranchReason> FileScan::reasonsOf(const Known& known, std::size_t fa
 
 std::vector<BranchReason> FileScan::definitionsOf(const BuildFact& fact) const {
     std::vector<BranchReason> definitions;
-    for (const std::string& name : fact.macros)
+    for (const std::string& name : fact.macros) {
         if (const BuildMacros::Macro* const macro = input_.build->find(name))
             definitions.push_back(
                 {{macro->place.line, 0, 0, 0}, macro->place.text, true, BranchReasonKind::Build, macro->place.file});
+    }
     return definitions;
 }
 

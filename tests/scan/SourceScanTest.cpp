@@ -1,5 +1,6 @@
 // What is found in files of all kinds, one line a finding.
 #include "base/scan/SourceScan.hpp"
+#include "base/core/Limits.hpp"
 #include "tests/support/Cases.hpp"
 
 #include <gtest/gtest.h>
@@ -93,6 +94,30 @@ TEST(Findings, OfMacrosThatGrow) {
     file.text = many;
     EXPECT_EQ(findings(SourceScanner(), file), "");
     EXPECT_FALSE(build.define("1") || build.define("") || build.undefine("A B") || build.undefine(""));
+}
+
+TEST(Findings, OfManyConfigurationsAndAssumptions) {
+    std::vector<BuildMacros> builds(limits::scanConfigurations + 1);
+    SourceFile file{"#if N\n#endif"};
+    for (std::size_t i = 0; i < builds.size(); ++i) {
+        EXPECT_TRUE(builds[i].define("N=" + std::to_string(i + 1)));
+        file.configurations.push_back(&builds[i]);
+    }
+    SourceScanner scanner;
+    std::size_t held = 0;
+    scanner.scan(file, [&](const BranchFinding& found) { held += found.configurations.size(); });
+    EXPECT_EQ(held, limits::scanConfigurations);
+    EXPECT_EQ(scanner.counts().leftOut, 1U);
+
+    const auto isFound = [](std::size_t links) { // A0 || !A1, A1 || !A2, ...
+        SourceScanner chained;
+        for (std::size_t i = 0; i < links; ++i)
+            EXPECT_EQ(chained.assume("A" + std::to_string(i) + " || !A" + std::to_string(i + 1)), std::nullopt);
+        const std::string text = "#if A" + std::to_string(links) + "\n#if A0\n#endif\n#endif";
+        return !findings(std::move(chained), {text}).empty();
+    };
+    EXPECT_TRUE(isFound(limits::relatedAssumptions));
+    EXPECT_FALSE(isFound(3 * limits::relatedAssumptions));
 }
 
 TEST(Findings, OfLongFiles) {

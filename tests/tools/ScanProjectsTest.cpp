@@ -101,6 +101,25 @@ TEST(ScanProjects, LogsHoldWhatServicesTake) {
     EXPECT_EQ(fingerprints.size(), results.size());
 }
 
+TEST(ScanProjects, LogsAreOfTheirSchema) {
+    const TemporaryFolder place;
+    place.write("a.c", "#if N > 3 && M\n#elif M // vtsym: keep\n#endif\n");
+    place.write("c.h", "#define N 4\n");
+    const Json schema = Json::parse(std::ifstream(VTSYM_TEST_DATA "/sarif-2.1.0.json"));
+    const Json builds =
+        Json::parse(runScript(place, "vtsym scan --sarif --why -imacros c.h -D K --assume 'M > 1 || K == 2' a.c").out);
+    EXPECT_EQ(schemaErrors(schema, schema, builds), "");
+    const Json& always = builds["runs"][0]["results"][0];
+    EXPECT_EQ(always["relatedLocations"][0]["physicalLocation"]["artifactLocation"]["uri"], "c.h");
+    EXPECT_EQ(always["properties"]["because"], Json({"#define N 4", "-DK", "M > 1 || K == 2"}));
+    const Json states = Json::parse(runScript(place, R"(git init -q; g() { git -c user.name=n -c user.email=e "$@"; }
+g add .; g commit -qm 1; printf '#if N\n#if N\n#endif\nint a;\n#endif\n' >a.c; g commit -qam 2
+vtsym scan --sarif --diff HEAD~1..)")
+                                        .out);
+    EXPECT_EQ(schemaErrors(schema, schema, states), "");
+    EXPECT_EQ(states["runs"][0]["results"][0]["baselineState"], "new");
+}
+
 TEST(ScanProjects, MessagesAreWhatTheProblemMatcherReads) {
     const TemporaryFolder place;
     place.write("a:1.c", "#ifdef A\n#ifdef A // vtsym: keep\n#endif\n#elif X && X\n#endif\n");

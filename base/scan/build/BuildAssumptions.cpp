@@ -75,8 +75,9 @@ std::vector<std::size_t> BuildAssumptions::relatedTo(const std::set<std::string_
         }
     };
     std::ranges::for_each(names, addAbout);
-    for (std::size_t i = 0; i < found.size(); ++i)
-        std::ranges::for_each(items_[found[i]].names, addAbout);
+    std::size_t next = 0;
+    while (next < found.size()) // which grows
+        std::ranges::for_each(items_[found[next++]].names, addAbout);
     return found;
 }
 
@@ -117,8 +118,9 @@ std::vector<std::size_t> FileAssumptions::relatedTo(const std::vector<MacroUnkno
                 found.push_back(fact);
     };
     std::ranges::for_each(unknowns, addAbout);
-    for (std::size_t i = 0; i < found.size(); ++i)
-        std::ranges::for_each(facts_[found[i]].condition.unknowns, addAbout);
+    std::size_t next = 0;
+    while (next < found.size()) // which grows
+        std::ranges::for_each(facts_[found[next++]].condition.unknowns, addAbout);
     return found;
 }
 

@@ -76,11 +76,12 @@ BranchWhy whyOf(const SymbolicExprTable& table, const MacroUnknowns& unknowns, B
                 SymbolicExprId condition, const BranchVerdict& verdict, const std::vector<SpelledCondition>& conditions,
                 KnownConditions known) {
     std::vector<Forcing> operands;
-    for (std::size_t i = 0; i < conditions.size(); ++i)
+    for (std::size_t i = 0; i < conditions.size(); ++i) {
         if (!conditions[i].texts.empty())
             operands.push_back({conditions[i].node, false, i});
         else if (!split(table, i, conditions[i].node, operands))
             return {};
+    }
     if (operands.size() > limits::whyOperands)
         return {};
     known.facts.clear();

@@ -49,10 +49,11 @@ std::vector<std::size_t> keptTokens(Tokens old, Tokens fresh) {
     const auto isSame = [&](std::size_t row, std::size_t column) {
         return old[first + row].text == fresh[first + column].text;
     };
-    for (std::size_t row = rows; row-- > 0;)
+    for (std::size_t row = rows; row-- > 0;) {
         for (std::size_t column = columns; column-- > 0;)
             at(row, column) =
                 isSame(row, column) ? at(row + 1, column + 1) + 1 : std::max(at(row + 1, column), at(row, column + 1));
+    }
     for (std::size_t row = 0, column = 0; row < rows && column < columns;) {
         if (isSame(row, column))
             kept[first + column++] = first + row++;

@@ -98,7 +98,7 @@ std::string Baseline::text() const {
     std::ranges::sort(found, {}, [](const auto* entry) {
         return std::tie(entry->second.file, entry->second.condition, entry->first);
     });
-    std::string text = "{\"version\":1,\"findings\":[";
+    std::string text = R"({"version":1,"findings":[)";
     for (const auto* entry : found) {
         text.append(entry == found.front() ? "\n" : ",\n").append("{\"fingerprint\":").append(jsonString(entry->first));
         appendMember(text, "file", jsonString(entry->second.file));
@@ -116,8 +116,9 @@ sys_days today() {
         const std::string_view text(epoch);
         std::from_chars(text.data(), text.data() + text.size(), seconds);
     }
-    constexpr std::int64_t aDay = 24 * 60 * 60;
-    return sys_days(std::chrono::days(seconds / aDay));
+    constexpr std::int64_t aDay = std::int64_t{24} * 60 * 60;
+    constexpr std::int64_t lastDay = 2'932'896; // 9999-12-31
+    return sys_days(std::chrono::days(std::clamp<std::int64_t>(seconds / aDay, 0, lastDay)));
 }
 
 } // namespace vtsym

@@ -61,6 +61,7 @@ GitProcess::GitProcess(const std::vector<std::string>& arguments) {
     std::vector<std::string> words{"git", "--no-optional-locks"};
     words.insert(words.end(), arguments.begin(), arguments.end());
     std::vector<char*> pointers;
+    pointers.reserve(words.size() + 1);
     for (std::string& word : words)
         pointers.push_back(word.data());
     pointers.push_back(nullptr);

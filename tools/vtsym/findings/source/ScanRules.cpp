@@ -171,10 +171,10 @@ Finding changedBranch(const std::string& file, const VT::ChangedBranch& branch) 
     finding.message = branch.directive == branch.before ? quoted(branch.directive) + " is reached in other cases"
                                                         : quoted(branch.directive) + " instead of " +
                                                               quoted(branch.before) + " changes what is built";
-    if (!branch.witness.empty())
-        finding.message.append(": with ")
-            .append(branch.witness)
-            .append(branch.isBuiltAfter ? " the code is in now" : " the code is not in any more");
+    if (!branch.witness.empty()) {
+        finding.message.append(": with ").append(branch.witness);
+        finding.message.append(branch.isBuiltAfter ? " the code is in now" : " the code is not in any more");
+    }
     return finding;
 }
 
