@@ -15,7 +15,7 @@ namespace vtsym::python {
 namespace {
 
 /// In the order of VT::BranchFindingKind.
-constexpr std::array<const char*, 3> kinds{"dead", "always-true", "removable"};
+constexpr std::array<const char*, 4> kinds{"dead", "always-true", "removable", "spelled-out"};
 
 class Scanner {
 public:

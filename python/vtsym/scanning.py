@@ -28,7 +28,7 @@ class SourceFinding:
     """A directive with a fault, proven for all values of the macros."""
 
     file: str
-    #: ``dead``, ``always-true`` or ``removable``.
+    #: ``dead``, ``always-true``, ``removable`` or ``spelled-out``.
     kind: str
     line: int
     column: int
@@ -42,7 +42,7 @@ class SourceFinding:
     reasons: tuple[Reason, ...]
 
     def __str__(self) -> str:
-        advice = f" (can be '{self.proposed}')" if self.kind == "removable" else ""
+        advice = f" (can be '{self.proposed}')" if self.kind in ("removable", "spelled-out") else ""
         return f"{self.file}:{self.line}: {self.kind}: {self.directive}{advice}"
 
 
@@ -50,12 +50,14 @@ def scan(
     paths: AnyPath | Iterable[AnyPath],
     *,
     strict_includes: bool = False,
+    spelled_out: bool = False,
     on_problem: Callable[[str, str], None] | None = None,
 ) -> Iterator[SourceFinding]:
     """Finds faults in C and C++ files, and in all such files below folders; yields them file by file.
 
     A path that cannot be read raises :class:`~vtsym.SourceError`, or is handed to ``on_problem`` with a sentence, after
-    which the scan goes on.  With ``strict_includes`` an included file may change any macro.
+    which the scan goes on.  With ``strict_includes`` an included file may change any macro.  With ``spelled_out`` an
+    ``#elif`` that repeats that those before it do not hold is a finding, too.
 
     >>> import vtsym
     >>> for finding in vtsym.scan("examples/radio.h"):
@@ -80,10 +82,12 @@ def scan(
         except SourceError as error:
             refuse(file, str(error))
             continue
-        yield from _findings(file, rows)
+        yield from _findings(file, rows, spelled_out)
 
 
-def scan_text(text: str | bytes, *, file: str = "<text>", is_cpp: bool = False) -> list[SourceFinding]:
+def scan_text(
+    text: str | bytes, *, file: str = "<text>", is_cpp: bool = False, spelled_out: bool = False
+) -> list[SourceFinding]:
     """The faults in a source text.
 
     >>> import vtsym
@@ -92,10 +96,12 @@ def scan_text(text: str | bytes, *, file: str = "<text>", is_cpp: bool = False) 
     ('always-true', 2, (Reason(line=1, directive='#if A > 2', holds=True),))
     """
     source = text.encode("utf-8", "surrogateescape") if isinstance(text, str) else text
-    return list(_findings(file, _vtsym.Scanner(False).scan_text(source, is_cpp)))
+    return list(_findings(file, _vtsym.Scanner(False).scan_text(source, is_cpp), spelled_out))
 
 
-def _findings(file: str, rows: list[_vtsym._Branch]) -> Iterator[SourceFinding]:
+def _findings(file: str, rows: list[_vtsym._Branch], spelled_out: bool) -> Iterator[SourceFinding]:
     for kind, line, column, directive, condition, proposed, reasons in rows:
+        if kind == "spelled-out" and not spelled_out:
+            continue
         because = tuple(Reason(*reason) for reason in reasons)
         yield SourceFinding(file, kind, line, column, directive, condition, proposed, because)

@@ -106,9 +106,10 @@ TEST(Documentation, ExplainsEveryMessageFindingAndWarning) {
 TEST(Documentation, NamesTheLicenceOfEveryDependency) {
     const std::string licences = readAll(root / "THIRD-PARTY.md");
     for (const fs::directory_entry& list : fs::directory_iterator(root / "cmake/packages"))
-        for (const std::string& package : linesOf(readAll(list.path())))
-            if (!package.empty() && !package.starts_with('#'))
-                EXPECT_NE(licences.find("`" + package + "`"), std::string::npos) << package;
+        for (const std::string& package : linesOf(readAll(list.path()))) {
+            const bool isPackage = !package.empty() && !package.starts_with('#');
+            EXPECT_TRUE(!isPackage || licences.find("`" + package + "`") != std::string::npos) << package;
+        }
 }
 
 } // namespace
