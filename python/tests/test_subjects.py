@@ -65,13 +65,13 @@ def test_wrong_models() -> None:
 
 
 def test_scanning_finds_what_the_program_finds() -> None:
-    kinds = {"dead": "dead", "always": "always-true", "removable": "removable"}
+    kinds = {"dead": "dead", "always": "always-true", "removable": "removable", "spelled-out": "spelled-out"}
     for name, text, *rest in cases("scan-findings.txt", "findings"):
         language = rest[1] if len(rest) > 1 else ""
         if language == "strict":
             continue
         wanted = [line.split(" ")[:2] for line in (rest[0] if rest else "").split("\n") if line]
-        found = vtsym.scan_text(text, is_cpp=language == "C++")
+        found = vtsym.scan_text(text, is_cpp=language == "C++", spelled_out=True)
         assert [[str(f.line), f.kind] for f in found] == [[line, kinds[kind]] for line, kind in wanted], name
 
 
