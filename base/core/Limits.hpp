@@ -153,6 +153,10 @@ inline constexpr std::size_t solverChecks = 64;
 inline constexpr std::uint64_t solverNodes = 1024;
 inline constexpr unsigned solverMegabytes = 256;
 
+/// Steps that a question for it takes from the budget of a command, which it may use for as long as so many decisions
+/// of the library at most.  Beyond the budget nothing goes to it.
+inline constexpr std::uint64_t solverSteps = std::uint64_t{1} << 16U;
+
 /// Bits of a number in a question for it, where each unknown counts as so many: the degree of products.  A larger
 /// number is one that nothing is known of.
 inline constexpr unsigned solverNumberBits = 4096;

@@ -287,7 +287,11 @@ void Decider::State::keepFunctions(Decision& decision, Gate truth, std::span<con
 void Decider::State::askSolver(AskedOf asked, std::span<const SymbolicExprId> ids, Decision& decision) {
     if (options.solver == nullptr || solverQuestions == 0)
         return;
+    if (budget != nullptr && budget->left() < limits::solverSteps)
+        return;
     --solverQuestions;
+    if (budget != nullptr)
+        budget->take(limits::solverSteps);
     const auto confirms = [&](const Witness& witness, std::span<const SymbolicExprId> calls) {
         std::vector<bool> truths;
         for (const SymbolicExprId id : ids) {

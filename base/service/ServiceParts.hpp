@@ -66,11 +66,12 @@ struct ServiceParts {
     std::array<SimplifyCache<SymbolicExprId>, 2> simplified;      ///< by condition
     std::array<SimplifyCache<std::string>, 2> simplifiedFromText; ///< by text
     DecisionCache decisions;
-    std::array<std::unique_ptr<Decider>, 4> deciders; ///< by mode
+    std::array<std::unique_ptr<Decider>, 8> deciders; ///< by mode
     Budget* budget = nullptr;                         ///< of decisions, owned by the caller
     Assumptions assumptions;
     bool bits32 = false; ///< unknowns are signed 32-bit integers to decisions
-    bool caching;        ///< the cache feature when the service was made
+    bool asksSolver = true;
+    bool caching; ///< the cache feature when the service was made
 };
 
 } // namespace VT

@@ -161,6 +161,8 @@ public:
 
     /// Whether decisions are over the signed 32-bit integers from now on; over all integers at first.
     void setDecisions32Bit(bool are32Bit);
+    /// Whether the solver that is installed as a plugin is asked what the library leaves undecided; it is at first.
+    void setSolver(bool isAsked);
     /// Takes the steps of all further decisions from a budget as well, which outlives the service or is replaced;
     /// nullptr ends that.  Decisions beyond it are undecided.
     void shareBudget(Budget* budget);

@@ -72,15 +72,16 @@ bool ServiceParts::keywordsInForce() const {
 }
 
 unsigned ServiceParts::decisionMode() const {
-    return (keywordsInForce() ? 1U : 0U) + (bits32 ? 2U : 0U);
+    return (keywordsInForce() ? 1U : 0U) + (bits32 ? 2U : 0U) + (asksSolver ? 4U : 0U);
 }
 
 Decider& ServiceParts::decider() {
     std::unique_ptr<Decider>& decider = deciders.at(decisionMode());
     if (decider == nullptr)
-        decider = std::make_unique<Decider>(table, DecisionOptions{.keywordsInForce = keywordsInForce(),
-                                                                   .bits32 = bits32,
-                                                                   .solver = &SolverPlugin::installed()});
+        decider = std::make_unique<Decider>(
+            table, DecisionOptions{.keywordsInForce = keywordsInForce(),
+                                   .bits32 = bits32,
+                                   .solver = asksSolver ? &SolverPlugin::installed() : nullptr});
     decider->share(budget);
     return *decider;
 }
@@ -108,6 +109,10 @@ Decision VCService::ask(PairQuestion question, const VCSymbolicExprId& a, const 
 
 void VCService::setDecisions32Bit(bool are32Bit) {
     parts_->bits32 = are32Bit;
+}
+
+void VCService::setSolver(bool isAsked) {
+    parts_->asksSolver = isAsked;
 }
 
 void VCService::shareBudget(Budget* budget) {

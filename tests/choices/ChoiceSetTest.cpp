@@ -235,7 +235,7 @@ TEST_F(ChoiceSetChecks, SayWhatClosesAGapAndWhatCanBeMerged) {
         return missing == report.findings.end() ? "no gap" : texts({{missing->proposed}});
     };
     EXPECT_EQ(proposed("true", {"A>0", "A<0"}), "A==0");
-    EXPECT_EQ(proposed("POWER>0", {"FUEL==1", "FUEL==2 && POWER<=90", "FUEL>2"}), "FUEL<=0 || FUEL==2 && POWER>90");
+    EXPECT_EQ(proposed("POWER>0", {"FUEL==1", "FUEL==2 && POWER<=90", "FUEL>2"}), "FUEL==2 && POWER>90 || FUEL<=0");
     EXPECT_EQ(proposed("A>2", {"A>1"}), "no gap");
     const auto merged = [&](const std::vector<std::string>& choices, ChoicePolicy policy = ChoicePolicy::Unique) {
         std::string result;

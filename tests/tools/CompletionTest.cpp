@@ -130,6 +130,8 @@ TEST(Help, ShowsExamplesThatRun) {
     place.write("model.json", R"({"blocks": [{"name": "b", "condition": "A && !A"}]})");
     place.write("src/a.c", "#if A\n#if A\n#endif\n#endif\n");
     place.write("include/a.h", "");
+    place.write("build/compile_commands.json", R"([{"directory": "/", "file": "a.c", "command": "cc -c a.c"}])");
+    runScript(place, "git init -q -b main && git -c user.name=a -c user.email=a commit -q --allow-empty -m a");
     std::size_t examples = 0;
     for (const std::string& command : namesInHelp(runProgram({"--help"}).out)) {
         if (command.starts_with('-'))
