@@ -213,6 +213,7 @@ TEST(Agreement, OnEveryOperatorInEveryOperandOfEveryOther) {
                     SymbolicExprId id = fill(outer, position, part);
                     if (round > 0)
                         id = tree(round == 1 ? Op::Equal : Op::And, id, anyLeaf(table, random, world));
+                    service->setSolver(random() % 50 == 0); // which takes longer than everything else
                     Case(*service, id, world, random).expectAgreement(table.getIdTRUE());
                     ASSERT_FALSE(HasFatalFailure());
                 }
@@ -227,7 +228,7 @@ TEST(Agreement, OnRandomGraphs) {
             const ConditionWorld world{.reals = done % 2 == 0, .calls = done % 3 == 0};
             const SymbolicExprId id = anyCondition(service->table(), random, 1 + done % 14, world);
             const SymbolicExprId known = anyCondition(service->table(), random, 1 + done % 4, world);
-            service->setSolver(done % 50 == 0); // which takes longer than everything else
+            service->setSolver(done % 50 == 0);
             Case(*service, id, world, random).expectAgreement(known);
             ASSERT_FALSE(HasFatalFailure()) << "seed " << done;
         }
