@@ -25,7 +25,7 @@ namespace VT {
 namespace {
 
 /// Whether an expression is a name of an integer: not a truth constant, not a variant keyword.
-bool isName(const SymbolicExprTable& table, SymbolicExprId id) {
+bool isIntegerName(const SymbolicExprTable& table, SymbolicExprId id) {
     const SymbolicExpr* const node = table.get(id);
     if (node == nullptr || node->op() != SymbolicOp::String || id == table.getIdTRUE() || id == table.getIdFALSE())
         return false;
@@ -43,12 +43,12 @@ std::optional<NameRange> rangeOf(const SymbolicExprTable& table, SymbolicExprId 
     SymbolicExprId literal = node.getInput(1);
     if (!table.hasOperand(id, name) || !table.hasOperand(id, literal))
         return std::nullopt;
-    if (isName(table, literal)) {
+    if (isIntegerName(table, literal)) {
         std::swap(name, literal);
         op = row.mirrored;
     }
     const SymbolicExpr* const number = table.get(literal);
-    if (!isName(table, name) || number == nullptr || number->op() != SymbolicOp::IntValue)
+    if (!isIntegerName(table, name) || number == nullptr || number->op() != SymbolicOp::IntValue)
         return std::nullopt;
     const std::int64_t value = static_cast<const SymbolicIntValue*>(number)->getValue();
     const IntegerSet set = IntegerSet::satisfying(op, value);

@@ -8,12 +8,6 @@
 
 namespace VT {
 
-namespace {
-
-constexpr std::size_t wordBits = 64;
-
-} // namespace
-
 // Axes.
 
 void Axis::cut(const IntegerSet& set) {

@@ -86,6 +86,9 @@ struct Box {
     std::uint32_t comparisons = 0;
 };
 
+/// Cells of a set in one word of it.
+inline constexpr std::size_t wordBits = 64;
+
 class Grid {
 public:
     using Words = boost::container::small_vector<Word, 64>;

@@ -18,8 +18,6 @@ namespace VT {
 
 namespace {
 
-constexpr std::size_t wordBits = 64;
-
 /// Comparisons up to which every formula has an operand of one or two at its outermost And or Or.
 constexpr std::size_t exactComparisons = 5;
 

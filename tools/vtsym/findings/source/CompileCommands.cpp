@@ -21,7 +21,7 @@ namespace {
 
 using Json = nlohmann::json;
 
-[[noreturn]] void refuse(const std::string& what) {
+[[noreturn]] void refuseDatabase(const std::string& what) {
     throw FileError("is not a compilation database: " + what);
 }
 
@@ -53,7 +53,7 @@ struct Compilation {
 Compilation commandOf(const Json& entry) {
     const auto text = [&entry](const char* name) {
         if (!entry.is_object() || !entry.contains(name) || !entry[name].is_string())
-            refuse(std::string("a command has no ") + name);
+            refuseDatabase(std::string("a command has no ") + name);
         return entry[name].get<std::string>();
     };
     Compilation command{text("directory"), text("file"), {}};
@@ -100,7 +100,7 @@ CompileCommands CompileCommands::read(std::string_view json, const std::function
                                       const Problem& problem) {
     const Json entries = Json::parse(json, nullptr, false);
     if (!entries.is_array())
-        refuse("it is no JSON list of commands");
+        refuseDatabase("it is no JSON list of commands");
     CompileCommands commands;
     std::map<std::string, std::optional<std::string>> texts; // of files that are included before others
     const auto textOf = [&](const std::string& path) -> const std::optional<std::string>& {

@@ -15,7 +15,7 @@ namespace {
 constexpr std::size_t context = 3;
 
 /// The lines of a text, each with its end.
-std::vector<std::string_view> linesOf(std::string_view text) {
+std::vector<std::string_view> linesOfText(std::string_view text) {
     std::vector<std::string_view> lines;
     while (!text.empty()) {
         const std::size_t end = std::min(text.find('\n'), text.size() - 1);
@@ -108,7 +108,7 @@ std::string patchOf(std::string_view path, std::string_view text, const std::vec
     if (edits.empty())
         return {};
     path.remove_prefix(std::min(path.find_first_not_of('/'), path.size()));
-    const std::vector<std::string_view> lines = linesOf(text);
+    const std::vector<std::string_view> lines = linesOfText(text);
     const std::vector<Change> changes = changesOf(lines, text, edits);
     std::string patch = "diff --git " + headerName("a/", path) + " " + headerName("b/", path) + "\n--- " +
                         headerName("a/", path) + "\n+++ " + headerName("b/", path) + "\n";
@@ -123,7 +123,7 @@ std::string patchOf(std::string_view path, std::string_view text, const std::vec
         std::size_t at = begin;
         std::ptrdiff_t growth = 0;
         for (std::size_t i = first; i < last; ++i) {
-            const std::vector<std::string_view> written = linesOf(changes[i].text);
+            const std::vector<std::string_view> written = linesOfText(changes[i].text);
             appendLines(body, ' ', lines, at, changes[i].begin);
             appendLines(body, '-', lines, changes[i].begin, changes[i].end);
             appendLines(body, '+', written, 0, written.size());
