@@ -1,58 +1,70 @@
-// A 64-bit integer that reports an overflow instead of wrapping, in the place of a big integer while numbers are small.
+// Integers of 64 and 128 bits that report an overflow instead of wrapping, in the place of big integers while numbers
+// are small.
 #pragma once
 
 #include "base/integer/BigInteger.hpp"
 
 #include <compare>
 #include <cstdint>
-#include <limits>
 
 namespace VT {
 
-/// Thrown where a number leaves 64 bits.
+/// Thrown where a number has too many bits.
 struct Overflow {};
 
-/// Adds, subtracts, multiplies and divides like an integer; throws Overflow where the result has no 64 bits.
-class CheckedInteger {
+/// Adds, subtracts, multiplies and divides like an integer; throws Overflow where the result does not fit.
+template <class Integer>
+class Checked {
 public:
-    CheckedInteger(std::int64_t value = 0)
-        : value_(value) {} // NOLINT(google-explicit-constructor): a number is a number
+    Checked(std::int64_t value = 0) // NOLINT(google-explicit-constructor): a number is a number
+        : value_(value) {}
 
-    explicit CheckedInteger(const BigInteger& value) {
-        if (value < std::numeric_limits<std::int64_t>::min() || value > std::numeric_limits<std::int64_t>::max())
+    explicit Checked(const BigInteger& value) {
+        constexpr unsigned bits = 8 * sizeof(Integer) - 1; // without the sign
+        if (value != 0 && msb(BigInteger(abs(value))) >= bits)
             throw Overflow{};
-        value_ = static_cast<std::int64_t>(value);
+        value_ = static_cast<Integer>(value);
     }
 
     explicit operator BigInteger() const { return value_; }
 
-    friend CheckedInteger operator+(CheckedInteger a, CheckedInteger b) {
-        std::int64_t result = 0;
-        return __builtin_add_overflow(a.value_, b.value_, &result) ? throw Overflow{} : result;
+    friend Checked operator+(Checked a, Checked b) {
+        Integer result = 0;
+        return __builtin_add_overflow(a.value_, b.value_, &result) ? throw Overflow{} : ofValue(result);
     }
 
-    friend CheckedInteger operator-(CheckedInteger a, CheckedInteger b) {
-        std::int64_t result = 0;
-        return __builtin_sub_overflow(a.value_, b.value_, &result) ? throw Overflow{} : result;
+    friend Checked operator-(Checked a, Checked b) {
+        Integer result = 0;
+        return __builtin_sub_overflow(a.value_, b.value_, &result) ? throw Overflow{} : ofValue(result);
     }
 
-    friend CheckedInteger operator*(CheckedInteger a, CheckedInteger b) {
-        std::int64_t result = 0;
-        return __builtin_mul_overflow(a.value_, b.value_, &result) ? throw Overflow{} : result;
+    friend Checked operator*(Checked a, Checked b) {
+        Integer result = 0;
+        return __builtin_mul_overflow(a.value_, b.value_, &result) ? throw Overflow{} : ofValue(result);
     }
 
-    friend CheckedInteger operator/(CheckedInteger a, CheckedInteger b) {
-        return b.value_ == -1 ? CheckedInteger(0) - a : CheckedInteger(a.value_ / b.value_);
+    friend Checked operator/(Checked a, Checked b) {
+        return b.value_ == -1 ? Checked(0) - a : ofValue(a.value_ / b.value_);
     }
 
-    friend CheckedInteger operator-(CheckedInteger a) { return CheckedInteger(0) - a; }
+    friend Checked operator-(Checked a) { return Checked(0) - a; }
 
-    CheckedInteger& operator+=(CheckedInteger other) { return *this = *this + other; }
+    Checked& operator+=(Checked other) { return *this = *this + other; }
 
-    friend auto operator<=>(CheckedInteger, CheckedInteger) = default;
+    friend auto operator<=>(Checked, Checked) = default;
 
 private:
-    std::int64_t value_ = 0;
+    static Checked ofValue(Integer value) {
+        Checked result;
+        result.value_ = value;
+        return result;
+    }
+
+    Integer value_ = 0;
 };
+
+__extension__ using Int128 = __int128;
+using CheckedInteger = Checked<std::int64_t>;
+using CheckedInt128 = Checked<Int128>;
 
 } // namespace VT

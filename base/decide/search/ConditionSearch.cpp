@@ -185,11 +185,12 @@ std::optional<ConditionSearch::PathEnd> ConditionSearch::nextPath(std::span<cons
     if (!clauses_.solve(assumptions))
         return std::nullopt;
     readPath();
+    const std::uint64_t before = steps_.left();
     const PathEnd end = witnesses_.tryPath(path_);
     if (end != PathEnd::Met) {
         unconfirmed_ = unconfirmed_ || end == PathEnd::Open;
         if (end == PathEnd::Excluded)
-            refute();
+            refute(before - steps_.left());
         std::vector<Literal> clause;
         for (const auto& [level, low, high] : path_) {
             if (low != minusInfinite)
@@ -263,14 +264,19 @@ void ConditionSearch::readPath() {
     }
 }
 
-/// Takes ranges from a path that nothing meets while that stays so: long runs of them first.
-void ConditionSearch::refute() {
+/// Takes ranges from a path that nothing meets while that stays so: long runs of them first.  Finding out about the
+/// whole path took `spent` steps.  About fewer ranges it takes fewer, as a rule, or else many more: these tries are
+/// given up.
+void ConditionSearch::refute(std::uint64_t spent) {
+    constexpr std::uint64_t allTimes = 8;
+    constexpr std::uint64_t inAnyCase = 4096;
+    const Steps::Share share(steps_, inAnyCase + allTimes * spent);
     for (std::size_t length = path_.size(); length > 0; length /= 2) {
         for (std::size_t i = 0; i < path_.size();) {
             std::vector<LevelRange> without(path_.begin(), path_.begin() + static_cast<std::ptrdiff_t>(i));
             const std::size_t rest = std::min(i + length, path_.size());
             without.insert(without.end(), path_.begin() + static_cast<std::ptrdiff_t>(rest), path_.end());
-            if (witnesses_.excludesPath(without))
+            if (witnesses_.excludesPath(without, inAnyCase + spent))
                 path_ = std::move(without);
             else
                 i = rest;

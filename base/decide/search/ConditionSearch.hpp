@@ -62,7 +62,7 @@ private:
     std::optional<PathEnd> nextPath(std::span<const Literal> assumptions);
     void readPath();
     [[nodiscard]] LevelRange rangeOf(const Question::Node& node) const;
-    void refute();
+    void refute(std::uint64_t spent);
 
     void minimize(std::span<const UnknownLeaf> leaves);
     bool findSmaller(Unknown unknown, std::int64_t value);

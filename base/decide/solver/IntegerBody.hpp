@@ -10,6 +10,7 @@
 // Cost: exponential in the variables at worst, polynomial in the length of numbers before the first split.
 #pragma once
 
+#include "base/core/Check.hpp"
 #include "base/core/Limits.hpp"
 #include "base/decide/solver/LatticeBasis.hpp"
 #include "base/decide/solver/Simplex.hpp"
@@ -47,12 +48,18 @@ public:
             return std::nullopt;
         if (fraction(real, variables_) == variables_)
             return whole(real, variables_);
+        try {
+            return branch(real, variables_, limits::firstBranches, Pick::First);
+        } catch (const TooManyBranches&) { // it takes variables in which the body is round
+        }
         findDirection();
+        VTSYM_CHECK(real.solve());
         return boundAll(real) ? solveBounded() : std::nullopt;
     }
 
 private:
     struct TooManyBranches {};
+    enum class Pick : std::uint8_t { First, Last }; ///< of the variables that have a fraction
 
     [[nodiscard]] std::vector<Row> rows() const {
         std::vector<Row> rows;
@@ -62,11 +69,13 @@ private:
         return rows;
     }
 
-    /// The last variable whose value is not an integer.
-    static std::size_t fraction(const Simplex<Number>& real, std::size_t variables) {
-        for (std::size_t i = variables; i-- > 0;)
-            if (const Number value = real.numerator(i); value / real.denominator() * real.denominator() != value)
-                return i;
+    /// A variable whose value is not an integer, or the number of variables.
+    static std::size_t fraction(const Simplex<Number>& real, std::size_t variables, Pick pick = Pick::First) {
+        for (std::size_t i = 0; i < variables; ++i) {
+            const std::size_t at = pick == Pick::First ? i : variables - 1 - i;
+            if (const Number value = real.numerator(at); value / real.denominator() * real.denominator() != value)
+                return at;
+        }
         return variables;
     }
 
@@ -243,14 +252,22 @@ private:
         Simplex<Number> real(sums, variables, steps_);
         for (std::size_t i = 0; i < bounds.size(); ++i)
             real.restrict(variables + i, bounds[i]);
+        return branch(real, variables, most, Pick::Last);
+    }
+
+    /// The same from the bounds of a simplex, which has these again where there are too many branches.
+    std::optional<Row> branch(Simplex<Number>& real, std::size_t variables, std::size_t most, Pick pick) {
         std::vector<Branch> branches;
         for (;;) {
             if (real.solve()) {
-                const std::size_t variable = fraction(real, variables);
+                const std::size_t variable = fraction(real, variables, pick);
                 if (variable == variables)
                     return whole(real, variables);
-                if (most-- == 0)
+                if (most-- == 0) {
+                    for (; !branches.empty(); branches.pop_back())
+                        real.restrict(branches.back().variable, std::move(branches.back().before));
                     throw TooManyBranches{};
+                }
                 const Number value = real.numerator(variable);
                 const Number below = IntegerRows::floorDivide(value, real.denominator());
                 const Number rest = value - below * real.denominator();

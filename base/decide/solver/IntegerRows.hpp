@@ -1,4 +1,4 @@
-// Rows of integers, of 64 bits or of any size, and what the solvers of linear constraints do with them.
+// Rows of integers, of 64 or 128 bits or of any size, and what the solvers of linear constraints do with them.
 #pragma once
 
 #include "base/decide/Steps.hpp"
@@ -56,10 +56,15 @@ inline std::size_t costOf(CheckedInteger) noexcept {
     return 1;
 }
 
+inline std::size_t costOf(CheckedInt128) noexcept {
+    return 2;
+}
+
 inline std::size_t costOf(const BigInteger& value) noexcept {
     constexpr std::size_t call = 8;
+    constexpr std::size_t pairsOfWords = 4; // whose product is added in the time of a product that is checked
     const std::size_t words = value.backend().size();
-    return call + words * words;
+    return call + words * words / pairsOfWords;
 }
 
 /// Takes steps for arithmetic on so many numbers that are about as long as `typical`.

@@ -1,8 +1,9 @@
 // Hands linear constraints to the reduction, with numbers of 64 bits first, and narrows a solution down to the
 // smallest.
 //
-// Method: a system whose numbers leave 64 bits is solved again from the start with big integers.  The smallest
-// solution is found by bisection: the values within a distance of 0 are the more the greater the distance is.
+// Method: a system whose numbers leave 64 bits is solved again from the start with 128 bits, and then with big
+// integers.  The smallest solution is found by bisection: the values within a distance of 0 are the more the greater
+// the distance is.
 //
 // Cost: that of the reduction and of the search for an integer point; the smallest solution takes a logarithmic number
 // of them for each variable.
@@ -43,6 +44,10 @@ std::optional<std::vector<BigInteger>> LinearSolver::solve(std::span<const Linea
                                                            std::size_t variables) {
     try {
         return solveWith<CheckedInteger>(constraints, variables, steps_);
+    } catch (const Overflow&) { // a wider kind may do
+    }
+    try {
+        return solveWith<CheckedInt128>(constraints, variables, steps_);
     } catch (const Overflow&) {
         return solveWith<BigInteger>(constraints, variables, steps_);
     }

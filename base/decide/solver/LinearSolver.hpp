@@ -1,7 +1,7 @@
 // Decides whether linear constraints have a common solution in the integers, and finds a small one.
 //
-// Numbers are exact at any size: the work is done with 64 bits and done again with packaged big integers where one
-// overflows.  An answer is proven, or the steps were used up.
+// Numbers are exact at any size: the work is done with 64 bits and done again with 128 bits or with packaged big
+// integers where one overflows.  An answer is proven, or the steps were used up.
 #pragma once
 
 #include "base/decide/Steps.hpp"

@@ -346,12 +346,17 @@ WitnessSearch::PathEnd WitnessSearch::tryPath(std::span<const LevelRange> ranges
     return end;
 }
 
-bool WitnessSearch::excludesPath(std::span<const LevelRange> ranges) {
+bool WitnessSearch::excludesPath(std::span<const LevelRange> ranges, std::uint64_t most) {
     const std::size_t before = system_.size();
-    for (const LevelRange& range : ranges)
-        restrict(question_->levels()[range.level], range.low, range.high);
-    std::vector<std::int64_t> values;
-    const bool excludes = !system_.solve(values) || (!terms_.empty() && !solvePath(false));
+    const Steps::Share share(steps_, most);
+    bool excludes = false;
+    try {
+        for (const LevelRange& range : ranges)
+            restrict(question_->levels()[range.level], range.low, range.high);
+        std::vector<std::int64_t> values;
+        excludes = !system_.solve(values) || (!terms_.empty() && !solvePath(false));
+    } catch (const StepsUsedUp&) { // a question whose own steps are used up notices soon
+    }
     shrink(before);
     return excludes;
 }

@@ -62,8 +62,8 @@ public:
     /// Whether some values lie in the ranges, which suffice for the question to hold.  Those at hand are then the
     /// smallest, if nothing computed is among the unknowns.
     PathEnd tryPath(std::span<const LevelRange> ranges);
-    /// Whether it is proven that no values lie in the ranges.
-    bool excludesPath(std::span<const LevelRange> ranges);
+    /// Whether so many steps suffice to prove that no values lie in the ranges.
+    bool excludesPath(std::span<const LevelRange> ranges, std::uint64_t most);
     /// Restricts an unknown on all paths that follow.
     void restrictPaths(Unknown unknown, std::int64_t low, std::int64_t high);
 
