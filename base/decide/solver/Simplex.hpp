@@ -6,7 +6,7 @@
 // one denominator, as in fraction-free elimination (Bareiss, 1968), so that no fraction is reduced; what is not in the
 // basis has an integer as its value.
 //
-// Cost: a pivot takes steps for the entries of the tableau and their length.
+// Cost: a pivot takes steps for the entries of the tableau that are not 0 and their length.
 #pragma once
 
 #include "base/decide/solver/IntegerRows.hpp"
@@ -56,8 +56,8 @@ public:
     /// Whether all bounds can be met.  Throws StepsUsedUp.
     bool solve() {
         for (;;) {
-            IntegerRows::charge(steps_, tableau_.size() * columns_.size(), denominator_);
             const auto [row, rises] = violated();
+            charge(denominator_);
             if (row == basis_.size())
                 return true;
             const std::size_t column = entering(row, rises);
@@ -91,11 +91,20 @@ public:
     [[nodiscard]] const Number& denominator() const noexcept { return denominator_; }
 
 private:
+    /// Takes steps for the products since the last time, and for looking at the tableau.
+    void charge(const Number& typical) {
+        constexpr std::size_t looksPerStep = 64;
+        steps_.take(tableau_.size() * columns_.size() / looksPerStep);
+        IntegerRows::charge(steps_, std::exchange(products_, 0), typical);
+    }
+
     [[nodiscard]] Number numeratorOf(std::size_t row) const {
         Number sum(0);
         for (std::size_t j = 0; j < columns_.size(); ++j)
-            if (const Number& value = values_[columns_[j]]; value != Number(0))
+            if (const Number& value = values_[columns_[j]]; value != Number(0) && tableau_[row][j] != Number(0)) {
+                ++products_;
                 sum += tableau_[row][j] * value;
+            }
         return sum;
     }
 
@@ -155,7 +164,6 @@ private:
 
     /// Moves the variable of a column until one is at a bound; false where none ever is.
     bool move(std::size_t column, bool up) {
-        IntegerRows::charge(steps_, tableau_.size() * columns_.size(), denominator_);
         const std::size_t variable = columns_[column];
         const std::optional<Number>& own = up ? bounds_[variable].high : bounds_[variable].low;
         std::size_t blocking = basis_.size();
@@ -181,6 +189,7 @@ private:
             least = std::move(room);
             blocking = i;
         }
+        charge(denominator_);
         if (!least)
             return false;
         if (blocking == basis_.size()) {
@@ -197,14 +206,19 @@ private:
 
     void pivot(std::size_t row, std::size_t column) {
         const Number by = tableau_[row][column];
-        IntegerRows::charge(steps_, tableau_.size() * columns_.size(), by);
+        charge(by);
         for (std::size_t i = 0; i < tableau_.size(); ++i) {
-            if (i == row)
-                continue;
             const Number factor = tableau_[i][column];
-            for (std::size_t j = 0; j < columns_.size(); ++j)
-                if (j != column)
-                    tableau_[i][j] = Number(tableau_[i][j] * by - factor * tableau_[row][j]) / denominator_;
+            if (i == row || (factor == Number(0) && by == denominator_))
+                continue;
+            for (std::size_t j = 0; j < columns_.size(); ++j) {
+                Number& entry = tableau_[i][j];
+                const bool changes = factor != Number(0) && tableau_[row][j] != Number(0);
+                if (j == column || (!changes && entry == Number(0)))
+                    continue;
+                products_ += changes ? 2 : 1;
+                entry = (changes ? Number(entry * by - factor * tableau_[row][j]) : Number(entry * by)) / denominator_;
+            }
         }
         for (std::size_t j = 0; j < columns_.size(); ++j)
             if (j != column)
@@ -234,6 +248,7 @@ private:
     std::vector<Number> values_; ///< of those that are not in the basis
     std::vector<Bounds<Number>> bounds_;
     Number denominator_{1};
+    mutable std::size_t products_ = 0; ///< computed since steps were taken for them
 };
 
 } // namespace VT

@@ -194,7 +194,11 @@ bool WitnessSearch::comesBefore(Unknown a, Unknown b, Order order) const {
     return question_->rankOf(a) < question_->rankOf(b);
 }
 
+/// Throws StepsUsedUp, too, where paths that nothing meets take more than a part of the steps: a search that learns
+/// from them takes fewer.
 void WitnessSearch::walkPaths(Diagram diagram) {
+    constexpr std::uint64_t part = 8;
+    std::uint64_t inVain = 0;
     frames_.clear();
     solutions_.assign(1, {});
     if (!system_.solve(solutions_.back()))
@@ -214,10 +218,17 @@ void WitnessSearch::walkPaths(Diagram diagram) {
         steps_.take();
         if (child == never || !take(frame, edge))
             continue;
-        if (child == always)
-            unconfirmed_ = reachedTruth() == PathEnd::Open || unconfirmed_;
-        else
+        if (child != always) {
             enter(child);
+            continue;
+        }
+        const std::uint64_t before = steps_.left();
+        const PathEnd end = reachedTruth();
+        unconfirmed_ = unconfirmed_ || end == PathEnd::Open;
+        if (end == PathEnd::Excluded)
+            inVain += before - steps_.left();
+        if (inVain > steps_.total() / part)
+            throw StepsUsedUp{};
     }
 }
 
