@@ -59,6 +59,7 @@ std::optional<ConditionReader::Value> ConditionReader::joined(SymbolicOp op, con
         return Value{Kind::RealTerm};
     Value value{Kind::Number};
     value.isReal = isReal;
+    value.isLiteral = a.isLiteral && (b != nullptr ? b->isLiteral : op == SymbolicOp::UnaryMinus);
     const Cases left = casesOf(a);
     const Cases right = b != nullptr ? casesOf(*b) : Cases{};
     bool isLinear = b != nullptr || op == SymbolicOp::UnaryMinus || !isReal;
@@ -97,8 +98,10 @@ std::optional<ConditionReader::Value> ConditionReader::addedUp(const Frame& fram
         return std::nullopt;
     std::vector<LinearPart> parts;
     LinearForm all;
+    bool isLiteral = true;
     for (std::size_t i = 0; i < ops.size(); ++i) {
         const Value& value = operand(frame, i);
+        isLiteral = isLiteral && value.isLiteral;
         const bool isPlain = value.kind == Value::Kind::Number && !value.isReal && value.cases.size() == 1;
         const LinearForm* form = isPlain ? value.cases.front().form.small() : nullptr;
         if (form == nullptr || value.cases.front().guard != always)
@@ -125,15 +128,17 @@ std::optional<ConditionReader::Value> ConditionReader::addedUp(const Frame& fram
         return std::nullopt;
     Value value{Value::Kind::Number};
     value.cases.push_back({always, std::move(all)});
+    value.isLiteral = isLiteral;
     return value;
 }
 
-/// Two literals, one of them a real number, rounded as they are folded.
+/// Two literals, one of them a real number, rounded as they are folded.  What is constant otherwise, like A-A+3, is not
+/// a literal.
 std::optional<ConditionReader::Value> ConditionReader::ofLiterals(SymbolicOp op, const Value& a, const Value& b) const {
     const auto literal = [&](const Value& value) -> std::optional<double> {
         if (value.kind == Value::Kind::Real)
             return value.real;
-        const auto constant = value.isReal ? std::nullopt : constantOf(value);
+        const auto constant = value.isLiteral ? constantOf(value) : std::nullopt;
         const LinearForm* small = constant ? constant->small() : nullptr;
         return small != nullptr ? std::optional(static_cast<double>(small->constant)) : std::nullopt;
     };

@@ -191,6 +191,7 @@ void ConditionReader::store(SymbolicExprId id, Value value) {
 ConditionReader::Value ConditionReader::ofNumber(std::int64_t number) {
     Value value{Value::Kind::Number};
     value.cases.push_back({always, LinearForm{{}, number}});
+    value.isLiteral = true;
     return value;
 }
 

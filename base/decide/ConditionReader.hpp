@@ -73,6 +73,7 @@ private:
         Cases cases = {};
         std::optional<Gate> nonZero = {}; ///< where a number is known to differ from 0, beside what its cases say
         bool isReal = false;              ///< whether a number is real: its quotients are exact
+        bool isLiteral = false;           ///< whether a number is made of integer literals alone
     };
 
     struct Frame {

@@ -112,7 +112,7 @@ std::optional<TermPlan::Exact> TermPlan::computeExact(const Node& node, const Ex
         const auto difference = combine(a.number, 1, b.number, -1);
         return difference ? std::optional(ofTruth(compareNumbers(node.op, difference->sign(), 0))) : std::nullopt;
     }
-    if (node.operands == 1 && node.op == SymbolicOp::UnaryMinus && a.literal)
+    if (node.operands == 1 && node.op == SymbolicOp::UnaryMinus && a.literal && a.isReal)
         return ofReal(-*a.literal);
     if (!finite)
         return std::nullopt;
@@ -127,7 +127,10 @@ std::optional<TermPlan::Exact> TermPlan::computeExact(const Node& node, const Ex
             number = combine(a.number, -1, LinearForm{{}, -1}, 1);
         else if (value)
             number = RationalForm(BigInteger(*value));
-        return number ? std::optional(Exact{*std::move(number), isReal}) : std::nullopt;
+        if (!number)
+            return std::nullopt;
+        const bool isLiteral = node.op == SymbolicOp::UnaryMinus && a.literal;
+        return Exact{*std::move(number), isReal, isLiteral ? std::optional(-*a.literal) : std::nullopt};
     }
     if (isReal && a.literal && b.literal)
         if (const auto folded = foldedReals(node.op, *a.literal, *b.literal))
