@@ -108,7 +108,7 @@ inline constexpr int nestedFloors = 64;
 /// integer point.
 inline constexpr std::int64_t eliminationGrowth = 2;
 
-/// Splits of a body in that search before it is made round anew with the exact widths of all its slabs.
+/// Splits of a body as it is before that search makes it round, and of that before it takes the widths of all slabs.
 inline constexpr std::size_t firstBranches = 64;
 
 /// Steps of the further questions of a comparison after one that used up its own, so that a hard pair costs little more

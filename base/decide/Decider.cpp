@@ -69,8 +69,8 @@ struct Decider::State {
     void clear();
 
     DecisionOptions options;
-    std::uint64_t questionSteps; ///< that a question may cost
-    Budget* budget = nullptr;    ///< of several questions
+    std::uint64_t questionSteps;                                           ///< that a question may cost
+    Budget* budget = nullptr;                                              ///< of several questions
     std::size_t solverQuestions = std::numeric_limits<std::size_t>::max(); ///< that may go to the solver
     SymbolicExprPrinter printer;
     LeafReader leafReader;
@@ -285,7 +285,7 @@ void Decider::State::keepFunctions(Decision& decision, Gate truth, std::span<con
 
 /// Asks another solver what stayed undecided.
 void Decider::State::askSolver(AskedOf asked, std::span<const SymbolicExprId> ids, Decision& decision) {
-    if (options.solver == nullptr || solverQuestions == 0)
+    if (options.solver == nullptr || solverQuestions == 0 || (budget != nullptr && budget->left() == 0))
         return;
     if (budget != nullptr && budget->left() < limits::solverSteps)
         return;

@@ -99,6 +99,16 @@ TEST(ExternalSolver, IsAskedNoMoreThanAllowed) {
     EXPECT_EQ(fixture.text(fixture.decider.canHold(condition)), "no");
 }
 
+TEST(ExternalSolver, IsNotAskedOnceABudgetIsUsedUp) {
+    DecisionFixture fixture(with(SolverPlugin::installed()));
+    Budget budget(1000);
+    fixture.decider.share(&budget);
+    const SymbolicExprId condition = fixture.parse("X*X == 2");
+    EXPECT_EQ(fixture.text(fixture.decider.canHold(condition)), "no");
+    budget.take(budget.left());
+    EXPECT_EQ(fixture.text(fixture.decider.canHold(condition)), "undecided steps");
+}
+
 /// The answer to a question that needs a solver.
 std::string answerOf(SolverPlugin& plugin, const char* question = "X*X == 2") {
     DecisionFixture fixture(with(plugin));

@@ -147,6 +147,37 @@ TEST(ServiceDecisions, OfSetsAndOfWhatIsNoCondition) {
     }
 }
 
+/// They are undecided once it is used up; that is not remembered.
+TEST(ServiceDecisions, ShareABudget) {
+    const FreshService service;
+    Budget budget(5000);
+    service->shareBudget(&budget);
+    const auto ask = [&](std::size_t i) {
+        const std::string number = std::to_string(i);
+        return service->implies(service->parseC("A<B && B<" + number + " || A==C"), service->parseC("A!=D+" + number));
+    };
+    std::size_t asked = 0;
+    for (; budget.left() > 0; ++asked) {
+        ASSERT_LT(asked, 5000U);
+        const Decision decision = ask(asked);
+        EXPECT_TRUE(decision.isNo() || budget.left() == 0);
+    }
+    EXPECT_GT(asked, 10U);
+    EXPECT_TRUE(ask(0).isNo()) << "an answer of before";
+    const VCSymbolicExprId a = service->parseC("A<B && B<C");
+    const VCSymbolicExprId b = service->parseC("A<C");
+    for (const Decision& decision : {ask(asked), service->implies(a, b), Decision(service->covers({a, b}))}) {
+        EXPECT_TRUE(decision.isUndecided());
+        EXPECT_EQ(decision.bound, DecisionBound::Steps);
+    }
+    EXPECT_EQ(service->compare(a, b).kind, RelationKind::Undecided);
+    EXPECT_FALSE(service->explainImplies(a, b).isProven);
+    service->shareBudget(nullptr);
+    EXPECT_TRUE(ask(asked).isNo());
+    EXPECT_EQ(service->compare(a, b).kind, RelationKind::Implies);
+    EXPECT_TRUE(service->explainImplies(a, b).isProven);
+}
+
 TEST(ServiceCombinations, OfConstantsAndConditions) {
     for (const CaseRow& row : casesOf("service.txt", "both and either", 6)) {
         SCOPED_TRACE(row[0] + " with " + row[1]);

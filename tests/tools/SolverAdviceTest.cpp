@@ -30,5 +30,20 @@ TEST(SolverAdvice, NamesThePackageWhereAQuestionNeedsIt) {
         << "a question that needs no solver says nothing of it";
 }
 
+TEST(SolverAdvice, IsInEveryAnswer) {
+    const TemporaryFolder place;
+    const std::string reason = "it depends on arithmetic beyond linear terms; a solver may decide it: apt install "
+                               "libvtsym-z3, then run this again";
+    EXPECT_EQ(runScript(place, copyLibrary + "vtsym compare --json 'X*X == 2' 'X*X == 3'", {}, elsewhere).out,
+              R"({"line":1,"a":"X*X == 2","b":"X*X == 3","relation":"undecided","reason":")" + reason + "\"}\n");
+    EXPECT_EQ(runScript(place, "vtsym dims --prove 'N*N != 2'", {}, elsewhere).out, "undecided: " + reason + "\n");
+    EXPECT_EQ(runScript(place, "vtsym dims --json --prove 'N*N != 2'", {}, elsewhere).out,
+              R"({"claim":"N*N != 2","answer":"undecided","reason":")" + reason + "\"}\n");
+    place.write("m",
+                R"({"blocks": [{"name": "S", "choices": [{"name": "c", "condition": "A*A==2"}, {"name": "d"}]}]})");
+    const ProgramResult check = runScript(place, "vtsym check m", {}, elsewhere);
+    EXPECT_NE(check.err.find("Whether S/c can be active stays undecided: " + reason), std::string::npos) << check.err;
+}
+
 } // namespace
 } // namespace VT::Testing

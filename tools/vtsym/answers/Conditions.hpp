@@ -29,6 +29,10 @@ public:
     /// To be called before the service reads a text.  Returns whether the service was renewed.
     bool makeRoomFor(const std::string& text);
 
+    /// Whether the steps of all questions are used up: those that follow are undecided, unless the next text brings
+    /// enough.
+    [[nodiscard]] bool stepsUsedUp() const { return budget_->left() == 0; }
+
     /// The condition of a text in the language of the options: as written, or as the service simplifies it.
     [[nodiscard]] VT::SymbolicExprId parse(const TextOptions& options, const std::string& text) const;
     [[nodiscard]] VT::SymbolicExprId simplify(const TextOptions& options, const std::string& text) const;

@@ -3,6 +3,7 @@
 #include "tools/vtsym/answers/ReasonText.hpp"
 #include "tools/vtsym/commands/Commands.hpp"
 #include "tools/vtsym/commands/Pairs.hpp"
+#include "tools/vtsym/findings/UndecidedText.hpp"
 #include "tools/vtsym/io/Json.hpp"
 
 #include <array>
@@ -27,12 +28,6 @@ Examples:
 /// In the order of VT::RelationKind.
 constexpr std::array<const char*, 6> relations{"equivalent", "disjoint", "implies",
                                                "implied by", "overlaps", "undecided"};
-
-std::string reasonOf(VT::DecisionBound bound) {
-    const char* const reason = bound == VT::DecisionBound::Steps ? ": it takes too many steps"
-                                                                 : ": it depends on arithmetic beyond linear terms";
-    return reason + solverAdvice();
-}
 
 class Comparer {
 public:
@@ -92,10 +87,15 @@ private:
             appendMember(out, "because", "{" + json.substr(1) + "}");
     }
 
+    /// Why a relation is undecided.
+    [[nodiscard]] std::string reasonOf(const VT::Relation& relation) const {
+        return "it " + undecidedText(relation.bound, conditions_.stepsUsedUp());
+    }
+
     void appendText(const VT::Relation& relation, std::string& out) const {
         out.append(relations.at(static_cast<std::size_t>(relation.kind)));
         if (relation.kind == VT::RelationKind::Undecided)
-            out.append(reasonOf(relation.bound));
+            out.append(": ").append(reasonOf(relation));
         const auto append = [&](const char* who, const VT::Decision& decision) {
             if (decision.witness)
                 out.append("; ").append(who).append(witnessText(conditions_, options_, *decision.witness));
@@ -110,6 +110,8 @@ private:
         appendMember(out, "a", jsonString(pair.firstText));
         appendMember(out, "b", jsonString(pair.secondText));
         appendMember(out, "relation", jsonString(relations.at(static_cast<std::size_t>(relation.kind))));
+        if (relation.kind == VT::RelationKind::Undecided)
+            appendMember(out, "reason", jsonString(reasonOf(relation)));
         std::string witnesses;
         const auto append = [&](const char* who, const VT::Decision& decision) {
             if (decision.witness)

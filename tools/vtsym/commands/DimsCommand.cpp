@@ -1,5 +1,7 @@
 // vtsym dims: dimension expressions in the forms that the host works with: integers, simplified, divisions pulled out.
 // Each text has a table of its own, in which the definitions are bound again.
+#include "base/core/Nodes.hpp"
+#include "base/core/Walk.hpp"
 #include "base/decide/DimensionProofs.hpp"
 #include "base/decide/external/SolverPlugin.hpp"
 #include "base/decide/reasons/ReasonSearch.hpp"
@@ -14,10 +16,12 @@
 #include "tools/vtsym/answers/ValueText.hpp"
 #include "tools/vtsym/commands/Commands.hpp"
 #include "tools/vtsym/commands/Definitions.hpp"
+#include "tools/vtsym/findings/UndecidedText.hpp"
 #include "tools/vtsym/io/CommandLine.hpp"
 #include "tools/vtsym/io/Json.hpp"
 #include "tools/vtsym/io/Texts.hpp"
 
+#include <cmath>
 #include <optional>
 #include <string_view>
 
@@ -42,13 +46,37 @@ struct DimsOptions : TextOptions {
     std::vector<std::string> claims;
 };
 
-/// Reads a dimension expression and turns its numbers into integers.  Throws the first diagnostic of the reader.
-VT::SymbolicExprId readDimension(VT::SymbolicExprTable& table, const std::string& text) {
+/// A dimension expression, as written.  Throws the first diagnostic of the reader.
+VT::SymbolicExprId readUncast(VT::SymbolicExprTable& table, const std::string& text) {
     VT::VTSymbolicExprErrorChecker checker;
     const VT::SymbolicExprId id = VT::SymbolicExprFromQParseTree(table, checker)(text);
     if (!checker.diagnostics().empty())
         throw VT::HostDiagnostic(checker.diagnostics().front());
-    return VT::SymbolicExprCast2Int(table).cast2Int(id);
+    return id;
+}
+
+/// The same with integers for its numbers.
+VT::SymbolicExprId readDimension(VT::SymbolicExprTable& table, const std::string& text) {
+    return VT::SymbolicExprCast2Int(table).cast2Int(readUncast(table, text));
+}
+
+/// A sentence for each number that its integer is far from, since dimensions have 32 bits.
+std::vector<std::string> tooLarge(const VT::SymbolicExprTable& table, VT::SymbolicExprId uncast) {
+    constexpr double beyond = 2147483648.0;
+    const VT::SymbolicExprPrinter printer(table, true);
+    std::vector<std::string> sentences;
+    VT::walkDistinct(
+        table, uncast,
+        [&](VT::SymbolicExprId id, const VT::SymbolicExpr& node) {
+            if (node.op() != VT::SymbolicOp::DoubleValue)
+                return;
+            const double rounded = std::round(static_cast<const VT::SymbolicDoubleValue&>(node).getValue());
+            if (!(rounded >= -beyond && rounded < beyond))
+                sentences.push_back(printer(id) +
+                                    " is not an integer of 32 bits, as dimensions are: it becomes -2147483648");
+        },
+        [](VT::SymbolicExprId) {});
+    return sentences;
 }
 
 void define(VT::SymbolicExprTable& table, const DimsOptions& options) {
@@ -122,10 +150,13 @@ private:
     bool begun_ = false;
 };
 
-void answer(const DimsOptions& options, const Style& style, const std::string& text, std::string& out) {
+void answer(const DimsOptions& options, const Style& style, const std::string& text, std::string& out,
+            std::vector<std::string>& warnings) {
     VT::SymbolicExprTable table;
     define(table, options);
-    const VT::SymbolicExprId cast = readDimension(table, text);
+    const VT::SymbolicExprId uncast = readUncast(table, text);
+    warnings = tooLarge(table, uncast);
+    const VT::SymbolicExprId cast = VT::SymbolicExprCast2Int(table).cast2Int(uncast);
     const std::optional<VT::SymbolicValue> value = valueOf(table, cast);
     std::uint64_t passes = 0;
     const VT::SymbolicExprId simplified = VT::SymbolicExprSimplify(table).simplify(cast, passes);
@@ -184,12 +215,16 @@ bool prove(const DimsOptions& options, Console& console) {
                 .append(":")
                 .append(std::to_string(each.value));
         }
+        const std::string reason =
+            decision.isUndecided() ? "it " + undecidedText(decision.bound, budget.left() == 0) : "";
         if (!options.json) {
-            console.out(answer + witness + "\n");
+            console.out(answer + (reason.empty() ? "" : ": " + reason) + witness + "\n");
             continue;
         }
         std::string out = "{\"claim\":" + jsonString(text);
         appendMember(out, "answer", jsonString(answer));
+        if (!reason.empty())
+            appendMember(out, "reason", jsonString(reason));
         if (decision.witness)
             appendMember(out, "witness", "{" + json + "}");
         console.out(out + "}\n");
@@ -219,10 +254,11 @@ void addDims(CommandLine& program) {
     command.run = [options](Console& console) -> ExitStatus {
         if (!options->claims.empty())
             return prove(*options, console);
+        std::vector<std::string> warnings;
         const auto answerText = [&](const std::string& text, std::string& out) {
-            answer(*options, console.outStyle(), text, out);
+            answer(*options, console.outStyle(), text, out, warnings);
         };
-        return answerTexts(*options, console, {answerText, !options->json});
+        return answerTexts(*options, console, {answerText, !options->json, &warnings});
     };
 }
 

@@ -2,14 +2,12 @@
 // a text with offsets that count from its beginning.
 #include "tools/vtsym/commands/Pairs.hpp"
 
-#include "base/decide/external/SolverPlugin.hpp"
 #include "host/Diagnostics.hpp"
 #include "tools/vtsym/io/CommandLine.hpp"
 #include "tools/vtsym/io/ErrorText.hpp"
 #include "tools/vtsym/io/Json.hpp"
 
 #include <algorithm>
-#include <cstdlib>
 
 namespace vtsym {
 
@@ -94,17 +92,6 @@ std::string witnessJson(const Conditions& conditions, const TextOptions& options
         json.append(":").append(std::to_string(each.value));
     }
     return "{" + json + "}";
-}
-
-std::string solverAdvice() {
-    VT::SolverPlugin& plugin = VT::SolverPlugin::installed();
-    if (plugin.functions() != nullptr)
-        return "";
-    if (!plugin.fault().empty())
-        return "; " + plugin.fault();
-    const char* const packages = std::getenv("VTSYM_SOLVER_PACKAGES"); // set by ./run
-    return std::string("; a solver may decide it: apt install ") + (packages != nullptr ? packages : "libvtsym-z3") +
-           ", then run this again";
 }
 
 } // namespace vtsym

@@ -34,9 +34,6 @@ void addPairOptions(Command& command, PairOptions& options, const std::string& f
 /// Reads a pair.  Throws CommandError with one error for each condition that cannot be read, placed in the whole text.
 ConditionPair readPair(const Conditions& conditions, const TextOptions& options, const std::string& text);
 
-/// What to do so that a solver is asked what stays undecided, after a "; "; nothing where one was.
-std::string solverAdvice();
-
 /// An assignment as text, "A=3, B=0", and as a JSON object.
 std::string witnessText(const Conditions& conditions, const TextOptions& options, const VT::Witness& witness);
 std::string witnessJson(const Conditions& conditions, const TextOptions& options, const VT::Witness& witness);

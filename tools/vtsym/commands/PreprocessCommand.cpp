@@ -1,5 +1,5 @@
 // vtsym pp: conditions as the host generates them for preprocessor directives, shortened under a known condition.
-// Unlike `given`, it takes parts away without searching for the shortest form.
+// Parts are taken away from the text as written; the shortest form is written only where it is shorter still.
 #include "base/decide/shorten/StringifyImpliedCondition.hpp"
 #include "base/transform/QuillConversion.hpp"
 #include "tools/vtsym/answers/Conditions.hpp"
@@ -62,7 +62,12 @@ void Preprocessor::answer(const std::string& text, std::string& out) {
                                          ? VT::invalidId
                                          : toC(conditions_.parse(options_, options_.given));
     const VT::SymbolicExprId condition = toC(conditions_.parse(options_, text));
-    const std::string result = VT::StringifyImpliedCondition(table, false, true, given).print(condition);
+    std::string result = VT::StringifyImpliedCondition(table, false, true, given).print(condition);
+    if (given != VT::invalidId) {
+        std::string shortest = conditions_.print(options_, conditions_.shortestGiven(options_, condition, given));
+        if (shortest.size() < result.size())
+            result = std::move(shortest);
+    }
     warnings = conditions_.warnings(options_, condition);
     if (options_.json)
         appendMember(out, "result", jsonString(result));

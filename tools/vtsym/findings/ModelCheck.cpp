@@ -10,6 +10,7 @@
 #include "base/variants/VariantKeywords.hpp"
 #include "host/Diagnostics.hpp"
 #include "host/Text.hpp"
+#include "tools/vtsym/findings/UndecidedText.hpp"
 #include "tools/vtsym/io/Json.hpp"
 
 #include <algorithm>
@@ -371,10 +372,7 @@ void ModelCheck::reportUndecided(const VTBlock& set, std::span<const VTBlock* co
     default:
         question = path + (finding.fault == VT::ChoiceFault::Dead ? " can be active" : " is always active");
     }
-    problem(placeOf(block),
-            "Whether " + question + " stays undecided: it " +
-                (finding.bound == VT::DecisionBound::Steps ? "takes too many steps."
-                                                           : "depends on arithmetic beyond linear terms."));
+    problem(placeOf(block), "Whether " + question + " stays undecided: it " + undecidedText(finding.bound) + ".");
 }
 
 void ModelCheck::checkPort(const vtPort& port) {
@@ -387,7 +385,8 @@ void ModelCheck::checkPort(const vtPort& port) {
     Place place = regionOf(file_, port.place());
     place.name = port.name();
     if (flows.isUndecided())
-        problem(place, "Whether the port " + port.name() + " can be active stays undecided.");
+        problem(place, "Whether the port " + port.name() + " can be active stays undecided: it " +
+                           undecidedText(flows.bound) + ".");
     if (!flows.isNo())
         return;
     std::vector<RelatedPlace> follows = conditionsAround(&port.source());
