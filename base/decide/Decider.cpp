@@ -285,7 +285,7 @@ void Decider::State::keepFunctions(Decision& decision, Gate truth, std::span<con
 
 /// Asks another solver what stayed undecided.
 void Decider::State::askSolver(AskedOf asked, std::span<const SymbolicExprId> ids, Decision& decision) {
-    if (options.solver == nullptr || solverQuestions == 0 || (budget != nullptr && budget->left() == 0))
+    if (options.solver == nullptr || solverQuestions == 0)
         return;
     if (budget != nullptr && budget->left() < limits::solverSteps)
         return;

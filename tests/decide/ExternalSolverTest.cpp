@@ -101,7 +101,7 @@ TEST(ExternalSolver, IsAskedNoMoreThanAllowed) {
 
 TEST(ExternalSolver, IsNotAskedOnceABudgetIsUsedUp) {
     DecisionFixture fixture(with(SolverPlugin::installed()));
-    Budget budget(1000);
+    Budget budget(limits::commandSteps);
     fixture.decider.share(&budget);
     const SymbolicExprId condition = fixture.parse("X*X == 2");
     EXPECT_EQ(fixture.text(fixture.decider.canHold(condition)), "no");
