@@ -1,5 +1,5 @@
 // Unions of boxes against brute force over a small grid: a point is found exactly where one is left out.
-#include "base/choices/BoxUnion.hpp"
+#include "base/choices/boxes/BoxUnion.hpp"
 
 #include <algorithm>
 #include <array>

@@ -4,7 +4,7 @@
 // choice hides: a point of the choice, one outside of it, and one for each operand, product and group.  Points found on
 // the way refute most comparisons that a whole group might be written as. Cost: a question for each operand and
 // product, at most limits::boxSteps each, and a few for groups.
-#include "base/choices/ChoiceBoxes.hpp"
+#include "base/choices/boxes/ChoiceBoxes.hpp"
 #include "base/core/Limits.hpp"
 
 #include <algorithm>
