@@ -53,6 +53,7 @@ struct ChoiceFinding {
     /// one that closes the gap, or the invalid identifier where it is long or not proven.
     SymbolicExprId proposed = invalidId;
     std::vector<std::size_t> hiddenBy = {}; ///< of a dead choice: earlier ones that hide it, unless there are many
+    bool isHidden = false;                  ///< of a dead choice: earlier ones hide it, it is not dead by itself
     /// Operands of declared values, assumptions, the parent and the choice for which it is dead, always active or
     /// redundant, where they were asked for; of a hidden choice those that hide it are left out.
     Reasons reasons = {};

@@ -203,10 +203,11 @@ void ChoiceSetChecker::State::findHiding(ChoiceFinding& finding, const Place& pl
                                          SymbolicExprId holds, ChoiceBoxes& boxes) {
     std::vector<SymbolicExprId> premises = place.premises;
     premises.push_back(condition);
-    if (place.earlierHold.empty() || !isActiveAlone(finding.choice, holds, boxes)) {
+    if (place.earlierHold.empty() || isDeadAlone(finding.choice, holds, boxes)) {
         finding.reasons = reasonsBy([&](ReasonSearch& search) { return search.whyNever(premises); });
         return;
     }
+    finding.isHidden = true;
     std::vector<SymbolicExprId> some;
     std::vector<std::size_t> earlier;
     const auto subset = minimalSubset(place.earlierHold.size(), [&](std::span<const std::size_t> positions) {
@@ -234,10 +235,10 @@ void ChoiceSetChecker::State::findHiding(ChoiceFinding& finding, const Place& pl
     finding.reasons = reasonsBy([&](ReasonSearch& search) { return search.whyImplied(premises, hiding); });
 }
 
-/// Whether a choice is active where those before it do not count.
-bool ChoiceSetChecker::State::isActiveAlone(std::size_t position, SymbolicExprId holds, ChoiceBoxes& boxes) {
+/// Whether a choice is never active, even where those before it do not count.
+bool ChoiceSetChecker::State::isDeadAlone(std::size_t position, SymbolicExprId holds, ChoiceBoxes& boxes) {
     const Answer seen = counted(boxes, boxes.isActiveWithout(position, {}));
-    return seen == Answer::Yes || (seen == Answer::Undecided && ask(&Decider::canHold, holds).isYes());
+    return seen == Answer::No || (seen == Answer::Undecided && ask(&Decider::canHold, holds).isNo());
 }
 
 /// Whether a choice is active where those before it do not count, and at first by values for which it holds at all.

@@ -70,7 +70,7 @@ struct ChoiceSetChecker::State {
                     ChoiceBoxes& boxes);
     Decision heldAt(const BoxPoint& point, SymbolicExprId condition, const ChoiceBoxes& boxes);
     Decision findActive(const Place& place, SymbolicExprId holds, SymbolicExprId left);
-    bool isActiveAlone(std::size_t position, SymbolicExprId holds, ChoiceBoxes& boxes);
+    bool isDeadAlone(std::size_t position, SymbolicExprId holds, ChoiceBoxes& boxes);
     template <class Search>
     Reasons reasonsBy(Search search);
     SymbolicExprId shorten(SymbolicExprId context, SymbolicExprId condition,

@@ -44,7 +44,7 @@ BoxSearch::Outcome BoxSearch::look(std::size_t begin, bool& isNarrowed) {
     std::ranges::fill(lows_, IntegerSet::plusInfinity);
     std::ranges::fill(highs_, IntegerSet::minusInfinity);
     std::size_t fewest = 0;
-    std::size_t looks = part_.size() / 8;
+    std::size_t looks = part_.size();
     for (std::size_t i = begin; i < meeting_.size(); ++i) {
         const Cube& box = *boxes_[meeting_[i]];
         std::size_t cutting = 0;

@@ -19,8 +19,8 @@ public:
     /// `boxes` outlive the search.
     BoxSearch(BoxPart region, std::span<const Cube* const> boxes);
 
-    /// Yes where there is such a part, No where the region is covered, undecided after `steps` looks at a side of a
-    /// box, of which it takes away those that it took.
+    /// Yes where there is such a part, No where the region is covered, undecided after `steps`, of which it takes away
+    /// those that it took: one for a few looks at a side of a box.
     Answer run(std::uint64_t& steps);
 
     /// After Yes, values of each atom, none of which are in a box.
@@ -30,6 +30,8 @@ public:
     [[nodiscard]] const std::vector<std::uint32_t>& covering() const noexcept { return covering_; }
 
 private:
+    static constexpr std::size_t looksPerStep = 8;
+
     enum class Outcome : std::uint8_t { Covered, Free, Open };
 
     struct Split {
@@ -51,7 +53,11 @@ private:
     bool narrow(Atom atom, IntegerSet values);
     void undo(std::size_t length);
 
-    void take(std::size_t steps) { left_ -= left_ < steps ? left_ : steps; }
+    /// Takes a step for some looks at a side.
+    void take(std::size_t looks) {
+        const std::size_t steps = looks / looksPerStep + 1;
+        left_ -= left_ < steps ? left_ : steps;
+    }
 
     BoxPart part_;
     std::span<const Cube* const> boxes_;

@@ -2,13 +2,14 @@
 //
 // Method: boxes are kept in blocks with an index for each atom: the values at which a side begins or ends, and between
 // them a bit for each box that has them.  The boxes that hold a point are the And of a few masks.  Points found before
-// and corners of the region are tried first, then whether one box covers it; a point that a box holds moves out of it
-// a few times.  Otherwise BoxSearch decides, with the boxes that meet the region; where a value beyond all sides of an
-// atom is in the region, boxes with such a side need no look.
-// Cost: a few looks for each block where a point is left out; exponential in the atoms at worst, bounded by steps.
+// and some corners of the region are tried first, then whether one box covers it; a point that a box holds moves out of
+// it a few times.  Otherwise BoxSearch decides, with the boxes that meet the region; where a value beyond all sides of
+// an atom is in the region, boxes with such a side need no look. Cost: a few looks for each block where a point is left
+// out; exponential in the atoms at worst, bounded by steps.
 #include "base/choices/boxes/BoxUnion.hpp"
 
 #include "base/core/Limits.hpp"
+#include "base/util/Hash.hpp"
 
 #include <algorithm>
 #include <bit>
@@ -52,6 +53,18 @@ bool leave(const Cube& box, const Cube& region, std::size_t turn, BoxPoint& poin
         return true;
     }
     return false;
+}
+
+/// A corner of a region; `turn` picks the ends.
+BoxPoint cornerOf(const Cube& region, std::size_t atoms, std::uint64_t turn) {
+    BoxPoint point(atoms);
+    for (Atom atom = 0; atom < atoms; ++atom) {
+        const bool isHigh = hashStep(turn, atom) >> 63U != 0;
+        const IntegerSet* const side = region.find(atom);
+        const IntegerSet set = side != nullptr ? *side : IntegerSet::all();
+        point[atom] = isHigh ? set.high() : set.low();
+    }
+    return point;
 }
 
 /// The atom whose values in a region are fewest: the most likely to tell a point from a box.
@@ -259,6 +272,11 @@ BoxGap BoxUnion::gap(const Cube& region, std::span<const Cube> further, std::uin
         if (const auto cover = whole(region, steps))
             return {Answer::No, {}, {*cover}};
     }
+    for (std::uint64_t turn = 0; turn < limits::boxCorners && steps > 0; ++turn) {
+        BoxPoint point = cornerOf(region, atoms_, turn);
+        if (holderOf(point, first, further, steps) == nullptr)
+            return {Answer::Yes, std::move(point)};
+    }
     BoxGap found = search(region, further, steps);
     if (found.answer == Answer::Yes)
         remember(found.point);
@@ -282,20 +300,41 @@ BoxGap BoxUnion::search(const Cube& region, std::span<const Cube> further, std::
         if (isLeft[atom])
             part[atom] = std::move(beyond);
     }
-    const std::vector<std::uint32_t> positions = meeting(part, isLeft, steps);
+    std::vector<std::uint32_t> positions = meeting(part, isLeft, steps);
+    const bool areFew = positions.size() <= limits::boxesAtOnce;
+    if (!areFew)
+        positions.clear();
     std::vector<const Cube*> boxes;
-    for (const std::uint32_t position : positions)
-        boxes.push_back(&boxes_[position]);
     for (const Cube& box : further)
         boxes.push_back(&box);
-    BoxSearch search(std::move(part), boxes);
-    BoxGap gap{search.run(steps)};
-    if (gap.answer == Answer::Yes)
-        for (Atom atom = 0; atom < atoms_; ++atom)
-            gap.point.push_back(nearestIn(search.part()[atom], 0));
-    for (const std::uint32_t box : search.covering())
-        if (box < positions.size())
-            gap.covering.push_back(positions[box]);
+    for (const std::uint32_t position : positions)
+        boxes.push_back(&boxes_[position]);
+    BoxGap gap;
+    for (;;) {
+        BoxSearch search(part, boxes);
+        gap.answer = search.run(steps);
+        for (const std::uint32_t box : search.covering())
+            if (box >= further.size())
+                gap.covering.push_back(positions[box - further.size()]);
+        if (gap.answer != Answer::Yes)
+            break;
+        // Of many boxes those are added that hold what the others leave.
+        const std::size_t before = positions.size();
+        for (const std::int64_t aim : {std::int64_t{0}, IntegerSet::minusInfinity, IntegerSet::plusInfinity}) {
+            gap.point.clear();
+            for (const IntegerSet& values : search.part())
+                gap.point.push_back(nearestIn(values, aim));
+            const Cube* const holder = areFew ? nullptr : holderOf(gap.point, narrowest(region), {}, steps);
+            if (holder == nullptr)
+                return gap;
+            const auto position = static_cast<std::uint32_t>(holder - boxes_.data());
+            if (std::find(positions.begin() + static_cast<std::ptrdiff_t>(before), positions.end(), position) ==
+                positions.end()) {
+                positions.push_back(position);
+                boxes.push_back(holder);
+            }
+        }
+    }
     return gap;
 }
 

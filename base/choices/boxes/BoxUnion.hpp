@@ -41,7 +41,7 @@ public:
     /// took, and is undecided after `steps`.
     BoxGap gap(const Cube& region, std::span<const Cube> further, std::uint64_t& steps);
 
-    [[nodiscard]] std::size_t size() const noexcept { return boxes_.size(); }
+    [[nodiscard]] const std::vector<Cube>& boxes() const noexcept { return boxes_; }
 
 private:
     static constexpr std::size_t blockBoxes = 256;

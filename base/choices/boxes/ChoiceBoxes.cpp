@@ -9,6 +9,7 @@
 #include "base/core/Limits.hpp"
 #include "base/core/Nodes.hpp"
 #include "base/core/Walk.hpp"
+#include "base/decide/reasons/MinimalSubset.hpp"
 #include "base/transform/Symbols.hpp"
 #include "base/variants/VariantKeywords.hpp"
 
@@ -66,6 +67,7 @@ ChoiceBoxes::ChoiceBoxes(const SymbolicExprTable& table, SymbolicExprId context,
         if (form)
             restrict(*form);
     findCuts();
+    left_ = limits::boxSteps + choices.size() * limits::boxStepsPerChoice;
     hiding_.emplace(atomCount_);
     none_.emplace(atomCount_);
 }
@@ -236,7 +238,7 @@ Answer ChoiceBoxes::overlap(std::size_t a, std::size_t b) const {
 
 /// Looks for a point of a region that is in none of some boxes.
 BoxGap ChoiceBoxes::ask(BoxUnion& boxes, const Cube& region, std::span<const Cube> further) {
-    const std::uint64_t most = std::max(limits::leastBoxSteps, left_ / 16);
+    const std::uint64_t most = std::max(limits::leastBoxSteps, left_ / 8);
     std::uint64_t left = most;
     BoxGap gap = boxes.gap(region, further, left);
     steps_ += most - left;
@@ -292,6 +294,25 @@ void ChoiceBoxes::hide(std::size_t choice) {
     }
 }
 
+/// Looks for a point of the context that no box hides, or for the fewest boxes that hide all.
+void ChoiceBoxes::findHidingGap() {
+    hidingGap_ = ask(*hiding_, context_, {});
+    if (hidingGap_->answer != Answer::No)
+        return;
+    std::vector<std::uint32_t>& covering = hidingGap_->covering;
+    std::vector<Cube> some;
+    const MinimalSubset needed = minimalSubset(covering.size(), [&](std::span<const std::size_t> positions) {
+        some.clear();
+        for (const std::size_t at : positions)
+            some.push_back(hiding_->boxes()[covering[at]]);
+        const Answer answer = ask(*none_, context_, some).answer;
+        return answer == Answer::Undecided ? answer : answer == Answer::No ? Answer::Yes : Answer::No;
+    });
+    for (std::size_t i = 0; i < needed.positions.size(); ++i)
+        covering[i] = covering[needed.positions[i]];
+    covering.resize(needed.positions.size());
+}
+
 ChoiceBoxes::Activity ChoiceBoxes::activityOf(std::size_t choice) {
     if (!isKnown(choice) || !areHidingKnown_)
         return {};
@@ -300,7 +321,7 @@ ChoiceBoxes::Activity ChoiceBoxes::activityOf(std::size_t choice) {
     BoxGap gap = areAllHidden ? *hidingGap_ : leaves(boxes, *hiding_, {});
     // What hides one choice may hide all that follow.
     if (gap.answer == Answer::No && !hidingGap_ && !boxes.empty())
-        hidingGap_ = ask(*hiding_, context_, {});
+        findHidingGap();
     Activity result{gap.answer, std::move(gap.point)};
     for (const std::uint32_t box : gap.covering)
         result.hiddenBy.push_back(hidingChoices_[box]);

@@ -87,6 +87,7 @@ private:
     Atom atomOf(SymbolicExprId name);
     void restrict(Form& form) const;
     void findCuts();
+    void findHidingGap();
     [[nodiscard]] static std::vector<Cube> boxesOf(const Form& form);
     BoxGap ask(BoxUnion& boxes, const Cube& region, std::span<const Cube> further);
     BoxGap leaves(std::span<const Cube> regions, BoxUnion& boxes, std::span<const Cube> further);
@@ -108,8 +109,8 @@ private:
     std::optional<BoxGap> hidingGap_;
     std::optional<BoxUnion> none_; ///< no box
     bool areHidingKnown_ = true;
-    std::uint64_t left_ = limits::boxSteps; ///< steps of further questions
-    std::uint64_t steps_ = 0;               ///< taken since they were last asked for
+    std::uint64_t left_ = 0;  ///< steps of further questions
+    std::uint64_t steps_ = 0; ///< taken since they were last asked for
 };
 
 } // namespace VT

@@ -43,7 +43,7 @@ private:
     }
 
     /// A hidden part shows that the choice is not always active.
-    bool isNotAlways() { return boxes_.hiding_->size() > 0 || isSomewhere(boxes_.context_, all_); }
+    bool isNotAlways() { return !boxes_.hiding_->boxes().empty() || isSomewhere(boxes_.context_, all_); }
 
     bool isEachProductNeeded() {
         for (std::size_t i = 0; i < form_.size(); ++i)
