@@ -287,7 +287,11 @@ Answer ChoiceSetChecker::State::checkOne(std::size_t position, const Place& plac
     Decision active = seen.answer == Answer::No    ? no
                       : seen.answer == Answer::Yes ? heldAt(seen.point, holds, boxes)
                                                    : Decision();
-    if (active.isUndecided())
+    // What boxes cannot tell from many earlier choices takes a decision even more steps.
+    const bool isCrowded = place.earlier.empty() && !place.earlierHold.empty();
+    if (active.isUndecided() && isCrowded && boxes.isHidingKnownOf(position))
+        active.bound = DecisionBound::Steps;
+    else if (active.isUndecided())
         active = findActive(place, holds, left);
     if (!active.isYes()) {
         const Answer answer = active.answer;
@@ -307,7 +311,6 @@ Answer ChoiceSetChecker::State::checkOne(std::size_t position, const Place& plac
         return Answer::Yes;
     }
     // Many earlier choices are left out, as their proofs would take more than the finding is worth.
-    const bool isCrowded = place.earlier.empty() && !place.earlierHold.empty();
     const SymbolicExprId around = isCrowded ? place.context : both(place.context, left);
     const auto isEqual = [&](SymbolicExprId candidate) {
         return seen.answer == Answer::Yes ? counted(boxes, boxes.isEqual(position, toC(candidate))) : Answer::Undecided;

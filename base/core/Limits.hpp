@@ -247,8 +247,8 @@ inline constexpr std::size_t rangeOperands = 64;
 /// Steps of all such questions about a set, a number for each set and one for each choice, and those that one of them
 /// may take in any case.  A step is some looks at a side of a box.  Beyond these bounds a decision answers.
 inline constexpr std::size_t boxAtoms = 64;
-inline constexpr std::uint64_t boxSteps = std::uint64_t{1} << 22U;
-inline constexpr std::uint64_t boxStepsPerChoice = std::uint64_t{1} << 10U;
+inline constexpr std::uint64_t boxSteps = std::uint64_t{1} << 23U;
+inline constexpr std::uint64_t boxStepsPerChoice = std::uint64_t{1} << 12U;
 inline constexpr std::uint64_t leastBoxSteps = std::uint64_t{1} << 11U;
 
 /// Values found before that are tried first where boxes are to leave some out, how often a point moves out of a box,

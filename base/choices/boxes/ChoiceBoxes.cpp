@@ -238,7 +238,7 @@ Answer ChoiceBoxes::overlap(std::size_t a, std::size_t b) const {
 
 /// Looks for a point of a region that is in none of some boxes.
 BoxGap ChoiceBoxes::ask(BoxUnion& boxes, const Cube& region, std::span<const Cube> further) {
-    const std::uint64_t most = std::max(limits::leastBoxSteps, left_ / 8);
+    const std::uint64_t most = std::max(limits::leastBoxSteps, left_ / 64);
     std::uint64_t left = most;
     BoxGap gap = boxes.gap(region, further, left);
     steps_ += most - left;
@@ -314,7 +314,7 @@ void ChoiceBoxes::findHidingGap() {
 }
 
 ChoiceBoxes::Activity ChoiceBoxes::activityOf(std::size_t choice) {
-    if (!isKnown(choice) || !areHidingKnown_)
+    if (!isHidingKnownOf(choice))
         return {};
     const std::vector<Cube> boxes = boxesOf(*forms_[choice]);
     const bool areAllHidden = hidingGap_ && hidingGap_->answer == Answer::No && !boxes.empty();
@@ -331,7 +331,7 @@ ChoiceBoxes::Activity ChoiceBoxes::activityOf(std::size_t choice) {
 }
 
 Answer ChoiceBoxes::isEqual(std::size_t choice, SymbolicExprId condition) {
-    if (!isKnown(choice) || !areHidingKnown_)
+    if (!isHidingKnownOf(choice))
         return Answer::Undecided;
     const std::size_t known = atoms_.size();
     std::optional<Form> form = formOf(condition);

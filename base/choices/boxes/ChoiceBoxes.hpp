@@ -33,6 +33,9 @@ public:
 
     [[nodiscard]] bool isKnown(std::size_t choice) const { return isUsable_ && forms_[choice].has_value(); }
 
+    /// Whether a choice and all that hide it are known.
+    [[nodiscard]] bool isHidingKnownOf(std::size_t choice) const { return isKnown(choice) && areHidingKnown_; }
+
     /// Whether all choices are known.
     [[nodiscard]] bool areKnown() const noexcept { return isUsable_ && areAllRead_; }
 

@@ -165,7 +165,7 @@ private:
 };
 
 bool ChoiceBoxes::isFaultless(std::size_t choice) {
-    return isKnown(choice) && areHidingKnown_ && FaultSearch(*this, *forms_[choice]).findsNone();
+    return isHidingKnownOf(choice) && FaultSearch(*this, *forms_[choice]).findsNone();
 }
 
 } // namespace VT
