@@ -16,6 +16,9 @@ using BoxPart = std::vector<IntegerSet>;
 /// Looks for a part of a region that no box meets, or proves that boxes cover the region.
 class BoxSearch {
 public:
+    /// Looks at a side of a box that are one step, which so takes about as long as one of a decision.
+    static constexpr std::size_t looksPerStep = 16;
+
     /// `boxes` outlive the search.
     BoxSearch(BoxPart region, std::span<const Cube* const> boxes);
 
@@ -30,8 +33,6 @@ public:
     [[nodiscard]] const std::vector<std::uint32_t>& covering() const noexcept { return covering_; }
 
 private:
-    static constexpr std::size_t looksPerStep = 8;
-
     enum class Outcome : std::uint8_t { Covered, Free, Open };
 
     struct Split {

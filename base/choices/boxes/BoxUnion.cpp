@@ -164,7 +164,7 @@ const Cube* BoxUnion::holderOf(const BoxPoint& point, Atom first, std::span<cons
     for (const Cube& box : further)
         if (contains(box, point))
             return &box;
-    std::uint64_t looks = 8;
+    std::uint64_t looks = BoxSearch::looksPerStep;
     const Cube* found = nullptr;
     for (std::size_t i = 0; i < blocks_.size() && found == nullptr; ++i) {
         Mask mask = blocks_[i].all;
@@ -177,13 +177,13 @@ const Cube* BoxUnion::holderOf(const BoxPoint& point, Atom first, std::span<cons
         if (isLeft)
             found = &boxes_[i * blockBoxes + firstOf(mask)];
     }
-    take(steps, looks / 8);
+    take(steps, looks / BoxSearch::looksPerStep);
     return found;
 }
 
 /// A box that covers a region.
 std::optional<std::uint32_t> BoxUnion::whole(const Cube& region, std::uint64_t& steps) const {
-    std::uint64_t looks = 8;
+    std::uint64_t looks = BoxSearch::looksPerStep;
     std::optional<std::uint32_t> found;
     for (std::size_t i = 0; i < blocks_.size() && !found; ++i) {
         Mask mask = blocks_[i].all;
@@ -204,7 +204,7 @@ std::optional<std::uint32_t> BoxUnion::whole(const Cube& region, std::uint64_t& 
         if (isLeft)
             found = static_cast<std::uint32_t>(i * blockBoxes + firstOf(mask));
     }
-    take(steps, looks / 8);
+    take(steps, looks / BoxSearch::looksPerStep);
     return found;
 }
 
@@ -212,7 +212,7 @@ std::optional<std::uint32_t> BoxUnion::whole(const Cube& region, std::uint64_t& 
 std::vector<std::uint32_t> BoxUnion::meeting(const BoxPart& part, const std::vector<bool>& isLeft,
                                              std::uint64_t& steps) const {
     std::vector<std::uint32_t> result;
-    std::uint64_t looks = 8;
+    std::uint64_t looks = BoxSearch::looksPerStep;
     for (std::size_t i = 0; i < blocks_.size(); ++i) {
         Mask mask = blocks_[i].all;
         for (Atom atom = 0; atom < atoms_; ++atom, ++looks) {
@@ -236,7 +236,7 @@ std::vector<std::uint32_t> BoxUnion::meeting(const BoxPart& part, const std::vec
                 result.push_back(static_cast<std::uint32_t>(i * blockBoxes + word * 64 +
                                                             static_cast<std::size_t>(std::countr_zero(bits))));
     }
-    take(steps, looks / 8 + result.size());
+    take(steps, looks / BoxSearch::looksPerStep + result.size());
     return result;
 }
 
