@@ -76,10 +76,11 @@ struct ChoiceSetReport {
 
 /// Checks choice sets against exact decisions: every finding is proven.
 ///
-/// Ranges of names separate most choices without a decision.  Other overlaps are looked for by halves: where no
-/// choice of one half overlaps one of the other, one decision settles all pairs.  So a set of n choices without
-/// overlaps takes some n log n steps, and each overlap found a few decisions more for each level of halves.  Steps are
-/// counted over all sets; when they are used up everything further is undecided.
+/// Choices that compare names with integers are unions of boxes, and most questions about them are answered from the
+/// sides of those.  Ranges of names separate most other choices without a decision.  Other overlaps are looked for by
+/// halves: where no choice of one half overlaps one of the other, one decision settles all pairs.  So a set of n
+/// choices without overlaps takes some n log n steps, and each overlap found a few decisions more for each level of
+/// halves. Steps are counted over all sets; when they are used up everything further is undecided.
 class VTSYM_API ChoiceSetChecker {
 public:
     /// The service outlives the checker.  What it assumes at this moment bounds every decision, as declared values do.
