@@ -21,7 +21,7 @@ set(VTSYM_FOLDERS_decide base/decide base/decide/circuit base/decide/diagram bas
 set(VTSYM_FOLDERS_eval base/eval)
 set(VTSYM_FOLDERS_parser parser)
 set(VTSYM_FOLDERS_service base/service)
-set(VTSYM_FOLDERS_choices base/choices)
+set(VTSYM_FOLDERS_choices base/choices base/choices/boxes)
 set(VTSYM_FOLDERS_scan base/scan base/scan/build base/scan/changes base/scan/report)
 set(VTSYM_FOLDERS_embedded host/embedded)
 set(VTSYM_FOLDERS_io tools/vtsym/io)

@@ -64,15 +64,23 @@ ChoiceSetReport ChoiceSetChecker::check(SymbolicExprId parent, std::span<const S
                        {Answer::Undecided, DecisionBound::Steps, std::nullopt}, report);
             continue;
         }
-        Answer isActive = state.counted(boxes, boxes.isFaultless(i)) ? Answer::Yes : Answer::Undecided;
-        if (policy == ChoicePolicy::First && (isActive != Answer::Yes || !state.options.domains.empty())) {
+        ChoiceBoxes::Activity seen;
+        if (policy == ChoicePolicy::First)
+            seen = state.counted(boxes, boxes.activityOf(i));
+        Answer isActive = Answer::Undecided;
+        if (seen.answer != Answer::No && state.counted(boxes, boxes.isFaultless(i)))
+            isActive = Answer::Yes;
+        if (seen.answer == Answer::No) {
+            State::placeAfter(place, conditions, seen.hiddenBy);
+            hiding[i] = place.earlierHold;
+        } else if (policy == ChoicePolicy::First && (isActive != Answer::Yes || !state.options.domains.empty())) {
             state.placeAfter(place, conditions, i, inOrder, earlier);
             hiding[i] = place.earlierHold;
         }
         if (isActive != Answer::Yes && place.earlierHold.empty() && ordinary.contains(conditions[i]))
             isActive = Answer::Yes;
         if (isActive != Answer::Yes)
-            isActive = state.checkOne(i, place, choices[i], boxes, report);
+            isActive = state.checkOne(i, place, choices[i], boxes, seen, report);
         if (isActive == Answer::No) {
             earlier.isDead[i] = true;
             holds[i] = table.getIdFALSE();
@@ -122,7 +130,7 @@ ChoiceSetReport ChoiceSetChecker::checkCondition(SymbolicExprId parent, Symbolic
     if (!report.parentNeverHolds) {
         const SymbolicExprId inC = state.toC(condition);
         ChoiceBoxes boxes(state.table, place.context, std::span(&inC, 1), state.options.bits32);
-        state.checkOne(0, place, condition, boxes, report);
+        state.checkOne(0, place, condition, boxes, {}, report);
     }
     return report;
 }

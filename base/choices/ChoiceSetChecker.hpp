@@ -53,6 +53,7 @@ struct ChoiceFinding {
     /// one that closes the gap, or the invalid identifier where it is long or not proven.
     SymbolicExprId proposed = invalidId;
     std::vector<std::size_t> hiddenBy = {}; ///< of a dead choice: earlier ones that hide it, unless there are many
+    bool isHidden = false;                  ///< of a dead choice: earlier ones hide it, it is not dead by itself
     /// Operands of declared values, assumptions, the parent and the choice for which it is dead, always active or
     /// redundant, where they were asked for; of a hidden choice those that hide it are left out.
     Reasons reasons = {};
@@ -75,10 +76,11 @@ struct ChoiceSetReport {
 
 /// Checks choice sets against exact decisions: every finding is proven.
 ///
-/// Ranges of names separate most choices without a decision.  Other overlaps are looked for by halves: where no
-/// choice of one half overlaps one of the other, one decision settles all pairs.  So a set of n choices without
-/// overlaps takes some n log n steps, and each overlap found a few decisions more for each level of halves.  Steps are
-/// counted over all sets; when they are used up everything further is undecided.
+/// Choices that compare names with integers are unions of boxes, and most questions about them are answered from the
+/// sides of those.  Ranges of names separate most other choices without a decision.  Other overlaps are looked for by
+/// halves: where no choice of one half overlaps one of the other, one decision settles all pairs.  So a set of n
+/// choices without overlaps takes some n log n steps, and each overlap found a few decisions more for each level of
+/// halves. Steps are counted over all sets; when they are used up everything further is undecided.
 class VTSYM_API ChoiceSetChecker {
 public:
     /// The service outlives the checker.  What it assumes at this moment bounds every decision, as declared values do.

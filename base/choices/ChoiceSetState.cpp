@@ -126,17 +126,31 @@ void ChoiceSetChecker::State::placeAfter(Place& place, std::span<const SymbolicE
         place.earlierHold.push_back(conditions[choice]);
 }
 
+/// Adds the choices that are known to hide one.
+void ChoiceSetChecker::State::placeAfter(Place& place, std::span<const SymbolicExprId> conditions,
+                                         const std::vector<std::size_t>& hiding) {
+    place.earlier = hiding;
+    place.earlierHold.clear();
+    for (const std::size_t choice : hiding)
+        place.earlierHold.push_back(conditions[choice]);
+}
+
 /// The condition without operands that its context makes redundant; itself where there are none.
-SymbolicExprId ChoiceSetChecker::State::shorten(SymbolicExprId context, SymbolicExprId condition) {
+/// What `isEqual` leaves undecided of a candidate is proven.
+SymbolicExprId ChoiceSetChecker::State::shorten(SymbolicExprId context, SymbolicExprId condition,
+                                                const std::function<Answer(SymbolicExprId)>& isEqual) {
     const std::size_t operands = operandsOf(condition);
     if (operands < 2 || operands > limits::choiceOperands)
         return condition;
     // Literals are taken from a context that is not large.
     const SymbolicExprId literals = operandsOf(context) > limits::choiceOperands ? table.getIdTRUE() : context;
     ConditionProofs proofs(decider, toC, condition, context, true, std::min(share(), limits::shortenSteps));
-    const auto isEqual = [&](SymbolicExprId candidate) { return proofs.isEqual(candidate); };
+    const auto isProven = [&](SymbolicExprId candidate) {
+        const Answer seen = isEqual ? isEqual(candidate) : Answer::Undecided;
+        return seen == Answer::Undecided ? proofs.isEqual(candidate) : seen == Answer::Yes;
+    };
     const SymbolicExprId shorter =
-        ImpliedCondition(table, service.simplifier().printer(), literals, isEqual).shorten(condition);
+        ImpliedCondition(table, service.simplifier().printer(), literals, isProven).shorten(condition);
     take(proofs.stepsTaken());
     return operandsOf(shorter) < operands ? shorter : condition;
 }
@@ -189,10 +203,11 @@ void ChoiceSetChecker::State::findHiding(ChoiceFinding& finding, const Place& pl
                                          SymbolicExprId holds, ChoiceBoxes& boxes) {
     std::vector<SymbolicExprId> premises = place.premises;
     premises.push_back(condition);
-    if (place.earlierHold.empty() || !isActiveAlone(finding.choice, holds, boxes)) {
+    if (place.earlierHold.empty() || isDeadAlone(finding.choice, holds, boxes)) {
         finding.reasons = reasonsBy([&](ReasonSearch& search) { return search.whyNever(premises); });
         return;
     }
+    finding.isHidden = true;
     std::vector<SymbolicExprId> some;
     std::vector<std::size_t> earlier;
     const auto subset = minimalSubset(place.earlierHold.size(), [&](std::span<const std::size_t> positions) {
@@ -220,10 +235,10 @@ void ChoiceSetChecker::State::findHiding(ChoiceFinding& finding, const Place& pl
     finding.reasons = reasonsBy([&](ReasonSearch& search) { return search.whyImplied(premises, hiding); });
 }
 
-/// Whether a choice is active where those before it do not count.
-bool ChoiceSetChecker::State::isActiveAlone(std::size_t position, SymbolicExprId holds, ChoiceBoxes& boxes) {
+/// Whether a choice is never active, even where those before it do not count.
+bool ChoiceSetChecker::State::isDeadAlone(std::size_t position, SymbolicExprId holds, ChoiceBoxes& boxes) {
     const Answer seen = counted(boxes, boxes.isActiveWithout(position, {}));
-    return seen == Answer::Yes || (seen == Answer::Undecided && ask(&Decider::canHold, holds).isYes());
+    return seen == Answer::No || (seen == Answer::Undecided && ask(&Decider::canHold, holds).isNo());
 }
 
 /// Whether a choice is active where those before it do not count, and at first by values for which it holds at all.
@@ -237,16 +252,47 @@ Decision ChoiceSetChecker::State::findActive(const Place& place, SymbolicExprId 
     return ask(&Decider::canHold, both(holds, left));
 }
 
+/// A condition holds at a point, if evaluation or a decision about the names that boxes know nothing of confirms it.
+Decision ChoiceSetChecker::State::heldAt(const BoxPoint& point, SymbolicExprId condition, const ChoiceBoxes& boxes) {
+    std::vector<SymbolicExprId> names;
+    const SymbolicExprSymbols symbols(table);
+    symbols(condition, names);
+    Witness witness = boxes.valuesAt(point);
+    std::erase_if(witness, [&](const UnknownValue& each) {
+        return each.value == 0 && std::ranges::find(names, each.unknown) == names.end();
+    });
+    if (boxes.hasOtherNames()) {
+        for (const auto& [name, value] : witness) {
+            if (!fitsInt(value))
+                return {};
+            condition = both(condition, compareWith(table, SymbolicOp::Equal, name, static_cast<int>(value)));
+        }
+        return ask(&Decider::canHold, condition);
+    }
+    if (!decider.holds(condition, witness).value_or(false))
+        return {};
+    std::ranges::sort(witness, {}, [&](const UnknownValue& each) { return decider.nameOf(each.unknown); });
+    return {Answer::Yes, DecisionBound::None, std::move(witness)};
+}
+
 /// Checks a choice by itself; whether it can be active.
 Answer ChoiceSetChecker::State::checkOne(std::size_t position, const Place& place, SymbolicExprId condition,
-                                         ChoiceBoxes& boxes, ChoiceSetReport& report) {
+                                         ChoiceBoxes& boxes, const ChoiceBoxes::Activity& seen,
+                                         ChoiceSetReport& report) {
     const SymbolicExprId holds = both(place.context, toC(condition));
     const SymbolicExprId left =
         place.earlierHold.empty()
             ? table.getIdTRUE()
             : makeUnary(table, SymbolicOp::Not, makeChain(table, SymbolicOp::Or, place.earlierHold));
-    const bool isHidden = !place.earlierHold.empty() && counted(boxes, boxes.isActive(position)) == Answer::No;
-    Decision active = isHidden ? no : findActive(place, holds, left);
+    Decision active = seen.answer == Answer::No    ? no
+                      : seen.answer == Answer::Yes ? heldAt(seen.point, holds, boxes)
+                                                   : Decision();
+    // What boxes cannot tell from many earlier choices takes a decision even more steps.
+    const bool isCrowded = place.earlier.empty() && !place.earlierHold.empty();
+    if (active.isUndecided() && isCrowded && boxes.isHidingKnownOf(position))
+        active.bound = DecisionBound::Steps;
+    else if (active.isUndecided())
+        active = findActive(place, holds, left);
     if (!active.isYes()) {
         const Answer answer = active.answer;
         ChoiceFinding finding{.fault = ChoiceFault::Dead, .choice = position};
@@ -265,9 +311,11 @@ Answer ChoiceSetChecker::State::checkOne(std::size_t position, const Place& plac
         return Answer::Yes;
     }
     // Many earlier choices are left out, as their proofs would take more than the finding is worth.
-    const bool isCrowded = place.earlier.empty() && !place.earlierHold.empty();
     const SymbolicExprId around = isCrowded ? place.context : both(place.context, left);
-    if (const SymbolicExprId shorter = shorten(around, condition); shorter != condition) {
+    const auto isEqual = [&](SymbolicExprId candidate) {
+        return seen.answer == Answer::Yes ? counted(boxes, boxes.isEqual(position, toC(candidate))) : Answer::Undecided;
+    };
+    if (const SymbolicExprId shorter = shorten(around, condition, isEqual); shorter != condition) {
         ChoiceFinding finding{.fault = ChoiceFault::Redundant, .choice = position, .proposed = shorter};
         finding.reasons = reasonsBy([&](ReasonSearch& search) {
             std::vector<SymbolicExprId> premises = place.premises;
@@ -354,11 +402,19 @@ ChoiceSetChecker::State::Gap ChoiceSetChecker::State::findGap(SymbolicExprId con
     for (const ChoiceRun& run : runs)
         if (run.count == 1)
             choices.push_back(run.left);
-    if (counted(boxes, boxes.isGap(choices)) == Answer::No)
+    const BoxGap seen = counted(boxes, boxes.gapOf(choices));
+    if (seen.answer == Answer::No)
         return {no, true};
+    const auto gapSeen = [&] { return seen.answer == Answer::Yes ? heldAt(seen.point, context, boxes) : Decision(); };
+    // Of many choices no decision is needed, as no condition is looked for that closes the gap.
+    if (choices.size() > limits::shortenComparisons)
+        if (Decision gap = gapSeen(); gap.isYes())
+            return {std::move(gap), true};
     Decision gap = ask(&Decider::implies, context, all.holds).opposite();
     if (!gap.isUndecided())
         return {std::move(gap), true};
+    if (Decision found = gapSeen(); found.isYes())
+        return {std::move(found), false};
     for (const NameRange& range : all.ranges) {
         for (const bool isAbove : {true, false}) {
             const std::int64_t bound = isAbove ? range.high : range.low;

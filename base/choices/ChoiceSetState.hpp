@@ -2,12 +2,12 @@
 #pragma once
 
 #include "base/choices/AssignmentCounter.hpp"
-#include "base/choices/ChoiceBoxes.hpp"
 #include "base/choices/ChoiceMerges.hpp"
 #include "base/choices/ChoiceRuns.hpp"
 #include "base/choices/ChoiceSetChecker.hpp"
 #include "base/choices/OrdinaryChoices.hpp"
 #include "base/choices/SmallestRemoval.hpp"
+#include "base/choices/boxes/ChoiceBoxes.hpp"
 #include "base/core/Table.hpp"
 #include "base/decide/Assumptions.hpp"
 #include "base/decide/Decider.hpp"
@@ -59,18 +59,22 @@ struct ChoiceSetChecker::State {
     Place placeIn(SymbolicExprId parent, std::span<const SymbolicExprId> conditions);
     void placeAfter(Place& place, std::span<const SymbolicExprId> conditions, std::size_t position,
                     const std::vector<ChoiceRun>& runs, const EarlierChoices& earlier);
+    static void placeAfter(Place& place, std::span<const SymbolicExprId> conditions,
+                           const std::vector<std::size_t>& hiding);
     Answer checkOne(std::size_t position, const Place& place, SymbolicExprId condition, ChoiceBoxes& boxes,
-                    ChoiceSetReport& report);
+                    const ChoiceBoxes::Activity& seen, ChoiceSetReport& report);
     OrdinaryChoices ordinaryIn(SymbolicExprId context);
     void checkDefault(std::size_t position, SymbolicExprId context, const std::vector<ChoiceRun>& runs,
                       const Decision& gap, ChoiceSetReport& report);
     void findHiding(ChoiceFinding& finding, const Place& place, SymbolicExprId condition, SymbolicExprId holds,
                     ChoiceBoxes& boxes);
+    Decision heldAt(const BoxPoint& point, SymbolicExprId condition, const ChoiceBoxes& boxes);
     Decision findActive(const Place& place, SymbolicExprId holds, SymbolicExprId left);
-    bool isActiveAlone(std::size_t position, SymbolicExprId holds, ChoiceBoxes& boxes);
+    bool isDeadAlone(std::size_t position, SymbolicExprId holds, ChoiceBoxes& boxes);
     template <class Search>
     Reasons reasonsBy(Search search);
-    SymbolicExprId shorten(SymbolicExprId context, SymbolicExprId condition);
+    SymbolicExprId shorten(SymbolicExprId context, SymbolicExprId condition,
+                           const std::function<Answer(SymbolicExprId)>& isEqual = {});
 
     struct Gap {
         Decision decision; ///< whether there is one

@@ -248,21 +248,26 @@ inline constexpr std::size_t choiceOverlaps = 1000;
 inline constexpr std::size_t rangeOperands = 64;
 
 /// Names that the choices of a set compare with integers, up to which questions about them are answered by boxes.
-/// Steps of all such questions about a set, each a comparison of a box with a part of the values, and those that one of
-/// them may take in any case.  Beyond these bounds a decision answers.
+/// Steps of all such questions about a set, a number for each set and one for each choice, and those that one of them
+/// may take in any case.  A step is some looks at a side of a box.  Beyond these bounds a decision answers.
 inline constexpr std::size_t boxAtoms = 64;
-inline constexpr std::uint64_t boxSteps = std::uint64_t{1} << 22U;
+inline constexpr std::uint64_t boxSteps = std::uint64_t{1} << 23U;
+inline constexpr std::uint64_t boxStepsPerChoice = std::uint64_t{1} << 12U;
 inline constexpr std::uint64_t leastBoxSteps = std::uint64_t{1} << 11U;
 
-/// Values found before that are tried first where boxes are to leave some out, and how often each moves out of a box.
+/// Values found before that are tried first where boxes are to leave some out, how often a point moves out of a box,
+/// and corners that are tried.  Beyond them the values are searched: with all boxes that meet them up to so many, or
+/// else with those that turn out to matter.
 inline constexpr std::size_t recentPoints = 4;
 inline constexpr std::size_t boxMoves = 12;
+inline constexpr std::size_t boxCorners = 32;
+inline constexpr std::size_t boxesAtOnce = 64;
 
 /// Steps that the checks of one choice set may cost: a number for each set and one for each choice, about a second for
 /// five thousand.  A question takes an eighth of what is left at most, and so many in any case.  Beyond the bound what
 /// is left is undecided.
-inline constexpr std::uint64_t setSteps = std::uint64_t{1} << 22U;
-inline constexpr std::uint64_t setStepsPerChoice = std::uint64_t{1} << 10U;
+inline constexpr std::uint64_t setSteps = std::uint64_t{1} << 23U;
+inline constexpr std::uint64_t setStepsPerChoice = std::uint64_t{1} << 12U;
 inline constexpr std::uint64_t leastSetSteps = std::uint64_t{1} << 10U;
 
 /// Choices of two runs that are compared pair by pair where boxes answer, and steps of a decision about larger runs for
@@ -277,8 +282,9 @@ inline constexpr std::size_t choiceOperands = 64;
 /// looked at with all pairs.  Beyond the bound the smallest set found so far is reported, not known to be the smallest.
 inline constexpr std::size_t removalCases = std::size_t{1} << 12U;
 
-/// Earlier choices that a choice is compared with one by one where the first one counts.  More of them are one
-/// condition, of which it is not said which choices hide the later one.
+/// Earlier choices that a choice is compared with one by one where the first one counts and boxes do not answer.  More
+/// of them are one condition, of which it is not said which choices hide the later one; a redundant operand is then
+/// found only if boxes answer, and no comparison is rewritten with a literal of an earlier choice.
 inline constexpr std::size_t hidingChoices = 256;
 
 /// Unions of choices that are tried to be written as one product.  Further ones are not tried.

@@ -47,9 +47,14 @@ bool Assumptions::add(SymbolicExprId condition) {
     if (!complete)
         return false;
     for (const SymbolicExprId operand : operands) {
-        if (operand == table_.getIdTRUE() || std::ranges::find(operands_, operand) != operands_.end())
+        if (operand == table_.getIdTRUE())
             continue;
         std::vector<SymbolicExprId> names = namesOf(std::span(&operand, 1));
+        const std::vector<std::size_t>& alike = names.empty() ? constants_ : uses_[names.front()];
+        if (std::ranges::any_of(alike, [&](std::size_t other) { return operands_[other] == operand; }))
+            continue;
+        if (names.empty())
+            constants_.push_back(operands_.size());
         for (const SymbolicExprId name : names)
             uses_[name].push_back(operands_.size());
         operands_.push_back(operand);
@@ -61,15 +66,24 @@ bool Assumptions::add(SymbolicExprId condition) {
 void Assumptions::clear() {
     operands_.clear();
     names_.clear();
+    constants_.clear();
     uses_.clear();
+}
+
+void Assumptions::shrink(std::size_t operands) {
+    for (; operands_.size() > operands; operands_.pop_back(), names_.pop_back()) {
+        if (names_.back().empty())
+            constants_.pop_back();
+        for (const SymbolicExprId name : names_.back())
+            uses_[name].pop_back();
+    }
 }
 
 std::vector<SymbolicExprId> Assumptions::relevantTo(std::span<const SymbolicExprId> conditions) const {
     if (operands_.empty())
         return {};
-    std::vector<bool> isRelevant(operands_.size(), false);
-    for (std::size_t i = 0; i < operands_.size(); ++i)
-        isRelevant[i] = names_[i].empty(); // a constant
+    std::vector<std::size_t> found = constants_;
+    IdMap<bool> isFound;
     std::vector<SymbolicExprId> open = namesOf(conditions);
     IdMap<bool> reached;
     while (!open.empty()) {
@@ -82,15 +96,17 @@ std::vector<SymbolicExprId> Assumptions::relevantTo(std::span<const SymbolicExpr
         if (uses == uses_.end())
             continue;
         for (const std::size_t operand : uses->second) {
-            if (!isRelevant[operand])
-                open.insert(open.end(), names_[operand].begin(), names_[operand].end());
-            isRelevant[operand] = true;
+            if (isFound.find(operand) != nullptr)
+                continue;
+            isFound.insert(operand, true);
+            found.push_back(operand);
+            open.insert(open.end(), names_[operand].begin(), names_[operand].end());
         }
     }
+    std::ranges::sort(found);
     std::vector<SymbolicExprId> relevant;
-    for (std::size_t i = 0; i < operands_.size(); ++i)
-        if (isRelevant[i])
-            relevant.push_back(operands_[i]);
+    for (const std::size_t operand : found)
+        relevant.push_back(operands_[operand]);
     return relevant;
 }
 

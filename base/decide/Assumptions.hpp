@@ -27,6 +27,8 @@ public:
     /// lacks an operand.  Linear in its distinct nodes.
     bool add(SymbolicExprId condition);
     void clear();
+    /// Forgets all but the first operands of all(), so that assumptions can follow a path through a tree.
+    void shrink(std::size_t operands);
 
     [[nodiscard]] bool empty() const noexcept { return operands_.empty(); }
 
@@ -45,6 +47,7 @@ private:
     SymbolicExprTable& table_;
     std::vector<SymbolicExprId> operands_;
     std::vector<std::vector<SymbolicExprId>> names_;                      ///< by operand
+    std::vector<std::size_t> constants_;                                  ///< operands without names
     boost::unordered_map<SymbolicExprId, std::vector<std::size_t>> uses_; ///< operands by name
 };
 

@@ -2,6 +2,7 @@
 #include "base/choices/ChoiceSetChecker.hpp"
 #include "base/choices/SmallestRemoval.hpp"
 #include "base/core/Table.hpp"
+#include "base/decide/Decider.hpp"
 #include "base/service/VCService.hpp"
 #include "tests/service/Customizers.hpp"
 #include "tests/support/generators/RandomCondition.hpp"
@@ -279,6 +280,76 @@ TEST_F(ChoiceSetChecks, KnowTheirReasonsAndWhatTheServiceAssumes) {
     const ChoiceSetReport report = check("true", {"F==1", "F==2", "F>2", "F==9"});
     ASSERT_EQ(report.findings.size(), 1U);
     EXPECT_EQ(reasons(report), "F<=3, F==9; ");
+}
+
+TEST_F(ChoiceSetChecks, KnowTheBoundsOfNames) {
+    const std::vector<std::string> choices{"A<2147483647", "A==2147483647", "A>2147483647"};
+    for (const bool bits32 : {false, true}) {
+        const ChoiceSetReport report = check("true", choices, ChoicePolicy::First, {.bits32 = bits32});
+        EXPECT_TRUE(report.undecided.empty());
+        ASSERT_EQ(std::ranges::count(report.findings, ChoiceFault::Dead, &ChoiceFinding::fault), bits32 ? 1 : 0);
+        if (bits32) {
+            const auto dead = std::ranges::find(report.findings, ChoiceFault::Dead, &ChoiceFinding::fault);
+            EXPECT_EQ(dead->choice, 2U);
+            EXPECT_FALSE(dead->isHidden);
+        }
+        EXPECT_EQ(std::ranges::count(report.findings, ChoiceFault::Missing, &ChoiceFinding::fault), 0);
+    }
+}
+
+TEST_F(ChoiceSetChecks, OfManyOverlappingChoicesUnderFirst) {
+    std::mt19937_64 random(66);
+    // Products of ranges, exclusions, and sums of products, of which thousands hide each other.
+    for (int shape = 0; shape < 3; ++shape) {
+        std::vector<std::string> choices;
+        for (int i = 0; i < 1500; ++i) {
+            std::string text;
+            for (std::size_t name = 0; name < 6; ++name) {
+                const std::string value = std::to_string(random() % 40);
+                const std::string symbol = "N" + std::to_string(name);
+                if (shape == 0 && random() % 3 == 0)
+                    text += (text.empty() ? "" : " && ") + symbol + " >= " + value + " && " + symbol + " <= " + value +
+                            std::to_string(random() % 10);
+                else if (shape == 1)
+                    text += (text.empty() ? "" : " && ") + symbol + " != " + value;
+                else if (shape == 2)
+                    text += (name == 0 ? "" : name % 2 == 0 ? " || " : " && ") + symbol + " == " + value;
+            }
+            choices.push_back(text.empty() ? "N0 == -1" : text);
+        }
+        const std::vector<SymbolicExprId> ids = parseAll(choices);
+        const ChoiceSetReport report =
+            ChoiceSetChecker(*service).check(parse("true"), ids, std::nullopt, ChoicePolicy::First);
+        EXPECT_TRUE(report.undecided.empty()) << shape << ": " << report.undecided.size();
+        std::vector<bool> isDead(ids.size(), false);
+        for (const ChoiceFinding& finding : report.findings) {
+            if (finding.fault != ChoiceFault::Dead)
+                continue;
+            isDead[finding.choice] = true;
+            ASSERT_TRUE(finding.isHidden && !finding.hiddenBy.empty());
+            ASSERT_LT(finding.hiddenBy.back(), finding.choice);
+        }
+        // A sample is decided without boxes.
+        Decider decider(service->table());
+        for (std::size_t i = 0; i < 60; ++i) {
+            std::string left = "(" + choices[i] + ")";
+            for (std::size_t before = 0; before < i; ++before)
+                left += " && !(" + choices[before] + ")";
+            const Decision active = decider.canHold(parse(left));
+            if (!active.isUndecided()) {
+                ASSERT_EQ(active.isNo(), isDead[i]) << left;
+            }
+        }
+        // Every value that some choice has, an active one has.
+        for (int sample = 0; sample < 200; ++sample) {
+            Witness values;
+            for (int name = 0; name < 6; ++name)
+                values.push_back({parse("N" + std::to_string(name)), static_cast<std::int64_t>(random() % 50)});
+            const auto holds = [&](SymbolicExprId id) { return decider.holds(id, values) == true; };
+            const auto first = std::ranges::find_if(ids, holds);
+            ASSERT_TRUE(first == ids.end() || !isDead[static_cast<std::size_t>(first - ids.begin())]);
+        }
+    }
 }
 
 TEST_F(ChoiceSetChecks, OfFiveThousandChoices) {

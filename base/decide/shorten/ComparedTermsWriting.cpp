@@ -21,6 +21,11 @@ constexpr std::int64_t plusInfinity = IntegerSet::plusInfinity;
 /// Comparisons weigh most; among cuts with as many of them, those that the condition does not write itself.
 constexpr std::size_t comparisonCost = 1U << 10U;
 
+/// Whether an integer can be written; the smallest one of 32 bits is the opposite of none.
+bool isLiteral(std::int64_t value) {
+    return fitsInt(value) && fitsInt(-value);
+}
+
 bool isBounded(const IntegerSet::Interval& interval) {
     return interval.low != minusInfinity && interval.high != plusInfinity;
 }
@@ -180,7 +185,8 @@ SymbolicExprId ComparedTerms::literal(Atom atom, const IntegerSet& set) {
 }
 
 /// The comparison of an atom, anew; the invalid identifier where a number is no literal.  Bounds are written as >= and
-/// <=, as > and < where that is asked for, and each part of a sum on the side where it is positive.
+/// <=, as > and < where that is asked for or only those have a literal, and each part of a sum on the side where it is
+/// positive.
 SymbolicExprId ComparedTerms::compose(Atom atom, const IntegerSet& set, bool strict) {
     const LinearParts& parts = entries_[atom].parts;
     const bool difference = std::ranges::any_of(parts, [](const LinearPart& part) { return part.factor < 0; });
@@ -195,12 +201,13 @@ SymbolicExprId ComparedTerms::compose(Atom atom, const IntegerSet& set, bool str
         const bool upward = set.low() != minusInfinity;
         const std::int64_t bound = upward ? set.low() : set.high();
         const std::int64_t beyond = upward ? bound - 1 : bound + 1;
-        strict = (difference && (bound == 0 || beyond == 0)) ? beyond == 0 : (fitsInt(beyond) && strict);
+        strict = (difference && (bound == 0 || beyond == 0)) ? beyond == 0
+                                                             : isLiteral(beyond) && (strict || !isLiteral(bound));
         right = strict ? beyond : bound;
         op = upward ? (strict ? SymbolicOp::GreaterThan : SymbolicOp::GreaterThanEqual)
                     : (strict ? SymbolicOp::LessThan : SymbolicOp::LessThanEqual);
     }
-    if (!fitsInt(right) || (right < 0 && !fitsInt(-right)))
+    if (!isLiteral(right))
         return invalidId;
     // With a part on the right, a negative constant is added on the left.
     const bool moves = difference && right < 0;

@@ -71,6 +71,7 @@ ModelCheck::ModelCheck(const VTRootBD& model, std::string file, const ModelCheck
       options_(options),
       conditions_(*handle_),
       isAssumed_(assume()),
+      conditionsOnPath_(handle_->table()),
       checker_(*handle_, checkerOptions()) {}
 
 /// Makes the service assume what the options say; false where that cannot be read.
@@ -205,9 +206,12 @@ void ModelCheck::run(FindingListener& writer) {
     writer_ = &writer;
     if (!readConditions())
         return;
+    for (const VT::VCSymbolicExprId& assumption : handle_->assumptions())
+        conditionsOnPath_.add(assumption.id());   // it may say something of several names
     std::unordered_set<const VTBlock*> dead;      // and everything inside of them
     std::unordered_set<const VTBlock*> followers; // always active where their parents are
     const auto note = [&](const VT::ChoiceSetReport& report, std::span<const VTBlock* const> blocks) {
+        isCertain_ = isCertain_ && report.undecided.empty();
         for (const VT::ChoiceFinding& finding : report.findings) {
             if (finding.fault == VT::ChoiceFault::Dead)
                 dead.insert(blocks[finding.choice]);
@@ -224,8 +228,10 @@ void ModelCheck::run(FindingListener& writer) {
         if (dead.contains(&block))
             continue;
         const VT::SymbolicExprId around = contextOf(block.parent());
-        contexts_.emplace(&block, followers.contains(&block) ? around
-                                                             : handle_->AND(around, ownAfterOthers(block), false).id());
+        const VT::SymbolicExprId own =
+            followers.contains(&block) ? handle_->table().getIdTRUE() : ownAfterOthers(block).id();
+        contexts_.emplace(&block, handle_->AND(around, own, false).id());
+        goInto(block, own);
         if (!block.choices().empty())
             note(checkChoices(block), block.choices());
         if (checker_.stepsUsedUp()) {
@@ -239,8 +245,36 @@ void ModelCheck::run(FindingListener& writer) {
             checkPort(port);
 }
 
+/// Leaves blocks on the path until a parent is the last one; whether it is on the path.
+bool ModelCheck::goUpTo(const VTBlock* parent) {
+    for (; !path_.empty() && path_.back().block != parent; path_.pop_back())
+        if (path_.back().conditionsBefore)
+            conditionsOnPath_.shrink(*path_.back().conditionsBefore);
+    return !path_.empty();
+}
+
+/// Adds a block that was checked to the path, if that leads to it from the outside.
+void ModelCheck::goInto(const VTBlock& block, VT::SymbolicExprId condition) {
+    if (goUpTo(block.parent()) || block.parent() == nullptr)
+        path_.push_back({&block, condition});
+}
+
 VT::ChoiceSetReport ModelCheck::checkBlock(const VTBlock& block) {
-    VT::ChoiceSetReport report = checker_.checkCondition(contextOf(block.parent()), conditions_.own(block).id());
+    const VT::SymbolicExprId own = conditions_.own(block).id();
+    const VT::SymbolicExprId around = contextOf(block.parent());
+    // The blocks around can be active, so conditions that share no name with this one have no say in whether it is
+    // without findings. A finding is decided with all of them, so that its witness has all names.
+    VT::ChoiceSetReport report;
+    const bool isOnPath = goUpTo(block.parent()) && isCertain_;
+    for (Around& each : path_)
+        if (!each.conditionsBefore) {
+            each.conditionsBefore = conditionsOnPath_.all().size();
+            conditionsOnPath_.add(each.condition);
+        }
+    if (isOnPath)
+        report = checker_.checkCondition(conditionsOnPath_.knownOf(std::span(&own, 1)), own);
+    if (!isOnPath || !report.findings.empty() || !report.undecided.empty() || report.parentNeverHolds)
+        report = checker_.checkCondition(around, own);
     const std::array blocks{&block};
     for (const VT::ChoiceFinding& finding : report.findings)
         write(otherFindings_, findingOf(block, blocks, finding));
@@ -307,12 +341,14 @@ Finding ModelCheck::findingOf(const VTBlock& set, std::span<const VTBlock* const
         result.message = path + " is never active: ";
         if (!finding.hiddenBy.empty())
             result.message += hidingText(blocks, finding.hiddenBy);
+        else if (finding.isHidden)
+            result.message += "earlier choices hide it";
         else if (VT::BlockConditions::isDefault(block))
             result.message += "the other choices leave nothing to it";
-        else if (checker_.canHold(conditions_.own(block).id()).isYes())
-            result.message += condition + " cannot hold" + where + " active";
-        else
+        else if (checker_.canHold(conditions_.own(block).id()).isNo())
             result.message += condition + " never holds";
+        else
+            result.message += condition + " cannot hold" + where + " active";
         break;
     case VT::ChoiceFault::AlwaysActive:
         result.message = path + " is always active" + where;

@@ -4,10 +4,12 @@
 
 #include "base/choices/BlockConditions.hpp"
 #include "base/choices/ChoiceSetChecker.hpp"
+#include "base/decide/Assumptions.hpp"
 #include "base/service/VCServiceHandle.hpp"
 #include "host/embedded/EmbeddedModel.hpp"
 #include "tools/vtsym/findings/Findings.hpp"
 
+#include <optional>
 #include <string>
 #include <unordered_map>
 #include <vector>
@@ -66,6 +68,8 @@ private:
     void explain(Finding& finding, const VT::Reasons& reasons) const;
     void writeAdvice(ChoiceSet& set);
     void writeMerges(const VTBlock& set, const VT::ChoiceSetReport& report, std::vector<Finding>& findings);
+    bool goUpTo(const VTBlock* parent);
+    void goInto(const VTBlock& block, VT::SymbolicExprId condition);
     VT::ChoiceSetReport checkBlock(const VTBlock& block);
     VT::ChoiceSetReport checkChoices(const VTBlock& block);
     void checkPort(const vtPort& port);
@@ -85,6 +89,17 @@ private:
     VT::VCServiceHandle handle_;
     VT::BlockConditions conditions_;
     bool isAssumed_; ///< all assumptions were read, before the checker is made
+
+    /// A block around the next one to be checked.
+    struct Around {
+        const VTBlock* block;
+        VT::SymbolicExprId condition;
+        std::optional<std::size_t> conditionsBefore = {}; ///< on the path, after a block inside needed it
+    };
+
+    VT::Assumptions conditionsOnPath_;
+    std::vector<Around> path_; ///< from the outside to the inside
+    bool isCertain_ = true;    ///< every block in contexts_ is known to be active somewhere
     VT::ChoiceSetChecker checker_;
     /// The condition under which a block is active, without the parts that are implied by the blocks around it.
     std::unordered_map<const VTBlock*, VT::SymbolicExprId> contexts_;

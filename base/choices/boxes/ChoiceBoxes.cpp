@@ -3,12 +3,13 @@
 // Method: an operand that compares one name with integers becomes a set of them, an And a box, an Or of Ands a list of
 // boxes within the context.  BoxUnion finds points that boxes leave out.
 // Cost: linear in the operands to read; all questions together limits::boxSteps, beyond which each takes a few.
-#include "base/choices/ChoiceBoxes.hpp"
+#include "base/choices/boxes/ChoiceBoxes.hpp"
 
 #include "base/core/Chains.hpp"
 #include "base/core/Limits.hpp"
 #include "base/core/Nodes.hpp"
 #include "base/core/Walk.hpp"
+#include "base/decide/reasons/MinimalSubset.hpp"
 #include "base/transform/Symbols.hpp"
 #include "base/variants/VariantKeywords.hpp"
 
@@ -62,15 +63,11 @@ ChoiceBoxes::ChoiceBoxes(const SymbolicExprTable& table, SymbolicExprId context,
     constexpr std::int64_t most = std::numeric_limits<std::int32_t>::max();
     for (Atom atom = 0; bits32 && atom < atomCount_; ++atom)
         isUsable_ = context_.restrict(atom, IntegerSet(least, most)) && isUsable_;
-    for (std::optional<Form>& form : forms_) {
-        if (!form)
-            continue;
-        for (Product& product : *form) {
-            product.box = context_;
-            for (const Operand& operand : product.operands)
-                product.isEmpty = product.isEmpty || !product.box.restrict(operand.allows.atom, operand.allows.set);
-        }
-    }
+    for (std::optional<Form>& form : forms_)
+        if (form)
+            restrict(*form);
+    findCuts();
+    left_ = limits::boxSteps + choices.size() * limits::boxStepsPerChoice;
     hiding_.emplace(atomCount_);
     none_.emplace(atomCount_);
 }
@@ -78,7 +75,25 @@ ChoiceBoxes::ChoiceBoxes(const SymbolicExprTable& table, SymbolicExprId context,
 Atom ChoiceBoxes::atomOf(SymbolicExprId name) {
     if (const Atom* const atom = atoms_.find(name))
         return *atom;
+    names_.push_back(name);
     return atoms_.insert(name, static_cast<Atom>(atoms_.size()));
+}
+
+/// Finds the values at which what the choices and the context say of a name changes.
+void ChoiceBoxes::findCuts() {
+    cuts_.resize(atomCount_, {0, 0});
+    const auto add = [&](const Constraint& side) {
+        for (const auto& [low, high] : side.set.intervals())
+            for (const std::int64_t end : {low, high})
+                if (end != IntegerSet::minusInfinity && end != IntegerSet::plusInfinity)
+                    cuts_[side.atom] = {std::min(cuts_[side.atom].first, end), std::max(cuts_[side.atom].second, end)};
+    };
+    std::ranges::for_each(context_.constraints(), add);
+    for (const std::optional<Form>& form : forms_)
+        if (form)
+            for (const Product& product : *form)
+                for (const Operand& operand : product.operands)
+                    add(operand.allows);
 }
 
 /// What an operand that compares one name with integers allows.
@@ -183,6 +198,7 @@ bool ChoiceBoxes::readContext(SymbolicExprId context) {
         else if (allows->atom < atomCount_ && !context_.restrict(allows->atom, allows->set))
             return false;
     }
+    hasOtherNames_ = !others.empty();
     std::vector<SymbolicExprId> names;
     SymbolsOfSymbolicExpr symbols(table_);
     for (const SymbolicExprId other : others)
@@ -193,9 +209,18 @@ bool ChoiceBoxes::readContext(SymbolicExprId context) {
     });
 }
 
-std::vector<Cube> ChoiceBoxes::boxesOf(std::size_t choice) const {
+/// Finds the boxes of a form within the context.
+void ChoiceBoxes::restrict(Form& form) const {
+    for (Product& product : form) {
+        product.box = context_;
+        for (const Operand& operand : product.operands)
+            product.isEmpty = product.isEmpty || !product.box.restrict(operand.allows.atom, operand.allows.set);
+    }
+}
+
+std::vector<Cube> ChoiceBoxes::boxesOf(const Form& form) {
     std::vector<Cube> boxes;
-    for (const Product& product : *forms_[choice])
+    for (const Product& product : form)
         if (!product.isEmpty)
             boxes.push_back(product.box);
     return boxes;
@@ -213,7 +238,7 @@ Answer ChoiceBoxes::overlap(std::size_t a, std::size_t b) const {
 
 /// Looks for a point of a region that is in none of some boxes.
 BoxGap ChoiceBoxes::ask(BoxUnion& boxes, const Cube& region, std::span<const Cube> further) {
-    const std::uint64_t most = std::max(limits::leastBoxSteps, left_ / 16);
+    const std::uint64_t most = std::max(limits::leastBoxSteps, left_ / 64);
     std::uint64_t left = most;
     BoxGap gap = boxes.gap(region, further, left);
     steps_ += most - left;
@@ -221,16 +246,17 @@ BoxGap ChoiceBoxes::ask(BoxUnion& boxes, const Cube& region, std::span<const Cub
     return gap;
 }
 
-/// Whether a choice is active where none of some boxes is.
-Answer ChoiceBoxes::leaves(std::size_t choice, BoxUnion& boxes, std::span<const Cube> further) {
-    Answer answer = Answer::No;
-    for (const Cube& box : boxesOf(choice)) {
-        const Answer gap = ask(boxes, box, further).answer;
-        if (gap == Answer::Yes)
+/// Looks for a point of one of some regions that is in none of some boxes.
+BoxGap ChoiceBoxes::leaves(std::span<const Cube> regions, BoxUnion& boxes, std::span<const Cube> further) {
+    BoxGap result{Answer::No};
+    for (const Cube& region : regions) {
+        BoxGap gap = ask(boxes, region, further);
+        if (gap.answer == Answer::Yes)
             return gap;
-        answer = gap == Answer::Undecided ? gap : answer;
+        result.answer = gap.answer == Answer::Undecided ? gap.answer : result.answer;
+        result.covering.insert(result.covering.end(), gap.covering.begin(), gap.covering.end());
     }
-    return answer;
+    return result;
 }
 
 Answer ChoiceBoxes::isActiveWithout(std::size_t choice, std::span<const std::size_t> others) {
@@ -238,20 +264,20 @@ Answer ChoiceBoxes::isActiveWithout(std::size_t choice, std::span<const std::siz
     for (const std::size_t other : others) {
         if (!isKnown(other))
             return Answer::Undecided;
-        const std::vector<Cube> ofOther = boxesOf(other);
+        const std::vector<Cube> ofOther = boxesOf(*forms_[other]);
         boxes.insert(boxes.end(), ofOther.begin(), ofOther.end());
     }
-    return isKnown(choice) ? leaves(choice, *none_, boxes) : Answer::Undecided;
+    return isKnown(choice) ? leaves(boxesOf(*forms_[choice]), *none_, boxes).answer : Answer::Undecided;
 }
 
-Answer ChoiceBoxes::isGap(std::span<const std::size_t> choices) {
+BoxGap ChoiceBoxes::gapOf(std::span<const std::size_t> choices) {
     if (!isUsable_ || !std::ranges::all_of(choices, [&](std::size_t choice) { return isKnown(choice); }))
-        return Answer::Undecided;
+        return {};
     BoxUnion all(atomCount_);
     for (const std::size_t choice : choices)
-        for (const Cube& box : boxesOf(choice))
+        for (const Cube& box : boxesOf(*forms_[choice]))
             all.add(box);
-    return ask(all, context_, {}).answer;
+    return ask(all, context_, {});
 }
 
 void ChoiceBoxes::hide(std::size_t choice) {
@@ -259,12 +285,80 @@ void ChoiceBoxes::hide(std::size_t choice) {
         areHidingKnown_ = false;
         return;
     }
-    for (const Cube& box : boxesOf(choice))
+    for (const Cube& box : boxesOf(*forms_[choice])) {
         hiding_->add(box);
+        hidingChoices_.push_back(choice);
+        if (hidingGap_ && hidingGap_->answer != Answer::No &&
+            (hidingGap_->answer == Answer::Undecided || contains(box, hidingGap_->point)))
+            hidingGap_.reset();
+    }
 }
 
-Answer ChoiceBoxes::isActive(std::size_t choice) {
-    return isKnown(choice) && areHidingKnown_ ? leaves(choice, *hiding_, {}) : Answer::Undecided;
+/// Looks for a point of the context that no box hides, or for the fewest boxes that hide all.
+void ChoiceBoxes::findHidingGap() {
+    hidingGap_ = ask(*hiding_, context_, {});
+    if (hidingGap_->answer != Answer::No)
+        return;
+    std::vector<std::uint32_t>& covering = hidingGap_->covering;
+    std::vector<Cube> some;
+    const MinimalSubset needed = minimalSubset(covering.size(), [&](std::span<const std::size_t> positions) {
+        some.clear();
+        for (const std::size_t at : positions)
+            some.push_back(hiding_->boxes()[covering[at]]);
+        const Answer answer = ask(*none_, context_, some).answer;
+        return answer == Answer::Undecided ? answer : answer == Answer::No ? Answer::Yes : Answer::No;
+    });
+    for (std::size_t i = 0; i < needed.positions.size(); ++i)
+        covering[i] = covering[needed.positions[i]];
+    covering.resize(needed.positions.size());
+}
+
+ChoiceBoxes::Activity ChoiceBoxes::activityOf(std::size_t choice) {
+    if (!isHidingKnownOf(choice))
+        return {};
+    const std::vector<Cube> boxes = boxesOf(*forms_[choice]);
+    const bool areAllHidden = hidingGap_ && hidingGap_->answer == Answer::No && !boxes.empty();
+    BoxGap gap = areAllHidden ? *hidingGap_ : leaves(boxes, *hiding_, {});
+    // What hides one choice may hide all that follow.
+    if (gap.answer == Answer::No && !hidingGap_ && !boxes.empty())
+        findHidingGap();
+    Activity result{gap.answer, std::move(gap.point)};
+    for (const std::uint32_t box : gap.covering)
+        result.hiddenBy.push_back(hidingChoices_[box]);
+    std::ranges::sort(result.hiddenBy);
+    result.hiddenBy.erase(std::unique(result.hiddenBy.begin(), result.hiddenBy.end()), result.hiddenBy.end());
+    return result;
+}
+
+Answer ChoiceBoxes::isEqual(std::size_t choice, SymbolicExprId condition) {
+    if (!isHidingKnownOf(choice))
+        return Answer::Undecided;
+    const std::size_t known = atoms_.size();
+    std::optional<Form> form = formOf(condition);
+    if (!form || atoms_.size() > known) // it has names of its own
+        return Answer::Undecided;
+    restrict(*form);
+    const std::vector<Cube> before = boxesOf(*forms_[choice]);
+    const std::vector<Cube> after = boxesOf(*form);
+    Answer gained = Answer::Undecided;
+    const Answer lost = leaves(before, *hiding_, after).answer;
+    if (lost != Answer::Yes)
+        gained = leaves(after, *hiding_, before).answer;
+    if (lost == Answer::Yes || gained == Answer::Yes)
+        return Answer::No;
+    return lost == Answer::No && gained == Answer::No ? Answer::Yes : Answer::Undecided;
+}
+
+std::vector<UnknownValue> ChoiceBoxes::valuesAt(const BoxPoint& point) const {
+    std::vector<UnknownValue> values;
+    for (Atom atom = 0; atom < atomCount_; ++atom) {
+        const auto& [low, high] = cuts_[atom];
+        const std::int64_t value = point[atom] == IntegerSet::minusInfinity  ? std::min<std::int64_t>(low - 1, 0)
+                                   : point[atom] == IntegerSet::plusInfinity ? std::max<std::int64_t>(high + 1, 0)
+                                                                             : point[atom];
+        values.push_back({names_[atom], value});
+    }
+    return values;
 }
 
 std::uint64_t ChoiceBoxes::takeSteps() {

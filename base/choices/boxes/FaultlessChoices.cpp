@@ -4,7 +4,7 @@
 // choice hides: a point of the choice, one outside of it, and one for each operand, product and group.  Points found on
 // the way refute most comparisons that a whole group might be written as. Cost: a question for each operand and
 // product, at most limits::boxSteps each, and a few for groups.
-#include "base/choices/ChoiceBoxes.hpp"
+#include "base/choices/boxes/ChoiceBoxes.hpp"
 #include "base/core/Limits.hpp"
 
 #include <algorithm>
@@ -43,7 +43,7 @@ private:
     }
 
     /// A hidden part shows that the choice is not always active.
-    bool isNotAlways() { return boxes_.hiding_->size() > 0 || isSomewhere(boxes_.context_, all_); }
+    bool isNotAlways() { return !boxes_.hiding_->boxes().empty() || isSomewhere(boxes_.context_, all_); }
 
     bool isEachProductNeeded() {
         for (std::size_t i = 0; i < form_.size(); ++i)
@@ -165,7 +165,7 @@ private:
 };
 
 bool ChoiceBoxes::isFaultless(std::size_t choice) {
-    return isKnown(choice) && areHidingKnown_ && FaultSearch(*this, *forms_[choice]).findsNone();
+    return isHidingKnownOf(choice) && FaultSearch(*this, *forms_[choice]).findsNone();
 }
 
 } // namespace VT
