@@ -51,6 +51,8 @@ std::string reasonText(const VT::BranchReason& reason) {
         return text.append(" is given");
     case VT::BranchReasonKind::Assumption:
         return text.append(" is assumed");
+    case VT::BranchReasonKind::Absence:
+        return text.append(" is defined nowhere");
     default:
         text.append(" (line ").append(std::to_string(reason.region.line)).append(")");
         return text.append(reason.holds ? " holds" : " does not hold");
@@ -142,6 +144,11 @@ Finding findingOf(const std::string& file, const VT::BranchFinding& found, std::
             finding.configurations.push_back(configuration + 1);
         finding.ofConfigurations = configurations;
     }
+    constexpr std::array<std::string_view, 3> causes{"", "configuration", "undefined-name"}; // as VT::BranchCause
+    finding.cause = causes.at(static_cast<std::size_t>(found.cause));
+    finding.witness = found.witness;
+    if (!found.witness.empty())
+        finding.message.append("; built with ").append(found.witness);
     const bool isInEvery = found.configurations.empty() || found.configurations.size() == configurations;
     if (found.replaced && isInEvery && isText(found.edit.text))
         finding.fix = Fix{"Write the shorter condition.", placeOf(file, *found.replaced), found.edit.text};
