@@ -287,6 +287,8 @@ BranchWhy FileScan::why(const Directive& directive, const DirectiveCondition& co
         } else if (const std::size_t next = at - known.build.size(); next < known.assumptions.size()) {
             const FileAssumptions::Fact& fact = assumptions_.facts()[known.assumptions[next]];
             spelled.tokens = BuildAssumptions::tokensOf(*fact.assumption);
+            if (!fact.assumption->shown.empty())
+                spelled.texts.push_back(fact.assumption->shown);
             spelled.spellings = fact.condition.spellings;
         } else {
             const BranchFact& fact = context_[known.directives[next - known.assumptions.size()]];

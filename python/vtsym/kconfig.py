@@ -139,18 +139,20 @@ class Meaning:
         modules = self.bounds.get(self.kconf.modules, (0, 2))
         return bool(item.orig_type is kconfiglib.TRISTATE and modules[1] > 0)
 
-    def promoted(self, value: int, item: Any) -> int:
-        return 2 if value == 1 and not self.is_modular(item) else value
+    def promoted(self, low: int, high: int, item: Any) -> Interval:
+        """Bounds of an item whose m is y unless it is a tristate and there are modules."""
+        always = item.orig_type is kconfiglib.TRISTATE and self.bounds.get(self.kconf.modules, (0, 2))[0] == 2
+        return 2 if low == 1 and not self.is_modular(item) else low, 2 if high == 1 and not always else high
 
     def _visible(self, item: Any) -> Interval:
         bounds = [self.bound(node.prompt[1]) for node in item.nodes if node.prompt]
         low = max((each[0] for each in bounds), default=0)
         high = max((each[1] for each in bounds), default=0)
-        return low, self.promoted(high, item)
+        return low, self.promoted(low, high, item)[1]
 
     def _bound_of_choice(self, choice: Any) -> Interval:
         low, high = self._visible(choice)
-        return self.promoted(0 if choice.is_optional else min(low, 1), choice), high
+        return self.promoted(0 if choice.is_optional else min(low, 1), high, choice)
 
     def _bound_of_default(self, symbol: Any) -> Interval:
         low, high = 2, 0
@@ -174,7 +176,7 @@ class Meaning:
         low = max(selected[0], default[0] if visible[1] == 0 else 0)
         if high == 1 and implied == 2:
             high = 2
-        return self.promoted(low, symbol), self.promoted(high, symbol)
+        return self.promoted(low, high, symbol)
 
     def _narrow(self) -> None:
         items = [each for each in self.kconf.unique_defined_syms
@@ -339,7 +341,10 @@ class Meaning:
         weak: Formula = self.condition(symbol.weak_rev_dep, 1, True) if level == 2 else False
         yield either(negated(own), self.condition(symbol.direct_dep, level, True), selected, weak)
         if not any(node.prompt for node in symbol.nodes):
-            given = (both(self.condition(value, level, True), self.condition(condition, level, True))
+            # Without modules, a default of m is y.
+            whole = negated(self.at_least(self.kconf.modules, 2, False))
+            given = (either(both(self.condition(value, level, True), self.condition(condition, level, True)),
+                            both(whole, self.condition(value, 1, True), self.condition(condition, 1, True)))
                      for value, condition in symbol.defaults)
             yield either(negated(own), *given, self.condition(symbol.weak_rev_dep, 1, True), selected)
 

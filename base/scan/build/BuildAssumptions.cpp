@@ -206,14 +206,16 @@ bool BuildAssumptions::isLogical(std::string_view name) const {
            });
 }
 
-std::optional<BuildAssumptions::Item> BuildAssumptions::absenceOf(std::string_view name) const {
+std::optional<BuildAssumptions::Item> BuildAssumptions::absenceOf(std::string_view name, bool isWritten) const {
     if (!isClosed(name) || open_.contains(name) || byName_.contains(name))
         return std::nullopt;
     Item item;
     item.line = std::make_shared<const std::string>("#if !defined(" + std::string(name) + ")");
     item.names = {std::string_view(*item.line).substr(13, name.size())};
-    item.kind = Item::Kind::Absence;
-    item.shown = name;
+    if (isWritten) {
+        item.kind = Item::Kind::Absence;
+        item.shown = name;
+    }
     return item;
 }
 
@@ -260,20 +262,24 @@ void FileAssumptions::readFor(std::span<const DirectiveToken> condition) {
     if (all_.empty())
         return;
     std::set<std::string_view> names;
+    for (const DirectiveToken& token : condition)
+        if (token.kind == DirectiveTokenKind::Name)
+            names.insert(token.text);
+    for (const std::string_view name : names)
+        readMade(all_.absenceOf(name, true));
     for (std::size_t i = 0; i < condition.size(); ++i) {
-        if (condition[i].kind != DirectiveTokenKind::Name)
-            continue;
-        names.insert(condition[i].text);
-        const bool isCall = i + 3 < condition.size() && isText(condition[i + 1], "(") &&
-                            condition[i + 2].kind == DirectiveTokenKind::Name && isText(condition[i + 3], ")") &&
-                            all_.isSettled(condition[i + 2].text);
+        const bool isCall = condition[i].kind == DirectiveTokenKind::Name && i + 3 < condition.size() &&
+                            isText(condition[i + 1], "(") && condition[i + 2].kind == DirectiveTokenKind::Name &&
+                            isText(condition[i + 3], ")") && all_.isSettled(condition[i + 2].text);
         if (!isCall)
             continue;
-        if (const auto* const meaning = readMade(all_.meaningOf(condition[i].text, condition[i + 2].text)))
-            names.insert(meaning->names.begin(), meaning->names.end());
+        const auto* const meaning = readMade(all_.meaningOf(condition[i].text, condition[i + 2].text));
+        if (meaning == nullptr)
+            continue;
+        for (const std::string_view name : meaning->names)
+            if (names.insert(name).second)
+                readMade(all_.absenceOf(name, false));
     }
-    for (const std::string_view name : names)
-        readMade(all_.absenceOf(name));
     for (const std::size_t item : all_.relatedTo(names))
         read(all_[item]);
 }

@@ -22,13 +22,6 @@
 
 namespace VT {
 
-namespace limits { // DEV
-inline constexpr std::size_t assumptionsAboutName = 16;
-inline constexpr std::size_t assumptionsTogether = 1024;
-inline constexpr std::size_t branchesAssumedAbout = 8;
-inline constexpr std::size_t assumptionNodes = std::size_t{1} << 16U;
-} // DEV
-
 /// Conditions that hold in every build, found by the macros that they name.
 class BuildAssumptions {
 public:
@@ -71,8 +64,9 @@ public:
     [[nodiscard]] bool isSettled(std::string_view name) const;
     /// Whether assumptions say that a macro is 1 wherever it is defined.
     [[nodiscard]] bool isLogical(std::string_view name) const;
-    /// Returns the condition that a settled macro that no line names is not defined; nothing for others.
-    [[nodiscard]] std::optional<Item> absenceOf(std::string_view name) const;
+    /// Returns the condition that a settled macro that no line names is not defined; nothing for others.  That is an
+    /// Absence where the code has the name; a name that a call makes of one that lines have is as good as named.
+    [[nodiscard]] std::optional<Item> absenceOf(std::string_view name, bool isWritten) const;
     /// Returns what the call of a macro with a settled name means; nothing where no line says so.
     [[nodiscard]] std::optional<Item> meaningOf(std::string_view macro, std::string_view argument) const;
 
