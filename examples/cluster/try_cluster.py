@@ -11,9 +11,10 @@ import pathlib
 import signal
 import sys
 import time
-from typing import List
+from typing import Callable, List
 
 import scan_trees
+from distributed import Client
 from scan_trees import Totals
 
 WORKERS = 2
@@ -33,7 +34,7 @@ def scan_here(trees: List[str], report: io.StringIO) -> Totals:
 class Killer:
     """Ends a worker after the first batch, as a machine does that fails."""
 
-    def __init__(self, client: scan_trees.Client) -> None:
+    def __init__(self, client: Client) -> None:
         self.client = client
         self.killed = 0
 
@@ -61,7 +62,8 @@ def main(trees: List[str]) -> int:
             started = time.perf_counter()
             killer = Killer(client)
             report = io.StringIO()
-            totals = scan_trees.scan_trees(client, trees, report, killer if loses else lambda totals: None)
+            on_batch: Callable[[Totals], None] = killer if loses else lambda totals: None
+            totals = scan_trees.scan_trees(client, trees, report, on_batch)
             elapsed = time.perf_counter() - started
             lost = loses and killer.killed not in client.run(os.getpid).values()
         name = "a cluster that loses a worker" if loses else "a cluster"

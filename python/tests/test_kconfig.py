@@ -225,3 +225,11 @@ def test_writing_without_sources(tmp_path: Path) -> None:
     out = io.StringIO()
     assert kconfig.write(read(tmp_path, KCONFIG), out) > 8
     assert "#pragma closed CONFIG_\n" in out.getvalue()
+
+
+def test_the_example_of_the_documentation(tmp_path: Path, monkeypatch: pytest.MonkeyPatch) -> None:
+    folder = Path(__file__).resolve().parents[2] / "docs/examples/kconfig"
+    monkeypatch.chdir(folder)
+    monkeypatch.delenv("srctree", raising=False)
+    assert kconfig.main(["Kconfig", "-o", str(tmp_path / "net.assume")]) == 0
+    assert (tmp_path / "net.assume").read_text() == (folder / "net.assume").read_text()

@@ -19,7 +19,7 @@ import os
 import re
 import sys
 from pathlib import Path
-from typing import Any, Callable, Iterator, Optional, TextIO, Tuple, Union
+from typing import Any, Callable, Iterable, Iterator, Optional, TextIO, Tuple, Union
 
 try:
     import kconfiglib  # type: ignore[import]
@@ -69,7 +69,9 @@ def joined(op: str, *operands: Formula) -> Formula:
             kept[operand] = None
     if any(negated(each) in kept for each in kept):
         return deciding
-    return (op, *kept) if len(kept) > 1 else next(iter(kept), not deciding)
+    if len(kept) > 1:
+        return (op, *kept)
+    return list(kept)[0] if kept else not deciding
 
 
 def either(*operands: Formula) -> Formula:
@@ -215,7 +217,7 @@ class Meaning:
             return low >= level
         if self.is_open(symbol):
             return over
-        is_y = f"defined({self.macro(symbol)})" if high == 2 else False
+        is_y: Formula = f"defined({self.macro(symbol)})" if high == 2 else False
         if level == 2 or not self.is_modular(symbol):
             return is_y
         return either(is_y, f"defined({self.macro(symbol, '_MODULE')})")
@@ -250,6 +252,7 @@ class Meaning:
             return over
         if self._is_fixed(a):
             return bool(kconfiglib.expr_value(expr) == 2)
+        holds: Callable[[int, int], bool]
         holds = {kconfiglib.EQUAL: lambda x, y: x == y, kconfiglib.UNEQUAL: lambda x, y: x != y,
                  kconfiglib.LESS: lambda x, y: x < y, kconfiglib.LESS_EQUAL: lambda x, y: x <= y,
                  kconfiglib.GREATER: lambda x, y: x > y, kconfiglib.GREATER_EQUAL: lambda x, y: x >= y}[operator]
@@ -435,7 +438,7 @@ def read(kconfig: Path, arch: Optional[str] = None) -> Any:
     def shell(_kconf: Any, _name: str, command: str) -> str:
         return commands.setdefault(command, f"{UNKNOWN}_{len(commands)}")
 
-    class Kconfig(kconfiglib.Kconfig):  # type: ignore[misc,name-defined]
+    class Kconfig(kconfiglib.Kconfig):  # type: ignore[misc]
         """Knows `modules` without `option`, as newer files have it."""
 
         def _tokenize(self, line: str) -> Any:
@@ -457,7 +460,7 @@ SETTINGS = re.compile(r"Makefile|Kbuild|.*(defconfig|\.config|\.rst|\.txt|\.dtsi
 class Sources:
     """The names of a tree: those that its sources use, those that they define themselves, and those of all Kconfig files."""
 
-    def __init__(self, tree: Path, prefix: str, excluded: Iterator[str] = iter(())) -> None:
+    def __init__(self, tree: Path, prefix: str, excluded: Iterable[str] = ()) -> None:
         self.used: set[str] = set()
         self.defined: set[str] = set()
         self.symbols: set[str] = set()
