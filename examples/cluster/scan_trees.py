@@ -90,7 +90,7 @@ class Pending(NamedTuple):
     """A batch under way."""
 
     files: int
-    outcome: "Future[Any]"
+    outcome: Future
 
 
 def scan_trees(

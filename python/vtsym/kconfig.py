@@ -252,21 +252,15 @@ class Meaning:
             return over
         if self._is_fixed(a):
             return bool(kconfiglib.expr_value(expr) == 2)
-        holds: Callable[[int, int], bool]
-        holds = {kconfiglib.EQUAL: lambda x, y: x == y, kconfiglib.UNEQUAL: lambda x, y: x != y,
-                 kconfiglib.LESS: lambda x, y: x < y, kconfiglib.LESS_EQUAL: lambda x, y: x <= y,
-                 kconfiglib.GREATER: lambda x, y: x > y, kconfiglib.GREATER_EQUAL: lambda x, y: x >= y}[operator]
         if a.orig_type in (kconfiglib.BOOL, kconfiglib.TRISTATE):
             if b.str_value not in ("n", "m", "y"):
                 return over
             wanted = "nmy".index(b.str_value)
-            return either(*(self._is_level(a, level, over) for level in range(3) if holds(level, wanted)))
+            return either(*(self._is_level(a, level, over) for level in range(3) if compares(operator, level, wanted)))
         number = number_of(b.str_value)
         if a.orig_type not in (kconfiglib.INT, kconfiglib.HEX) or number is None or self.is_open(a):
             return over
-        sign = {kconfiglib.EQUAL: "==", kconfiglib.UNEQUAL: "!=", kconfiglib.LESS: "<", kconfiglib.LESS_EQUAL: "<=",
-                kconfiglib.GREATER: ">", kconfiglib.GREATER_EQUAL: ">="}[operator]
-        compared = f"{self.macro(a)} {sign} {number}"
+        compared = f"{self.macro(a)} {sign_of(operator)} {number}"
         defined = f"defined({self.macro(a)})"
         return either(negated(defined), compared) if over else both(defined, compared)
 
@@ -408,6 +402,19 @@ class Meaning:
             for first in range(0, len(others), MOST_NAMES - 1):
                 off = (negated(self.at_least(each, 1, False)) for each in others[first : first + MOST_NAMES - 1])
                 yield from self._written(either(negated(self.at_least(symbol, 2, True)), both(*off)))
+
+
+def sign_of(operator: Any) -> str:
+    """The sign of a comparison in C."""
+    signs = {kconfiglib.EQUAL: "==", kconfiglib.UNEQUAL: "!=", kconfiglib.LESS: "<", kconfiglib.LESS_EQUAL: "<=",
+             kconfiglib.GREATER: ">", kconfiglib.GREATER_EQUAL: ">="}
+    return signs[operator]
+
+
+def compares(operator: Any, a: int, b: int) -> bool:
+    """Whether a comparison of two numbers holds."""
+    sign = sign_of(operator)
+    return (a == b and "=" in sign and sign != "!=") or (a < b and sign[0] in "<!") or (a > b and sign[0] in ">!")
 
 
 def number_of(text: str, base: int = 0) -> Optional[int]:
