@@ -150,6 +150,8 @@ config MODULES
 	modules
 config NET
 	tristate "net"
+config USB
+	tristate "usb"
 config TLS
 	bool "tls"
 	depends on NET = y
@@ -184,6 +186,8 @@ CODE = """\
 #endif
 #ifdef CONFIG_OTHER
 #endif
+#if defined(CONFIG_USB_MODULE) && !defined(CONFIG_TLS_MODULE)
+#endif
 """
 
 
@@ -210,6 +214,7 @@ def test_scanning_with_a_configuration(tmp_path: Path) -> None:
         ["a.c:8", "'#if defined(CONFIG_SMALL) && defined(CONFIG_BIG)' is dead"],
         ["a.c:11", "'#ifdef CONFIG_NETWORK' is dead"],
         ["a.c:15", "'#ifdef CONFIG_OTHER' is dead"],
+        ["a.c:17", "'#if defined(CONFIG_USB_MODULE) && !defined(CONFIG_TLS_MODULE)' can be '#if defined(CONFIG_USB_MODULE)'"],
     ]
     assert "'CONFIG_NETWORK' is defined nowhere" in found[3][1]
 

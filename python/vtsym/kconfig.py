@@ -500,7 +500,7 @@ def related(lines: list[str], names: set[str], prefix: str) -> list[str]:
     for at, found in enumerate(of_line):
         about.setdefault(found[0], []).append(at)
     kept: set[int] = set()
-    open_names = [*names, *(each + "_MODULE" for each in names)]
+    open_names = [*names, *(each + "_MODULE" for each in names), *(each.removesuffix("_MODULE") for each in names)]
     seen = set(open_names)
     while open_names:
         for at in about.get(open_names.pop(), ()):
@@ -525,14 +525,15 @@ def write(kconf: Any, out: TextIO, sources: Optional[Sources] = None, of: str = 
     named = set(re.findall(r"\w+", " ".join(lines)))
     # What is left out is not known, rather than not defined.
     own = {meaning.macro(each) for each in kconf.unique_defined_syms}
-    for name in sorted(open_names | (own - named)):
+    left_out = own - named
+    for name in sorted({*open_names, *left_out, *(each + "_MODULE" for each in left_out)}):
         print(f"#pragma open {name}", file=out)
     for line in lines:
         print(line, file=out)
     count = len(lines)
     if sources:
         for macro in sorted({meaning.prefix + name for name in sources.symbols} - own):
-            if macro not in open_names and macro in sources.used:
+            if macro not in open_names and sources.used & {macro, macro + "_MODULE"}:
                 print(f"!defined({macro}) && !defined({macro}_MODULE)", file=out)  # of another architecture
                 count += 1
     return count

@@ -16,7 +16,9 @@ std::string lineOf(const BranchFinding& found) {
     if (found.proposed != "0" && found.proposed != "1" && !found.proposed.empty())
         line += " -> " + found.proposed;
     for (const BranchReason& reason : found.reasons)
-        line += (reason.kind == BranchReasonKind::Absence ? " ~" : reason.holds ? " @" : " !") +
+        line += (reason.kind == BranchReasonKind::Absence ? " ~"
+                 : reason.holds                           ? " @"
+                                                          : " !") +
                 (reason.kind == BranchReasonKind::Directive ? std::to_string(reason.region.line) : reason.directive);
     for (const std::string& operand : found.redundant)
         line += " without " + operand;
