@@ -339,7 +339,7 @@ class Meaning:
         yield either(negated(own), self.condition(symbol.direct_dep, level, True), selected, weak)
         if not any(node.prompt for node in symbol.nodes):
             # Without modules, a default of m is y.
-            whole = negated(self.at_least(self.kconf.modules, 2, False))
+            whole: Formula = negated(self.at_least(self.kconf.modules, 2, False)) if level == 2 else False
             given = (either(both(self.condition(value, level, True), self.condition(condition, level, True)),
                             both(whole, self.condition(value, 1, True), self.condition(condition, 1, True)))
                      for value, condition in symbol.defaults)
