@@ -319,6 +319,20 @@ inline constexpr std::size_t scanNodes = std::size_t{1} << 20U;
 /// macro with it, then those that share one with these.  Further ones are not used for it.
 inline constexpr std::size_t relatedAssumptions = 64;
 
+/// Assumptions that share a name and are followed from it.  A name of more leads to those that begin with it alone:
+/// others say little about it, and each leads to further names.
+inline constexpr std::size_t assumptionsAboutName = 16;
+
+/// Assumptions that are checked for a contradiction when a scan begins.  More are taken as they are: contradictions say
+/// nothing about any condition.
+inline constexpr std::size_t assumptionsTogether = 1024;
+
+/// Branches around a condition, the innermost, whose assumptions are used for it too.
+inline constexpr std::size_t branchesAssumedAbout = 8;
+
+/// Nodes of conditions that are only checked to be readable, before the memory is used again.
+inline constexpr std::size_t assumptionNodes = std::size_t{1} << 16U;
+
 /// Configurations of a build that one source file is scanned for.  Further ones are left out, which is counted.
 inline constexpr std::size_t scanConfigurations = 32;
 

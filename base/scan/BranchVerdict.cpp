@@ -147,6 +147,15 @@ BranchVerdict BranchJudge::judge(SymbolicExprId condition, const KnownConditions
     return verdict;
 }
 
+Witness BranchJudge::witness(SymbolicExprId condition, const KnownConditions& known) {
+    beginQuestion();
+    const SymbolicExprId all = this->all(known.facts, known.includeLaws, known.undefinedLaws);
+    const Decision decision = decider_.canHold(SymbolicAndExpr(table_, condition, all).getId(table_));
+    charge(decider_.stepsTaken() + 1);
+    spend(limits::branchSteps - stepsLeft_);
+    return decision.witness.value_or(Witness());
+}
+
 void BranchJudge::beginQuestion() {
     stepsLeft_ = limits::branchSteps;
     isUndecided_ = false;

@@ -54,6 +54,9 @@ public:
     /// that a condition is dead may be about TRUE, where the condition is among the facts.
     MinimalSubset reasons(SymbolicExprId condition, const BranchVerdict& verdict, const KnownConditions& known);
 
+    /// Returns values of unknowns for which a condition and the known ones hold; none where that is not decided.
+    Witness witness(SymbolicExprId condition, const KnownConditions& known);
+
     /// Interns the opposite of a condition.
     SymbolicExprId negated(SymbolicExprId condition) { return SymbolicNotExpr(table_, condition).getId(table_); }
 

@@ -11,6 +11,7 @@
 #include "base/scan/report/ConditionProposal.hpp"
 #include "base/scan/report/DirectiveTexts.hpp"
 #include "base/scan/report/SourcePlaces.hpp"
+#include "base/scan/report/WitnessText.hpp"
 
 #include <utility>
 
@@ -100,6 +101,7 @@ void FileScan::beginBranch(const Directive& directive) {
     if (chain.always && !chain.switchedOn && !chain.silentAround) {
         BranchFinding dead = finding(BranchFindingKind::Dead, directive);
         dead.reasons.push_back(*chain.always);
+        dead.cause = chain.cause;
         report(std::move(dead), directive, "0");
     }
     chain.hadElse = directive.kind == DirectiveKind::Else;
@@ -154,6 +156,10 @@ FileScan::Known FileScan::knownFor(const DirectiveCondition& condition) {
     const auto ask = [&](const std::vector<MacroUnknownId>& unknowns) {
         asked.insert(asked.end(), unknowns.begin(), unknowns.end());
     };
+    if (!assumptions_.facts().empty()) // which may lead from the branches around to the condition alone
+        for (std::size_t i = context_.size(), left = limits::branchesAssumedAbout; i-- > 0 && left > 0; --left)
+            if (assumptions_.concern(context_[i].unknowns))
+                ask(context_[i].unknowns);
     for (std::size_t assumed = 0;;) { // directives lead to assumptions, and these to directives
         known.directives = context_.related(asked);
         for (const std::size_t fact : known.directives)
@@ -194,6 +200,8 @@ void FileScan::judgeBranch(const Directive& directive, const DirectiveCondition&
     if ((known.conditions.facts.empty() && isSingle(condition.node)) || !judge_.beginBranch())
         return;
     const BranchVerdict verdict = judge_.judge(condition.node, known.conditions);
+    if (input_.witnesses != nullptr && verdict.kind != BranchVerdictKind::Dead)
+        findWitness(directive, condition, known);
     if (verdict.kind == BranchVerdictKind::None)
         return;
     std::string proposed = verdict.kind == BranchVerdictKind::Dead ? "0" : "1";
@@ -209,6 +217,7 @@ void FileScan::judgeBranch(const Directive& directive, const DirectiveCondition&
                                    : verdict.kind == BranchVerdictKind::AlwaysTrue ? BranchFindingKind::AlwaysTrue
                                                                                    : BranchFindingKind::Removable,
                                    directive);
+    result.cause = causeOf(known, reasons);
     for (const std::size_t at : reasons) {
         for (BranchReason& reason : reasonsOf(known, at))
             if (std::ranges::find(result.reasons, reason) == result.reasons.end())
@@ -226,8 +235,10 @@ void FileScan::judgeBranch(const Directive& directive, const DirectiveCondition&
     }
     Chain& chain = chains_.back();
     chain.silent = verdict.kind == BranchVerdictKind::Dead;
-    if (verdict.kind == BranchVerdictKind::AlwaysTrue)
+    if (verdict.kind == BranchVerdictKind::AlwaysTrue) {
+        chain.cause = result.cause;
         chain.always = BranchReason{result.region, quotedDirective(result.directive), true};
+    }
     report(std::move(result), directive, std::move(proposed));
 }
 
@@ -237,6 +248,31 @@ bool FileScan::isSpelledOut(const Known& known, const std::vector<std::size_t>& 
     return !reasons.empty() && std::ranges::all_of(reasons, [&](std::size_t at) {
         return at >= first && known.directives[at - first] >= chains_.back().firstFact;
     });
+}
+
+/// What a finding needs besides the code.
+BranchCause FileScan::causeOf(const Known& known, const std::vector<std::size_t>& reasons) const {
+    BranchCause cause = BranchCause::Code;
+    for (std::size_t at : reasons) {
+        const bool isBuild = at < known.build.size();
+        at -= isBuild ? 0 : known.build.size();
+        if (isBuild)
+            cause = std::max(cause, BranchCause::Configuration);
+        else if (at < known.assumptions.size())
+            cause = std::max(cause, assumptions_.facts()[known.assumptions[at]].assumption->kind ==
+                                            BuildAssumptions::Item::Kind::Absence
+                                        ? BranchCause::Absence
+                                        : BranchCause::Configuration);
+    }
+    return cause;
+}
+
+/// Finds definitions that enter a branch, where they are wanted.
+void FileScan::findWitness(const Directive& directive, const DirectiveCondition& condition, const Known& known) {
+    const auto wanted = input_.witnesses->find(directive.line);
+    if (wanted != input_.witnesses->end() && wanted->second.empty())
+        wanted->second = witnessText(unknowns_, judge_.witness(condition.node, known.conditions),
+                                     [this](std::string_view name) { return input_.assumptions.isLogical(name); });
 }
 
 /// The operands that force a verdict, picked from the facts that are its reasons.
@@ -250,7 +286,9 @@ BranchWhy FileScan::why(const Directive& directive, const DirectiveCondition& co
                 spelled.texts.push_back(definition.directive);
         } else if (const std::size_t next = at - known.build.size(); next < known.assumptions.size()) {
             const FileAssumptions::Fact& fact = assumptions_.facts()[known.assumptions[next]];
-            spelled.tokens = input_.assumptions[fact.assumption].tokens;
+            spelled.tokens = BuildAssumptions::tokensOf(*fact.assumption);
+            if (!fact.assumption->shown.empty())
+                spelled.texts.push_back(fact.assumption->shown);
             spelled.spellings = fact.condition.spellings;
         } else {
             const BranchFact& fact = context_[known.directives[next - known.assumptions.size()]];
@@ -282,11 +320,13 @@ std::vector<BranchReason> FileScan::reasonsOf(const Known& known, std::size_t fa
     fact -= known.build.size();
     if (fact >= known.assumptions.size())
         return {reasonOf(context_[known.directives[fact - known.assumptions.size()]])};
-    const std::size_t assumption = assumptions_.facts()[known.assumptions[fact]].assumption;
+    const BuildAssumptions::Item& assumption = *assumptions_.facts()[known.assumptions[fact]].assumption;
+    const bool isAbsence = assumption.kind == BuildAssumptions::Item::Kind::Absence;
     return {{{},
-             quotedDirective(spelledTokens(input_.assumptions[assumption].tokens)),
+             quotedDirective(assumption.shown.empty() ? assumption.line->substr(assumption.line->find(' ') + 1)
+                                                      : assumption.shown),
              true,
-             BranchReasonKind::Assumption}};
+             isAbsence ? BranchReasonKind::Absence : BranchReasonKind::Assumption}};
 }
 
 std::vector<BranchReason> FileScan::definitionsOf(const BuildFact& fact) const {

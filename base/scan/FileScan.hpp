@@ -8,10 +8,15 @@
 #include "base/scan/report/BranchWhy.hpp"
 
 #include <functional>
+#include <map>
+#include <string>
 #include <unordered_map>
 #include <vector>
 
 namespace VT {
+
+/// Definitions that enter branches, by the lines of those that they are wanted for; empty where none was found.
+using BranchWitnesses = std::map<std::uint64_t, std::string>;
 
 /// One file and what is known of its build.
 struct FileScanInput {
@@ -20,6 +25,7 @@ struct FileScanInput {
     const BuildMacros* build; ///< nullptr for nothing
     const BuildAssumptions& assumptions;
     const SourceScanOptions& options;
+    BranchWitnesses* witnesses = nullptr; ///< to find; nullptr for none
 };
 
 /// Reports the findings of one file in the order of its lines.  Used once.
@@ -49,8 +55,9 @@ private:
         bool silent = false;  ///< nothing is reported inside the branch
         bool hasFact = false; ///< the branch's condition is the last fact
         bool hadElse = false;
-        bool switchedOn = false;              ///< a branch before is entered by a switch
-        std::optional<BranchReason> always{}; ///< the branch that is always entered, so that later ones never are
+        bool switchedOn = false;               ///< a branch before is entered by a switch
+        BranchCause cause = BranchCause::Code; ///< of what follows
+        std::optional<BranchReason> always{};  ///< the branch that is always entered, so that later ones never are
     };
 
     /// What is known where a condition is judged.  The facts are those of the build, assumptions, and directives.
@@ -74,6 +81,8 @@ private:
     void judgeBranch(const Directive& directive, const DirectiveCondition& condition);
     [[nodiscard]] bool isSingle(SymbolicExprId condition) const;
     [[nodiscard]] bool isSpelledOut(const Known& known, const std::vector<std::size_t>& reasons) const;
+    [[nodiscard]] BranchCause causeOf(const Known& known, const std::vector<std::size_t>& reasons) const;
+    void findWitness(const Directive& directive, const DirectiveCondition& condition, const Known& known);
     [[nodiscard]] BranchFinding finding(BranchFindingKind kind, const Directive& directive) const;
     void report(BranchFinding finding, const Directive& directive, std::string proposed);
     [[nodiscard]] std::vector<BranchReason> reasonsOf(const Known& known, std::size_t fact) const;

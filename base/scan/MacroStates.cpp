@@ -27,7 +27,7 @@ MacroStates::Name MacroStates::nameOf(std::string_view text, bool lasting) {
         }
     }
     texts_.push_back(lasting ? text : copies_.emplace_back(text));
-    macros_.push_back({.version = 0, .varies = variesByItself(text)});
+    macros_.push_back({.version = 0, .varies = variesByItself(text), .settled = isSettled_ && isSettled_(text)});
     sameHash_.push_back(before);
     byHash_.insert(hash, name);
     return name;
@@ -84,7 +84,8 @@ bool MacroStates::reach(Name name, Names namesOf) {
 
 MacroStates::State MacroStates::stateOf(Name name) {
     const Macro& macro = macros_[name];
-    State state{std::max(macro.version, floor_), epoch_, !macro.names.empty(), macro.varies};
+    const std::uint64_t version = std::max(macro.version, floor_);
+    State state{version, macro.settled && version == 0 ? 0 : epoch_, !macro.names.empty(), macro.varies};
     if (!state.derived)
         return state;
     if (!reach(

@@ -16,9 +16,11 @@
 #include <cstddef>
 #include <cstdint>
 #include <deque>
+#include <functional>
 #include <span>
 #include <string>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 namespace VT {
@@ -35,6 +37,9 @@ public:
         bool varies = false;   ///< the value may differ with each reading
         bool operator==(const State&) const = default;
     };
+
+    /// Names macros that no included file changes, before the first of them is read.
+    void settle(std::function<bool(std::string_view)> isSettled) { isSettled_ = std::move(isSettled); }
 
     /// Returns the number of a name.  With `lasting`, the text outlives this object and is not copied.
     Name nameOf(std::string_view text, bool lasting = false);
@@ -79,6 +84,7 @@ private:
         std::vector<Name> aliases{}; ///< definitions as a whole
         bool varies;                 ///< by itself
         bool open = false;           ///< by itself
+        bool settled = false;        ///< before the file begins
     };
 
     template <class Names>
@@ -89,6 +95,7 @@ private:
     std::vector<std::string_view> texts_; ///< by name
     std::deque<std::string> copies_;
     std::vector<Macro> macros_; ///< by name
+    std::function<bool(std::string_view)> isSettled_;
     std::vector<Chain> chains_; ///< open
     std::vector<Name> reached_; ///< by reach()
     std::uint64_t latest_ = 0;

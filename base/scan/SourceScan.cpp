@@ -9,6 +9,8 @@
 #include "base/scan/FileScan.hpp"
 
 #include <algorithm>
+#include <deque>
+#include <map>
 #include <unordered_map>
 #include <utility>
 
@@ -69,17 +71,28 @@ struct SourceScanner::State {
         judge = std::make_unique<BranchJudge>(*table);
     }
 
-    std::vector<BranchFinding> scan(const SourceFile& file, const BuildMacros* build);
+    /// A configuration of a file.
+    struct Configuration {
+        const BuildMacros* build;
+        const BuildAssumptions* assumptions;
+    };
+
+    std::vector<BranchFinding> scan(const SourceFile& file, const Configuration& in, BranchWitnesses* witnesses);
+    [[nodiscard]] std::vector<Configuration> configurationsOf(const SourceFile& file) const;
+    void addWitnesses(const SourceFile& file, const std::vector<Configuration>& configurations,
+                      std::vector<BranchFinding>& found);
 
     SourceScanOptions options;
     SourceScanCounts counts;
-    BuildAssumptions assumptions;
+    BuildAssumptions assumptions; ///< of every build
+    std::deque<BuildAssumptions> alternatives;
     std::unique_ptr<SymbolicExprTable> table;
     std::unique_ptr<BranchJudge> judge;
 };
 
 /// Scans a file in one configuration.  Only the scan without one counts what it reads.
-std::vector<BranchFinding> SourceScanner::State::scan(const SourceFile& file, const BuildMacros* build) {
+std::vector<BranchFinding> SourceScanner::State::scan(const SourceFile& file, const Configuration& in,
+                                                      BranchWitnesses* witnesses = nullptr) {
     if (table->size() > limits::scanNodes)
         renew();
     const std::uint64_t stepsBefore = judge->steps();
@@ -87,13 +100,58 @@ std::vector<BranchFinding> SourceScanner::State::scan(const SourceFile& file, co
     judge->beginFile();
     std::vector<BranchFinding> found;
     SourceScanCounts uncounted;
-    const FileScanInput input{file.text, file.isCpp, build, assumptions, options};
-    FileScan(*table, *judge, input, build == nullptr ? counts : uncounted, [&](BranchFinding&& finding) {
+    const FileScanInput input{file.text, file.isCpp, in.build, *in.assumptions, options, witnesses};
+    const bool isCounted = in.build == nullptr && in.assumptions == &assumptions;
+    FileScan(*table, *judge, input, isCounted ? counts : uncounted, [&](BranchFinding&& finding) {
         found.push_back(std::move(finding));
     }).run();
     counts.undecided += judge->givenUp() - givenUpBefore;
     counts.steps += judge->steps() - stepsBefore;
     return found;
+}
+
+/// Each definition of macros with each alternative.  Alternatives that have nothing to say about a file are left out.
+std::vector<SourceScanner::State::Configuration> SourceScanner::State::configurationsOf(const SourceFile& file) const {
+    std::vector<const BuildMacros*> builds = file.configurations;
+    if (builds.empty() &&
+        std::ranges::any_of(alternatives, [&](const BuildAssumptions& each) { return each.mayConcern(file.text); }))
+        builds.push_back(nullptr);
+    std::vector<Configuration> all;
+    for (const BuildMacros* const build : builds) {
+        if (alternatives.empty())
+            all.push_back({build, &assumptions});
+        for (const BuildAssumptions& each : alternatives)
+            all.push_back({build, &each});
+    }
+    return all;
+}
+
+/// Adds how branches that are dead in some configurations are entered in others.
+void SourceScanner::State::addWitnesses(const SourceFile& file, const std::vector<Configuration>& configurations,
+                                        std::vector<BranchFinding>& found) {
+    std::map<std::size_t, BranchWitnesses> wanted; // by configuration
+    for (const BranchFinding& finding : found) {
+        if (finding.kind != BranchFindingKind::Dead || finding.configurations.empty())
+            continue;
+        std::size_t other = 0;
+        while (other < finding.configurations.size() && finding.configurations[other] == other)
+            ++other;
+        if (other < configurations.size())
+            wanted[other].emplace(finding.region.line, "");
+    }
+    for (auto& [configuration, witnesses] : wanted) {
+        scan(file, configurations[configuration], &witnesses);
+        for (BranchFinding& finding : found) {
+            const auto witness = witnesses.find(finding.region.line);
+            const bool isOther =
+                std::ranges::find(finding.configurations, configuration) == finding.configurations.end();
+            if (witness == witnesses.end() || finding.kind != BranchFindingKind::Dead || !isOther ||
+                finding.configurations.empty() || witness->second.empty())
+                continue;
+            finding.witness = witness->second;
+            finding.witnessOf = configuration;
+        }
+    }
 }
 
 SourceScanner::SourceScanner(const SourceScanOptions& options) : state_(std::make_unique<State>(options)) {}
@@ -103,21 +161,31 @@ SourceScanner& SourceScanner::operator=(SourceScanner&&) noexcept = default;
 SourceScanner::~SourceScanner() = default;
 
 std::optional<std::string> SourceScanner::assume(std::string_view condition) {
-    return state_->assumptions.add(condition);
+    return (state_->alternatives.empty() ? state_->assumptions : state_->alternatives.back()).add(condition);
+}
+
+void SourceScanner::beginAlternative() {
+    state_->alternatives.push_back(state_->assumptions);
 }
 
 bool SourceScanner::assumptionsCanHold() {
-    return state_->assumptions.canHold();
+    return state_->assumptions.canHold() &&
+           std::ranges::all_of(state_->alternatives, [](const BuildAssumptions& each) { return each.canHold(); });
 }
 
 void SourceScanner::scan(const SourceFile& file, const std::function<void(const BranchFinding&)>& report) {
     FileFindings all;
-    all.add(state_->scan(file, nullptr), std::nullopt);
-    const std::size_t most = std::min(file.configurations.size(), limits::scanConfigurations);
+    all.add(state_->scan(file, {nullptr, &state_->assumptions}), std::nullopt);
+    std::vector<State::Configuration> configurations = state_->configurationsOf(file);
+    const std::size_t most = std::min(configurations.size(), limits::scanConfigurations);
+    state_->counts.leftOut += configurations.size() - most;
+    configurations.resize(most);
     for (std::size_t i = 0; i < most; ++i)
-        all.add(state_->scan(file, file.configurations[i]), i);
-    state_->counts.leftOut += file.configurations.size() - most;
-    std::ranges::for_each(all.take(), report);
+        all.add(state_->scan(file, configurations[i]), i);
+    std::vector<BranchFinding> found = all.take();
+    if (state_->options.why && !state_->alternatives.empty())
+        state_->addWitnesses(file, configurations, found);
+    std::ranges::for_each(found, report);
 }
 
 void SourceScanner::scan(std::string_view text, bool isCpp, const std::function<void(const BranchFinding&)>& report) {

@@ -38,12 +38,20 @@ enum class BranchReasonKind : std::uint8_t {
     Directive,  ///< of the file
     Build,      ///< a definition of the build
     Assumption, ///< a condition that is assumed
+    Absence,    ///< a macro that is assumed to be defined nowhere
+};
+
+/// What a finding needs besides the code, the strongest that it needs last.
+enum class BranchCause : std::uint8_t {
+    Code,          ///< nothing
+    Configuration, ///< definitions of the build, or assumptions
+    Absence,       ///< that a macro is defined nowhere
 };
 
 /// What a finding follows from.
 struct BranchReason {
     SourceRegion region;   ///< a definition has the line in its file alone, or 0; an assumption has none
-    std::string directive; ///< "#if A > 2", "-DN=4", "N >= 1"
+    std::string directive; ///< "#if A > 2", "-DN=4", "N >= 1", the name of a macro that is defined nowhere
     bool holds;            ///< at the finding: true for a directive around it, false for one before it in its chain
     BranchReasonKind kind = BranchReasonKind::Directive;
     std::string file{}; ///< of a definition
@@ -58,6 +66,7 @@ struct BranchFinding {
     std::string condition; ///< "defined(A)"; empty for #else
     std::string proposed;  ///< a condition to write instead; empty for #else
     std::vector<BranchReason> reasons;
+    BranchCause cause = BranchCause::Code;
     std::optional<SourceRegion> replaced; ///< the region to replace by `edit.text` for the proposed condition
     SourceEdit edit;                      ///< the same in bytes; comments, blanks and line splices stay
     /// The operands that force the finding, as written or negated; none unless they are asked for.
@@ -68,6 +77,8 @@ struct BranchFinding {
     /// Configurations of the build that the finding holds for, by number; none for one that holds in every build.
     std::vector<std::size_t> configurations{};
     bool hasOtherReasons = false; ///< in some of the configurations
+    std::string witness{};        ///< definitions that enter a branch that is dead in other configurations alone
+    std::size_t witnessOf = 0;    ///< the configuration that has them
 };
 
 /// Options of a scanner, for all of its files.
@@ -110,7 +121,8 @@ struct SourceFile {
 ///
 /// With configurations, a file is scanned without them first, and then for each: macros are what the build defines,
 /// until the file changes them.  Definitions stay through included files.  Assumptions are conditions that hold for
-/// macros that the file did not change, wherever they are read.
+/// macros that the file did not change, wherever they are read.  Alternatives are sets of assumptions of which one
+/// holds: each makes a configuration of each that the file has, or one by itself.
 ///
 /// A scanner keeps its decisions from file to file.  It is used by one thread at a time.
 class VTSYM_API SourceScanner {
@@ -123,6 +135,8 @@ public:
     /// Assumes a condition, as #if has them, in every file from now on.  Returns what is wrong with it, a part of a
     /// sentence that follows its quotation; nothing where it is assumed.
     std::optional<std::string> assume(std::string_view condition);
+    /// Begins an alternative, which has what was assumed so far, and takes what is assumed from now on.
+    void beginAlternative();
     /// Whether all assumptions can hold together, as far as that is decided.
     [[nodiscard]] bool assumptionsCanHold();
 

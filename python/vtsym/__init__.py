@@ -11,7 +11,7 @@ from vtsym.context import Context
 from vtsym.errors import EvaluationError, ModelError, ParseError, SourceError, VtsymError
 from vtsym.models import Block, Model, ModelFinding, Report
 from vtsym.results import Decision, Reasons, Relation, SetDecision
-from vtsym.scanning import Reason, SourceFinding, scan, scan_text
+from vtsym.scanning import Reason, SourceFinding, scan, scan_text, source_files
 
 __all__ = [
     "Block",
@@ -40,4 +40,5 @@ __all__ = [
     "parse",
     "scan",
     "scan_text",
+    "source_files",
 ]

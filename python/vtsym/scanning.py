@@ -46,6 +46,26 @@ class SourceFinding:
         return f"{self.file}:{self.line}: {self.kind}: {self.directive}{advice}"
 
 
+def source_files(
+    paths: AnyPath | Iterable[AnyPath], *, on_problem: Callable[[str, str], None] | None = None
+) -> list[str]:
+    """The files that :func:`scan` reads, in its order: C and C++ files below folders, and files that are named.
+
+    A folder that cannot be read raises :class:`~vtsym.SourceError`, or is handed to ``on_problem`` with a sentence.
+
+    >>> import vtsym
+    >>> vtsym.source_files("examples")
+    ['examples/radio.h']
+    """
+    given = [paths] if isinstance(paths, (str, os.PathLike)) else paths
+    files, problems = _vtsym.source_files([os.fsencode(path) for path in given])
+    for path, sentence in problems:
+        if on_problem is None:
+            raise SourceError(f"{path}: {sentence}")
+        on_problem(path, sentence)
+    return files
+
+
 def scan(
     paths: AnyPath | Iterable[AnyPath],
     *,
@@ -71,10 +91,7 @@ def scan(
             raise SourceError(f"{path}: {sentence}")
         on_problem(path, sentence)
 
-    given = [paths] if isinstance(paths, (str, os.PathLike)) else paths
-    files, problems = _vtsym.source_files([os.fsencode(path) for path in given])
-    for path, sentence in problems:
-        refuse(path, sentence)
+    files = source_files(paths, on_problem=refuse)
     scanner = _vtsym.Scanner(strict_includes)
     for file in files:
         try:

@@ -16,7 +16,9 @@ std::string lineOf(const BranchFinding& found) {
     if (found.proposed != "0" && found.proposed != "1" && !found.proposed.empty())
         line += " -> " + found.proposed;
     for (const BranchReason& reason : found.reasons)
-        line += (reason.holds ? " @" : " !") +
+        line += (reason.kind == BranchReasonKind::Absence ? " ~"
+                 : reason.holds                           ? " @"
+                                                          : " !") +
                 (reason.kind == BranchReasonKind::Directive ? std::to_string(reason.region.line) : reason.directive);
     for (const std::string& operand : found.redundant)
         line += " without " + operand;
@@ -24,6 +26,10 @@ std::string lineOf(const BranchFinding& found) {
         line += (i == 0 ? " because " : ", ") + found.because[i];
     for (const std::size_t configuration : found.configurations)
         line += " #" + std::to_string(configuration + 1);
+    if (found.cause == BranchCause::Absence)
+        line += " absent";
+    if (!found.witness.empty())
+        line += " but #" + std::to_string(found.witnessOf + 1) + " with " + found.witness;
     return line;
 }
 
@@ -67,6 +73,8 @@ TEST(Findings, OfBuilds) {
                     EXPECT_TRUE(builds.back().undefine(option.substr(2))) << option;
                 else if (option.starts_with("assume "))
                     EXPECT_EQ(scanner.assume(option.substr(7)), std::nullopt) << option;
+                else if (option == "or")
+                    scanner.beginAlternative();
                 else
                     builds.back().addFile("c.h", option, true);
             }

@@ -1,4 +1,11 @@
 // Conditions that are assumed of every build.
+//
+// A line is a condition as #if has them, or one of these:
+//   #define F(x) body      what a call of F with one name means where code asks for it: `x##_A` is the name with a
+//   suffix #pragma closed PREFIX  macros of this prefix are settled before a file begins, and those that no line names
+//   are not
+//                          defined
+//   #pragma open NAME      but for this one, which sources define themselves
 #pragma once
 
 #include "base/scan/DirectiveCondition.hpp"
@@ -10,6 +17,7 @@
 #include <string>
 #include <string_view>
 #include <unordered_map>
+#include <utility>
 #include <vector>
 
 namespace VT {
@@ -18,19 +26,29 @@ namespace VT {
 class BuildAssumptions {
 public:
     struct Item {
+        enum class Kind : std::uint8_t {
+            Condition, ///< a line
+            Meaning,   ///< of a call, by a #define
+            Absence,   ///< of a macro that no line names
+        };
+
         std::shared_ptr<const std::string> line; ///< as a directive
-        std::vector<DirectiveToken> tokens;      ///< views of the line
-        std::vector<std::string_view> names;     ///< of macros, each once
+        std::vector<std::string_view> names;     ///< of macros, each once, in their order
+        Kind kind = Kind::Condition;
+        std::string shown{}; ///< what it follows from, where that is not the line itself
     };
 
-    /// Assumes a condition as #if has them.  Returns what is wrong with it, a part of a sentence that follows its
-    /// quotation; nothing where it was added.
+    /// Adds a line.  Returns what is wrong with it, a part of a sentence that follows its quotation; nothing where it
+    /// was added.
     std::optional<std::string> add(std::string_view condition);
 
-    /// Whether all can hold together, as far as that is decided.
+    /// Whether all can hold together, as far as that is decided: true for more than limits::assumptionsTogether.
     [[nodiscard]] bool canHold() const;
 
-    [[nodiscard]] bool empty() const noexcept { return items_.empty(); }
+    [[nodiscard]] bool empty() const noexcept { return items_.empty() && closed_.empty() && meanings_.empty(); }
+
+    /// Whether some text may have a macro that is settled; true where no prefix is closed.
+    [[nodiscard]] bool mayConcern(std::string_view text) const;
 
     [[nodiscard]] const Item& operator[](std::size_t at) const { return items_[at]; }
 
@@ -38,24 +56,56 @@ public:
     /// limits::relatedAssumptions at most.
     [[nodiscard]] std::vector<std::size_t> relatedTo(const std::set<std::string_view>& names) const;
 
+    /// Whether a name leads to an assumption that has it.  A name that more than limits::assumptionsAboutName share
+    /// leads to those that begin with it alone.
+    [[nodiscard]] bool leadsTo(std::string_view name, const Item& item) const;
+
+    /// Whether a macro is settled before a file begins.
+    [[nodiscard]] bool isSettled(std::string_view name) const;
+    /// Whether assumptions say that a macro is 1 wherever it is defined.
+    [[nodiscard]] bool isLogical(std::string_view name) const;
+    /// Returns the condition that a settled macro that no line names is not defined; nothing for others.  That is an
+    /// Absence where the code has the name; a name that a call makes of one that lines have is as good as named.
+    [[nodiscard]] std::optional<Item> absenceOf(std::string_view name, bool isWritten) const;
+    /// Returns what the call of a macro with a settled name means; nothing where no line says so.
+    [[nodiscard]] std::optional<Item> meaningOf(std::string_view macro, std::string_view argument) const;
+
+    /// The tokens of an item: views of its line.
+    static std::vector<DirectiveToken> tokensOf(const Item& item);
+
 private:
+    /// What calls of a macro mean.
+    struct Meaning {
+        std::shared_ptr<const std::string> line;
+        std::string_view parameter;
+        std::vector<DirectiveToken> body;
+    };
+
+    struct Check;
+
+    [[nodiscard]] bool isClosed(std::string_view name) const;
+    bool isCondition(const Directive& directive);
+    std::optional<std::string> addMeaning(std::string_view line);
+    std::optional<std::string> addPragma(std::string_view line);
+
     std::vector<Item> items_;
     std::unordered_map<std::string_view, std::vector<std::size_t>> byName_;
+    std::unordered_map<std::string_view, std::vector<std::size_t>> byFirst_;
+    std::vector<std::string> closed_; ///< prefixes
+    std::set<std::string, std::less<>> open_;
+    std::map<std::string, Meaning, std::less<>> meanings_;
+    std::shared_ptr<Check> check_; ///< of lines that are added
 };
 
 /// The assumptions in one file: about macros that the file did not change, wherever they are read.
 class FileAssumptions {
 public:
     FileAssumptions(const BuildAssumptions& all, MacroStates& states, MacroUnknowns& unknowns,
-                    DirectiveConditionReader& reader)
-        : all_(all),
-          states_(states),
-          unknowns_(unknowns),
-          reader_(reader) {}
+                    DirectiveConditionReader& reader);
 
     /// An assumption about macros as they are at some place.
     struct Fact {
-        std::size_t assumption;
+        const BuildAssumptions::Item* assumption;
         DirectiveCondition condition;
     };
 
@@ -66,17 +116,24 @@ public:
     /// Everything that was read.
     [[nodiscard]] const std::vector<Fact>& facts() const noexcept { return facts_; }
 
+    /// Whether a fact is about one of the unknowns.
+    [[nodiscard]] bool concern(const std::vector<MacroUnknownId>& unknowns) const;
+
     /// Returns the positions of the facts that have to do with some unknowns, limits::relatedAssumptions at most.
     [[nodiscard]] std::vector<std::size_t> relatedTo(const std::vector<MacroUnknownId>& unknowns) const;
 
 private:
+    void read(const BuildAssumptions::Item& item);
+    const BuildAssumptions::Item* readMade(std::optional<BuildAssumptions::Item> item);
+
     const BuildAssumptions& all_;
     MacroStates& states_;
     MacroUnknowns& unknowns_;
     DirectiveConditionReader& reader_;
     std::vector<Fact> facts_;
-    std::set<std::pair<std::size_t, std::uint64_t>> read_;                ///< assumption and epoch
-    std::unordered_map<std::uint32_t, std::vector<std::size_t>> byGroup_; ///< facts by group of unknowns
+    std::map<std::string, BuildAssumptions::Item, std::less<>> made_; ///< for names and calls of the file, by line
+    std::set<std::pair<const BuildAssumptions::Item*, std::uint64_t>> read_; ///< and epoch
+    std::unordered_map<std::uint32_t, std::vector<std::size_t>> byGroup_;    ///< facts by group of unknowns
 };
 
 } // namespace VT

@@ -321,6 +321,12 @@ void addBuildOptions(Command& command, const std::shared_ptr<ScanOptions>& optio
                                  }
                              }
                          });
+    command.addArguments(
+        {"--configuration", "Scan for builds of one of several kinds, each with its assumptions", "NAME=FILE"},
+        [&settings](const std::vector<std::string>& arguments) {
+            for (const std::string& argument : arguments)
+                addConfiguration(settings.configurations, "--configuration", argument);
+        });
     command.addFlag("--strict-includes", "Assume that an included file changes any macro", settings.strictIncludes);
 }
 

@@ -72,11 +72,18 @@ void appendReasons(const Finding& finding, std::string& json) {
 void appendState(const Finding& finding, std::string& json) {
     if (!finding.state.empty())
         appendMember(json, "state", jsonString(finding.state));
+    if (!finding.cause.empty())
+        appendMember(json, "cause", jsonString(finding.cause));
     if (finding.configurations.empty())
         return;
     std::string list;
     for (const std::size_t configuration : finding.configurations)
         list.append(list.empty() ? "" : ",").append(std::to_string(configuration));
+    if (!finding.configurationNames.empty()) {
+        list.clear();
+        for (const std::string& name : finding.configurationNames)
+            list.append(list.empty() ? "" : ",").append(jsonString(name));
+    }
     appendMember(json, "configurations", "[" + list + "]");
     appendMember(json, "of_configurations", std::to_string(finding.ofConfigurations));
 }
@@ -238,7 +245,7 @@ void SarifWriter::add(const Finding& finding) {
     if (!finding.witness.empty())
         appendMember(properties, "witness", jsonString(finding.witness));
     appendReasons(finding, properties);
-    if (!finding.configurations.empty())
+    if (!finding.configurations.empty() || !finding.cause.empty())
         appendState(finding, properties);
     appendMember(out, "properties", properties + "}");
     results.emplace_back(added_, out + "}");

@@ -71,6 +71,8 @@ struct Finding {
     /// Configurations of the build that the finding holds for, from 1, of so many; none where it holds in every build.
     std::vector<std::size_t> configurations = {};
     std::size_t ofConfigurations = 0;
+    std::vector<std::string> configurationNames = {}; ///< of those that have names
+    std::string_view cause = {}; ///< what the finding needs besides the code: "configuration", "undefined-name"
 };
 
 /// The message with its reasons.

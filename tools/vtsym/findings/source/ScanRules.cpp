@@ -51,6 +51,8 @@ std::string reasonText(const VT::BranchReason& reason) {
         return text.append(" is given");
     case VT::BranchReasonKind::Assumption:
         return text.append(" is assumed");
+    case VT::BranchReasonKind::Absence:
+        return text.append(" is defined nowhere");
     default:
         text.append(" (line ").append(std::to_string(reason.region.line)).append(")");
         return text.append(reason.holds ? " holds" : " does not hold");
@@ -65,6 +67,19 @@ std::string reasonsText(const VT::BranchFinding& found) {
         text.append(i == 0 ? "" : i + 1 == reasons.size() ? " and " : ", ").append(reasonText(reasons[i]));
     text.append(reasons.back().kind == VT::BranchReasonKind::Directive ? " here" : "");
     return found.hasOtherReasons ? text + " or for other reasons" : text;
+}
+
+/// The settings of "A=y, B=n, C=m" that are not n.
+std::string settingsOn(const std::string& settings) {
+    std::string on;
+    for (std::size_t at = 0; at < settings.size();) {
+        const std::size_t end = std::min(settings.find(", ", at), settings.size());
+        const std::string setting = settings.substr(at, end - at);
+        if (!setting.ends_with("=n"))
+            on.append(on.empty() ? "" : ", ").append(setting);
+        at = end + 2;
+    }
+    return on;
 }
 
 std::string messageOf(const VT::BranchFinding& found) {
@@ -142,6 +157,11 @@ Finding findingOf(const std::string& file, const VT::BranchFinding& found, std::
             finding.configurations.push_back(configuration + 1);
         finding.ofConfigurations = configurations;
     }
+    constexpr std::array<std::string_view, 3> causes{"", "configuration", "undefined-name"}; // as VT::BranchCause
+    finding.cause = causes.at(static_cast<std::size_t>(found.cause));
+    finding.witness = found.witness;
+    if (const std::string on = settingsOn(found.witness); !on.empty())
+        finding.message.append("; built with ").append(on);
     const bool isInEvery = found.configurations.empty() || found.configurations.size() == configurations;
     if (found.replaced && isInEvery && isText(found.edit.text))
         finding.fix = Fix{"Write the shorter condition.", placeOf(file, *found.replaced), found.edit.text};

@@ -99,6 +99,12 @@ void SettingsReader::take(const toml::key& key, const toml::node& node) {
     } else if (name == "assume-files") {
         for (const std::string& path : pathsOf(key, node))
             addAssumption(settings_.assumptions, path);
+    } else if (name == "configurations") {
+        for (const std::string& argument : textsOf(key, node)) {
+            const std::size_t path = argument.find('=') + 1;
+            addConfiguration(settings_.configurations, option,
+                             argument.substr(0, path) + pathIn(folder_, argument.substr(path)));
+        }
     } else if (name == "compile-commands") {
         settings_.compileCommands = pathIn(folder_, textOf(key, node));
     } else if (name == "baseline") {
@@ -125,6 +131,21 @@ ScanSettings SettingsReader::read(const toml::table& whole) {
 
 void append(std::vector<std::string>& to, const std::vector<std::string>& from) {
     to.insert(to.end(), from.begin(), from.end());
+}
+
+bool isComment(std::string_view line) {
+    return line.starts_with('#') && !line.starts_with("#define") && !line.starts_with("#pragma");
+}
+
+void addLines(std::vector<std::string>& conditions, const std::string& text) {
+    for (std::size_t at = 0; at < text.size();) {
+        const std::size_t end = std::min(text.find('\n', at), text.size());
+        const std::string_view line(text.data() + at, end - at);
+        const std::size_t first = line.find_first_not_of(" \t\r");
+        if (first != std::string_view::npos && !isComment(line.substr(first)))
+            conditions.emplace_back(line.substr(first, line.find_last_not_of(" \t\r") - first + 1));
+        at = end + 1;
+    }
 }
 
 } // namespace
@@ -154,6 +175,8 @@ ScanSettings joined(ScanSettings project, const ScanSettings& commandLine, bool 
     append(project.undefines, commandLine.undefines);
     append(project.macroFiles, commandLine.macroFiles);
     append(project.assumptions, commandLine.assumptions);
+    project.configurations.insert(project.configurations.end(), commandLine.configurations.begin(),
+                                  commandLine.configurations.end());
     project.strictIncludes = project.strictIncludes || commandLine.strictIncludes;
     project.why = project.why || commandLine.why;
     project.mostBytes = commandLine.mostBytes;
@@ -166,15 +189,24 @@ void addAssumption(std::vector<std::string>& conditions, const std::string& argu
         conditions.push_back(argument);
         return;
     }
-    const std::string text = readFile(argument, mostBytes);
-    for (std::size_t at = 0; at < text.size();) {
-        const std::size_t end = std::min(text.find('\n', at), text.size());
-        const std::string_view line(text.data() + at, end - at);
-        const std::size_t first = line.find_first_not_of(" \t\r");
-        if (first != std::string_view::npos && line[first] != '#')
-            conditions.emplace_back(line.substr(first, line.find_last_not_of(" \t\r") - first + 1));
-        at = end + 1;
+    addLines(conditions, readFile(argument, mostBytes));
+}
+
+void addConfiguration(std::vector<AssumedConfiguration>& configurations, const std::string& option,
+                      const std::string& argument) {
+    const std::size_t equals = argument.find('=');
+    if (equals == std::string::npos || equals == 0)
+        throw UsageError(option, quotedArgument(argument) + " has no name; write NAME=FILE");
+    AssumedConfiguration added{argument.substr(0, equals), {}};
+    if (std::ranges::find(configurations, added.name, &AssumedConfiguration::name) != configurations.end())
+        throw UsageError(option, quotedArgument(added.name) + " is given twice");
+    const std::string path = argument.substr(equals + 1);
+    try {
+        addLines(added.assumptions, readFile(path, mostBytes));
+    } catch (const FileError& error) {
+        throw UsageError(option, path + " " + error.what());
     }
+    configurations.push_back(std::move(added));
 }
 
 std::vector<std::string> kindsOf(const std::string& option, const std::string& list) {

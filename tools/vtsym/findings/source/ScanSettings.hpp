@@ -14,6 +14,12 @@ namespace vtsym {
 /// The file of a project's settings, in the folder where the program starts.
 inline constexpr const char* settingsName = ".vtsym.toml";
 
+/// A set of assumptions of which one holds: what one architecture promises.
+struct AssumedConfiguration {
+    std::string name;
+    std::vector<std::string> assumptions; ///< lines
+};
+
 struct ScanSettings {
     std::vector<std::string> paths;    ///< files and folders
     std::vector<std::string> excluded; ///< patterns of paths, as a shell has them
@@ -24,7 +30,8 @@ struct ScanSettings {
     std::vector<std::string> defines;   ///< texts after -D
     std::vector<std::string> undefines; ///< names
     std::vector<std::string> macroFiles;
-    std::vector<std::string> assumptions; ///< conditions
+    std::vector<std::string> assumptions;             ///< lines: conditions, meanings of calls, settled macros
+    std::vector<AssumedConfiguration> configurations; ///< alternatives
     std::string compileCommands;
     std::string baseline;
     std::size_t mostBytes = vtsym::mostBytes;
@@ -38,9 +45,14 @@ ScanSettings readSettings(const std::string& path);
 /// project, everything else is added.
 ScanSettings joined(ScanSettings project, const ScanSettings& commandLine, bool hasSeverity);
 
-/// Adds an assumption: a condition, or the conditions of a file, one a line, without those that begin with # and empty
-/// ones.  A file is an argument that ends in `.assume`, or the path of a regular file.  Throws FileError.
+/// Adds an assumption: a condition, or the lines of a file that VT::SourceScanner::assume() takes, without comments and
+/// empty ones.  A comment begins with # and is neither #define nor #pragma.  A file is an argument that ends in
+/// `.assume`, or the path of a regular file.  Throws FileError.
 void addAssumption(std::vector<std::string>& conditions, const std::string& argument);
+
+/// Adds an alternative: "NAME=FILE".  Throws FileError, or UsageError about the option.
+void addConfiguration(std::vector<AssumedConfiguration>& configurations, const std::string& option,
+                      const std::string& argument);
 
 /// Returns the kinds of a list such as "dead,always-true", or of "all".  Throws UsageError about the option for an
 /// unknown one.

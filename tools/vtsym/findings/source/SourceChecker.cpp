@@ -40,6 +40,12 @@ SourceChecker::SourceChecker(const ScanSettings& settings, const CompileCommands
     for (const std::string& condition : settings.assumptions)
         if (const auto wrong = scanner_.assume(condition))
             throw UsageError("--assume", quotedArgument(condition) + " " + *wrong);
+    for (const AssumedConfiguration& configuration : settings.configurations) {
+        scanner_.beginAlternative();
+        for (const std::string& line : configuration.assumptions)
+            if (const auto wrong = scanner_.assume(line))
+                throw UsageError("--configuration", quotedArgument(line) + " of " + configuration.name + " " + *wrong);
+    }
     if (!scanner_.assumptionsCanHold())
         throw UsageError("--assume", "the conditions contradict each other; leave out some of them");
     for (const std::string& path : settings.macroFiles) {
@@ -87,7 +93,10 @@ std::vector<FileFinding> SourceChecker::check(const std::string& path, std::stri
         file.configurations = commands_->of(path);
     if (file.configurations.empty() && !build_.empty())
         file.configurations = {&build_};
-    const std::size_t configurations = std::min(file.configurations.size(), VT::limits::scanConfigurations);
+    const std::size_t alternatives = settings_.configurations.size();
+    const std::size_t builds = file.configurations.size();
+    const std::size_t configurations = std::min(
+        alternatives == 0 ? builds : std::max<std::size_t>(builds, 1) * alternatives, VT::limits::scanConfigurations);
 
     const std::vector<VT::Suppression> suppressions = VT::readSuppressions(text);
     std::unordered_multimap<std::uint64_t, std::size_t> byLine; // of directives
@@ -106,6 +115,9 @@ std::vector<FileFinding> SourceChecker::check(const std::string& path, std::stri
     const std::uint64_t undecidedBefore = scanner_.counts().undecided;
     scanner_.scan(file, [&](const VT::BranchFinding& found) {
         Finding finding = findingOf(path, found, configurations);
+        if (alternatives != 0)
+            for (const std::size_t configuration : found.configurations)
+                finding.configurationNames.push_back(settings_.configurations[configuration % alternatives].name);
         bool isSuppressed = false;
         const auto [begin, end] = byLine.equal_range(found.region.line);
         for (auto each = begin; each != end; ++each) {
