@@ -9,9 +9,9 @@
 
 #include "base/core/Limits.hpp"
 #include "base/scan/report/ConditionProposal.hpp"
+#include "base/scan/report/ConfigurationText.hpp"
 #include "base/scan/report/DirectiveTexts.hpp"
 #include "base/scan/report/SourcePlaces.hpp"
-#include "base/scan/report/WitnessText.hpp"
 
 #include <utility>
 
@@ -271,8 +271,9 @@ BranchCause FileScan::causeOf(const Known& known, const std::vector<std::size_t>
 void FileScan::findWitness(const Directive& directive, const DirectiveCondition& condition, const Known& known) {
     const auto wanted = input_.witnesses->find(directive.line);
     if (wanted != input_.witnesses->end() && wanted->second.empty())
-        wanted->second = witnessText(unknowns_, judge_.witness(condition.node, known.conditions),
-                                     [this](std::string_view name) { return input_.assumptions.isLogical(name); });
+        wanted->second =
+            configurationText(unknowns_, judge_.witness(condition.node, known.conditions),
+                              [this](std::string_view name) { return input_.assumptions.isLogical(name); });
 }
 
 /// The operands that force a verdict, picked from the facts that are its reasons.

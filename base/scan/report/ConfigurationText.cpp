@@ -1,12 +1,12 @@
 // Writes values of unknowns as definitions.
-#include "base/scan/report/WitnessText.hpp"
+#include "base/scan/report/ConfigurationText.hpp"
 
 #include <map>
 
 namespace VT {
 
-std::string witnessText(const MacroUnknowns& unknowns, const Witness& witness,
-                        const std::function<bool(std::string_view)>& isLogical) {
+std::string configurationText(const MacroUnknowns& unknowns, const Witness& witness,
+                              const std::function<bool(std::string_view)>& isLogical) {
     using Kind = MacroUnknown::Kind;
     constexpr std::string_view moduleSuffix = "_MODULE";
     std::map<std::string, std::string> values;
