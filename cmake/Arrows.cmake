@@ -3,7 +3,7 @@
 
 set(VTSYM_LAYERS host util core variants integer cover text transform print simplify decide eval parser service choices scan
     embedded)
-set(VTSYM_PROGRAM_LAYERS io answers findings commands program)
+set(VTSYM_PROGRAM_LAYERS io answers findings lsp commands program)
 
 # The first folder of a layer and those inside it that belong to it too.
 set(VTSYM_FOLDERS_host host)
@@ -22,11 +22,12 @@ set(VTSYM_FOLDERS_eval base/eval)
 set(VTSYM_FOLDERS_parser parser)
 set(VTSYM_FOLDERS_service base/service)
 set(VTSYM_FOLDERS_choices base/choices base/choices/boxes)
-set(VTSYM_FOLDERS_scan base/scan base/scan/build base/scan/changes base/scan/report)
+set(VTSYM_FOLDERS_scan base/scan base/scan/build base/scan/changes base/scan/regions base/scan/report)
 set(VTSYM_FOLDERS_embedded host/embedded)
 set(VTSYM_FOLDERS_io tools/vtsym/io)
 set(VTSYM_FOLDERS_answers tools/vtsym/answers)
 set(VTSYM_FOLDERS_findings tools/vtsym/findings tools/vtsym/findings/source)
+set(VTSYM_FOLDERS_lsp tools/vtsym/lsp)
 set(VTSYM_FOLDERS_commands tools/vtsym/commands)
 set(VTSYM_FOLDERS_program tools/vtsym)
 
@@ -50,7 +51,8 @@ set(VTSYM_ARROWS_embedded host)
 set(VTSYM_ARROWS_io host)
 set(VTSYM_ARROWS_answers io service)
 set(VTSYM_ARROWS_findings io choices scan embedded)
-set(VTSYM_ARROWS_commands answers findings)
+set(VTSYM_ARROWS_lsp findings)
+set(VTSYM_ARROWS_commands answers lsp)
 set(VTSYM_ARROWS_program commands)
 
 # The front doors, each one header in base/ itself.
@@ -62,6 +64,7 @@ set(VTSYM_GUARDED_HEADERS toml++/ fmt/ spdlog/ boost/spirit boost/phoenix boost/
 set(VTSYM_HEADERS_embedded fmt/ spdlog/ nlohmann/)
 set(VTSYM_HEADERS_parser boost/spirit boost/phoenix boost/fusion)
 set(VTSYM_HEADERS_findings nlohmann/ toml++/)
+set(VTSYM_HEADERS_lsp nlohmann/)
 set(VTSYM_HEADERS_io CLI/ nlohmann/ histedit editline)
 
 # All layers that `layer` may use, itself included.

@@ -248,9 +248,14 @@ DirectiveConditionReader::Operand DirectiveConditionReader::truthOf(SymbolicExpr
 SymbolicExprId DirectiveConditionReader::truth(const Operand& operand) {
     if (operand.kind == Operand::Kind::Truth)
         return operand.truth;
-    const SymbolicExprId node = operand.kind == Operand::Kind::Constant
-                                    ? use(unknowns_.unique(text(operand.innerFirst, operand.innerLast, false)))
-                                    : symbol(operand);
+    SymbolicExprId node = invalidId;
+    if (operand.kind == Operand::Kind::Constant) {
+        const MacroUnknownId constant = unknowns_.unique(text(operand.innerFirst, operand.innerLast, false));
+        condition_.constants.emplace_back(constant, operand.constant.bits != 0);
+        node = use(constant);
+    } else {
+        node = symbol(operand);
+    }
     condition_.spellings.push_back({node, operand.innerFirst, operand.innerLast});
     return node;
 }

@@ -20,6 +20,7 @@
 
 #include <optional>
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace VT {
@@ -47,6 +48,8 @@ struct DirectiveCondition {
     std::vector<MacroUnknownId> unknowns; ///< each once
     std::vector<PartSpelling> spellings;  ///< of the parts that && and || join, and of the chains of these
     std::vector<BuildFact> known;         ///< about the unknowns
+    /// Unknowns that stand for constants among operands, which are switches set by hand, and whether they hold.
+    std::vector<std::pair<MacroUnknownId, bool>> constants;
 };
 
 /// Returns the text of tokens, with one blank where there was any; if `compact`, only where the tokens would join.

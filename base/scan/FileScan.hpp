@@ -3,6 +3,7 @@
 
 #include "base/scan/BranchContext.hpp"
 #include "base/scan/BranchVerdict.hpp"
+#include "base/scan/MacroChanges.hpp"
 #include "base/scan/SourceScan.hpp"
 #include "base/scan/build/BuildAssumptions.hpp"
 #include "base/scan/report/BranchWhy.hpp"
@@ -41,6 +42,7 @@ public:
           text_(input.text),
           counts_(counts),
           report_(std::move(report)),
+          changes_(states_, input.options.strictIncludes),
           unknowns_(table, states_),
           conditions_(table, states_, unknowns_, input.isCpp, input.build),
           assumptions_(input.assumptions, states_, unknowns_, conditions_),
@@ -72,7 +74,6 @@ private:
         return !chains_.empty() && (chains_.back().silentAround || chains_.back().silent);
     }
 
-    void changeMacros(const Directive& directive);
     void beginBranch(const Directive& directive);
     void leaveBranch();
     void readBranch(const Directive& directive);
@@ -98,15 +99,14 @@ private:
     SourceScanCounts& counts_;
     Report report_;
     MacroStates states_;
+    MacroChanges changes_;
     MacroUnknowns unknowns_;
     DirectiveConditionReader conditions_;
     FileAssumptions assumptions_;
     BranchContext context_;
     std::unordered_map<MacroUnknownId, BuildFact> values_; ///< of unknowns, by the build
     std::vector<Chain> chains_;
-    std::vector<MacroStates::Name> names_; ///< in the definition that is read
-    std::vector<DirectiveReader> kept_;    ///< whose tokens are in use
-    bool expandsToPragma_ = false;         ///< any line of code may change macros by one of the file's
+    std::vector<DirectiveReader> kept_; ///< whose tokens are in use
 };
 
 } // namespace VT

@@ -1,6 +1,7 @@
 // Findings of a scan compared with a real preprocessor under every definition of the macros of a small world.
 #include "base/scan/SourceScan.hpp"
 #include "base/scan/changes/BranchMeanings.hpp"
+#include "base/scan/regions/BuiltCondition.hpp"
 #include "base/scan/report/Suppressions.hpp"
 #include "tests/preprocessor/Judges.hpp"
 
@@ -560,6 +561,41 @@ TEST(BranchesOfBuilds, AreWhatAPreprocessorMakesOfThem) {
 }
 
 INSTANTIATE_TEST_SUITE_P(PlainAndAny, Branches, ::testing::Bool());
+
+/// The condition of a branch, asked at the end of the file, holds where the branch is entered.  Where macros change on
+/// the way, it is asked only whether it is always or never so.
+TEST(BuiltConditions, AreWhatAPreprocessorMakesOfThem) {
+    constexpr int asked = 100'000; // is added to the number of a branch
+    std::mt19937_64 random(23);
+    std::size_t conditions = 0;
+    std::size_t constants = 0;
+    for (int file = 0; file < 60; ++file) {
+        const bool isPlain = file % 2 == 0;
+        RandomSource source(random, isPlain);
+        const ConditionalRegions regions(source.text);
+        std::string text = source.text;
+        std::map<int, std::string> built;
+        for (std::size_t i = 0; i < source.branches.size(); ++i) {
+            const std::uint32_t region = regions.onLine(source.branches[i].line);
+            if (region == ConditionalRegions::none)
+                continue;
+            const std::string condition = builtCondition(source.text, false, regions, region).condition;
+            ASSERT_TRUE(!isPlain || !condition.empty()) << source.text << "branch " << i;
+            const bool isConstant = condition == "0" || condition == "1";
+            if (condition.empty() || (!isPlain && !isConstant))
+                continue;
+            ++(isConstant ? constants : conditions);
+            built[static_cast<int>(i)] = condition;
+            text += "#if " + condition + "\n@" + std::to_string(asked + static_cast<int>(i)) + "\n#endif\n";
+        }
+        for (const std::set<int>& entered : entered(text, source.values))
+            for (const auto& [branch, condition] : built)
+                ASSERT_EQ(entered.contains(branch), entered.contains(asked + branch))
+                    << source.text << "branch " << branch << ": " << condition;
+    }
+    EXPECT_GT(conditions, 100U);
+    EXPECT_GT(constants, 30U);
+}
 
 } // namespace
 } // namespace VT::Testing

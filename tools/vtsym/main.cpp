@@ -56,8 +56,9 @@ void complain(Console& console, const std::string& problem) {
 /// Reads the command line and runs its command.  `onError` becomes the status for a command that throws.
 int readAndRun(Console& console, std::vector<std::string> arguments, ExitStatus& onError) {
     CommandLine commandLine(description, VTSYM_VERSION, programNotes);
-    for (const auto add : {addSimplify, addCompare, addGiven, addCheck, addScan, addConvert, addPreprocess, addTree,
-                           addEval, addDims, addSymbols, addReplace, addRepl, addOperators, addManual, addCompletion})
+    for (const auto add :
+         {addSimplify, addCompare, addGiven, addCheck, addScan, addConvert, addPreprocess, addTree, addEval, addDims,
+          addSymbols, addReplace, addRepl, addLsp, addOperators, addManual, addCompletion})
         add(commandLine);
     addFeatureOption(commandLine);
     if (arguments.empty()) {

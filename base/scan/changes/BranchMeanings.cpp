@@ -14,6 +14,7 @@
 #include "base/scan/DirectiveCondition.hpp"
 #include "base/scan/report/DirectiveTexts.hpp"
 #include "base/scan/report/SourcePlaces.hpp"
+#include "base/scan/report/WitnessText.hpp"
 
 #include <algorithm>
 #include <array>
@@ -168,8 +169,7 @@ private:
         if (b == outside)
             changed.region = {line, 1, line, 1};
         if (same.witness) {
-            for (const UnknownValue& value : *same.witness)
-                changed.witness.append(changed.witness.empty() ? "" : ", ").append(textOf(value));
+            changed.witness = witnessText(unknowns_, decider_, *same.witness);
             changed.isBuiltAfter = decider_.holds(fresh.built, *same.witness).value_or(false);
         }
         changed_.push_back(std::move(changed));
@@ -189,17 +189,6 @@ private:
         Decision decision;
         decision.answer = Answer::Yes;
         return decision;
-    }
-
-    /// "A=1", "A < B".
-    [[nodiscard]] std::string textOf(const UnknownValue& value) const {
-        const MacroUnknown* const unknown = unknowns_.find(value.unknown);
-        if (unknown == nullptr)
-            return decider_.nameOf(value.unknown) + "=" + std::to_string(value.value);
-        if (unknown->kind == MacroUnknown::Kind::Comparison)
-            return unknown->left + (value.value < 0 ? " < " : value.value > 0 ? " > " : " == ") + unknown->right;
-        const bool isDefined = unknown->kind == MacroUnknown::Kind::Defined;
-        return (isDefined ? "defined(" + unknown->left + ")" : unknown->left) + "=" + std::to_string(value.value);
     }
 
     Decision decide(SymbolicExprId a, SymbolicExprId b) {

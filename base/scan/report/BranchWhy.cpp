@@ -43,18 +43,6 @@ bool split(const SymbolicExprTable& table, std::size_t condition, SymbolicExprId
     return true;
 }
 
-/// Whether `!` before a text would negate a part of it alone.
-bool needsBrackets(std::string_view text) {
-    std::size_t depth = 0;
-    for (const char c : text) {
-        depth += c == '(' ? 1U : 0U;
-        depth -= c == ')' && depth > 0 ? 1U : 0U;
-        if (depth == 0 && std::string_view("=<>&|+-*/%^?! ").find(c) != std::string_view::npos)
-            return true;
-    }
-    return false;
-}
-
 std::string textOf(const SymbolicExprTable& table, const MacroUnknowns& unknowns, const SpelledCondition& condition,
                    const Forcing& operand) {
     const auto spelled = partText(table, unknowns, condition.spellings, condition.tokens, operand.node);
@@ -65,9 +53,7 @@ std::string textOf(const SymbolicExprTable& table, const MacroUnknowns& unknowns
         text = unknown->kind == MacroUnknown::Kind::Defined ? "defined(" + unknown->left + ")" : unknown->left;
     else
         text = spelledTokens(condition.tokens);
-    if (!operand.negated)
-        return text;
-    return needsBrackets(text) ? "!(" + text + ")" : "!" + text;
+    return operand.negated ? negatedText(text) : text;
 }
 
 } // namespace

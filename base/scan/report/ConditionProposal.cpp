@@ -7,6 +7,22 @@
 
 namespace VT {
 
+namespace {
+
+/// Whether `!` before a text would negate a part of it alone.
+bool needsBrackets(std::string_view text) {
+    std::size_t depth = 0;
+    for (const char c : text) {
+        depth += c == '(' ? 1U : 0U;
+        depth -= c == ')' && depth > 0 ? 1U : 0U;
+        if (depth == 0 && std::string_view("=<>&|+-*/%^?! ").find(c) != std::string_view::npos)
+            return true;
+    }
+    return false;
+}
+
+} // namespace
+
 std::optional<std::string> partText(const SymbolicExprTable& table, const MacroUnknowns& unknowns,
                                     const std::vector<PartSpelling>& spellings, std::span<const DirectiveToken> tokens,
                                     SymbolicExprId part) {
@@ -29,44 +45,59 @@ std::optional<std::string> partText(const SymbolicExprTable& table, const MacroU
     return text.append(ofTwo ? unknown->right : std::to_string(value));
 }
 
-std::optional<std::string> proposalText(const SymbolicExprTable& table, const MacroUnknowns& unknowns,
-                                        const DirectiveCondition& condition, std::span<const DirectiveToken> tokens,
-                                        SymbolicExprId proposal) {
+std::string negatedText(const std::string& text) {
+    return needsBrackets(text) ? "!(" + text + ")" : "!" + text;
+}
+
+std::optional<std::string> chainText(const SymbolicExprTable& table, SymbolicExprId condition, ChainStyle style,
+                                     const PartText& textOf) {
     struct Piece {
         SymbolicExprId id; ///< invalid for a text
         SymbolicOp around;
         const char* text;
+        bool isNegated = false;
     };
 
     std::string result;
-    std::vector<Piece> pieces{{proposal, SymbolicOp::None, ""}};
+    std::vector<Piece> pieces{{condition, SymbolicOp::None, ""}};
     while (!pieces.empty()) {
-        const Piece piece = pieces.back();
+        Piece piece = pieces.back();
         pieces.pop_back();
         if (piece.id == invalidId) {
             result.append(piece.text);
             continue;
         }
+        for (; style.withoutNots && table.get(piece.id)->op() == SymbolicOp::Not; piece.isNegated = !piece.isNegated)
+            piece.id = table.get(piece.id)->getInput(0);
         const SymbolicExpr& node = *table.get(piece.id);
         if (node.op() != SymbolicOp::And && node.op() != SymbolicOp::Or) {
-            const auto text = partText(table, unknowns, condition.spellings, tokens, piece.id);
+            const auto text = textOf(piece.id, piece.isNegated);
             if (!text)
                 return std::nullopt;
             result.append(*text);
             continue;
         }
-        const bool isAnd = node.op() == SymbolicOp::And;
-        const bool brackets = (isAnd && piece.around == SymbolicOp::Or && condition.bracketed) ||
-                              (!isAnd && piece.around == SymbolicOp::And);
+        const bool isAnd = (node.op() == SymbolicOp::And) != piece.isNegated;
+        const SymbolicOp op = isAnd ? SymbolicOp::And : SymbolicOp::Or;
+        const bool brackets =
+            (isAnd && piece.around == SymbolicOp::Or && style.bracketed) || (!isAnd && piece.around == SymbolicOp::And);
         if (brackets)
             pieces.push_back({invalidId, SymbolicOp::None, ")"});
-        pieces.push_back({node.getInput(1), node.op(), ""});
+        pieces.push_back({node.getInput(1), op, "", piece.isNegated});
         pieces.push_back({invalidId, SymbolicOp::None, isAnd ? " && " : " || "});
-        pieces.push_back({node.getInput(0), node.op(), ""});
+        pieces.push_back({node.getInput(0), op, "", piece.isNegated});
         if (brackets)
             pieces.push_back({invalidId, SymbolicOp::None, "("});
     }
     return result;
+}
+
+std::optional<std::string> proposalText(const SymbolicExprTable& table, const MacroUnknowns& unknowns,
+                                        const DirectiveCondition& condition, std::span<const DirectiveToken> tokens,
+                                        SymbolicExprId proposal) {
+    return chainText(table, proposal, {.bracketed = condition.bracketed}, [&](SymbolicExprId part, bool) {
+        return partText(table, unknowns, condition.spellings, tokens, part);
+    });
 }
 
 } // namespace VT

@@ -18,6 +18,7 @@ void addTree(CommandLine& program);
 void addSymbols(CommandLine& program);
 void addReplace(CommandLine& program);
 void addRepl(CommandLine& program);
+void addLsp(CommandLine& program);
 void addPreprocess(CommandLine& program);
 void addEval(CommandLine& program);
 void addDims(CommandLine& program);

@@ -16,7 +16,6 @@
 #include <algorithm>
 #include <charconv>
 #include <filesystem>
-#include <fnmatch.h>
 #include <limits>
 #include <utility>
 
@@ -54,17 +53,6 @@ struct ScanOptions {
     std::size_t days = std::numeric_limits<std::size_t>::max();
     FindingForm form = FindingForm::Compiler;
 };
-
-/// Whether a pattern leaves a path out, or a folder above it.
-bool isExcluded(const std::string& path, const std::vector<std::string>& patterns) {
-    for (std::size_t end = path.size(); end != std::string::npos && end != 0; end = path.rfind('/', end - 1)) {
-        const std::string part = path.substr(0, end);
-        if (std::ranges::any_of(
-                patterns, [&](const std::string& pattern) { return fnmatch(pattern.c_str(), part.c_str(), 0) == 0; }))
-            return true;
-    }
-    return false;
-}
 
 /// Whether a path is one of those given, or below one; any where none is given.
 bool isBelow(const std::string& path, const std::vector<std::string>& given) {

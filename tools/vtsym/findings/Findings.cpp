@@ -6,6 +6,7 @@
 #include "host/Text.hpp"
 #include "tools/vtsym/io/CommandLine.hpp"
 #include "tools/vtsym/io/Json.hpp"
+#include "tools/vtsym/io/Uris.hpp"
 
 #include <algorithm>
 #include <array>
@@ -122,23 +123,6 @@ void JsonWriter::add(const Finding& finding) {
     }
     appendMember(out, "follows", "[" + follows + "]");
     console().out(out + "}\n");
-}
-
-/// The path of a file as a URI reference: a relative path stays relative.
-std::string uriOf(std::string_view path) {
-    static constexpr char digits[] = "0123456789ABCDEF";
-    static constexpr std::string_view plain = "-._~/!$&'()*+,;=@";
-    std::string uri = path.starts_with('/') ? "file://" : "";
-    for (const char c : path) {
-        const auto byte = static_cast<unsigned char>(c);
-        const bool isPlain = (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9') ||
-                             plain.find(c) != std::string_view::npos;
-        if (isPlain)
-            uri.push_back(c);
-        else
-            uri.append("%").append({digits[byte >> 4U], digits[byte & 15U]});
-    }
-    return uri;
 }
 
 std::string jsonMessage(std::string_view text) {

@@ -89,7 +89,8 @@ bool ModelCheck::assume() {
 
 /// The options, with the values that the model declares.
 VT::ChoiceSetOptions ModelCheck::checkerOptions() {
-    VT::ChoiceSetOptions result{.bits32 = options_.bits32, .reasons = options_.why, .merges = options_.merges};
+    VT::ChoiceSetOptions result{
+        .bits32 = options_.bits32, .reasons = options_.why, .merges = options_.merges, .steps = options_.steps};
     const VT::SymbolicExprTable& table = handle_->table();
     for (const VT::Embedded::DeclaredSymbol& symbol : model_.symbols()) {
         VT::SymbolicExprId id = VT::invalidId;

@@ -21,9 +21,10 @@ inline constexpr std::string_view mergeable = "mergeable"; ///< the kind of choi
 
 struct ModelCheckOptions {
     bool bits32 = false;
-    bool why = false;                          ///< findings come with reasons, sets with counted assignments
-    bool merges = false;                       ///< choices that can be merged are findings
-    std::vector<std::string> assumptions = {}; ///< in the language of the model
+    bool why = false;                              ///< findings come with reasons, sets with counted assignments
+    bool merges = false;                           ///< choices that can be merged are findings
+    std::vector<std::string> assumptions = {};     ///< in the language of the model
+    std::uint64_t steps = VT::limits::choiceSteps; ///< that the whole check may cost
 };
 
 /// Checks one model, once.

@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <array>
 #include <filesystem>
+#include <fnmatch.h>
 #include <system_error>
 
 namespace vtsym {
@@ -58,6 +59,16 @@ bool isCppPath(std::string_view path) {
 bool isSourcePath(std::string_view path) {
     const std::string extension = fs::path(path).extension().string();
     return isCppPath(path) || std::ranges::find(otherExtensions, extension) != otherExtensions.end();
+}
+
+bool isExcluded(const std::string& path, const std::vector<std::string>& patterns) {
+    for (std::size_t end = path.size(); end != std::string::npos && end != 0; end = path.rfind('/', end - 1)) {
+        const std::string part = path.substr(0, end);
+        if (std::ranges::any_of(
+                patterns, [&](const std::string& pattern) { return fnmatch(pattern.c_str(), part.c_str(), 0) == 0; }))
+            return true;
+    }
+    return false;
 }
 
 std::vector<std::string> sourceFiles(const std::vector<std::string>& paths, const FileProblem& problem) {

@@ -15,6 +15,9 @@ bool isCppPath(std::string_view path);
 /// Whether a path has an extension of C or C++.
 bool isSourcePath(std::string_view path);
 
+/// Whether a pattern, as a shell has them, leaves a path out, or a folder above it.
+bool isExcluded(const std::string& path, const std::vector<std::string>& patterns);
+
 /// Receives a path that could not be read, and the reason.
 using FileProblem = std::function<void(const std::string& path, const std::string& sentence)>;
 
