@@ -22,15 +22,14 @@
 
 namespace VT {
 
-namespace {
-
-/// Whether an expression is a name of an integer: not a truth constant, not a variant keyword.
 bool isIntegerName(const SymbolicExprTable& table, SymbolicExprId id) {
     const SymbolicExpr* const node = table.get(id);
     if (node == nullptr || node->op() != SymbolicOp::String || id == table.getIdTRUE() || id == table.getIdFALSE())
         return false;
     return !VariantKeywords::isVariantKeyword(static_cast<const SymbolicString*>(node)->getName(), false);
 }
+
+namespace {
 
 /// The range of a comparison of a name with an integer.
 std::optional<NameRange> rangeOf(const SymbolicExprTable& table, SymbolicExprId id) {

@@ -9,6 +9,9 @@
 
 namespace VT {
 
+/// Whether an expression is a name of an integer: not a truth constant, not a variant keyword.
+bool isIntegerName(const SymbolicExprTable& table, SymbolicExprId id);
+
 /// The integers from `low` to `high` that a name is confined to.
 struct NameRange {
     SymbolicExprId name;

@@ -5,13 +5,13 @@
 // Cost: linear in the operands to read; all questions together limits::boxSteps, beyond which each takes a few.
 #include "base/choices/boxes/ChoiceBoxes.hpp"
 
+#include "base/choices/ChoiceRanges.hpp"
 #include "base/core/Chains.hpp"
 #include "base/core/Limits.hpp"
 #include "base/core/Nodes.hpp"
 #include "base/core/Walk.hpp"
 #include "base/decide/reasons/MinimalSubset.hpp"
 #include "base/transform/Symbols.hpp"
-#include "base/variants/VariantKeywords.hpp"
 
 #include <algorithm>
 #include <limits>
@@ -26,13 +26,6 @@ std::optional<int> integerOf(const SymbolicExprTable& table, SymbolicExprId id) 
     if (node == nullptr || node->op() != SymbolicOp::IntValue)
         return std::nullopt;
     return static_cast<const SymbolicIntValue*>(node)->getValue();
-}
-
-/// Whether a node is a name of an integer.
-bool isName(const SymbolicExprTable& table, SymbolicExprId id) {
-    const SymbolicExpr* const node = table.has(id) ? table.get(id) : nullptr;
-    return node != nullptr && node->op() == SymbolicOp::String && id != table.getIdTRUE() && id != table.getIdFALSE() &&
-           !VariantKeywords::isVariantKeyword(static_cast<const SymbolicString*>(node)->getName(), false);
 }
 
 /// The operands of a chain; nothing where one is missing or there are more than are looked at.
@@ -100,10 +93,10 @@ void ChoiceBoxes::findCuts() {
 std::optional<Constraint> ChoiceBoxes::constraintOf(SymbolicExprId operand) {
     const auto ofComparison = [&](const SymbolicExpr& node) -> std::optional<Constraint> {
         const OperatorInfo& row = operatorInfo(node.op());
-        const bool isMirrored = isName(table_, node.getInput(1));
+        const bool isMirrored = isIntegerName(table_, node.getInput(1));
         const SymbolicExprId name = node.getInput(isMirrored ? 1 : 0);
         const std::optional<int> value = integerOf(table_, node.getInput(isMirrored ? 0 : 1));
-        if (!value || !isName(table_, name))
+        if (!value || !isIntegerName(table_, name))
             return std::nullopt;
         return Constraint{atomOf(name), IntegerSet::satisfying(isMirrored ? row.mirrored : row.op, *value)};
     };
@@ -114,7 +107,7 @@ std::optional<Constraint> ChoiceBoxes::constraintOf(SymbolicExprId operand) {
     const auto ofNode = [&](SymbolicExprId id, const SymbolicExpr& node) -> std::optional<Constraint> {
         if (comparisonOps.contains(node.op()))
             return ofComparison(node);
-        if (isName(table_, id))
+        if (isIntegerName(table_, id))
             return Constraint{atomOf(id), IntegerSet::allBut(0)};
         const bool isOr = node.op() == SymbolicOp::Or;
         if (node.op() != SymbolicOp::Not && node.op() != SymbolicOp::And && !isOr)
