@@ -29,7 +29,24 @@ bool isIntegerName(const SymbolicExprTable& table, SymbolicExprId id) {
     return !VariantKeywords::isVariantKeyword(static_cast<const SymbolicString*>(node)->getName(), false);
 }
 
+std::optional<std::vector<SymbolicExprId>> operandsOf(const SymbolicExprTable& table, SymbolicExprId chain,
+                                                      SymbolicOp op, std::size_t most) {
+    std::vector<SymbolicExprId> operands;
+    const bool isComplete = walkChain(
+        table, chain, most, [op](SymbolicExprId, const SymbolicExpr& node) { return node.op() == op; },
+        [&](SymbolicExprId id, const SymbolicExpr* node) {
+            operands.push_back(id);
+            return node != nullptr;
+        });
+    return isComplete ? std::optional(std::move(operands)) : std::nullopt;
+}
+
 namespace {
+
+/// The operands of a chain; nothing where a range cannot be read from them.
+std::vector<SymbolicExprId> rangeOperandsOf(const SymbolicExprTable& table, SymbolicExprId chain, SymbolicOp op) {
+    return operandsOf(table, chain, op, limits::rangeOperands).value_or(std::vector<SymbolicExprId>());
+}
 
 /// The range of a comparison of a name with an integer.
 std::optional<NameRange> rangeOf(const SymbolicExprTable& table, SymbolicExprId id) {
@@ -56,22 +73,10 @@ std::optional<NameRange> rangeOf(const SymbolicExprTable& table, SymbolicExprId 
     return NameRange{name, set.intervals().front().low, set.intervals().front().high};
 }
 
-/// Returns the operands of a chain of one operator; nothing where there are more than are looked at.
-std::vector<SymbolicExprId> operandsOf(const SymbolicExprTable& table, SymbolicExprId chain, SymbolicOp op) {
-    std::vector<SymbolicExprId> operands;
-    const bool complete = walkChain(
-        table, chain, limits::rangeOperands, [op](SymbolicExprId, const SymbolicExpr& node) { return node.op() == op; },
-        [&](SymbolicExprId id, const SymbolicExpr* node) {
-            operands.push_back(id);
-            return node != nullptr;
-        });
-    return complete ? operands : std::vector<SymbolicExprId>();
-}
-
 /// The ranges of an And.
 NameRanges rangesOfProduct(const SymbolicExprTable& table, SymbolicExprId product) {
     NameRanges ranges;
-    for (const SymbolicExprId operand : operandsOf(table, product, SymbolicOp::And)) {
+    for (const SymbolicExprId operand : rangeOperandsOf(table, product, SymbolicOp::And)) {
         const std::optional<NameRange> range = rangeOf(table, operand);
         if (!range)
             continue;
@@ -92,7 +97,7 @@ NameRanges rangesOf(const SymbolicExprTable& table, SymbolicExprId condition) {
     if (!table.has(condition))
         return {};
     std::optional<NameRanges> ranges;
-    for (const SymbolicExprId product : operandsOf(table, condition, SymbolicOp::Or)) {
+    for (const SymbolicExprId product : rangeOperandsOf(table, condition, SymbolicOp::Or)) {
         NameRanges next = rangesOfProduct(table, product);
         ranges = ranges ? joined(*ranges, next) : std::move(next);
     }

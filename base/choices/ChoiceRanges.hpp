@@ -4,13 +4,19 @@
 
 #include "base/core/Table.hpp"
 
+#include <cstddef>
 #include <cstdint>
+#include <optional>
 #include <vector>
 
 namespace VT {
 
 /// Whether an expression is a name of an integer: not a truth constant, not a variant keyword.
 bool isIntegerName(const SymbolicExprTable& table, SymbolicExprId id);
+
+/// The operands of a chain of one operator; nothing where one is missing or there are more than `most`.
+std::optional<std::vector<SymbolicExprId>> operandsOf(const SymbolicExprTable& table, SymbolicExprId chain,
+                                                      SymbolicOp op, std::size_t most);
 
 /// The integers from `low` to `high` that a name is confined to.
 struct NameRange {

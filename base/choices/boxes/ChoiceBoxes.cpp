@@ -6,7 +6,6 @@
 #include "base/choices/boxes/ChoiceBoxes.hpp"
 
 #include "base/choices/ChoiceRanges.hpp"
-#include "base/core/Chains.hpp"
 #include "base/core/Limits.hpp"
 #include "base/core/Nodes.hpp"
 #include "base/core/Walk.hpp"
@@ -26,19 +25,6 @@ std::optional<int> integerOf(const SymbolicExprTable& table, SymbolicExprId id) 
     if (node == nullptr || node->op() != SymbolicOp::IntValue)
         return std::nullopt;
     return static_cast<const SymbolicIntValue*>(node)->getValue();
-}
-
-/// The operands of a chain; nothing where one is missing or there are more than are looked at.
-std::optional<std::vector<SymbolicExprId>> operandsOf(const SymbolicExprTable& table, SymbolicExprId chain,
-                                                      SymbolicOp op, std::size_t most) {
-    std::vector<SymbolicExprId> operands;
-    const bool isComplete = walkChain(
-        table, chain, most, [op](SymbolicExprId, const SymbolicExpr& node) { return node.op() == op; },
-        [&](SymbolicExprId id, const SymbolicExpr* node) {
-            operands.push_back(id);
-            return node != nullptr;
-        });
-    return isComplete ? std::optional(std::move(operands)) : std::nullopt;
 }
 
 } // namespace

@@ -39,7 +39,7 @@ struct Bounds {
 };
 
 /// Bits that hold a value and its sign.
-unsigned bitsOf(std::int64_t value) {
+unsigned widthOf(std::int64_t value) {
     return static_cast<unsigned>(std::bit_width(static_cast<std::uint64_t>(value < 0 ? ~value : value))) + 1;
 }
 
@@ -102,7 +102,7 @@ private:
         return term;
     }
 
-    Term integer(std::int64_t value) override { return sized(literal(value), bitsOf(value)); }
+    Term integer(std::int64_t value) override { return sized(literal(value), widthOf(value)); }
 
     Term real(double) override { return {}; }
 

@@ -6,7 +6,7 @@ namespace VT {
 namespace {
 
 /// "A=1", "A < B".
-std::string textOf(const MacroUnknowns& unknowns, const Decider& decider, const UnknownValue& value) {
+std::string valueText(const MacroUnknowns& unknowns, const Decider& decider, const UnknownValue& value) {
     const MacroUnknown* const unknown = unknowns.find(value.unknown);
     if (unknown == nullptr)
         return decider.nameOf(value.unknown) + "=" + std::to_string(value.value);
@@ -21,7 +21,7 @@ std::string textOf(const MacroUnknowns& unknowns, const Decider& decider, const 
 std::string witnessText(const MacroUnknowns& unknowns, const Decider& decider, const Witness& witness) {
     std::string text;
     for (const UnknownValue& value : witness)
-        text.append(text.empty() ? "" : ", ").append(textOf(unknowns, decider, value));
+        text.append(text.empty() ? "" : ", ").append(valueText(unknowns, decider, value));
     return text;
 }
 

@@ -150,8 +150,8 @@ private:
     bool begun_ = false;
 };
 
-void answer(const DimsOptions& options, const Style& style, const std::string& text, std::string& out,
-            std::vector<std::string>& warnings) {
+void answerDimension(const DimsOptions& options, const Style& style, const std::string& text, std::string& out,
+                     std::vector<std::string>& warnings) {
     VT::SymbolicExprTable table;
     define(table, options);
     const VT::SymbolicExprId uncast = readUncast(table, text);
@@ -256,7 +256,7 @@ void addDims(CommandLine& program) {
             return prove(*options, console);
         std::vector<std::string> warnings;
         const auto answerText = [&](const std::string& text, std::string& out) {
-            answer(*options, console.outStyle(), text, out, warnings);
+            answerDimension(*options, console.outStyle(), text, out, warnings);
         };
         return answerTexts(*options, console, {answerText, !options->json, &warnings});
     };

@@ -33,7 +33,7 @@ VT::SymbolicExprId read(VT::SymbolicExprTable& table, const TreeOptions& options
     return VT::SymbolicExprFromQParseTreeBlockVariants(table, checker)(text);
 }
 
-void answer(const TreeOptions& options, const Style& style, const std::string& text, std::string& out) {
+void answerTree(const TreeOptions& options, const Style& style, const std::string& text, std::string& out) {
     VT::SymbolicExprTable table;
     table.addBoolSymbols();
     const VT::SymbolicExprId root = read(table, options, text);
@@ -57,7 +57,7 @@ void addTree(CommandLine& program) {
     command.exclude("--dot", "--json");
     command.run = [options](Console& console) {
         const auto answerText = [&](const std::string& text, std::string& out) {
-            answer(*options, console.outStyle(), text, out);
+            answerTree(*options, console.outStyle(), text, out);
         };
         return answerTexts(*options, console, {answerText, !options->json});
     };
