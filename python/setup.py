@@ -39,7 +39,7 @@ def version() -> str:
 (BUILD / "wheel").mkdir(parents=True, exist_ok=True)
 setup(
     version=version(),
-    packages=["vtsym"],
+    packages=["vtsym", "vtsym.kconfig"],
     package_data={"vtsym": ["py.typed", "*.pyi"]},
     ext_modules=[Extension("vtsym._vtsym", [])],
     cmdclass={"build_ext": CMakeBuild},
