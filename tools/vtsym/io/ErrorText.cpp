@@ -6,6 +6,7 @@
 
 #include "host/Diagnostics.hpp"
 #include "host/Text.hpp"
+#include "tools/vtsym/io/ErrorHints.hpp"
 #include "tools/vtsym/io/Json.hpp"
 
 #include <algorithm>
@@ -68,8 +69,16 @@ std::string withCaret(std::string_view text, std::size_t offset, const Style& st
 
 std::string errorText(std::string_view text, const TextError& error, const Style& style) {
     std::string lines = error.message + "\n";
-    if (error.offset)
-        lines += withCaret(text.substr(error.begin, error.end - error.begin), *error.offset - error.begin, style);
+    if (!error.offset)
+        return lines;
+    const std::string_view part = text.substr(error.begin, error.end - error.begin);
+    lines += withCaret(part, *error.offset - error.begin, style);
+    if (error.id != "Vantor:Variants:ExpressionParseError")
+        return lines;
+    if (const std::string_view hint = errorHint(part, *error.offset - error.begin); !hint.empty()) {
+        lines.pop_back();
+        lines.append(" ").append(hint).append("\n");
+    }
     return lines;
 }
 
