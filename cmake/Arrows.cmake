@@ -22,8 +22,8 @@ set(VTSYM_FOLDERS_eval base/eval)
 set(VTSYM_FOLDERS_parser parser)
 set(VTSYM_FOLDERS_service base/service)
 set(VTSYM_FOLDERS_choices base/choices base/choices/boxes)
-set(VTSYM_FOLDERS_scan base/scan base/scan/build base/scan/changes base/scan/regions base/scan/report
-    base/scan/text)
+set(VTSYM_FOLDERS_scan base/scan base/scan/build base/scan/changes base/scan/facts base/scan/regions
+    base/scan/report base/scan/text)
 set(VTSYM_FOLDERS_embedded host/embedded)
 set(VTSYM_FOLDERS_io tools/vtsym/io)
 set(VTSYM_FOLDERS_answers tools/vtsym/answers)
