@@ -22,11 +22,12 @@ set(VTSYM_FOLDERS_eval base/eval)
 set(VTSYM_FOLDERS_parser parser)
 set(VTSYM_FOLDERS_service base/service)
 set(VTSYM_FOLDERS_choices base/choices base/choices/boxes)
-set(VTSYM_FOLDERS_scan base/scan base/scan/build base/scan/changes base/scan/regions base/scan/report)
+set(VTSYM_FOLDERS_scan base/scan base/scan/build base/scan/changes base/scan/facts base/scan/regions
+    base/scan/report base/scan/text)
 set(VTSYM_FOLDERS_embedded host/embedded)
-set(VTSYM_FOLDERS_io tools/vtsym/io)
+set(VTSYM_FOLDERS_io tools/vtsym/io tools/vtsym/io/manual)
 set(VTSYM_FOLDERS_answers tools/vtsym/answers)
-set(VTSYM_FOLDERS_findings tools/vtsym/findings tools/vtsym/findings/source)
+set(VTSYM_FOLDERS_findings tools/vtsym/findings tools/vtsym/findings/cache tools/vtsym/findings/source)
 set(VTSYM_FOLDERS_lsp tools/vtsym/lsp)
 set(VTSYM_FOLDERS_commands tools/vtsym/commands)
 set(VTSYM_FOLDERS_program tools/vtsym)
@@ -60,12 +61,13 @@ set(VTSYM_DOOR_core base/VTSymbolicExpr.hpp)
 set(VTSYM_DOOR_service base/VCService.hpp)
 
 # Libraries that only some layers may include, by the beginning of the header's name.
-set(VTSYM_GUARDED_HEADERS toml++/ fmt/ spdlog/ boost/spirit boost/phoenix boost/fusion CLI/ nlohmann/ histedit editline gtest/ rapidcheck)
+set(VTSYM_GUARDED_HEADERS toml++/ fmt/ spdlog/ boost/spirit boost/phoenix boost/fusion CLI/ nlohmann/ histedit editline gtest/ rapidcheck
+    oneapi/ xxhash.h)
 set(VTSYM_HEADERS_embedded fmt/ spdlog/ nlohmann/)
 set(VTSYM_HEADERS_parser boost/spirit boost/phoenix boost/fusion)
-set(VTSYM_HEADERS_findings nlohmann/ toml++/)
+set(VTSYM_HEADERS_findings nlohmann/ toml++/ xxhash.h)
 set(VTSYM_HEADERS_lsp nlohmann/)
-set(VTSYM_HEADERS_io CLI/ nlohmann/ histedit editline)
+set(VTSYM_HEADERS_io CLI/ nlohmann/ histedit editline oneapi/)
 
 # All layers that `layer` may use, itself included.
 function(vtsym_reach layer result)

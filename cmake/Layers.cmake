@@ -65,7 +65,7 @@ target_include_directories(vtsym INTERFACE $<BUILD_INTERFACE:${PROJECT_SOURCE_DI
   $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}/vtsym>)
 set_target_properties(vtsym PROPERTIES VERSION ${PROJECT_VERSION} SOVERSION ${VTSYM_ABI}
   LINKER_LANGUAGE CXX LIBRARY_OUTPUT_DIRECTORY ${PROJECT_BINARY_DIR}/lib)
-if(VTSYM_EMBEDDED_HOST AND NOT VTSYM_SANITIZE)
+if(VTSYM_EMBEDDED_HOST AND NOT VTSYM_SANITIZE AND NOT VTSYM_SANITIZE_THREAD)
   target_link_options(vtsym PRIVATE -Wl,--no-undefined)
 endif()
 
@@ -94,11 +94,13 @@ if(VTSYM_PROGRAM AND VTSYM_EMBEDDED_HOST)
   endforeach()
   find_package(CLI11 REQUIRED)
   find_package(tomlplusplus REQUIRED)
+  find_package(TBB REQUIRED)
+  find_path(VTSYM_XXHASH_INCLUDE xxhash.h REQUIRED)
   find_library(VTSYM_EDIT_LIBRARY edit REQUIRED)
   add_library(vtsym_tool STATIC ${tool_sources})
   add_executable(vtsym_program ${main_sources})
   target_link_libraries(vtsym_tool PUBLIC vtsym vtsym_options PRIVATE CLI11::CLI11 nlohmann_json::nlohmann_json
-    tomlplusplus::tomlplusplus ${VTSYM_EDIT_LIBRARY})
+    tomlplusplus::tomlplusplus TBB::tbb ${VTSYM_EDIT_LIBRARY})
   target_compile_definitions(vtsym_tool PUBLIC VTSYM_VERSION="${PROJECT_VERSION}")
   target_link_libraries(vtsym_program PRIVATE vtsym_tool)
   foreach(target vtsym_tool vtsym_program)

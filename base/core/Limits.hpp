@@ -93,6 +93,10 @@ inline constexpr std::uint64_t settableSteps = std::uint64_t{1} << 24U;
 inline constexpr std::uint64_t commandSteps = std::uint64_t{1} << 26U;
 inline constexpr std::uint64_t commandStepsPerLine = std::uint64_t{1} << 13U;
 
+/// Steps that lines which are answered before their turn, beside others, may take together beyond those of each line:
+/// about a second.  Beyond them they are answered when it is their turn.
+inline constexpr std::uint64_t commandStepsAhead = std::uint64_t{1} << 23U;
+
 /// Slots of an index of diagrams that stay allocated from question to question.  A larger index is freed.
 inline constexpr std::size_t keptSlots = 4096;
 
@@ -300,6 +304,10 @@ inline constexpr std::size_t countedAssignments = std::size_t{1} << 14U;
 /// Nodes that are evaluated to count the assignments of all choices of a set: about half a second.  What is left is not
 /// counted.
 inline constexpr std::uint64_t countedNodes = std::uint64_t{1} << 22U;
+
+/// Bytes of a cache of findings: those of some hundred thousand files with findings, or of millions without.  A larger
+/// file is not read; what the last scan did not find is left out first.
+inline constexpr std::size_t scanCacheBytes = std::size_t{1} << 28U;
 
 /// Steps that decisions about the conditions of one source file may cost: a number for each file, and one for each
 /// condition as it is read.  Real conditions take some hundred, those of long chains over one macro some thousand.

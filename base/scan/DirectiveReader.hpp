@@ -1,6 +1,7 @@
 // The preprocessor directives of a C or C++ file.
 #pragma once
 
+#include "base/scan/text/SourceText.hpp"
 #include "host/Export.hpp"
 
 #include <cstddef>
@@ -83,15 +84,12 @@ public:
     bool next(Directive& directive);
 
 private:
-    [[nodiscard]] char at(std::size_t place) const { return place < text_.size() ? text_[place] : '\0'; }
+    [[nodiscard]] std::string_view text() const noexcept { return source_.text(); }
 
-    [[nodiscard]] std::size_t afterSplices(std::size_t place) const;
-    [[nodiscard]] bool beginsComment(std::size_t place) const;
-    [[nodiscard]] std::size_t afterComment(std::size_t place) const;
+    [[nodiscard]] char at(std::size_t place) const { return source_.at(place); }
+
     std::size_t passComment(std::size_t place);
-    [[nodiscard]] std::size_t afterQuoted(std::size_t place) const;
     [[nodiscard]] std::size_t afterRawString(std::size_t quote);
-    [[nodiscard]] std::size_t afterHeaderName(std::size_t place) const;
     bool skipBlanks();
     std::size_t skipLine();
     bool skipImport();
@@ -102,7 +100,7 @@ private:
     bool readDirective(Directive& directive);
     std::uint64_t lineOf(std::size_t place);
 
-    std::string_view text_;
+    SourceText source_;
     std::size_t place_ = 0;
     std::size_t counted_ = 0; ///< up to where lines were counted
     std::uint64_t line_ = 1;

@@ -25,7 +25,7 @@ std::string commandOf(const std::string& program, const Strings& arguments) {
 }
 
 std::string inEnvironment(Strings settings, const std::string& command) {
-    for (const std::string name : {"PATH", "ASAN_OPTIONS", "UBSAN_OPTIONS"})
+    for (const std::string name : {"PATH", "ASAN_OPTIONS", "UBSAN_OPTIONS", "TSAN_OPTIONS"})
         if (const char* const value = std::getenv(name.c_str()))
             settings.push_back(name + "=" + value);
     return commandOf("env -i", settings) + " " + command;

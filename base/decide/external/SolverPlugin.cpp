@@ -16,13 +16,21 @@ namespace {
 
 constexpr std::string_view pluginFile = "libvtsym-z3.so";
 
-/// The folder of this library, or of the program that it is linked into, with a slash at the end.
-std::string ownFolder() {
+/// The file that an address of code or data comes from; empty where that is not known.
+std::string fileOf(const void* address) {
     Dl_info here{};
-    if (dladdr(reinterpret_cast<const void*>(&SolverPlugin::installed), &here) == 0 || here.dli_fname == nullptr)
-        return "";
-    const std::string_view path = here.dli_fname;
-    return std::string(path.substr(0, path.rfind('/') + 1));
+    return dladdr(address, &here) == 0 || here.dli_fname == nullptr ? "" : here.dli_fname;
+}
+
+/// This library, or the program that it is linked into.
+std::string ownFile() {
+    return fileOf(reinterpret_cast<const void*>(&SolverPlugin::installed));
+}
+
+/// Where the plugin is looked for first.
+std::string fileBeside() {
+    const std::string own = ownFile();
+    return own.empty() ? "" : own.substr(0, own.rfind('/') + 1) + "vtsym/" + std::string(pluginFile);
 }
 
 } // namespace
@@ -44,13 +52,23 @@ const std::string& SolverPlugin::fault() {
     return fault_;
 }
 
+std::vector<std::string> SolverPlugin::files() {
+    std::vector<std::string> all{ownFile()};
+    if (!path_.empty())
+        all.push_back(path_);
+    else if (const std::string beside = fileBeside(); access(beside.c_str(), F_OK) == 0)
+        all.push_back(beside);
+    else if (functions() != nullptr)
+        all.push_back(fileOf(functions()));
+    return all;
+}
+
 void SolverPlugin::load() {
     if (!path_.empty()) {
         loadFrom(path_);
         return;
     }
-    const std::string beside = ownFolder() + "vtsym/" + std::string(pluginFile);
-    if (!loadFrom(beside))
+    if (!loadFrom(fileBeside()))
         loadFrom(std::string(pluginFile));
 }
 

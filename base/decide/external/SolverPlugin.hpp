@@ -7,6 +7,7 @@
 
 #include <mutex>
 #include <string>
+#include <vector>
 
 struct vtsym_solver_functions;
 
@@ -31,6 +32,10 @@ public:
 
     /// Why a plugin that is there cannot be used; empty where it can, and where there is none.
     const std::string& fault();
+
+    /// The files that answers depend on: this library, or the program that holds it, and the plugin.  Loads a plugin
+    /// that only the system can find.
+    std::vector<std::string> files();
 
 private:
     SolverPlugin() = default;

@@ -28,7 +28,16 @@ std::string visible(std::string text) {
 
 } // namespace
 
+bool Conditions::begin(std::uint64_t steps) {
+    *budget_ = VT::Budget(steps);
+    if (isFresh_)
+        return false;
+    renew();
+    return true;
+}
+
 bool Conditions::makeRoomFor(const std::string& text) {
+    isFresh_ = false;
     budget_->add(VT::limits::commandStepsPerLine);
     textBytes_ += text.size() + cacheEntryBytes;
     if (service().table().size() < fullTable && textBytes_ < fullTexts)
@@ -62,14 +71,15 @@ void Conditions::assume(const std::string& text) const {
 }
 
 void Conditions::renew() {
-    handle_.reset();
-    handle_.emplace();
+    service_.reset();
+    service_ = std::make_unique<VT::VCService>();
     service().setDecisions32Bit(bits32_);
     service().shareBudget(budget_.get());
     service().clearAssumptions();
     for (const std::string& text : assumptions_)
         assume(text);
     textBytes_ = 0;
+    isFresh_ = true;
 }
 
 VT::SymbolicExprId Conditions::parse(const TextOptions& options, const std::string& text) const {

@@ -14,7 +14,7 @@
 namespace vtsym {
 
 /// A condition service that is renewed when its caches have grown large, so that endless input takes bounded memory.
-/// Identifiers are valid until the next makeRoomFor().
+/// Identifiers are valid until the next makeRoomFor() or begin().  Each thread has its own.
 class Conditions {
 public:
     /// `bits32` makes decisions over signed integers of 32 bits.
@@ -24,7 +24,13 @@ public:
     /// Throws UsageError for an assumption that cannot be read, and for assumptions that contradict each other.
     Conditions(bool bits32, const TextOptions& options, std::vector<std::string> assumptions);
 
-    [[nodiscard]] VT::VCService& service() const { return **handle_; }
+    [[nodiscard]] VT::VCService& service() const { return *service_; }
+
+    /// Goes on as if nothing had been read, with so many steps for all questions to come.  Returns whether the service
+    /// was renewed for that.
+    bool begin(std::uint64_t steps);
+
+    [[nodiscard]] std::uint64_t stepsLeft() const { return budget_->left(); }
 
     /// To be called before the service reads a text.  Returns whether the service was renewed.
     bool makeRoomFor(const std::string& text);
@@ -69,8 +75,22 @@ private:
     const TextOptions* assumedIn_ = nullptr;
     std::vector<std::string> assumptions_;
     std::unique_ptr<VT::Budget> budget_ = std::make_unique<VT::Budget>(VT::limits::commandSteps); ///< of all services
-    std::optional<VT::VCServiceHandle> handle_;
+    std::unique_ptr<VT::VCService> service_;
+    bool isFresh_ = true;       ///< nothing was read but assumptions
     std::size_t textBytes_ = 0; ///< that the service may have kept
 };
+
+/// The answers of `worker->answer(text, out)`, which uses `worker->conditions` and may leave `worker->warnings`.
+template <class Worker>
+Answering answeringBy(const std::shared_ptr<Worker>& worker) {
+    Answering answering;
+    answering.answer = [worker](const std::string& text, std::string& out) { worker->answer(text, out); };
+    answering.begin = [worker](std::uint64_t steps) { worker->conditions.begin(steps); };
+    answering.steps = {VT::limits::commandSteps, VT::limits::settableSteps, VT::limits::commandStepsAhead,
+                       [worker] { return worker->conditions.stepsLeft(); }};
+    if constexpr (requires { worker->warnings; })
+        answering.warnings = &worker->warnings;
+    return answering;
+}
 
 } // namespace vtsym

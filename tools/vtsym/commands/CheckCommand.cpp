@@ -1,4 +1,4 @@
-// vtsym check: reads a model, runs ModelCheck on it, and writes the findings and, if wanted, a page.
+// vtsym check: reads models, runs ModelCheck on them, and writes the findings and, if wanted, a page.
 // A model that cannot be read, a page that cannot be written and an undecided question end with status 2.
 #include "tools/vtsym/commands/Commands.hpp"
 #include "tools/vtsym/findings/Findings.hpp"
@@ -6,12 +6,16 @@
 #include "tools/vtsym/findings/ModelPage.hpp"
 #include "tools/vtsym/io/CommandLine.hpp"
 #include "tools/vtsym/io/Files.hpp"
+#include "tools/vtsym/io/InOrder.hpp"
 #include "tools/vtsym/io/Texts.hpp"
 
 #include "host/embedded/ModelFile.hpp"
 
 #include <algorithm>
+#include <functional>
+#include <memory>
 #include <unordered_set>
+#include <utility>
 
 namespace vtsym {
 
@@ -49,11 +53,12 @@ constexpr std::array<FindingRule, 6> checkRules{{
 }};
 
 struct CheckOptions {
-    std::string file;
+    std::vector<std::string> files;
     std::string page;
     FindingForm form = FindingForm::Compiler;
     std::size_t mostBytes = vtsym::mostBytes;
     bool fix = false;
+    std::size_t jobs = 0; ///< 0 for all processors
     ModelCheckOptions check;
 };
 
@@ -115,28 +120,96 @@ void fix(const std::string& path, const std::string& text, const VTRootBD& model
         }
 }
 
+/// Keeps what a listener receives, for another one.
+class KeptFindings : public FindingListener {
+public:
+    void write(const Finding& finding) override {
+        kept_.emplace_back([finding](FindingListener& to) { to.write(finding); });
+    }
+
+    void problem(const Place& place, const std::string& sentence) override {
+        kept_.emplace_back([place, sentence](FindingListener& to) { to.problem(place, sentence); });
+    }
+
+    void note(const std::string& sentence) override {
+        kept_.emplace_back([sentence](FindingListener& to) { to.note(sentence); });
+    }
+
+    void remark(const Place& place, std::span<const std::string> sentences, const std::string& members) override {
+        const std::vector<std::string> all(sentences.begin(), sentences.end());
+        kept_.emplace_back([place, all, members](FindingListener& to) { to.remark(place, all, members); });
+    }
+
+    /// Hands over what was kept.
+    void pass(FindingListener& to) {
+        for (const auto& each : std::exchange(kept_, {}))
+            each(to);
+    }
+
+private:
+    std::vector<std::function<void(FindingListener&)>> kept_;
+};
+
+/// A model on its way.
+struct CheckedModel {
+    std::string file;
+    std::string text;
+    std::unique_ptr<VTRootBD> model{};
+    std::unique_ptr<ModelCheck> check{}; ///< nullptr where the model cannot be read
+    KeptFindings kept{};
+};
+
+void checkModel(CheckedModel& checked, const CheckOptions& options, FindingListener& listener) {
+    try {
+        checked.text = readFile(checked.file, options.mostBytes);
+        checked.model = std::make_unique<VTRootBD>();
+        VT::Embedded::readModel(checked.text, *checked.model);
+        auto check = std::make_unique<ModelCheck>(*checked.model, checked.file, options.check);
+        check->run(listener);
+        checked.check = std::move(check);
+    } catch (const OutputError&) {
+        throw;
+    } catch (const VT::Embedded::ModelError& error) {
+        listener.problem({checked.file, error.place().line, error.place().column, 0, 0, {}}, error.what());
+    } catch (const std::runtime_error& error) {
+        listener.problem({checked.file, 0, 0, 0, 0, {}}, error.what());
+    }
+}
+
 SearchResult check(const CheckOptions& options, Console& console) {
     const std::unique_ptr<FindingWriter> writer = makeFindingWriter(options.form, console, checkRules);
-    if (!options.page.empty() && isSameFile(options.page, options.file)) {
+    if (!options.page.empty() && isSameFile(options.page, options.files.front())) {
         writer->problem({options.page, 0, 0, 0, 0, {}}, "is the model: name another file for the page");
         return writer->finish();
     }
-    try {
-        console.working(1);
-        VTRootBD model;
-        std::string text = readFile(options.file, options.mostBytes);
-        VT::Embedded::readModel(text, model);
-        ModelCheck modelCheck(model, options.file, options.check);
-        modelCheck.run(*writer);
-        if (options.fix)
-            fix(options.file, text, model, modelCheck, *writer);
-        if (!options.page.empty())
-            writePage(options.page, modelPage(model, modelCheck), *writer);
-    } catch (const VT::Embedded::ModelError& error) {
-        writer->problem({options.file, error.place().line, error.place().column, 0, 0, {}}, error.what());
-    } catch (const std::runtime_error& error) {
-        writer->problem({options.file, 0, 0, 0, 0, {}}, error.what());
-    }
+    // Models that are written are read one after another: two may be the same.
+    const bool isAlone = options.fix || options.files.size() == 1;
+    const std::size_t jobs = isAlone ? 1 : options.jobs == 0 ? processors() : options.jobs;
+    std::vector<CheckedModel> slots(slotsFor(jobs));
+    auto next = options.files.begin();
+    OrderedWork work;
+    work.next = [&](std::size_t slot) {
+        if (next == options.files.end())
+            return false;
+        console.working(static_cast<std::uint64_t>(next - options.files.begin()) + 1);
+        slots[slot] = {*next++, {}};
+        return true;
+    };
+    work.work = [&](std::size_t slot, std::size_t) {
+        CheckedModel& checked = slots[slot];
+        checkModel(checked, options, isAlone ? static_cast<FindingListener&>(*writer) : checked.kept);
+    };
+    work.finish = [&](std::size_t slot) {
+        CheckedModel& checked = slots[slot];
+        checked.kept.pass(*writer);
+        if (checked.check && options.fix)
+            fix(checked.file, checked.text, *checked.model, *checked.check, *writer);
+        if (checked.check && !options.page.empty())
+            writePage(options.page, modelPage(*checked.model, *checked.check), *writer);
+        checked.check.reset();
+        checked = {};
+    };
+    runInOrder(jobs, work);
     return writer->finish();
 }
 
@@ -145,7 +218,8 @@ SearchResult check(const CheckOptions& options, Console& console) {
 void addCheck(CommandLine& program) {
     Command& command = program.add("check", "Find dead, overlapping and missing choices in a model", checkNotes);
     const auto options = std::make_shared<CheckOptions>();
-    command.addArgument({"MODEL", "File of the model"}, options->file);
+    command.addArguments({"MODEL", "Files of models"},
+                         [options](std::vector<std::string> files) { options->files = std::move(files); });
     command.require("MODEL");
     command.addArgument({"--html", "Write an HTML page with a matrix of the choices of each block", "FILE"},
                         options->page);
@@ -158,6 +232,11 @@ void addCheck(CommandLine& program) {
     command.addFlag("--merge", "Find choices that can be one", options->check.merges);
     command.addFlag("--fix", "Write the model without redundant operands and without dead choices that no port needs",
                     options->fix);
+    addJobsOption(command, options->jobs);
+    command.afterOptions = [options] {
+        if (!options->page.empty() && options->files.size() > 1)
+            throw UsageError("--html", "a page shows one model; check the others without it");
+    };
     command.run = [options](Console& console) { return check(*options, console); };
     command.onError = SearchResult::Failed;
 }

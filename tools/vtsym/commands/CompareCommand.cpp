@@ -32,30 +32,32 @@ constexpr std::array<const char*, 6> relations{"equivalent", "disjoint", "implie
 class Comparer {
 public:
     explicit Comparer(const PairOptions& options)
-        : options_(options),
-          conditions_(options.bits32, options, options.assumptions) {}
+        : conditions(options.bits32, options, options.assumptions),
+          options_(options) {}
 
     void answer(const std::string& text, std::string& out) {
-        conditions_.makeRoomFor(text);
-        const ConditionPair pair = readPair(conditions_, options_, text);
-        const VT::Relation relation = conditions_.service().compare(pair.first, pair.second);
+        conditions.makeRoomFor(text);
+        const ConditionPair pair = readPair(conditions, options_, text);
+        const VT::Relation relation = conditions.service().compare(pair.first, pair.second);
         if (options_.json)
             appendJson(pair, relation, out);
         else
             appendText(relation, out);
         if (options_.why && relation.kind == VT::RelationKind::Equivalent)
-            appendBothWays(conditions_.service().explainEquivalent(pair.first, pair.second), out);
+            appendBothWays(conditions.service().explainEquivalent(pair.first, pair.second), out);
         const VT::Reasons reasons = options_.why ? reasonsOf(pair, relation) : VT::Reasons{};
         if (reasons.isProven && options_.json)
-            appendMember(out, "because", reasonsJson(conditions_, options_, reasons));
+            appendMember(out, "because", reasonsJson(conditions, options_, reasons));
         else if (reasons.isProven && !reasons.operands.empty())
-            out.append("; because: ").append(reasonsText(conditions_, options_, reasons));
+            out.append("; because: ").append(reasonsText(conditions, options_, reasons));
     }
+
+    Conditions conditions;
 
 private:
     /// The operands that force the relation; an overlap needs none.
     [[nodiscard]] VT::Reasons reasonsOf(const ConditionPair& pair, const VT::Relation& relation) const {
-        VT::VCService& service = conditions_.service();
+        VT::VCService& service = conditions.service();
         switch (relation.kind) {
         case VT::RelationKind::Disjoint:
             return service.explainDisjoint({pair.first, pair.second});
@@ -75,11 +77,11 @@ private:
             if (!each.isProven)
                 return;
             if (options_.json)
-                appendMember(json, member, reasonsJson(conditions_, options_, each));
+                appendMember(json, member, reasonsJson(conditions, options_, each));
             else if (each.operands.empty())
                 out.append("; " + which + " always holds");
             else
-                out.append("; " + which + " because: ").append(reasonsText(conditions_, options_, each));
+                out.append("; " + which + " because: ").append(reasonsText(conditions, options_, each));
         };
         append("second", "a", reasons.secondFromFirst);
         append("first", "b", reasons.firstFromSecond);
@@ -89,7 +91,7 @@ private:
 
     /// Why a relation is undecided.
     [[nodiscard]] std::string reasonOf(const VT::Relation& relation) const {
-        return "it " + undecidedText(relation.bound, conditions_.stepsUsedUp());
+        return "it " + undecidedText(relation.bound, conditions.stepsUsedUp());
     }
 
     void appendText(const VT::Relation& relation, std::string& out) const {
@@ -98,7 +100,7 @@ private:
             out.append(": ").append(reasonOf(relation));
         const auto append = [&](const char* who, const VT::Decision& decision) {
             if (decision.witness)
-                out.append("; ").append(who).append(witnessText(conditions_, options_, *decision.witness));
+                out.append("; ").append(who).append(witnessText(conditions, options_, *decision.witness));
         };
         append("first alone: ", relation.onlyA);
         append("second alone: ", relation.onlyB);
@@ -115,7 +117,7 @@ private:
         std::string witnesses;
         const auto append = [&](const char* who, const VT::Decision& decision) {
             if (decision.witness)
-                appendMember(witnesses, who, witnessJson(conditions_, options_, *decision.witness));
+                appendMember(witnesses, who, witnessJson(conditions, options_, *decision.witness));
         };
         append("only_a", relation.onlyA);
         append("only_b", relation.onlyB);
@@ -125,7 +127,6 @@ private:
     }
 
     const PairOptions& options_;
-    Conditions conditions_;
 };
 
 } // namespace
@@ -136,9 +137,11 @@ void addCompare(CommandLine& program) {
     const auto options = std::make_shared<PairOptions>();
     addPairOptions(command, *options, "A", "B");
     command.run = [options](Console& console) {
-        Comparer comparer(*options);
-        const auto answer = [&](const std::string& text, std::string& out) { comparer.answer(text, out); };
-        return answerTexts(*options, console, {answer, false, nullptr, true});
+        return answerTexts(*options, console, [&] {
+            Answering answering = answeringBy(std::make_shared<Comparer>(*options));
+            answering.writesInput = true;
+            return answering;
+        });
     };
 }
 

@@ -17,6 +17,25 @@ Examples:
   vtsym convert --to pp 'Mode==1 || s.gear>2 && true'
   vtsym convert --to quill < conditions.txt)";
 
+struct Converter {
+    explicit Converter(const TextOptions& given) : options(given) {}
+
+    void answer(const std::string& text, std::string& out) {
+        conditions.makeRoomFor(text);
+        const VT::SymbolicExprId condition = conditions.parse(options, text);
+        const std::string result = conditions.print(options, condition);
+        warnings = conditions.warnings(options, condition);
+        if (options.json)
+            appendMember(out, "result", jsonString(result));
+        else
+            out.append(result);
+    }
+
+    const TextOptions& options;
+    Conditions conditions;
+    std::vector<std::string> warnings;
+};
+
 } // namespace
 
 void addConvert(CommandLine& program) {
@@ -26,19 +45,7 @@ void addConvert(CommandLine& program) {
     addTextOptions(command, *options);
     addLanguageOption(command, *options);
     command.run = [options](Console& console) {
-        Conditions conditions;
-        std::vector<std::string> warnings;
-        const auto answer = [&](const std::string& text, std::string& out) {
-            conditions.makeRoomFor(text);
-            const VT::SymbolicExprId condition = conditions.parse(*options, text);
-            const std::string result = conditions.print(*options, condition);
-            warnings = conditions.warnings(*options, condition);
-            if (options->json)
-                appendMember(out, "result", jsonString(result));
-            else
-                out.append(result);
-        };
-        return answerTexts(*options, console, {answer, false, &warnings});
+        return answerTexts(*options, console, [&] { return answeringBy(std::make_shared<Converter>(*options)); });
     };
 }
 

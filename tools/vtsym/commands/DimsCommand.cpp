@@ -254,11 +254,13 @@ void addDims(CommandLine& program) {
     command.run = [options](Console& console) -> ExitStatus {
         if (!options->claims.empty())
             return prove(*options, console);
-        std::vector<std::string> warnings;
-        const auto answerText = [&](const std::string& text, std::string& out) {
-            answerDimension(*options, console.outStyle(), text, out, warnings);
-        };
-        return answerTexts(*options, console, {answerText, !options->json, &warnings});
+        return answerTexts(*options, console, [&] {
+            const auto warnings = std::make_shared<std::vector<std::string>>();
+            const auto answerText = [&, warnings](const std::string& text, std::string& out) {
+                answerDimension(*options, console.outStyle(), text, out, *warnings);
+            };
+            return Answering{answerText, !options->json, warnings.get()};
+        });
     };
 }
 

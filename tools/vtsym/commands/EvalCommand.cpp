@@ -9,7 +9,7 @@
 #include "tools/vtsym/io/Json.hpp"
 #include "tools/vtsym/io/Texts.hpp"
 
-#include <optional>
+#include <memory>
 
 namespace vtsym {
 
@@ -34,26 +34,33 @@ public:
     explicit Evaluator(const EvalOptions& options) : options_(options) {}
 
     void define();
+    void begin(std::uint64_t steps);
     void answer(const std::string& text, std::string& out);
 
+    Conditions conditions;
+
 private:
-    [[nodiscard]] VT::SymbolicExprTable& table() const { return conditions_.service().table(); }
+    [[nodiscard]] VT::SymbolicExprTable& table() const { return conditions.service().table(); }
 
     /// A list in Quill is written as a matrix.
     [[nodiscard]] VT::SymbolicExprId read(const std::string& text) const {
-        return VT::SymbolicExprDimensionLists(table())(conditions_.parse(options_, text));
+        return VT::SymbolicExprDimensionLists(table())(conditions.parse(options_, text));
     }
 
     const EvalOptions& options_;
-    Conditions conditions_;
 };
+
+void Evaluator::begin(std::uint64_t steps) {
+    if (conditions.begin(steps))
+        define();
+}
 
 void Evaluator::define() {
     bindDefinitions(table(), options_.definitions, [this](const std::string& text) { return read(text); });
 }
 
 void Evaluator::answer(const std::string& text, std::string& out) {
-    if (conditions_.makeRoomFor(text))
+    if (conditions.makeRoomFor(text))
         define();
     const VT::SymbolicValue value = VT::SymbolicExprEval(table()).eval(read(text));
     if (options_.json) {
@@ -69,14 +76,18 @@ void Evaluator::answer(const std::string& text, std::string& out) {
 void addEval(CommandLine& program) {
     Command& command = program.add("eval", "Evaluate expressions", evalNotes);
     const auto options = std::make_shared<EvalOptions>();
-    const auto evaluator = std::make_shared<std::optional<Evaluator>>();
     addTextOptions(command, *options);
     addDefinitions(command, options->definitions);
     // After all options: --from is the language of the definitions too.
-    command.afterOptions = [options, evaluator] { evaluator->emplace(*options).define(); };
-    command.run = [options, evaluator](Console& console) {
-        const Answering answering{[&](const std::string& text, std::string& out) { (*evaluator)->answer(text, out); }};
-        return answerTexts(*options, console, answering);
+    command.afterOptions = [options] { Evaluator(*options).define(); };
+    command.run = [options](Console& console) {
+        return answerTexts(*options, console, [&] {
+            const auto evaluator = std::make_shared<Evaluator>(*options);
+            evaluator->define();
+            Answering answering = answeringBy(evaluator);
+            answering.begin = [evaluator](std::uint64_t steps) { evaluator->begin(steps); };
+            return answering;
+        });
     };
 }
 

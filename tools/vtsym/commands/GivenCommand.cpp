@@ -18,6 +18,36 @@ Examples:
   vtsym given --why 'VERSION >= 3 && NET' 'VERSION >= 2 && TLS'
   vtsym given --json < pairs.txt)";
 
+struct Shortener {
+    explicit Shortener(const PairOptions& given) : options(given), conditions(given.bits32, given, given.assumptions) {}
+
+    void answer(const std::string& text, std::string& out) {
+        conditions.makeRoomFor(text);
+        const ConditionPair pair = readPair(conditions, options, text);
+        const VT::SymbolicExprId result = conditions.shortestGiven(options, pair.second, pair.first);
+        const std::string printed = conditions.print(options, result);
+        warnings = conditions.warnings(options, result);
+        const VT::ShorteningReasons reasons =
+            options.why ? conditions.service().explainImpliedCondition(pair.second, result, pair.first)
+                        : VT::ShorteningReasons{};
+        if (!options.json) {
+            out.append(printed);
+            if (reasons.because.isProven)
+                appendReasons(conditions, options, reasons, out);
+            return;
+        }
+        appendMember(out, "known", jsonString(pair.firstText));
+        appendMember(out, "condition", jsonString(pair.secondText));
+        appendMember(out, "result", jsonString(printed));
+        if (reasons.because.isProven)
+            appendReasonsJson(conditions, options, reasons, out);
+    }
+
+    const PairOptions& options;
+    Conditions conditions;
+    std::vector<std::string> warnings;
+};
+
 } // namespace
 
 void addGiven(CommandLine& program) {
@@ -26,30 +56,11 @@ void addGiven(CommandLine& program) {
     addPairOptions(command, *options, "KNOWN", "CONDITION");
     addLanguageOption(command, *options);
     command.run = [options](Console& console) {
-        Conditions conditions(options->bits32, *options, options->assumptions);
-        std::vector<std::string> warnings;
-        const auto answer = [&](const std::string& text, std::string& out) {
-            conditions.makeRoomFor(text);
-            const ConditionPair pair = readPair(conditions, *options, text);
-            const VT::SymbolicExprId result = conditions.shortestGiven(*options, pair.second, pair.first);
-            const std::string printed = conditions.print(*options, result);
-            warnings = conditions.warnings(*options, result);
-            const VT::ShorteningReasons reasons =
-                options->why ? conditions.service().explainImpliedCondition(pair.second, result, pair.first)
-                             : VT::ShorteningReasons{};
-            if (!options->json) {
-                out.append(printed);
-                if (reasons.because.isProven)
-                    appendReasons(conditions, *options, reasons, out);
-                return;
-            }
-            appendMember(out, "known", jsonString(pair.firstText));
-            appendMember(out, "condition", jsonString(pair.secondText));
-            appendMember(out, "result", jsonString(printed));
-            if (reasons.because.isProven)
-                appendReasonsJson(conditions, *options, reasons, out);
-        };
-        return answerTexts(*options, console, {answer, false, &warnings, true});
+        return answerTexts(*options, console, [&] {
+            Answering answering = answeringBy(std::make_shared<Shortener>(*options));
+            answering.writesInput = true;
+            return answering;
+        });
     };
 }
 

@@ -1,8 +1,8 @@
 // vtsym man and vtsym completion: the manual page and the completions of shells, which packages install.
 // The help does not list them.
 #include "tools/vtsym/commands/Commands.hpp"
-#include "tools/vtsym/io/Completions.hpp"
-#include "tools/vtsym/io/ManualPage.hpp"
+#include "tools/vtsym/io/manual/Completions.hpp"
+#include "tools/vtsym/io/manual/ManualPage.hpp"
 
 namespace vtsym {
 

@@ -54,6 +54,7 @@ void addPairOptions(Command& command, PairOptions& options, const std::string& f
                         [&options](const std::string& text) { options.second = text; });
     addSourceOption(command, options);
     command.addFlag("--json", "Answer with one JSON object per pair", options.json);
+    addJobsOption(command, options.jobs);
     addBitsOption(command, options.bits32);
     addAssumeOption(command, options.assumptions);
     command.addFlag("--why", "Say which operands, known facts and assumptions force the answer", options.why);

@@ -34,15 +34,15 @@ public:
     void answer(const std::string& text, std::string& out);
 
     std::vector<std::string> warnings;
+    Conditions conditions;
 
 private:
     const PreprocessOptions& options_;
-    Conditions conditions_;
 };
 
 bool Preprocessor::readsGiven(Console& console) {
     try {
-        static_cast<void>(conditions_.parse(options_, options_.given));
+        static_cast<void>(conditions.parse(options_, options_.given));
         return true;
     } catch (...) {
         const TextError error = currentTextError();
@@ -55,20 +55,20 @@ bool Preprocessor::readsGiven(Console& console) {
 }
 
 void Preprocessor::answer(const std::string& text, std::string& out) {
-    conditions_.makeRoomFor(text);
-    VT::SymbolicExprTable& table = conditions_.service().table();
+    conditions.makeRoomFor(text);
+    VT::SymbolicExprTable& table = conditions.service().table();
     const VT::SymbolicExprQ2C toC(table);
     const VT::SymbolicExprId given = options_.given.empty() // nothing is known then
                                          ? VT::invalidId
-                                         : toC(conditions_.parse(options_, options_.given));
-    const VT::SymbolicExprId condition = toC(conditions_.parse(options_, text));
+                                         : toC(conditions.parse(options_, options_.given));
+    const VT::SymbolicExprId condition = toC(conditions.parse(options_, text));
     std::string result = VT::StringifyImpliedCondition(table, false, true, given).print(condition);
     if (given != VT::invalidId) {
-        std::string shortest = conditions_.print(options_, conditions_.shortestGiven(options_, condition, given));
+        std::string shortest = conditions.print(options_, conditions.shortestGiven(options_, condition, given));
         if (shortest.size() < result.size())
             result = std::move(shortest);
     }
-    warnings = conditions_.warnings(options_, condition);
+    warnings = conditions.warnings(options_, condition);
     if (options_.json)
         appendMember(out, "result", jsonString(result));
     else
@@ -86,11 +86,9 @@ void addPreprocess(CommandLine& program) {
         {"--given", "A condition that is known to hold; the parts that it decides are left out", "CONDITION"},
         options->given);
     command.run = [options](Console& console) {
-        Preprocessor preprocessor(*options);
-        if (!preprocessor.readsGiven(console))
+        if (!Preprocessor(*options).readsGiven(console))
             return false;
-        const auto answer = [&](const std::string& text, std::string& out) { preprocessor.answer(text, out); };
-        return answerTexts(*options, console, {answer, false, &preprocessor.warnings});
+        return answerTexts(*options, console, [&] { return answeringBy(std::make_shared<Preprocessor>(*options)); });
     };
 }
 

@@ -54,7 +54,7 @@ void addRepl(CommandLine& program) {
             if (!session.ended())
                 session.answer(line, out);
         };
-        return answerTexts(*options, console, {answer});
+        return answerOneByOne(*options, console, {answer});
     };
 }
 

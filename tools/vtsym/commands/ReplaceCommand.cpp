@@ -41,6 +41,25 @@ Names takeNames(std::vector<std::string>& arguments) {
     return names;
 }
 
+struct Replacer {
+    Replacer(const TextOptions& given, const Names& replaced) : options(given), names(replaced) {}
+
+    void answer(const std::string& text, std::string& out) {
+        conditions.makeRoomFor(text);
+        const VT::VCSymbolicExprId replaced =
+            conditions.service().replaceSymbolsInExpression(conditions.parse(options, text), names);
+        const std::string result = conditions.print(options, replaced.id());
+        if (options.json)
+            appendMember(out, "result", jsonString(result));
+        else
+            out.append(result);
+    }
+
+    const TextOptions& options;
+    const Names& names;
+    Conditions conditions;
+};
+
 } // namespace
 
 void addReplace(CommandLine& program) {
@@ -51,18 +70,8 @@ void addReplace(CommandLine& program) {
     addLanguageOption(command, *options);
     command.afterOptions = [options, names] { *names = takeNames(options->texts); };
     command.run = [options, names](Console& console) {
-        Conditions conditions;
-        const auto answer = [&](const std::string& text, std::string& out) {
-            conditions.makeRoomFor(text);
-            const VT::VCSymbolicExprId replaced =
-                conditions.service().replaceSymbolsInExpression(conditions.parse(*options, text), *names);
-            const std::string result = conditions.print(*options, replaced.id());
-            if (options->json)
-                appendMember(out, "result", jsonString(result));
-            else
-                out.append(result);
-        };
-        return answerTexts(*options, console, {answer});
+        return answerTexts(*options, console,
+                           [&] { return answeringBy(std::make_shared<Replacer>(*options, *names)); });
     };
 }
 

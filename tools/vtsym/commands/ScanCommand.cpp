@@ -4,6 +4,7 @@
 #include "base/core/Limits.hpp"
 #include "tools/vtsym/commands/Commands.hpp"
 #include "tools/vtsym/findings/SourceFiles.hpp"
+#include "tools/vtsym/findings/cache/ScanCache.hpp"
 #include "tools/vtsym/findings/source/Baseline.hpp"
 #include "tools/vtsym/findings/source/GitRepository.hpp"
 #include "tools/vtsym/findings/source/Patch.hpp"
@@ -12,6 +13,8 @@
 #include "tools/vtsym/findings/source/SourceChecker.hpp"
 #include "tools/vtsym/io/CommandLine.hpp"
 #include "tools/vtsym/io/Files.hpp"
+#include "tools/vtsym/io/InOrder.hpp"
+#include "tools/vtsym/io/Texts.hpp"
 
 #include <algorithm>
 #include <charconv>
@@ -51,6 +54,8 @@ struct ScanOptions {
     std::string written; ///< baseline to write
     std::string range;   ///< of states to compare
     std::size_t days = std::numeric_limits<std::size_t>::max();
+    std::size_t jobs = 0; ///< 0 for all processors
+    std::string cache;    ///< folder; empty for none
     FindingForm form = FindingForm::Compiler;
 };
 
@@ -70,6 +75,25 @@ Baseline baselineAt(const std::string& path, bool mayBeMissing) {
     return Baseline::read(readFile(path, mostBytes));
 }
 
+/// A file on its way through a scan.
+struct ScannedFile {
+    std::string path;
+    std::string text; ///< kept where the file is to be changed
+    std::string problem;
+    CheckedFile checked;
+    std::optional<ContentKey> key{}; ///< of a result that is to be kept
+};
+
+/// Two states of a file on their way through a comparison.
+struct ComparedFile {
+    std::string path;
+    std::string before;
+    std::string after;
+    const std::vector<VT::ChangedLines>* lines = nullptr;
+    std::string problem;
+    std::vector<Finding> changes;
+};
+
 /// One run of the command.
 class Scan {
 public:
@@ -78,7 +102,15 @@ public:
           settings_(options.settings),
           console_(console),
           writer_(makeFindingWriter(options.form, console, scanRules())),
-          checker_(settings_, [this](const std::string& sentence) { writer_->note(sentence); }) {}
+          jobs_(options.fix && !options.dryRun ? 1
+                : options.jobs == 0            ? processors()
+                                               : options.jobs),
+          first_(settings_, [this](const std::string& sentence) { writer_->note(sentence); }),
+          others_(jobs_ - 1) {
+        if (!options.cache.empty())
+            cache_.emplace(options.cache, settingsKey(settings_, first_.buildKey()),
+                           [this](const std::string& sentence) { writer_->note(sentence); });
+    }
 
     SearchResult run();
     /// Compares two states of the repository.
@@ -90,7 +122,12 @@ private:
     }
 
     bool readBaselines();
-    void scan(const std::string& path);
+    SourceChecker& checkerOf(std::size_t worker);
+    void read(ScannedFile& file, SourceChecker& checker) const;
+    void use(ScannedFile& file);
+    void scanFiles(const std::vector<std::string>& paths);
+    [[nodiscard]] bool isAsked(const std::string& path) const;
+    void read(GitRepository& repository, const ChangedFile& changed, ComparedFile& file) const;
     void report(const FileFinding& found);
     void fix(const std::string& path, const std::string& text, const std::vector<FileFinding>& found);
     void writeSummary() const;
@@ -99,10 +136,14 @@ private:
     const ScanSettings& settings_;
     Console& console_;
     std::unique_ptr<FindingWriter> writer_;
-    SourceChecker checker_;
+    std::size_t jobs_; ///< files that are written are read one after another: two may be the same
+    SourceChecker first_;
+    std::vector<std::unique_ptr<SourceChecker>> others_; ///< of other workers, made by them
+    std::optional<ScanCache> cache_;
     Baseline baseline_; ///< accepted before
     Baseline written_;
     std::chrono::sys_days today_ = today();
+    VT::SourceScanCounts counts_;
     std::uint64_t files_ = 0;
     std::uint64_t fixed_ = 0;
 };
@@ -125,14 +166,12 @@ SearchResult Scan::run() {
     const FileProblem report = [this](const std::string& path, const std::string& sentence) {
         problem(path, sentence);
     };
-    for (const std::string& path : sourceFiles(settings_.paths, report))
-        if (!isExcluded(path, settings_.excluded))
-            scan(path);
+    scanFiles(sourceFiles(settings_.paths, report));
     if (files_ == 0 && !writer_->failed())
         problem(settings_.paths.front(), "there is no C or C++ file: name a folder of sources, or a file");
-    if (const std::uint64_t undecided = checker_.counts().undecided; undecided > 0)
+    if (const std::uint64_t undecided = counts_.undecided; undecided > 0)
         writer_->note(std::to_string(undecided) + " decisions were given up: findings that depend on them are missing");
-    if (const std::uint64_t leftOut = checker_.counts().leftOut; leftOut > 0)
+    if (const std::uint64_t leftOut = counts_.leftOut; leftOut > 0)
         writer_->note(std::to_string(leftOut) + " configurations of files were left out: a file is scanned for " +
                       std::to_string(VT::limits::scanConfigurations));
     if (const std::size_t gone = baseline_.notFound(); gone > 0)
@@ -156,20 +195,28 @@ SearchResult Scan::run() {
 SearchResult Scan::compare() {
     GitRepository repository;
     std::size_t counted[2] = {0, 0}; // findings that remain, that are fixed
-    for (const ChangedFile& file : repository.changes(options_.range)) {
-        if (!isSourcePath(file.path) || isExcluded(file.path, settings_.excluded) ||
-            !isBelow(file.path, settings_.paths))
-            continue;
-        std::string texts[2];
-        try {
-            const std::string* const blobs[] = {&file.blobBefore, &file.blob};
-            for (std::size_t i = 0; i < 2; ++i)
-                texts[i] = blobs[i]->empty() ? "" : repository.read(*blobs[i], settings_.mostBytes);
-        } catch (const FileError& error) {
-            problem(file.path, error.what());
-            continue;
-        }
-        for (const Finding& finding : changesOf(checker_, {file.path, texts[0], texts[1], file.lines})) {
+    const std::vector<ChangedFile> changed = repository.changes(options_.range);
+    std::vector<ComparedFile> slots(slotsFor(jobs_));
+    auto next = changed.begin();
+    OrderedWork work;
+    work.next = [&](std::size_t slot) {
+        next = std::find_if(next, changed.end(), [this](const ChangedFile& file) { return isAsked(file.path); });
+        if (next == changed.end())
+            return false;
+        slots[slot] = {};
+        read(repository, *next++, slots[slot]);
+        return true;
+    };
+    work.work = [&](std::size_t slot, std::size_t worker) {
+        ComparedFile& file = slots[slot];
+        if (file.problem.empty())
+            file.changes = changesOf(checkerOf(worker), {file.path, file.before, file.after, *file.lines});
+    };
+    work.finish = [&](std::size_t slot) {
+        const ComparedFile& file = slots[slot];
+        if (!file.problem.empty())
+            problem(file.path, file.problem);
+        for (const Finding& finding : file.changes) {
             if (finding.state == "new") {
                 writer_->write(finding);
                 continue;
@@ -178,7 +225,8 @@ SearchResult Scan::compare() {
             if (finding.state != "updated")
                 ++counted[finding.state == "absent" ? 1 : 0];
         }
-    }
+    };
+    runInOrder(jobs_, work);
     const std::uint64_t found = writer_->found();
     const SearchResult result = writer_->finish();
     if (options_.summary)
@@ -187,20 +235,91 @@ SearchResult Scan::compare() {
     return result;
 }
 
-void Scan::scan(const std::string& path) {
-    std::string text;
+/// Whether changes of a file are compared.
+bool Scan::isAsked(const std::string& path) const {
+    return isSourcePath(path) && !isExcluded(path, settings_.excluded) && isBelow(path, settings_.paths);
+}
+
+void Scan::read(GitRepository& repository, const ChangedFile& changed, ComparedFile& file) const {
+    file.path = changed.path;
+    file.lines = &changed.lines;
+    const auto textOf = [&](const std::string& blob) {
+        return blob.empty() ? std::string() : repository.read(blob, settings_.mostBytes);
+    };
     try {
-        text = readFile(path, settings_.mostBytes);
+        file.before = textOf(changed.blobBefore);
+        file.after = textOf(changed.blob);
     } catch (const FileError& error) {
-        problem(path, error.what());
+        file.problem = error.what();
+    }
+}
+
+SourceChecker& Scan::checkerOf(std::size_t worker) {
+    if (worker == 0)
+        return first_;
+    std::unique_ptr<SourceChecker>& checker = others_[worker - 1];
+    if (!checker)
+        checker = std::make_unique<SourceChecker>(first_);
+    return *checker;
+}
+
+/// Reads a file and finds what there is.  Changes nothing that threads share.
+void Scan::read(ScannedFile& file, SourceChecker& checker) const {
+    try {
+        file.text = readFile(file.path, settings_.mostBytes);
+    } catch (const FileError& error) {
+        file.problem = error.what();
+        return;
+    }
+    std::optional<ContentKey> key;
+    if (cache_) {
+        key = cache_->keyOf(file.path, file.text);
+        if (std::optional<CheckedFile> known = cache_->find(*key)) {
+            file.checked = *std::move(known);
+            file.key = key;
+        }
+    }
+    if (!file.key) {
+        file.checked = checker.checkAndCount(file.path, file.text);
+        file.key = key;
+    }
+    if (!options_.fix)
+        file.text = {};
+}
+
+void Scan::use(ScannedFile& file) {
+    if (!file.problem.empty()) {
+        problem(file.path, file.problem);
         return;
     }
     ++files_;
-    const std::vector<FileFinding> found = checker_.check(path, text);
+    addCounts(counts_, file.checked.counts);
+    if (file.key)
+        cache_->keep(*file.key, file.checked);
     if (options_.fix)
-        fix(path, text, found);
+        fix(file.path, file.text, file.checked.findings);
     else
-        std::ranges::for_each(found, [this](const FileFinding& each) { report(each); });
+        std::ranges::for_each(file.checked.findings, [this](const FileFinding& each) { report(each); });
+}
+
+void Scan::scanFiles(const std::vector<std::string>& paths) {
+    std::vector<ScannedFile> slots(slotsFor(jobs_));
+    auto next = paths.begin();
+    OrderedWork work;
+    work.next = [&](std::size_t slot) {
+        next =
+            std::find_if(next, paths.end(), [this](const auto& path) { return !isExcluded(path, settings_.excluded); });
+        if (next == paths.end())
+            return false;
+        slots[slot] = {};
+        slots[slot].path = *next++;
+        return true;
+    };
+    work.work = [&](std::size_t slot, std::size_t worker) { read(slots[slot], checkerOf(worker)); };
+    work.finish = [&](std::size_t slot) { use(slots[slot]); };
+    runInOrder(jobs_, work);
+    if (cache_)
+        cache_->write();
 }
 
 void Scan::report(const FileFinding& found) {
@@ -238,10 +357,9 @@ void Scan::fix(const std::string& path, const std::string& text, const std::vect
 }
 
 void Scan::writeSummary() const {
-    const VT::SourceScanCounts& counts = checker_.counts();
-    console_.err("vtsym: " + std::to_string(files_) + " files, " + std::to_string(counts.branches) + " branches, " +
-                 std::to_string(writer_->found()) + " findings; " + std::to_string(counts.unread) +
-                 " conditions not understood, " + std::to_string(counts.undecided) + " decisions given up\n");
+    console_.err("vtsym: " + std::to_string(files_) + " files, " + std::to_string(counts_.branches) + " branches, " +
+                 std::to_string(writer_->found()) + " findings; " + std::to_string(counts_.unread) +
+                 " conditions not understood, " + std::to_string(counts_.undecided) + " decisions given up\n");
 }
 
 /// Joins the options with the settings of the project.
@@ -333,9 +451,12 @@ void addScan(CommandLine& program) {
         {"--exclude", "Leave out paths, or folders, of a pattern", "PATTERN"},
         [options](std::vector<std::string> patterns) { options->settings.excluded = std::move(patterns); });
     command.addArgument({"--config", "Read settings from this file rather than .vtsym.toml", "FILE"}, options->config);
+    addJobsOption(command, options->jobs);
+    command.addArgument({"--cache", "Keep findings in this folder, for files that do not change", "DIR"},
+                        options->cache);
     command.exclude("--write-baseline", "--fix");
     command.afterOptions = [options] { readProject(*options); };
-    for (const char* const other : {"--fix", "--baseline", "--write-baseline"})
+    for (const char* const other : {"--fix", "--baseline", "--write-baseline", "--cache"})
         command.exclude("--diff", other);
     command.run = [options](Console& console) -> ExitStatus {
         Scan scan(*options, console);

@@ -40,13 +40,14 @@ struct SimplifyOptions : TextOptions {
 class Simplifier {
 public:
     Simplifier(const SimplifyOptions& options, const Style& style)
-        : options_(options),
-          style_(style),
-          conditions_(options.bits32, options, options.assumptions) {}
+        : conditions(options.bits32, options, options.assumptions),
+          options_(options),
+          style_(style) {}
 
     void answer(const std::string& text, std::string& out);
 
-    [[nodiscard]] const std::vector<std::string>& warnings() const noexcept { return warnings_; }
+    Conditions conditions;
+    std::vector<std::string> warnings;
 
 private:
     VT::SymbolicExprId answerInDetail(const std::string& text, std::string& out) const;
@@ -54,44 +55,42 @@ private:
 
     const SimplifyOptions& options_;
     const Style& style_;
-    Conditions conditions_;
-    std::vector<std::string> warnings_;
 };
 
 void Simplifier::answer(const std::string& text, std::string& out) {
-    conditions_.makeRoomFor(text);
+    conditions.makeRoomFor(text);
     VT::SymbolicExprId result = 0;
     if (options_.json || options_.explain) {
         result = answerInDetail(text, out);
     } else {
         const VT::SymbolicExprId condition =
-            options_.normalForm ? conditions_.simplify(options_, text) : conditions_.parse(options_, text);
-        result = options_.normalForm ? condition : conditions_.shortest(options_, condition);
-        out.append(options_.normalForm ? conditions_.print(options_, result)
-                                       : conditions_.printShortest(options_, result, condition));
+            options_.normalForm ? conditions.simplify(options_, text) : conditions.parse(options_, text);
+        result = options_.normalForm ? condition : conditions.shortest(options_, condition);
+        out.append(options_.normalForm ? conditions.print(options_, result)
+                                       : conditions.printShortest(options_, result, condition));
     }
-    warnings_ = conditions_.warnings(options_, result);
+    warnings = conditions.warnings(options_, result);
     if (options_.why)
-        explainShorter(conditions_.parse(options_, text), result, out);
+        explainShorter(conditions.parse(options_, text), result, out);
 }
 
 /// Appends which operands went, and why; nothing where the condition stays as it is.
 void Simplifier::explainShorter(VT::SymbolicExprId condition, VT::SymbolicExprId result, std::string& out) const {
-    VT::VCService& service = conditions_.service();
+    VT::VCService& service = conditions.service();
     const VT::ShorteningReasons reasons =
         condition == result ? VT::ShorteningReasons{}
                             : service.explainImpliedCondition(condition, result, service.table().getIdTRUE());
     if (!reasons.because.isProven)
         return;
     if (options_.json)
-        appendReasonsJson(conditions_, options_, reasons, out);
+        appendReasonsJson(conditions, options_, reasons, out);
     else
-        appendReasons(conditions_, options_, reasons, out);
+        appendReasons(conditions, options_, reasons, out);
 }
 
 /// Bypasses the caches of the service, which keep only results.
 VT::SymbolicExprId Simplifier::answerInDetail(const std::string& text, std::string& out) const {
-    Explanation explanation(conditions_, options_, conditions_.parse(options_, text), options_.explain);
+    Explanation explanation(conditions, options_, conditions.parse(options_, text), options_.explain);
     if (!options_.normalForm)
         explanation.shorten();
     if (!options_.json) {
@@ -126,9 +125,11 @@ void addSimplify(CommandLine& program) {
         const Conditions checked(options->bits32, *options, options->assumptions); // before any text is answered
     };
     command.run = [options](Console& console) {
-        Simplifier simplifier(*options, console.outStyle());
-        const auto answer = [&](const std::string& text, std::string& out) { simplifier.answer(text, out); };
-        return answerTexts(*options, console, {answer, options->explain && !options->json, &simplifier.warnings()});
+        return answerTexts(*options, console, [&] {
+            Answering answering = answeringBy(std::make_shared<Simplifier>(*options, console.outStyle()));
+            answering.inBlocks = options->explain && !options->json;
+            return answering;
+        });
     };
 }
 

@@ -64,6 +64,28 @@ VT::VCSymbolTypes kindsOf(const SymbolsOptions& options) {
     return kinds;
 }
 
+struct SymbolLister {
+    explicit SymbolLister(const SymbolsOptions& given) : options(given) {}
+
+    void answer(const std::string& text, std::string& out) {
+        conditions.makeRoomFor(text);
+        std::string list;
+        for (const std::string& symbol : conditions.symbols(conditions.parse(options, text), kindsOf(options))) {
+            list.append(list.empty()   ? ""
+                        : options.json ? ","
+                                       : " ")
+                .append(options.json ? jsonString(symbol) : symbol);
+        }
+        if (options.json)
+            appendMember(out, "symbols", "[" + list + "]");
+        else
+            out.append(list);
+    }
+
+    const SymbolsOptions& options;
+    Conditions conditions;
+};
+
 } // namespace
 
 void addSymbols(CommandLine& program) {
@@ -77,23 +99,7 @@ void addSymbols(CommandLine& program) {
     command.run = [options](Console& console) {
         if (options->kinds.empty())
             options->kinds = {"identifiers", "members"};
-        Conditions conditions;
-        const auto answer = [&](const std::string& text, std::string& out) {
-            conditions.makeRoomFor(text);
-            const auto symbols = conditions.symbols(conditions.parse(*options, text), kindsOf(*options));
-            std::string list;
-            for (const std::string& symbol : symbols) {
-                list.append(list.empty()    ? ""
-                            : options->json ? ","
-                                            : " ")
-                    .append(options->json ? jsonString(symbol) : symbol);
-            }
-            if (options->json)
-                appendMember(out, "symbols", "[" + list + "]");
-            else
-                out.append(list);
-        };
-        return answerTexts(*options, console, {answer});
+        return answerTexts(*options, console, [&] { return answeringBy(std::make_shared<SymbolLister>(*options)); });
     };
 }
 

@@ -59,7 +59,7 @@ void addTree(CommandLine& program) {
         const auto answerText = [&](const std::string& text, std::string& out) {
             answerTree(*options, console.outStyle(), text, out);
         };
-        return answerTexts(*options, console, {answerText, !options->json});
+        return answerTexts(*options, console, [&] { return Answering{answerText, !options->json}; });
     };
 }
 

@@ -69,16 +69,16 @@ ModelCheck::ModelCheck(const VTRootBD& model, std::string file, const ModelCheck
     : model_(model),
       file_(std::move(file)),
       options_(options),
-      conditions_(*handle_),
+      conditions_(*service_),
       isAssumed_(assume()),
-      conditionsOnPath_(handle_->table()),
-      checker_(*handle_, checkerOptions()) {}
+      conditionsOnPath_(service_->table()),
+      checker_(*service_, checkerOptions()) {}
 
 /// Makes the service assume what the options say; false where that cannot be read.
 bool ModelCheck::assume() {
     for (const std::string& text : options_.assumptions) {
         try {
-            model_.isQuill() ? handle_->assumeFromQCondition(text) : handle_->assumeFromCCondition(text);
+            model_.isQuill() ? service_->assumeFromQCondition(text) : service_->assumeFromCCondition(text);
         } catch (const VT::HostDiagnostic& diagnostic) {
             refused_ = diagnostic.what();
             return false;
@@ -91,11 +91,11 @@ bool ModelCheck::assume() {
 VT::ChoiceSetOptions ModelCheck::checkerOptions() {
     VT::ChoiceSetOptions result{
         .bits32 = options_.bits32, .reasons = options_.why, .merges = options_.merges, .steps = options_.steps};
-    const VT::SymbolicExprTable& table = handle_->table();
+    const VT::SymbolicExprTable& table = service_->table();
     for (const VT::Embedded::DeclaredSymbol& symbol : model_.symbols()) {
         VT::SymbolicExprId id = VT::invalidId;
         try {
-            id = model_.isQuill() ? handle_->parseQ(symbol.name) : handle_->parseC(symbol.name);
+            id = model_.isQuill() ? service_->parseQ(symbol.name) : service_->parseC(symbol.name);
         } catch (const VT::HostDiagnostic&) {
             unread_.push_back(&symbol);
             continue;
@@ -112,12 +112,12 @@ VT::ChoiceSetOptions ModelCheck::checkerOptions() {
 }
 
 std::string ModelCheck::print(VT::SymbolicExprId condition) const {
-    const std::string text = model_.isQuill() ? handle_->printQExpr(condition) : handle_->printCExpr(condition);
+    const std::string text = model_.isQuill() ? service_->printQExpr(condition) : service_->printCExpr(condition);
     return text.empty() ? "true" : text;
 }
 
 std::string ModelCheck::witnessText(const VT::Witness& witness) const {
-    return witness.empty() ? "any values" : handle_->printWitness(witness);
+    return witness.empty() ? "any values" : service_->printWitness(witness);
 }
 
 Place ModelCheck::placeOf(const VTBlock& block) const {
@@ -148,15 +148,15 @@ std::vector<RelatedPlace> ModelCheck::conditionsAround(const VTBlock* block) con
 }
 
 VT::SymbolicExprId ModelCheck::contextOf(const VTBlock* block) const {
-    return block != nullptr ? contexts_.at(block) : handle_->table().getIdTRUE();
+    return block != nullptr ? contexts_.at(block) : service_->table().getIdTRUE();
 }
 
 VT::SymbolicExprId ModelCheck::conditionOf(const vtPort& port) const {
-    VT::VCSymbolicExprId to = handle_->table().getIdFALSE();
+    VT::VCSymbolicExprId to = service_->table().getIdFALSE();
     for (const VTBlock* const destination : port.destinations())
         if (contexts_.contains(destination))
-            to = handle_->OR(to, contextOf(destination), false);
-    return handle_->AND(contextOf(&port.source()), to, false).id();
+            to = service_->OR(to, contextOf(destination), false);
+    return service_->AND(contextOf(&port.source()), to, false).id();
 }
 
 /// Reads the conditions of all blocks.  Returns whether every one could be read.
@@ -197,9 +197,9 @@ VT::VCSymbolicExprId ModelCheck::ownAfterOthers(const VTBlock& block) {
         VT::BlockConditions::isDefault(block))
         return own;
     VT::SymbolicExprId& before =
-        earlierChoices_.try_emplace(block.parent(), handle_->table().getIdFALSE()).first->second;
-    const VT::VCSymbolicExprId active = handle_->AND(own, handle_->NOT(before, false), false);
-    before = handle_->OR(before, own, false).id();
+        earlierChoices_.try_emplace(block.parent(), service_->table().getIdFALSE()).first->second;
+    const VT::VCSymbolicExprId active = service_->AND(own, service_->NOT(before, false), false);
+    before = service_->OR(before, own, false).id();
     return active;
 }
 
@@ -207,7 +207,7 @@ void ModelCheck::run(FindingListener& writer) {
     writer_ = &writer;
     if (!readConditions())
         return;
-    for (const VT::VCSymbolicExprId& assumption : handle_->assumptions())
+    for (const VT::VCSymbolicExprId& assumption : service_->assumptions())
         conditionsOnPath_.add(assumption.id());   // it may say something of several names
     std::unordered_set<const VTBlock*> dead;      // and everything inside of them
     std::unordered_set<const VTBlock*> followers; // always active where their parents are
@@ -230,8 +230,8 @@ void ModelCheck::run(FindingListener& writer) {
             continue;
         const VT::SymbolicExprId around = contextOf(block.parent());
         const VT::SymbolicExprId own =
-            followers.contains(&block) ? handle_->table().getIdTRUE() : ownAfterOthers(block).id();
-        contexts_.emplace(&block, handle_->AND(around, own, false).id());
+            followers.contains(&block) ? service_->table().getIdTRUE() : ownAfterOthers(block).id();
+        contexts_.emplace(&block, service_->AND(around, own, false).id());
         goInto(block, own);
         if (!block.choices().empty())
             note(checkChoices(block), block.choices());
@@ -379,7 +379,7 @@ Finding ModelCheck::findingOf(const VTBlock& set, std::span<const VTBlock* const
     }
     explain(result, finding.reasons);
     if (finding.fault != VT::ChoiceFault::Dead)
-        result.witness = handle_->printWitness(finding.witness);
+        result.witness = service_->printWitness(finding.witness);
     return result;
 }
 

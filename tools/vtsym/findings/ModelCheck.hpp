@@ -5,10 +5,11 @@
 #include "base/choices/BlockConditions.hpp"
 #include "base/choices/ChoiceSetChecker.hpp"
 #include "base/decide/Assumptions.hpp"
-#include "base/service/VCServiceHandle.hpp"
+#include "base/service/VCService.hpp"
 #include "host/embedded/EmbeddedModel.hpp"
 #include "tools/vtsym/findings/Findings.hpp"
 
+#include <memory>
 #include <optional>
 #include <string>
 #include <unordered_map>
@@ -27,7 +28,7 @@ struct ModelCheckOptions {
     std::uint64_t steps = VT::limits::choiceSteps; ///< that the whole check may cost
 };
 
-/// Checks one model, once.
+/// Checks one model, once, in one thread; several may be checked at once.
 class ModelCheck {
 public:
     /// The findings about the choices of a block.
@@ -87,7 +88,7 @@ private:
     ModelCheckOptions options_;
     std::vector<const VT::Embedded::DeclaredSymbol*> unread_; ///< symbols that are not names
     std::string refused_;                                     ///< why an assumption cannot be read
-    VT::VCServiceHandle handle_;
+    std::unique_ptr<VT::VCService> service_ = std::make_unique<VT::VCService>();
     VT::BlockConditions conditions_;
     bool isAssumed_; ///< all assumptions were read, before the checker is made
 

@@ -9,6 +9,7 @@
 #include <array>
 #include <cerrno>
 #include <charconv>
+#include <cstdio>
 #include <fcntl.h>
 #include <limits>
 #include <new>
@@ -82,7 +83,7 @@ bool readUpTo(const Descriptor& file, std::size_t size, std::string& text) {
     return true;
 }
 
-std::string readText(const Descriptor& file, std::size_t bound) {
+std::string readAll(const Descriptor& file, std::size_t bound, bool isText) {
     struct stat state {};
 
     if (file.get() < 0 || fstat(file.get(), &state) != 0)
@@ -95,7 +96,7 @@ std::string readText(const Descriptor& file, std::size_t bound) {
     };
     std::string text;
     bool goesOn = readUpTo(file, std::min(firstBytes, bound + 1), text);
-    if (text.find('\0') != std::string::npos)
+    if (isText && text.find('\0') != std::string::npos)
         throw FileError("is not a text: there is a NUL in it");
     const std::size_t size = isRegular ? static_cast<std::size_t>(state.st_size) : 0;
     if (size > bound || text.size() > bound)
@@ -123,9 +124,11 @@ std::size_t bytesOf(std::string_view text) {
 
 } // namespace
 
-std::string readFile(const std::string& path, std::size_t bound) {
+namespace {
+
+std::string readWhole(const std::string& path, std::size_t bound, bool isText) {
     try {
-        return readText(Descriptor(path, O_RDONLY), bound);
+        return readAll(Descriptor(path, O_RDONLY), bound, isText);
     } catch (const std::bad_alloc&) {
         throw FileError("cannot be read: there is not enough memory for it");
     } catch (const std::length_error&) {
@@ -133,8 +136,7 @@ std::string readFile(const std::string& path, std::size_t bound) {
     }
 }
 
-void writeFile(const std::string& path, std::string_view text) {
-    Descriptor file(path, O_WRONLY | O_CREAT | O_TRUNC);
+void writeTo(Descriptor& file, std::string_view text) {
     if (file.get() < 0)
         failToWrite();
     while (!text.empty()) {
@@ -145,6 +147,34 @@ void writeFile(const std::string& path, std::string_view text) {
     }
     if (!file.close())
         failToWrite();
+}
+
+} // namespace
+
+std::string readFile(const std::string& path, std::size_t bound) {
+    return readWhole(path, bound, true);
+}
+
+std::string readBytes(const std::string& path, std::size_t bound) {
+    return readWhole(path, bound, false);
+}
+
+void replaceFile(const std::string& path, std::string_view bytes) {
+    const std::string beside = path + "." + std::to_string(getpid()) + ".new";
+    try {
+        Descriptor file(beside, O_WRONLY | O_CREAT | O_TRUNC);
+        writeTo(file, bytes);
+        if (rename(beside.c_str(), path.c_str()) != 0)
+            failToWrite();
+    } catch (...) {
+        unlink(beside.c_str());
+        throw;
+    }
+}
+
+void writeFile(const std::string& path, std::string_view text) {
+    Descriptor file(path, O_WRONLY | O_CREAT | O_TRUNC);
+    writeTo(file, text);
 }
 
 bool isSameFile(const std::string& a, const std::string& b) {

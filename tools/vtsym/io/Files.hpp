@@ -25,6 +25,13 @@ public:
 /// first bytes, and where the system refuses.  Waits for the other end of a pipe.
 std::string readFile(const std::string& path, std::size_t bound);
 
+/// Reads any file of that many bytes at most.  Throws FileError as above.
+std::string readBytes(const std::string& path, std::size_t bound);
+
+/// Puts a file in the place of another one in one step: others read either of them.  Throws FileError, after which the
+/// file is as it was.
+void replaceFile(const std::string& path, std::string_view bytes);
+
 /// Replaces the content of a file.  Throws FileError, after which the file may hold a part of the text.
 void writeFile(const std::string& path, std::string_view text);
 

@@ -97,7 +97,9 @@ std::vector<std::string> shellWords(std::string_view command) {
 }
 
 CompileCommands CompileCommands::read(std::string_view json, const std::function<void(VT::BuildMacros&)>& further,
-                                      const Problem& problem) {
+                                      const Problem& problem, ContentHash* read) {
+    if (read != nullptr)
+        read->add(json).add(fs::current_path().string());
     const Json entries = Json::parse(json, nullptr, false);
     if (!entries.is_array())
         refuseDatabase("it is no JSON list of commands");
@@ -111,6 +113,8 @@ CompileCommands CompileCommands::read(std::string_view json, const std::function
         } catch (const FileError& error) {
             problem(shownPath(path) + " " + error.what() + ": macros that are not defined may be defined there");
         }
+        if (isNew && read != nullptr)
+            read->add(known->second ? "read" : "unread").add(known->second.value_or(""));
         return known->second;
     };
     std::map<std::string, VT::BuildMacros> ofOthers;    // by key

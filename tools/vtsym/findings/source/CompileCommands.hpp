@@ -2,6 +2,7 @@
 #pragma once
 
 #include "base/scan/build/BuildMacros.hpp"
+#include "tools/vtsym/findings/cache/ContentHash.hpp"
 
 #include <functional>
 #include <map>
@@ -24,8 +25,9 @@ public:
     /// Reads a database, compile_commands.json.  Definitions of the command line, in `further`, come after those of
     /// each command.  Throws FileError for a text that is none.  A file that a command includes and that cannot be read
     /// is a problem; macros that are not defined may be then.
+    /// `read`, if given, takes everything that was read, and the folder that paths are shown from.
     static CompileCommands read(std::string_view json, const std::function<void(VT::BuildMacros&)>& further,
-                                const Problem& problem);
+                                const Problem& problem, ContentHash* read = nullptr);
 
     /// The different configurations of a file: of all commands that compile it; for other files, such as headers, of
     /// all commands, where what is not defined may be defined before.

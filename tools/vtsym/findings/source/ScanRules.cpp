@@ -10,6 +10,8 @@ namespace vtsym {
 
 namespace {
 
+constexpr std::array<std::string_view, 3> causes{"", "configuration", "undefined-name"}; // as VT::BranchCause
+
 constexpr auto rules = std::to_array<FindingRule>({
     {"dead", "A branch is never entered.",
      "The condition contradicts a directive around the branch or before it in its chain, so that no definition of the "
@@ -126,6 +128,11 @@ const FindingRule* scanRule(std::string_view kind) {
     return rule == rules.end() ? nullptr : rule;
 }
 
+std::optional<std::string_view> findingCause(std::string_view text) {
+    const auto* const known = std::ranges::find(causes, text);
+    return known == causes.end() ? std::nullopt : std::optional(*known);
+}
+
 Finding findingOf(const std::string& file, const VT::BranchFinding& found, std::size_t configurations) {
     const FindingRule& rule = rules.at(static_cast<std::size_t>(found.kind));
     Finding finding;
@@ -157,7 +164,6 @@ Finding findingOf(const std::string& file, const VT::BranchFinding& found, std::
             finding.configurations.push_back(configuration + 1);
         finding.ofConfigurations = configurations;
     }
-    constexpr std::array<std::string_view, 3> causes{"", "configuration", "undefined-name"}; // as VT::BranchCause
     finding.cause = causes.at(static_cast<std::size_t>(found.cause));
     finding.witness = found.witness;
     if (const std::string on = settingsOn(found.witness); !on.empty())

@@ -18,6 +18,9 @@ std::span<const FindingRule> scanRules();
 /// The rule of a kind; nullptr for an unknown one.
 const FindingRule* scanRule(std::string_view kind);
 
+/// The program's own text of a cause, as findings have it; nothing for an unknown one.
+std::optional<std::string_view> findingCause(std::string_view text);
+
 /// Returns a finding of the scanner in a file that is built in so many configurations.
 Finding findingOf(const std::string& file, const VT::BranchFinding& found, std::size_t configurations);
 

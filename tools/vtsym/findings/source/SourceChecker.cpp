@@ -31,68 +31,115 @@ std::optional<std::string> problemOf(const VT::Suppression& suppression) {
     return std::nullopt;
 }
 
+struct MacroFile {
+    std::string path;
+    std::string text;
+};
+
+/// Adds the macros that options define.
+void addOptions(const ScanSettings& settings, const std::vector<MacroFile>& macroFiles, VT::BuildMacros& build) {
+    for (const std::string& definition : settings.defines) {
+        const std::string name = definition.substr(0, definition.find_first_of("=("));
+        if (std::ranges::find(settings.undefines, name) != settings.undefines.end())
+            throw UsageError("-D", quotedArgument(name) + " is undefined by -U too; leave out one of them");
+        if (!build.define(definition))
+            throw UsageError("-D", quotedArgument(definition) + " does not begin with a name; write NAME=VALUE");
+    }
+    for (const std::string& name : settings.undefines)
+        if (!build.undefine(name))
+            throw UsageError("-U", quotedArgument(name) + " is not a name");
+    for (const MacroFile& file : macroFiles)
+        build.addFile(file.path, file.text, isCppPath(file.path));
+}
+
 } // namespace
 
 SourceChecker::SourceChecker(const ScanSettings& settings, const CompileCommands::Problem& problem)
     : settings_(settings),
       scanner_({.strictIncludes = settings.strictIncludes, .why = settings.why}),
       kinds_(settings.kinds.empty() ? kindsOf("--kinds", "usual") : settings.kinds) {
-    for (const std::string& condition : settings.assumptions)
+    assume();
+    if (!scanner_.assumptionsCanHold())
+        throw UsageError("--assume", "the conditions contradict each other; leave out some of them");
+    auto build = std::make_shared<Build>();
+    readBuild(*build, problem);
+    build_ = std::move(build);
+}
+
+SourceChecker::SourceChecker(const SourceChecker& other)
+    : settings_(other.settings_),
+      scanner_({.strictIncludes = settings_.strictIncludes, .why = settings_.why}),
+      kinds_(other.kinds_),
+      build_(other.build_) {
+    assume();
+}
+
+void SourceChecker::assume() {
+    for (const std::string& condition : settings_.assumptions)
         if (const auto wrong = scanner_.assume(condition))
             throw UsageError("--assume", quotedArgument(condition) + " " + *wrong);
-    for (const AssumedConfiguration& configuration : settings.configurations) {
+    for (const AssumedConfiguration& configuration : settings_.configurations) {
         scanner_.beginAlternative();
         for (const std::string& line : configuration.assumptions)
             if (const auto wrong = scanner_.assume(line))
                 throw UsageError("--configuration", quotedArgument(line) + " of " + configuration.name + " " + *wrong);
     }
-    if (!scanner_.assumptionsCanHold())
-        throw UsageError("--assume", "the conditions contradict each other; leave out some of them");
-    for (const std::string& path : settings.macroFiles) {
+}
+
+/// Reads the macros that options and commands define.
+void SourceChecker::readBuild(Build& build, const CompileCommands::Problem& problem) const {
+    std::vector<MacroFile> macroFiles;
+    for (const std::string& path : settings_.macroFiles) {
         try {
-            macroFiles_.push_back({path, readFile(path, settings.mostBytes)});
+            macroFiles.push_back({path, readFile(path, settings_.mostBytes)});
+            build.files.add(macroFiles.back().text);
         } catch (const FileError& error) {
             throw UsageError("--imacros", path + " " + error.what());
         }
     }
-    addOptions(build_);
-    if (settings.compileCommands.empty())
+    addOptions(settings_, macroFiles, build.ofOptions);
+    if (settings_.compileCommands.empty())
         return;
     try {
-        const std::string database = readFile(settings.compileCommands, settings.mostBytes);
-        commands_ = CompileCommands::read(
-            database, [this](VT::BuildMacros& build) { addOptions(build); }, problem);
+        const std::string database = readFile(settings_.compileCommands, settings_.mostBytes);
+        build.commands = CompileCommands::read(
+            database, [&](VT::BuildMacros& macros) { addOptions(settings_, macroFiles, macros); }, problem,
+            &build.files);
     } catch (const FileError& error) {
-        throw UsageError("--compile-commands", settings.compileCommands + " " + error.what());
+        throw UsageError("--compile-commands", settings_.compileCommands + " " + error.what());
     }
-}
-
-/// Adds the macros that options define.
-void SourceChecker::addOptions(VT::BuildMacros& build) const {
-    for (const std::string& definition : settings_.defines) {
-        const std::string name = definition.substr(0, definition.find_first_of("=("));
-        if (std::ranges::find(settings_.undefines, name) != settings_.undefines.end())
-            throw UsageError("-D", quotedArgument(name) + " is undefined by -U too; leave out one of them");
-        if (!build.define(definition))
-            throw UsageError("-D", quotedArgument(definition) + " does not begin with a name; write NAME=VALUE");
-    }
-    for (const std::string& name : settings_.undefines)
-        if (!build.undefine(name))
-            throw UsageError("-U", quotedArgument(name) + " is not a name");
-    for (const MacroFile& file : macroFiles_)
-        build.addFile(file.path, file.text, isCppPath(file.path));
 }
 
 bool SourceChecker::isAsked(const Finding& finding) const {
     return finding.level >= settings_.severity && std::ranges::find(kinds_, finding.kind) != kinds_.end();
 }
 
+void addCounts(VT::SourceScanCounts& to, const VT::SourceScanCounts& more) {
+    to.branches += more.branches;
+    to.unread += more.unread;
+    to.undecided += more.undecided;
+    to.steps += more.steps;
+    to.leftOut += more.leftOut;
+}
+
+CheckedFile SourceChecker::checkAndCount(const std::string& path, std::string_view text) {
+    const VT::SourceScanCounts before = scanner_.counts();
+    CheckedFile checked{check(path, text), scanner_.counts()};
+    VT::SourceScanCounts& counts = checked.counts;
+    counts.branches -= before.branches;
+    counts.unread -= before.unread;
+    counts.undecided -= before.undecided;
+    counts.steps -= before.steps;
+    counts.leftOut -= before.leftOut;
+    return checked;
+}
+
 std::vector<FileFinding> SourceChecker::check(const std::string& path, std::string_view text) {
     VT::SourceFile file{text, isCppPath(path)};
-    if (commands_)
-        file.configurations = commands_->of(path);
-    if (file.configurations.empty() && !build_.empty())
-        file.configurations = {&build_};
+    if (build_->commands)
+        file.configurations = build_->commands->of(path);
+    if (file.configurations.empty() && !build_->ofOptions.empty())
+        file.configurations = {&build_->ofOptions};
     const std::size_t alternatives = settings_.configurations.size();
     const std::size_t builds = file.configurations.size();
     const std::size_t configurations = std::min(

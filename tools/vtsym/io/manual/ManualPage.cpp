@@ -1,6 +1,6 @@
 // Writes the manual page with the macros of man(7): the program, then a section for each command with its options,
 // notes and examples.  The page carries no date, so that the same program always writes the same page.
-#include "tools/vtsym/io/ManualPage.hpp"
+#include "tools/vtsym/io/manual/ManualPage.hpp"
 
 #include <sstream>
 #include <string_view>

@@ -1,6 +1,6 @@
 // Writes completion scripts: a table of the commands, options and words, and what the shell needs to look them up.
 // Files are completed where an argument is one; texts of conditions are not completed.
-#include "tools/vtsym/io/Completions.hpp"
+#include "tools/vtsym/io/manual/Completions.hpp"
 
 #include <algorithm>
 #include <string_view>

@@ -1,0 +1,129 @@
+// Works on items with oneTBB.
+//
+// Method: a pipeline of three filters, the first and the last in order.  As many items are under way as there are
+// slots, so that the item of a slot is finished before the slot is used again.  An exception waits in its slot until
+// the items before it are finished. Relies on: threads of an arena have numbers below its size.
+#include "tools/vtsym/io/InOrder.hpp"
+
+#include <oneapi/tbb/global_control.h>
+#include <oneapi/tbb/info.h>
+#include <oneapi/tbb/parallel_pipeline.h>
+#include <oneapi/tbb/task_arena.h>
+
+#include <atomic>
+#include <exception>
+#include <utility>
+#include <vector>
+
+namespace vtsym {
+
+namespace {
+
+/// Bytes of a worker's stack: as many as the first thread of a process usually has, for which the depth of texts is
+/// bounded.
+constexpr std::size_t stackBytes = std::size_t{8} << 20U;
+
+/// One run with several workers.
+class OrderedRun {
+public:
+    OrderedRun(std::size_t slots, const OrderedWork& work) : work_(work), errors_(slots), steps_(slots) {}
+
+    /// Goes on with the first two items, which are in their slots.
+    void run() {
+        namespace tbb = oneapi::tbb;
+        constexpr auto inOrder = tbb::filter_mode::serial_in_order;
+        tbb::parallel_pipeline(
+            errors_.size(),
+            tbb::make_filter<void, std::size_t>(inOrder, [this](tbb::flow_control& control) {
+                if (!next())
+                    control.stop();
+                return (items_ - 1) % errors_.size();
+            }) & tbb::make_filter<std::size_t, std::size_t>(tbb::filter_mode::parallel, [this](std::size_t slot) {
+                workOn(slot);
+                return slot;
+            }) & tbb::make_filter<std::size_t, void>(inOrder, [this](std::size_t slot) { finish(slot); }));
+    }
+
+private:
+    bool next() {
+        const std::size_t slot = items_ % errors_.size();
+        if (ended_)
+            return false;
+        try {
+            if (items_ >= 2 && !work_.next(slot))
+                return false;
+        } catch (...) {
+            ended_ = true;
+            errors_[slot] = std::current_exception();
+        }
+        ++items_;
+        handOver(slot);
+        return true;
+    }
+
+    void workOn(std::size_t slot) {
+        takeOver(slot);
+        try {
+            if (!errors_[slot])
+                work_.work(slot, static_cast<std::size_t>(oneapi::tbb::this_task_arena::current_thread_index()));
+        } catch (...) {
+            errors_[slot] = std::current_exception();
+        }
+        handOver(slot);
+    }
+
+    // The library orders the steps of an item; a race detector that does not see into it sees these.
+    void handOver(std::size_t slot) { steps_[slot].fetch_add(1, std::memory_order_release); }
+
+    void takeOver(std::size_t slot) { static_cast<void>(steps_[slot].load(std::memory_order_acquire)); }
+
+    void finish(std::size_t slot) {
+        takeOver(slot);
+        if (const std::exception_ptr error = std::exchange(errors_[slot], nullptr))
+            std::rethrow_exception(error);
+        work_.finish(slot);
+    }
+
+    const OrderedWork& work_;
+    std::vector<std::exception_ptr> errors_;   ///< by slot
+    std::vector<std::atomic<unsigned>> steps_; ///< by slot: of its items
+    std::size_t items_ = 0;
+    bool ended_ = false; ///< by an exception
+};
+
+/// Puts the second item into its slot.  Where that fails, the first one is finished nevertheless.
+bool nextOrFirst(const OrderedWork& work) {
+    try {
+        return work.next(1);
+    } catch (...) {
+        work.work(0, 0);
+        work.finish(0);
+        throw;
+    }
+}
+
+} // namespace
+
+std::size_t processors() {
+    return static_cast<std::size_t>(oneapi::tbb::info::default_concurrency());
+}
+
+void runInOrder(std::size_t jobs, const OrderedWork& work) {
+    if (jobs == 1) {
+        runOneByOne(work);
+        return;
+    }
+    if (!work.next(0))
+        return;
+    if (!nextOrFirst(work)) {
+        work.work(0, 0);
+        work.finish(0);
+        return;
+    }
+    const oneapi::tbb::global_control stack(oneapi::tbb::global_control::thread_stack_size, stackBytes);
+    const oneapi::tbb::global_control threads(oneapi::tbb::global_control::max_allowed_parallelism, jobs);
+    oneapi::tbb::task_arena arena(static_cast<int>(jobs));
+    arena.execute([&] { OrderedRun(slotsFor(jobs), work).run(); });
+}
+
+} // namespace vtsym
