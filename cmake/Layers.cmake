@@ -65,6 +65,8 @@ target_include_directories(vtsym INTERFACE $<BUILD_INTERFACE:${PROJECT_SOURCE_DI
   $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}/vtsym>)
 set_target_properties(vtsym PROPERTIES VERSION ${PROJECT_VERSION} SOVERSION ${VTSYM_ABI}
   LINKER_LANGUAGE CXX LIBRARY_OUTPUT_DIRECTORY ${PROJECT_BINARY_DIR}/lib)
+# The library calls its own functions, whatever else the process has of the same names: loading it need not look them up.
+target_link_options(vtsym PRIVATE -Wl,-Bsymbolic-functions)
 if(VTSYM_EMBEDDED_HOST AND NOT VTSYM_SANITIZE AND NOT VTSYM_SANITIZE_THREAD)
   target_link_options(vtsym PRIVATE -Wl,--no-undefined)
 endif()

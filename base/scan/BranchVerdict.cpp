@@ -1,6 +1,7 @@
 // Judges a condition under known facts.
 //
-// Method: a verdict is a question to the decider: disjoint from the facts, implied by them, or equivalent to a shorter
+// Method: a comparison of one symbol under comparisons of it is judged by sets of values, see KnownValues.  Any other
+// verdict is a question to the decider: disjoint from the facts, implied by them, or equivalent to a shorter
 // condition (ImpliedCondition) under them.  Reasons are minimised as in delta debugging (Zeller, Hildebrandt,
 // "Simplifying and isolating failure-inducing input", 2002): runs of facts are dropped, in halves of halves, while the
 // rest suffices.
@@ -28,7 +29,8 @@ std::size_t BranchJudge::QuestionHash::operator()(const Question& question) cons
 BranchJudge::BranchJudge(SymbolicExprTable& table)
     : table_(table),
       decider_(table, {.keywordsInForce = false, .steps = limits::branchDecisionSteps}),
-      printer_(table, false) {
+      printer_(table, false),
+      values_(table) {
     table.addBoolSymbols();
 }
 
@@ -131,8 +133,25 @@ bool BranchJudge::beginBranch() noexcept {
     return hasSteps;
 }
 
+/// Judges a comparison of one symbol under comparisons of it, without the decider.  Costs the same whatever was asked
+/// before.
+std::optional<BranchVerdict> BranchJudge::judgeByValues(SymbolicExprId condition, const KnownConditions& known) {
+    if (!known.includeLaws.empty() || !known.undefinedLaws.empty())
+        return std::nullopt;
+    const std::optional<ValueVerdict> values = values_.judge(condition, known.facts);
+    if (!values)
+        return std::nullopt;
+    spend(known.facts.size() + 1);
+    return BranchVerdict{*values == ValueVerdict::Never    ? BranchVerdictKind::Dead
+                         : *values == ValueVerdict::Always ? BranchVerdictKind::AlwaysTrue
+                                                           : BranchVerdictKind::None,
+                         invalidId};
+}
+
 BranchVerdict BranchJudge::judge(SymbolicExprId condition, const KnownConditions& known) {
     beginQuestion();
+    if (const std::optional<BranchVerdict> verdict = judgeByValues(condition, known))
+        return *verdict;
     const Question question{condition, all(known.facts, known.includeLaws, known.undefinedLaws),
                             all(known.facts, known.includeLaws, {})};
     auto judged = judged_.find(question);

@@ -6,6 +6,7 @@
 #include "base/decide/Decider.hpp"
 #include "base/decide/reasons/MinimalSubset.hpp"
 #include "base/print/ExpressionPrinter.hpp"
+#include "base/scan/facts/KnownValues.hpp"
 
 #include <functional>
 #include <optional>
@@ -92,12 +93,14 @@ private:
     bool proven(Ask ask);
     bool holds(BranchVerdict verdict, SymbolicExprId condition, SymbolicExprId known);
     BranchVerdictKind statedBy(std::span<const SymbolicExprId> facts, SymbolicExprId condition);
+    std::optional<BranchVerdict> judgeByValues(SymbolicExprId condition, const KnownConditions& known);
     BranchVerdict decide(const Question& question, std::span<const SymbolicExprId> facts);
     SymbolicExprId shortened(SymbolicExprId condition, SymbolicExprId known);
 
     SymbolicExprTable& table_;
     Decider decider_;
     SymbolicExprPrinter printer_;
+    KnownValues values_;
     std::unordered_map<Question, Judged, QuestionHash> judged_;
     std::int64_t fileStepsLeft_ = 0; ///< a question may leave a debt, which later conditions pay off
     std::uint64_t stepsLeft_ = 0;    ///< of the question

@@ -47,7 +47,7 @@ void FileScan::beginBranch(const Directive& directive) {
     if (opensChain(directive.kind)) {
         const bool silent = isSilent();
         states_.open();
-        chains_.push_back({context_.size(), silent});
+        chains_.push_back({context_.size(), context_.size(), silent});
     } else if (chains_.empty()) {
         return;
     } else {
@@ -75,7 +75,7 @@ void FileScan::leaveBranch() {
     states_.nextBranch();
     Chain& chain = chains_.back();
     if (chain.hasFact)
-        context_.negateLast();
+        context_.negateFrom(chain.branchFact);
     chain.hasFact = false;
 }
 
@@ -92,10 +92,11 @@ void FileScan::readBranch(const Directive& directive) {
     }
     judgeBranch(directive, condition);
     chain.hasFact = true;
-    context_.push(
-        {condition.node, false, directive.line, directive.begin, directive.end, std::move(condition.unknowns)});
-    if (input_.options.why)
-        context_.keepSpellings(std::move(condition.spellings));
+    chain.branchFact = context_.size();
+    if (!input_.options.why)
+        condition.spellings.clear();
+    context_.push({condition.node, false, directive.line, directive.begin, directive.end, std::move(condition.unknowns),
+                   std::move(condition.spellings)});
 }
 
 /// Whether a condition has no && or ||.

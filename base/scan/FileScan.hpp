@@ -1,11 +1,11 @@
 // The scan of one file in one configuration.
 #pragma once
 
-#include "base/scan/BranchContext.hpp"
 #include "base/scan/BranchVerdict.hpp"
 #include "base/scan/MacroChanges.hpp"
 #include "base/scan/SourceScan.hpp"
 #include "base/scan/build/BuildAssumptions.hpp"
+#include "base/scan/facts/BranchContext.hpp"
 #include "base/scan/report/BranchWhy.hpp"
 
 #include <functional>
@@ -53,9 +53,10 @@ public:
 private:
     struct Chain {
         std::size_t firstFact;
-        bool silentAround;    ///< nothing is reported about the whole chain
-        bool silent = false;  ///< nothing is reported inside the branch
-        bool hasFact = false; ///< the branch's condition is the last fact
+        std::size_t branchFact; ///< the first of the branch's condition
+        bool silentAround;      ///< nothing is reported about the whole chain
+        bool silent = false;    ///< nothing is reported inside the branch
+        bool hasFact = false;   ///< the branch's condition is the last facts
         bool hadElse = false;
         bool switchedOn = false;               ///< a branch before is entered by a switch
         BranchCause cause = BranchCause::Code; ///< of what follows

@@ -116,6 +116,11 @@ MacroUnknownId MacroUnknowns::unique(std::string text) {
     return add({MacroUnknown::Kind::Term, subject, {0, 0, false, true}, 0, invalidId, std::move(text), {}});
 }
 
+std::optional<MacroUnknownId> MacroUnknowns::idOf(SymbolicExprId node) const {
+    const auto known = byNode_.find(node);
+    return known == byNode_.end() ? std::nullopt : std::optional(known->second);
+}
+
 const MacroUnknown* MacroUnknowns::find(SymbolicExprId node) const {
     const auto known = byNode_.find(node);
     return known == byNode_.end() ? nullptr : &unknowns_[known->second];

@@ -57,6 +57,7 @@ public:
 
     /// Returns the unknown of a symbol, or nullptr.
     [[nodiscard]] const MacroUnknown* find(SymbolicExprId node) const;
+    [[nodiscard]] std::optional<MacroUnknownId> idOf(SymbolicExprId node) const;
 
 private:
     struct Key {

@@ -37,6 +37,26 @@ Examples:
   vtsym check model.json
   vtsym scan src include)";
 
+/// Adds the command that a command line begins with; all commands for any other word, and for those that describe all.
+void addCommands(CommandLine& commandLine, const std::string& first) {
+    struct Row {
+        const char* name; ///< empty for a command that describes all
+        void (*add)(CommandLine&);
+    };
+
+    static constexpr Row rows[] = {{"simplify", addSimplify}, {"compare", addCompare}, {"given", addGiven},
+                                   {"check", addCheck},       {"scan", addScan},       {"convert", addConvert},
+                                   {"pp", addPreprocess},     {"tree", addTree},       {"eval", addEval},
+                                   {"dims", addDims},         {"symbols", addSymbols}, {"replace", addReplace},
+                                   {"repl", addRepl},         {"lsp", addLsp},         {"operators", addOperators},
+                                   {"", addManual},           {"", addCompletion}};
+    for (const Row& row : rows)
+        if (first == row.name && !first.empty())
+            return row.add(commandLine);
+    for (const Row& row : rows)
+        row.add(commandLine);
+}
+
 void addFeatureOption(CommandLine& commandLine) {
     std::string flags;
     for (const VtFeature* feature : VtFeature::all())
@@ -56,10 +76,7 @@ void complain(Console& console, const std::string& problem) {
 /// Reads the command line and runs its command.  `onError` becomes the status for a command that throws.
 int readAndRun(Console& console, std::vector<std::string> arguments, ExitStatus& onError) {
     CommandLine commandLine(description, VTSYM_VERSION, programNotes);
-    for (const auto add :
-         {addSimplify, addCompare, addGiven, addCheck, addScan, addConvert, addPreprocess, addTree, addEval, addDims,
-          addSymbols, addReplace, addRepl, addLsp, addOperators, addManual, addCompletion})
-        add(commandLine);
+    addCommands(commandLine, arguments.empty() ? "" : arguments.front());
     addFeatureOption(commandLine);
     if (arguments.empty()) {
         console.err("vtsym: a command is missing; choose one of those below\n\n" + commandLine.help());

@@ -10,7 +10,7 @@
 #include "base/core/Make.hpp"
 #include "base/decide/Assumptions.hpp"
 #include "base/decide/Decider.hpp"
-#include "base/scan/BranchContext.hpp"
+#include "base/scan/facts/BranchContext.hpp"
 #include "base/scan/DirectiveCondition.hpp"
 #include "base/scan/report/DirectiveTexts.hpp"
 #include "base/scan/report/SourcePlaces.hpp"

@@ -11,7 +11,7 @@
 #include "base/core/Make.hpp"
 #include "base/core/Walk.hpp"
 #include "base/decide/shorten/ShortestForm.hpp"
-#include "base/scan/BranchContext.hpp"
+#include "base/scan/facts/BranchContext.hpp"
 #include "base/scan/MacroChanges.hpp"
 #include "base/scan/report/ConditionProposal.hpp"
 #include "base/scan/report/DirectiveTexts.hpp"

@@ -1,19 +1,55 @@
 // Facts around a branch, and laws about their macros.
 //
-// Method: an index from groups of unknowns (those about one macro in one version) to facts.  related() collects facts
-// in waves from the groups of the condition.  laws() sorts the unknowns by macro, version and epoch and relates
-// neighbours.
-// Cost: push and pop O(unknowns of the fact); related() bounded by limits::factWeight and limits::factWindow.
-#include "base/scan/BranchContext.hpp"
+// Method: a condition that holds is as many facts as its And has operands.  There is an index from groups of unknowns
+// (those about one macro in one version) to facts.  related() collects facts in waves from the groups of the condition.
+// laws() sorts the unknowns by macro, version and epoch and relates neighbours. Cost: push and pop O(unknowns of the
+// fact); related() bounded by limits::factWeight and limits::factWindow.
+#include "base/scan/facts/BranchContext.hpp"
 
 #include "base/core/Limits.hpp"
+#include "base/core/Walk.hpp"
 
 #include <algorithm>
 #include <tuple>
 
 namespace VT {
 
-void BranchContext::push(BranchFact fact) {
+std::vector<MacroUnknownId> BranchContext::unknownsIn(SymbolicExprId node) const {
+    std::vector<MacroUnknownId> found;
+    walkDistinct(
+        table_, node,
+        [&](SymbolicExprId id, const SymbolicExpr&) {
+            if (const std::optional<MacroUnknownId> unknown = unknowns_.idOf(id))
+                found.push_back(*unknown);
+        },
+        [](SymbolicExprId) {});
+    return found;
+}
+
+void BranchContext::push(const BranchFact& fact) {
+    std::vector<SymbolicExprId> operands{fact.node};
+    for (std::size_t i = 0; i < operands.size() && operands.size() <= limits::factWindow;) {
+        const SymbolicExpr* const node = table_.get(operands[i]);
+        if (node->op() != SymbolicOp::And) {
+            ++i;
+            continue;
+        }
+        operands.insert(operands.begin() + static_cast<std::ptrdiff_t>(i) + 1, node->getInput(1));
+        operands[i] = node->getInput(0);
+    }
+    if (operands.size() > limits::factWindow)
+        operands = {fact.node};
+    for (const SymbolicExprId operand : operands) {
+        BranchFact part = fact;
+        part.whole = fact.node;
+        part.node = operand;
+        if (operands.size() > 1)
+            part.unknowns = unknownsIn(operand);
+        add(std::move(part));
+    }
+}
+
+void BranchContext::add(BranchFact fact) {
     const auto at = static_cast<std::uint32_t>(facts_.size());
     byGroup_.resize(unknowns_.groups());
     groupMarks_.resize(unknowns_.groups());
@@ -23,10 +59,16 @@ void BranchContext::push(BranchFact fact) {
     marks_.push_back(0);
 }
 
-void BranchContext::negateLast() {
-    BranchFact& last = facts_.back();
-    last.negated = !last.negated;
-    last.node = SymbolicNotExpr(table_, last.node).getId(table_);
+void BranchContext::negateFrom(std::size_t first) {
+    BranchFact opposite = facts_[first];
+    opposite.negated = true;
+    opposite.node = SymbolicNotExpr(table_, opposite.whole).getId(table_);
+    for (std::size_t i = first + 1; i < facts_.size(); ++i)
+        opposite.unknowns.insert(opposite.unknowns.end(), facts_[i].unknowns.begin(), facts_[i].unknowns.end());
+    std::ranges::sort(opposite.unknowns);
+    opposite.unknowns.erase(std::unique(opposite.unknowns.begin(), opposite.unknowns.end()), opposite.unknowns.end());
+    pop(first);
+    add(std::move(opposite));
 }
 
 void BranchContext::pop(std::size_t size) {

@@ -11,13 +11,14 @@ namespace VT {
 
 /// A condition that holds, or does not, where a branch begins.
 struct BranchFact {
-    SymbolicExprId node; ///< the condition that holds
+    SymbolicExprId node; ///< the condition that holds, or an operand of its And
     bool negated;        ///< the directive's condition does not hold
     std::uint64_t line;
     std::size_t begin; ///< the directive, in bytes
     std::size_t end;
     std::vector<MacroUnknownId> unknowns;
     std::vector<PartSpelling> spellings{}; ///< in the directive's tokens; kept where reasons are written
+    SymbolicExprId whole = invalidId;      ///< the directive's condition
 };
 
 /// The facts of the open chains of one file, found by the macros that they are about.
@@ -29,13 +30,12 @@ public:
 
     [[nodiscard]] const BranchFact& operator[](std::size_t at) const { return facts_[at]; }
 
-    void push(BranchFact fact);
+    /// Adds the condition of a directive.  The operands of an And become facts of their own, each about its own macros,
+    /// so that macros are related through those alone; an And of more than limits::factWindow stays one.
+    void push(const BranchFact& fact);
 
-    /// Keeps how the parts of the last fact are written.
-    void keepSpellings(std::vector<PartSpelling> spellings) { facts_.back().spellings = std::move(spellings); }
-
-    /// Turns the last fact into its opposite.
-    void negateLast();
+    /// Turns the facts from a position on, which are those of one directive, into its opposite.
+    void negateFrom(std::size_t first);
     void pop(std::size_t size);
 
     /// Returns the positions of the facts that are related to unknowns, in order: those about the same macros, those
@@ -53,6 +53,10 @@ public:
     Laws laws(std::vector<MacroUnknownId> unknowns);
 
 private:
+    void add(BranchFact fact);
+    /// The unknowns whose symbols a condition has.
+    [[nodiscard]] std::vector<MacroUnknownId> unknownsIn(SymbolicExprId node) const;
+
     SymbolicExprTable& table_;
     MacroUnknowns& unknowns_;
     std::vector<BranchFact> facts_;
