@@ -46,3 +46,12 @@ if(VTSYM_SANITIZE)
     target_compile_options(vtsym_options INTERFACE -Wno-maybe-uninitialized)
   endif()
 endif()
+if(VTSYM_FUZZ)
+  # Unsigned arithmetic wraps on purpose, in hashes and in numbers of more than one word; everything else that could be a
+  # slip is an error, also where the language defines it.
+  set(flags -fsanitize=fuzzer-no-link,address,undefined,float-cast-overflow,float-divide-by-zero,integer,nullability
+      -fno-sanitize=unsigned-integer-overflow,unsigned-shift-base -fno-sanitize-recover=all -fno-omit-frame-pointer)
+  target_compile_options(vtsym_options INTERFACE ${flags}
+    -fsanitize-ignorelist=${PROJECT_SOURCE_DIR}/fuzz/libraries.txt)
+  target_link_options(vtsym_options INTERFACE ${flags})
+endif()

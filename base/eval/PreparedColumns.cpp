@@ -173,7 +173,7 @@ void PreparedExprColumns::placeOperations() {
 }
 
 std::byte* PreparedExprColumns::buffer(std::uint32_t number) noexcept {
-    return storage_.data()->bytes + number * blockRows_ * sizeof(double);
+    return reinterpret_cast<std::byte*>(storage_.data()) + number * blockRows_ * sizeof(double);
 }
 
 void PreparedExprColumns::fillConstants() {

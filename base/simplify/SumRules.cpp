@@ -11,7 +11,6 @@
 #include "base/util/IdMap.hpp"
 
 #include <algorithm>
-#include <ranges>
 
 namespace VT {
 
@@ -121,7 +120,8 @@ bool LinearSum::read(const RuleContext& context, SymbolicExprId root) {
         return false;
     // How often a node occurs is known once everything above it has been counted.
     multiples.insert(root, 1);
-    for (const SymbolicExprId id : order | std::views::reverse) {
+    for (auto next = order.rbegin(); next != order.rend(); ++next) {
+        const SymbolicExprId id = *next;
         const SymbolicExpr& node = context.node(id);
         if (!sumOps.contains(node.op()))
             continue;

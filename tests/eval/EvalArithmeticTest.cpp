@@ -5,7 +5,7 @@
 #include "base/eval/EvalVisitor.hpp"
 #include "tests/support/TreeReader.hpp"
 #include "tests/support/generators/AnyNode.hpp"
-#include "tests/support/oracles/Truth.hpp"
+#include "tests/support/oracles/WideArithmetic.hpp"
 
 #include <gtest/gtest.h>
 
@@ -23,140 +23,6 @@
 namespace VT::Testing {
 namespace {
 
-constexpr double infinity = std::numeric_limits<double>::infinity();
-constexpr double threshold = 1.4901161193847656e-08;
-constexpr std::int64_t greatest = 2147483647;
-constexpr std::int64_t least = -2147483648;
-
-/// Values at which something changes: bounds of int, of shifts and of the tolerance, signs, halves, what is no number.
-const std::vector<SymbolicScalar>& corners() {
-    static const std::vector<SymbolicScalar> all = [] {
-        std::vector<SymbolicScalar> values{false, true, std::numeric_limits<double>::quiet_NaN()};
-        for (const int value :
-             {-2147483647 - 1, -2147483647, -33, -32, -31, -7, -1, 0, 1, 2, 31, 32, 33, 46341, 2147483646, 2147483647})
-            values.emplace_back(value);
-        for (const double value : {threshold, std::nextafter(threshold, 0.0), std::nextafter(threshold, 1.0), 0.0, 0.5,
-                                   0.3, 0.1 + 0.2, 1.0, 1.0 + threshold, 31.9, 32.0, 2147483647.5, 2147483648.0,
-                                   2147483648.5, 2147483649.0, 1e300, 5e-324, infinity})
-            values.insert(values.end(), {value, -value});
-        return values;
-    }();
-    return all;
-}
-
-SymbolicExprId literal(SymbolicExprTable& table, const SymbolicScalar& value) {
-    if (value.type() == ScalarType::Bool)
-        return SymbolicString(table, value.getBool() ? "true" : "false").getId(table);
-    if (value.type() == ScalarType::Int)
-        return SymbolicIntValue(table, value.getInt()).getId(table);
-    if (value == SymbolicScalar(-0.0)) // as a literal it is that of 0
-        return SymbolicUnaryMinusExpr(table, literal(table, 0.0)).getId(table);
-    const SymbolicExprId found = Trees{table}.real(value.getDouble());
-    return found != invalidId ? found : table.size() - 1; // NaN is not found
-}
-
-/// A scalar in the oracle's hands: an integer without bounds, or a real.
-struct Wide {
-    bool isReal;
-    bool isBool;
-    std::int64_t integer;
-    double real;
-
-    explicit Wide(const SymbolicScalar& scalar)
-        : isReal(scalar.index() == 2),
-          isBool(scalar.index() == 0),
-          integer(isReal   ? 0
-                  : isBool ? (scalar.getBool() ? 1 : 0)
-                           : scalar.getInt()),
-          real(isReal ? scalar.getDouble() : static_cast<double>(integer)) {}
-
-    /// What bit operators see.
-    [[nodiscard]] std::int64_t bits() const {
-        if (!isReal)
-            return integer;
-        if (std::isnan(real))
-            return 0;
-        return static_cast<std::int64_t>(std::clamp(std::trunc(real), -2147483648.0, 2147483647.0));
-    }
-
-    [[nodiscard]] bool isTrue() const { return isReal ? !(real == 0.0) : integer != 0; }
-};
-
-/// The integer of 32 bits that is congruent.
-SymbolicScalar wrap(std::int64_t value) {
-    return static_cast<std::int32_t>(value);
-}
-
-SymbolicScalar saturate(std::int64_t value) {
-    return static_cast<std::int32_t>(std::clamp(value, least, greatest));
-}
-
-/// By a power of two, rounded down.
-SymbolicScalar shift(std::int64_t value, std::int64_t amount) {
-    if (amount < 0)
-        return wrap(value >> std::min<std::int64_t>(-amount, 63));
-    return amount > 31 ? SymbolicScalar(0) : wrap(value << amount);
-}
-
-SymbolicScalar divide(const Wide& a, const Wide& b) {
-    if (a.isReal || b.isReal) {
-        if (b.real >= threshold || b.real <= -threshold)
-            return a.real / b.real;
-        return std::isnan(a.real) ? a.real : std::signbit(a.real) && a.real != 0 ? -infinity : infinity;
-    }
-    if (b.integer != 0)
-        return saturate(a.integer / b.integer);
-    if (a.integer == 0)
-        return !a.isBool && !b.isBool ? 0 : static_cast<std::int32_t>(greatest);
-    return static_cast<std::int32_t>(a.integer > 0 ? greatest : least);
-}
-
-SymbolicScalar remainder(const Wide& a, const Wide& b) {
-    if (a.isReal || b.isReal)
-        return b.real > -threshold && b.real < threshold ? a.real : std::fmod(a.real, b.real);
-    return saturate(b.integer == 0 ? a.integer : a.integer % b.integer);
-}
-
-bool equal(const Wide& a, const Wide& b) {
-    if (!a.isReal && !b.isReal)
-        return a.integer == b.integer;
-    if (std::isnan(a.real) || std::isnan(b.real))
-        return std::isnan(a.real) && std::isnan(b.real);
-    return a.real == b.real || std::abs(a.real - b.real) < threshold;
-}
-
-bool less(const Wide& a, const Wide& b) {
-    return a.isReal || b.isReal ? a.real < b.real : a.integer < b.integer;
-}
-
-SymbolicScalar expected(SymbolicOp op, const Wide& a, const Wide& b) {
-    const bool real = a.isReal || b.isReal;
-    const auto number = [&](double inReals, std::int64_t inIntegers) {
-        return real ? SymbolicScalar(inReals) : wrap(inIntegers);
-    };
-    using Op = SymbolicOp;
-    const std::map<Op, std::function<SymbolicScalar()>> answers{
-        {Op::Plus, [&] { return number(a.real + b.real, a.integer + b.integer); }},
-        {Op::Minus, [&] { return number(a.real - b.real, a.integer - b.integer); }},
-        {Op::Multiply, [&] { return number(a.real * b.real, a.integer * b.integer); }},
-        {Op::UnaryMinus, [&] { return a.isReal ? SymbolicScalar(-a.real) : wrap(-a.integer); }},
-        {Op::Divide, [&] { return divide(a, b); }},
-        {Op::Modulo, [&] { return remainder(a, b); }},
-        {Op::Equal, [&] { return equal(a, b); }},
-        {Op::NotEqual, [&] { return !equal(a, b); }},
-        {Op::LessThan, [&] { return less(a, b); }},
-        {Op::GreaterThan, [&] { return less(b, a); }},
-        {Op::LessThanEqual, [&] { return less(a, b) || equal(a, b); }},
-        {Op::GreaterThanEqual, [&] { return less(b, a) || equal(a, b); }},
-        {Op::ShiftLeft, [&] { return shift(a.bits(), b.bits()); }},
-        {Op::ShiftRight, [&] { return shift(a.bits(), -b.bits()); }},
-    };
-    if (const auto answer = answers.find(op); answer != answers.end())
-        return answer->second();
-    return booleanOps.contains(op) ? SymbolicScalar(computed(op, a.isTrue(), b.isTrue()).value() != 0)
-                                   : wrap(computed(op, a.bits(), b.bits()).value());
-}
-
 std::string shown(const SymbolicScalar& value) {
     return std::string(1, "bid"[value.index()]) + ":" + std::to_string(value.toDouble());
 }
@@ -165,8 +31,8 @@ TEST(Arithmetic, AgreesWithWideIntegersOnEveryPairOfCornerValues) {
     SymbolicExprTable table;
     const SymbolicExprId a = Trees{table}.name("a"), b = Trees{table}.name("b");
     std::vector<SymbolicExprId> literals;
-    for (const SymbolicScalar& value : corners())
-        literals.push_back(literal(table, value));
+    for (const SymbolicScalar& value : cornerScalars())
+        literals.push_back(scalarLiteral(table, value));
     std::size_t operators = 0;
     for (const OperatorInfo& row : operatorTable()) {
         if (row.op <= SymbolicOp::DoubleValue || row.op == SymbolicOp::MemberValue || dimensionOps.contains(row.op))
@@ -181,10 +47,10 @@ TEST(Arithmetic, AgreesWithWideIntegersOnEveryPairOfCornerValues) {
         const std::size_t operands = operandCount(row.op).value();
         ++operators;
         PreparedExpr prepared = evaluator.prepare(id);
-        for (std::size_t i = 0; i < corners().size(); ++i)
-            for (std::size_t j = 0; j < (operands == 1 ? 1 : corners().size()); ++j) {
-                const SymbolicScalar &left = corners()[i], &right = corners()[j];
-                const SymbolicScalar wanted = visibleScalar(expected(row.op, Wide(left), Wide(right)));
+        for (std::size_t i = 0; i < cornerScalars().size(); ++i)
+            for (std::size_t j = 0; j < (operands == 1 ? 1 : cornerScalars().size()); ++j) {
+                const SymbolicScalar &left = cornerScalars()[i], &right = cornerScalars()[j];
+                const SymbolicScalar wanted = visibleScalar(expectedScalar(row.op, left, right));
                 table.registerValueId(a, literals[i]);
                 table.registerValueId(b, literals[j]);
                 prepared.set(0, left);
@@ -276,8 +142,7 @@ private:
         Outcome result{"", a.isVector || b.isVector, {}};
         const std::size_t count = a.isVector ? a.values.size() : b.values.size();
         for (std::size_t i = 0; i < count; ++i)
-            result.values.push_back(
-                expected(op, Wide(a.values[a.isVector ? i : 0]), Wide(b.values[b.isVector ? i : 0])));
+            result.values.push_back(expectedScalar(op, a.values[a.isVector ? i : 0], b.values[b.isVector ? i : 0]));
         return result;
     }
 
@@ -312,7 +177,7 @@ public:
             symbols.push_back(readTree(table, symbol));
         nodes = symbols;
         for (int i = 0; i < 8; ++i)
-            nodes.push_back(literal(table, anyScalar()));
+            nodes.push_back(scalarLiteral(table, anyScalar()));
         while (nodes.size() < 50) {
             const SymbolicOp op = isWild && below(30) == 0 ? operatorTable()[below(operatorTable().size())].op
                                   : below(15) == 0         ? SymbolicOp::DimsND
@@ -330,7 +195,7 @@ public:
 
     std::size_t below(std::size_t bound) { return random_() % bound; }
 
-    SymbolicScalar anyScalar() { return corners()[below(corners().size())]; }
+    SymbolicScalar anyScalar() { return cornerScalars()[below(cornerScalars().size())]; }
 
     /// Gives a symbol a number or a list of numbers, and answers it.
     SymbolicValue rebind(SymbolicExprId symbol) {
@@ -338,7 +203,7 @@ public:
         std::vector<SymbolicExprId> literals;
         for (std::size_t i = below(2) == 0 ? 2 : below(4); i > 0; --i) {
             elements.push_back(anyScalar());
-            literals.push_back(literal(table, elements.back()));
+            literals.push_back(scalarLiteral(table, elements.back()));
         }
         const bool isList = elements.empty() || below(6) == 0;
         table.registerValueId(symbol, isList ? SymbolicNDExpr(table, literals).getId(table) : literals.front());
@@ -439,7 +304,7 @@ public:
         while (values_.size() < rows) {
             const SymbolicScalar value = graph.anyScalar();
             std::byte* const to = first_ + static_cast<std::ptrdiff_t>(values_.size()) * stride_;
-            const auto integer = static_cast<std::int32_t>(Wide(value).bits());
+            const auto integer = expectedScalar(SymbolicOp::BitOr, value, 0).getInt();
             const std::int64_t wide = integer;
             const double real = value.toDouble();
             const unsigned char byte = integer == 0 ? 0 : graph.below(2) == 0 ? 1 : 255;
@@ -500,7 +365,7 @@ TEST(Prepared, RunsManyRowsAsItRunsEach) {
         Graph graph(seed, false);
         for (const SymbolicExprId symbol : graph.symbols)
             if (graph.below(20) != 0)
-                graph.table.registerValueId(symbol, literal(graph.table, graph.anyScalar()));
+                graph.table.registerValueId(symbol, scalarLiteral(graph.table, graph.anyScalar()));
         PreparedExpr prepared = SymbolicExprEval(graph.table).prepare(graph.nodes[graph.nodes.size() - 1 - seed % 3]);
         const std::size_t rows = graph.below(10) == 0 ? 2100 + graph.below(300) : graph.below(70);
         std::vector<Column> columns;
@@ -544,11 +409,12 @@ TEST(ColumnLoops, AreTheSameForWideRegisters) {
     for (std::size_t type = 0; type < scalarTypes; ++type) {
         columns.at(type).resize(2 * rows);
         for (std::size_t i = 0; i < 2 * rows; ++i) {
-            const SymbolicScalar value = corners()[random() % corners().size()];
+            const SymbolicScalar value = cornerScalars()[random() % cornerScalars().size()];
             if (type == 0)
                 reinterpret_cast<bool*>(columns[0].data())[i] = value.toDouble() > 0;
             else if (type == 1)
-                reinterpret_cast<std::int32_t*>(columns[1].data())[i] = static_cast<std::int32_t>(Wide(value).bits());
+                reinterpret_cast<std::int32_t*>(columns[1].data())[i] =
+                    expectedScalar(SymbolicOp::BitOr, value, 0).getInt();
             else
                 columns[2][i] = visibleScalar(value.toDouble()).getDouble();
         }

@@ -41,11 +41,12 @@ public:
 
     void ask(const std::string& condition) { file_ += "#if " + condition + "\n1\n#else\n0\n#endif\n"; }
 
-    /// A 1 or 0 for each condition, in order.
-    [[nodiscard]] std::vector<std::int64_t> decide() const {
+    /// A 1 or 0 for each condition, in order.  The command makes the file "decided" of "conditions.h".
+    [[nodiscard]] std::vector<std::int64_t>
+    decide(const std::string& command = "cpp -P -undef conditions.h decided") const {
         const TemporaryFolder place;
         place.write("conditions.h", file_);
-        run(place, "cpp -P -undef conditions.h decided");
+        run(place, command);
         return numbers(place.read("decided"));
     }
 

@@ -10,8 +10,10 @@
 #include <cerrno>
 #include <charconv>
 #include <cstdio>
+#include <cstdlib>
 #include <fcntl.h>
 #include <limits>
+#include <memory>
 #include <new>
 #include <sys/stat.h>
 #include <system_error>
@@ -109,6 +111,72 @@ std::string readAll(const Descriptor& file, std::size_t bound, bool isText) {
     return text;
 }
 
+void writeText(const Descriptor& file, std::string_view text) {
+    while (!text.empty()) {
+        const ssize_t written = write(file.get(), text.data(), text.size());
+        if (written < 0 && errno != EINTR)
+            failToWrite();
+        text.remove_prefix(static_cast<std::size_t>(std::max<ssize_t>(written, 0)));
+    }
+}
+
+/// Where writing fails, the file is left empty, so that nobody takes a part of the text for all of it.
+void writeInPlace(const std::string& path, std::string_view text) {
+    Descriptor file(path, O_WRONLY | O_CREAT | O_TRUNC);
+    if (file.get() < 0)
+        failToWrite();
+    try {
+        writeText(file, text);
+    } catch (const FileError&) {
+        static_cast<void>(ftruncate(file.get(), 0) == 0);
+        throw;
+    }
+    if (!file.close())
+        failToWrite();
+}
+
+/// Writes a file beside the one that it then replaces, with the mode and the owner of that one.  Returns false, and
+/// changes nothing, where the folder refuses further files or the owner cannot be kept.
+bool replaceFile(const std::string& path, std::string_view text, const struct stat* old) {
+    // Links stay, the file that they lead to is replaced.
+    const std::unique_ptr<char, decltype(&std::free)> real(old != nullptr ? realpath(path.c_str(), nullptr) : nullptr,
+                                                           &std::free);
+    const std::string target = real != nullptr ? real.get() : path;
+    const std::string beside = target + "." + std::to_string(getpid()) + ".part";
+    Descriptor file(beside, O_WRONLY | O_CREAT | O_EXCL);
+    if (file.get() < 0) {
+        if (errno == EACCES || errno == EPERM || errno == EROFS || errno == ENAMETOOLONG || errno == EEXIST)
+            return false;
+        failToWrite();
+    }
+    const auto giveUp = [&] {
+        const int reason = errno;
+        static_cast<void>(unlink(beside.c_str()));
+        errno = reason;
+    };
+
+    struct stat made {};
+
+    if (old != nullptr && (fstat(file.get(), &made) != 0 ||
+                           ((made.st_uid != old->st_uid || made.st_gid != old->st_gid) &&
+                            fchown(file.get(), old->st_uid, old->st_gid) != 0) ||
+                           fchmod(file.get(), old->st_mode & 07777U) != 0)) {
+        giveUp();
+        return false;
+    }
+    try {
+        writeText(file, text);
+    } catch (const FileError&) {
+        giveUp();
+        throw;
+    }
+    if (!file.close() || rename(beside.c_str(), target.c_str()) != 0) {
+        giveUp();
+        failToWrite();
+    }
+    return true;
+}
+
 /// Reads a number of bytes, with a unit or without.  Returns 0 for anything else.
 std::size_t bytesOf(std::string_view text) {
     std::size_t number = 0;
@@ -136,19 +204,6 @@ std::string readWhole(const std::string& path, std::size_t bound, bool isText) {
     }
 }
 
-void writeTo(Descriptor& file, std::string_view text) {
-    if (file.get() < 0)
-        failToWrite();
-    while (!text.empty()) {
-        const ssize_t written = write(file.get(), text.data(), text.size());
-        if (written < 0 && errno != EINTR)
-            failToWrite();
-        text.remove_prefix(static_cast<std::size_t>(std::max<ssize_t>(written, 0)));
-    }
-    if (!file.close())
-        failToWrite();
-}
-
 } // namespace
 
 std::string readFile(const std::string& path, std::size_t bound) {
@@ -159,22 +214,21 @@ std::string readBytes(const std::string& path, std::size_t bound) {
     return readWhole(path, bound, false);
 }
 
-void replaceFile(const std::string& path, std::string_view bytes) {
-    const std::string beside = path + "." + std::to_string(getpid()) + ".new";
-    try {
-        Descriptor file(beside, O_WRONLY | O_CREAT | O_TRUNC);
-        writeTo(file, bytes);
-        if (rename(beside.c_str(), path.c_str()) != 0)
-            failToWrite();
-    } catch (...) {
-        unlink(beside.c_str());
-        throw;
-    }
-}
-
 void writeFile(const std::string& path, std::string_view text) {
-    Descriptor file(path, O_WRONLY | O_CREAT | O_TRUNC);
-    writeTo(file, text);
+    // Opened first without a change, so that a file that must not be written stays.
+    const Descriptor old(path, O_WRONLY);
+    if (old.get() < 0 && errno != ENOENT)
+        failToWrite();
+
+    struct stat state {};
+
+    const bool isThere = old.get() >= 0;
+    if (isThere && fstat(old.get(), &state) != 0)
+        failToWrite();
+    // Further names of a file, links to what is not there yet, devices and pipes would not survive a renaming.
+    const bool canReplace = isThere ? S_ISREG(state.st_mode) && state.st_nlink == 1 : lstat(path.c_str(), &state) != 0;
+    if (!canReplace || !replaceFile(path, text, isThere ? &state : nullptr))
+        writeInPlace(path, text);
 }
 
 bool isSameFile(const std::string& a, const std::string& b) {

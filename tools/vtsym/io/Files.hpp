@@ -28,11 +28,9 @@ std::string readFile(const std::string& path, std::size_t bound);
 /// Reads any file of that many bytes at most.  Throws FileError as above.
 std::string readBytes(const std::string& path, std::size_t bound);
 
-/// Puts a file in the place of another one in one step: others read either of them.  Throws FileError, after which the
-/// file is as it was.
-void replaceFile(const std::string& path, std::string_view bytes);
-
-/// Replaces the content of a file.  Throws FileError, after which the file may hold a part of the text.
+/// Replaces the content of a file.  The text is written beside the file, which is then replaced by renaming; in place
+/// where that cannot be: for a device, a pipe, a file with several names, a folder that takes no further file.  Throws
+/// FileError, after which the file is as it was, or empty where it was written in place.
 void writeFile(const std::string& path, std::string_view text);
 
 /// Whether two paths lead to the same regular file, directly or through links.

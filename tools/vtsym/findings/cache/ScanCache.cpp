@@ -123,7 +123,7 @@ void ScanCache::write() {
                     add(known_.entry(at).key, known_.bytes(known_.entry(at)));
         for (std::size_t at = 0; at < others.size(); ++at)
             add(others.entry(at).key, others.bytes(others.entry(at)));
-        replaceFile(path_, Pack::text(entries));
+        writeFile(path_, Pack::text(entries));
     } catch (const FileError& problem) {
         note_("the cache " + path_ + " " + problem.what());
     } catch (const fs::filesystem_error& problem) {
