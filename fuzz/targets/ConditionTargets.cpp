@@ -9,7 +9,7 @@ namespace VT::Fuzz {
 
 namespace {
 
-constexpr std::size_t mostOperators = 48;
+constexpr std::size_t mostOperators = 20; ///< as each may double the text
 constexpr std::size_t assignmentCount = 24;
 
 /// Calls with an Agreement about the condition that the input chooses, in a fresh service.

@@ -24,6 +24,8 @@ std::vector<Entry> entries() {
          4000, makeEnumeration},
         {"preprocessor", "conditions and their normal and short forms are decided alike by cpp and clang", 2,
          makePreprocessorPairs},
+        {"system-calls", "each open, read, write, close and rename of the program fails once", 250, makeFaults},
+        {"program-memory", "each allocation of the program fails, once and from then on", 250, makeFaults},
     };
     for (const VT::Fuzz::Target& target : VT::Fuzz::targets())
         all.push_back({target.name, "a fuzz target with random inputs, at full speed; a failing one is minimised", 300,

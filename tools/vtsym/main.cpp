@@ -8,7 +8,11 @@
 
 #include <algorithm>
 #include <csignal>
+#include <new>
+#include <optional>
 #include <string>
+#include <string_view>
+#include <unistd.h>
 #include <vector>
 
 namespace vtsym {
@@ -73,8 +77,14 @@ void complain(Console& console, const std::string& problem) {
     console.err("vtsym: " + VT::shownText(problem) + "\n");
 }
 
+/// Says so without taking memory.
+void complainOfMemory() {
+    static constexpr std::string_view message = "vtsym: there is not enough memory\n";
+    static_cast<void>(write(STDERR_FILENO, message.data(), message.size()) > 0);
+}
+
 /// Reads the command line and runs its command.  `onError` becomes the status for a command that throws.
-int readAndRun(Console& console, std::vector<std::string> arguments, ExitStatus& onError) {
+int readAndRun(Console& console, std::vector<std::string> arguments, std::optional<ExitStatus>& onError) {
     CommandLine commandLine(description, VTSYM_VERSION, programNotes);
     addCommands(commandLine, arguments.empty() ? "" : arguments.front());
     addFeatureOption(commandLine);
@@ -97,20 +107,29 @@ int readAndRun(Console& console, std::vector<std::string> arguments, ExitStatus&
     }
     onError = request.command->onError;
     const int status = request.command->run(console).value();
-    return console.errFailed() ? std::max(status, onError.value()) : status;
+    return console.errFailed() ? std::max(status, onError->value()) : status;
 }
 
 int runProgram(Console& console, std::vector<std::string> arguments) {
-    ExitStatus onError = false;
+    std::optional<ExitStatus> onError; // when the command is known
+    bool isOutOfMemory = false;
     try {
-        return readAndRun(console, std::move(arguments), onError);
-    } catch (const OutputError& error) {
-        if (!error.readerIsGone())
+        try {
+            return readAndRun(console, std::move(arguments), onError);
+        } catch (const std::bad_alloc&) {
+            throw;
+        } catch (const OutputError& error) {
+            if (!error.readerIsGone())
+                complain(console, error.what());
+        } catch (const std::exception& error) {
             complain(console, error.what());
-    } catch (const std::exception& error) {
-        complain(console, error.what());
+        }
+    } catch (const std::bad_alloc&) {
+        isOutOfMemory = true;
+        complainOfMemory();
+    } catch (const OutputError&) { // the message could not be written either
     }
-    return onError.value();
+    return onError.value_or(isOutOfMemory ? ExitStatus(SearchResult::Failed) : ExitStatus(false)).value();
 }
 
 } // namespace
@@ -120,6 +139,11 @@ int runProgram(Console& console, std::vector<std::string> arguments) {
 int main(int argc, char** argv) {
     vtsym::holdStandardStreams();
     std::signal(SIGPIPE, SIG_IGN); // a reader that left is an error of writing, not the end of the process
-    vtsym::Console console;
-    return vtsym::runProgram(console, std::vector<std::string>(argv + (argc > 0 ? 1 : 0), argv + argc));
+    try {
+        vtsym::Console console;
+        return vtsym::runProgram(console, std::vector<std::string>(argv + (argc > 0 ? 1 : 0), argv + argc));
+    } catch (const std::exception&) { // before there was anything that could say more
+        vtsym::complainOfMemory();
+        return vtsym::wrongUsage;
+    }
 }

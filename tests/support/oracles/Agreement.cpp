@@ -27,15 +27,17 @@ Agreement::Agreement(VCService& library, SymbolicExprId condition, const Conditi
       exact_(table_, id_),
       assignments_(std::move(assignments)) {}
 
-void Agreement::demand(bool met, const std::string& what) const {
+/// The words are made only where they are needed: the text of a shared graph may be long.
+template <class Words>
+void Agreement::demand(bool met, Words words) const {
     if (!met)
-        throw Disagreement(text(id_) + ": " + what);
+        throw Disagreement(text(id_) + ": " + words());
 }
 
 /// Both are as true, or as large, wherever the known condition holds.  A number is a dimension, whose quotients are
 /// exact.
 void Agreement::demandSame(const char* what, SymbolicExprId other, Kept kept, SymbolicExprId known) const {
-    demand(table_.has(other), std::string(what) + " is no condition");
+    demand(table_.has(other), [&] { return std::string(std::string(what) + " is no condition"); });
     const Quotients quotients = kept == Kept::Value ? Quotients::ByContext : Quotients::Truncated;
     const ExactValue value(table_, id_, quotients);
     const ExactValue otherValue(table_, other, quotients);
@@ -47,9 +49,10 @@ void Agreement::demandSame(const char* what, SymbolicExprId other, Kept kept, Sy
         const auto holds = knownValue.under(assignment);
         if (!before || !after || !holds || !holds->holds())
             continue;
-        demand(isTruth ? before->holds() == after->holds() : before->real == after->real,
-               std::string(what) + " is " + text(other) + ", " + std::to_string(after->real) + " instead of " +
-                   std::to_string(before->real) + shown(assignment));
+        demand(isTruth ? before->holds() == after->holds() : before->real == after->real, [&] {
+            return std::string(std::string(what) + " is " + text(other) + ", " + std::to_string(after->real) +
+                               " instead of " + std::to_string(before->real) + shown(assignment));
+        });
     }
 }
 
@@ -60,7 +63,8 @@ void Agreement::demandEquivalent(SymbolicExprId other) const {
         const auto a = exact_.under(*assignment);
         const bool inexact = exact_.tookRemainder() && !booleanOps.contains(table_.get(id_)->op());
         const auto b = ExactValue(table_, other).under(*assignment);
-        demand(!a || !b || inexact || a->holds() == b->holds(), "differs from " + text(other) + shown(*assignment));
+        demand(!a || !b || inexact || a->holds() == b->holds(),
+               [&] { return std::string("differs from " + text(other) + shown(*assignment)); });
     }
 }
 
@@ -68,7 +72,8 @@ void Agreement::demandSimplified() const {
     const SymbolicExprId simple = service_.simplify(id_, false).id();
     demandSame("simplified", simple, Kept::Value, table_.getIdTRUE());
     const SymbolicExprId again = service_.simplify(simple, false).id();
-    demand(again == simple, "simplified again is " + text(again) + ", before " + text(simple));
+    demand(again == simple,
+           [&] { return std::string("simplified again is " + text(again) + ", before " + text(simple)); });
     demandEquivalent(simple);
 }
 
@@ -77,7 +82,7 @@ void Agreement::demandShortest() const {
     demandSame("shortest", shortest, Kept::Value, table_.getIdTRUE());
     // "false" may be the longer word.
     demand(shortest == table_.getIdFALSE() || service_.printCExpr(shortest).size() <= service_.printCExpr(id_).size(),
-           "shortest is longer: " + text(shortest));
+           [&] { return std::string("shortest is longer: " + text(shortest)); });
 }
 
 void Agreement::demandGiven(SymbolicExprId known) const {
@@ -102,9 +107,10 @@ void Agreement::demandEvaluated() const {
             prepared->setInt(slot, bound == assignment.end() ? 0 : static_cast<std::int32_t>(bound->second));
         }
         const SymbolicScalar computed = prepared->run().scalar();
-        demand(computed.toDouble() == value->real && (computed.type() == ScalarType::Double) == value->isReal,
-               "is evaluated to " + std::to_string(computed.toDouble()) + " instead of " + std::to_string(value->real) +
-                   shown(assignment));
+        demand(computed.toDouble() == value->real && (computed.type() == ScalarType::Double) == value->isReal, [&] {
+            return std::string("is evaluated to " + std::to_string(computed.toDouble()) + " instead of " +
+                               std::to_string(value->real) + shown(assignment));
+        });
     }
 }
 
@@ -119,11 +125,11 @@ void Agreement::demandDecided(SymbolicExprId known) const {
         if (!value)
             continue;
         const bool a = value->holds();
-        demand(a ? !can.isNo() : !must.isYes(), "is decided wrongly" + shown(assignment));
+        demand(a ? !can.isNo() : !must.isYes(), [&] { return std::string("is decided wrongly" + shown(assignment)); });
         const bool b = other && other->holds();
         demand(!other || !((a && !b && relation.onlyA.isNo()) || (b && !a && relation.onlyB.isNo()) ||
                            (a && b && relation.both.isNo())),
-               "is compared wrongly with " + text(known) + shown(assignment));
+               [&] { return std::string("is compared wrongly with " + text(known) + shown(assignment)); });
     }
     demandWitness(can, exact_, true);
     demandWitness(must, exact_, false);
@@ -174,7 +180,7 @@ std::optional<Assignment> Agreement::assignmentOf(const Decision& decision) cons
 void Agreement::demandWitness(const Decision& decision, const ExactValue& of, bool wanted) const {
     const auto assignment = decision.witness ? assignmentOf(decision) : std::nullopt;
     if (const auto value = assignment ? of.under(*assignment) : std::nullopt)
-        demand(value->holds() == wanted, "a witness is wrong:" + shown(*assignment));
+        demand(value->holds() == wanted, [&] { return std::string("a witness is wrong:" + shown(*assignment)); });
 }
 
 } // namespace VT::Testing

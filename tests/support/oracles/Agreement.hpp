@@ -47,7 +47,8 @@ public:
 private:
     enum class Kept : bool { Truth, Value };
 
-    void demand(bool met, const std::string& what) const;
+    template <class Words>
+    void demand(bool met, Words words) const;
     void demandSame(const char* what, SymbolicExprId other, Kept kept, SymbolicExprId known) const;
     void demandEquivalent(SymbolicExprId other) const;
     void demandWitness(const Decision& decision, const ExactValue& of, bool wanted) const;

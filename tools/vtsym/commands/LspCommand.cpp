@@ -10,6 +10,7 @@
 #include <array>
 #include <cerrno>
 #include <poll.h>
+#include <system_error>
 #include <unistd.h>
 
 namespace vtsym {
@@ -32,7 +33,7 @@ Examples:
 class Input {
 public:
     /// Reads once.  With `waits`, until something arrives; otherwise only what is there.  Returns false where nothing
-    /// is.
+    /// is.  Throws std::system_error where the system refuses.
     bool read(FrameReader& frames, bool waits) {
         pollfd input{STDIN_FILENO, POLLIN, 0};
         while (!hasEnded_) {
@@ -42,6 +43,8 @@ public:
             const ssize_t got = ready < 0 ? -1 : ::read(STDIN_FILENO, part_.data(), part_.size());
             if (got < 0 && errno == EINTR)
                 continue;
+            if (got < 0)
+                throw std::system_error(errno, std::generic_category(), "standard input cannot be read");
             hasEnded_ = got <= 0;
             if (hasEnded_)
                 return false;

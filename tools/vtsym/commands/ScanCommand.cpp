@@ -177,7 +177,9 @@ SearchResult Scan::run() {
     if (const std::size_t gone = baseline_.notFound(); gone > 0)
         writer_->note(std::to_string(gone) + " findings of " + settings_.baseline +
                       " are not found any more: write it again with --write-baseline");
-    if (!options_.written.empty()) {
+    if (!options_.written.empty() && writer_->failed()) {
+        problem(options_.written, "is not written, because it would lack what could not be read: mend that first");
+    } else if (!options_.written.empty()) {
         try {
             writeFile(options_.written, written_.text());
         } catch (const FileError& error) {

@@ -48,6 +48,7 @@ std::vector<std::string> kindsIn(const std::vector<std::string>& lists) {
     std::vector<std::string> kinds;
     for (const std::string& list : lists) {
         std::istringstream words(list + ",");
+        words.exceptions(std::ios::badbit); // or it would end early where memory runs out
         for (std::string word; std::getline(words, word, ',');) {
             requireOneOf("--kinds", word, kindNames());
             kinds.push_back(word);

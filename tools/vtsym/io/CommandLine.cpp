@@ -83,6 +83,14 @@ std::string unexpected(const std::vector<std::string>& arguments) {
     return quotedArgument(unmarked(first)) + " is one argument too many; leave it out";
 }
 
+/// An option that was added.  The look-up of the library that parses ends the process where memory runs out.
+CLI::Option& optionOf(CLI::App& app, const std::string& name) {
+    for (CLI::Option* const option : app.get_options())
+        if (option->check_name(name))
+            return *option;
+    throw std::logic_error("there is no option " + name);
+}
+
 } // namespace
 
 std::string quotedArgument(const std::string& argument) {
@@ -178,11 +186,11 @@ void Command::addFlag(const std::string& name, const std::string& description, s
 }
 
 void Command::require(const std::string& name) {
-    app_.get_option(name)->required();
+    optionOf(app_, name).required();
 }
 
 void Command::exclude(const std::string& name, const std::string& other) {
-    app_.get_option(name)->excludes(app_.get_option(other));
+    optionOf(app_, name).excludes(&optionOf(app_, other));
 }
 
 CommandLine::CommandLine(const std::string& description, const std::string& version, const std::string& notes)
@@ -250,6 +258,7 @@ Request CommandLine::read(std::vector<std::string> arguments) {
         app_->parse(std::move(arguments));
     } catch (const CLI::Success& request) { // --help or --version
         std::ostringstream out;
+        out.exceptions(std::ios::badbit); // or a part would be taken for all where memory runs out
         app_->exit(request, out, out);
         return {nullptr, out.str()};
     } catch (const CLI::ExtrasError&) {

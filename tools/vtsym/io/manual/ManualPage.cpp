@@ -52,6 +52,7 @@ std::string heading(const OptionEntry& option) {
 /// Paragraphs, and examples as they are written.
 void writeNotes(const std::string& notes, std::string& page) {
     std::istringstream stream(notes);
+    stream.exceptions(std::ios::badbit); // or it would end early where memory runs out
     bool inExample = false;
     bool begins = true; // a paragraph
     for (std::string line; std::getline(stream, line);) {
