@@ -1,7 +1,7 @@
 // The grammar against an independent hand-written parser.
 #include "base/VTSymbolicExpr.hpp"
 #include "base/print/ExpressionPrinter.hpp"
-#include "benchmarks/FloorConditionReader.hpp"
+#include "tests/support/oracles/PrecedenceReader.hpp"
 #include "tests/support/Parsing.hpp"
 #include "tests/support/TreeText.hpp"
 #include "tests/support/generators/Corpus.hpp"
@@ -54,11 +54,11 @@ std::string difference(SymbolicExprTable& table, const std::string& text, bool c
     static const std::regex beyond("[0-9]{10}|[eE][-+]?[0-9]{3}");
     const ParseAnswer answer = parse(table, text, cOperators, keywords);
     TextBuilder builder{cOperators, keywords};
-    const std::string expected = Benchmarks::ConditionReader(builder, text).run();
+    const std::string expected = PrecedenceReader(builder, text).run();
     const std::string tree = answer.error ? "" : treeText(table, answer.id);
     std::size_t stop = text.size();
     for (bool isRead = !expected.empty(); stop > 0 && !isRead; stop -= isRead ? 0 : 1)
-        isRead = !Benchmarks::ConditionReader(builder, std::string_view(text).substr(0, stop)).run().empty();
+        isRead = !PrecedenceReader(builder, std::string_view(text).substr(0, stop)).run().empty();
     if (tree == expected && (answer.stop(text) == stop || std::regex_search(text, beyond)))
         return {};
     return "`" + text + "`: " + tree + " at " + std::to_string(answer.stop(text)) + " instead of " + expected + " at " +
