@@ -144,12 +144,11 @@ bool compare(const Comparison& comparison) {
             continue;
         const std::string name = comparison.name + suffix;
         const std::string counted = number(comparison.items) + '\t' + comparison.unit + '\t' + name;
-        benchmark::RegisterBenchmark(name.c_str(),
-                                     [run = side, size = comparison.size, counted](benchmark::State& state) {
-                                         sideName() = counted;
-                                         run(state, size);
-                                     })
-            ->UseManualTime();
+        benchmark::RegisterBenchmark(name.c_str(), [run = side, size = comparison.size,
+                                                    counted](benchmark::State& state) {
+            sideName() = counted;
+            run(state, size);
+        })->UseManualTime();
     }
     return true;
 }

@@ -387,8 +387,8 @@ void randomFloor(benchmark::State& state, std::int64_t) {
         [&](const auto& records) {
             std::size_t before = 0;
             for (const std::string& text : randomTexts()) // a name in each comparison
-                before += static_cast<std::size_t>(
-                    std::ranges::count_if(text, [](char c) { return c >= 'A' && c <= 'C'; }));
+                before +=
+                    static_cast<std::size_t>(std::ranges::count_if(text, [](char c) { return c >= 'A' && c <= 'C'; }));
             state.counters["of the comparisons kept"] =
                 static_cast<double>(records->after) / static_cast<double>(before);
         });

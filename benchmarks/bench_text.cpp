@@ -22,7 +22,8 @@ std::string randomTerm(std::mt19937_64& random) {
     static const char* const operators[] = {" == ", " != ", "<", " >= ", " > ", "<="};
     const auto below = [&](std::uint64_t bound) { return random() % bound; };
     const auto name = [&] { return stems[below(std::size(stems))] + std::to_string(below(170)); };
-    const std::string left = below(4) == 0 ? name() + (below(2) == 0 ? "*" : " + ") + std::to_string(below(100)) : name();
+    const std::string left =
+        below(4) == 0 ? name() + (below(2) == 0 ? "*" : " + ") + std::to_string(below(100)) : name();
     return left + operators[below(std::size(operators))] + (below(4) == 0 ? name() : std::to_string(below(1000)));
 }
 

@@ -62,6 +62,7 @@ private:
     [[nodiscard]] bool isCovered(const Box& box) const;
     [[nodiscard]] std::uint32_t written(const Box& box);
     void join(std::uint32_t& product, std::uint32_t comparison);
+
     [[nodiscard]] std::uint32_t integer(std::int32_t value) {
         return table_.intern(Kind::Integer, static_cast<std::uint32_t>(value), none);
     }

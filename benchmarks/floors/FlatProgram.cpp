@@ -42,8 +42,8 @@ FlatProgram::FlatProgram(const FlatTable& table, std::uint32_t root) : cells_(ro
 
 double FlatProgram::run() {
     static const void* const places[] = {
-        &&end, &&end,  &&end,   &&either, &&both, &&end,   &&end,   &&end, &&end, &&end, &&less, &&end, &&greater, &&end,
-        &&end, &&end,  &&plus,  &&minus,  &&times, &&divide, &&end, &&end, &&end, &&end, &&end,  &&end, &&end,     &&end};
+        &&end, &&end, &&end,  &&either, &&both,  &&end,    &&end, &&end, &&end, &&end, &&less, &&end, &&greater, &&end,
+        &&end, &&end, &&plus, &&minus,  &&times, &&divide, &&end, &&end, &&end, &&end, &&end,  &&end, &&end,     &&end};
     double* const cells = cells_.data();
     const Line* line = code_.data();
 #define FLOOR_NEXT goto* places[static_cast<std::size_t>((++line)->kind)]

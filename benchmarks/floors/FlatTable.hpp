@@ -50,7 +50,8 @@ struct Record {
     std::uint32_t right; ///< operand, or length of a name's text, or the other half
 };
 
-/// Gives one number to one record.  Slots of 8 bytes hold 32 bits of the hash, which also choose the slot, and an index.
+/// Gives one number to one record.  Slots of 8 bytes hold 32 bits of the hash, which also choose the slot, and an
+/// index.
 class FlatTable {
 public:
     FlatTable() : slots_(std::size_t{1} << firstBits) {}
@@ -58,10 +59,9 @@ public:
     std::uint32_t intern(Kind kind, std::uint32_t left, std::uint32_t right) {
         const std::uint64_t operands = std::uint64_t{left} << 32U | right;
         const std::uint64_t hash = (operands ^ static_cast<std::uint64_t>(kind) * first) * second;
-        return find(static_cast<std::uint32_t>((hash ^ hash >> 32U) * first >> 32U), {kind, left, right},
-                    [&](const Record& known) {
-                        return known.left == left && known.right == right && known.kind == kind;
-                    });
+        return find(
+            static_cast<std::uint32_t>((hash ^ hash >> 32U) * first >> 32U), {kind, left, right},
+            [&](const Record& known) { return known.left == left && known.right == right && known.kind == kind; });
     }
 
     std::uint32_t name(std::string_view text) {
