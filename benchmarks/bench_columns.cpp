@@ -122,7 +122,8 @@ bool add(const char* name) {
                     .size = rows,
                     .items = static_cast<double>(rows),
                     .unit = "row",
-                    .mark = 1.5});
+                    .mark = 3,
+                    .goal = 1.5});
 }
 
 const bool registered = add<conditionOnIntegers, Int, bool>("condition on integers") &&

@@ -2,7 +2,8 @@
 #include "base/core/Nodes.hpp"
 #include "base/eval/Eval.hpp"
 #include "benchmarks/Comparison.hpp"
-#include "benchmarks/ThreeAddress.hpp"
+#include "benchmarks/floors/FlatProgram.hpp"
+#include "benchmarks/floors/FlatText.hpp"
 #include "parser/SymbolicExprParser.hpp"
 
 #include <array>
@@ -54,13 +55,19 @@ struct Subject {
         : formula(made),
           id(SymbolicExprParser(table, true, false)(made.text)),
           values(valuesOf(made)),
-          floor(table, id) {}
+          floor(programOf(made.text)) {}
+
+    static Floor::FlatProgram programOf(const char* text) {
+        Floor::FlatTable records;
+        const std::uint32_t root = Floor::read(records, text);
+        return {records, root};
+    }
 
     const Formula& formula;
     SymbolicExprTable table;
     SymbolicExprId id;
     Values values;
-    ThreeAddress floor;
+    Floor::FlatProgram floor;
 };
 
 template <std::size_t Which>
@@ -68,7 +75,7 @@ void runFloor(benchmark::State& state, std::int64_t evaluations) {
     const Subject subject(formulas[Which]);
     measure(
         state, [&] { return subject.floor; },
-        [&](ThreeAddress& floor) {
+        [&](Floor::FlatProgram& floor) {
             for (std::int64_t i = 0; i < evaluations; ++i) {
                 const auto& values = subject.values[static_cast<std::size_t>(i) % rounds];
                 for (std::size_t variable = 0; variable < variables.size(); ++variable)
@@ -158,7 +165,7 @@ void registerFormula() {
                  .unit = "node",
                  .mark = mark});
     };
-    add("prepared: ", runPrepared<Which>, runFloor<Which>, 1'000'000, 3);
+    add("prepared: ", runPrepared<Which>, runFloor<Which>, 1'000'000, 1);
 #ifdef VTSYM_BENCH_MUPARSER
     add("beside muParser: ", runPrepared<Which>, runMuParser<Which>, 1'000'000, 1);
 #endif

@@ -6,11 +6,13 @@
 #include "base/transform/XForm.hpp"
 #include "benchmarks/BenchmarkCorpus.hpp"
 #include "benchmarks/Comparison.hpp"
-#include "benchmarks/FloorText.hpp"
+#include "benchmarks/floors/FlatMinimiser.hpp"
+#include "benchmarks/floors/FlatText.hpp"
 #include "tests/support/generators/RandomCondition.hpp"
 #include "tests/support/oracles/Truth.hpp"
 
-#include <functional>
+#include <algorithm>
+#include <array>
 #include <memory>
 #include <random>
 
@@ -18,17 +20,17 @@ namespace VT::Benchmarks {
 namespace {
 
 /// Interns every record up to `root` again.  Operands stand before their operators, so one pass in order will do.
-std::uint64_t internAgain(const RecordTable& source, std::uint64_t root, RecordTable& target) {
-    std::vector<std::uint64_t> copies(root + 1);
-    for (std::uint64_t id = 0; id <= root; ++id) {
-        const Record& record = source[id];
-        const auto copyOf = [&](std::uint64_t operand) { return operand < id ? copies[operand] : operand; };
-        if (record.op == SymbolicOp::String)
+std::uint32_t internAgain(const Floor::FlatTable& source, std::uint32_t root, Floor::FlatTable& target) {
+    std::vector<std::uint32_t> copies(root + 1);
+    const auto copyOf = [&](std::uint32_t operand) { return operand == Floor::none ? operand : copies[operand]; };
+    for (std::uint32_t id = 0; id <= root; ++id) {
+        const Floor::Record& record = source[id];
+        if (record.kind == Floor::Kind::Name)
             copies[id] = target.name(source.text(record));
-        else if (record.op == SymbolicOp::IntValue || record.op == SymbolicOp::DoubleValue)
-            copies[id] = target.intern(record.op, record.left, record.right);
+        else if (record.kind == Floor::Kind::Integer)
+            copies[id] = target.intern(record.kind, record.left, record.right);
         else
-            copies[id] = target.intern(record.op, copyOf(record.left), copyOf(record.right));
+            copies[id] = target.intern(record.kind, copyOf(record.left), copyOf(record.right));
     }
     return copies[root];
 }
@@ -36,9 +38,9 @@ std::uint64_t internAgain(const RecordTable& source, std::uint64_t root, RecordT
 /// An expression twice: as nodes and as records.
 struct Subject {
     SymbolicExprTable table;
-    RecordTable records;
+    Floor::FlatTable records;
     SymbolicExprId id = invalidId;
-    std::uint64_t record = 0;
+    std::uint32_t record = 0;
 };
 
 using Build = std::unique_ptr<Subject> (*)(std::int64_t size);
@@ -55,6 +57,8 @@ struct NodeWriter {
         switch (op) {
         case SymbolicOp::And:
             return SymbolicAndExpr(table, a, b).getId(table);
+        case SymbolicOp::Or:
+            return SymbolicOrExpr(table, a, b).getId(table);
         case SymbolicOp::Plus:
             return SymbolicPlusExpr(table, a, b).getId(table);
         case SymbolicOp::Divide:
@@ -72,31 +76,76 @@ struct NodeWriter {
 };
 
 struct RecordWriter {
-    RecordTable& table;
+    Floor::FlatTable& table;
 
-    std::uint64_t name(const std::string& text) const { return table.name(text); }
+    std::uint32_t name(const std::string& text) const { return table.name(text); }
 
-    std::uint64_t integer(int value) const {
-        return table.intern(SymbolicOp::IntValue, static_cast<std::uint64_t>(value), ~std::uint64_t{0});
+    std::uint32_t integer(int value) const {
+        return table.intern(Floor::Kind::Integer, static_cast<std::uint32_t>(value), Floor::none);
     }
 
-    std::uint64_t intern(SymbolicOp op, std::uint64_t a, std::uint64_t b) const { return table.intern(op, a, b); }
+    std::uint32_t intern(SymbolicOp op, std::uint32_t a, std::uint32_t b) const {
+        switch (op) {
+        case SymbolicOp::And:
+            return table.intern(Floor::Kind::And, a, b);
+        case SymbolicOp::Or:
+            return table.intern(Floor::Kind::Or, a, b);
+        case SymbolicOp::Plus:
+            return table.intern(Floor::Kind::Plus, a, b);
+        case SymbolicOp::Divide:
+            return table.intern(Floor::Kind::Divide, a, b);
+        case SymbolicOp::Equal:
+            return table.intern(Floor::Kind::Equal, a, b);
+        case SymbolicOp::NotEqual:
+            return table.intern(Floor::Kind::NotEqual, a, b);
+        case SymbolicOp::LessThan:
+            return table.intern(Floor::Kind::Less, a, b);
+        default:
+            return table.intern(Floor::Kind::Greater, a, b);
+        }
+    }
 };
 
 /// A left-deep chain of comparisons in random order: ten symbols, so that many operands meet.
-template <class Writer>
-std::uint64_t conjunction(const Writer& writer, std::int64_t operands) {
+template <SymbolicOp Op, class Writer>
+auto chainOf(const Writer& writer, std::int64_t operands) {
     std::mt19937 random(17);
-    const std::array ops{SymbolicOp::NotEqual, SymbolicOp::LessThan, SymbolicOp::GreaterThan, SymbolicOp::NotEqual};
-    std::uint64_t chain = 0;
+    constexpr bool isAnd = Op == SymbolicOp::And;
+    constexpr SymbolicOp apart = isAnd ? SymbolicOp::NotEqual : SymbolicOp::Equal;
+    constexpr SymbolicOp above = isAnd ? SymbolicOp::LessThan : SymbolicOp::GreaterThan;
+    constexpr SymbolicOp below = isAnd ? SymbolicOp::GreaterThan : SymbolicOp::LessThan;
+    const std::array ops{apart, above, below, apart};
+    decltype(writer.name("")) chain = 0;
     for (std::int64_t i = 0; i < operands; ++i) {
         const SymbolicOp op = ops[random() % ops.size()];
         const int near = static_cast<int>(random() % 1000);
-        const int constant = op == SymbolicOp::LessThan      ? 2000 + near
-                             : op == SymbolicOp::GreaterThan ? near
-                                                             : 1000 + near;
+        const int constant = op == above ? 2000 + near : op == below ? near : 1000 + near;
         const auto term =
             writer.intern(op, writer.name("Symbol_" + std::to_string(random() % 10)), writer.integer(constant));
+        chain = i == 0 ? term : writer.intern(Op, chain, term);
+    }
+    return chain;
+}
+
+template <class Writer>
+auto conjunction(const Writer& writer, std::int64_t operands) {
+    return chainOf<SymbolicOp::And>(writer, operands);
+}
+
+template <class Writer>
+auto disjunction(const Writer& writer, std::int64_t operands) {
+    return chainOf<SymbolicOp::Or>(writer, operands);
+}
+
+/// The same over as many symbols as operands, so that few operands meet.
+template <class Writer>
+auto conditions(const Writer& writer, std::int64_t operands) {
+    std::mt19937 random(20);
+    const std::array ops{SymbolicOp::NotEqual, SymbolicOp::LessThan, SymbolicOp::GreaterThan, SymbolicOp::Equal};
+    decltype(writer.name("")) chain = 0;
+    for (std::int64_t i = 0; i < operands; ++i) {
+        const auto term = writer.intern(ops[random() % ops.size()], writer.name("Symbol_" + std::to_string(i)),
+                                        writer.integer(static_cast<int>(random() % 1000)));
         chain = i == 0 ? term : writer.intern(SymbolicOp::And, chain, term);
     }
     return chain;
@@ -104,9 +153,9 @@ std::uint64_t conjunction(const Writer& writer, std::int64_t operands) {
 
 /// A left-deep sum of symbols, some of them again, and constants.
 template <class Writer>
-std::uint64_t sum(const Writer& writer, std::int64_t terms) {
+auto sum(const Writer& writer, std::int64_t terms) {
     std::mt19937 random(18);
-    std::uint64_t chain = writer.name("first");
+    auto chain = writer.name("first");
     for (std::int64_t i = 1; i < terms; ++i) {
         const auto term = random() % 8 == 0 ? writer.integer(static_cast<int>(random() % 100))
                                             : writer.name("Symbol_" + std::to_string(random() % 5000));
@@ -117,8 +166,8 @@ std::uint64_t sum(const Writer& writer, std::int64_t terms) {
 
 /// x+x, its double, the double of that: nodes in the number of levels, paths in two to that power.
 template <class Writer>
-std::uint64_t doubling(const Writer& writer, std::int64_t levels) {
-    std::uint64_t node = writer.intern(SymbolicOp::Divide, writer.name("x"), writer.name("y"));
+auto doubling(const Writer& writer, std::int64_t levels) {
+    auto node = writer.intern(SymbolicOp::Divide, writer.name("x"), writer.name("y"));
     for (std::int64_t i = 0; i < levels; ++i)
         node = writer.intern(SymbolicOp::Plus, node, node);
     return node;
@@ -133,6 +182,14 @@ std::uint64_t doubling(const Writer& writer, std::int64_t levels) {
 
 std::unique_ptr<Subject> conjunctionOf(std::int64_t size) {
     BUILD_BOTH(conjunction, size);
+}
+
+std::unique_ptr<Subject> disjunctionOf(std::int64_t size) {
+    BUILD_BOTH(disjunction, size);
+}
+
+std::unique_ptr<Subject> conditionsOf(std::int64_t size) {
+    BUILD_BOTH(conditions, size);
 }
 
 std::unique_ptr<Subject> sumOf(std::int64_t size) {
@@ -177,7 +234,7 @@ void copyFloor(benchmark::State& state, std::int64_t size) {
     measure(
         state, [&] { return build(size); },
         [](auto& subject) {
-            RecordTable target;
+            Floor::FlatTable target;
             benchmark::DoNotOptimize(internAgain(subject->records, subject->record, target));
         });
 }
@@ -202,16 +259,6 @@ void corpusLibrary(benchmark::State& state, std::int64_t) {
             std::uint64_t passes = 0;
             for (const SymbolicExprId id : parsed->ids)
                 benchmark::DoNotOptimize(simplifier.simplify(id, passes));
-        });
-}
-
-/// What simplification cannot do without: every line read.
-void corpusFloor(benchmark::State& state, std::int64_t) {
-    measure(
-        state, [] { return std::make_unique<RecordTable>(); },
-        [&](auto& table) {
-            for (const std::string& line : readableLines())
-                benchmark::DoNotOptimize(readRecords(*table, line));
         });
 }
 
@@ -315,43 +362,77 @@ void randomShortestForms(benchmark::State& state, std::int64_t) {
         [&](const auto& corpus) { corpus->report(state); });
 }
 
+/// The random conditions as records.
+struct RandomRecords {
+    RandomRecords() {
+        for (const std::string& text : randomTexts())
+            given.push_back(Floor::read(table, text));
+    }
+
+    Floor::FlatTable table;
+    std::vector<std::uint32_t> given;
+    std::size_t after = 0;
+};
+
 void randomFloor(benchmark::State& state, std::int64_t) {
     measure(
-        state, [] { return std::make_unique<RecordTable>(); },
-        [&](auto& table) {
-            for (const std::string& text : randomTexts())
-                benchmark::DoNotOptimize(readRecords(*table, text));
+        state, [] { return std::make_unique<RandomRecords>(); },
+        [](auto& records) {
+            Floor::FlatMinimiser minimiser(records->table);
+            for (const std::uint32_t id : records->given) {
+                benchmark::DoNotOptimize(minimiser.run(id));
+                records->after += minimiser.comparisons();
+            }
+        },
+        [&](const auto& records) {
+            std::size_t before = 0;
+            for (const std::string& text : randomTexts()) // a name in each comparison
+                before +=
+                    static_cast<std::size_t>(std::ranges::count_if(text, [](char c) { return c >= 'A' && c <= 'C'; }));
+            state.counters["of the comparisons kept"] =
+                static_cast<double>(records->after) / static_cast<double>(before);
         });
 }
 
 const bool registered = [] {
-    compare({.name = "normal forms of random conditions (floor: read)",
+    compare({.name = "normal forms of random conditions",
              .library = randomNormalForms,
              .floor = randomFloor,
              .items = randomConditions,
-             .unit = "condition"});
+             .unit = "condition",
+             .mark = 1,
+             .goal = 0.5});
     compare({.name = "shortest forms of random conditions",
              .library = randomShortestForms,
              .floor = randomFloor,
              .items = randomConditions,
              .unit = "condition"});
+    compare({.name = "normal forms of the corpus",
+             .library = corpusLibrary,
+             .floor = nullptr,
+             .items = static_cast<double>(readableLines().size()),
+             .unit = "line",
+             .goalSeconds = 2e-6});
     compare({.name = "shortest forms of the corpus (floor: its normal forms)",
              .library = shortestLibrary,
              .floor = shortestFloor,
              .items = static_cast<double>(readableLines().size()),
              .unit = "line"});
-    compare({.name = "simplify the corpus (floor: read it)",
-             .library = corpusLibrary,
-             .floor = corpusFloor,
-             .items = static_cast<double>(readableLines().size()),
-             .unit = "line"});
-    for (const std::int64_t operands : {100, 200, 400, 1000})
-        compare({.name = "simplify And of " + std::to_string(operands),
-                 .library = simplifyLibrary<conjunctionOf>,
-                 .floor = copyFloor<conjunctionOf>,
+    const auto addChain = [](const std::string& name, Side library, Side floor, std::int64_t operands) {
+        compare({.name = "simplify " + name + " of " + std::to_string(operands),
+                 .library = library,
+                 .floor = floor,
                  .size = operands,
                  .items = static_cast<double>(operands),
-                 .unit = "operand"});
+                 .unit = "operand",
+                 .markSeconds = 1e-6,
+                 .goalSeconds = 0.3e-6});
+    };
+    for (const std::int64_t operands : {100, 1000, 10000, 100000}) {
+        addChain("And", simplifyLibrary<conjunctionOf>, copyFloor<conjunctionOf>, operands);
+        addChain("Or", simplifyLibrary<disjunctionOf>, copyFloor<disjunctionOf>, operands);
+        addChain("And, distinct symbols,", simplifyLibrary<conditionsOf>, copyFloor<conditionsOf>, operands);
+    }
     for (const std::int64_t terms : {1000, 10000, 100000, 1000000})
         compare({.name = "simplify a sum of " + std::to_string(terms),
                  .library = simplifyLibrary<sumOf>,

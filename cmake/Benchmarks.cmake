@@ -1,8 +1,8 @@
-# One benchmark program per benchmarks/bench_*.cpp; the other sources of the folder are linked into each of them.  Built on
-# demand: `ninja benchmarks`.
+# One benchmark program per benchmarks/bench_*.cpp; the other sources of the folder, and the floors, are linked into each of
+# them.  Built on demand: `ninja benchmarks`.
 
 file(GLOB bench_sources CONFIGURE_DEPENDS benchmarks/bench_*.cpp)
-file(GLOB bench_support CONFIGURE_DEPENDS benchmarks/*.cpp)
+file(GLOB bench_support CONFIGURE_DEPENDS benchmarks/*.cpp benchmarks/floors/*.cpp)
 if(NOT bench_sources OR NOT VTSYM_EMBEDDED_HOST)
   return()
 endif()

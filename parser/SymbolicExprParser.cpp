@@ -1,10 +1,11 @@
-// Parses conditions: the grammar reads the whole text to a syntax value, which is then interned.  A text that is
-// refused interns nothing.  Linear in the text.
+// Parses conditions.  The quick reader reads ordinary ones; what it leaves, the grammar reads to a syntax value, which
+// is then interned.  A text that is refused interns nothing.  Linear in the text.
 #include "parser/SymbolicExprParser.hpp"
 
 #include "base/variants/VariantKeywords.hpp"
 #include "host/Diagnostics.hpp"
 #include "parser/ConditionGrammar.hpp"
+#include "parser/QuickReader.hpp"
 #include "parser/SyntaxConverter.hpp"
 
 #include <utility>
@@ -24,8 +25,11 @@ namespace {
 
 SymbolicExprId SymbolicExprParser::operator()(const std::string& text) {
     const bool keywords = allowVariantKeywords_ && isVariantKeywordsSimCodegenFeatureOn();
+    const Parser::GrammarOptions options{cOperatorMode_, keywords};
+    if (const SymbolicExprId id = Parser::QuickReader(table_, options).read(text); id != invalidId)
+        return id;
     Parser::SyntaxArena arena;
-    const Parser::SyntaxResult result = Parser::readCondition(text, {cOperatorMode_, keywords}, arena);
+    const Parser::SyntaxResult result = Parser::readCondition(text, options, arena);
     if (!result.value)
         throwParseError(text, result.stop);
     return Parser::convertSyntax(table_, *result.value, cOperatorMode_);

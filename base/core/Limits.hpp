@@ -58,6 +58,11 @@ inline constexpr std::size_t textBytes = std::size_t{1} << 30U;
 /// are ordered by their structure.
 inline constexpr std::size_t orderedTextBytes = std::size_t{1} << 16U;
 
+/// Bytes of a text that a printer writes in one pass, and as many more for each node of the table.  A longer text is
+/// that of shared nodes, and is put together from texts that each of them has once.
+inline constexpr std::size_t directBytes = 4096;
+inline constexpr std::size_t directBytesPerNode = 16;
+
 /// Texts that a printer keeps from one print, in records of 48 bytes.  A print that made more frees them, which costs
 /// less than printing did.
 inline constexpr std::size_t keptTexts = std::size_t{1} << 16U;

@@ -248,7 +248,6 @@ SymbolicExprId CallName::in(SymbolicExprTable& table) const {
 // Dispatch.
 
 #define VTSYM_OPERATOR(Code, Name, Class, ...)                                                                         \
-    Class::~Class() = default;                                                                                         \
     void Class::invoke(SymbolicExprVisitor& visitor) const {                                                           \
         visitor.visit(*this);                                                                                          \
     }                                                                                                                  \

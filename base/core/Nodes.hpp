@@ -69,8 +69,8 @@ public:
     static constexpr SymbolicOp code = Op;
     /// Real literals within a tolerance are equal though their hashes differ.
     static constexpr bool equalWithinTolerance = Op == SymbolicOp::DoubleValue;
-    /// Nodes of other classes are equal to some of this one.
-    static constexpr bool hasTwins = dimensionOps.contains(Op) || callOps.contains(Op);
+    /// Most nodes are told apart by their keys.
+    static constexpr bool hasExactKeys = exactKeyOps.contains(Op);
 
     [[nodiscard]] SymbolicOp op() const final { return Op; }
 
@@ -232,7 +232,7 @@ struct CellNode : InternedNode<Node, Op, CellShape> {
         using NodeBase = detail::ShapeName##Node<Class, SymbolicOp::Name>;                                             \
         using NodeBase::NodeBase;                                                                                      \
         Class(const Class&) = delete;                                                                                  \
-        ~Class() override;                                                                                             \
+        ~Class() override = default;                                                                                   \
         void accept(const SymbolicExprTable& table, SymbolicExprVisitor& visitor) const override;                      \
         void invoke(SymbolicExprVisitor& visitor) const override;                                                      \
                                                                                                                        \

@@ -1,7 +1,8 @@
 // The shapes of nodes: payload, operands, hash and equality.  The node classes themselves are in Nodes.hpp.
 //
-// Beside the virtual operations each shape compares its parts with those of another node of its class (hasParts) and
-// hashes them as operands of an operator (hashOf): interning knows the class and needs no virtual call.
+// Beside the virtual operations each shape compares its parts with those of another node of its class (hasParts),
+// hashes them as operands of an operator (hashOf) and has a key for them (keyOf): interning knows the class and needs
+// no virtual call.
 #pragma once
 
 #include "base/core/Node.hpp"
@@ -30,6 +31,10 @@ public:
     [[nodiscard]] bool hasParts(const SymbolicUnaryExpr& other) const noexcept { return operand_ == other.operand_; }
 
     [[nodiscard]] std::uint64_t hashOf(SymbolicOp op) const noexcept { return hashStep(hashSeed(op), operand_); }
+
+    [[nodiscard]] std::uint64_t keyOf(SymbolicOp op) const noexcept {
+        return NodeKeys::fits(operand_, 0) ? NodeKeys::exact(op, operand_, 0) : NodeKeys::inexact(hashOf(op));
+    }
 
 protected:
     explicit SymbolicUnaryExpr(SymbolicExprId operand) : operand_(operand) {}
@@ -61,6 +66,10 @@ public:
 
     [[nodiscard]] std::uint64_t hashOf(SymbolicOp op) const noexcept {
         return hashStep(hashStep(hashSeed(op), left_), right_);
+    }
+
+    [[nodiscard]] std::uint64_t keyOf(SymbolicOp op) const noexcept {
+        return NodeKeys::fits(left_, right_) ? NodeKeys::exact(op, left_, right_) : NodeKeys::inexact(hashOf(op));
     }
 
 protected:
@@ -98,6 +107,8 @@ public:
         return hashStep(hashStep(hashStep(hashSeed(op), first()), second()), third());
     }
 
+    [[nodiscard]] std::uint64_t keyOf(SymbolicOp op) const noexcept { return NodeKeys::inexact(hashOf(op)); }
+
 protected:
     SymbolicTernaryExpr(SymbolicExprId a, SymbolicExprId b, SymbolicExprId c) : inputs_{a, b, c} {}
 
@@ -123,6 +134,8 @@ public:
     [[nodiscard]] bool hasParts(const SymbolicMultiExpr& other) const noexcept { return inputs_ == other.inputs_; }
 
     [[nodiscard]] std::uint64_t hashOf(SymbolicOp op) const noexcept;
+
+    [[nodiscard]] std::uint64_t keyOf(SymbolicOp op) const noexcept { return NodeKeys::inexact(hashOf(op)); }
 
 protected:
     explicit SymbolicMultiExpr(std::vector<SymbolicExprId> inputs) : inputs_(std::move(inputs)) {}
@@ -152,6 +165,8 @@ public:
 
     [[nodiscard]] std::uint64_t hashOf(SymbolicOp op) const noexcept;
 
+    [[nodiscard]] std::uint64_t keyOf(SymbolicOp) const noexcept { return NodeKeys::ofText(name_); }
+
 protected:
     explicit StringShape(std::string name) : name_(std::move(name)) {}
 
@@ -176,6 +191,8 @@ public:
     [[nodiscard]] std::uint64_t hashOf(SymbolicOp) const noexcept {
         return static_cast<std::uint64_t>(static_cast<std::int64_t>(value_));
     }
+
+    [[nodiscard]] std::uint64_t keyOf(SymbolicOp) const noexcept { return NodeKeys::ofInteger(value_); }
 
 protected:
     explicit IntShape(int value) : value_(value) {}
@@ -203,6 +220,8 @@ public:
 
     [[nodiscard]] std::uint64_t hashOf(SymbolicOp op) const noexcept;
 
+    [[nodiscard]] std::uint64_t keyOf(SymbolicOp op) const noexcept { return NodeKeys::inexact(hashOf(op)); }
+
 protected:
     explicit DoubleShape(double value) : value_(value) {}
 
@@ -223,6 +242,8 @@ public:
 
     [[nodiscard]] std::uint64_t hashOf(SymbolicOp op) const noexcept;
 
+    [[nodiscard]] std::uint64_t keyOf(SymbolicOp op) const noexcept { return NodeKeys::inexact(hashOf(op)); }
+
 protected:
     MemberShape(SymbolicExprId owner, std::string name) : SymbolicUnaryExpr(owner), name_(std::move(name)) {}
 
@@ -238,6 +259,9 @@ public:
 
     [[nodiscard]] std::size_t getNumDimensions() const override { return this->getNumInputs(); }
 
+    /// The key of the twin with any number of operands.
+    [[nodiscard]] std::uint64_t keyOf(SymbolicOp op) const noexcept { return NodeKeys::inexact(this->hashOf(op)); }
+
 protected:
     using Inputs::Inputs;
 };
@@ -247,6 +271,8 @@ public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override { return equalDimensions(*this, other); }
 
     [[nodiscard]] std::uint64_t hashOf(SymbolicOp op) const noexcept;
+
+    [[nodiscard]] std::uint64_t keyOf(SymbolicOp op) const noexcept { return NodeKeys::inexact(hashOf(op)); }
 
     [[nodiscard]] std::size_t getNumDimensions() const override { return getNumInputs(); }
 
@@ -264,6 +290,9 @@ public:
 
     [[nodiscard]] std::size_t getNumArgs() const override { return this->getNumInputs() - 1; }
 
+    /// The key of the twin with any number of operands.
+    [[nodiscard]] std::uint64_t keyOf(SymbolicOp op) const noexcept { return NodeKeys::inexact(this->hashOf(op)); }
+
 protected:
     using Inputs::Inputs;
 };
@@ -273,6 +302,9 @@ public:
     [[nodiscard]] bool operator==(const SymbolicExpr& other) const override { return equalCalls(*this, other); }
 
     [[nodiscard]] std::uint64_t hashOf(SymbolicOp op) const noexcept;
+
+    [[nodiscard]] std::uint64_t keyOf(SymbolicOp op) const noexcept { return NodeKeys::inexact(hashOf(op)); }
+
     [[nodiscard]] std::size_t getNumArgs() const override;
 
 protected:

@@ -1,11 +1,11 @@
 // The interning store: one identifier for one structure (hash consing).
 //
-// Method: nodes lie in cells that never move.  An index with open addressing and linear probing holds, for each node,
-// the number of its cell and 32 bits of its hash; most probes that miss read no node.  The topmost bits of a hash
-// spread by multiplication (Knuth, "The Art of Computer Programming", vol. 3, 6.4) choose the slot, so that a larger
-// index is filled almost in order and without hashing anew.
+// Method: nodes lie in cells that never move.  A key of 64 bits for each node holds its operator and operands, or a
+// hash where they do not fit.  An index with open addressing and linear probing holds the identifiers of nodes and 32
+// bits of the hashes of their keys; a look-up reads a slot and a key, and a node only where the key is a hash.  The
+// topmost bits of a hash choose the slot, so that a larger index is filled almost in order and without hashing anew.
 // Cost: O(1) on average for each constructor and look-up; the index is filled to three quarters at most.
-// Relies on: nodes that are equal have equal hashes, but for real literals within a tolerance.
+// Relies on: nodes that are equal have equal keys, but for real literals within a tolerance.
 #include "base/core/Table.hpp"
 
 #include "base/core/Nodes.hpp"
@@ -22,17 +22,8 @@ namespace VT {
 
 namespace {
 constexpr std::size_t firstSlots = 16;
+constexpr std::size_t firstRoom = 128; // nodes
 
-void makeRoom(std::vector<const SymbolicExpr*>& nodes) {
-    if (nodes.size() < nodes.capacity())
-        return;
-    std::vector<const SymbolicExpr*> larger;
-    larger.reserve(std::max(firstSlots, nodes.size() * 2));
-    preferLargePages(larger.data(),
-                     larger.capacity() * sizeof(larger.front())); // NOLINT(bugprone-sizeof-expression): of a pointer
-    larger.assign(nodes.begin(), nodes.end());
-    nodes.swap(larger);
-}
 } // namespace
 
 SymbolicExprTable::SymbolicExprTable()
@@ -42,7 +33,8 @@ SymbolicExprTable::SymbolicExprTable()
 SymbolicExprTable::~SymbolicExprTable() {
     // Both lists are in the order of addition, so one pass separates foreign nodes from those in cells.
     auto foreign = foreignNodes_.begin();
-    for (const SymbolicExpr* node : nodes_) {
+    for (std::size_t id = 0; id < nodes_.size(); ++id) {
+        const SymbolicExpr* const node = nodes_[id];
         if (foreign != foreignNodes_.end() && *foreign == node) {
             delete node;
             ++foreign;
@@ -52,22 +44,42 @@ SymbolicExprTable::~SymbolicExprTable() {
     }
 }
 
-bool SymbolicExprTable::equalNodes(const SymbolicExpr& interned, const SymbolicExpr& node, std::uint64_t hash) {
-    return &interned == &node || (interned == node && interned.getHash() == hash);
+bool SymbolicExprTable::equalNodes(const SymbolicExpr& interned, const SymbolicExpr& node) {
+    return &interned == &node || (interned == node && interned.getHash() == node.getHash());
 }
 
-std::uint32_t SymbolicExprTable::tagOf(const SymbolicExpr& node, std::uint64_t hash) {
-    const bool isNaN = hash == SymbolicDoubleValue::hashOfNaN && node.op() == SymbolicOp::DoubleValue;
-    return isNaN ? addressTag(node) : tagOf(hash);
+/// The key of a node of any class: what a node of the library with this operator and these operands has.
+std::uint64_t SymbolicExprTable::keyOf(const SymbolicExpr& node) {
+    const SymbolicOp op = node.op();
+    if (op == SymbolicOp::String)
+        return static_cast<const detail::StringShape&>(node).keyOf(op);
+    if (op == SymbolicOp::IntValue)
+        return static_cast<const detail::IntShape&>(node).keyOf(op);
+    const bool isUnary = node.isUnaryExpr();
+    const bool isKnown = op > SymbolicOp::None && static_cast<int>(op) < operatorCount && exactKeyOps.contains(op);
+    if (isKnown && (isUnary || node.isBinaryExpr())) {
+        const SymbolicExprId left = node.getInput(0);
+        const SymbolicExprId right = isUnary ? 0 : node.getInput(1);
+        if (NodeKeys::fits(left, right))
+            return NodeKeys::exact(op, left, right);
+    }
+    const std::uint64_t hash = node.getHash();
+    const bool isNaN = op == SymbolicOp::DoubleValue && hash == SymbolicDoubleValue::hashOfNaN;
+    return isNaN ? addressKey(node) : NodeKeys::inexact(hash);
 }
 
-std::size_t SymbolicExprTable::probe(const SymbolicExpr& node, std::uint64_t hash) const {
-    return probe(tagOf(node, hash), [&](const NodeCell& cell) { return equalNodes(*cell.node(), node, hash); });
+std::size_t SymbolicExprTable::probe(const SymbolicExpr& node, std::uint64_t key) const {
+    return probe(key, [&](const SymbolicExpr& interned) { return equalNodes(interned, node); });
 }
 
 /// Makes room for one more node, so that nothing but its own storage can fail once it is made.
 void SymbolicExprTable::reserveOne() {
-    makeRoom(nodes_);
+    if (nodes_.size() == room_) {
+        const std::size_t room = std::max(firstRoom, 2 * room_);
+        keys_.reserve(room);
+        nodes_.reserve(room);
+        room_ = room;
+    }
     if ((nodes_.size() + 1) * 4 <= index_.size() * 3)
         return;
     if (indexShift_ == 0)
@@ -79,10 +91,10 @@ void SymbolicExprTable::reserveOne() {
     larger.resize(index_.size() * 2);
     const std::size_t mask = larger.size() - 1;
     for (const Slot& slot : index_) {
-        if (slot.cell == 0)
+        if (slot.idAndOne == 0)
             continue;
         std::size_t at = std::size_t{slot.tag} >> (indexShift_ - 1);
-        while (larger[at].cell != 0)
+        while (larger[at].idAndOne != 0)
             at = (at + 1) & mask;
         larger[at] = slot;
     }
@@ -94,17 +106,13 @@ void SymbolicExprTable::add(const SymbolicExpr* node) {
     std::unique_ptr<const SymbolicExpr> owned(node);
     if (isFull())
         reserveOne();
-    makeRoom(foreignNodes_);
-    const CellStore::Number number =
-        cells_.allocate(sizeof(node)); // NOLINT(bugprone-sizeof-expression): a pointer is kept
-    NodeCell* const fresh = cell(number);
-    fresh->id = static_cast<std::uint32_t>(nodes_.size());
-    fresh->code = NodeCell::foreign;
-    new (fresh + 1) const SymbolicExpr*(node);
-    const std::uint64_t hash = node->getHash();
-    Slot& slot = index_[probe(*node, hash)];
-    if (slot.cell == 0)
-        slot = {tagOf(*node, hash), number};
+    if (foreignNodes_.size() == foreignNodes_.capacity())
+        foreignNodes_.reserve(std::max(firstSlots, 2 * foreignNodes_.size()));
+    const std::uint64_t key = keyOf(*node);
+    Slot& slot = index_[probe(*node, key)];
+    if (slot.idAndOne == 0)
+        slot = {tagOf(key), static_cast<std::uint32_t>(nodes_.size()) + 1};
+    keys_.push_back(key);
     foreignNodes_.push_back(node);
     nodes_.push_back(owned.release());
 }
@@ -115,10 +123,10 @@ bool SymbolicExprTable::contains(const SymbolicExpr* node) const {
 
 SymbolicExprId SymbolicExprTable::lookup(const SymbolicExpr* node) const {
     // Another node may be where the remembered one was, so it is compared.
-    if (node == lastAnswer_.candidate && *lastAnswer_.cell->node() == *node)
-        return lastAnswer_.cell->id;
-    const CellStore::Number found = index_[probe(*node, node->getHash())].cell;
-    return found == 0 ? invalidId : cell(found)->id;
+    if (node == lastAnswer_.candidate && *nodes_[lastAnswer_.id] == *node)
+        return lastAnswer_.id;
+    const std::uint32_t found = index_[probe(*node, keyOf(*node))].idAndOne;
+    return found == 0 ? invalidId : found - 1;
 }
 
 const SymbolicExpr* SymbolicExprTable::get(SymbolicExprId id) const {
@@ -143,6 +151,18 @@ void SymbolicExprTable::lookup(const SymbolicOp& op, std::vector<SymbolicExprId>
     for (SymbolicExprId id = 0; id < nodes_.size(); ++id)
         if (nodes_[id]->op() == op)
             out.push_back(id);
+}
+
+SymbolicExprId SymbolicExprTable::internName(std::string_view text) {
+    if (isPlain()) {
+        const std::size_t position = probe(NodeKeys::ofText(text), [&](const SymbolicExpr& interned) {
+            return interned.op() == SymbolicOp::String &&
+                   static_cast<const detail::StringShape&>(interned).getName() == text;
+        });
+        if (const std::uint32_t known = index_[position].idAndOne; known != 0)
+            return known - 1;
+    }
+    return SymbolicString(*this, std::string(text)).getId(*this);
 }
 
 void SymbolicExprTable::addBoolSymbols() {

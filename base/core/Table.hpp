@@ -1,17 +1,20 @@
 // The interning store of expression nodes: owns them and yields one identifier for one structure.
 //
-// Look-ups and additions are O(1) on average and hash each node once; Table.cpp describes the index.
+// Look-ups and additions are O(1) on average; Table.cpp describes the index.
 #pragma once
 
 #include "base/core/Cells.hpp"
 #include "base/core/Node.hpp"
+#include "base/core/NodeHash.hpp"
 #include "base/util/Hash.hpp"
+#include "base/util/PlainVector.hpp"
 
 #include <boost/unordered_map.hpp>
 
 #include <memory>
 #include <new>
 #include <string>
+#include <string_view>
 #include <typeinfo>
 #include <vector>
 
@@ -26,7 +29,7 @@ class InternedNode;
 /// long as the table.  The table also holds value bindings of expressions, aliases of identifiers and the two truth
 /// constants.
 ///
-/// A table holds up to 128 GiB of nodes, three thousand million at most, and throws std::length_error for one more.
+/// A table holds three thousand million nodes at most, and throws std::length_error for one more.
 /// A derived class may keep its nodes elsewhere by overriding the virtual operations, through which all of the library
 /// reaches them: constructors call contains() and add(), getId() calls lookup(), everything else calls get().
 ///
@@ -64,6 +67,10 @@ public:
     /// Whether the virtual operations are this class's own, so that they need not be called.
     [[nodiscard]] bool isPlain() const { return typeid(*this) == typeid(SymbolicExprTable); }
 
+    /// The key of a node in the table's own storage (NodeHash.hpp): mostly its operator and operands, without a look at
+    /// the node.
+    [[nodiscard]] std::uint64_t keyAt(SymbolicExprId id) const noexcept { return keys_[id]; }
+
     /// Whether an identifier is one of this table.
     [[nodiscard]] bool has(SymbolicExprId id) const { return isPlain() ? id < nodes_.size() : get(id) != nullptr; }
 
@@ -76,6 +83,10 @@ public:
             return has(operand);
         return operand < id && has(operand);
     }
+
+    /// Interns an identifier and returns what the constructor of SymbolicString and getId() return.  Makes no copy of a
+    /// text that is there.
+    SymbolicExprId internName(std::string_view text);
 
     /// Interns "false" and then "true" and remembers them as the truth constants.  A second call changes nothing.
     void addBoolSymbols();
@@ -116,74 +127,78 @@ private:
     template <class Node, SymbolicOp Op, class Payload>
     friend class detail::InternedNode;
 
-    /// The part of the hash is what chooses the slot, so that a larger index is filled without hashing anew.
+    /// The hash of a node's key is what chooses the slot, so that a larger index is filled without hashing anew.
     struct Slot {
         std::uint32_t tag = 0;
-        CellStore::Number cell = 0; ///< 0 marks a free slot
+        std::uint32_t idAndOne = 0; ///< 0 marks a free slot
     };
 
-    /// What a constructor found or added, so that the lookup right after it need not hash and probe again.  Kept for
-    /// classes in which equal nodes have equal hashes.
+    /// What a constructor found or added, so that the lookup right after it need not probe again.  Kept for classes in
+    /// which equal nodes have equal hashes.
     struct LastAnswer {
         const SymbolicExpr* candidate = nullptr;
-        const NodeCell* cell = nullptr;
+        std::uint32_t id = 0;
     };
 
     template <class Node, class Payload>
     void intern(const Payload& candidate);
     template <class Node, class Payload>
-    const NodeCell* place(const Payload& candidate, std::uint32_t tag, std::size_t position);
+    std::uint32_t place(const Payload& candidate, std::uint64_t key, std::size_t position);
     template <class Node, class Payload>
     [[nodiscard]] SymbolicExprId idOf(const Payload& node) const;
 
-    [[nodiscard]] static std::uint32_t tagOf(std::uint64_t hash) noexcept {
-        // Hashes of literals are their bits, so they are spread before the topmost bits choose the slot.
-        return static_cast<std::uint32_t>((hash * spread) >> 32U);
+    /// A hash of two multiplications.
+    [[nodiscard]] static std::uint32_t tagOf(std::uint64_t key) noexcept {
+        key *= 0xd6e8feb86659fd93U;
+        return static_cast<std::uint32_t>(((key ^ key >> 32U) * spread) >> 32U);
     }
 
     /// NaN literals have one hash and equal nothing, so each is found by its address alone.
-    [[nodiscard]] static std::uint32_t addressTag(const SymbolicExpr& node) noexcept {
-        return tagOf(reinterpret_cast<std::uintptr_t>(&node));
+    [[nodiscard]] static std::uint64_t addressKey(const SymbolicExpr& node) noexcept {
+        return NodeKeys::inexact(reinterpret_cast<std::uintptr_t>(&node));
     }
 
-    [[nodiscard]] static std::uint32_t tagOf(const SymbolicExpr& node, std::uint64_t hash);
+    [[nodiscard]] static std::uint64_t keyOf(const SymbolicExpr& node);
 
     template <class Equal>
-    [[nodiscard]] std::size_t probe(std::uint32_t tag, Equal equal) const;
-    [[nodiscard]] std::size_t probe(const SymbolicExpr& node, std::uint64_t hash) const;
-    [[nodiscard]] static bool equalNodes(const SymbolicExpr& interned, const SymbolicExpr& node, std::uint64_t hash);
-
-    [[nodiscard]] NodeCell* cell(CellStore::Number number) const noexcept {
-        return static_cast<NodeCell*>(cells_.at(number));
-    }
+    [[nodiscard]] std::size_t probe(std::uint64_t key, Equal equal) const;
+    [[nodiscard]] std::size_t probe(const SymbolicExpr& node, std::uint64_t key) const;
+    [[nodiscard]] static bool equalNodes(const SymbolicExpr& interned, const SymbolicExpr& node);
 
     [[nodiscard]] bool isFull() const noexcept {
-        return nodes_.size() == nodes_.capacity() || (nodes_.size() + 1) * 4 > index_.size() * 3;
+        return nodes_.size() == room_ || (nodes_.size() + 1) * 4 > index_.size() * 3;
     }
 
     void reserveOne();
 
-    std::vector<Slot> index_; ///< open addressing, linear probing, a power of two of slots
-    std::vector<const SymbolicExpr*> nodes_;
+    std::vector<Slot> index_;         ///< open addressing, linear probing, a power of two of slots
+    PlainVector<std::uint64_t> keys_; ///< by identifier
+    PlainVector<const SymbolicExpr*> nodes_;
     boost::unordered_map<SymbolicExprId, SymbolicExprId> values_;
     boost::unordered_map<std::string, std::string> aliases_;
     SymbolicExprId invalidId_ = invalidId;
     SymbolicExprId trueId_ = invalidId;
     SymbolicExprId falseId_ = invalidId;
 
+    std::size_t room_ = 0; ///< nodes for which there is room in keys_ and nodes_
     CellStore cells_;
     std::vector<const SymbolicExpr*> foreignNodes_; ///< those that came through add(), in the order of addition
     unsigned indexShift_;
     LastAnswer lastAnswer_;
 };
 
-/// Returns the position of the slot of an equal node, or of the free slot where it would go.
+/// Returns the position of the slot of a node of this key for which `equal(node)` holds, or of the free slot where it
+/// would go.  Nodes of an exact key are equal.
 template <class Equal>
-std::size_t SymbolicExprTable::probe(std::uint32_t tag, Equal equal) const {
+std::size_t SymbolicExprTable::probe(std::uint64_t key, Equal equal) const {
     const std::size_t mask = index_.size() - 1;
+    const std::uint32_t tag = tagOf(key);
     for (std::size_t at = std::size_t{tag} >> indexShift_;; at = (at + 1) & mask) {
         const Slot& slot = index_[at];
-        if (slot.cell == 0 || (slot.tag == tag && equal(*cell(slot.cell))))
+        if (slot.idAndOne == 0)
+            return at;
+        if (slot.tag == tag && keys_[slot.idAndOne - 1] == key &&
+            (NodeKeys::isExact(key) || equal(*nodes_[slot.idAndOne - 1])))
             return at;
     }
 }
@@ -198,60 +213,60 @@ void SymbolicExprTable::intern(const Payload& candidate) {
             add(node.release());
         return;
     }
-    const std::uint64_t hash = candidate.hashOf(Node::code);
-    const std::uint32_t tag = tagOf(hash);
-    const std::size_t position = probe(tag, [&](const NodeCell& cell) {
-        // Nodes of one class are compared without a virtual call.
-        if constexpr (!Node::equalWithinTolerance) {
-            if (cell.isOf(Node::code))
-                return static_cast<const Payload*>(cell.node())->hasParts(candidate);
-            if (!Node::hasTwins && cell.code != NodeCell::foreign)
-                return false;
-        }
-        return equalNodes(*cell.node(), candidate, hash);
+    const std::uint64_t key = candidate.keyOf(Node::code);
+    const std::size_t position = probe(key, [&](const SymbolicExpr& interned) {
+        if constexpr (Node::equalWithinTolerance)
+            return equalNodes(interned, candidate);
+        else
+            return interned == static_cast<const SymbolicExpr&>(candidate);
     });
-    const CellStore::Number known = index_[position].cell;
-    const NodeCell* const answer = known != 0 ? cell(known) : place<Node>(candidate, tag, position);
-    lastAnswer_ = {Node::equalWithinTolerance ? nullptr : &candidate, answer};
+    const std::uint32_t known = index_[position].idAndOne;
+    const std::uint32_t id = known != 0 ? known - 1 : place<Node>(candidate, key, position);
+    lastAnswer_ = {Node::equalWithinTolerance ? nullptr : &candidate, id};
 }
 
-/// Adds a copy of `candidate`, for whose tag `position` is the free slot.
+/// Adds a copy of `candidate`, for whose key `position` is the free slot.
 template <class Node, class Payload>
-const NodeCell* SymbolicExprTable::place(const Payload& candidate, std::uint32_t tag, std::size_t position) {
+std::uint32_t SymbolicExprTable::place(const Payload& candidate, std::uint64_t key, std::size_t position) {
+    const auto free = [](const SymbolicExpr&) { return false; };
     if (isFull()) {
         reserveOne();
-        position = probe(tag, [](const NodeCell&) { return false; });
+        position = probe(key, free);
     }
-    const CellStore::Number number = cells_.allocate(sizeof(Node));
-    NodeCell* const fresh = cell(number);
+    void* const cell = cells_.allocate(sizeof(Node));
     const SymbolicExpr* node = nullptr;
     try {
-        node = new (fresh + 1) Node(candidate);
+        node = new (cell) Node(candidate);
     } catch (...) {
-        cells_.release(number);
+        cells_.release(cell);
         throw;
     }
-    fresh->id = static_cast<std::uint32_t>(nodes_.size());
-    fresh->code = static_cast<std::uint32_t>(Node::code);
     if constexpr (Node::equalWithinTolerance) {
         if (!candidate.hasParts(candidate)) {
-            tag = addressTag(*node);
-            position = probe(tag, [](const NodeCell&) { return false; });
+            key = addressKey(*node);
+            position = probe(key, free);
         }
     }
-    index_[position] = {tag, number};
+    const auto id = static_cast<std::uint32_t>(nodes_.size());
+    index_[position] = {tagOf(key), id + 1};
+    keys_.push_back(key);
     nodes_.push_back(node);
-    return fresh;
+    return id;
 }
 
 /// The identifier of a node of class Node that was made by one of its constructors.
 template <class Node, class Payload>
 SymbolicExprId SymbolicExprTable::idOf(const Payload& node) const {
-    // Another node may be where the remembered one was, so it is compared, which is cheaper than hashing.
+    // Another node may be where the remembered one was, so it is compared, which is cheaper than probing.
     if constexpr (!Node::equalWithinTolerance) {
-        if (lastAnswer_.candidate == &node && lastAnswer_.cell->isOf(Node::code) &&
-            static_cast<const Payload*>(lastAnswer_.cell->node())->hasParts(node))
-            return lastAnswer_.cell->id;
+        if (lastAnswer_.candidate == &node) {
+            if constexpr (Node::hasExactKeys)
+                if (const std::uint64_t key = node.keyOf(Node::code);
+                    NodeKeys::isExact(key) && keys_[lastAnswer_.id] == key)
+                    return lastAnswer_.id;
+            if (*nodes_[lastAnswer_.id] == static_cast<const SymbolicExpr&>(node))
+                return lastAnswer_.id;
+        }
     }
     return lookup(&node);
 }

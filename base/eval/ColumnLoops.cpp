@@ -10,11 +10,16 @@
 #include <limits>
 #include <type_traits>
 
-// Compiles a function for processors with wide registers, where the compiler can.
+// Compile a function for processors with wide registers, where the compiler can.
 #ifdef __x86_64__
 #define VTSYM_WIDE [[gnu::target("avx2")]]
 #else
 #define VTSYM_WIDE
+#endif
+#if defined(__x86_64__) && !defined(__clang__)
+#define VTSYM_WIDEST [[gnu::target("avx512f,avx512dq,avx512bw,avx512vl,prefer-vector-width=512")]]
+#else
+#define VTSYM_WIDEST VTSYM_WIDE
 #endif
 
 namespace VT::detail {
@@ -45,12 +50,18 @@ VTSYM_WIDE void wideLoop(const void* left, const void* right, void* result, std:
     apply<Left, typeOfSecond(Operands, Left, Right), Function>(left, Operands == 1 ? left : right, result, rows);
 }
 
-/// The plain loop and the wide one.
-using Loops = std::array<ColumnLoop, 2>;
+template <std::size_t Operands, ScalarType Left, ScalarType Right, class Function>
+VTSYM_WIDEST void widestLoop(const void* left, const void* right, void* result, std::size_t rows) noexcept {
+    apply<Left, typeOfSecond(Operands, Left, Right), Function>(left, Operands == 1 ? left : right, result, rows);
+}
+
+/// By the registers.
+using Loops = std::array<ColumnLoop, registerKinds>;
 
 template <std::size_t Operands, ScalarType Left, ScalarType Right, class Function>
 constexpr Loops loopsOfTypes(Function) {
-    return {loop<Operands, Left, Right, Function>, wideLoop<Operands, Left, Right, Function>};
+    return {loop<Operands, Left, Right, Function>, wideLoop<Operands, Left, Right, Function>,
+            widestLoop<Operands, Left, Right, Function>};
 }
 
 template <std::size_t Operands, class Function>
@@ -76,6 +87,10 @@ VTSYM_WIDE void unifyWidely(const double* values, double* to, std::size_t rows) 
     unify(values, to, rows);
 }
 
+VTSYM_WIDEST void unifyWidest(const double* values, double* to, std::size_t rows) noexcept {
+    unify(values, to, rows);
+}
+
 /// In the order of ScalarRuleIndex, as operationCode() counts.
 constexpr auto loops = std::to_array<std::array<Loops, typePairs>>({
 #define VTSYM_RULE(Op, Operands, Function) loopsOf<Operands>([](auto a, auto b) { return rules::Function(a, b); }),
@@ -85,20 +100,24 @@ constexpr auto loops = std::to_array<std::array<Loops, typePairs>>({
 
 } // namespace
 
-ColumnLoop columnLoop(std::uint32_t code, bool wide) noexcept {
-    return loops[code / typePairs][code % typePairs][wide ? 1 : 0];
+ColumnLoop columnLoop(std::uint32_t code, Registers registers) noexcept {
+    return loops[code / typePairs][code % typePairs][static_cast<std::size_t>(registers)];
 }
 
-bool hasWideRegisters() noexcept {
+Registers widestRegisters() noexcept {
 #ifdef __x86_64__
-    return __builtin_cpu_supports("avx2") != 0;
-#else
-    return false;
+    if (__builtin_cpu_supports("avx512f") && __builtin_cpu_supports("avx512dq") && __builtin_cpu_supports("avx512bw") &&
+        __builtin_cpu_supports("avx512vl"))
+        return Registers::Widest;
+    if (__builtin_cpu_supports("avx2"))
+        return Registers::Wide;
 #endif
+    return Registers::Plain;
 }
 
-void copyVisible(const double* values, double* to, std::size_t rows, bool wide) noexcept {
-    wide ? unifyWidely(values, to, rows) : unifyPlainly(values, to, rows);
+void copyVisible(const double* values, double* to, std::size_t rows, Registers registers) noexcept {
+    constexpr std::array copies{unifyPlainly, unifyWidely, unifyWidest};
+    copies[static_cast<std::size_t>(registers)](values, to, rows);
 }
 
 } // namespace VT::detail

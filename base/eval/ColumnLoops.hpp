@@ -12,13 +12,18 @@ namespace VT::detail {
 /// their type; the results overlap no operand.  An operator of one operand ignores the second.
 using ColumnLoop = void (*)(const void* left, const void* right, void* result, std::size_t rows) noexcept;
 
-/// The loop of an operation's code; `wide` chooses the one for processors with wide registers.
-ColumnLoop columnLoop(std::uint32_t code, bool wide) noexcept;
+/// What loops are compiled for: registers of 16, 32 or 64 bytes on x86.  Their results are the same.
+enum class Registers : std::uint8_t { Plain, Wide, Widest };
 
-/// Whether this processor has the registers that wide loops use.
-bool hasWideRegisters() noexcept;
+inline constexpr std::size_t registerKinds = 3;
+
+/// The loop of an operation's code.
+ColumnLoop columnLoop(std::uint32_t code, Registers registers) noexcept;
+
+/// The widest registers of this processor.
+Registers widestRegisters() noexcept;
 
 /// Copies values and makes every NaN the same, as visibleScalar() does.
-void copyVisible(const double* values, double* to, std::size_t rows, bool wide) noexcept;
+void copyVisible(const double* values, double* to, std::size_t rows, Registers registers) noexcept;
 
 } // namespace VT::detail

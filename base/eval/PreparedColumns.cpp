@@ -160,7 +160,7 @@ void PreparedExprColumns::placeOperations() {
     for (std::uint32_t i = 0; i < count; ++i) {
         const detail::Operation& operation = expression_.operations_[i];
         const std::uint32_t result = first + i;
-        lines_.push_back({detail::columnLoop(operation.code, isWide_), operation.left, operation.right, result});
+        lines_.push_back({detail::columnLoop(operation.code, registers_), operation.left, operation.right, result});
         if (result != root || resultType() == ScalarType::Double)
             buffers_[result] = takeBuffer();
         // Only now, so that results never overlap operands.
@@ -227,7 +227,7 @@ void PreparedExprColumns::run(std::size_t rows, void* results) {
         }
         if (type == ScalarType::Double)
             detail::copyVisible(static_cast<const double*>(values_[root]), reinterpret_cast<double*>(out), count,
-                                isWide_);
+                                registers_);
         else if (root < expression_.firstResult_) // no operation
             std::memcpy(out, values_[root], count * bytesOf(type));
     }

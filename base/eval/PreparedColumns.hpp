@@ -47,7 +47,7 @@ private:
     [[nodiscard]] std::byte* buffer(std::uint32_t number) noexcept;
 
     const PreparedExpr& expression_;
-    bool isWide_ = detail::hasWideRegisters();
+    detail::Registers registers_ = detail::widestRegisters();
     std::vector<Source> sources_;
     std::vector<Line> lines_;
     std::vector<std::uint32_t> buffers_;   ///< numbers, by cell

@@ -1,17 +1,23 @@
 // Prints expressions by identifier, with two stores: printed nodes, which share their texts in a pool, and finished
 // texts.
 //
-// Cost: each distinct node is looked at once in the printer's life; a text costs its length.  textLength() and
-// compareUsingCache() write no text.
+// Method: an expression that is asked for once is written in one pass, without the pool, unless the pass gives up.
+// Cost: a text costs its length, and each distinct node that the pool holds was looked at once in the printer's life.
+// textLength() and compareUsingCache() write no text.
 // Relies on: StringifySymbolicExpr for the texts, the predicate's version() for names that change.
 #include "base/print/ExpressionPrinter.hpp"
 
 #include "base/core/Check.hpp"
 #include "base/core/Limits.hpp"
+#include "base/print/DirectText.hpp"
 #include "base/print/StringifySymbolicExpr.hpp"
 #include "base/print/StructuralOrder.hpp"
 
 #include <boost/unordered_map.hpp>
+
+#include <algorithm>
+#include <optional>
+#include <utility>
 
 namespace VT {
 
@@ -23,10 +29,23 @@ struct SymbolicExprPrinter::State {
           plainNames(predicate.isPlain()),
           quill(quillSyntax),
           spaced(spacedLogicalOperators),
+          direct(expressions, quillSyntax, spacedLogicalOperators),
           stringify(expressions, quillSyntax, spacedLogicalOperators, predicate) {}
 
+    std::string print(SymbolicExprId id) {
+        if (plainNames && table.isPlain() && !stringify.hasMet(id)) {
+            // Where nodes are shared, a pass may write more than the pool would hold; not for long.
+            const std::size_t most = limits::directBytes + limits::directBytesPerNode * table.size();
+            if (std::optional<std::string> text = direct.print(id, std::min(most, textBound))) {
+                VTSYM_CHECK_SAMPLED(isAsPrintedAnew(id, *text));
+                return *std::move(text);
+            }
+        }
+        return printPooled(id);
+    }
+
     template <class Expression>
-    std::string print(const Expression& expression) {
+    std::string printPooled(const Expression& expression) {
         if (!plainNames)
             stringify.forget(); // names may have changed since
         const std::size_t before = stringify.texts().size();
@@ -59,6 +78,8 @@ struct SymbolicExprPrinter::State {
     bool plainNames;
     bool quill;
     bool spaced;
+    std::size_t textBound = limits::textBytes;
+    DirectText direct;
     StringifySymbolicExpr stringify;
     boost::unordered_map<SymbolicExprId, std::string> finished;
     std::uint64_t version = 0; ///< of the names
@@ -77,7 +98,7 @@ std::string SymbolicExprPrinter::operator()(SymbolicExprId id) const {
 }
 
 std::string SymbolicExprPrinter::operator()(const SymbolicExpr& node) const {
-    return state_->print(node);
+    return state_->printPooled(node);
 }
 
 std::string SymbolicExprPrinter::printIdUsingCache(SymbolicExprId id) const {
@@ -106,6 +127,7 @@ int SymbolicExprPrinter::compareUsingCache(SymbolicExprId left, SymbolicExprId r
 }
 
 void SymbolicExprPrinter::setTextBound(std::size_t bytes) {
+    state_->textBound = bytes;
     state_->stringify.setTextBound(bytes);
 }
 

@@ -69,6 +69,12 @@ public:
     [[nodiscard]] virtual std::string print(const SymbolicExpr& node);
     /// The printed form of an expression of the table.  Throws std::out_of_range where the table has none.
     Printed printed(SymbolicExprId id);
+    /// Whether print() or printed() met an expression, so that its text is at hand.
+    [[nodiscard]] bool hasMet(SymbolicExprId id) const noexcept {
+        const Known* const met = known_.find(id);
+        return met != nullptr && met->opAndOne != 0;
+    }
+
     /// Forgets the nodes met by print() and printed(), and their texts.
     virtual void forget();
 

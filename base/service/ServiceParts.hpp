@@ -65,6 +65,8 @@ struct ServiceParts {
     boost::unordered_map<std::string, std::string> parameterAliases;
     std::array<SimplifyCache<SymbolicExprId>, 2> simplified;      ///< by condition
     std::array<SimplifyCache<std::string>, 2> simplifiedFromText; ///< by text
+    /// The simplified texts of texts, for each language in and out.
+    std::array<std::array<SimplifyCache<std::string, std::string>, 2>, 2> simplifiedTexts;
     DecisionCache decisions;
     std::array<std::unique_ptr<Decider>, 8> deciders; ///< by mode
     Budget* budget = nullptr;                         ///< of decisions, owned by the caller

@@ -291,6 +291,8 @@ private:
     [[nodiscard]] bool has(const VCSymbolicExprId& condition) const noexcept;
     SymbolicExprId parse(const std::string& text, bool isQuill);
     VCSymbolicExprId simplifyFrom(const std::string& text, bool isQuill);
+    std::string simplifiedText(const std::string& text, bool wasQuill, bool quill);
+    std::string printSimplified(const std::string& text, bool wasQuill, bool quill);
     bool isAsSimplifiedAnew(const std::string& text, bool isQuill, SymbolicExprId kept);
     std::string printIn(bool quill, SymbolicExprId condition, bool wasQuill);
     VCSymbolicExprId combined(SymbolicExprId condition, bool simplify);

@@ -1,6 +1,6 @@
 // Simplifies conditions: cache, then the customizer's rewrite, then the simplifier.
 //
-// The caches keep identifiers by condition and by text, one pair for each language.  A hit is O(1).
+// The caches keep identifiers by condition and by text, one pair for each language, and texts by text.  A hit is O(1).
 #include "base/core/Check.hpp"
 #include "base/service/ServiceParts.hpp"
 #include "base/service/VCService.hpp"
@@ -27,7 +27,7 @@ VCSymbolicExprId VCService::simplify(const VCSymbolicExprId& condition, bool isQ
     if (!has(condition))
         return invalidId;
     auto& cache = ServiceParts::of(parts_->simplified, isQuill);
-    if (const auto known = parts_->caching ? cache.find(condition.id()) : std::nullopt) {
+    if (const auto known = parts_->caching ? cache.find(condition.id()) : nullptr) {
         VTSYM_CHECK_SAMPLED(parts_->mayHaveChanged(condition.id()) || *known == simplifyNow(condition.id(), isQuill));
         return *known;
     }
@@ -71,7 +71,7 @@ bool VCService::isAsSimplifiedAnew(const std::string& text, bool isQuill, Symbol
 
 VCSymbolicExprId VCService::simplifyFrom(const std::string& text, bool isQuill) {
     auto& cache = ServiceParts::of(parts_->simplifiedFromText, isQuill);
-    if (const auto known = parts_->caching ? cache.find(text) : std::nullopt) {
+    if (const auto known = parts_->caching ? cache.find(text) : nullptr) {
         VTSYM_CHECK_SAMPLED(isAsSimplifiedAnew(text, isQuill, *known));
         return *known;
     }
@@ -79,6 +79,26 @@ VCSymbolicExprId VCService::simplifyFrom(const std::string& text, bool isQuill) 
     if (parts_->caching)
         cache.insert(text, result);
     return result;
+}
+
+/// Simplifies a text and prints the result in the same or the other language.
+std::string VCService::simplifiedText(const std::string& text, bool wasQuill, bool quill) {
+    if (text.empty())
+        return {};
+    auto& cache = ServiceParts::of(ServiceParts::of(parts_->simplifiedTexts, wasQuill), quill);
+    if (const std::string* const known = parts_->caching ? cache.find(text) : nullptr) {
+        VTSYM_CHECK_SAMPLED(*known == printSimplified(text, wasQuill, quill));
+        return *known;
+    }
+    std::string result = printSimplified(text, wasQuill, quill);
+    if (parts_->caching)
+        cache.insert(text, result);
+    return result;
+}
+
+std::string VCService::printSimplified(const std::string& text, bool wasQuill, bool quill) {
+    const VCSymbolicExprId result = simplifyFrom(text, wasQuill);
+    return quill && !wasQuill ? printQExprWithConversion(result) : quill ? printQExpr(result) : printCExpr(result);
 }
 
 VCSymbolicExprId VCService::simplifyFromCCondition(const std::string& text) {

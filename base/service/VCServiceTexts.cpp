@@ -63,19 +63,19 @@ std::string VCService::convertExprBetweenQandC(const std::string& text, bool inp
 }
 
 std::string VCService::simplifyCExprFromCCondition(const std::string& text) {
-    return text.empty() ? std::string() : printCExpr(simplifyFromCCondition(text));
+    return simplifiedText(text, false, false);
 }
 
 std::string VCService::simplifyQExprFromCCondition(const std::string& text) {
-    return text.empty() ? std::string() : printQExprWithConversion(simplifyFromCCondition(text));
+    return simplifiedText(text, false, true);
 }
 
 std::string VCService::simplifyCExprFromQCondition(const std::string& text) {
-    return text.empty() ? std::string() : printCExpr(simplifyFromQCondition(text));
+    return simplifiedText(text, true, false);
 }
 
 std::string VCService::simplifyQExprFromQCondition(const std::string& text) {
-    return text.empty() ? std::string() : printQExpr(simplifyFromQCondition(text));
+    return simplifiedText(text, true, true);
 }
 
 std::string VCService::simplifyExpressionWithoutEvalChecks(const std::string& text, bool inputIsQuill,

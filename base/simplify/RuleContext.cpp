@@ -10,7 +10,10 @@ namespace VT {
 
 RuleListener::~RuleListener() = default;
 
-RuleContext::RuleContext(SymbolicExprTable& table, bool keywordsOn) : table_(table), keywordsOn_(keywordsOn) {}
+RuleContext::RuleContext(SymbolicExprTable& table, bool keywordsOn)
+    : table_(table),
+      isPlain_(table.isPlain()),
+      keywordsOn_(keywordsOn) {}
 
 SymbolicExprId RuleContext::resolve(SymbolicExprId id) const {
     if (op(id) != SymbolicOp::MemberValue)
@@ -20,6 +23,12 @@ SymbolicExprId RuleContext::resolve(SymbolicExprId id) const {
 }
 
 std::optional<int> RuleContext::integer(SymbolicExprId id) const {
+    if (isPlain_) {
+        const std::uint64_t key = table_.keyAt(id);
+        return NodeKeys::isExact(key) && NodeKeys::opOf(key) == SymbolicOp::IntValue
+                   ? std::optional(NodeKeys::integerOf(key))
+                   : std::nullopt;
+    }
     const SymbolicExpr& literal = node(id);
     if (literal.op() != SymbolicOp::IntValue)
         return std::nullopt;

@@ -41,7 +41,12 @@ public:
 
     [[nodiscard]] const SymbolicExpr& node(SymbolicExprId id) const { return *table_.get(id); }
 
-    [[nodiscard]] SymbolicOp op(SymbolicExprId id) const { return node(id).op(); }
+    [[nodiscard]] SymbolicOp op(SymbolicExprId id) const {
+        if (isPlain_) // most nodes need not be looked at
+            if (const std::uint64_t key = table_.keyAt(id); NodeKeys::isExact(key))
+                return NodeKeys::opOf(key);
+        return node(id).op();
+    }
 
     template <class Node, class... Parts>
     SymbolicExprId make(Parts&&... parts) {
@@ -95,6 +100,7 @@ public:
 
 private:
     SymbolicExprTable& table_;
+    bool isPlain_; ///< the table
     bool keywordsOn_;
     RuleListener* listener_ = nullptr;
     std::uint64_t pass_ = 0;

@@ -3,10 +3,14 @@
 #include "tests/support/Cases.hpp"
 #include "tests/support/HostTables.hpp"
 #include "tests/support/TreeText.hpp"
+#include "tests/support/generators/AnyNode.hpp"
 
 #include <gmock/gmock.h>
 
+#include <map>
 #include <memory>
+#include <random>
+#include <set>
 
 namespace VT::Testing {
 namespace {
@@ -93,6 +97,38 @@ TEST(Table, AnAnswerIsNotRememberedForAnotherNodeAtTheSamePlace) {
     EXPECT_EQ(ids(minus, other, 7, 8), Ids(invalidId, 1)) << "a miss is not remembered either";
     EXPECT_EQ(ids(plus, other, 7, 8), Ids(0, 2));
     EXPECT_EQ(ids(minus, table, 7, 8), Ids(1, 1));
+}
+
+TEST(Table, NodesAreOneExactlyWhereTheirPartsAre) {
+    // Operands around the largest that fit the table's keys, and far beyond: a table does not ask whether they are
+    // there.
+    const std::vector<SymbolicExprId> operands{
+        0, 1, 2, (1U << 29U) - 1, 1U << 29U, (1U << 29U) + 1, ~0U, SymbolicExprId{1} << 58U, invalidId - 1, invalidId};
+    SymbolicExprTable table;
+    std::map<std::pair<SymbolicOp, std::vector<SymbolicExprId>>, SymbolicExprId> known;
+    std::mt19937_64 random(5);
+    for (int round = 0; round < 30000; ++round) {
+        const auto op = static_cast<SymbolicOp>(random() % operatorCount);
+        const std::optional<std::size_t> count = operandCount(op);
+        if (count == 0 || op == SymbolicOp::MemberValue || dimensionOps.contains(op) || callOps.contains(op))
+            continue; // leaves, and classes some of whose nodes are equal to those of others
+        std::vector<SymbolicExprId> inputs(count.value_or(random() % 4));
+        for (SymbolicExprId& input : inputs)
+            input = operands[random() % operands.size()];
+        const std::size_t before = table.size();
+        const SymbolicExprId id = makeNode(table, op, inputs);
+        const auto [entry, isNew] = known.emplace(std::pair(op, inputs), id);
+        ASSERT_EQ(entry->second, id);
+        ASSERT_EQ(table.size(), before + (isNew ? 1 : 0));
+        ASSERT_EQ(table.lookup(table.get(id)), id);
+    }
+    std::set<std::string> names;
+    for (int i = 0; i < 1000; ++i) {
+        const std::string name = std::string(random() % 20, "ab"[random() % 2]) + std::string(random() % 2, '\0');
+        const SymbolicExprId id = table.internName(name);
+        EXPECT_EQ(table.size() - known.size(), (names.insert(name), names.size())) << name;
+        EXPECT_EQ(SymbolicString(table, name).getId(table), id);
+    }
 }
 
 TEST(Table, AddKeepsWhatItIsGivenAndFindsTheFirst) {

@@ -63,6 +63,30 @@ TEST_F(PrintBounds, AgreesWithTheTextsAndIsAnOrder) {
             ASSERT_LT(printer.compareUsingCache(ids[i], ids[j]), 0);
 }
 
+TEST(PrintOnce, WritesWhatThePoolDoes) {
+    std::vector<Op> all;
+    for (const OperatorInfo& row : operatorTable())
+        if (row.form != OperatorForm::Leaf)
+            all.push_back(row.op);
+    const std::vector<Op> plain{Op::And,        Op::Or,    Op::Not,      Op::Minus,
+                                Op::UnaryMinus, Op::Equal, Op::Multiply, Op::FcnCall};
+    std::mt19937_64 random(12);
+    for (int round = 0; round < 20000; ++round) {
+        SymbolicExprTable table;
+        const Trees tree{table};
+        const SymbolicExprId id = randomTree(table, random, round % 4 == 0 ? all : plain, 1 + round % 6, [&] {
+            const std::vector<SymbolicExprId> leaves{tree.name("a"),  tree.name("-b"),  tree.name(""),  tree.integer(0),
+                                                     tree.integer(7), tree.integer(-7), tree.real(0.5), tree.name("c")};
+            return leaves[random() % (round % 3 == 0 ? leaves.size() : 2)];
+        });
+        for (const bool quill : {false, true}) {
+            const bool spaced = round % 2 == 0;
+            ASSERT_EQ(SymbolicExprPrinter(table, quill, spaced)(id),
+                      StringifySymbolicExpr(table, quill, spaced).print(id));
+        }
+    }
+}
+
 TEST(PrintHistory, DoesNotDependOnWhatWasInternedWhen) {
     const auto sorted = [](unsigned history) {
         SymbolicExprTable table;

@@ -1,5 +1,4 @@
-// A precedence parser for conditions in one pass: the floor of reading, and an independent reading for the tests of the
-// grammar.
+// A precedence parser for conditions in one pass: an independent reading for the tests of the grammar.
 #pragma once
 
 #include "base/core/Operators.hpp"
@@ -7,17 +6,17 @@
 #include <charconv>
 #include <string_view>
 
-namespace VT::Benchmarks {
+namespace VT::Testing {
 
 /// Makes the nodes of a builder: `intern` an operator with one or two operands, `name`, `integer` and `real`.  Lists
 /// are Rows of one and the rest, a call is a FcnCall of a name and perhaps a list, a member a MemberValue of two names.
 /// Answers Builder::none for a text that is no condition.  Recurses.
 template <class Builder>
-class ConditionReader {
+class PrecedenceReader {
 public:
     using Node = typename Builder::Node;
 
-    ConditionReader(Builder& builder, std::string_view text)
+    PrecedenceReader(Builder& builder, std::string_view text)
         : builder_(builder),
           at_(text.data()),
           end_(text.data() + text.size()) {}
@@ -216,4 +215,4 @@ private:
     const char* end_;
 };
 
-} // namespace VT::Benchmarks
+} // namespace VT::Testing
