@@ -59,9 +59,8 @@ std::optional<NameRange> rangeOf(const SymbolicExprTable& table, SymbolicExprId 
 /// Returns the operands of a chain of one operator; nothing where there are more than are looked at.
 std::vector<SymbolicExprId> operandsOf(const SymbolicExprTable& table, SymbolicExprId chain, SymbolicOp op) {
     std::vector<SymbolicExprId> operands;
-    const bool complete = walkChain(
-        table, chain, limits::rangeOperands, [op](SymbolicExprId, const SymbolicExpr& node) { return node.op() == op; },
-        [&](SymbolicExprId id, const SymbolicExpr* node) {
+    const bool complete =
+        walkChain(table, chain, limits::rangeOperands, LinksOf(op), [&](SymbolicExprId id, const SymbolicExpr* node) {
             operands.push_back(id);
             return node != nullptr;
         });
