@@ -242,14 +242,12 @@ std::optional<std::uint64_t> AssignmentCounter::count(std::span<const SymbolicEx
         parts.push_back(std::move(part));
     };
     for (const SymbolicExprId condition : conditions) {
-        const bool complete = walkChain(
-            table_, condition, limits::chainOperands,
-            [](SymbolicExprId, const SymbolicExpr& node) { return node.op() == SymbolicOp::And; },
-            [&](SymbolicExprId id, const SymbolicExpr*) {
-                if (id != table_.getIdTRUE())
-                    add(id);
-                return isCountable;
-            });
+        const bool complete = walkChain(table_, condition, limits::chainOperands, LinksOf(SymbolicOp::And),
+                                        [&](SymbolicExprId id, const SymbolicExpr*) {
+                                            if (id != table_.getIdTRUE())
+                                                add(id);
+                                            return isCountable;
+                                        });
         isCountable = isCountable && complete;
     }
     if (!isCountable)

@@ -22,24 +22,22 @@ std::vector<ChoiceMerges::Group> ChoiceMerges::groupsOf(SymbolicExprId condition
     std::vector<Group> groups;
     std::vector<std::vector<SymbolicExprId>> operands;
     const SymbolicExprSymbols symbols(table_);
-    const bool complete = walkChain(
-        table_, condition, limits::choiceOperands,
-        [](SymbolicExprId, const SymbolicExpr& node) { return node.op() == SymbolicOp::And; },
-        [&](SymbolicExprId id, const SymbolicExpr* node) {
-            if (node == nullptr)
-                return false;
-            std::vector<SymbolicExprId> names;
-            symbols(id, names);
-            std::ranges::sort(names);
-            const auto at = std::ranges::find(groups, names, &Group::names);
-            const auto position = static_cast<std::size_t>(at - groups.begin());
-            if (at == groups.end()) {
-                groups.push_back({std::move(names), invalidId});
-                operands.emplace_back();
-            }
-            operands[position].push_back(id);
-            return true;
-        });
+    const bool complete = walkChain(table_, condition, limits::choiceOperands, LinksOf(SymbolicOp::And),
+                                    [&](SymbolicExprId id, const SymbolicExpr* node) {
+                                        if (node == nullptr)
+                                            return false;
+                                        std::vector<SymbolicExprId> names;
+                                        symbols(id, names);
+                                        std::ranges::sort(names);
+                                        const auto at = std::ranges::find(groups, names, &Group::names);
+                                        const auto position = static_cast<std::size_t>(at - groups.begin());
+                                        if (at == groups.end()) {
+                                            groups.push_back({std::move(names), invalidId});
+                                            operands.emplace_back();
+                                        }
+                                        operands[position].push_back(id);
+                                        return true;
+                                    });
     if (!complete)
         return {};
     for (std::size_t i = 0; i < groups.size(); ++i) {
@@ -57,13 +55,11 @@ SymbolicExprId ChoiceMerges::asProduct(SymbolicExprId condition) {
     --triesLeft_;
     const SymbolicExprId merged = shorten_(condition);
     bool isProduct = merged != table_.getIdFALSE();
-    walkChain(
-        table_, merged, limits::choiceOperands,
-        [](SymbolicExprId, const SymbolicExpr& node) { return node.op() == SymbolicOp::And; },
-        [&](SymbolicExprId, const SymbolicExpr* node) {
-            isProduct = isProduct && node != nullptr && node->op() != SymbolicOp::Or;
-            return isProduct;
-        });
+    walkChain(table_, merged, limits::choiceOperands, LinksOf(SymbolicOp::And),
+              [&](SymbolicExprId, const SymbolicExpr* node) {
+                  isProduct = isProduct && node != nullptr && node->op() != SymbolicOp::Or;
+                  return isProduct;
+              });
     return isProduct ? merged : invalidId;
 }
 

@@ -32,9 +32,8 @@ bool isIntegerName(const SymbolicExprTable& table, SymbolicExprId id) {
 std::optional<std::vector<SymbolicExprId>> operandsOf(const SymbolicExprTable& table, SymbolicExprId chain,
                                                       SymbolicOp op, std::size_t most) {
     std::vector<SymbolicExprId> operands;
-    const bool isComplete = walkChain(
-        table, chain, most, [op](SymbolicExprId, const SymbolicExpr& node) { return node.op() == op; },
-        [&](SymbolicExprId id, const SymbolicExpr* node) {
+    const bool isComplete =
+        walkChain(table, chain, most, LinksOf(op), [&](SymbolicExprId id, const SymbolicExpr* node) {
             operands.push_back(id);
             return node != nullptr;
         });

@@ -83,13 +83,11 @@ Decision ChoiceSetChecker::State::ask(Decision (Decider::*question)(SymbolicExpr
 std::size_t ChoiceSetChecker::State::operandsOf(SymbolicExprId condition) const {
     static constexpr OperatorSet logicalOps{SymbolicOp::And, SymbolicOp::Or, SymbolicOp::Not};
     std::size_t count = 0;
-    const bool complete = walkChain(
-        table, condition, limits::choiceOperands,
-        [](SymbolicExprId, const SymbolicExpr& node) { return logicalOps.contains(node.op()); },
-        [&](SymbolicExprId, const SymbolicExpr*) {
-            ++count;
-            return true;
-        });
+    const bool complete = walkChain(table, condition, limits::choiceOperands, LinksOf(logicalOps),
+                                    [&](SymbolicExprId, const SymbolicExpr*) {
+                                        ++count;
+                                        return true;
+                                    });
     return complete ? count : limits::choiceOperands + 1;
 }
 

@@ -22,8 +22,7 @@ OrdinaryChoices::OrdinaryChoices(SymbolicExprTable& table, SymbolicExprId contex
       judge_(std::move(judge)) {
     const SymbolicExprSymbols symbols(table);
     isUsable_ = walkDistinctChain(
-        table, context, limits::reasonOperands,
-        [](SymbolicExprId, const SymbolicExpr& node) { return node.op() == SymbolicOp::And; },
+        table, context, limits::reasonOperands, LinksOf(SymbolicOp::And),
         [&](SymbolicExprId id, const SymbolicExpr* node) {
             if (node == nullptr)
                 return false;
@@ -72,19 +71,17 @@ bool OrdinaryChoices::contains(SymbolicExprId condition) {
     };
 
     std::vector<Part> parts;
-    const bool isPlain =
-        isUsable_ && walkChain(
-                         table_, condition, limits::choiceOperands,
-                         [](SymbolicExprId, const SymbolicExpr& node) { return node.op() == SymbolicOp::And; },
-                         [&](SymbolicExprId id, const SymbolicExpr* node) {
-                             const SymbolicExprId name = node == nullptr ? invalidId : nameIn(id);
-                             const auto at = std::ranges::find(parts, name, &Part::name);
-                             if (at == parts.end())
-                                 parts.push_back({name, id});
-                             else
-                                 at->says = makeBinary(table_, SymbolicOp::And, at->says, id);
-                             return name != invalidId;
-                         });
+    const bool isPlain = isUsable_ && walkChain(table_, condition, limits::choiceOperands, LinksOf(SymbolicOp::And),
+                                                [&](SymbolicExprId id, const SymbolicExpr* node) {
+                                                    const SymbolicExprId name =
+                                                        node == nullptr ? invalidId : nameIn(id);
+                                                    const auto at = std::ranges::find(parts, name, &Part::name);
+                                                    if (at == parts.end())
+                                                        parts.push_back({name, id});
+                                                    else
+                                                        at->says = makeBinary(table_, SymbolicOp::And, at->says, id);
+                                                    return name != invalidId;
+                                                });
     return isPlain && std::ranges::all_of(parts, [&](const Part& part) {
                if (const bool* const before = isOrdinary_.find(part.says))
                    return *before;

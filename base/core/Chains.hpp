@@ -16,6 +16,19 @@ namespace VT {
 /// The number of operands of a walk without a limit.
 inline constexpr std::size_t anyNumber = std::numeric_limits<std::size_t>::max();
 
+/// The links of a chain: nodes of one operator, or of one of some.
+class LinksOf {
+public:
+    explicit LinksOf(OperatorSet ops) noexcept : ops_(ops) {}
+
+    explicit LinksOf(SymbolicOp op) noexcept : ops_{op} {}
+
+    bool operator()(SymbolicExprId, const SymbolicExpr& node) const { return ops_.contains(node.op()); }
+
+private:
+    OperatorSet ops_;
+};
+
 namespace detail {
 
 template <class Seen, class IsLink, class Visit>

@@ -133,6 +133,33 @@ inline constexpr std::uint64_t diagramSteps = std::uint64_t{1} << 12U;
 /// that were easy to decide, the smallest found so far is reported.
 inline constexpr std::uint64_t witnessSteps = std::uint64_t{1} << 19U;
 
+/// Steps that work on the smallest witness may cost: so many times what the question took so far, and so many in any
+/// case.  At most the former is charged, so that how names are spelt changes the cost of a question by no more than a
+/// factor of two.  Beyond the bound the smallest found so far is reported.
+inline constexpr std::uint64_t spellingFactor = 8;
+inline constexpr std::uint64_t spellingSteps = 8192;
+
+/// The part of a question's steps that paths of a diagram may take which nothing meets, one in so many.  Beyond it a
+/// search that learns from them takes over.
+inline constexpr std::uint64_t vainShare = 8;
+
+/// Steps to find out which ranges of such a path suffice to exclude it: so many, and so many times what excluding it
+/// took.  Beyond them the search learns from more ranges than it needs to.
+inline constexpr std::uint64_t refutingSteps = 4096;
+inline constexpr std::uint64_t refutingFactor = 8;
+
+/// Steps for each node of a term that is evaluated to confirm a witness: it takes that many times the memory of an edge
+/// of a diagram.
+inline constexpr std::uint64_t plannedNodeSteps = 4;
+
+/// Nodes of such terms that are kept from question to question, about 80 bytes each.  When there are more, everything
+/// that was read is thrown away before the next question.
+inline constexpr std::size_t keptPlannedNodes = std::size_t{1} << 18U;
+
+/// Pairs of calls with equal arguments and different values that one look at a witness reports.  Further ones are found
+/// with the next witness.
+inline constexpr std::size_t callPairs = 4096;
+
 /// Numbers and references in the circuits of conditions that are kept between questions, 4 to 8 bytes each.  When there
 /// are more, all are thrown away before the next question, which reads anew what it needs.
 inline constexpr std::size_t circuitSize = std::size_t{1} << 22U;

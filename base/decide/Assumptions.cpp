@@ -37,8 +37,7 @@ bool Assumptions::add(SymbolicExprId condition) {
         return false;
     std::vector<SymbolicExprId> operands;
     const bool complete = walkDistinctChain(
-        table_, SymbolicExprQ2C(table_)(condition), anyNumber,
-        [](SymbolicExprId, const SymbolicExpr& node) { return node.op() == SymbolicOp::And; },
+        table_, SymbolicExprQ2C(table_)(condition), anyNumber, LinksOf(SymbolicOp::And),
         [&](SymbolicExprId id, const SymbolicExpr* node) {
             operands.push_back(id);
             return node != nullptr;

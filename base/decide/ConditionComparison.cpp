@@ -6,11 +6,14 @@
 // together with a round number near the bound, so that the circuit holds small bounds only.
 //
 // Cost: linear in the parts of the forms.
+#include "base/core/Chains.hpp"
 #include "base/core/Limits.hpp"
 #include "base/decide/ConditionReader.hpp"
 #include "base/integer/ExactArithmetic.hpp"
 
+#include <algorithm>
 #include <cmath>
+#include <iterator>
 #include <numeric>
 #include <tuple>
 
@@ -23,8 +26,64 @@ Gate ConditionReader::ownTruth(SymbolicExprId id) {
 }
 
 ConditionReader::Value ConditionReader::comparison(const Frame& frame) {
-    const auto truth = compared(frame.node->op(), operand(frame, 0), operand(frame, 1));
+    const SymbolicOp op = frame.node->op();
+    if (op == SymbolicOp::Equal || op == SymbolicOp::NotEqual)
+        if (const auto equal = equalProducts(operands_[frame.firstOperand], operands_[frame.firstOperand + 1]))
+            return ofTruth(op == SymbolicOp::Equal ? *equal : opposite(*equal));
+    const auto truth = compared(op, operand(frame, 0), operand(frame, 1));
     return ofTruth(truth ? *truth : ownTruth(frame.id));
+}
+
+/// Where two products with common factors are equal: where one of those is 0, or where the rests are equal.  Nothing
+/// where that is not understood, or a rest is a product, which would be an unknown of its own.
+std::optional<Gate> ConditionReader::equalProducts(SymbolicExprId a, SymbolicExprId b) {
+    if (table_.get(a)->op() != SymbolicOp::Multiply && table_.get(b)->op() != SymbolicOp::Multiply)
+        return std::nullopt;
+    using Factors = std::vector<SymbolicExprId>;
+    bool areUnderstood = true;
+    const auto factorsOf = [&](SymbolicExprId product) {
+        Factors factors;
+        walkChain(table_, product, anyNumber, LinksOf(SymbolicOp::Multiply),
+                  [&](SymbolicExprId id, const SymbolicExpr*) {
+                      steps_.take();
+                      areUnderstood = areUnderstood && isLinear(valueOf(id));
+                      factors.push_back(id);
+                      return areUnderstood;
+                  });
+        std::ranges::sort(factors);
+        return factors;
+    };
+    const Factors left = factorsOf(a);
+    const Factors right = areUnderstood ? factorsOf(b) : Factors();
+    Factors common;
+    std::ranges::set_intersection(left, right, std::back_inserter(common));
+    if (!areUnderstood || common.empty() || std::max(left.size(), right.size()) > common.size() + 1)
+        return std::nullopt;
+    const auto restOf = [&](const Factors& factors) {
+        Factors rest;
+        std::ranges::set_difference(factors, common, std::back_inserter(rest));
+        return rest.empty() ? ofNumber(1) : valueOf(rest.front());
+    };
+    auto equal = compared(SymbolicOp::Equal, restOf(left), restOf(right));
+    for (const SymbolicExprId factor : common)
+        if (const auto isZero = equal ? compared(SymbolicOp::Equal, valueOf(factor), ofNumber(0)) : std::nullopt)
+            equal = circuit_.either(*equal, *isZero);
+        else
+            return std::nullopt;
+    return equal;
+}
+
+/// Whether a value is an integer that exists whatever the values of its unknowns are.
+bool ConditionReader::isLinear(const Value& value) {
+    if (value.kind == Value::Kind::Truth)
+        return true;
+    const auto isTerm = [&](const WidePart& part) { return unknowns_[part.unknown].kind == UnknownKind::Term; };
+    return value.kind == Value::Kind::Number && !value.isReal &&
+           std::ranges::none_of(value.cases, [&](const Case& each) {
+               const WideForm form = each.form.widened();
+               charge(form);
+               return std::ranges::any_of(form.parts, isTerm);
+           });
 }
 
 /// Where `a op b` holds; nothing where that is not understood.

@@ -265,31 +265,4 @@ Gate ConditionReader::truthOf(SymbolicExprId id) {
     }
 }
 
-/// The cases of a number, of a truth value or of a finite real literal.
-ConditionReader::Cases ConditionReader::casesOf(const Value& value) const {
-    if (value.kind == Value::Kind::Number)
-        return value.cases;
-    Cases cases;
-    if (value.kind == Value::Kind::Real) {
-        cases.push_back({always, RationalForm::of(value.real)});
-        return cases;
-    }
-    if (value.truth != never)
-        cases.push_back({value.truth, LinearForm{{}, 1}});
-    if (value.truth != always)
-        cases.push_back({opposite(value.truth), LinearForm{}});
-    return cases;
-}
-
-void ConditionReader::addCase(Cases& cases, Gate guard, const RationalForm& form) {
-    if (guard == never)
-        return;
-    const auto known = std::ranges::find(cases, form, &Case::form);
-    if (known != cases.end()) {
-        known->guard = circuit_.either(known->guard, guard);
-        return;
-    }
-    cases.push_back({guard, form});
-}
-
 } // namespace VT

@@ -105,6 +105,8 @@ private:
     Value compute(const Frame& frame);
     Value chain(const Frame& frame);
     Value comparison(const Frame& frame);
+    std::optional<Gate> equalProducts(SymbolicExprId a, SymbolicExprId b);
+    bool isLinear(const Value& value);
     std::optional<Gate> compared(SymbolicOp op, const Value& a, const Value& b);
     Value arithmetic(const Frame& frame);
     Value sum(const Frame& frame);
@@ -125,7 +127,8 @@ private:
     Gate truthOf(SymbolicExprId id);
     Gate ownTruth(SymbolicExprId id);
     Cases casesOf(const Value& value) const;
-    void addCase(Cases& cases, Gate guard, const RationalForm& form);
+    RationalForm pinned(Gate guard, const RationalForm& form);
+    void addCase(Cases& cases, Gate guard, const RationalForm& given);
     /// Where `form op 0` holds.
     Gate compare(SymbolicOp op, const RationalForm& form);
     /// The same for the three operators that the others are the opposites of.

@@ -29,16 +29,14 @@ struct Quotient {
 /// The value of a product of positive integers that fits a literal.
 std::optional<std::int64_t> productOf(const SymbolicExprTable& table, SymbolicExprId id) {
     std::int64_t product = 1;
-    const bool complete = walkChain(
-        table, id, limits::chainOperands,
-        [](SymbolicExprId, const SymbolicExpr& node) { return node.op() == SymbolicOp::Multiply; },
-        [&](SymbolicExprId, const SymbolicExpr* node) {
-            if (node == nullptr || node->op() != SymbolicOp::IntValue)
-                return false;
-            const int factor = static_cast<const SymbolicIntValue*>(node)->getValue();
-            product *= factor > 0 ? factor : 0;
-            return product > 0 && fitsInt(product);
-        });
+    const bool complete = walkChain(table, id, limits::chainOperands, LinksOf(SymbolicOp::Multiply),
+                                    [&](SymbolicExprId, const SymbolicExpr* node) {
+                                        if (node == nullptr || node->op() != SymbolicOp::IntValue)
+                                            return false;
+                                        const int factor = static_cast<const SymbolicIntValue*>(node)->getValue();
+                                        product *= factor > 0 ? factor : 0;
+                                        return product > 0 && fitsInt(product);
+                                    });
     return complete ? std::optional(product) : std::nullopt;
 }
 

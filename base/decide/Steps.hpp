@@ -66,11 +66,10 @@ public:
             }
             return;
         }
-        constexpr std::uint64_t times = 8;
-        constexpr std::uint64_t always = 8192;
         const std::uint64_t spent = total_ - left_ - kept_;
         const std::uint64_t before = left_;
-        const std::uint64_t allowed = std::min(times * spent + always, limits::witnessSteps);
+        const std::uint64_t allowed =
+            std::min(limits::spellingFactor * spent + limits::spellingSteps, limits::witnessSteps);
         left_ = allowed;
         isSpelling_ = true;
         try {

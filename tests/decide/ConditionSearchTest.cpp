@@ -1,5 +1,5 @@
 // The search over comparisons against the diagrams, which share nothing but the question.
-#include "base/decide/search/ConditionSearch.hpp"
+#include "base/decide/DeciderState.hpp"
 #include "tests/decide/DecisionFixture.hpp"
 #include "tests/support/generators/RandomCondition.hpp"
 
@@ -9,16 +9,8 @@ namespace VT::Testing {
 namespace {
 
 /// Everything that a decision needs, with the ways to decide apart from each other.
-struct SearchBench : DecisionFixture {
-    SearchBench()
-        : printer(table, false),
-          leaves(table, false),
-          unknowns(table, printer, minusInfinite, plusInfinite),
-          circuit(unknowns, steps),
-          reader(leaves, unknowns, circuit, steps),
-          diagrams(steps),
-          witnesses(leaves, unknowns, diagrams, steps),
-          search(unknowns, witnesses, steps) {}
+struct SearchBench : DecisionFixture, DecisionParts {
+    SearchBench() : DecisionParts(table, false, minusInfinite, plusInfinite) {}
 
     std::pair<Decision, Decision> bothWays(SymbolicExprId id) {
         steps.refill(limits::decisionSteps);
@@ -31,17 +23,6 @@ struct SearchBench : DecisionFixture {
         Decision byDiagrams = witnesses.find(question, diagrams.of(question), condition.leaves);
         return {std::move(byDiagrams), search.find(question, condition.leaves)};
     }
-
-    SymbolicExprPrinter printer;
-    LeafReader leaves;
-    Steps steps;
-    Unknowns unknowns;
-    Circuit circuit;
-    ConditionReader reader;
-    Question question;
-    Diagrams diagrams;
-    WitnessSearch witnesses;
-    ConditionSearch search;
 };
 
 TEST(ConditionSearch, AgreesWithDiagrams) {

@@ -35,10 +35,49 @@ TEST(LinearDecisions, Relations) {
     }
 }
 
-/// What the solver decides within its limit is decided alike; witnesses hold by evaluation.
+/// Quotients of quotients against C's own, and the smallest witness.
+TEST(LinearDecisions, NestedQuotientsAreThoseOfC) {
+    std::mt19937_64 random(47);
+    constexpr int far = 3000;
+    std::size_t held = 0;
+    for (int round = 0; round < 300; ++round) {
+        std::string text = "X";
+        std::vector<std::pair<int, int>> links; // a divisor and what is added
+        for (std::size_t i = 0; i < 1 + random() % 5; ++i) {
+            links.emplace_back(static_cast<int>(2 + random() % 3) * (random() % 4 == 0 ? -1 : 1),
+                               static_cast<int>(random() % 5) - 2);
+            text =
+                "(" + text + "/" + std::to_string(links.back().first) + "+" + std::to_string(links.back().second) + ")";
+        }
+        const auto valueAt = [&](int x) {
+            for (const auto& [divisor, added] : links)
+                x = x / divisor + added;
+            return x;
+        };
+        const int wanted = static_cast<int>(random() % 7) - 3;
+        int smallest = 0; // 0, 1, -1, 2, ...
+        while (smallest < far && valueAt(smallest) != wanted)
+            smallest = smallest > 0 ? -smallest : 1 - smallest;
+        DecisionFixture bench;
+        const Decision decision = bench.decider.canHold(bench.parse(text + "==" + std::to_string(wanted)));
+        SCOPED_TRACE(text + "==" + std::to_string(wanted));
+        ASSERT_EQ(decision.answer, smallest < far ? Answer::Yes : Answer::No);
+        if (decision.isNo())
+            continue;
+        ++held;
+        ASSERT_EQ(bench.text(decision), "yes: X=" + std::to_string(smallest));
+    }
+    EXPECT_GT(held, 100U);
+}
+
+/// What the solver decides within its limit is decided alike; witnesses hold by evaluation.  VTSYM_LINEAR_PAIRS asks
+/// for more pairs; with VTSYM_LINEAR_FIRST they begin at that seed, and the solver, which takes most of the time, is
+/// asked only what no witness proves.
 TEST(LinearDecisions, RandomPairsAgreeWithTheSolver) {
     const char* asked = std::getenv("VTSYM_LINEAR_PAIRS");
     const std::size_t pairs = asked != nullptr ? std::strtoul(asked, nullptr, 10) : 200;
+    const char* chunk = std::getenv("VTSYM_LINEAR_FIRST");
+    const std::size_t first = chunk != nullptr ? std::strtoul(chunk, nullptr, 10) : 0;
     constexpr unsigned solverResources = 3000000;
     using Clock = std::chrono::steady_clock;
     Clock::duration own{};
@@ -53,7 +92,7 @@ TEST(LinearDecisions, RandomPairsAgreeWithTheSolver) {
         Solver solver(bench.table);
         solver.limit(solverResources);
         for (int i = 0; i < 200 && done < all; ++i, ++done) {
-            const std::size_t seed = done < pairs ? done : hard[done - pairs];
+            const std::size_t seed = done < pairs ? first + done : hard[done - pairs];
             std::mt19937_64 random(seed);
             const std::string textA = randomLinear(random);
             const std::string textB = randomLinear(random);
@@ -67,6 +106,12 @@ TEST(LinearDecisions, RandomPairsAgreeWithTheSolver) {
             for (const auto& [decision, inA, inB] :
                  {std::tuple(&relation.onlyA, true, false), std::tuple(&relation.onlyB, false, true),
                   std::tuple(&relation.both, true, true)}) {
+                for (const auto& [id, in] : {std::pair(a, inA), std::pair(b, inB)})
+                    if (decision->witness) {
+                        ASSERT_EQ(bench.decider.holds(id, *decision->witness), in);
+                    }
+                if (chunk != nullptr && decision->witness)
+                    continue;
                 const auto start = Clock::now();
                 const Z3_ast left = inA ? solver.truth(a) : solver.negated(solver.truth(a));
                 const Z3_ast right = inB ? solver.truth(b) : solver.negated(solver.truth(b));
@@ -74,10 +119,6 @@ TEST(LinearDecisions, RandomPairsAgreeWithTheSolver) {
                 others += Clock::now() - start;
                 given += known ? 0U : 1U;
                 withoutWitness += decision->isYes() && !decision->witness ? 1U : 0U; // a number beyond 64 bits
-                for (const auto& [id, in] : {std::pair(a, inA), std::pair(b, inB)})
-                    if (decision->witness) {
-                        ASSERT_EQ(bench.decider.holds(id, *decision->witness), in);
-                    }
                 if (known && decision->isUndecided()) {
                     undecided += " " + std::to_string(seed);
                 } else if (known) {
@@ -93,7 +134,7 @@ TEST(LinearDecisions, RandomPairsAgreeWithTheSolver) {
     RecordProperty("microseconds", perPair(own));
     RecordProperty("microsecondsOfSolver", perPair(others));
     EXPECT_EQ(undecided, "") << "questions left undecided, by pair";
-    EXPECT_LE(withoutWitness * 50, pairs);
+    EXPECT_LE(withoutWitness * 30, pairs);
     EXPECT_LE(given * 20, pairs) << "questions that the solver gave up";
     if (asked != nullptr)
         std::cout << "us a pair: " << perPair(own) << ", solver " << perPair(others) << ", questions given up by it "

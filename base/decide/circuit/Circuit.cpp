@@ -2,7 +2,7 @@
 //
 // Method: operands are gathered with marks, nested Ands taken apart; comparisons of one quantity are intersected in
 // pairs; then each Or is looked at with the marks of the others (unit resolution, one level deep), a bounded number of
-// times.  Nodes are found by open addressing.
+// times, where bounds of two unknowns bound their difference.  Nodes are found by open addressing.
 #include "base/decide/circuit/Circuit.hpp"
 
 #include "base/core/Check.hpp"
@@ -124,6 +124,13 @@ Gate Circuit::between(Quantity quantity, std::int64_t low, std::int64_t high) {
     if (high < info.high)
         scratch_.ends.push_back(high);
     return comparison(quantity, scratch_);
+}
+
+std::pair<std::int64_t, std::int64_t> Circuit::range(Gate truth) const {
+    const QuantityInfo& info = unknowns_.quantity(quantity(truth));
+    const std::span<const std::int64_t> sides = ends(truth);
+    const bool holdsAtEnd = holdsAtStart(truth) == (sides.size() % 2 == 0);
+    return {holdsAtStart(truth) ? info.low : sides.front() + 1, holdsAtEnd ? info.high : sides.back()};
 }
 
 void Circuit::assign(Range& range, Gate truth) const {
@@ -260,17 +267,48 @@ bool Circuit::joinComparisons() {
     return true;
 }
 
+/// The gathered comparison of a quantity; `always` where there is none.
+Gate Circuit::gatheredAbout(Quantity quantity) const {
+    const bool isThere = quantity < byQuantity_.size() && byQuantity_[quantity].gathering == gathering_;
+    return isThere ? gathered_[byQuantity_[quantity].value] : always;
+}
+
+/// The least and the greatest value that the gathered comparison of an unknown leaves it.
+std::pair<std::int64_t, std::int64_t> Circuit::gatheredRange(Unknown unknown) const {
+    const Quantity own = unknowns_[unknown].quantity;
+    const Gate truth = gatheredAbout(own);
+    if (truth != always)
+        return range(truth);
+    const QuantityInfo& info = unknowns_.quantity(own);
+    return {info.low, info.high};
+}
+
+/// What the gathered comparisons of two unknowns say about one of their difference.
+Circuit::Known Circuit::knownOfDifference(Gate truth) const {
+    const QuantityInfo& info = unknowns_.quantity(quantity(truth));
+    if (!info.isDifference())
+        return Known::Open;
+    const auto [plusLow, plusHigh] = gatheredRange(info.plus);
+    const auto [minusLow, minusHigh] = gatheredRange(info.minus);
+    const bool isBelow = plusLow != minusInfinite && minusHigh != plusInfinite; // bounded from below
+    const bool isAbove = plusHigh != plusInfinite && minusLow != minusInfinite;
+    const std::span<const std::int64_t> sides = ends(truth);
+    const auto first = isBelow ? std::ranges::lower_bound(sides, plusLow - minusHigh) : sides.begin();
+    if (first != sides.end() && !(isAbove && *first >= plusHigh - minusLow))
+        return Known::Open;
+    return holdsAtStart(truth) == ((first - sides.begin()) % 2 == 0) ? Known::True : Known::False;
+}
+
 /// What the gathered operands say about another condition.
 Circuit::Known Circuit::knownOf(Gate truth) const {
     const Mark& mark = marks_[truth >> 1U];
     if (mark.gathering == gathering_)
         return mark.value == (truth & 1U) ? Known::True : Known::False;
-    if (!isComparison(truth) || quantity(truth) >= byQuantity_.size())
+    if (!isComparison(truth))
         return Known::Open;
-    const Mark& position = byQuantity_[quantity(truth)];
-    if (position.gathering != gathering_ || gathered_[position.value] == always)
-        return Known::Open;
-    const Gate other = gathered_[position.value];
+    const Gate other = gatheredAbout(quantity(truth));
+    if (other == always)
+        return knownOfDifference(truth);
     bool here = holdsAtStart(truth);
     bool there = holdsAtStart(other);
     bool inside = there && here;

@@ -56,6 +56,9 @@ public:
     /// Of a comparison.
     [[nodiscard]] Quantity quantity(Gate truth) const { return nodes_[truth >> 1U].quantity; }
 
+    /// The least and the greatest value for which a comparison holds.
+    [[nodiscard]] std::pair<std::int64_t, std::int64_t> range(Gate truth) const;
+
     /// Of the node of a comparison: it holds up to the first end, fails from there to the second, and so on.
     [[nodiscard]] std::span<const std::int64_t> ends(Gate truth) const {
         const Node& node = nodes_[truth >> 1U];
@@ -104,6 +107,9 @@ private:
     void gatherOne(Gate truth, bool& possible);
     bool joinComparisons();
     bool resolveOrs(bool& foundUnit);
+    [[nodiscard]] Gate gatheredAbout(Quantity quantity) const;
+    [[nodiscard]] std::pair<std::int64_t, std::int64_t> gatheredRange(Unknown unknown) const;
+    [[nodiscard]] Known knownOfDifference(Gate truth) const;
     [[nodiscard]] Known knownOf(Gate truth) const;
 
     [[nodiscard]] bool holdsAtStart(Gate truth) const { return (truth & 1U) == 0; }

@@ -59,8 +59,7 @@ Level Question::addLevel(const Unknowns& unknowns, Quantity quantity, Level afte
         return mark.value;
     mark = {question_, static_cast<std::uint32_t>(levels_.size())};
     const QuantityInfo& info = unknowns.quantity(quantity);
-    LevelInfo level{quantity, info.plus, info.minus, false, info.isDifference() || unknowns[info.plus].isComputed(),
-                    info.low, info.high};
+    LevelInfo level{quantity, info.plus, info.minus, false, info.dependsOnOthers(), info.low, info.high};
     if (level.isChecked)
         rankUnknowns();
     bool turned = false;
@@ -68,7 +67,7 @@ Level Question::addLevel(const Unknowns& unknowns, Quantity quantity, Level afte
         turned = rankOf(info.plus) < rankOf(info.minus);
         if (turned)
             std::swap(level.plus, level.minus);
-    } else if (unknowns[info.plus].kind == UnknownKind::Sum) {
+    } else if (info.kind == UnknownKind::Sum) {
         const LinearParts& parts = unknowns[info.plus].sum;
         turned =
             std::ranges::min_element(parts, {}, [&](const LinearPart& p) { return rankOf(p.unknown); })->factor < 0;
@@ -135,7 +134,8 @@ void Question::addComparison(const Circuit& circuit, Level level, Gate truth) {
             ends_.push_back(-ends[i] - 1);
         flip = ends.size() % 2 != 0;
     } else {
-        ends_.insert(ends_.end(), ends.begin(), ends.end());
+        for (const std::int64_t end : ends) // one or two, as a rule
+            ends_.push_back(end);
     }
     byNode_[truth >> 1U] = {question_, static_cast<std::uint32_t>(nodes_.size()) * 2 + (flip ? 1U : 0U)};
     nodes_.push_back({level, first, static_cast<std::uint32_t>(ends.size())});

@@ -137,7 +137,8 @@ Diagram Diagrams::make(Level level, std::size_t scratch) {
         needsChecking = needsChecking || this->needsChecking(edge->child);
     const auto number = static_cast<std::uint32_t>(nodes_.size());
     const auto first = static_cast<std::uint32_t>(edges_.size());
-    edges_.insert(edges_.end(), fresh, scratch_.end());
+    for (auto edge = fresh; edge != scratch_.end(); ++edge) // two or three, as a rule
+        edges_.push_back(*edge);
     nodes_.push_back({level, first, static_cast<std::uint32_t>(count), needsChecking});
     index_[at] = number;
     scratch_.resize(scratch);

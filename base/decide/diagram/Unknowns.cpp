@@ -130,7 +130,7 @@ std::pair<std::int64_t, std::int64_t> Unknowns::rangeOf(const LinearParts& parts
 Unknown Unknowns::add(UnknownInfo info) {
     const auto unknown = static_cast<Unknown>(unknowns_.size());
     info.quantity = static_cast<Quantity>(quantities_.size());
-    quantities_.push_back({unknown, noUnknown, info.low, info.high});
+    quantities_.push_back({unknown, noUnknown, info.low, info.high, info.kind});
     unknowns_.push_back(std::move(info));
     if (unknowns_.back().isComputed())
         return unknown;

@@ -60,6 +60,10 @@ struct QuantityInfo {
     Unknown minus; ///< subtracted, or noUnknown
     std::int64_t low;
     std::int64_t high;
+    UnknownKind kind = UnknownKind::Free; ///< of `plus` where nothing is subtracted
+
+    /// Whether the value depends on those of other quantities.
+    [[nodiscard]] bool dependsOnOthers() const noexcept { return isDifference() || kind >= UnknownKind::Term; }
 
     [[nodiscard]] bool isDifference() const noexcept { return minus != noUnknown; }
 };

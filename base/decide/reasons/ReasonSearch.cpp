@@ -41,8 +41,7 @@ std::optional<std::vector<SymbolicExprId>> ReasonSearch::operandsOf(std::span<co
         std::vector<SymbolicExprId> ofPremise;
         bool isMissing = false;
         const bool complete = walkDistinctChain(
-            table_, premise, limits::reasonOperands,
-            [](SymbolicExprId, const SymbolicExpr& node) { return node.op() == SymbolicOp::And; },
+            table_, premise, limits::reasonOperands, LinksOf(SymbolicOp::And),
             [&](SymbolicExprId id, const SymbolicExpr* node) {
                 ofPremise.push_back(id);
                 isMissing = isMissing || node == nullptr;

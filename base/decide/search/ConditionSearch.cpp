@@ -2,6 +2,7 @@
 #include "base/decide/search/ConditionSearch.hpp"
 
 #include "base/core/Check.hpp"
+#include "base/core/Limits.hpp"
 
 #include <algorithm>
 
@@ -268,15 +269,13 @@ void ConditionSearch::readPath() {
 /// whole path took `spent` steps.  About fewer ranges it takes fewer, as a rule, or else many more: these tries are
 /// given up.
 void ConditionSearch::refute(std::uint64_t spent) {
-    constexpr std::uint64_t allTimes = 8;
-    constexpr std::uint64_t inAnyCase = 4096;
-    const Steps::Share share(steps_, inAnyCase + allTimes * spent);
+    const Steps::Share share(steps_, limits::refutingSteps + limits::refutingFactor * spent);
     for (std::size_t length = path_.size(); length > 0; length /= 2) {
         for (std::size_t i = 0; i < path_.size();) {
             std::vector<LevelRange> without(path_.begin(), path_.begin() + static_cast<std::ptrdiff_t>(i));
             const std::size_t rest = std::min(i + length, path_.size());
             without.insert(without.end(), path_.begin() + static_cast<std::ptrdiff_t>(rest), path_.end());
-            if (witnesses_.excludesPath(without, inAnyCase + spent))
+            if (witnesses_.excludesPath(without, limits::refutingSteps + spent))
                 path_ = std::move(without);
             else
                 i = rest;

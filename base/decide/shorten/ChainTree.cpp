@@ -21,8 +21,7 @@ bool ChainTree::split(SymbolicExprId condition) {
         items_[i].op = op;
         const bool complete = walkChain(
             table_, items_[i].id, limits::chainOperands - std::min<std::uint64_t>(items_.size(), limits::chainOperands),
-            [op](SymbolicExprId, const SymbolicExpr& link) { return link.op() == op; },
-            [&](SymbolicExprId id, const SymbolicExpr* operand) {
+            LinksOf(op), [&](SymbolicExprId id, const SymbolicExpr* operand) {
                 items_[i].operands.push_back(items_.size());
                 items_.push_back({.id = id, .parent = i});
                 return operand != nullptr;

@@ -82,7 +82,30 @@ void DifferenceSystem::findRanges() {
     tighten();
 }
 
+/// Values by their own bounds alone, below which no solution goes; whether they are one, if no range is empty.
+std::optional<bool> DifferenceSystem::solveApart(std::vector<std::int64_t>& values) {
+    steps_.take(bounds_.size() / boundsPerStep + 1);
+    low_.assign(count_, minusInfinite);
+    high_.assign(count_, plusInfinite);
+    low_[0] = high_[0] = 0;
+    for (const Bound& bound : bounds_) {
+        if (bound.y == 0)
+            high_[bound.x] = std::min(high_[bound.x], bound.most);
+        else if (bound.x == 0)
+            low_[bound.y] = std::max(low_[bound.y], -bound.most);
+    }
+    values.resize(count_);
+    for (Number x = 0; x < count_; ++x) {
+        if (low_[x] > high_[x])
+            return std::nullopt;
+        values[x] = std::clamp(std::int64_t{0}, low_[x], high_[x]);
+    }
+    return std::ranges::all_of(bounds_, [&](const Bound& b) { return values[b.x] - values[b.y] <= b.most; });
+}
+
 bool DifferenceSystem::solve(std::vector<std::int64_t>& values) {
+    if (const auto apart = solveApart(values); !apart || *apart)
+        return apart.has_value();
     if (!canBeMet())
         return false;
     findRanges();

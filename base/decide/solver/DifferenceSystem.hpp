@@ -12,6 +12,7 @@
 #include "base/decide/Steps.hpp"
 
 #include <cstdint>
+#include <optional>
 #include <vector>
 
 namespace VT {
@@ -52,6 +53,7 @@ public:
 
 private:
     bool canBeMet();
+    std::optional<bool> solveApart(std::vector<std::int64_t>& values);
     void tighten();
 
     Steps& steps_;

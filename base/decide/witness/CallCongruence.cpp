@@ -5,8 +5,8 @@
 // order alone. n log n comparisons of argument lists, and one for each pair of neighbours with equal ones.
 #include "base/decide/witness/CallCongruence.hpp"
 
+#include "base/core/Limits.hpp"
 #include "base/core/Nodes.hpp"
-#include "base/decide/witness/TermPlan.hpp"
 
 #include <algorithm>
 #include <vector>
@@ -14,9 +14,6 @@
 namespace VT {
 
 namespace {
-
-/// Pairs that one look at a witness reports.  Further ones are found with the next witness.
-constexpr std::size_t atOnce = 4096;
 
 struct Call {
     SymbolicExprId name;
@@ -64,7 +61,7 @@ CallCongruence::findViolations(std::span<const SymbolicExprId> calls, const Witn
         const SymbolicExpr& node = *table.get(calls[i]);
         Call call{node.getInput(0), {}, i, *value};
         for (std::size_t at = 1; at < node.getNumInputs(); ++at) {
-            TermPlan plan(leaves_, unknowns_, node.getInput(at));
+            TermPlan& plan = plans_.of(node.getInput(at));
             steps_.take(plan.size() + 1);
             const auto argument = plan.exactValue(valueOf);
             const auto integer = argument ? argument->integer() : std::nullopt;
@@ -84,7 +81,7 @@ CallCongruence::findViolations(std::span<const SymbolicExprId> calls, const Witn
     std::vector<std::pair<std::size_t, std::size_t>> violations;
     for (std::size_t i = 0; i < all.size(); ++i) {
         const Call& a = all[i];
-        for (std::size_t j = i + 1; j < all.size() && violations.size() < atOnce; ++j) {
+        for (std::size_t j = i + 1; j < all.size() && violations.size() < limits::callPairs; ++j) {
             const Call& b = all[j];
             steps_.take();
             if (a.name != b.name || a.arguments != b.arguments)

@@ -4,7 +4,7 @@
 #include "base/decide/Decision.hpp"
 #include "base/decide/LeafReader.hpp"
 #include "base/decide/Steps.hpp"
-#include "base/decide/diagram/Unknowns.hpp"
+#include "base/decide/witness/TermPlans.hpp"
 
 #include <span>
 #include <utility>
@@ -18,9 +18,10 @@ namespace VT {
 
 class CallCongruence {
 public:
-    CallCongruence(const LeafReader& leaves, Unknowns& unknowns, Steps& steps)
+    CallCongruence(const LeafReader& leaves, const Unknowns& unknowns, TermPlans& plans, Steps& steps)
         : leaves_(leaves),
           unknowns_(unknowns),
+          plans_(plans),
           steps_(steps) {}
 
     /// Calls that a witness gives two values, though they call one function with arguments that are equal under the
@@ -31,7 +32,8 @@ public:
 
 private:
     const LeafReader& leaves_;
-    Unknowns& unknowns_;
+    const Unknowns& unknowns_;
+    TermPlans& plans_;
     Steps& steps_;
 };
 

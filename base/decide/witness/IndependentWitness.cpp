@@ -1,12 +1,14 @@
-// The smallest witness where no unknown depends on others.
+// The smallest witness where unknowns do not depend on others, or where what depends on them need not be searched.
 //
 // Method: where every comparison is in the question once, one walk up the nodes finds for each what it costs to hold
 // and to fail, and one walk down picks the values.  Elsewhere the values that comparisons force which have to hold, and
-// 0 for the rest, are below every witness, so they are the smallest where they are one.  What is left is read from the
-// diagram. Cost: linear in the nodes of the question, or of its diagram.
+// 0 for the rest, are below every witness, so they are the smallest where they are one; differences, sums and floors
+// follow from them.  What is left is read from the diagram.
+// Cost: linear in the nodes of the question, or of its diagram.
 #include "base/decide/witness/WitnessSearch.hpp"
 
 #include <algorithm>
+#include <utility>
 
 namespace VT {
 
@@ -58,20 +60,51 @@ std::int64_t WitnessSearch::nearest(Gate gate) const {
 }
 
 std::optional<Decision> WitnessSearch::findAtOnce(const Question& question, std::span<const UnknownLeaf> leaves) {
-    if (question.needsChecking())
-        return std::nullopt;
     question_ = &question;
     steps_.take(question.nodes().size() / 4 + 1);
     byLevel_.assign(question.levels().size(), 0);
-    if (question.isReadOnce()) {
+    if (question.isReadOnce() && !question.needsChecking()) {
         placeLevels(leaves);
         valuesOfReadOnce();
     } else {
         forcedValues();
+        if (question.needsChecking() && !computeLevels())
+            return std::nullopt;
         if (!question.holds([&](Level level) { return byLevel_[level]; }))
             return std::nullopt;
     }
     return Decision{Answer::Yes, DecisionBound::None, byLevels(leaves, byLevel_)};
+}
+
+/// Computes the values of the levels that depend on others; false where one is a term, or has no 64 bits.
+bool WitnessSearch::computeLevels() {
+    const std::vector<LevelInfo>& levels = question_->levels();
+    const auto valueOf = [&](Unknown unknown) {
+        const Level level = question_->levelOf(unknowns_[unknown].quantity);
+        return level == noLevel ? std::int64_t{0} : byLevel_[level];
+    };
+    const auto computed = [&](Unknown unknown) -> std::optional<std::int64_t> {
+        const UnknownInfo& info = unknowns_[unknown];
+        if (!info.isComputed())
+            return valueOf(unknown);
+        const auto isFree = [&](const auto& part) { return !unknowns_[part.unknown].isComputed(); };
+        if (info.kind == UnknownKind::Term || !std::ranges::all_of(info.sum, isFree) ||
+            (info.floor != nullptr && !std::ranges::all_of(info.floor->form.parts, isFree)))
+            return std::nullopt;
+        steps_.take(info.sum.size());
+        return computedValue(info, valueOf);
+    };
+    for (Level level = 0; level < levels.size(); ++level) {
+        if (!levels[level].isChecked)
+            continue;
+        auto plus = computed(levels[level].plus);
+        auto minus = levels[level].minus != noUnknown ? computed(levels[level].minus) : std::optional<std::int64_t>(0);
+        if (levels[level].opposed)
+            std::swap(plus, minus);
+        if (!plus || !minus || __builtin_sub_overflow(*plus, *minus, &byLevel_[level]))
+            return false;
+    }
+    return true;
 }
 
 /// Values that no witness can go below, one by one: what comparisons say that have to hold, and 0 for the others.

@@ -11,6 +11,7 @@
 #include <algorithm>
 #include <array>
 #include <iterator>
+#include <tuple>
 
 namespace VT {
 
@@ -29,40 +30,14 @@ bool WitnessSearch::computeTerms(std::vector<std::int64_t>& values) {
             steps_.take(term.plan->size());
             value = term.plan->value([&](Unknown unknown) { return values[numberOf(unknown)]; });
         } else {
-            value = sumOf(order_[term.number - 1], values);
+            value = computedValue(unknowns_[order_[term.number - 1]],
+                                  [&](Unknown unknown) { return values[numberOf(unknown)]; });
         }
         if (!value)
             return false;
         values[term.number] = *value;
     }
     return true;
-}
-
-/// The value of a sum or floor, where its numbers have 64 bits.
-std::optional<std::int64_t> WitnessSearch::sumOf(Unknown unknown, const std::vector<std::int64_t>& values) const {
-    const UnknownInfo& info = unknowns_[unknown];
-    std::int64_t sum = 0;
-    bool fits = true;
-    const auto small = [&](const BigInteger& number) {
-        const bool isSmall = abs(number) <= plusInfinite;
-        fits = fits && isSmall;
-        return isSmall ? static_cast<std::int64_t>(number) : 1;
-    };
-    const auto add = [&](std::int64_t factor, std::int64_t value) {
-        std::int64_t product = 0;
-        const bool overflows =
-            __builtin_mul_overflow(factor, value, &product) || __builtin_add_overflow(sum, product, &sum);
-        fits = fits && !overflows;
-    };
-    for (const LinearPart& part : info.sum)
-        add(part.factor, values[numberOf(part.unknown)]);
-    if (info.floor == nullptr)
-        return fits ? std::optional(sum) : std::nullopt;
-    for (const WidePart& part : info.floor->form.parts)
-        add(small(part.factor), values[numberOf(part.unknown)]);
-    add(small(info.floor->form.constant), 1);
-    const std::int64_t divisor = small(info.floor->divisor);
-    return fits ? std::optional(floorDivide(sum, divisor)) : std::nullopt;
 }
 
 /// The same for numbers of any size; whole numbers alone can be compared.
@@ -241,10 +216,13 @@ bool WitnessSearch::confirmWith(std::span<const Change> changes) {
     bool confirmed = computeTerms(values);
     if (confirmed) {
         --triesLeft_;
-        for (const Term& term : terms_) {
-            confirmed = confirmed && isWithinBound(values[term.number]);
-            if (confirmed)
-                restrictSystem(order_[term.number - 1], noUnknown, values[term.number], values[term.number]);
+        for (std::size_t i = 0; i < terms_.size() && confirmed; ++i) {
+            const std::int64_t value = values[terms_[i].number];
+            confirmed = value >= termRanges_[i].first && value <= termRanges_[i].second;
+        }
+        for (std::size_t i = 0; i < terms_.size() && confirmed; ++i) {
+            const std::int64_t value = values[terms_[i].number];
+            restrictSystem(order_[terms_[i].number - 1], noUnknown, value, value);
         }
         confirmed = confirmed && system_.solve(values) && confirm(values);
     }
@@ -254,12 +232,25 @@ bool WitnessSearch::confirmWith(std::span<const Change> changes) {
     return confirmed;
 }
 
+/// The values that the path leaves to each term, for which the ranges of the system are at hand.
+void WitnessSearch::findTermRanges() {
+    termRanges_.clear();
+    for (const Term& term : terms_) {
+        std::int64_t low = std::max(system_.low(term.number), -limits::formNumber);
+        std::int64_t high = std::min(system_.high(term.number), limits::formNumber);
+        if (isOpposed(order_[term.number - 1]))
+            std::tie(low, high) = std::pair(-high, -low);
+        termRanges_.emplace_back(low, high);
+    }
+}
+
 /// Tries other values for one, then for two of the unknowns that terms are computed from: around the solution, and
 /// around the same with 1 in the place of 0, since nothing can be divided by that.
 bool WitnessSearch::confirmNear(const std::vector<std::int64_t>& solution) {
     const std::vector<std::int64_t> all = candidates(solution);
     std::vector<std::vector<std::int64_t>> possible; // for each unknown, within its bounds
     system_.findRanges();
+    findTermRanges();
     for (const Number number : movable_) {
         possible.emplace_back();
         std::ranges::copy_if(all, std::back_inserter(possible.back()), [&](std::int64_t value) {

@@ -15,9 +15,6 @@ namespace VT {
 
 namespace {
 
-/// A node of a plan takes that many times the memory of an edge of a diagram.
-constexpr std::size_t stepsPerPlanned = 4;
-
 /// The edges of a node from one of them outwards: itself, the one above, the one below, and so on.
 std::size_t outward(std::size_t origin, std::size_t step, std::size_t count) {
     const std::size_t below = origin;
@@ -30,8 +27,8 @@ std::size_t outward(std::size_t origin, std::size_t step, std::size_t count) {
 
 } // namespace
 
-WitnessSearch::WitnessSearch(const LeafReader& leaves, Unknowns& unknowns, Diagrams& diagrams, Steps& steps)
-    : leafReader_(leaves),
+WitnessSearch::WitnessSearch(TermPlans& plans, Unknowns& unknowns, Diagrams& diagrams, Steps& steps)
+    : plans_(plans),
       unknowns_(unknowns),
       diagrams_(diagrams),
       steps_(steps),
@@ -139,31 +136,31 @@ void WitnessSearch::number(std::span<const UnknownLeaf> leaves, Order order) {
     wantsSmallest_ = order == Order::Texts;
     for (const UnknownLeaf& leaf : leaves)
         meet(leaf.unknown);
-    std::vector<Unknown> free;                         // what terms are computed from
-    for (std::size_t i = 0; i < order_.size(); ++i) {  // NOLINT(modernize-loop-convert): meeting more appends
-        const UnknownInfo info = unknowns_[order_[i]]; // a copy, which stays where it is
-        const auto meetOperand = [&](Unknown operand) {
-            meet(operand);
-            if (!unknowns_[operand].isComputed())
-                free.push_back(operand);
-        };
+    free_.clear();
+    const auto meetOperand = [&](Unknown operand) {
+        meet(operand);
+        if (!unknowns_[operand].isComputed())
+            free_.push_back(operand);
+    };
+    for (std::size_t i = 0; i < order_.size(); ++i) { // NOLINT(modernize-loop-convert): meeting more appends
+        const UnknownInfo& info = unknowns_[order_[i]];
+        if (!info.isComputed())
+            continue;
+        terms_.push_back({order_[i], nullptr}); // its number follows
         for (const LinearPart& part : info.sum)
             meetOperand(part.unknown);
         if (info.floor != nullptr)
             for (const WidePart& part : info.floor->form.parts)
                 meetOperand(part.unknown);
         if (info.kind == UnknownKind::Term) {
-            terms_.push_back({0, std::make_unique<TermPlan>(leafReader_, unknowns_, info.node)});
-            steps_.take(terms_.back().plan->size() * stepsPerPlanned);
-            for (const Unknown unknown : terms_.back().plan->unknowns()) {
+            TermPlan& plan = plans_.of(info.node); // may move what was known of the unknown
+            terms_.back().plan = &plan;
+            steps_.take(plan.size() * limits::plannedNodeSteps);
+            for (const Unknown unknown : plan.unknowns()) {
                 meet(unknown);
-                free.push_back(unknown);
+                free_.push_back(unknown);
             }
         }
-        if (info.isComputed() && info.kind != UnknownKind::Term)
-            terms_.push_back({0, nullptr});
-        if (info.isComputed())
-            terms_.back().number = order_[i]; // for the time being
     }
     std::ranges::sort(order_, [&](Unknown a, Unknown b) { return comesBefore(a, b, order); });
     for (std::size_t i = 0; i < order_.size(); ++i)
@@ -172,7 +169,7 @@ void WitnessSearch::number(std::span<const UnknownLeaf> leaves, Order order) {
     for (Term& term : terms_)
         term.number = numberOf(term.number);
     std::ranges::sort(terms_, {}, [&](const Term& term) { return std::pair(isSum(term), term.number); });
-    for (const Unknown unknown : free)
+    for (const Unknown unknown : free_)
         movable_.push_back(numberOf(unknown));
     std::ranges::sort(movable_);
     movable_.erase(std::unique(movable_.begin(), movable_.end()), movable_.end());
@@ -197,7 +194,6 @@ bool WitnessSearch::comesBefore(Unknown a, Unknown b, Order order) const {
 /// Throws StepsUsedUp, too, where paths that nothing meets take more than a part of the steps: a search that learns
 /// from them takes fewer.
 void WitnessSearch::walkPaths(Diagram diagram) {
-    constexpr std::uint64_t part = 8;
     std::uint64_t inVain = 0;
     frames_.clear();
     solutions_.assign(1, {});
@@ -227,7 +223,7 @@ void WitnessSearch::walkPaths(Diagram diagram) {
         unconfirmed_ = unconfirmed_ || end == PathEnd::Open;
         if (end == PathEnd::Excluded)
             inVain += before - steps_.left();
-        if (inVain > steps_.total() / part)
+        if (inVain > steps_.total() / limits::vainShare)
             throw StepsUsedUp{};
     }
 }

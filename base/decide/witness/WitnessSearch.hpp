@@ -21,16 +21,15 @@
 #include "base/decide/diagram/SmallestPath.hpp"
 #include "base/decide/solver/DifferenceSystem.hpp"
 #include "base/decide/witness/PathSystem.hpp"
-#include "base/decide/witness/TermPlan.hpp"
+#include "base/decide/witness/TermPlans.hpp"
 
-#include <memory>
 #include <span>
 
 namespace VT {
 
 class WitnessSearch {
 public:
-    WitnessSearch(const LeafReader& leaves, Unknowns& unknowns, Diagrams& diagrams, Steps& steps);
+    WitnessSearch(TermPlans& plans, Unknowns& unknowns, Diagrams& diagrams, Steps& steps);
 
     /// Whether the question, whose diagram it is, holds for some assignment, with the smallest as witness: values for
     /// `leaves`, which are in the order of their texts.
@@ -104,10 +103,38 @@ private:
         return result;
     }
 
+    /// The value of a sum or floor, where its numbers have 64 bits.
+    template <class ValueOf>
+    static std::optional<std::int64_t> computedValue(const UnknownInfo& info, ValueOf valueOf) {
+        std::int64_t sum = 0;
+        bool fits = true;
+        const auto small = [&](const BigInteger& number) {
+            const bool isSmall = abs(number) <= plusInfinite;
+            fits = fits && isSmall;
+            return isSmall ? static_cast<std::int64_t>(number) : 1;
+        };
+        const auto add = [&](std::int64_t factor, std::int64_t value) {
+            std::int64_t product = 0;
+            const bool overflows =
+                __builtin_mul_overflow(factor, value, &product) || __builtin_add_overflow(sum, product, &sum);
+            fits = fits && !overflows;
+        };
+        for (const LinearPart& part : info.sum)
+            add(part.factor, valueOf(part.unknown));
+        if (info.floor == nullptr)
+            return fits ? std::optional(sum) : std::nullopt;
+        for (const WidePart& part : info.floor->form.parts)
+            add(small(part.factor), valueOf(part.unknown));
+        add(small(info.floor->form.constant), 1);
+        const std::int64_t divisor = small(info.floor->divisor);
+        return fits ? std::optional(floorDivide(sum, divisor)) : std::nullopt;
+    }
+
     Witness byLevels(std::span<const UnknownLeaf> leaves, std::span<const std::int64_t> values) const;
     void placeLevels(std::span<const UnknownLeaf> leaves);
     void valuesOfReadOnce();
     void forcedValues();
+    bool computeLevels();
     [[nodiscard]] std::int64_t nearest(Gate gate) const;
     Witness smallestOf(Diagram diagram, std::span<const UnknownLeaf> leaves);
 
@@ -118,6 +145,7 @@ private:
     void restrict(const LevelInfo& level, std::int64_t low, std::int64_t high);
     void restrict(Unknown plus, Unknown minus, std::int64_t low, std::int64_t high);
     void restrictSystem(Unknown plus, Unknown minus, std::int64_t low, std::int64_t high);
+    void findTermRanges();
     [[nodiscard]] bool isOpposed(Unknown unknown) const;
     void shrink(std::size_t size);
     [[nodiscard]] bool comesBefore(Unknown a, Unknown b, Order order) const;
@@ -147,13 +175,12 @@ private:
     // Confirmation.
     struct Term {
         Number number;
-        std::unique_ptr<TermPlan> plan; ///< none for a sum or a floor
+        TermPlan* plan; ///< none for a sum or a floor
     };
 
     template <class Integer>
     [[nodiscard]] bool holds(const std::vector<Integer>& values) const;
     bool computeTerms(std::vector<std::int64_t>& values);
-    [[nodiscard]] std::optional<std::int64_t> sumOf(Unknown unknown, const std::vector<std::int64_t>& values) const;
     bool computeExactly(std::vector<BigInteger>& values);
     bool confirm(const std::vector<std::int64_t>& values);
     bool confirmExactly(std::vector<BigInteger> values);
@@ -167,7 +194,7 @@ private:
     std::optional<PathSystem::Values> solvePath(bool smallest);
     [[nodiscard]] std::vector<std::int64_t> candidates(const std::vector<std::int64_t>& solution) const;
 
-    const LeafReader& leafReader_;
+    TermPlans& plans_;
     Unknowns& unknowns_;
     Diagrams& diagrams_;
     Steps& steps_;
@@ -185,8 +212,10 @@ private:
     std::vector<Unknown> order_; ///< of the question, by number - 1
     IdMap<Number> numbers_;
     PathSystem pathSystem_;
-    std::vector<Term> terms_;     ///< operands before what is computed from them
-    std::vector<Number> movable_; ///< free unknowns that terms depend on
+    std::vector<Term> terms_;                                       ///< operands before what is computed from them
+    std::vector<Unknown> free_;                                     ///< unknowns that terms depend on
+    std::vector<Number> movable_;                                   ///< their numbers
+    std::vector<std::pair<std::int64_t, std::int64_t>> termRanges_; ///< by position in terms_
     std::vector<Frame> frames_;
     std::vector<PathRange> path_;
     std::vector<std::vector<std::int64_t>> solutions_;
