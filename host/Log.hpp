@@ -17,7 +17,7 @@ class basic_diagnostic_logger; // char is the only instance
 
 /// A logger with a name.  Lines below its level cost one comparison.  The host decides where lines go; the
 /// embedded host writes them to standard error and takes the first level from the environment variable VTSYM_LOG
-/// (debug, info, warning, error or off; warning without it).
+/// (debug, info, warning, error or off; warning without it).  Used by one thread at a time.
 template <>
 class VTSYM_API basic_diagnostic_logger<char> {
 public:

@@ -18,7 +18,7 @@ namespace VT {
 /// of an operand belongs to the literal: `-5` is a literal, `- 5` a negation.  Letters, digits and blanks are those of
 /// ASCII.
 ///
-/// A parser keeps nothing from text to text except the nodes in its table.
+/// A parser keeps nothing from text to text except the nodes in its table.  It is used by one thread at a time.
 class VTSYM_API SymbolicExprParser {
 public:
     /// Parses into `table`, which must outlive the parser.

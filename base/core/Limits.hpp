@@ -352,8 +352,8 @@ inline constexpr std::uint64_t scanStepsPerBranch = std::uint64_t{1} << 13U;
 inline constexpr std::uint64_t branchSteps = std::uint64_t{1} << 20U;
 inline constexpr std::uint64_t branchDecisionSteps = std::uint64_t{1} << 16U;
 
-/// Nodes that a scanner keeps from file to file, with what was decided about them: some 20 MB for each thread.  When there
-/// are more, the next file begins anew.
+/// Nodes that a scanner keeps from file to file, with what was decided about them: some 20 MB for each thread.  When
+/// there are more, the next file begins anew.
 inline constexpr std::size_t scanNodes = std::size_t{1} << 17U;
 
 /// Conditions that are assumed of every build and compared with one condition of a source file: those that share a

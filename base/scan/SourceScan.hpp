@@ -124,7 +124,8 @@ struct SourceFile {
 /// macros that the file did not change, wherever they are read.  Alternatives are sets of assumptions of which one
 /// holds: each makes a configuration of each that the file has, or one by itself.
 ///
-/// A scanner keeps its decisions from file to file.  It is used by one thread at a time.
+/// A scanner keeps its decisions from file to file.  It is used by one thread at a time; scanners of several threads
+/// may work at once, and read the same definitions of a build.
 class VTSYM_API SourceScanner {
 public:
     explicit SourceScanner(const SourceScanOptions& options = {});

@@ -17,7 +17,8 @@ namespace VT {
 /// operator is a dimension, and keeps its value: dimensions divide exactly, quotients below a comparison or a logical
 /// operator are truncated toward zero.
 ///
-/// Keeps the texts of operands that it has ordered, so that further calls need not print them again.
+/// Keeps the texts of operands that it has ordered, so that further calls need not print them again.  Used by one
+/// thread at a time.
 class VTSYM_API SymbolicExprSimplify {
 public:
     explicit SymbolicExprSimplify(SymbolicExprTable& table, std::uint64_t maxIterations = limits::simplifyPasses);

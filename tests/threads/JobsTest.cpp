@@ -141,7 +141,8 @@ TEST(Jobs, AnswerLinesAlike) {
                "printf 'A > 1 && A\\nB &&' | vtsym simplify $JOBS 'A && A' - 'B || B'; vtsym convert $JOBS A B C");
 }
 
-/// Lines of one chunk each, some hard: the steps of the command run out at the same line, and are shared in order.
+/// Lines of one chunk each, some hard: the steps of the command run out at the same line, and are shared in order.  The
+/// preset for ThreadSanitizer leaves this out: all these steps take it minutes.
 TEST(Jobs, ShareStepsInOrder) {
     constexpr std::size_t most = limits::commandSteps / limits::decisionSteps + 4;
     const std::string library =

@@ -27,7 +27,8 @@ struct BuildPlace {
 /// The macros of one configuration of a build, in the order in which a compiler takes them.  What is not named here is
 /// not known.
 ///
-/// Copies share what they have in common.  The value of a macro is computed as the preprocessor does, by expansion.
+/// Const operations may run in several threads while none adds anything.  Copies share what they have in common.  The
+/// value of a macro is computed as the preprocessor does, by expansion.
 class VTSYM_API BuildMacros {
 public:
     /// What the build says about a macro.

@@ -75,6 +75,9 @@ Baseline baselineAt(const std::string& path, bool mayBeMissing) {
     return Baseline::read(readFile(path, mostBytes));
 }
 
+/// Files that a thread takes at once: small ones cost hardly more than to be handed over.
+constexpr std::size_t filesAtOnce = 8;
+
 /// A file on its way through a scan.
 struct ScannedFile {
     std::string path;
@@ -305,20 +308,25 @@ void Scan::use(ScannedFile& file) {
 }
 
 void Scan::scanFiles(const std::vector<std::string>& paths) {
-    std::vector<ScannedFile> slots(slotsFor(jobs_));
-    auto next = paths.begin();
+    std::vector<std::vector<ScannedFile>> slots(slotsFor(jobs_));
+    const std::size_t atOnce = jobs_ == 1 ? 1 : filesAtOnce;
+    auto path = paths.begin();
     OrderedWork work;
     work.next = [&](std::size_t slot) {
-        next =
-            std::find_if(next, paths.end(), [this](const auto& path) { return !isExcluded(path, settings_.excluded); });
-        if (next == paths.end())
-            return false;
-        slots[slot] = {};
-        slots[slot].path = *next++;
-        return true;
+        std::vector<ScannedFile>& files = slots[slot];
+        for (files.clear(); path != paths.end() && files.size() < atOnce; ++path)
+            if (!isExcluded(*path, settings_.excluded))
+                files.emplace_back().path = *path;
+        return !files.empty();
     };
-    work.work = [&](std::size_t slot, std::size_t worker) { read(slots[slot], checkerOf(worker)); };
-    work.finish = [&](std::size_t slot) { use(slots[slot]); };
+    work.work = [&](std::size_t slot, std::size_t worker) {
+        for (ScannedFile& file : slots[slot])
+            read(file, checkerOf(worker));
+    };
+    work.finish = [&](std::size_t slot) {
+        for (ScannedFile& file : slots[slot])
+            use(file);
+    };
     runInOrder(jobs_, work);
     if (cache_)
         cache_->write();

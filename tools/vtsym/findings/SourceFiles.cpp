@@ -4,8 +4,11 @@
 
 #include <algorithm>
 #include <array>
+#include <cerrno>
+#include <dirent.h>
 #include <filesystem>
 #include <fnmatch.h>
+#include <memory>
 #include <system_error>
 
 namespace vtsym {
@@ -24,41 +27,89 @@ std::string tidied(const fs::path& path) {
     return std::ranges::find(path, fs::path("..")) == path.end() ? path.lexically_normal().string() : path.string();
 }
 
+/// The extension of a path's last part, with its dot; empty for none.
+std::string_view extensionOf(std::string_view path) {
+    const std::string_view name = path.substr(path.rfind('/') + 1); // of the whole path where there is no slash
+    const std::size_t dot = name.rfind('.');
+    return dot == std::string_view::npos || dot == 0 || name == ".." ? std::string_view() : name.substr(dot);
+}
+
+/// A directory to be read: its path, and what the paths of its files begin with.
+struct OpenDirectory {
+    std::string path;
+    std::string prefix;
+};
+
+/// What a path begins with below a directory.
+std::string prefixBelow(const std::string& directory) {
+    std::string prefix = tidied(directory);
+    if (prefix == "." || prefix == "./")
+        return "";
+    if (!prefix.ends_with('/'))
+        prefix.push_back('/');
+    return prefix;
+}
+
+/// The kind of an entry, without following links.  The system mostly knows it from the directory.
+fs::file_type kindOf(const dirent& entry, const std::string& path, std::error_code& error) {
+    switch (entry.d_type) {
+    case DT_REG:
+        return fs::file_type::regular;
+    case DT_DIR:
+        return fs::file_type::directory;
+    case DT_UNKNOWN:
+        return fs::symlink_status(path, error).type();
+    default:
+        return fs::file_type::unknown;
+    }
+}
+
 /// Adds the files below a directory.
-void addBelow(const fs::path& directory, std::vector<std::string>& files, const FileProblem& problem) {
-    std::error_code error;
-    std::vector<fs::path> open{directory};
+void addBelow(const std::string& directory, std::vector<std::string>& files, const FileProblem& problem) {
+    const auto refuse = [&](const std::string& path, int error) {
+        problem(path, "cannot be read: " + std::generic_category().message(error));
+    };
+    std::vector<OpenDirectory> open{{directory, prefixBelow(directory)}};
     while (!open.empty()) {
-        const fs::path next = std::move(open.back());
+        const OpenDirectory next = std::move(open.back());
         open.pop_back();
-        fs::directory_iterator entries(next, error);
-        while (!error && entries != fs::directory_iterator()) {
-            std::error_code unknown;
-            const fs::file_status status = entries->symlink_status(unknown);
-            if (status.type() == fs::file_type::none)
-                problem(entries->path().string(), "cannot be read: " + unknown.message());
-            else if (fs::is_directory(status))
-                open.push_back(entries->path());
-            else if (fs::is_regular_file(status) && isSourcePath(entries->path().native()))
-                files.push_back(tidied(entries->path()));
-            entries.increment(error);
+        const std::unique_ptr<DIR, int (*)(DIR*)> entries(opendir(next.path.c_str()), closedir);
+        if (!entries) {
+            refuse(next.path, errno);
+            continue;
         }
-        if (error)
-            problem(next.string(), "cannot be read: " + error.message());
-        error.clear();
+        for (;;) {
+            errno = 0;
+            const dirent* const entry = readdir(entries.get()); // NOLINT(concurrency-mt-unsafe): of its own stream
+            if (entry == nullptr)
+                break;
+            const std::string_view name = entry->d_name;
+            if (name == "." || name == "..")
+                continue;
+            std::string path = next.path;
+            path.append(path.ends_with('/') ? "" : "/").append(name);
+            std::error_code error;
+            const fs::file_type kind = kindOf(*entry, path, error);
+            if (kind == fs::file_type::none)
+                refuse(path, error.value());
+            else if (kind == fs::file_type::directory)
+                open.push_back({std::move(path), next.prefix + std::string(name) + "/"});
+            else if (kind == fs::file_type::regular && isSourcePath(name))
+                files.push_back(next.prefix + std::string(name));
+        }
+        if (errno != 0)
+            refuse(next.path, errno);
     }
 }
 
 } // namespace
 
 bool isCppPath(std::string_view path) {
-    const std::string extension = fs::path(path).extension().string();
-    return std::ranges::find(cppExtensions, extension) != cppExtensions.end();
+    return std::ranges::find(cppExtensions, extensionOf(path)) != cppExtensions.end();
 }
 
 bool isSourcePath(std::string_view path) {
-    const std::string extension = fs::path(path).extension().string();
-    return isCppPath(path) || std::ranges::find(otherExtensions, extension) != otherExtensions.end();
+    return isCppPath(path) || std::ranges::find(otherExtensions, extensionOf(path)) != otherExtensions.end();
 }
 
 bool isExcluded(const std::string& path, const std::vector<std::string>& patterns) {

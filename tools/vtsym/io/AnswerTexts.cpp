@@ -37,7 +37,7 @@ namespace {
 constexpr std::size_t shownOfLong = 80;
 
 // A chunk ends with the line that makes it as large as one of these.
-constexpr std::size_t chunkLines = 256;
+constexpr std::size_t chunkLines = 128;
 constexpr std::size_t chunkBytes = std::size_t{1} << 16U;
 
 /// Bytes of lines that are read before they are answered.

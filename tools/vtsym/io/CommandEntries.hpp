@@ -17,7 +17,9 @@ struct OptionEntry {
 
     [[nodiscard]] bool isPositional() const { return !names.front().starts_with('-'); }
 
-    [[nodiscard]] bool takesFiles() const { return value == "FILE" || value == "MODEL" || value == "PATH"; }
+    [[nodiscard]] bool takesFiles() const {
+        return value == "FILE" || value == "MODEL" || value == "PATH" || value == "DIR";
+    }
 };
 
 struct CommandEntry {

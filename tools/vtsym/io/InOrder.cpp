@@ -12,6 +12,7 @@
 
 #include <atomic>
 #include <exception>
+#include <optional>
 #include <utility>
 #include <vector>
 
@@ -23,70 +24,101 @@ namespace {
 /// bounded.
 constexpr std::size_t stackBytes = std::size_t{8} << 20U;
 
+/// What one thread does after another.  The library orders them; a race detector that does not see into it sees this.
+class Turn {
+public:
+    explicit Turn(std::atomic<unsigned>& turns) : turns_(turns) { static_cast<void>(turns_.load()); }
+
+    Turn(const Turn&) = delete;
+    Turn& operator=(const Turn&) = delete;
+
+    ~Turn() { ++turns_; }
+
+private:
+    std::atomic<unsigned>& turns_;
+};
+
 /// One run with several workers.
 class OrderedRun {
 public:
-    OrderedRun(std::size_t slots, const OrderedWork& work) : work_(work), errors_(slots), steps_(slots) {}
+    OrderedRun(std::size_t jobs, const OrderedWork& work)
+        : work_(work),
+          errors_(slotsFor(jobs)),
+          ofSlot_(errors_.size()),
+          ofWorker_(jobs) {}
 
     /// Goes on with the first two items, which are in their slots.
     void run() {
         namespace tbb = oneapi::tbb;
         constexpr auto inOrder = tbb::filter_mode::serial_in_order;
+        ++ofNext_;
         tbb::parallel_pipeline(
             errors_.size(),
             tbb::make_filter<void, std::size_t>(inOrder, [this](tbb::flow_control& control) {
-                if (!next())
+                const std::optional<std::size_t> slot = next();
+                if (!slot)
                     control.stop();
-                return (items_ - 1) % errors_.size();
+                return slot.value_or(0);
             }) & tbb::make_filter<std::size_t, std::size_t>(tbb::filter_mode::parallel, [this](std::size_t slot) {
                 workOn(slot);
                 return slot;
             }) & tbb::make_filter<std::size_t, void>(inOrder, [this](std::size_t slot) { finish(slot); }));
     }
 
+    ~OrderedRun() { // after all threads
+        const Turn next(ofNext_);
+        const Turn finish(ofFinish_);
+        for (auto* const turns : {&ofSlot_, &ofWorker_})
+            for (std::atomic<unsigned>& each : *turns)
+                const Turn turn(each);
+    }
+
+    OrderedRun(const OrderedRun&) = delete;
+    OrderedRun& operator=(const OrderedRun&) = delete;
+
 private:
-    bool next() {
+    /// The slot of the next item; nothing at the end.
+    std::optional<std::size_t> next() {
+        const Turn turn(ofNext_);
         const std::size_t slot = items_ % errors_.size();
-        if (ended_)
-            return false;
+        const Turn turnOfSlot(ofSlot_[slot]);
+        bool isThere = !ended_;
         try {
-            if (items_ >= 2 && !work_.next(slot))
-                return false;
+            isThere = isThere && (items_ < 2 || work_.next(slot));
         } catch (...) {
             ended_ = true;
             errors_[slot] = std::current_exception();
         }
         ++items_;
-        handOver(slot);
-        return true;
+        return isThere ? std::optional(slot) : std::nullopt;
     }
 
     void workOn(std::size_t slot) {
-        takeOver(slot);
+        const auto worker = static_cast<std::size_t>(oneapi::tbb::this_task_arena::current_thread_index());
+        const Turn turn(ofSlot_[slot]);
+        const Turn turnOfWorker(ofWorker_[worker]);
         try {
             if (!errors_[slot])
-                work_.work(slot, static_cast<std::size_t>(oneapi::tbb::this_task_arena::current_thread_index()));
+                work_.work(slot, worker);
         } catch (...) {
             errors_[slot] = std::current_exception();
         }
-        handOver(slot);
     }
 
-    // The library orders the steps of an item; a race detector that does not see into it sees these.
-    void handOver(std::size_t slot) { steps_[slot].fetch_add(1, std::memory_order_release); }
-
-    void takeOver(std::size_t slot) { static_cast<void>(steps_[slot].load(std::memory_order_acquire)); }
-
     void finish(std::size_t slot) {
-        takeOver(slot);
+        const Turn turn(ofFinish_);
+        const Turn turnOfSlot(ofSlot_[slot]);
         if (const std::exception_ptr error = std::exchange(errors_[slot], nullptr))
             std::rethrow_exception(error);
         work_.finish(slot);
     }
 
     const OrderedWork& work_;
-    std::vector<std::exception_ptr> errors_;   ///< by slot
-    std::vector<std::atomic<unsigned>> steps_; ///< by slot: of its items
+    std::vector<std::exception_ptr> errors_; ///< by slot
+    std::vector<std::atomic<unsigned>> ofSlot_;
+    std::vector<std::atomic<unsigned>> ofWorker_;
+    std::atomic<unsigned> ofNext_ = 0;
+    std::atomic<unsigned> ofFinish_ = 0;
     std::size_t items_ = 0;
     bool ended_ = false; ///< by an exception
 };
@@ -123,7 +155,7 @@ void runInOrder(std::size_t jobs, const OrderedWork& work) {
     const oneapi::tbb::global_control stack(oneapi::tbb::global_control::thread_stack_size, stackBytes);
     const oneapi::tbb::global_control threads(oneapi::tbb::global_control::max_allowed_parallelism, jobs);
     oneapi::tbb::task_arena arena(static_cast<int>(jobs));
-    arena.execute([&] { OrderedRun(slotsFor(jobs), work).run(); });
+    arena.execute([&] { OrderedRun(jobs, work).run(); });
 }
 
 } // namespace vtsym

@@ -28,7 +28,7 @@ std::size_t processors();
 
 /// Slots that so many workers need to have work while an item takes longer than others.
 constexpr std::size_t slotsFor(std::size_t jobs) {
-    return jobs == 1 ? 1 : 8 * jobs;
+    return jobs == 1 ? 1 : 32 * jobs;
 }
 
 /// Works on all items with so many workers and slotsFor() them; on a single item, or with one worker, in this thread.
