@@ -24,6 +24,7 @@ std::vector<Entry> entries() {
          4000, makeEnumeration},
         {"preprocessor", "conditions and their normal and short forms are decided alike by cpp and clang", 2,
          makePreprocessorPairs},
+        {"stack", "trees of a million levels need no more than 256 KiB of stack", 16, makeDeepTrees},
         {"system-calls", "each open, read, write, close and rename of the program fails once", 250, makeFaults},
         {"program-memory", "each allocation of the program fails, once and from then on", 250, makeFaults},
     };
