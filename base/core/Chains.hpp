@@ -5,11 +5,12 @@
 #pragma once
 
 #include "base/core/Table.hpp"
-#include "base/util/IdMap.hpp"
+#include "base/util/IdSet.hpp"
+
+#include <boost/container/small_vector.hpp>
 
 #include <cstddef>
 #include <limits>
-#include <vector>
 
 namespace VT {
 
@@ -34,7 +35,7 @@ namespace detail {
 template <class Seen, class IsLink, class Visit>
 bool walkChainUnseen(const SymbolicExprTable& table, SymbolicExprId root, std::size_t most, Seen&& seen,
                      IsLink&& isLink, Visit&& visit) {
-    std::vector<SymbolicExprId> pending{root};
+    boost::container::small_vector<SymbolicExprId, 32> pending{root};
     for (std::size_t operands = 0; !pending.empty();) {
         if (operands >= most)
             return false;
@@ -79,16 +80,12 @@ bool walkChain(const SymbolicExprTable& table, SymbolicExprId root, std::size_t 
 template <class IsLink, class Visit, class Again>
 bool walkDistinctChain(const SymbolicExprTable& table, SymbolicExprId root, std::size_t most, IsLink&& isLink,
                        Visit&& visit, Again&& again) {
-    IdMap<bool> seen;
+    IdSet seen;
     const auto wasSeen = [&](SymbolicExprId id) {
-        if (id == invalidId) // each missing operand counts for itself
+        if (id == invalidId || seen.add(id)) // each missing operand counts for itself
             return false;
-        if (seen.find(id) != nullptr) {
-            again(id);
-            return true;
-        }
-        seen.insert(id, true);
-        return false;
+        again(id);
+        return true;
     };
     return detail::walkChainUnseen(table, root, most, wasSeen, isLink, visit);
 }

@@ -78,6 +78,8 @@ void SymbolicExprTable::reserveOne() {
         const std::size_t room = std::max(firstRoom, 2 * room_);
         keys_.reserve(room);
         nodes_.reserve(room);
+        preferLargePages(&keys_[0], room * sizeof(keys_[0]));
+        preferLargePages(&nodes_[0], room * sizeof(nodes_[0])); // NOLINT(bugprone-sizeof-expression): of a pointer
         room_ = room;
     }
     if ((nodes_.size() + 1) * 4 <= index_.size() * 3)

@@ -69,6 +69,7 @@ public:
     [[nodiscard]] virtual std::string print(const SymbolicExpr& node);
     /// The printed form of an expression of the table.  Throws std::out_of_range where the table has none.
     Printed printed(SymbolicExprId id);
+
     /// Whether print() or printed() met an expression, so that its text is at hand.
     [[nodiscard]] bool hasMet(SymbolicExprId id) const noexcept {
         const Known* const met = known_.find(id);

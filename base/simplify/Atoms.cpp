@@ -192,7 +192,9 @@ SymbolicExprId Atoms::write(const Cover& cover) {
 
 std::vector<SymbolicExprId> chainOperands(const RuleContext& context, SymbolicOp op, SymbolicExprId root,
                                           bool& repeated) {
+    constexpr std::size_t usual = 8;
     std::vector<SymbolicExprId> operands;
+    operands.reserve(usual);
     walkDistinctChain(
         context.table(), root, anyNumber, [op](SymbolicExprId, const SymbolicExpr& link) { return link.op() == op; },
         [&](SymbolicExprId id, const SymbolicExpr*) {

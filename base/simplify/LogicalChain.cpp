@@ -12,7 +12,9 @@
 #include "base/core/Limits.hpp"
 #include "base/simplify/Atoms.hpp"
 #include "base/simplify/RuleTables.hpp"
-#include "base/util/IdMap.hpp"
+#include "base/util/IdSet.hpp"
+
+#include <boost/container/small_vector.hpp>
 
 #include <algorithm>
 #include <iterator>
@@ -373,14 +375,13 @@ SymbolicExprId rewriteChain(RuleContext& context, SymbolicExprId root) {
 
 bool chainIsWithin(const SymbolicExprTable& table, const SymbolicExpr& root, std::uint64_t limit) {
     std::uint64_t operands = 0;
-    std::vector<SymbolicExprId> pending{root.getInput(1), root.getInput(0)};
-    IdMap<bool> seen;
+    boost::container::small_vector<SymbolicExprId, 32> pending{root.getInput(1), root.getInput(0)};
+    IdSet seen;
     while (!pending.empty() && operands <= limit) {
         const SymbolicExprId id = pending.back();
         pending.pop_back();
-        if (!table.has(id) || seen.find(id) != nullptr)
+        if (!table.has(id) || !seen.add(id))
             continue;
-        seen.insert(id, true);
         const SymbolicExpr& node = *table.get(id);
         if (node.op() != root.op())
             ++operands;

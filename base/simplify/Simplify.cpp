@@ -7,7 +7,7 @@
 
 #include "base/core/Chains.hpp"
 #include "base/core/Check.hpp"
-#include "base/util/IdMap.hpp"
+#include "base/util/IdSet.hpp"
 #include "base/variants/VariantKeywords.hpp"
 
 namespace VT {
@@ -66,17 +66,17 @@ SymbolicExprId SymbolicExprSimplify::simplify(SymbolicExprId id, std::uint64_t& 
         return invalidId;
     visitor.setListener(listener_);
     visitor.renewBudget();
-    IdMap<bool> seen;
+    IdSet seen;
     SymbolicExprId current = id;
+    seen.add(current);
     for (;;) {
-        seen.insert(current, true);
         const SymbolicExprId result = visitor.pass(current);
         ++passes;
         if (result == current || visitor.hasGivenUp())
             break;
         current = result;
         const bool constant = result == table_.getIdTRUE() || result == table_.getIdFALSE();
-        if (constant || seen.find(result) != nullptr || passes >= maxIterations_)
+        if (constant || !seen.add(result) || passes >= maxIterations_)
             break;
     }
     // What an earlier pass reached might get further with a budget of its own, so that a second call would change it.
