@@ -51,7 +51,7 @@ std::string prefixBelow(const std::string& directory) {
 }
 
 /// The kind of an entry, without following links.  The system mostly knows it from the directory.
-fs::file_type kindOf(const dirent& entry, const std::string& path, std::error_code& error) {
+fs::file_type entryKindOf(const dirent& entry, const std::string& path, std::error_code& error) {
     switch (entry.d_type) {
     case DT_REG:
         return fs::file_type::regular;
@@ -89,7 +89,7 @@ void addBelow(const std::string& directory, std::vector<std::string>& files, con
             std::string path = next.path;
             path.append(path.ends_with('/') ? "" : "/").append(name);
             std::error_code error;
-            const fs::file_type kind = kindOf(*entry, path, error);
+            const fs::file_type kind = entryKindOf(*entry, path, error);
             if (kind == fs::file_type::none)
                 refuse(path, error.value());
             else if (kind == fs::file_type::directory)
