@@ -76,6 +76,8 @@ public:
         Z3_params parameters = Z3_mk_params(context_);
         Z3_params_inc_ref(context_, parameters);
         Z3_params_set_uint(context_, parameters, Z3_mk_string_symbol(context_, "rlimit"), resources);
+        // The one whose work that bounds.
+        Z3_params_set_uint(context_, parameters, Z3_mk_string_symbol(context_, "arith.solver"), 2);
         Z3_solver_set_params(context_, solver_, parameters);
         Z3_params_dec_ref(context_, parameters);
     }

@@ -217,7 +217,7 @@ std::string modelPage(const VTRootBD& model, const ModelCheck& check) {
     std::vector<const ModelCheck::ChoiceSet*> sets;
     for (const ModelCheck::ChoiceSet& set : check.choiceSets())
         sets.push_back(&set);
-    std::ranges::stable_partition(sets, [](const auto* set) { return !set->findings.empty(); });
+    std::stable_partition(sets.begin(), sets.end(), [](const auto* set) { return !set->findings.empty(); });
     std::size_t found = check.otherFindings().size();
     for (const ModelCheck::ChoiceSet* const set : sets)
         found += set->findings.size();

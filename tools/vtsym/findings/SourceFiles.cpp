@@ -132,8 +132,7 @@ std::vector<std::string> sourceFiles(const std::vector<std::string>& paths, cons
             files.push_back(tidied(path));
     }
     std::ranges::sort(files);
-    const auto repeated = std::ranges::unique(files);
-    files.erase(repeated.begin(), repeated.end());
+    files.erase(std::unique(files.begin(), files.end()), files.end());
     return files;
 }
 
