@@ -32,7 +32,7 @@ struct DirectText::Style {
 
 namespace {
 
-constexpr unsigned signPrecedence = operatorInfo(SymbolicOp::UnaryMinus).precedence;
+constexpr unsigned prefixPrecedence = operatorInfo(SymbolicOp::UnaryMinus).precedence;
 constexpr OperatorSet spacedOps{SymbolicOp::And, SymbolicOp::Or, SymbolicOp::SingleAnd, SymbolicOp::SingleOr};
 
 } // namespace
@@ -53,7 +53,7 @@ const DirectText::Style* DirectText::stylesOf(bool quill, bool spaced) {
             if (isSpaced)
                 style.spelling[style.size++] = ' ';
             // An operator as strong as a sign asks more of literals beside it.
-            const bool isWeak = row.precedence > signPrecedence && row.associativity == OpAssociativity::Left;
+            const bool isWeak = row.precedence > prefixPrecedence && row.associativity == OpAssociativity::Left;
             if (row.op == SymbolicOp::String)
                 style.kind = Style::Kind::Name;
             else if (row.op == SymbolicOp::IntValue)
@@ -64,7 +64,7 @@ const DirectText::Style* DirectText::stylesOf(bool quill, bool spaced) {
                 style.kind = Style::Kind::Call;
             else if (row.form == OperatorForm::Infix && isWeak && !spelling.empty())
                 style.kind = Style::Kind::Infix;
-            else if (row.form == OperatorForm::Prefix && row.precedence == signPrecedence && !spelling.empty())
+            else if (row.form == OperatorForm::Prefix && row.precedence == prefixPrecedence && !spelling.empty())
                 style.kind = Style::Kind::Prefix;
         }
         return all;
