@@ -122,6 +122,18 @@ constexpr auto lower_bound(R&& r, const T& value, C c = {}, P p = {}) {
     return ranges::lower_bound(std::begin(r), std::end(r), value, c, p);
 }
 
+template <class I, class T, class C = ranges::less, class P = identity>
+requires input_or_output_iterator<I>
+
+constexpr I upper_bound(I first, I last, const T& value, C c = {}, P p = {}) {
+    return std::upper_bound(first, last, value, [&](const T& v, auto&& each) { return invoke(c, v, invoke(p, each)); });
+}
+
+template <Sequence R, class T, class C = ranges::less, class P = identity>
+constexpr auto upper_bound(R&& r, const T& value, C c = {}, P p = {}) {
+    return ranges::upper_bound(std::begin(r), std::end(r), value, c, p);
+}
+
 template <Sequence R, class T, class C = ranges::less, class P = identity>
 constexpr bool binary_search(R&& r, const T& value, C c = {}, P p = {}) {
     const auto found = ranges::lower_bound(r, value, c, p);

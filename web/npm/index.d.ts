@@ -80,6 +80,8 @@ export interface Vtsym {
     evaluate(text: string, values?: Record<string, number | string>, options?: LanguageOptions): unknown;
     /** The findings of a model: its JSON text or its object. */
     check(model: string | object): Finding[];
+    /** The same as sentences, each after `/model.json:LINE: `. */
+    checkText(model: string | object): string[];
     /** A self-contained HTML page about a model. */
     checkPage(model: string | object): string;
 }

@@ -17,6 +17,16 @@ export class VtsymError extends Error {
     }
 }
 
+function joined(chunks) {
+    const bytes = new Uint8Array(chunks.reduce((sum, chunk) => sum + chunk.length, 0));
+    let at = 0;
+    for (const chunk of chunks) {
+        bytes.set(chunk, at);
+        at += chunk.length;
+    }
+    return bytes;
+}
+
 /** Collects what the program writes to one of its streams. */
 function collect(stream) {
     const chunks = [];
@@ -27,15 +37,7 @@ function collect(stream) {
             return length;
         },
     };
-    return () => {
-        const bytes = new Uint8Array(chunks.reduce((sum, chunk) => sum + chunk.length, 0));
-        let at = 0;
-        for (const chunk of chunks.splice(0)) {
-            bytes.set(chunk, at);
-            at += chunk.length;
-        }
-        return decoder.decode(bytes);
-    };
+    return () => decoder.decode(joined(chunks.splice(0)));
 }
 
 /** Lets the program read a text from its standard input. */
@@ -66,21 +68,39 @@ function languageOptions({ from, to, assume = [], bits } = {}) {
     return options;
 }
 
+const problemIn = (err) => err.trim().replace(/^vtsym: /, '').replaceAll('/model.json', 'the model');
+
+/** The findings of a model, unless it could not be read. */
+function findingsOf({ out, err, status }) {
+    if (status === 2 && !out) throw new VtsymError(problemIn(err));
+    return out;
+}
+
 /** The object in the only line of an answer. */
 function objectOf({ out, err }) {
     const line = out.split('\n', 1)[0];
-    if (!line) throw new VtsymError(err.trim().replace(/^vtsym: /, '') || 'the program ended without an answer');
+    if (!line) throw new VtsymError(problemIn(err) || 'the program ended without an answer');
     const answer = JSON.parse(line);
     if (answer.error) throw new VtsymError(answer.error.message, answer.error.offset, answer.error.id);
     return answer;
 }
 
+/** The bytes of a text in base64 that were deflated. */
+async function unpack(text) {
+    const bytes = Uint8Array.from(atob(text), (character) => character.charCodeAt(0));
+    const reader = new Blob([bytes]).stream().pipeThrough(new DecompressionStream('deflate')).getReader();
+    const chunks = [];
+    for (let part = await reader.read(); !part.done; part = await reader.read()) chunks.push(part.value);
+    return joined(chunks);
+}
+
 /**
  * Starts an engine.
- * @param {(settings: object) => Promise<object>} createModule the function that the compiled module exports
+ * @param {(settings: object) => Promise<object>} createModule the function that the compiled script exports
+ * @param {string} packed its WebAssembly, deflated, in base64
  */
-export async function openWith(createModule) {
-    const module = await createModule({ print() {}, printErr() {} });
+export async function openWith(createModule, packed) {
+    const module = await createModule({ wasmBinary: await unpack(packed), print() {}, printErr() {} });
     const write = feed(module.FS.streams[0]);
     const readOut = collect(module.FS.streams[1]);
     const readErr = collect(module.FS.streams[2]);
@@ -126,11 +146,8 @@ export async function openWith(createModule) {
             const definitions = Object.entries(values).flatMap(([name, value]) => ['-D', `${name}=${value}`]);
             return answer('eval', [...definitions, ...languageOptions(options)], text).value;
         },
-        check(model) {
-            const { out, err, status } = checked(model, ['--json', '--why']);
-            if (status === 2 && !out) throw new VtsymError(err.trim().replace(/^vtsym: /, ''));
-            return out.split('\n').filter(Boolean).map((line) => JSON.parse(line));
-        },
+        check: (model) => findingsOf(checked(model, ['--json', '--why'])).split('\n').filter(Boolean).map((line) => JSON.parse(line)),
+        checkText: (model) => findingsOf(checked(model, ['--why'])).split('\n').filter(Boolean),
         checkPage(model) {
             checked(model, ['--html', '/page.html']);
             try {

@@ -29,7 +29,16 @@ function stateText() {
     return `#${state}`;
 }
 
+/** The number of the example that is in the fields. */
+function exampleShown() {
+    const isShown = (example) => example.first === $('first').value && (example.language ?? 'c') === $('language').value &&
+        (example.second ?? '') === $('second').value && (example.assume ?? '') === $('assume').value;
+    const found = examples.findIndex(isShown);
+    return found < 0 ? '' : String(found);
+}
+
 function keepState() {
+    $('example').value = exampleShown();
     history.replaceState(null, '', stateText());
 }
 
@@ -79,7 +88,7 @@ async function answer() {
         $('problem').hidden = true;
         show('shortest', short.result);
         show('steps', stepsText(short.steps));
-        const normal = await engine.ask('simplify', first, { ...options, normalForm: true });
+        const normal = await engine.ask('simplify', first, { from: options.from, normalForm: true }); // of the text alone
         show('normal', normal.result);
         const other = options.from === 'c' ? 'quill' : 'c';
         show('other-name', other === 'c' ? 'In C' : 'In Quill');
@@ -124,16 +133,12 @@ async function checkModel() {
     keepState();
     engine.renew();
     try {
-        const findings = await engine.ask('check', text);
+        const findings = await engine.ask('checkText', text);
         const page = await engine.ask('checkPage', text);
         if (turn !== latest) return;
         $('model-problem').hidden = true;
-        $('findings').innerHTML = findings.map((finding) => `<li>line ${finding.line}: <code>${escaped(finding.name)}</code> ` +
-            `<b>${escaped(finding.kind)}</b> <code>${escaped(finding.condition)}</code>` +
-            (finding.proposed ? ` can be <code>${escaped(finding.proposed)}</code>` : '') +
-            (finding.witness ? ` for ${escaped(finding.witness)}` : '') +
-            (finding.because ? `, because <code>${finding.because.map(escaped).join('</code>, <code>')}</code>` : '') + '</li>').join('') ||
-            '<li>none</li>';
+        const sentences = findings.map((finding) => finding.replace(/^\/model\.json:(\d+): /, 'line $1: '));
+        $('findings').innerHTML = sentences.map((sentence) => `<li>${escaped(sentence)}</li>`).join('') || '<li>none</li>';
         $('matrix').srcdoc = page;
     } catch (problem) {
         if (turn !== latest) return;
@@ -162,9 +167,10 @@ function after(action) {
 }
 
 async function start() {
-    $('example').innerHTML = examples.map(({ name }, i) => `<option value="${i}">${escaped(name)}</option>`).join('');
+    $('example').innerHTML = '<option value="">(yours)</option>' + examples.map(({ name }, i) => `<option value="${i}">${escaped(name)}</option>`).join('');
     $('example').onchange = () => {
         const example = examples[$('example').value];
+        if (!example) return;
         for (const name of ['first', 'second', 'assume']) $(name).value = example[name] ?? '';
         $('language').value = example.language ?? 'c';
         answer();
@@ -191,6 +197,6 @@ async function start() {
 }
 
 start().catch((failure) => {
-    show('problem', `The engine does not start: ${failure.message}. A browser of 2022 or later is needed.`);
+    show('problem', `The engine does not start: ${failure.message}. A browser of 2023 or later is needed.`);
     $('problem').hidden = false;
 });

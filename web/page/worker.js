@@ -1,5 +1,5 @@
 // Answers the page: one message, one call of the engine.
-const opened = openWith(createVtsym);
+const opened = openWith(createVtsym, packed);
 
 onmessage = async ({ data: { id, name, args } }) => {
     try {

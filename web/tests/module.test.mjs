@@ -50,7 +50,7 @@ function randomConditions(count) {
 
 const numbers = [...randomDoubles(4000).map(String), '0.1', '1e22', '1e23', '5e-324', '1.7976931348623157e308', '123456789012345680000',
     '0.30000000000000004', '2147483647', '2147483648', '1e300*1e300', '0.1+0.2', '9007199254740993', '0x7fffffff'];
-const readme = [...readFileSync(join(root, 'docs/commands.md'), 'utf8').matchAll(/^\$ \.\/run .*?'(.*)'$/gm)].map((match) => match[1]);
+const readme = [...readFileSync(join(root, 'docs/commands.md'), 'utf8').matchAll(/^\$ \.\/run .*?'(.*?)'$/gm)].map((match) => match[1]);
 
 for (const [name, args, lines] of [
     ['numbers are read and written', ['eval'], numbers],
@@ -75,6 +75,7 @@ test('a model is checked as natively, again and again', () => {
     const text = readFileSync(path, 'utf8');
     const expected = native(['check', '--json', '--why', path]).out.split('\n').filter(Boolean).map((line) => ({ ...JSON.parse(line), file: '/model.json' }));
     for (let i = 0; i < 3; ++i) assert.deepEqual(vtsym.check(text), expected);
+    assert.deepEqual(vtsym.checkText(text).map((line) => line.replace('/model.json', path)), native(['check', '--why', path]).out.trim().split('\n'));
     assert.match(vtsym.checkPage(text), /^<!DOCTYPE html>[^]*<\/html>\s*$/);
     assert.throws(() => vtsym.check('{'), VtsymError);
 });
