@@ -1,11 +1,11 @@
 // The names that a converter has resolved.
 #pragma once
 
+#include "base/core/NodeHash.hpp"
 #include "base/core/Nodes.hpp"
 
 #include <cstddef>
 #include <cstdint>
-#include <functional>
 #include <string_view>
 #include <vector>
 
@@ -41,9 +41,7 @@ private:
         SymbolicExprId id = invalidId;
     };
 
-    static std::uint32_t tagOf(std::string_view name) {
-        return static_cast<std::uint32_t>(std::hash<std::string_view>()(name));
-    }
+    static std::uint32_t tagOf(std::string_view name) { return static_cast<std::uint32_t>(NodeKeys::ofText(name)); }
 
     [[nodiscard]] std::string_view nameOf(SymbolicExprId id) const {
         return static_cast<const SymbolicString*>(table_.get(id))->getName();

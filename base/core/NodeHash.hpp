@@ -21,6 +21,10 @@ constexpr std::uint64_t hashSeed(SymbolicOp op) noexcept {
 inline constexpr OperatorSet exactKeyOps = OperatorSet::where(
     [](const OperatorInfo& r) { return r.shape == "Int" || r.shape == "Unary" || r.shape == "Binary"; });
 
+/// A number that differs from process to process: with it, nobody can prepare texts whose nodes collide in hash tables.
+/// No result depends on it.
+std::uint64_t processSeed() noexcept;
+
 namespace NodeKeys {
 
 inline constexpr unsigned operandBits = 29; ///< of an operand that fits
@@ -78,10 +82,10 @@ constexpr std::uint64_t ofInteger(std::int32_t value) noexcept {
     return static_cast<std::uint64_t>(SymbolicOp::IntValue) << opShift | static_cast<std::uint32_t>(value);
 }
 
-/// The key of an identifier: a hash of its bytes, eight at a time.
+/// The key of an identifier: a hash of its bytes, eight at a time, and of the process.
 inline std::uint64_t ofText(std::string_view text) noexcept {
     constexpr std::uint64_t multiplier = 0xd6e8feb86659fd93U;
-    std::uint64_t hash = text.size();
+    std::uint64_t hash = text.size() ^ processSeed();
     std::uint64_t word = 0;
     for (; text.size() > sizeof word; text.remove_prefix(sizeof word)) {
         std::memcpy(&word, text.data(), sizeof word);

@@ -4,6 +4,7 @@
 // hash where they do not fit.  An index with open addressing and linear probing holds the identifiers of nodes and 32
 // bits of the hashes of their keys; a look-up reads a slot and a key, and a node only where the key is a hash.  The
 // topmost bits of a hash choose the slot, so that a larger index is filled almost in order and without hashing anew.
+// A seed of the process is mixed in, so that nobody can prepare texts whose nodes share slots.
 // Cost: O(1) on average for each constructor and look-up; the index is filled to three quarters at most.
 // Relies on: nodes that are equal have equal keys, but for real literals within a tolerance.
 #include "base/core/Table.hpp"
@@ -14,6 +15,7 @@
 
 #include <algorithm>
 #include <bit>
+#include <chrono>
 #include <limits>
 #include <memory>
 #include <utility>
@@ -25,6 +27,18 @@ constexpr std::size_t firstSlots = 16;
 constexpr std::size_t firstRoom = 128; // nodes
 
 } // namespace
+
+std::uint64_t processSeed() noexcept {
+    // The time and where the system has put the library and the stack.
+    static const std::uint64_t seed = [] {
+        const int local = 0;
+        const auto now = std::chrono::high_resolution_clock::now().time_since_epoch().count();
+        const std::uint64_t places =
+            hashStep(reinterpret_cast<std::uintptr_t>(&local), reinterpret_cast<std::uintptr_t>(&firstSlots));
+        return hashStep(places, static_cast<std::uint64_t>(now));
+    }();
+    return seed;
+}
 
 SymbolicExprTable::SymbolicExprTable()
     : index_(firstSlots),

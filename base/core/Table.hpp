@@ -147,9 +147,9 @@ private:
     template <class Node, class Payload>
     [[nodiscard]] SymbolicExprId idOf(const Payload& node) const;
 
-    /// A hash of two multiplications.
-    [[nodiscard]] static std::uint32_t tagOf(std::uint64_t key) noexcept {
-        key *= 0xd6e8feb86659fd93U;
+    /// A hash of two multiplications, different in each process.
+    [[nodiscard]] std::uint32_t tagOf(std::uint64_t key) const noexcept {
+        key = (key ^ seed_) * 0xd6e8feb86659fd93U;
         return static_cast<std::uint32_t>(((key ^ key >> 32U) * spread) >> 32U);
     }
 
@@ -184,6 +184,7 @@ private:
     CellStore cells_;
     std::vector<const SymbolicExpr*> foreignNodes_; ///< those that came through add(), in the order of addition
     unsigned indexShift_;
+    std::uint64_t seed_ = processSeed();
     LastAnswer lastAnswer_;
 };
 

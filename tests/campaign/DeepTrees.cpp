@@ -1,5 +1,5 @@
 // Every operation on trees of a million operators on top of each other, with 256 KiB of stack; texts nested as deep as
-// they may be, with 128 KiB.
+// they may be, with 384 KiB.
 #include "base/VCService.hpp"
 #include "base/VTSymbolicExpr.hpp"
 #include "base/eval/Eval.hpp"
@@ -137,7 +137,7 @@ class DeepTrees final : public Job {
 public:
     void run(std::uint64_t /*seed*/, std::uint64_t item) override {
         if (item == 0)
-            return withStack(128 * kibibyte, readNested);
+            return withStack(384 * kibibyte, readNested);
         // Each operation on some shape comes first.
         const Operation& operation = operations.at((item - 1) % operations.size());
         const Shape& shape = shapes.at(((item - 1) / operations.size() + item) % shapes.size());
@@ -160,7 +160,7 @@ public:
 
     [[nodiscard]] std::string figure() const override {
         return std::to_string(done_) + " of " + std::to_string(items() - 1) +
-               " operations on trees of 1000000 levels with 256 KiB of stack, texts nested to the bound with 128 KiB";
+               " operations on trees of 1000000 levels with 256 KiB of stack, texts nested to the bound with 384 KiB";
     }
 
     [[nodiscard]] std::uint64_t items() const override { return shapes.size() * operations.size() + 1; }
