@@ -165,6 +165,16 @@ constexpr bool equal(A&& a, B&& b, E e = {}, P p = {}, Q q = {}) {
                       [&](auto&& x, auto&& y) { return invoke(e, invoke(p, x), invoke(q, y)); });
 }
 
+template <Sequence A, Sequence B, class O>
+constexpr void set_intersection(A&& a, B&& b, O out) {
+    std::set_intersection(std::begin(a), std::end(a), std::begin(b), std::end(b), out);
+}
+
+template <Sequence A, Sequence B, class O>
+constexpr void set_difference(A&& a, B&& b, O out) {
+    std::set_difference(std::begin(a), std::end(a), std::begin(b), std::end(b), out);
+}
+
 template <Sequence R, class T>
 constexpr void fill(R&& r, const T& value) {
     std::fill(std::begin(r), std::end(r), value);
