@@ -54,9 +54,10 @@ abi_gate() {
 symbols() {
     dpkg-gensymbols -q -c0 -plibvtsym0 -v"$2" -e"$1" -O"$1.symbols"
     nm -D --defined-only "$1" | awk '
-        NR == FNR { if ($2 ~ /^[Wu]$/) weak[$3]; next }
+        NR == FNR { defined[$3]; if ($2 ~ /^[Wu]$/) weak[$3]; next }
         /^#MISSING/ { next }
         /^ / { name = substr($1, 1, index($1, "@") - 1); sub(/^\(optional=templinst\)/, "", name)
+               if (!(name in defined)) next # optional, and gone
                if (name in weak && $1 !~ /^\(/) sub(/^ /, " (optional=templinst)") }
         { print }' - "$1.symbols"
     rm -f "$1.symbols"
