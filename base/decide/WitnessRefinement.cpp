@@ -20,8 +20,10 @@ void keepCallsOfOneFunction(const SymbolicExprTable& table, std::vector<Symbolic
     std::vector<SymbolicExprId> functions(calls.size());
     std::ranges::transform(calls, functions.begin(), functionOf);
     std::ranges::sort(functions);
-    std::erase_if(
-        calls, [&](SymbolicExprId call) { return std::ranges::equal_range(functions, functionOf(call)).size() < 2; });
+    std::erase_if(calls, [&](SymbolicExprId call) {
+        const auto first = std::ranges::lower_bound(functions, functionOf(call));
+        return functions.end() - first < 2 || first[0] != first[1];
+    });
 }
 
 } // namespace
