@@ -86,7 +86,7 @@ std::optional<std::string> BuildAssumptions::addMeaning(std::string_view line) {
     const std::span<const DirectiveToken> tokens = directive.tokens;
     const bool isCall = tokens.size() > 4 && tokens[0].kind == DirectiveTokenKind::Name && isText(tokens[1], "(") &&
                         !tokens[1].afterBlank && tokens[2].kind == DirectiveTokenKind::Name && isText(tokens[3], ")");
-    if (!isCall)
+    if (!isCall || isText(tokens[0], "defined") || isText(tokens[2], "defined"))
         return wrong;
     const std::string_view text = *meaning.line;
     meaning.parameter = text.substr(tokens[2].begin, tokens[2].end - tokens[2].begin);
@@ -94,6 +94,8 @@ std::optional<std::string> BuildAssumptions::addMeaning(std::string_view line) {
         meaning.body.push_back(token);
         meaning.body.back().text = text.substr(token.begin, token.end - token.begin);
     }
+    if (isText(meaning.body.front(), "##") || isText(meaning.body.back(), "##"))
+        return "pastes nothing: ## is between two tokens";
     const std::string name(tokens[0].text);
     meanings_.insert_or_assign(name, std::move(meaning));
     const std::optional<Item> example = meaningOf(name, "A");
@@ -225,15 +227,11 @@ std::optional<BuildAssumptions::Item> BuildAssumptions::meaningOf(std::string_vi
     if (known == meanings_.end())
         return std::nullopt;
     std::string body;
-    const std::vector<DirectiveToken>& tokens = known->second.body;
-    for (std::size_t i = 0; i < tokens.size(); ++i) {
-        const bool isPaste = i + 1 < tokens.size() && tokens[i].text == "#" && tokens[i + 1].text == "#";
-        if (isPaste || tokens[i].text == "##") {
-            i += isPaste ? 1 : 0;
+    for (const DirectiveToken& token : known->second.body) {
+        if (isText(token, "##"))
             body.erase(body.find_last_not_of(' ') + 1);
-            continue;
-        }
-        body.append(tokens[i].text == known->second.parameter ? argument : tokens[i].text).push_back(' ');
+        else
+            body.append(isText(token, known->second.parameter) ? argument : token.text).push_back(' ');
     }
     const std::string call = std::string(macro) + "(" + std::string(argument) + ")";
     Item item;

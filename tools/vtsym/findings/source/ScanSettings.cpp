@@ -97,14 +97,16 @@ void SettingsReader::take(const toml::key& key, const toml::node& node) {
     } else if (name == "assume") {
         settings_.assumptions = textsOf(key, node);
     } else if (name == "assume-files") {
-        for (const std::string& path : pathsOf(key, node))
-            addAssumption(settings_.assumptions, path);
-    } else if (name == "configurations") {
-        for (const std::string& argument : textsOf(key, node)) {
-            const std::size_t path = argument.find('=') + 1;
-            addConfiguration(settings_.configurations, option,
-                             argument.substr(0, path) + pathIn(folder_, argument.substr(path)));
+        for (const std::string& path : pathsOf(key, node)) {
+            try {
+                addAssumption(settings_.assumptions, path);
+            } catch (const FileError& error) {
+                throw UsageError(option, path + " " + error.what());
+            }
         }
+    } else if (name == "configurations") {
+        for (const std::string& argument : textsOf(key, node))
+            addConfiguration(settings_.configurations, option, argument, folder_);
     } else if (name == "compile-commands") {
         settings_.compileCommands = pathIn(folder_, textOf(key, node));
     } else if (name == "baseline") {
@@ -131,6 +133,12 @@ ScanSettings SettingsReader::read(const toml::table& whole) {
 
 void append(std::vector<std::string>& to, const std::vector<std::string>& from) {
     to.insert(to.end(), from.begin(), from.end());
+}
+
+void append(std::vector<AssumedConfiguration>& to, const std::string& option, AssumedConfiguration added) {
+    if (std::ranges::find(to, added.name, &AssumedConfiguration::name) != to.end())
+        throw UsageError(option, quotedArgument(added.name) + " is given twice; write another name");
+    to.push_back(std::move(added));
 }
 
 bool isComment(std::string_view line) {
@@ -175,8 +183,8 @@ ScanSettings joined(ScanSettings project, const ScanSettings& commandLine, bool 
     append(project.undefines, commandLine.undefines);
     append(project.macroFiles, commandLine.macroFiles);
     append(project.assumptions, commandLine.assumptions);
-    project.configurations.insert(project.configurations.end(), commandLine.configurations.begin(),
-                                  commandLine.configurations.end());
+    for (const AssumedConfiguration& configuration : commandLine.configurations)
+        append(project.configurations, "--configuration", configuration);
     project.strictIncludes = project.strictIncludes || commandLine.strictIncludes;
     project.why = project.why || commandLine.why;
     project.mostBytes = commandLine.mostBytes;
@@ -193,20 +201,20 @@ void addAssumption(std::vector<std::string>& conditions, const std::string& argu
 }
 
 void addConfiguration(std::vector<AssumedConfiguration>& configurations, const std::string& option,
-                      const std::string& argument) {
+                      const std::string& argument, const std::string& folder) {
     const std::size_t equals = argument.find('=');
     if (equals == std::string::npos || equals == 0)
         throw UsageError(option, quotedArgument(argument) + " has no name; write NAME=FILE");
+    if (equals + 1 == argument.size())
+        throw UsageError(option, quotedArgument(argument) + " has no file; write NAME=FILE");
     AssumedConfiguration added{argument.substr(0, equals), {}};
-    if (std::ranges::find(configurations, added.name, &AssumedConfiguration::name) != configurations.end())
-        throw UsageError(option, quotedArgument(added.name) + " is given twice");
-    const std::string path = argument.substr(equals + 1);
+    const std::string path = pathIn(folder, argument.substr(equals + 1));
     try {
         addLines(added.assumptions, readFile(path, mostBytes));
     } catch (const FileError& error) {
         throw UsageError(option, path + " " + error.what());
     }
-    configurations.push_back(std::move(added));
+    append(configurations, option, std::move(added));
 }
 
 std::vector<std::string> kindsOf(const std::string& option, const std::string& list) {

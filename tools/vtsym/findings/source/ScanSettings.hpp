@@ -42,7 +42,7 @@ struct ScanSettings {
 ScanSettings readSettings(const std::string& path);
 
 /// Adds what the command line says to the settings of a project: paths, kinds and a severity replace those of the
-/// project, everything else is added.
+/// project, everything else is added.  Throws UsageError for a configuration that both have.
 ScanSettings joined(ScanSettings project, const ScanSettings& commandLine, bool hasSeverity);
 
 /// Adds an assumption: a condition, or the lines of a file that VT::SourceScanner::assume() takes, without comments and
@@ -50,9 +50,9 @@ ScanSettings joined(ScanSettings project, const ScanSettings& commandLine, bool 
 /// `.assume`, or the path of a regular file.  Throws FileError.
 void addAssumption(std::vector<std::string>& conditions, const std::string& argument);
 
-/// Adds an alternative: "NAME=FILE".  Throws FileError, or UsageError about the option.
+/// Adds an alternative: "NAME=FILE", whose file is in a folder.  Throws UsageError about the option.
 void addConfiguration(std::vector<AssumedConfiguration>& configurations, const std::string& option,
-                      const std::string& argument);
+                      const std::string& argument, const std::string& folder = {});
 
 /// Returns the kinds of a list such as "dead,always-true", or of "all".  Throws UsageError about the option for an
 /// unknown one.

@@ -60,7 +60,7 @@ SourceChecker::SourceChecker(const ScanSettings& settings, const CompileCommands
       kinds_(settings.kinds.empty() ? kindsOf("--kinds", "usual") : settings.kinds) {
     assume();
     if (!scanner_.assumptionsCanHold())
-        throw UsageError("--assume", "the conditions contradict each other; leave out some of them");
+        refuseAssumptions();
     auto build = std::make_shared<Build>();
     readBuild(*build, problem);
     build_ = std::move(build);
@@ -83,6 +83,23 @@ void SourceChecker::assume() {
         for (const std::string& line : configuration.assumptions)
             if (const auto wrong = scanner_.assume(line))
                 throw UsageError("--configuration", quotedArgument(line) + " of " + configuration.name + " " + *wrong);
+    }
+}
+
+/// Names the option whose conditions contradict each other.
+void SourceChecker::refuseAssumptions() const {
+    VT::SourceScanner scanner;
+    for (const std::string& condition : settings_.assumptions)
+        scanner.assume(condition);
+    if (!scanner.assumptionsCanHold())
+        throw UsageError("--assume", "the conditions contradict each other; leave out some of them");
+    for (const AssumedConfiguration& configuration : settings_.configurations) {
+        scanner.beginAlternative();
+        for (const std::string& line : configuration.assumptions)
+            scanner.assume(line);
+        if (!scanner.assumptionsCanHold())
+            throw UsageError("--configuration", "the conditions of " + quotedArgument(configuration.name) +
+                                                    " contradict each other or those of --assume; leave out some");
     }
 }
 

@@ -64,6 +64,7 @@ private:
 
     void readBuild(Build& build, const CompileCommands::Problem& problem) const;
     void assume();
+    void refuseAssumptions() const;
 
     const ScanSettings& settings_;
     VT::SourceScanner scanner_;
