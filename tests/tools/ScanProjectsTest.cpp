@@ -138,5 +138,38 @@ TEST(ScanProjects, MessagesAreWhatTheProblemMatcherReads) {
     EXPECT_THAT(numbers, ::testing::ElementsAre("2", "2", "4"));
 }
 
+TEST(ScanProjects, StepsOfTheWorkflowRun) {
+    std::ifstream workflow(VTSYM_TEST_DATA "/../../examples/ci/workflow.yml");
+    const std::regex step("^ +(?:- )?run: (.*)$");
+    std::string script = R"(git init -q; g() { git -c user.name=n -c user.email=e "$@"; }; export HOME="$PWD"
+g add .; g commit -qm 1; printf '#elif B\n#elif B && C\n#endif\n' >>a.c; g commit -qam 2
+)";
+    std::size_t steps = 0;
+    for (std::string line; std::getline(workflow, line);) {
+        std::smatch match;
+        if (!std::regex_match(line, match, step) || match[1].str().starts_with("apt-get "))
+            continue;
+        std::string command = match[1];
+        command = std::regex_replace(command, std::regex(R"(\$\{\{ \S*base\.sha \}\})"), "$$(git rev-parse HEAD~1)");
+        command = std::regex_replace(command, std::regex(R"(\$\{\{ github\.sha \}\})"), "$$(git rev-parse HEAD)");
+        script += "(set -e\n" + command + "\n)\necho \"= $?\"\n";
+        ++steps;
+    }
+    ASSERT_EQ(steps, 4U);
+    const TemporaryFolder place;
+    place.write("a.c", "#ifdef A\n#ifdef A\n#endif\n");
+    const ProgramResult result = runScript(place, script);
+    EXPECT_EQ(result.out, R"(= 0
+::add-matcher::.github/workflows/problem-matcher.json
+= 0
+= 0
+a.c:2: remains: '#ifdef A' always holds, since '#ifdef A' (line 1) holds here
+a.c:5: new: '#elif B && C' is dead, since '#elif B' (line 4) does not hold here
+= 1
+)");
+    EXPECT_EQ(result.err, "");
+    EXPECT_EQ(Json::parse(place.read("findings.sarif"))["runs"][0]["results"].size(), 2U);
+}
+
 } // namespace
 } // namespace VT::Testing
