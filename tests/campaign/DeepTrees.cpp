@@ -27,6 +27,11 @@ using Op = SymbolicOp;
 
 constexpr int depth = 1'000'000;
 constexpr std::size_t kibibyte = 1024;
+#ifdef __SANITIZE_ADDRESS__
+constexpr std::size_t stackOfTexts = 4096 * kibibyte; // frames are many times as large
+#else
+constexpr std::size_t stackOfTexts = 384 * kibibyte;
+#endif
 
 /// Calls in a thread with a small stack; what is thrown there is thrown here.
 void withStack(std::size_t bytes, const std::function<void()>& call) {
@@ -137,7 +142,7 @@ class DeepTrees final : public Job {
 public:
     void run(std::uint64_t /*seed*/, std::uint64_t item) override {
         if (item == 0)
-            return withStack(384 * kibibyte, readNested);
+            return withStack(stackOfTexts, readNested);
         // Each operation on some shape comes first.
         const Operation& operation = operations.at((item - 1) % operations.size());
         const Shape& shape = shapes.at(((item - 1) / operations.size() + item) % shapes.size());
