@@ -1,7 +1,7 @@
 # promise: the program writes the same bytes whichever compiler, optimisation, locale and stack it has
 # shellcheck shell=sh disable=SC2154 # sourced by ./campaign
 #
-# g++ -O2, g++ -O3 with checks, and clang -O0; the locales that the tests make; stacks of 256 KiB, 8 MiB and no bound.
+# g++ -O1, g++ -O3 with checks, and clang -O0; the locales that the tests make; stacks of 256 KiB, 8 MiB and no bound.
 build program "program z3" vtsym_program
 build test "program tests z3" vtsym_program vtsym_test_locales
 build clang "program fuzz z3" vtsym_program
