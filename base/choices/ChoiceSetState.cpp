@@ -407,6 +407,7 @@ Decision ChoiceSetChecker::State::overlapOf(const ChoiceRun& a, const ChoiceRun&
 void ChoiceSetChecker::State::findOverlaps(const std::vector<ChoiceRun>& runs, std::span<const SymbolicExprId> holds,
                                            ChoiceBoxes& boxes, ChoiceSetReport& report) {
     std::size_t reported = 0;
+    std::optional<std::uint64_t> kept; // steps that counting further overlaps leaves
     std::vector<std::pair<std::size_t, std::size_t>> open;
     // Small runs come first, so that larger ones are decided from theirs.
     for (const ChoiceRun& run : runs) {
@@ -417,14 +418,27 @@ void ChoiceSetChecker::State::findOverlaps(const std::vector<ChoiceRun>& runs, s
             open.pop_back();
             if (areApart(runs[a].ranges, runs[b].ranges))
                 continue;
-            Decision both = overlapOf(runs[a], runs[b], boxes);
+            const bool isPair = runs[a].isSingle() && runs[b].isSingle();
+            const bool isCounting = reported == options.overlaps;
+            // Of a pair that is only counted boxes say enough.
+            const bool isSeen =
+                isCounting && isPair && counted(boxes, boxes.overlap(runs[a].left, runs[b].left)) == Answer::Yes;
+            Decision both =
+                isSeen ? Decision{Answer::Yes, DecisionBound::None, std::nullopt} : overlapOf(runs[a], runs[b], boxes);
             if (both.isNo())
                 continue;
-            if (reported == options.overlaps || stepsLeft == 0 || setLeft == 0) {
+            if (isCounting && !kept)
+                kept = setLeft - std::min(setLeft, share());
+            const bool isCut = stepsLeft == 0 || setLeft <= kept.value_or(0);
+            if (isCut || (isCounting && isPair)) {
                 report.allOverlaps = false;
-                return;
+                report.furtherOverlaps += isPair && both.isYes() ? 1U : 0U;
+                report.allCounted = report.allCounted && !isCut && both.isYes();
+                if (isCut)
+                    return;
+                continue;
             }
-            if (runs[a].isSingle() && runs[b].isSingle()) {
+            if (isPair) {
                 reportOverlap(runs[a].left, runs[b].left, std::move(both), holds, report);
                 ++reported;
                 continue;
