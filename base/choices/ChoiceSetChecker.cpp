@@ -56,6 +56,9 @@ ChoiceSetReport ChoiceSetChecker::check(SymbolicExprId parent, std::span<const S
     std::vector<std::vector<SymbolicExprId>> hiding(policy == ChoicePolicy::First ? choices.size() : 0);
     const std::vector<ChoiceRun> inOrder =
         policy == ChoicePolicy::First ? joinedInHalves(state.table, holds) : std::vector<ChoiceRun>();
+    ChoiceEvaluation evaluation(table, state.decider.options().keywordsInForce, conditions);
+    place.conditions = conditions;
+    place.evaluation = &evaluation;
     for (std::size_t i = 0; i < choices.size(); ++i) {
         if (i == defaultChoice)
             continue;
@@ -71,10 +74,10 @@ ChoiceSetReport ChoiceSetChecker::check(SymbolicExprId parent, std::span<const S
         if (seen.answer != Answer::No && state.counted(boxes, boxes.isFaultless(i)))
             isActive = Answer::Yes;
         if (seen.answer == Answer::No) {
-            State::placeAfter(place, conditions, seen.hiddenBy);
+            State::placeAfter(place, seen.hiddenBy);
             hiding[i] = place.earlierHold;
         } else if (policy == ChoicePolicy::First && (isActive != Answer::Yes || !state.options.domains.empty())) {
-            state.placeAfter(place, conditions, i, inOrder, earlier);
+            state.placeAfter(place, i, inOrder, earlier);
             hiding[i] = place.earlierHold;
         }
         if (isActive != Answer::Yes && place.earlierHold.empty() && ordinary.contains(conditions[i]))
@@ -87,6 +90,7 @@ ChoiceSetReport ChoiceSetChecker::check(SymbolicExprId parent, std::span<const S
         } else if (policy == ChoicePolicy::First) {
             earlier.anyHolds = state.service.OR(earlier.anyHolds, conditions[i], false).id();
             earlier.isAnyActive = earlier.isAnyActive || isActive == Answer::Yes;
+            earlier.living.push_back(i);
             boxes.hide(i);
         }
     }

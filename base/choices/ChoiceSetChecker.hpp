@@ -72,6 +72,8 @@ struct ChoiceSetReport {
     std::vector<std::optional<std::uint64_t>> assignments = {};
     std::optional<std::uint64_t> parentAssignments = {}; ///< the same for the parent
     bool allOverlaps = true;                             ///< whether the overlaps found are all; false beyond the bound
+    std::uint64_t furtherOverlaps = 0;                   ///< pairs beyond the bound, which are only counted
+    bool allCounted = true;                              ///< whether there are no more than these
 };
 
 /// Checks choice sets against exact decisions: every finding is proven.

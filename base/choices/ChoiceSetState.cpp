@@ -106,31 +106,32 @@ ChoiceSetChecker::State::Place ChoiceSetChecker::State::placeIn(SymbolicExprId p
 }
 
 /// Adds the choices that come before one and may hide it.
-void ChoiceSetChecker::State::placeAfter(Place& place, std::span<const SymbolicExprId> conditions, std::size_t position,
-                                         const std::vector<ChoiceRun>& runs, const EarlierChoices& earlier) {
-    const auto ranges = rangesOf(table, both(place.context, conditions[position]));
+void ChoiceSetChecker::State::placeAfter(Place& place, std::size_t position, const std::vector<ChoiceRun>& runs,
+                                         const EarlierChoices& earlier) {
+    const auto ranges = rangesOf(table, both(place.context, place.conditions[position]));
     const auto near = choicesNear(runs, ranges, limits::hidingChoices,
                                   [&](std::size_t choice) { return choice < position && !earlier.isDead[choice]; });
     place.isHidden = earlier.isAnyActive;
-    place.before = position;
     place.earlier.clear();
     place.earlierHold.clear();
     if (!near) {
         place.earlierHold.assign(1, earlier.anyHolds);
+        place.living = earlier.living;
         return;
     }
     place.earlier = *near;
+    place.living = *near;
     for (const std::size_t choice : *near)
-        place.earlierHold.push_back(conditions[choice]);
+        place.earlierHold.push_back(place.conditions[choice]);
 }
 
 /// Adds the choices that are known to hide one.
-void ChoiceSetChecker::State::placeAfter(Place& place, std::span<const SymbolicExprId> conditions,
-                                         const std::vector<std::size_t>& hiding) {
+void ChoiceSetChecker::State::placeAfter(Place& place, const std::vector<std::size_t>& hiding) {
     place.earlier = hiding;
+    place.living = hiding;
     place.earlierHold.clear();
     for (const std::size_t choice : hiding)
-        place.earlierHold.push_back(conditions[choice]);
+        place.earlierHold.push_back(place.conditions[choice]);
 }
 
 /// The condition without operands that its context makes redundant; itself where there are none.
@@ -201,7 +202,7 @@ void ChoiceSetChecker::State::findHiding(ChoiceFinding& finding, const Place& pl
                                          SymbolicExprId holds, ChoiceBoxes& boxes) {
     std::vector<SymbolicExprId> premises = place.premises;
     premises.push_back(condition);
-    if (place.earlierHold.empty() || isDeadAlone(finding.choice, holds, boxes)) {
+    if (place.earlierHold.empty() || (!place.isDeadByEarlier && isDeadAlone(finding.choice, holds, boxes))) {
         finding.reasons = reasonsBy([&](ReasonSearch& search) { return search.whyNever(premises); });
         return;
     }
@@ -239,15 +240,46 @@ bool ChoiceSetChecker::State::isDeadAlone(std::size_t position, SymbolicExprId h
     return seen == Answer::No || (seen == Answer::Undecided && ask(&Decider::canHold, holds).isNo());
 }
 
-/// Whether a choice is active where those before it do not count, and at first by values for which it holds at all.
-Decision ChoiceSetChecker::State::findActive(const Place& place, SymbolicExprId holds, SymbolicExprId left) {
-    if (place.earlierHold.empty() || !place.earlier.empty())
-        return ask(&Decider::canHold, both(holds, left));
-    take(place.before); // they are all looked at
-    Decision alone = ask(&Decider::canHold, holds);
-    if (!alone.isYes() || (alone.witness && decider.holds(left, *alone.witness).value_or(false)))
-        return alone;
-    return ask(&Decider::canHold, both(holds, left));
+/// Whether a choice is active where those before it do not count.  Where it is not, the place is left with those that
+/// hide it.
+Decision ChoiceSetChecker::State::findActive(Place& place, SymbolicExprId holds, SymbolicExprId left) {
+    if (place.earlierHold.empty())
+        return ask(&Decider::canHold, holds);
+    std::vector<std::size_t> hiding;
+    Decision active = findBeyond(place, holds, hiding);
+    if (active.isNo()) {
+        std::ranges::sort(hiding);
+        placeAfter(place, hiding);
+        place.isDeadByEarlier = !hiding.empty();
+    }
+    return active.bound != DecisionBound::Terms ? active : ask(&Decider::canHold, both(holds, left));
+}
+
+/// Whether a condition holds where no earlier choice does.  These become part of the question when values that were
+/// found turn out to be theirs: most never do.  `hiding` has those from which to start, and then all that did.
+/// Undecided with the bound of terms where they cannot be evaluated.
+Decision ChoiceSetChecker::State::findBeyond(const Place& place, SymbolicExprId holds,
+                                             std::vector<std::size_t>& hiding) {
+    const auto leaveOut = [&](std::size_t choice) {
+        holds = both(holds, makeUnary(table, SymbolicOp::Not, place.conditions[choice]));
+    };
+    std::ranges::for_each(hiding, leaveOut);
+    while (hiding.size() < limits::hidingChoices) {
+        Decision found = ask(&Decider::canHold, holds);
+        if (!found.isYes())
+            return found;
+        if (!found.witness)
+            return {Answer::Undecided, DecisionBound::Terms, std::nullopt};
+        const ChoiceEvaluation::Hit hit = place.evaluation->anyOf(place.living, *found.witness);
+        take(hit.steps);
+        if (hit.answer == Answer::No)
+            return found;
+        if (hit.answer == Answer::Undecided)
+            return {Answer::Undecided, DecisionBound::Terms, std::nullopt};
+        hiding.push_back(hit.choice);
+        leaveOut(hit.choice);
+    }
+    return {Answer::Undecided, DecisionBound::Steps, std::nullopt};
 }
 
 /// A condition holds at a point, if evaluation or a decision about the names that boxes know nothing of confirms it.
@@ -274,7 +306,7 @@ Decision ChoiceSetChecker::State::heldAt(const BoxPoint& point, SymbolicExprId c
 }
 
 /// Checks a choice by itself; whether it can be active.
-Answer ChoiceSetChecker::State::checkOne(std::size_t position, const Place& place, SymbolicExprId condition,
+Answer ChoiceSetChecker::State::checkOne(std::size_t position, Place place, SymbolicExprId condition,
                                          ChoiceBoxes& boxes, const ChoiceBoxes::Activity& seen,
                                          ChoiceSetReport& report) {
     const SymbolicExprId holds = both(place.context, toC(condition));
@@ -286,8 +318,7 @@ Answer ChoiceSetChecker::State::checkOne(std::size_t position, const Place& plac
                       : seen.answer == Answer::Yes ? heldAt(seen.point, holds, boxes)
                                                    : Decision();
     // What boxes cannot tell from many earlier choices takes a decision even more steps.
-    const bool isCrowded = place.earlier.empty() && !place.earlierHold.empty();
-    if (active.isUndecided() && isCrowded && boxes.isHidingKnownOf(position))
+    if (active.isUndecided() && place.isCrowded() && boxes.isHidingKnownOf(position))
         active.bound = DecisionBound::Steps;
     else if (active.isUndecided())
         active = findActive(place, holds, left);
@@ -309,9 +340,24 @@ Answer ChoiceSetChecker::State::checkOne(std::size_t position, const Place& plac
         return Answer::Yes;
     }
     // Many earlier choices are left out, as their proofs would take more than the finding is worth.
-    const SymbolicExprId around = isCrowded ? place.context : both(place.context, left);
+    const bool isAlone = place.isCrowded() || (seen.answer != Answer::Yes && place.evaluation != nullptr &&
+                                               operandsOf(left) > limits::choiceOperands);
+    const SymbolicExprId around = isAlone ? place.context : both(place.context, left);
     const auto isEqual = [&](SymbolicExprId candidate) {
-        return seen.answer == Answer::Yes ? counted(boxes, boxes.isEqual(position, toC(candidate))) : Answer::Undecided;
+        if (seen.answer == Answer::Yes)
+            return counted(boxes, boxes.isEqual(position, toC(candidate)));
+        if (!isAlone || place.isCrowded())
+            return Answer::Undecided;
+        std::vector<std::size_t> hiding;
+        const SymbolicExprId inC = toC(candidate);
+        for (const auto& [holdsThere, failsThere] : {std::pair(inC, toC(condition)), std::pair(toC(condition), inC)}) {
+            const SymbolicExprId differs =
+                both(place.context, both(holdsThere, makeUnary(table, SymbolicOp::Not, failsThere)));
+            const Decision found = findBeyond(place, differs, hiding);
+            if (!found.isNo())
+                return found.isYes() ? Answer::No : Answer::Undecided;
+        }
+        return Answer::Yes;
     };
     if (const SymbolicExprId shorter = shorten(around, condition, isEqual); shorter != condition) {
         ChoiceFinding finding{.fault = ChoiceFault::Redundant, .choice = position, .proposed = shorter};
@@ -361,6 +407,7 @@ Decision ChoiceSetChecker::State::overlapOf(const ChoiceRun& a, const ChoiceRun&
 void ChoiceSetChecker::State::findOverlaps(const std::vector<ChoiceRun>& runs, std::span<const SymbolicExprId> holds,
                                            ChoiceBoxes& boxes, ChoiceSetReport& report) {
     std::size_t reported = 0;
+    std::optional<std::uint64_t> kept; // steps that counting further overlaps leaves
     std::vector<std::pair<std::size_t, std::size_t>> open;
     // Small runs come first, so that larger ones are decided from theirs.
     for (const ChoiceRun& run : runs) {
@@ -371,14 +418,27 @@ void ChoiceSetChecker::State::findOverlaps(const std::vector<ChoiceRun>& runs, s
             open.pop_back();
             if (areApart(runs[a].ranges, runs[b].ranges))
                 continue;
-            Decision both = overlapOf(runs[a], runs[b], boxes);
+            const bool isPair = runs[a].isSingle() && runs[b].isSingle();
+            const bool isCounting = reported == options.overlaps;
+            // Of a pair that is only counted boxes say enough.
+            const bool isSeen =
+                isCounting && isPair && counted(boxes, boxes.overlap(runs[a].left, runs[b].left)) == Answer::Yes;
+            Decision both =
+                isSeen ? Decision{Answer::Yes, DecisionBound::None, std::nullopt} : overlapOf(runs[a], runs[b], boxes);
             if (both.isNo())
                 continue;
-            if (reported == options.overlaps || stepsLeft == 0 || setLeft == 0) {
+            if (isCounting && !kept)
+                kept = setLeft - std::min(setLeft, share());
+            const bool isCut = stepsLeft == 0 || setLeft <= kept.value_or(0);
+            if (isCut || (isCounting && isPair)) {
                 report.allOverlaps = false;
-                return;
+                report.furtherOverlaps += isPair && both.isYes() ? 1U : 0U;
+                report.allCounted = report.allCounted && !isCut && both.isYes();
+                if (isCut)
+                    return;
+                continue;
             }
-            if (runs[a].isSingle() && runs[b].isSingle()) {
+            if (isPair) {
                 reportOverlap(runs[a].left, runs[b].left, std::move(both), holds, report);
                 ++reported;
                 continue;

@@ -2,6 +2,7 @@
 #pragma once
 
 #include "base/choices/AssignmentCounter.hpp"
+#include "base/choices/ChoiceEvaluation.hpp"
 #include "base/choices/ChoiceMerges.hpp"
 #include "base/choices/ChoiceRuns.hpp"
 #include "base/choices/ChoiceSetChecker.hpp"
@@ -25,17 +26,23 @@ struct ChoiceSetChecker::State {
         std::vector<SymbolicExprId> premises;         ///< the same, as written
         std::vector<SymbolicExprId> earlierHold = {}; ///< what may hide it, in C shape
         std::vector<std::size_t> earlier = {};        ///< the choices that it is; none where they are too many
-        std::size_t before = 0;                       ///< the number of all choices before it
+        std::vector<std::size_t> living = {};         ///< the choices that it is, however many
+        ChoiceEvaluation* evaluation = nullptr;       ///< of these
+        std::span<const SymbolicExprId> conditions{}; ///< of all choices, in C shape
         bool isHidden = false;                        ///< an earlier choice is active somewhere
+        bool isDeadByEarlier = false;                 ///< these hide the choice, which is not dead alone
+
+        [[nodiscard]] bool isCrowded() const { return earlier.empty() && !earlierHold.empty(); }
     };
 
     /// The choices of a set that come before one.
     struct EarlierChoices {
         EarlierChoices(std::size_t choices, SymbolicExprId none) : isDead(choices, false), anyHolds(none) {}
 
-        std::vector<bool> isDead; ///< by choice
-        SymbolicExprId anyHolds;  ///< where one of them does
-        bool isAnyActive = false; ///< one of them is active somewhere
+        std::vector<bool> isDead;        ///< by choice
+        std::vector<std::size_t> living; ///< the others
+        SymbolicExprId anyHolds;         ///< where one of them does
+        bool isAnyActive = false;        ///< one of them is active somewhere
     };
 
     Decision ask(Decision (Decider::*question)(SymbolicExprId), SymbolicExprId condition);
@@ -57,11 +64,10 @@ struct ChoiceSetChecker::State {
 
     SymbolicExprId both(SymbolicExprId a, SymbolicExprId b);
     Place placeIn(SymbolicExprId parent, std::span<const SymbolicExprId> conditions);
-    void placeAfter(Place& place, std::span<const SymbolicExprId> conditions, std::size_t position,
-                    const std::vector<ChoiceRun>& runs, const EarlierChoices& earlier);
-    static void placeAfter(Place& place, std::span<const SymbolicExprId> conditions,
-                           const std::vector<std::size_t>& hiding);
-    Answer checkOne(std::size_t position, const Place& place, SymbolicExprId condition, ChoiceBoxes& boxes,
+    void placeAfter(Place& place, std::size_t position, const std::vector<ChoiceRun>& runs,
+                    const EarlierChoices& earlier);
+    static void placeAfter(Place& place, const std::vector<std::size_t>& hiding);
+    Answer checkOne(std::size_t position, Place place, SymbolicExprId condition, ChoiceBoxes& boxes,
                     const ChoiceBoxes::Activity& seen, ChoiceSetReport& report);
     OrdinaryChoices ordinaryIn(SymbolicExprId context);
     void checkDefault(std::size_t position, SymbolicExprId context, const std::vector<ChoiceRun>& runs,
@@ -69,7 +75,8 @@ struct ChoiceSetChecker::State {
     void findHiding(ChoiceFinding& finding, const Place& place, SymbolicExprId condition, SymbolicExprId holds,
                     ChoiceBoxes& boxes);
     Decision heldAt(const BoxPoint& point, SymbolicExprId condition, const ChoiceBoxes& boxes);
-    Decision findActive(const Place& place, SymbolicExprId holds, SymbolicExprId left);
+    Decision findActive(Place& place, SymbolicExprId holds, SymbolicExprId left);
+    Decision findBeyond(const Place& place, SymbolicExprId holds, std::vector<std::size_t>& hiding);
     bool isDeadAlone(std::size_t position, SymbolicExprId holds, ChoiceBoxes& boxes);
     template <class Search>
     Reasons reasonsBy(Search search);

@@ -120,6 +120,10 @@ inline constexpr std::int64_t eliminationGrowth = 2;
 /// Splits of a body as it is before that search makes it round, and of that before it takes the widths of all slabs.
 inline constexpr std::size_t firstBranches = 64;
 
+/// Rounds in which that search rounds the bounds of all sums to what the others leave of them.  Beyond it they are as
+/// tight as they became.
+inline constexpr std::size_t tighteningRounds = 4;
+
 /// Steps of the further questions of a comparison after one that used up its own, so that a hard pair costs little more
 /// than one question.
 inline constexpr std::uint64_t furtherSteps = std::uint64_t{1} << 17U;
@@ -142,6 +146,11 @@ inline constexpr std::uint64_t spellingSteps = 8192;
 /// The part of a question's steps that paths of a diagram may take which nothing meets, one in so many.  Beyond it a
 /// search that learns from them takes over.
 inline constexpr std::uint64_t vainShare = 8;
+
+/// The part of a question's steps that one path may take at first, one in so many, and how many times more when it is
+/// tried again, after the others.
+inline constexpr std::uint64_t pathShare = 8;
+inline constexpr std::uint64_t pathGrowth = 4;
 
 /// Steps to find out which ranges of such a path suffice to exclude it: so many, and so many times what excluding it
 /// took.  Beyond them the search learns from more ranges than it needs to.

@@ -299,11 +299,16 @@ TEST_F(ChoiceSetChecks, KnowTheBoundsOfNames) {
 
 TEST_F(ChoiceSetChecks, OfManyOverlappingChoicesUnderFirst) {
     std::mt19937_64 random(66);
-    // Products of ranges, exclusions, and sums of products, of which thousands hide each other.
-    for (int shape = 0; shape < 3; ++shape) {
+    const auto anyName = [&] { return "N" + std::to_string(random() % 6); };
+    const auto less = [&] { return anyName() + " < " + anyName() + " + " + std::to_string(random() % 100); };
+    const auto sum = [&] { return anyName() + " + " + anyName() + " == " + std::to_string(random() % 60); };
+    // Products of ranges, exclusions, and sums of products, of which thousands hide each other; differences and sums.
+    for (int shape = 0; shape < 5; ++shape) {
         std::vector<std::string> choices;
-        for (int i = 0; i < 1500; ++i) {
-            std::string text;
+        for (int i = 0; i < (shape < 3 ? 1500 : 200); ++i) {
+            std::string text = shape == 3   ? less() + " && " + less()
+                               : shape == 4 ? sum() + " && " + anyName() + " == " + std::to_string(random() % 9)
+                                            : "";
             for (std::size_t name = 0; name < 6; ++name) {
                 const std::string value = std::to_string(random() % 40);
                 const std::string symbol = "N" + std::to_string(name);
@@ -322,15 +327,23 @@ TEST_F(ChoiceSetChecks, OfManyOverlappingChoicesUnderFirst) {
             ChoiceSetChecker(*service).check(parse("true"), ids, std::nullopt, ChoicePolicy::First);
         EXPECT_TRUE(report.undecided.empty()) << shape << ": " << report.undecided.size();
         std::vector<bool> isDead(ids.size(), false);
+        Decider decider(service->table());
         for (const ChoiceFinding& finding : report.findings) {
             if (finding.fault != ChoiceFault::Dead)
                 continue;
             isDead[finding.choice] = true;
-            ASSERT_TRUE(finding.isHidden && !finding.hiddenBy.empty());
+            if (!finding.isHidden) {
+                ASSERT_TRUE(decider.canHold(ids[finding.choice]).isNo()) << choices[finding.choice];
+                continue;
+            }
+            ASSERT_FALSE(finding.hiddenBy.empty());
             ASSERT_LT(finding.hiddenBy.back(), finding.choice);
+            std::string hiding;
+            for (const std::size_t choice : finding.hiddenBy)
+                hiding += (hiding.empty() ? "(" : " || (") + choices[choice] + ")";
+            ASSERT_FALSE(decider.implies(ids[finding.choice], parse(hiding)).isNo());
         }
         // A sample is decided without boxes.
-        Decider decider(service->table());
         for (std::size_t i = 0; i < 60; ++i) {
             std::string left = "(" + choices[i] + ")";
             for (std::size_t before = 0; before < i; ++before)

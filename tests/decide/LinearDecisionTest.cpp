@@ -85,7 +85,8 @@ TEST(LinearDecisions, RandomPairsAgreeWithTheSolver) {
     std::size_t given = 0;
     std::string undecided;
     std::size_t withoutWitness = 0;
-    constexpr std::size_t hard[] = {101405, 115147, 116021}; // over as many as 20 variables, or far from their corners
+    constexpr std::size_t hard[] = {101405, 115147, 116021, // over as many as 20 variables, or far from their corners
+                                    7603,   40395,  43743}; // with one hard path or sums to round
     const std::size_t all = pairs + std::size(hard);
     for (std::size_t done = 0; done < all;) {
         DecisionFixture bench; // a fresh one now and then, so that neither side grows without end
@@ -134,7 +135,7 @@ TEST(LinearDecisions, RandomPairsAgreeWithTheSolver) {
     RecordProperty("microseconds", perPair(own));
     RecordProperty("microsecondsOfSolver", perPair(others));
     EXPECT_EQ(undecided, "") << "questions left undecided, by pair";
-    EXPECT_LE(withoutWitness * 30, pairs);
+    EXPECT_LE(withoutWitness * 50, pairs);
     EXPECT_LE(given * 20, pairs) << "questions that the solver gave up";
     if (asked != nullptr)
         std::cout << "us a pair: " << perPair(own) << ", solver " << perPair(others) << ", questions given up by it "

@@ -5,6 +5,7 @@
 #include "base/core/Limits.hpp"
 
 #include <algorithm>
+#include <utility>
 
 namespace VT {
 
@@ -25,14 +26,9 @@ Decision ConditionSearch::find(const Question& question, std::span<const Unknown
     try {
         witnesses_.beginPaths(question, leaves, WitnessSearch::Order::Mentioned);
         encode();
-        for (;;) {
-            const auto end = nextPath({});
-            if (!end)
-                return {unconfirmed_ ? Answer::Undecided : Answer::No,
-                        unconfirmed_ ? DecisionBound::Terms : DecisionBound::None, std::nullopt};
-            if (*end == PathEnd::Met)
-                break;
-        }
+        if (!hasPath())
+            return {unconfirmed_ ? Answer::Undecided : Answer::No,
+                    unconfirmed_ ? DecisionBound::Terms : DecisionBound::None, std::nullopt};
     } catch (const StepsUsedUp&) {
         return {Answer::Undecided, DecisionBound::Steps, std::nullopt};
     }
@@ -181,15 +177,39 @@ Literal ConditionSearch::addAnd(const Question::Node& node, unsigned uses) {
 
 // Paths.
 
+/// Whether a path is met.  Those that take many steps are tried again, with more, when there are no others.
+bool ConditionSearch::hasPath() {
+    postponed_.clear();
+    for (pathSteps_ = steps_.total() / limits::pathShare + 1;; pathSteps_ *= limits::pathGrowth) {
+        while (const auto end = nextPath({}))
+            if (*end == PathEnd::Met)
+                return true;
+        if (postponed_.empty())
+            return false;
+        for (std::vector<LevelRange>& path : std::exchange(postponed_, {})) {
+            path_ = std::move(path);
+            if (tryPath() == PathEnd::Met)
+                return true;
+        }
+    }
+}
+
 /// Tries the next path; nothing where there is none.
 std::optional<ConditionSearch::PathEnd> ConditionSearch::nextPath(std::span<const Literal> assumptions) {
     if (!clauses_.solve(assumptions))
         return std::nullopt;
     readPath();
+    return tryPath();
+}
+
+/// Tries the path at hand, and excludes it from those that follow unless it is met.
+ConditionSearch::PathEnd ConditionSearch::tryPath() {
     const std::uint64_t before = steps_.left();
-    const PathEnd end = witnesses_.tryPath(path_);
+    const PathEnd end = witnesses_.tryPath(path_, pathSteps_);
     if (end != PathEnd::Met) {
         unconfirmed_ = unconfirmed_ || end == PathEnd::Open;
+        if (end == PathEnd::Hard)
+            postponed_.push_back(path_);
         if (end == PathEnd::Excluded)
             refute(before - steps_.left());
         std::vector<Literal> clause;
@@ -287,7 +307,7 @@ void ConditionSearch::refute(std::uint64_t spent) {
 
 void ConditionSearch::minimize(std::span<const UnknownLeaf> leaves) {
     witnesses_.beginPaths(*question_, leaves, WitnessSearch::Order::Texts);
-    static_cast<void>(witnesses_.tryPath(path_));
+    static_cast<void>(witnesses_.tryPath(path_, pathSteps_));
     for (const UnknownLeaf& leaf : leaves) {
         while (witnesses_.pathValue(leaf.unknown) != 0 && findSmaller(leaf.unknown, witnesses_.pathValue(leaf.unknown)))
             steps_.take();

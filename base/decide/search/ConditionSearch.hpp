@@ -5,7 +5,7 @@
 // quantities that depend on each other stand for bounds on differences.  An assignment of truth values leaves ranges of
 // a few levels that suffice for the question to hold; those are a path, as those of diagrams are, for which the
 // WitnessSearch finds values.  Where there are none the ranges that contradict each other become a clause, and the
-// search goes on.
+// search goes on.  A path that takes many steps is postponed: another one may decide the question at once.
 //
 // The smallest witness is found by asking again for a smaller value of one unknown after the other, in the order of
 // their texts.
@@ -59,7 +59,9 @@ private:
 
     [[nodiscard]] Literal endLiteral(Level level, std::int64_t end) const;
 
+    bool hasPath();
     std::optional<PathEnd> nextPath(std::span<const Literal> assumptions);
+    PathEnd tryPath();
     void readPath();
     [[nodiscard]] LevelRange rangeOf(const Question::Node& node) const;
     void refute(std::uint64_t spent);
@@ -80,6 +82,8 @@ private:
     std::vector<std::uint8_t> isOnPath_;
     IdMap<Vertex> vertices_;
     std::vector<LevelRange> path_; ///< one range for each level that it restricts
+    std::vector<std::vector<LevelRange>> postponed_;
+    std::uint64_t pathSteps_ = 0; ///< that one path may take
     std::vector<std::uint32_t> positions_;
     bool unconfirmed_ = false;
 };

@@ -2,10 +2,11 @@
 //
 // Method: a sum is open if it can grow without end within all bounds.  There is a direction along which all open sums
 // grow and no other sum changes, so that they can be met from any point that meets the others, and are left out.  The
-// others bound a body, perhaps along with directions that change none of them; these are separated, and the variables
-// that remain are changed so that the body becomes round (LatticeBasis).  Then the body is split at a variable that has
-// a fraction in a real solution (branch and bound, Land and Doig, 1960), the last one first.  The body is bounded, so
-// this ends; in round bodies it ends soon.
+// others bound a body, perhaps along with directions that change none of them; each bound is rounded to the integers
+// that the real solutions leave (Chvatal, 1973), the directions are separated, and the variables that remain are
+// changed so that the body becomes round (LatticeBasis).  Then the body is split at a variable that has a fraction in a
+// real solution (branch and bound, Land and Doig, 1960), the last one first.  The body is bounded, so this ends; in
+// round bodies it ends soon.
 //
 // Cost: exponential in the variables at worst, polynomial in the length of numbers before the first split.
 #pragma once
@@ -54,7 +55,7 @@ public:
         }
         findDirection();
         VTSYM_CHECK(real.solve());
-        return boundAll(real) ? solveBounded() : std::nullopt;
+        return tightenAll(real) ? solveBounded() : std::nullopt;
     }
 
 private:
@@ -117,16 +118,27 @@ private:
         }
     }
 
-    /// Finds upper bounds of the sums that have none and are not open; false where there is no integer below one.
-    bool boundAll(Simplex<Number>& real) {
-        for (std::size_t i = 0; i < slabs_.size(); ++i) {
-            Bounds<Number>& bounds = slabs_[i].bounds;
-            if (isOpen_[i] || bounds.high)
-                continue;
-            bounds.high = real.greatest(variables_ + i);
-            if (*bounds.high < *bounds.low)
-                return false;
-            real.restrict(variables_ + i, bounds);
+    /// Rounds the bounds of the sums that are not open to what the others leave of them, which may leave less of
+    /// others in turn; false where there is no integer between two bounds.
+    bool tightenAll(Simplex<Number>& real) {
+        bool isChanged = true;
+        for (std::size_t round = 0; isChanged && round < limits::tighteningRounds; ++round) {
+            isChanged = false;
+            for (std::size_t i = 0; i < slabs_.size(); ++i) {
+                if (isOpen_[i])
+                    continue;
+                Bounds<Number>& bounds = slabs_[i].bounds;
+                Bounds<Number> tighter{real.least(variables_ + i), real.greatest(variables_ + i)};
+                if (*tighter.high < *tighter.low)
+                    return false;
+                if (bounds.low == tighter.low && bounds.high == tighter.high)
+                    continue;
+                isChanged = true;
+                bounds = std::move(tighter);
+                real.restrict(variables_ + i, bounds);
+                if (!real.solve())
+                    return false;
+            }
         }
         return true;
     }

@@ -46,6 +46,7 @@ Decision WitnessSearch::find(const Question& question, Diagram diagram, std::spa
     DecisionBound bound = DecisionBound::None;
     best_.reset();
     unconfirmed_ = false;
+    tooHard_ = false;
     first_ = true;
     try {
         collect(diagram, leaves, Order::Mentioned);
@@ -54,7 +55,9 @@ Decision WitnessSearch::find(const Question& question, Diagram diagram, std::spa
         bound = DecisionBound::Steps;
     }
     if (!best_) {
-        if (bound == DecisionBound::None && unconfirmed_)
+        if (tooHard_)
+            bound = DecisionBound::Steps;
+        else if (bound == DecisionBound::None && unconfirmed_)
             bound = DecisionBound::Terms;
         return {bound == DecisionBound::None ? Answer::No : Answer::Undecided, bound, std::nullopt};
     }
@@ -219,8 +222,9 @@ void WitnessSearch::walkPaths(Diagram diagram) {
             continue;
         }
         const std::uint64_t before = steps_.left();
-        const PathEnd end = reachedTruth();
+        const PathEnd end = reachedTruth(steps_.total() / limits::pathShare);
         unconfirmed_ = unconfirmed_ || end == PathEnd::Open;
+        tooHard_ = tooHard_ || end == PathEnd::Hard;
         if (end == PathEnd::Excluded)
             inVain += before - steps_.left();
         if (inVain > steps_.total() / limits::vainShare)
@@ -317,6 +321,18 @@ WitnessSearch::PathEnd WitnessSearch::reachedTruth() {
     return confirmNear(solutions_.back()) ? PathEnd::Met : PathEnd::Open;
 }
 
+/// The same in so many steps.
+WitnessSearch::PathEnd WitnessSearch::reachedTruth(std::uint64_t most) {
+    try {
+        const Steps::Share share(steps_, most);
+        return reachedTruth();
+    } catch (const StepsUsedUp&) {
+        if (steps_.left() == 0)
+            throw;
+        return PathEnd::Hard;
+    }
+}
+
 // Paths that a search finds.
 
 void WitnessSearch::beginPaths(const Question& question, std::span<const UnknownLeaf> leaves, Order order) {
@@ -335,13 +351,13 @@ void WitnessSearch::restrictPaths(Unknown unknown, std::int64_t low, std::int64_
     restrict(unknown, noUnknown, low, high);
 }
 
-WitnessSearch::PathEnd WitnessSearch::tryPath(std::span<const LevelRange> ranges) {
+WitnessSearch::PathEnd WitnessSearch::tryPath(std::span<const LevelRange> ranges, std::uint64_t most) {
     const std::size_t before = system_.size();
     for (const LevelRange& range : ranges)
         restrict(question_->levels()[range.level], range.low, range.high);
     solutions_.assign(1, {});
     best_.reset();
-    const PathEnd end = system_.solve(solutions_.back()) ? reachedTruth() : PathEnd::Excluded;
+    const PathEnd end = system_.solve(solutions_.back()) ? reachedTruth(most) : PathEnd::Excluded;
     shrink(before);
     if (end == PathEnd::Met) {
         VTSYM_CHECK(isLarge_ || holds(*best_));

@@ -54,13 +54,14 @@ public:
         Met,      ///< the values at hand lie in the ranges, and the question holds for them
         Excluded, ///< no values do
         Open,     ///< not known
+        Hard,     ///< not known after the steps that a path may take
     };
 
     /// Begins with a question whose paths follow; values at hand are kept.
     void beginPaths(const Question& question, std::span<const UnknownLeaf> leaves, Order order);
-    /// Whether some values lie in the ranges, which suffice for the question to hold.  Those at hand are then the
-    /// smallest, if nothing computed is among the unknowns.
-    PathEnd tryPath(std::span<const LevelRange> ranges);
+    /// Whether some values lie in the ranges, which suffice for the question to hold, in so many steps.  Those at hand
+    /// are then the smallest, if nothing computed is among the unknowns.
+    PathEnd tryPath(std::span<const LevelRange> ranges, std::uint64_t most);
     /// Whether so many steps suffice to prove that no values lie in the ranges.
     bool excludesPath(std::span<const LevelRange> ranges, std::uint64_t most);
     /// Restricts an unknown on all paths that follow.
@@ -153,6 +154,7 @@ private:
     void enter(Diagram diagram);
     bool take(const Frame& frame, std::size_t edge);
     PathEnd reachedTruth();
+    PathEnd reachedTruth(std::uint64_t most);
     [[nodiscard]] bool improves(const std::vector<std::int64_t>& values) const;
 
     [[nodiscard]] Number numberOf(Unknown unknown) const { return *numbers_.find(unknown); }
@@ -227,6 +229,7 @@ private:
     bool isWide_ = false;      ///< whether the latest trial has a value without 64 bits
     bool isLarge_ = false;     ///< whether that, or a term computed from it, has one
     bool unconfirmed_ = false; ///< whether a path was left that may hold
+    bool tooHard_ = false;     ///< whether one was left that took too many steps
 };
 
 } // namespace VT

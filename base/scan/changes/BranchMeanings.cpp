@@ -100,19 +100,17 @@ State Reader::read(std::string_view text) {
     };
     DirectiveReader reader(text);
     for (Directive directive; reader.next(directive);) {
-        const bool opens = opensChain(directive.kind);
-        const bool ends = directive.kind == DirectiveKind::Endif;
-        if (!opens && (chains.empty() || (!ends && !continuesChain(directive.kind))))
+        if (!belongsToChain(directive.kind, !chains.empty()))
             continue;
         fill(directive.line);
         const SourceRegion region = regionOf(text, directive.begin, directive.line, directive.begin, directive.end);
         for (std::uint64_t line = region.line; line <= region.endLine && line <= lines; ++line)
             state.hasText[line - 1] = false;
-        if (ends) {
+        if (directive.kind == DirectiveKind::Endif) {
             chains.pop_back();
             continue;
         }
-        if (opens)
+        if (opensChain(directive.kind))
             chains.push_back({chains.empty() ? outside : chains.back().branch, outside, table_.getIdTRUE()});
         Chain& chain = chains.back();
         const SymbolicExprId own = conditionOf(directive);

@@ -84,19 +84,17 @@ void BuiltReader::read(std::string_view text, const std::vector<BuiltPart>& part
     std::uint32_t region = 0;
     auto part = parts.begin();
     for (Directive directive; part != parts.end() && reader.next(directive);) {
-        const bool opens = opensChain(directive.kind);
-        if (!opens && !continuesChain(directive.kind) && directive.kind != DirectiveKind::Endif) {
+        if (!belongsToChain(directive.kind, depth != 0)) {
             changes_.take(directive);
             continue;
         }
-        if (!opens && depth == 0)
-            continue;
         if (directive.kind == DirectiveKind::Endif) {
             --depth;
             states_.close();
             continue;
         }
         changes_.beforeCondition();
+        const bool opens = opensChain(directive.kind);
         depth += opens ? 1U : 0U;
         if (opens)
             states_.open();

@@ -66,10 +66,10 @@ ConditionalRegions::ConditionalRegions(std::string_view text) {
     std::vector<Chain> chains;
     DirectiveReader reader(text);
     for (Directive directive; reader.next(directive);) {
+        if (!belongsToChain(directive.kind, !chains.empty()))
+            continue;
         const bool opens = opensChain(directive.kind);
         const bool ends = directive.kind == DirectiveKind::Endif;
-        if (!opens && (chains.empty() || (!ends && !continuesChain(directive.kind))))
-            continue;
         if (!opens)
             regions_[chains.back().last].bodyEnd = lineBegin(text, directive.begin);
         if (ends) {

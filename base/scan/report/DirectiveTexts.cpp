@@ -38,6 +38,10 @@ bool continuesChain(DirectiveKind kind) {
            kind == DirectiveKind::Else;
 }
 
+bool belongsToChain(DirectiveKind kind, bool isBegun) {
+    return opensChain(kind) || (isBegun && (kind == DirectiveKind::Endif || continuesChain(kind)));
+}
+
 std::string directiveText(const Directive& directive) {
     std::string text(keywordText(directive.kind));
     if (directive.kind != DirectiveKind::Else && !directive.tokens.empty())

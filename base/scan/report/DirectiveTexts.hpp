@@ -13,6 +13,8 @@ bool isExpression(DirectiveKind kind);
 /// Whether it begins a chain of branches; whether it goes on with the next branch of one.
 bool opensChain(DirectiveKind kind);
 bool continuesChain(DirectiveKind kind);
+/// Whether it begins, continues or ends a chain; only a chain that was begun is continued or ended.
+bool belongsToChain(DirectiveKind kind, bool isBegun);
 
 /// The keyword of a directive that begins a branch: "#elif".
 std::string_view keywordText(DirectiveKind kind);

@@ -4,17 +4,11 @@
 #include "tools/vtsym/findings/ModelCheck.hpp"
 #include "tools/vtsym/io/Json.hpp"
 
-#include "host/Text.hpp"
-
 #include <algorithm>
 
 namespace vtsym {
 
 namespace {
-
-std::string shownShort(const std::string& text) {
-    return VT::shownText(text, shownInSentence);
-}
 
 std::string jsonCount(const std::optional<std::uint64_t>& count) {
     return count ? std::to_string(*count) : "null";
@@ -37,12 +31,16 @@ void ModelCheck::writeAdvice(ChoiceSet& set) {
         removedJson.append(removedJson.empty() ? "" : ",").append(jsonString(choices[choice]->path()));
     }
     if (std::ranges::count(report.findings, VT::ChoiceFault::Overlap, &VT::ChoiceFinding::fault) > 1) {
-        set.advice.push_back("no choices overlap without " + shownShort(removed) +
+        set.advice.push_back("no choices overlap without " + shown(removed) +
                              (report.removal.isSmallest ? "" : ", which may be more than needed"));
         if (!report.allOverlaps)
-            set.advice.back() = "of the pairs reported none overlaps without " + shownShort(removed);
+            set.advice.back() = "of the pairs reported none overlaps without " + shown(removed);
         appendMember(members, "remove", "[" + removedJson + "]");
         appendMember(members, "smallest", report.removal.isSmallest ? "true" : "false");
+        if (!report.allOverlaps) {
+            appendMember(members, "further_overlaps", std::to_string(report.furtherOverlaps));
+            appendMember(members, "all_counted", report.allCounted ? "true" : "false");
+        }
     }
     if (options_.why && report.parentAssignments) {
         std::string counts;
@@ -54,7 +52,7 @@ void ModelCheck::writeAdvice(ChoiceSet& set) {
             countsJson.append(countsJson.empty() ? "" : ",").append(jsonString(choices[i]->path()));
             countsJson.append(":").append(jsonCount(count));
         }
-        set.advice.push_back(std::to_string(*report.parentAssignments) + " assignments" + shownShort(counts));
+        set.advice.push_back(std::to_string(*report.parentAssignments) + " assignments" + shown(counts));
         appendMember(members, "assignments", jsonCount(report.parentAssignments));
         appendMember(members, "by_choice", "{" + countsJson + "}");
     }
@@ -80,7 +78,7 @@ void ModelCheck::writeMerges(const VTBlock& set, const VT::ChoiceSetReport& repo
             if (&block != &first)
                 finding.follows.push_back({placeOf(block), block.variantCondition()});
         }
-        finding.message = shownShort(finding.message) + " can be one choice: " + shownShort(*finding.proposed);
+        finding.message = shown(finding.message) + " can be one choice: " + shown(*finding.proposed);
         write(findings, std::move(finding));
     }
 }

@@ -56,6 +56,9 @@ public:
 
     [[nodiscard]] const std::string& file() const noexcept { return file_; }
 
+    /// Says how many overlaps have no finding of their own: "at least 12 more pairs".
+    [[nodiscard]] static std::string furtherOverlaps(const VT::ChoiceSetReport& report);
+
     /// The text of a witness; "any values" for one without unknowns.
     [[nodiscard]] std::string witnessText(const VT::Witness& witness) const;
 
@@ -76,11 +79,18 @@ private:
     VT::ChoiceSetReport checkChoices(const VTBlock& block);
     void checkPort(const vtPort& port);
     Finding findingOf(const VTBlock& set, std::span<const VTBlock* const> blocks, const VT::ChoiceFinding& finding);
+    [[nodiscard]] Finding findingOf(const vtPort& port) const;
     void reportUndecided(const VTBlock& set, std::span<const VTBlock* const> blocks, const VT::ChoiceFinding& finding);
     void describeShorter(Finding& finding, const VTBlock& block, VT::SymbolicExprId proposed) const;
     [[nodiscard]] VT::SymbolicExprId contextOf(const VTBlock* block) const;
     [[nodiscard]] VT::SymbolicExprId conditionOf(const vtPort& port) const;
     [[nodiscard]] Place placeOf(const VTBlock& block) const;
+    [[nodiscard]] Place placeOf(const vtPort& port) const;
+    [[nodiscard]] Place regionOf(const VT::Embedded::TextPlace& place) const;
+    [[nodiscard]] static std::string shown(const std::string& text);
+    [[nodiscard]] static bool isUnconditional(const VTBlock& block);
+    [[nodiscard]] static Finding findingAt(Place place, VT::ChoiceFault fault, std::string message,
+                                           std::string condition);
     [[nodiscard]] std::vector<RelatedPlace> conditionsAround(const VTBlock* block) const;
 
     const VTRootBD& model_;

@@ -193,7 +193,9 @@ void SetPage::append(std::string& html, std::size_t number) {
     for (const std::string& advice : set_.advice)
         html.append("<p class=\"soft\">").append(escaped(advice)).append("</p>\n");
     if (!set_.report.allOverlaps)
-        html.append("<p class=\"soft\">More choices overlap than the pairs shown.</p>\n");
+        html.append("<p class=\"soft\">Not shown: ")
+            .append(ModelCheck::furtherOverlaps(set_.report))
+            .append(" of choices that overlap.</p>\n");
     if (set_.findings.empty() && set_.report.undecided.empty())
         html.append("<p class=\"fine\">Exactly one choice is active, whatever the values.</p>\n");
     else
