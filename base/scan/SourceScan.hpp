@@ -129,7 +129,10 @@ struct SourceFile {
 class VTSYM_API SourceScanner {
 public:
     explicit SourceScanner(const SourceScanOptions& options = {});
+    /// A scanner with the same options and assumptions, which both keep once, for another thread.
+    SourceScanner(const SourceScanner& other);
     SourceScanner(SourceScanner&&) noexcept;
+    SourceScanner& operator=(const SourceScanner&) = delete;
     SourceScanner& operator=(SourceScanner&&) noexcept;
     ~SourceScanner();
 
@@ -138,6 +141,9 @@ public:
     std::optional<std::string> assume(std::string_view condition);
     /// Begins an alternative, which has what was assumed so far, and takes what is assumed from now on.
     void beginAlternative();
+    /// Reports from now on only what holds in all configurations of a file, or in every build; or all again.  A file is
+    /// not scanned for further ones once nothing is left that holds in those so far.
+    void reportCommonOnly(bool only) noexcept;
     /// Whether all assumptions can hold together, as far as that is decided.
     [[nodiscard]] bool assumptionsCanHold();
 
