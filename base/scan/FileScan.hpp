@@ -60,6 +60,7 @@ private:
         bool hadElse = false;
         bool switchedOn = false;               ///< a branch before is entered by a switch
         BranchCause cause = BranchCause::Code; ///< of what follows
+        bool needsDefinitions = false;         ///< what follows
         std::optional<BranchReason> always{};  ///< the branch that is always entered, so that later ones never are
     };
 

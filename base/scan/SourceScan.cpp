@@ -36,6 +36,7 @@ public:
             } else if (!same->configurations.empty()) { // not in every build
                 same->configurations.push_back(*configuration);
                 same->hasOtherReasons = same->hasOtherReasons || same->reasons != finding.reasons;
+                same->needsDefinitions = same->needsDefinitions || finding.needsDefinitions;
             }
         }
     }

@@ -178,7 +178,7 @@ std::vector<FileFinding> SourceChecker::check(const std::string& path, std::stri
     scanner_.reportCommonOnly(settings_.severity > FindingLevel::Note && suppressions.empty());
     const std::uint64_t undecidedBefore = scanner_.counts().undecided;
     scanner_.scan(file, [&](const VT::BranchFinding& found) {
-        Finding finding = findingOf(path, found, configurations, alternatives != 0);
+        Finding finding = findingOf(path, found, configurations);
         if (alternatives != 0)
             for (const std::size_t configuration : found.configurations)
                 finding.configurationNames.push_back(settings_.configurations[configuration % alternatives].name);
