@@ -68,8 +68,11 @@ void FileScan::beginBranch(const Directive& directive) {
         report(std::move(dead), directive, "0");
     }
     chain.hadElse = directive.kind == DirectiveKind::Else;
-    if (!isSilent() && !chain.hadElse)
+    if (!isSilent() && !chain.hadElse) {
+        if (input_.ask)
+            input_.ask();
         readBranch(directive);
+    }
 }
 
 void FileScan::leaveBranch() {

@@ -26,6 +26,7 @@ struct FileScanInput {
     const BuildMacros* build; ///< nullptr for nothing
     const BuildAssumptions& assumptions;
     const SourceScanOptions& options;
+    const std::function<void()>& ask;     ///< before each condition; may be empty
     BranchWitnesses* witnesses = nullptr; ///< to find; nullptr for none
 };
 

@@ -121,6 +121,7 @@ struct SourceScanner::State {
     SourceScanOptions options;
     SourceScanCounts counts;
     bool commonOnly = false;
+    std::function<void()> ask;                                              ///< before each condition; may be empty
     std::shared_ptr<Assumptions> assumed = std::make_shared<Assumptions>(); ///< shared with scanners of other threads
     std::unique_ptr<SymbolicExprTable> table;
     std::unique_ptr<BranchJudge> judge;
@@ -136,7 +137,7 @@ std::vector<BranchFinding> SourceScanner::State::scan(const SourceFile& file, co
     judge->beginFile();
     std::vector<BranchFinding> found;
     SourceScanCounts uncounted;
-    const FileScanInput input{file.text, file.isCpp, in.build, *in.assumptions, options, witnesses};
+    const FileScanInput input{file.text, file.isCpp, in.build, *in.assumptions, options, ask, witnesses};
     const bool isCounted = in.build == nullptr && in.assumptions == &assumed->common;
     FileScan(*table, *judge, input, isCounted ? counts : uncounted, [&](BranchFinding&& finding) {
         found.push_back(std::move(finding));
@@ -212,6 +213,10 @@ void SourceScanner::beginAlternative() {
 
 void SourceScanner::reportCommonOnly(bool only) noexcept {
     state_->commonOnly = only;
+}
+
+void SourceScanner::beforeEachCondition(std::function<void()> ask) {
+    state_->ask = std::move(ask);
 }
 
 bool SourceScanner::assumptionsCanHold() {

@@ -142,6 +142,9 @@ public:
     /// Assumes a condition, as #if has them, in every file from now on.  Returns what is wrong with it, a part of a
     /// sentence that follows its quotation; nothing where it is assumed.
     std::optional<std::string> assume(std::string_view condition);
+    /// Asks before each condition of a file: what `ask` throws ends the scan of the file, and the scanner is as good as
+    /// before.
+    void beforeEachCondition(std::function<void()> ask);
     /// Begins an alternative, which has what was assumed so far, and takes what is assumed from now on.
     void beginAlternative();
     /// Reports from now on only what holds in all configurations of a file, or in every build; or all again.  A file is
