@@ -64,11 +64,15 @@ void FileScan::beginBranch(const Directive& directive) {
         BranchFinding dead = finding(BranchFindingKind::Dead, directive);
         dead.reasons.push_back(*chain.always);
         dead.cause = chain.cause;
+        dead.needsDefinitions = chain.needsDefinitions;
         report(std::move(dead), directive, "0");
     }
     chain.hadElse = directive.kind == DirectiveKind::Else;
-    if (!isSilent() && !chain.hadElse)
+    if (!isSilent() && !chain.hadElse) {
+        if (input_.ask)
+            input_.ask();
         readBranch(directive);
+    }
 }
 
 void FileScan::leaveBranch() {
@@ -181,6 +185,7 @@ void FileScan::judgeBranch(const Directive& directive, const DirectiveCondition&
                                                                                    : BranchFindingKind::Removable,
                                    directive);
     result.cause = causeOf(known, reasons);
+    result.needsDefinitions = std::ranges::any_of(reasons, [&](std::size_t at) { return at < known.build.size(); });
     for (const std::size_t at : reasons) {
         for (BranchReason& reason : reasonsOf(known, at))
             if (std::ranges::find(result.reasons, reason) == result.reasons.end())
@@ -200,6 +205,7 @@ void FileScan::judgeBranch(const Directive& directive, const DirectiveCondition&
     chain.silent = verdict.kind == BranchVerdictKind::Dead;
     if (verdict.kind == BranchVerdictKind::AlwaysTrue) {
         chain.cause = result.cause;
+        chain.needsDefinitions = result.needsDefinitions;
         chain.always = BranchReason{result.region, quotedDirective(result.directive), true};
     }
     report(std::move(result), directive, std::move(proposed));

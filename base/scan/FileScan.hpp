@@ -26,6 +26,7 @@ struct FileScanInput {
     const BuildMacros* build; ///< nullptr for nothing
     const BuildAssumptions& assumptions;
     const SourceScanOptions& options;
+    const std::function<void()>& ask;     ///< before each condition; may be empty
     BranchWitnesses* witnesses = nullptr; ///< to find; nullptr for none
 };
 
@@ -60,6 +61,7 @@ private:
         bool hadElse = false;
         bool switchedOn = false;               ///< a branch before is entered by a switch
         BranchCause cause = BranchCause::Code; ///< of what follows
+        bool needsDefinitions = false;         ///< what follows
         std::optional<BranchReason> always{};  ///< the branch that is always entered, so that later ones never are
     };
 

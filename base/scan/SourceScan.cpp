@@ -2,7 +2,9 @@
 //
 // Method: a file is scanned without its configurations, then for each of them; findings about one directive that are
 // equal become one, which knows the configurations that it holds for.
-// Cost: that of FileScan for each configuration, limits::scanConfigurations at most.
+// Cost: that of FileScan for each configuration, limits::scanConfigurations at most.  Where only what they all have in
+// common is reported, a file without candidates ends after its first: 21 configurations of a large tree cost little
+// more than one.
 #include "base/scan/SourceScan.hpp"
 
 #include "base/core/Limits.hpp"
@@ -34,8 +36,22 @@ public:
             } else if (!same->configurations.empty()) { // not in every build
                 same->configurations.push_back(*configuration);
                 same->hasOtherReasons = same->hasOtherReasons || same->reasons != finding.reasons;
+                same->needsDefinitions = same->needsDefinitions || finding.needsDefinitions;
             }
         }
+    }
+
+    /// Whether some finding holds in each of the first configurations, and not in every build.
+    [[nodiscard]] bool hasCommon(std::size_t configurations) const {
+        return std::ranges::any_of(
+            all_, [&](const BranchFinding& each) { return each.configurations.size() == configurations; });
+    }
+
+    /// Leaves out what holds in some of the configurations alone.
+    void keepCommon(std::size_t configurations) {
+        std::erase_if(all_, [&](const BranchFinding& each) {
+            return !each.configurations.empty() && each.configurations.size() != configurations;
+        });
     }
 
     /// All in the order of their lines.
@@ -63,7 +79,27 @@ private:
 } // namespace
 
 struct SourceScanner::State {
+    /// What is assumed of every build, or of those of one kind.
+    struct Assumptions {
+        BuildAssumptions common;
+        std::deque<BuildAssumptions> alternatives;
+    };
+
     explicit State(const SourceScanOptions& given) : options(given) { renew(); }
+
+    State(const SourceScanOptions& given, std::shared_ptr<Assumptions> shared, bool common)
+        : options(given),
+          commonOnly(common),
+          assumed(std::move(shared)) {
+        renew();
+    }
+
+    /// The assumptions to add to, which no other scanner has.
+    Assumptions& ownAssumptions() {
+        if (assumed.use_count() > 1)
+            assumed = std::make_shared<Assumptions>(*assumed);
+        return *assumed;
+    }
 
     void renew() {
         judge.reset();
@@ -84,8 +120,9 @@ struct SourceScanner::State {
 
     SourceScanOptions options;
     SourceScanCounts counts;
-    BuildAssumptions assumptions; ///< of every build
-    std::deque<BuildAssumptions> alternatives;
+    bool commonOnly = false;
+    std::function<void()> ask;                                              ///< before each condition; may be empty
+    std::shared_ptr<Assumptions> assumed = std::make_shared<Assumptions>(); ///< shared with scanners of other threads
     std::unique_ptr<SymbolicExprTable> table;
     std::unique_ptr<BranchJudge> judge;
 };
@@ -100,8 +137,8 @@ std::vector<BranchFinding> SourceScanner::State::scan(const SourceFile& file, co
     judge->beginFile();
     std::vector<BranchFinding> found;
     SourceScanCounts uncounted;
-    const FileScanInput input{file.text, file.isCpp, in.build, *in.assumptions, options, witnesses};
-    const bool isCounted = in.build == nullptr && in.assumptions == &assumptions;
+    const FileScanInput input{file.text, file.isCpp, in.build, *in.assumptions, options, ask, witnesses};
+    const bool isCounted = in.build == nullptr && in.assumptions == &assumed->common;
     FileScan(*table, *judge, input, isCounted ? counts : uncounted, [&](BranchFinding&& finding) {
         found.push_back(std::move(finding));
     }).run();
@@ -112,6 +149,7 @@ std::vector<BranchFinding> SourceScanner::State::scan(const SourceFile& file, co
 
 /// Each definition of macros with each alternative.  Alternatives that have nothing to say about a file are left out.
 std::vector<SourceScanner::State::Configuration> SourceScanner::State::configurationsOf(const SourceFile& file) const {
+    const std::deque<BuildAssumptions>& alternatives = assumed->alternatives;
     std::vector<const BuildMacros*> builds = file.configurations;
     if (builds.empty() &&
         std::ranges::any_of(alternatives, [&](const BuildAssumptions& each) { return each.mayConcern(file.text); }))
@@ -119,7 +157,7 @@ std::vector<SourceScanner::State::Configuration> SourceScanner::State::configura
     std::vector<Configuration> all;
     for (const BuildMacros* const build : builds) {
         if (alternatives.empty())
-            all.push_back({build, &assumptions});
+            all.push_back({build, &assumed->common});
         for (const BuildAssumptions& each : alternatives)
             all.push_back({build, &each});
     }
@@ -156,34 +194,53 @@ void SourceScanner::State::addWitnesses(const SourceFile& file, const std::vecto
 
 SourceScanner::SourceScanner(const SourceScanOptions& options) : state_(std::make_unique<State>(options)) {}
 
+SourceScanner::SourceScanner(const SourceScanner& other)
+    : state_(std::make_unique<State>(other.state_->options, other.state_->assumed, other.state_->commonOnly)) {}
+
 SourceScanner::SourceScanner(SourceScanner&&) noexcept = default;
 SourceScanner& SourceScanner::operator=(SourceScanner&&) noexcept = default;
 SourceScanner::~SourceScanner() = default;
 
 std::optional<std::string> SourceScanner::assume(std::string_view condition) {
-    return (state_->alternatives.empty() ? state_->assumptions : state_->alternatives.back()).add(condition);
+    State::Assumptions& own = state_->ownAssumptions();
+    return (own.alternatives.empty() ? own.common : own.alternatives.back()).add(condition);
 }
 
 void SourceScanner::beginAlternative() {
-    state_->alternatives.push_back(state_->assumptions);
+    State::Assumptions& own = state_->ownAssumptions();
+    own.alternatives.push_back(own.common);
+}
+
+void SourceScanner::reportCommonOnly(bool only) noexcept {
+    state_->commonOnly = only;
+}
+
+void SourceScanner::beforeEachCondition(std::function<void()> ask) {
+    state_->ask = std::move(ask);
 }
 
 bool SourceScanner::assumptionsCanHold() {
-    return state_->assumptions.canHold() &&
-           std::ranges::all_of(state_->alternatives, [](const BuildAssumptions& each) { return each.canHold(); });
+    const State::Assumptions& assumed = *state_->assumed;
+    return assumed.common.canHold() &&
+           std::ranges::all_of(assumed.alternatives, [](const BuildAssumptions& each) { return each.canHold(); });
 }
 
 void SourceScanner::scan(const SourceFile& file, const std::function<void(const BranchFinding&)>& report) {
     FileFindings all;
-    all.add(state_->scan(file, {nullptr, &state_->assumptions}), std::nullopt);
+    all.add(state_->scan(file, {nullptr, &state_->assumed->common}), std::nullopt);
     std::vector<State::Configuration> configurations = state_->configurationsOf(file);
     const std::size_t most = std::min(configurations.size(), limits::scanConfigurations);
     state_->counts.leftOut += configurations.size() - most;
     configurations.resize(most);
-    for (std::size_t i = 0; i < most; ++i)
+    for (std::size_t i = 0; i < most; ++i) {
+        if (state_->commonOnly && i > 0 && !all.hasCommon(i))
+            break;
         all.add(state_->scan(file, configurations[i]), i);
+    }
+    if (state_->commonOnly)
+        all.keepCommon(most);
     std::vector<BranchFinding> found = all.take();
-    if (state_->options.why && !state_->alternatives.empty())
+    if (state_->options.why && !state_->commonOnly && !state_->assumed->alternatives.empty())
         state_->addWitnesses(file, configurations, found);
     std::ranges::for_each(found, report);
 }

@@ -79,6 +79,9 @@ struct BranchFinding {
     bool hasOtherReasons = false; ///< in some of the configurations
     std::string witness{};        ///< definitions that enter a branch that is dead in other configurations alone
     std::size_t witnessOf = 0;    ///< the configuration that has them
+    /// Whether it needs definitions of the build, as its reasons or as those of the branch before it in its chain that
+    /// is always entered.
+    bool needsDefinitions = false;
 };
 
 /// Options of a scanner, for all of its files.
@@ -129,15 +132,24 @@ struct SourceFile {
 class VTSYM_API SourceScanner {
 public:
     explicit SourceScanner(const SourceScanOptions& options = {});
+    /// A scanner with the same options and assumptions, which both keep once, for another thread.
+    SourceScanner(const SourceScanner& other);
     SourceScanner(SourceScanner&&) noexcept;
+    SourceScanner& operator=(const SourceScanner&) = delete;
     SourceScanner& operator=(SourceScanner&&) noexcept;
     ~SourceScanner();
 
     /// Assumes a condition, as #if has them, in every file from now on.  Returns what is wrong with it, a part of a
     /// sentence that follows its quotation; nothing where it is assumed.
     std::optional<std::string> assume(std::string_view condition);
+    /// Asks before each condition of a file: what `ask` throws ends the scan of the file, and the scanner is as good as
+    /// before.
+    void beforeEachCondition(std::function<void()> ask);
     /// Begins an alternative, which has what was assumed so far, and takes what is assumed from now on.
     void beginAlternative();
+    /// Reports from now on only what holds in all configurations of a file, or in every build; or all again.  A file is
+    /// not scanned for further ones once nothing is left that holds in those so far.
+    void reportCommonOnly(bool only) noexcept;
     /// Whether all assumptions can hold together, as far as that is decided.
     [[nodiscard]] bool assumptionsCanHold();
 

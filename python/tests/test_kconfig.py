@@ -219,6 +219,25 @@ def test_scanning_with_a_configuration(tmp_path: Path) -> None:
     assert "'CONFIG_NETWORK' is defined nowhere" in found[3][1]
 
 
+def test_architectures_with_the_files_of_another(tmp_path: Path, monkeypatch: pytest.MonkeyPatch) -> None:
+    (tmp_path / "arch").mkdir()
+    (tmp_path / "arch/Kconfig.sparc").write_text('config WIDE\n\tbool "Wide" if "$(ARCH)" = "sparc"\n\tdefault "$(ARCH)" = "sparc64"\n')
+    (tmp_path / "Kconfig").write_text('source "arch/Kconfig.$(SRCARCH)"\n')
+    monkeypatch.setenv("srctree", str(tmp_path))
+    for name in ("ARCH", "SRCARCH", "SUBARCH", "HEADER_ARCH"):
+        monkeypatch.delenv(name, raising=False)
+    values = {}
+    for arch in ("sparc", "sparc64", "sparc32"):
+        out = io.StringIO()
+        kconfig.write(kconfig.read(tmp_path / "Kconfig", arch), out)
+        values[arch] = [line for line in out.getvalue().splitlines() if not line.startswith("#")]
+    assert values == {
+        "sparc": ["!defined(CONFIG_WIDE) || CONFIG_WIDE == 1"],
+        "sparc64": ["CONFIG_WIDE == 1"],
+        "sparc32": ["!defined(CONFIG_WIDE)"],
+    }
+
+
 def test_wrong_files(tmp_path: Path, capsys: pytest.CaptureFixture[str]) -> None:
     (tmp_path / "Kconfig").write_text("config A\n\tmaybe\n")
     assert main([str(tmp_path / "Kconfig")]) == 2

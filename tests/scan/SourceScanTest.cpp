@@ -60,10 +60,27 @@ std::vector<std::string> wordsOf(const std::string& list, const std::string& sep
     return words;
 }
 
+/// The findings of a copy that is asked for what all configurations have in common.
+std::string commonOf(SourceScanner scanner, const SourceFile& file) {
+    scanner.reportCommonOnly(true);
+    return findings(std::move(scanner), file);
+}
+
+/// The findings of a copy, without those that hold in some configurations alone.
+std::string withoutOthers(SourceScanner scanner, const SourceFile& file, std::size_t configurations) {
+    std::string report;
+    scanner.scan(file, [&](const BranchFinding& found) {
+        if (found.configurations.empty() || found.configurations.size() == configurations)
+            report += (report.empty() ? "" : "\n") + lineOf(found);
+    });
+    return report;
+}
+
 TEST(Findings, OfBuilds) {
     for (const CaseRow& row : casesOf("scan-builds.txt", "builds", 4)) {
         SourceScanner scanner({.why = true});
         std::vector<BuildMacros> builds;
+        std::size_t alternatives = 0;
         for (const std::string& configuration : wordsOf(row[1], " | ")) {
             builds.emplace_back();
             for (const std::string& option : wordsOf(configuration, "; ")) {
@@ -73,7 +90,7 @@ TEST(Findings, OfBuilds) {
                     EXPECT_TRUE(builds.back().undefine(option.substr(2))) << option;
                 else if (option.starts_with("assume "))
                     EXPECT_EQ(scanner.assume(option.substr(7)), std::nullopt) << option;
-                else if (option == "or")
+                else if (option == "or" && ++alternatives > 0)
                     scanner.beginAlternative();
                 else
                     builds.back().addFile("c.h", option, true);
@@ -83,6 +100,9 @@ TEST(Findings, OfBuilds) {
         for (const BuildMacros& build : builds)
             if (!build.empty())
                 file.configurations.push_back(&build);
+        const std::size_t configurations =
+            std::max<std::size_t>(alternatives, 1) * std::max<std::size_t>(file.configurations.size(), 1);
+        EXPECT_EQ(commonOf(scanner, file), withoutOthers(scanner, file, configurations)) << row[0] << "\n" << row[2];
         EXPECT_EQ(findings(std::move(scanner), file), row[3]) << row[0] << "\n" << row[2];
     }
 }
@@ -116,6 +136,16 @@ TEST(Findings, OfManyConfigurationsAndAssumptions) {
     scanner.scan(file, [&](const BranchFinding& found) { held += found.configurations.size(); });
     EXPECT_EQ(held, limits::scanConfigurations);
     EXPECT_EQ(scanner.counts().leftOut, 1U);
+
+    // A file is given up as soon as its configurations have nothing in common.
+    file.text = "#if N > 2 && A\n#endif\n#if N > 2 && B\n#endif";
+    SourceScanner all;
+    EXPECT_NE(findings(all, file), "");
+    SourceScanner few(all);
+    few.reportCommonOnly(true);
+    few.scan(file, [](const BranchFinding& found) { ADD_FAILURE() << lineOf(found); });
+    all.scan(file, [](const BranchFinding&) {});
+    EXPECT_LT(4 * few.counts().steps, all.counts().steps);
 
     const auto isFound = [](std::size_t links) { // A0 || !A1, A1 || !A2, ...
         SourceScanner chained;

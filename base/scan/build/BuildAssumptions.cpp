@@ -28,21 +28,62 @@ bool isText(const DirectiveToken& token, std::string_view text) {
 
 } // namespace
 
-/// A reader of conditions outside of any file.
-struct BuildAssumptions::Check {
-    Check() : unknowns(table, states), reader(table, states, unknowns, false) { table.addBoolSymbols(); }
+/// The lines that were read, with a reader of conditions outside of any file.
+struct BuildAssumptions::Lines {
+    /// Reads conditions; its memory is used again from time to time.
+    struct Check {
+        Check() : unknowns(table, states), reader(table, states, unknowns, false) { table.addBoolSymbols(); }
 
-    SymbolicExprTable table;
-    MacroStates states;
-    MacroUnknowns unknowns;
-    DirectiveConditionReader reader;
+        SymbolicExprTable table;
+        MacroStates states;
+        MacroUnknowns unknowns;
+        DirectiveConditionReader reader;
+    };
+
+    /// Whether #if can have a condition.
+    bool isCondition(const Directive& directive) {
+        if (!check || check->table.size() > limits::assumptionNodes)
+            check.emplace();
+        return check->reader.read(directive).understood;
+    }
+
+    std::optional<std::string> read(std::string_view condition, std::shared_ptr<const Item>& item);
+
+    std::optional<Check> check;
+    std::unordered_map<std::string_view, std::shared_ptr<const Item>> known; ///< by condition, a view of its line
 };
 
-/// Whether #if can have a condition.
-bool BuildAssumptions::isCondition(const Directive& directive) {
-    if (!check_ || check_->table.size() > limits::assumptionNodes)
-        check_ = std::make_shared<Check>();
-    return check_->reader.read(directive).understood;
+/// Makes an item of a condition.  Returns what is wrong with it.
+std::optional<std::string> BuildAssumptions::Lines::read(std::string_view condition,
+                                                         std::shared_ptr<const Item>& item) {
+    if (const auto same = known.find(condition); same != known.end()) {
+        item = same->second;
+        return std::nullopt;
+    }
+    Item made;
+    made.line = std::make_shared<const std::string>("#if " + std::string(condition));
+    DirectiveReader reader(*made.line);
+    Directive directive{};
+    if (condition.find('\n') != std::string_view::npos)
+        return "has several lines";
+    if (!readLine(reader, *made.line, directive))
+        return "holds no condition";
+    if (!isCondition(directive))
+        return "is not a condition that #if can have";
+    for (const DirectiveToken& token : directive.tokens) {
+        const bool isMacro = token.kind == DirectiveTokenKind::Name && token.text != "defined";
+        // A view of the line: its tokens have no splices.
+        const std::string_view name = std::string_view(*made.line).substr(token.begin, token.end - token.begin);
+        if (isMacro && std::ranges::find(made.names, name) == made.names.end())
+            made.names.push_back(name);
+    }
+    item = std::make_shared<const Item>(std::move(made));
+    known.emplace(std::string_view(*item->line).substr(4), item);
+    return std::nullopt;
+}
+
+std::shared_ptr<BuildAssumptions::Lines> BuildAssumptions::newLines() {
+    return std::make_shared<Lines>();
 }
 
 std::optional<std::string> BuildAssumptions::add(std::string_view condition) {
@@ -50,27 +91,13 @@ std::optional<std::string> BuildAssumptions::add(std::string_view condition) {
         return addMeaning(condition);
     if (condition.starts_with("#pragma"))
         return addPragma(condition);
-    Item item;
-    item.line = std::make_shared<const std::string>("#if " + std::string(condition));
-    DirectiveReader reader(*item.line);
-    Directive directive{};
-    if (condition.find('\n') != std::string_view::npos)
-        return "has several lines";
-    if (!readLine(reader, *item.line, directive))
-        return "holds no condition";
-    if (!isCondition(directive))
-        return "is not a condition that #if can have";
-    for (const DirectiveToken& token : directive.tokens) {
-        const bool isMacro = token.kind == DirectiveTokenKind::Name && token.text != "defined";
-        // A view of the line: its tokens have no splices.
-        const std::string_view name = std::string_view(*item.line).substr(token.begin, token.end - token.begin);
-        if (isMacro && std::ranges::find(item.names, name) == item.names.end())
-            item.names.push_back(name);
-    }
-    for (const std::string_view name : item.names)
+    std::shared_ptr<const Item> item;
+    if (auto wrong = lines_->read(condition, item))
+        return wrong;
+    for (const std::string_view name : item->names)
         byName_[name].push_back(items_.size());
-    if (!item.names.empty())
-        byFirst_[item.names.front()].push_back(items_.size());
+    if (!item->names.empty())
+        byFirst_[item->names.front()].push_back(items_.size());
     items_.push_back(std::move(item));
     return std::nullopt;
 }
@@ -101,7 +128,7 @@ std::optional<std::string> BuildAssumptions::addMeaning(std::string_view line) {
     const std::optional<Item> example = meaningOf(name, "A");
     DirectiveReader exampleReader(*example->line);
     Directive read{};
-    if (readLine(exampleReader, *example->line, read) && isCondition(read))
+    if (readLine(exampleReader, *example->line, read) && lines_->isCondition(read))
         return std::nullopt;
     meanings_.erase(name);
     return "does not define a condition that #if can have";
@@ -142,10 +169,10 @@ bool BuildAssumptions::canHold() const {
     std::vector<SymbolicExprId> all;
     if (items_.empty() || items_.size() > limits::assumptionsTogether)
         return true;
-    for (const Item& item : items_) {
+    for (const std::shared_ptr<const Item>& item : items_) {
         Directive directive{};
         directive.kind = DirectiveKind::If;
-        const std::vector<DirectiveToken> tokens = tokensOf(item);
+        const std::vector<DirectiveToken> tokens = tokensOf(*item);
         directive.tokens = tokens;
         all.push_back(reader.read(directive).node);
     }
@@ -187,12 +214,13 @@ std::vector<std::size_t> BuildAssumptions::relatedTo(const std::set<std::string_
     std::ranges::for_each(names, addAbout);
     std::size_t next = 0;
     while (next < found.size()) // which grows
-        std::ranges::for_each(items_[found[next++]].names, addAbout);
+        std::ranges::for_each(items_[found[next++]]->names, addAbout);
     return found;
 }
 
 bool BuildAssumptions::isClosed(std::string_view name) const {
-    return std::ranges::any_of(closed_, [&](const std::string& prefix) { return name.starts_with(prefix); });
+    return std::ranges::any_of(
+        closed_, [&](const std::string& prefix) { return name.size() > prefix.size() && name.starts_with(prefix); });
 }
 
 bool BuildAssumptions::isSettled(std::string_view name) const {
@@ -203,7 +231,7 @@ bool BuildAssumptions::isLogical(std::string_view name) const {
     const auto about = byFirst_.find(name);
     const std::string is = std::string(name) + " == 1";
     return about != byFirst_.end() && std::ranges::any_of(about->second, [&](std::size_t item) {
-               const std::string_view line = std::string_view(*items_[item].line).substr(4);
+               const std::string_view line = std::string_view(*items_[item]->line).substr(4);
                return line.starts_with(is) || line.starts_with("!defined(" + std::string(name) + ") || " + is);
            });
 }

@@ -1,10 +1,10 @@
 // Conditions that are assumed of every build.
 //
 // A line is a condition as #if has them, or one of these:
-//   #define F(x) body      what a call of F with one name means where code asks for it: `x##_A` is the name with a
-//   suffix #pragma closed PREFIX  macros of this prefix are settled before a file begins, and those that no line names
-//   are not
-//                          defined
+//   #define F(x) body      what a call of F with one name means where code asks for it:
+//                          `x##_A` is the name with a suffix
+//   #pragma closed PREFIX  macros that begin with it, and are longer, are settled before a file
+//                          begins, and those that no line names are not defined
 //   #pragma open NAME      but for this one, which sources define themselves
 #pragma once
 
@@ -22,7 +22,8 @@
 
 namespace VT {
 
-/// Conditions that hold in every build, found by the macros that they name.
+/// Conditions that hold in every build, found by the macros that they name.  Copies share the lines that both have, and
+/// are added to by one thread at a time.
 class BuildAssumptions {
 public:
     struct Item {
@@ -50,7 +51,7 @@ public:
     /// Whether some text may have a macro that is settled; true where no prefix is closed.
     [[nodiscard]] bool mayConcern(std::string_view text) const;
 
-    [[nodiscard]] const Item& operator[](std::size_t at) const { return items_[at]; }
+    [[nodiscard]] const Item& operator[](std::size_t at) const { return *items_[at]; }
 
     /// Returns the positions of assumptions that share a macro with the names, then those that share one with these,
     /// limits::relatedAssumptions at most.
@@ -81,20 +82,20 @@ private:
         std::vector<DirectiveToken> body;
     };
 
-    struct Check;
+    struct Lines;
 
+    static std::shared_ptr<Lines> newLines();
     [[nodiscard]] bool isClosed(std::string_view name) const;
-    bool isCondition(const Directive& directive);
     std::optional<std::string> addMeaning(std::string_view line);
     std::optional<std::string> addPragma(std::string_view line);
 
-    std::vector<Item> items_;
+    std::vector<std::shared_ptr<const Item>> items_;
     std::unordered_map<std::string_view, std::vector<std::size_t>> byName_;
     std::unordered_map<std::string_view, std::vector<std::size_t>> byFirst_;
     std::vector<std::string> closed_; ///< prefixes
     std::set<std::string, std::less<>> open_;
     std::map<std::string, Meaning, std::less<>> meanings_;
-    std::shared_ptr<Check> check_; ///< of lines that are added
+    std::shared_ptr<Lines> lines_ = newLines(); ///< that were read, of all copies
 };
 
 /// The assumptions in one file: about macros that the file did not change, wherever they are read.

@@ -11,12 +11,17 @@ from .bounds import UNKNOWN
 from .library import kconfiglib
 
 
+#: Architectures whose files are in the folder of another one.
+FOLDERS = {"i386": "x86", "x86_64": "x86", "sparc32": "sparc", "sparc64": "sparc", "parisc64": "parisc"}
+
+
 def read(kconfig: Path, arch: Optional[str] = None) -> Any:
     """Reads a Kconfig file as a build for an architecture does.  No command of the shell is run."""
     if arch is not None:
-        for name, value in {"ARCH": arch, "SRCARCH": arch, "SUBARCH": arch, "HEADER_ARCH": arch}.items():
-            os.environ.setdefault(name, value)
-        os.environ["ARCH"] = os.environ["SRCARCH"] = arch
+        folder = FOLDERS.get(arch, arch)
+        for name in ("SUBARCH", "HEADER_ARCH"):
+            os.environ.setdefault(name, folder)
+        os.environ.update(ARCH=arch, SRCARCH=folder)
         if arch == "um":
             os.environ["SUBARCH"] = os.environ["HEADER_ARCH"] = "x86"
     os.environ.setdefault("srctree", str(kconfig.parent))

@@ -4,6 +4,7 @@
 #include "tools/vtsym/findings/Findings.hpp"
 #include "tools/vtsym/findings/ModelCheck.hpp"
 #include "tools/vtsym/findings/ModelPage.hpp"
+#include "tools/vtsym/findings/ModelRemovals.hpp"
 #include "tools/vtsym/io/CommandLine.hpp"
 #include "tools/vtsym/io/Files.hpp"
 #include "tools/vtsym/io/InOrder.hpp"
@@ -70,31 +71,6 @@ void writePage(const std::string& path, const std::string& page, FindingWriter& 
     }
 }
 
-/// The blocks that a port is joined to, and all blocks around them.
-std::unordered_set<const VTBlock*> joinedBlocks(const VTRootBD& model) {
-    std::unordered_set<const VTBlock*> joined;
-    const auto add = [&](const VTBlock* block) {
-        while (block != nullptr && joined.insert(block).second)
-            block = block->parent();
-    };
-    for (const vtPort& port : model.ports()) {
-        add(&port.source());
-        std::ranges::for_each(port.destinations(), add);
-    }
-    return joined;
-}
-
-/// The dead choices of a set that can be removed: no port is joined to them, and another choice is left.
-std::vector<Removal> removalsOf(const ModelCheck::ChoiceSet& set, const std::unordered_set<const VTBlock*>& joined) {
-    std::vector<Removal> removals;
-    for (const VT::ChoiceFinding& finding : set.report.findings) {
-        const VTBlock& choice = *set.block->choices()[finding.choice];
-        if (finding.fault == VT::ChoiceFault::Dead && !joined.contains(&choice))
-            removals.push_back({choice.textRange().begin, choice.textRange().end});
-    }
-    return removals.size() < set.block->choices().size() ? removals : std::vector<Removal>();
-}
-
 /// Writes the model without redundant operands and dead choices.
 void fix(const std::string& path, const std::string& text, const VTRootBD& model, const ModelCheck& check,
          FindingWriter& writer) {
@@ -109,8 +85,8 @@ void fix(const std::string& path, const std::string& text, const VTRootBD& model
     collect(check.otherFindings());
     for (const ModelCheck::ChoiceSet& set : check.choiceSets()) {
         collect(set.findings);
-        const std::vector<Removal> ofSet = removalsOf(set, joined);
-        removals.insert(removals.end(), ofSet.begin(), ofSet.end());
+        for (const RemovableChoice& choice : removableChoices(set, joined, text))
+            removals.push_back(choice.removal);
     }
     if (!fixes.empty() || !removals.empty())
         try {

@@ -1,7 +1,7 @@
 // vtsym lsp: a language server on standard input and output.
 //
 // What has arrived is read before it is answered, and diagnostics wait until nothing more has arrived: so cancellations
-// are seen, and of several keys the last one counts.
+// are seen, and of several keys the last one counts.  What arrives while a source is scanned may end that scan.
 #include "tools/vtsym/commands/Commands.hpp"
 #include "tools/vtsym/lsp/LanguageServer.hpp"
 #include "tools/vtsym/lsp/MessageFraming.hpp"
@@ -9,6 +9,7 @@
 
 #include <array>
 #include <cerrno>
+#include <functional>
 #include <poll.h>
 #include <system_error>
 #include <unistd.h>
@@ -62,12 +63,15 @@ private:
 };
 
 bool serve(Console& console) {
-    LanguageServer server([&console](const std::string& message) {
-        console.out(framed(message));
-        console.flush();
-    });
     FrameReader frames;
     const auto input = std::make_unique<Input>();
+    std::function<void()> takeAll;
+    LanguageServer server(
+        [&console](const std::string& message) {
+            console.out(framed(message));
+            console.flush();
+        },
+        [&takeAll] { takeAll(); });
     const auto take = [&] {
         while (server.waiting() < mostWaiting) {
             const std::optional<ReceivedFrame> frame = frames.next();
@@ -79,10 +83,13 @@ bool serve(Console& console) {
                 server.receive(frame->text);
         }
     };
-    while (!server.hasEnded()) {
+    takeAll = [&] {
         take();
         while (server.waiting() < mostWaiting && input->read(frames, false))
             take();
+    };
+    while (!server.hasEnded()) {
+        takeAll();
         if (server.waiting() > 0)
             server.handleNext();
         else if (!server.publishNext() && !input->read(frames, true))

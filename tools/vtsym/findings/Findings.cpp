@@ -313,14 +313,6 @@ std::string fixed(const std::string& text, std::vector<Fix> fixes, std::vector<R
         const bool isFixed = fix != fixes.end() && line == fix->region.line && column >= fix->region.column;
         if (isFixed && begins && column == fix->region.column)
             result.append(fix->text);
-        if (isRemoved && i == removal->begin) {
-            const std::size_t after = text.find_first_not_of(" \t\r\n", removal->end);
-            if (after != std::string::npos && text[after] == ',')
-                removal->end = after + 1;
-            else if (const std::size_t before = result.find_last_not_of(" \t\r\n"); // the last element of the list
-                     before != std::string::npos && result[before] == ',')
-                result.resize(before);
-        }
         if (!isRemoved && !isFixed)
             result.push_back(text[i]);
         if (text[i] == '\n') {

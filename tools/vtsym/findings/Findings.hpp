@@ -78,14 +78,14 @@ struct Finding {
 /// The message with its reasons.
 std::string sentenceOf(const Finding& finding);
 
-/// Bytes of a text that holds JSON: an element of a list, from `begin` to before `end`.
+/// Bytes of a text that are taken out, from `begin` to before `end`.
 struct Removal {
     std::size_t begin;
     std::size_t end;
 };
 
-/// Returns a text with fixes of regions in it that do not overlap, each on one line, and without some elements of JSON
-/// lists, each with the comma that separates it from another one.  Linear in the text, plus sorting.
+/// Returns a text with fixes of regions in it that do not overlap, each on one line, and without some of its bytes.
+/// Linear in the text, plus sorting.
 std::string fixed(const std::string& text, std::vector<Fix> fixes, std::vector<Removal> removals);
 
 enum class FindingForm : std::uint8_t { Compiler, Json, Sarif };

@@ -121,7 +121,7 @@ Json actionsFor(const OpenDocument& document, std::size_t begin, std::size_t end
             continue;
         if (actions.size() == mostDiagnostics)
             break;
-        actions.push_back({{"title", "Write '" + mark.proposed + "'"},
+        actions.push_back({{"title", mark.action},
                            {"kind", "quickfix"},
                            {"isPreferred", true},
                            {"diagnostics", Json::array({diagnosticOf(document, mark, abilities)})},

@@ -32,15 +32,17 @@ void LanguageServer::receiveFault(const std::string& sentence) {
     send_(rpcError(nullptr, RpcError::ParseError, sentence));
 }
 
-/// Answers a request that still waits; one that was answered stays so.
+/// Answers a request that still waits, and leaves the one that is worked on; one that was answered stays so.
 void LanguageServer::cancel(const Json& params) {
     const Json* const id = memberAt(params, "id");
+    isCancelled_ = isCancelled_ || (id != nullptr && !id->is_null() && *id == answered_);
     const auto request = id == nullptr ? waiting_.end() : std::ranges::find(waiting_, *id, &RpcMessage::id);
     if (request == waiting_.end() || !request->isRequest() || request->method == "initialize" ||
         request->method == "shutdown")
         return;
     send_(rpcError(request->id, RpcError::RequestCancelled, "the request was cancelled"));
     waiting_.erase(request);
+    seen_ = 0;
 }
 
 void LanguageServer::handleNext() {
@@ -92,6 +94,7 @@ Json LanguageServer::answer(const RpcMessage& message) {
 
 void LanguageServer::handleRequest(const RpcMessage& message) {
     std::string response;
+    answered_ = message.id;
     try {
         response = rpcResult(message.id, answer(message));
     } catch (const RpcFault& fault) {
@@ -99,6 +102,8 @@ void LanguageServer::handleRequest(const RpcMessage& message) {
     } catch (const std::exception& error) {
         response = rpcError(message.id, RpcError::InternalError, error.what());
     }
+    answered_ = nullptr;
+    isCancelled_ = false;
     send_(response);
 }
 
@@ -122,17 +127,41 @@ void LanguageServer::log(const std::string& sentence) {
     send_(rpcNotification("window/logMessage", {{"type", 2}, {"message", sentence}}));
 }
 
-void LanguageServer::analyse(OpenDocument& document) {
-    if (!document.analysis)
-        document.analysis = projectOf(document.uri).analyse(document);
+/// Takes what has arrived, and throws where the work on a document is of no use any more: it is cancelled, or what was
+/// found would be that of an earlier text.
+void LanguageServer::leaveFor(const OpenDocument& document) {
+    if (!arrive_)
+        return;
+    arrive_();
+    if (isCancelled_)
+        throw RpcFault(RpcError::RequestCancelled, "the request was cancelled");
+    for (; seen_ < waiting_.size(); ++seen_) {
+        const RpcMessage& message = waiting_[seen_];
+        const bool isOfText = message.method == "textDocument/didChange" || message.method == "textDocument/didClose" ||
+                              message.method == "textDocument/didOpen";
+        const Json* const uri = isOfText ? memberAt(message.params, "textDocument/uri") : nullptr;
+        if (message.method == "exit" || message.method == "shutdown" || (uri != nullptr && *uri == document.uri))
+            throw RpcFault(RpcError::ContentModified, "the document was changed while it was read");
+    }
 }
 
+void LanguageServer::analyse(OpenDocument& document) {
+    if (document.analysis)
+        return;
+    seen_ = 0;
+    document.analysis = projectOf(document.uri).analyse(document, [this, &document] { leaveFor(document); });
+}
+
+/// Sends diagnostics, unless the document is left for what arrived.
 void LanguageServer::publish(OpenDocument& document) {
     document.isSent = true; // what fails once is not tried again
     std::string message;
     try {
         analyse(document);
         message = rpcNotification("textDocument/publishDiagnostics", diagnosticsOf(document, abilities_));
+    } catch (const RpcFault&) {
+        document.isSent = false;
+        return;
     } catch (const std::exception& error) {
         message = rpcNotification("window/logMessage", {{"type", 2}, {"message", document.uri + ": " + error.what()}});
     }

@@ -17,13 +17,17 @@ namespace vtsym {
 
 /// Answers messages one by one.  Messages wait until handleNext(), so that a cancellation, which is taken at once,
 /// finds the request that it is about.  Diagnostics are made by publishNext(), so that a caller who has further
-/// messages can hand over those first: of several changes, the last one counts.
+/// messages can hand over those first: of several changes, the last one counts.  A document that takes long is left
+/// where a change of it, its end, or a cancellation arrives meanwhile.
 class LanguageServer {
 public:
     /// Receives each message to the client, without its frame.
     using Send = std::function<void(const std::string& message)>;
 
-    explicit LanguageServer(Send send) : send_(std::move(send)) {}
+    /// Hands over, with receive(), what has arrived since; called from time to time while a document is read.
+    using Arrive = std::function<void()>;
+
+    explicit LanguageServer(Send send, Arrive arrive = {}) : send_(std::move(send)), arrive_(std::move(arrive)) {}
 
     /// Takes a message of the client, or what is wrong with the stream.
     void receive(std::string_view message);
@@ -33,7 +37,7 @@ public:
 
     /// Handles the message that has waited longest.
     void handleNext();
-    /// Sends the diagnostics of a document that changed; false where there is none.
+    /// Sends the diagnostics of a document that changed, or leaves it for what arrived; false where there is none.
     bool publishNext();
 
     /// Whether the client said goodbye, and whether it did so in order.
@@ -55,6 +59,7 @@ private:
     void cancel(const Json& params);
     void log(const std::string& sentence);
     void publish(OpenDocument& document);
+    void leaveFor(const OpenDocument& document);
 
     Json initialize(const Json& params);
     Json shutDown(const Json& params);
@@ -78,6 +83,10 @@ private:
     void analyse(OpenDocument& document);
 
     Send send_;
+    Arrive arrive_;
+    Json answered_ = nullptr;  ///< the request that is worked on; null for none
+    bool isCancelled_ = false; ///< it is
+    std::size_t seen_ = 0;     ///< messages, of those that wait, that do not concern the document that is read
     State state_ = State::Fresh;
     bool wasShutDown_ = false;
     EditorAbilities abilities_;

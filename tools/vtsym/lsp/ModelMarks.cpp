@@ -1,6 +1,6 @@
 // Checks models for an editor.  A text that is not a model, which it mostly is while it is typed, is one error at the
 // place where reading ended.  Costs mostModelSteps at most.
-#include "tools/vtsym/findings/ModelCheck.hpp"
+#include "tools/vtsym/findings/ModelRemovals.hpp"
 #include "tools/vtsym/lsp/ServerBounds.hpp"
 #include "tools/vtsym/lsp/SourceMarks.hpp"
 
@@ -30,7 +30,7 @@ public:
         if (finding.fix) {
             const DocumentMark place = at(finding.fix->region);
             mark.edit = VT::SourceEdit{place.begin, place.end, finding.fix->text};
-            mark.proposed = finding.proposed.value_or("");
+            mark.action = "Write '" + finding.proposed.value_or("") + "'";
         }
         marks_.push_back(std::move(mark));
     }
@@ -53,6 +53,18 @@ public:
         }
     }
 
+    /// Adds an edit to the mark of a finding.
+    void propose(const Finding& finding, const std::string& action, VT::SourceEdit edit) {
+        const DocumentMark place = at(finding.place);
+        const auto mark = std::ranges::find_if(marks_, [&](const DocumentMark& each) {
+            return each.begin == place.begin && each.sentence == finding.message;
+        });
+        if (mark == marks_.end())
+            return;
+        mark->action = action;
+        mark->edit = std::move(edit);
+    }
+
     std::vector<DocumentMark> take() { return std::move(marks_); }
 
 private:
@@ -69,6 +81,14 @@ private:
     std::vector<DocumentMark> marks_;
 };
 
+/// Proposes to remove the dead choices that `vtsym check --fix` removes.
+void proposeRemovals(const ModelCheck& check, const VTRootBD& model, const std::string& text, MarkListener& listener) {
+    const auto joined = joinedBlocks(model);
+    for (const ModelCheck::ChoiceSet& set : check.choiceSets())
+        for (const auto& [finding, removal] : removableChoices(set, joined, text))
+            listener.propose(set.findings[finding], "Remove the dead choice", {removal.begin, removal.end, ""});
+}
+
 } // namespace
 
 DocumentAnalysis analyseModel(const OpenDocument& document) {
@@ -78,7 +98,9 @@ DocumentAnalysis analyseModel(const OpenDocument& document) {
         VT::Embedded::readModel(document.text.text(), model);
         ModelCheckOptions options;
         options.steps = mostModelSteps;
-        ModelCheck(model, document.path, options).run(listener);
+        ModelCheck check(model, document.path, options);
+        check.run(listener);
+        proposeRemovals(check, model, document.text.text(), listener);
     } catch (const VT::Embedded::ModelError& error) {
         listener.problem({document.path, error.place().line, error.place().column, 0, error.place().endColumn, {}},
                          error.what());

@@ -39,7 +39,7 @@ struct DocumentMark {
     std::string explanation{}; ///< the sentence, with the operands that force the finding
     std::vector<MarkPlace> related{};
     std::optional<VT::SourceEdit> edit{};
-    std::string proposed{};                              ///< what the edit writes, for a title
+    std::string action{};                                ///< what the edit does, for a title
     std::uint32_t region = VT::ConditionalRegions::none; ///< the branch that it is about
     bool isUnbuilt = false;                              ///< no build has what is marked
 };

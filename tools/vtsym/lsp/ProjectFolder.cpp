@@ -90,7 +90,7 @@ bool ProjectFolder::refresh() {
     return true;
 }
 
-DocumentAnalysis ProjectFolder::analyse(const OpenDocument& document) {
+DocumentAnalysis ProjectFolder::analyse(const OpenDocument& document, const std::function<void()>& ask) {
     enter();
     if (document.kind == DocumentKind::Json)
         return isModelText(document.text.text()) ? analyseModel(document)
@@ -98,6 +98,7 @@ DocumentAnalysis ProjectFolder::analyse(const OpenDocument& document) {
     if (document.kind == DocumentKind::Other || isExcluded(document.path, settings_.excluded))
         return {VT::ConditionalRegions({}), {}};
     const auto now = today();
+    checker_->beforeEachCondition(ask);
     return analyseSource(*checker_, document, [&](const Finding& finding) {
         return baseline_.covers(finding, now, std::numeric_limits<std::size_t>::max());
     });

@@ -31,8 +31,9 @@ public:
     /// A path in the folder as `vtsym scan` has it; any other as it is.
     [[nodiscard]] std::string relative(const std::string& path) const;
 
-    /// Finds what is to be shown of a document.
-    DocumentAnalysis analyse(const OpenDocument& document);
+    /// Finds what is to be shown of a document.  What `ask` throws, which is called before each condition of a source,
+    /// ends that.
+    DocumentAnalysis analyse(const OpenDocument& document, const std::function<void()>& ask);
 
     /// Reads the settings anew where one of their files changed; returns whether one did.
     bool refresh();

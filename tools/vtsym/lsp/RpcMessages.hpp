@@ -20,6 +20,7 @@ enum class RpcError : int {
     InternalError = -32603,
     ServerNotInitialized = -32002,
     RequestCancelled = -32800,
+    ContentModified = -32801,
 };
 
 /// A message that cannot be answered.

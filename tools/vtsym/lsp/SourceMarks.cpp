@@ -37,7 +37,7 @@ DocumentMark markOf(const OpenDocument& document, const VT::ConditionalRegions& 
             mark.related.push_back(placeOf(document, related));
     mark.region = regions.onLine(place.line);
     if (found.edit && finding.proposed)
-        mark.proposed = *finding.proposed;
+        mark.action = "Write '" + *finding.proposed + "'";
     mark.edit = std::move(found.edit);
     return mark;
 }

@@ -35,7 +35,7 @@ std::string hexadecimal(std::uint64_t value) {
 
 void addFingerprints(std::vector<Finding>& findings) {
     std::map<std::uint64_t, std::uint64_t> times;
-    for (Finding& finding : findings) {
+    const auto number = [&](Finding& finding) {
         Hash content;
         content.add(finding.place.file);
         content.add(finding.kind);
@@ -46,7 +46,17 @@ void addFingerprints(std::vector<Finding>& findings) {
         Hash numbered = content;
         numbered.add(std::to_string(++times[content.value()]));
         finding.fingerprint = hexadecimal(numbered.value());
-    }
+    };
+    // What holds in some configurations alone comes last: a scan that leaves it out numbers the others alike.
+    const auto isPartial = [](const Finding& finding) {
+        return finding.configurations.size() != finding.ofConfigurations;
+    };
+    for (Finding& finding : findings)
+        if (!isPartial(finding))
+            number(finding);
+    for (Finding& finding : findings)
+        if (isPartial(finding))
+            number(finding);
 }
 
 } // namespace vtsym

@@ -71,13 +71,10 @@ std::string reasonsText(const VT::BranchFinding& found) {
     return found.hasOtherReasons ? text + " or for other reasons" : text;
 }
 
-/// Whether a finding is what the definitions of a build decide, as they are meant to.  Among alternatives, which hold
-/// conditions, only definitions that are its reasons count.
-bool isDecidedByBuild(const VT::BranchFinding& found, bool hasAlternatives) {
-    return found.cause == VT::BranchCause::Configuration && !found.configurations.empty() &&
-           (!hasAlternatives || std::ranges::any_of(found.reasons, [](const VT::BranchReason& reason) {
-               return reason.kind == VT::BranchReasonKind::Build;
-           }));
+/// Whether a finding is what the definitions of a build decide, as they are meant to, and not conditions alone that are
+/// assumed.
+bool isDecidedByBuild(const VT::BranchFinding& found) {
+    return found.cause == VT::BranchCause::Configuration && found.needsDefinitions;
 }
 
 /// The settings of "A=y, B=n, C=m" that are not n.
@@ -142,13 +139,12 @@ std::optional<std::string_view> findingCause(std::string_view text) {
     return known == causes.end() ? std::nullopt : std::optional(*known);
 }
 
-Finding findingOf(const std::string& file, const VT::BranchFinding& found, std::size_t configurations,
-                  bool hasAlternatives) {
+Finding findingOf(const std::string& file, const VT::BranchFinding& found, std::size_t configurations) {
     const FindingRule& rule = rules.at(static_cast<std::size_t>(found.kind));
     Finding finding;
     finding.place = placeOf(file, found.region);
     finding.kind = rule.kind;
-    finding.level = isDecidedByBuild(found, hasAlternatives) ? FindingLevel::Note : rule.level;
+    finding.level = isDecidedByBuild(found) ? FindingLevel::Note : rule.level;
     finding.message = messageOf(found);
     finding.condition = found.condition;
     finding.because = found.because;

@@ -21,10 +21,9 @@ const FindingRule* scanRule(std::string_view kind);
 /// The program's own text of a cause, as findings have it; nothing for an unknown one.
 std::optional<std::string_view> findingCause(std::string_view text);
 
-/// Returns a finding of the scanner in a file that is built in so many configurations, which may be alternatives of
-/// assumptions.  It is a note where it holds in some of them alone, or where what the build defines decides it.
-Finding findingOf(const std::string& file, const VT::BranchFinding& found, std::size_t configurations,
-                  bool hasAlternatives);
+/// Returns a finding of the scanner in a file that is built in so many configurations.  It is a note where it holds in
+/// some of them alone, or where what the build defines decides it.
+Finding findingOf(const std::string& file, const VT::BranchFinding& found, std::size_t configurations);
 
 /// The findings about a suppression: what is wrong with it, or that nothing is found where it is.
 Finding malformedSuppression(const std::string& file, const VT::Suppression& suppression, const std::string& problem);

@@ -68,11 +68,9 @@ SourceChecker::SourceChecker(const ScanSettings& settings, const CompileCommands
 
 SourceChecker::SourceChecker(const SourceChecker& other)
     : settings_(other.settings_),
-      scanner_({.strictIncludes = settings_.strictIncludes, .why = settings_.why}),
+      scanner_(other.scanner_),
       kinds_(other.kinds_),
-      build_(other.build_) {
-    assume();
-}
+      build_(other.build_) {}
 
 void SourceChecker::assume() {
     for (const std::string& condition : settings_.assumptions)
@@ -176,9 +174,11 @@ std::vector<FileFinding> SourceChecker::check(const std::string& path, std::stri
         edits.push_back(std::move(edit));
         isKept.push_back(isReported && isAsked(findings.back()));
     };
+    // What holds in some configurations alone is a note, which only a suppression may need besides.
+    scanner_.reportCommonOnly(settings_.severity > FindingLevel::Note && suppressions.empty());
     const std::uint64_t undecidedBefore = scanner_.counts().undecided;
     scanner_.scan(file, [&](const VT::BranchFinding& found) {
-        Finding finding = findingOf(path, found, configurations, alternatives != 0);
+        Finding finding = findingOf(path, found, configurations);
         if (alternatives != 0)
             for (const std::size_t configuration : found.configurations)
                 finding.configurationNames.push_back(settings_.configurations[configuration % alternatives].name);

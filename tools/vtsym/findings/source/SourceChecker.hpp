@@ -6,6 +6,7 @@
 #include "tools/vtsym/findings/source/CompileCommands.hpp"
 #include "tools/vtsym/findings/source/ScanSettings.hpp"
 
+#include <functional>
 #include <memory>
 #include <optional>
 #include <string>
@@ -47,6 +48,9 @@ public:
 
     /// The same, with what it took.
     CheckedFile checkAndCount(const std::string& path, std::string_view text);
+
+    /// Asks before each condition of a file: what `ask` throws ends the check.
+    void beforeEachCondition(std::function<void()> ask) { scanner_.beforeEachCondition(std::move(ask)); }
 
     /// A hash of all files that were read of the build.
     [[nodiscard]] ContentKey buildKey() const noexcept { return build_->files.key(); }
