@@ -54,6 +54,11 @@ struct QuillFailure {
     std::string_view reason;  ///< a sentence for the author of the text; empty without a failure; has static lifetime
 };
 
+/// A second base of parsers whose trees of names, numbers, calls of names, fields of names, parentheses and operators
+/// other than powers, transposes and ranges are those of the language.  The library then reads texts of nothing else by
+/// itself, and asks for no tree.  All parsers of a host have this base, or none.
+class ReadsOrdinaryQuill {};
+
 } // namespace VT
 
 /// A parser of Quill expressions.  It may be used for any number of texts, by one thread at a time.

@@ -1,9 +1,11 @@
 // Reads ordinary conditions in one pass, and interns them in a second one over their parts.
 //
 // Method: operator precedence with explicit stacks (Floyd, "Syntactic analysis and operator precedence", 1963).  The
-// parts of an operand are linked in the order of interning, right operands first; joining two operands sets three
-// links. A text is interned once all of it is read. Cost: linear in the text. Relies on: the operator table for
-// spellings and strengths; the condition grammar for all that is given up.
+// parts of an operand are linked in the order of interning; joining two operands sets three links.  A text is interned
+// once all of it is read.
+// Cost: linear in the text.
+// Relies on: the operator table for spellings and strengths, the NUL after a text, which ends every look ahead; the
+// grammar of each language for all that is given up.
 #include "parser/QuickReader.hpp"
 
 #include "base/core/Limits.hpp"
@@ -11,69 +13,25 @@
 #include "base/core/Nodes.hpp"
 #include "base/variants/VariantKeywords.hpp"
 #include "host/Numbers.hpp"
+#include "parser/QuickSpellings.hpp"
 
-#include <array>
+#include <cmath>
 #include <limits>
 
 namespace VT::Parser {
 
 namespace {
 
-constexpr std::uint8_t letterClass = 1;
-constexpr std::uint8_t digitClass = 2;
-constexpr std::uint8_t blankClass = 4;
-
-constexpr auto byteClasses = [] {
-    std::array<std::uint8_t, 256> classes{};
-    for (unsigned c = 'a'; c <= 'z'; ++c)
-        classes[c] = classes[c - 'a' + 'A'] = letterClass;
-    classes['_'] = letterClass;
-    for (unsigned c = '0'; c <= '9'; ++c)
-        classes[c] = digitClass;
-    for (const char c : {' ', '\t', '\n', '\v', '\f', '\r'})
-        classes[static_cast<unsigned char>(c)] = blankClass;
-    return classes;
-}();
-
-bool isOf(char c, unsigned classes) {
-    return (byteClasses[static_cast<unsigned char>(c)] & classes) != 0;
-}
-
-/// The infix operators that begin with a byte: alone, and with a second byte.
-struct Beginning {
-    static constexpr std::size_t most = 2;
-
-    SymbolicOp alone = SymbolicOp::None;
-    std::array<char, most> seconds{};
-    std::array<SymbolicOp, most> pairs{SymbolicOp::None, SymbolicOp::None};
-};
-
-constexpr auto beginnings = [] {
-    std::array<Beginning, 128> all{};
-    for (const OperatorInfo& row : operatorTable()) {
-        if (!conditionInfixOps.contains(row.op))
-            continue;
-        Beginning& beginning = all[static_cast<unsigned char>(row.c[0])];
-        if (row.c.size() == 1) {
-            beginning.alone = row.op;
-            continue;
-        }
-        const std::size_t place = beginning.seconds[0] == '\0' ? 0 : 1;
-        beginning.seconds.at(place) = row.c[1];
-        beginning.pairs.at(place) = row.op;
-    }
-    return all;
-}();
-
 constexpr std::uint32_t noItem = std::numeric_limits<std::uint32_t>::max();
 
 } // namespace
 
 SymbolicExprId QuickReader::read(std::string_view text) {
-    if (text.size() >= noItem)
+    constexpr std::size_t most = std::numeric_limits<std::int32_t>::max();
+    if (text.size() > most)
         return invalidId;
     text_ = text;
-    at_ = 0;
+    at_ = text.data();
     brackets_ = 0;
     operandIsNext_ = true;
     items_.clear();
@@ -90,7 +48,7 @@ bool QuickReader::readAll() {
             continue;
         }
         skipBlanks();
-        if (at_ == text_.size()) {
+        if (at_ == text_.data() + text_.size()) {
             foldUpTo(std::numeric_limits<unsigned>::max());
             return waiting_.empty();
         }
@@ -102,27 +60,26 @@ bool QuickReader::readAll() {
 bool QuickReader::readOperand() {
     if (!readPrefixes())
         return false;
-    const char c = peek();
-    if (isOf(c, letterClass))
+    if (isOf(*at_, letterClass))
         return readName();
-    if (c != '(')
+    if (*at_ != '(')
         return readNumber();
-    const std::string_view rest = text_.substr(at_);
-    if (options_.variantKeywords && (rest.starts_with(VariantKeywords::getSimVariantKeyword()) ||
-                                     rest.starts_with(VariantKeywords::getCodegenVariantKeyword())))
-        return false;
-    return openBracket(Wait::Parenthesis, noItem);
+    return !startsKeyword() && openBracket(Wait::Parenthesis, noItem);
 }
 
-/// Reads prefix operators.  A sign directly before a number belongs to the number.
+/// Reads prefix operators.  In C a sign directly before a number belongs to the number.
 bool QuickReader::readPrefixes() {
     for (std::size_t prefixes = 0;; ++prefixes) {
         skipBlanks();
-        const char c = peek();
+        const char c = *at_;
         const bool isSign = c == '-' || c == '+';
-        if (!(isSign ? !isDigitAt(peek(1) == '.' ? 2 : 1) : c == '!' || c == '~'))
+        if (isSign) {
+            if (!isQuill_ && isOf(at_[at_[1] == '.' ? 2 : 1], digitClass))
+                return true;
+        } else if (c != '!' && c != '~') {
             return true;
-        if (prefixes == limits::nesting)
+        }
+        if (prefixes == limits::nesting || (isQuill_ && !isSign && at_[1] == '='))
             return false;
         ++at_;
         if (c == '+')
@@ -135,22 +92,29 @@ bool QuickReader::readPrefixes() {
 }
 
 bool QuickReader::readName() {
-    const auto addWord = [&] {
-        const std::string_view name = word();
-        skipBlanks();
+    const auto addName = [&](std::string_view name) {
         return add(Part::Name, SymbolicOp::String, static_cast<std::uint32_t>(name.data() - text_.data()),
                    static_cast<std::uint32_t>(name.size()));
     };
-    const std::uint32_t name = addWord();
-    if (peek() == '(')
+    const std::string_view first = word();
+    const bool blank = skipBlanks();
+    const bool isCalled = *at_ == '(';
+    if (isQuill_ && (isQuillWord(first, isCalled) || (isCalled && blank && startsKeyword())))
+        return false;
+    const std::uint32_t name = addName(first);
+    if (isCalled)
         return openBracket(Wait::Call, name);
     Operand operand{name, name};
-    while (peek() == '.') {
+    while (*at_ == '.') {
         ++at_;
         skipBlanks();
-        if (!isOf(peek(), letterClass))
+        if (!isOf(*at_, letterClass))
             return false;
-        const std::uint32_t member = addWord();
+        const std::string_view field = word();
+        skipBlanks();
+        if (isQuill_ && isQuillWord(field, false))
+            return false;
+        const std::uint32_t member = addName(field);
         const std::uint32_t whole = add(Part::Operator, SymbolicOp::MemberValue);
         items_[operand.root].next = member;
         items_[member].next = whole;
@@ -161,16 +125,16 @@ bool QuickReader::readName() {
 
 /// Reads a number with its sign.
 bool QuickReader::readNumber() {
-    const std::size_t start = at_;
-    const bool isNegative = peek() == '-';
-    if (isNegative || peek() == '+')
+    const char* const start = at_;
+    const bool isNegative = *at_ == '-';
+    if (isNegative || *at_ == '+')
         ++at_;
     constexpr std::uint64_t bound = std::uint64_t{1} << 31U;
-    const std::size_t digits = at_;
+    const char* const digits = at_;
     std::uint64_t value = 0;
-    for (; isOf(peek(), digitClass) && value <= bound; ++at_)
-        value = value * 10 + static_cast<std::uint64_t>(peek() - '0');
-    if (at_ == digits || peek() == '.' || isOf(peek(), letterClass | digitClass) ||
+    for (; isOf(*at_, digitClass) && value <= bound; ++at_)
+        value = value * 10 + static_cast<std::uint64_t>(*at_ - '0');
+    if (at_ == digits || *at_ == '.' || isOf(*at_, letterClass | digitClass) ||
         value > bound - (isNegative ? 0U : 1U)) {
         at_ = start; // a real, a number that is too large, or no operand
         return readReal();
@@ -180,36 +144,42 @@ bool QuickReader::readNumber() {
     return endOperand({number, number});
 }
 
+/// Reads a real number with a decimal point.  In Quill digits follow the point, which else may begin an operator, and
+/// integral values are left to the grammar, because they become integers.
 bool QuickReader::readReal() {
-    if (peek() == '+')
+    if (*at_ == '+')
         ++at_; // the number without it is the same
-    const std::size_t start = at_;
-    if (peek() == '-')
+    const char* const start = at_;
+    if (*at_ == '-')
         ++at_;
     const auto skipDigits = [&] {
-        const std::size_t first = at_;
-        while (isOf(peek(), digitClass))
+        const char* const first = at_;
+        while (isOf(*at_, digitClass))
             ++at_;
         return at_ - first;
     };
-    const std::size_t whole = skipDigits();
-    if (peek() != '.')
+    const auto whole = skipDigits();
+    if (*at_ != '.')
         return false;
     ++at_;
-    if (whole + skipDigits() == 0)
+    const auto decimals = skipDigits();
+    if ((isQuill_ ? 0 : whole) + decimals == 0)
         return false;
-    if (peek() == 'e' || peek() == 'E') {
+    if (*at_ == 'e' || *at_ == 'E') {
         ++at_;
-        if (peek() == '+' || peek() == '-')
+        if (*at_ == '+' || *at_ == '-')
             ++at_;
         if (skipDigits() == 0)
             return false;
     }
-    if (peek() == '.' || isOf(peek(), letterClass) ||
-        vtsv_strtod(text_.substr(start, at_ - start)).error != NumberError::None)
+    const std::string_view digits(start, static_cast<std::size_t>(at_ - start));
+    const ParsedNumber read = vtsv_strtod(digits);
+    if (*at_ == '.' || isOf(*at_, letterClass) || read.error != NumberError::None ||
+        (isQuill_ && read.value == std::trunc(read.value)))
         return false;
-    const std::uint32_t number = add(Part::Real, SymbolicOp::DoubleValue, static_cast<std::uint32_t>(start),
-                                     static_cast<std::uint32_t>(at_ - start));
+    const std::uint32_t number =
+        add(Part::Real, SymbolicOp::DoubleValue, static_cast<std::uint32_t>(start - text_.data()),
+            static_cast<std::uint32_t>(digits.size()));
     return endOperand({number, number});
 }
 
@@ -220,7 +190,7 @@ bool QuickReader::openBracket(Wait wait, std::uint32_t callee) {
     waiting_.push_back({wait, 0, SymbolicOp::FcnCall, callee, callee, 0});
     if (wait == Wait::Call) {
         skipBlanks();
-        if (peek() == ')')
+        if (*at_ == ')')
             return closeBracket();
     }
     return true;
@@ -228,23 +198,19 @@ bool QuickReader::openBracket(Wait wait, std::uint32_t callee) {
 
 /// Reads what follows an operand.
 bool QuickReader::readOperator() {
-    const char c = peek();
+    const char c = *at_;
     if (c == ')')
         return closeBracket();
     if (c == ',')
         return nextArgument();
-    SymbolicOp op = SymbolicOp::None;
+    const Beginning& beginning = (isQuill_ ? beginningsOfQuill : beginningsOfC)[static_cast<unsigned char>(c)];
+    SymbolicOp op = beginning.alone;
     std::size_t length = 1;
-    if (static_cast<unsigned char>(c) < beginnings.size()) {
-        const Beginning& beginning = beginnings[static_cast<unsigned char>(c)];
-        op = beginning.alone;
-        const char second = peek(1);
-        for (std::size_t i = 0; i < Beginning::most; ++i)
-            if (second != '\0' && beginning.seconds[i] == second) {
-                op = beginning.pairs[i];
-                length = 2;
-            }
-    }
+    for (std::size_t i = 0; i < Beginning::most; ++i)
+        if (beginning.seconds[i] != '\0' && beginning.seconds[i] == at_[1]) {
+            op = beginning.pairs[i];
+            length = 2;
+        }
     if (op == SymbolicOp::None)
         return false;
     at_ += length;
@@ -266,8 +232,8 @@ bool QuickReader::closeBracket() {
         if (!isEmpty)
             endArgument(waiting_.back());
         const Waiting& call = waiting_.back();
-        const std::uint32_t root =
-            isEmpty ? add(Part::Operator, SymbolicOp::FcnCall0U) : add(Part::Call, SymbolicOp::FcnCall, call.arguments);
+        const std::uint32_t root = isEmpty && !isQuill_ ? add(Part::Operator, SymbolicOp::FcnCall0U)
+                                                        : add(Part::Call, SymbolicOp::FcnCall, call.arguments);
         items_[call.last].next = root;
         operands_.push_back({call.callee, root});
     }
@@ -306,9 +272,11 @@ void QuickReader::foldUpTo(unsigned precedence) {
         operands_.pop_back();
         Operand& left = operands_.back();
         const std::uint32_t root = add(Part::Operator, top.op);
-        items_[right.root].next = left.first;
-        items_[left.root].next = root;
-        left = {right.first, root};
+        const Operand before = isQuill_ ? left : right;
+        const Operand after = isQuill_ ? right : left;
+        items_[before.root].next = after.first;
+        items_[after.root].next = root;
+        left = {before.first, root};
     }
 }
 
@@ -336,14 +304,13 @@ SymbolicExprId QuickReader::intern(Operand root) {
         const Item& item = items_[at];
         switch (item.part) {
         case Part::Name:
-            ids_.push_back(table_.internName(text_.substr(item.start, item.size)));
+            ids_.push_back(table_.internName(textOf(item)));
             break;
         case Part::Integer:
             ids_.push_back(SymbolicIntValue(table_, static_cast<std::int32_t>(item.size)).getId(table_));
             break;
         case Part::Real:
-            ids_.push_back(
-                SymbolicDoubleValue(table_, vtsv_strtod(text_.substr(item.start, item.size)).value).getId(table_));
+            ids_.push_back(SymbolicDoubleValue(table_, vtsv_strtod(textOf(item)).value).getId(table_));
             break;
         case Part::Call:
             ids_.push_back(internCall(item.start));
@@ -354,8 +321,9 @@ SymbolicExprId QuickReader::intern(Operand root) {
             if (op == SymbolicOp::MemberValue) { // the owner comes first, then the name
                 const auto& name = static_cast<const SymbolicString&>(*table_.get(last));
                 ids_.push_back(SymbolicMemberValue(table_, take(), name.getName()).getId(table_));
-            } else if (conditionInfixOps.contains(op)) {
-                ids_.push_back(makeBinary(table_, op, last, take())); // the right operand comes first
+            } else if (infixOps.contains(op)) {
+                const SymbolicExprId before = take();
+                ids_.push_back(isQuill_ ? makeBinary(table_, op, before, last) : makeBinary(table_, op, last, before));
             } else {
                 ids_.push_back(makeUnary(table_, op, last));
             }
@@ -379,24 +347,28 @@ std::uint32_t QuickReader::add(Part part, SymbolicOp op, std::uint32_t start, st
 }
 
 std::string_view QuickReader::word() {
-    const std::size_t start = at_;
-    while (isOf(peek(), letterClass | digitClass))
+    const char* const start = at_;
+    do
         ++at_;
-    return text_.substr(start, at_ - start);
+    while (isOf(*at_, letterClass | digitClass));
+    return {start, static_cast<std::size_t>(at_ - start)};
 }
 
-void QuickReader::skipBlanks() {
-    while (isOf(peek(), blankClass))
+/// Returns whether there were any.
+bool QuickReader::skipBlanks() {
+    if (!isOf(*at_, blankClass))
+        return false;
+    do
         ++at_;
+    while (isOf(*at_, blankClass));
+    return true;
 }
 
-/// A byte of the text; 0 at its end.
-char QuickReader::peek(std::size_t ahead) const {
-    return at_ + ahead < text_.size() ? text_[at_ + ahead] : '\0';
-}
-
-bool QuickReader::isDigitAt(std::size_t ahead) const {
-    return isOf(peek(ahead), digitClass);
+/// Whether a variant keyword begins here, at a parenthesis.
+bool QuickReader::startsKeyword() const {
+    const std::string_view rest(at_, static_cast<std::size_t>(text_.data() + text_.size() - at_));
+    return options_.variantKeywords && (rest.starts_with(VariantKeywords::getSimVariantKeyword()) ||
+                                        rest.starts_with(VariantKeywords::getCodegenVariantKeyword()));
 }
 
 } // namespace VT::Parser

@@ -12,21 +12,27 @@
 namespace VT::Parser {
 
 /// Reads operators, names, numbers, calls, members and parentheses.  Gives up at anything else: a text that is refused
-/// here may be a condition, and the condition grammar says so, or where it stops.
+/// here may be a condition, and the grammar of its language says so, or where it stops.
 class QuickReader {
 public:
-    QuickReader(SymbolicExprTable& table, const GrammarOptions& options) : table_(table), options_(options) {}
+    enum class Language : std::uint8_t { C, Quill };
 
-    /// Returns the identifier of what the condition grammar reads, interned in the same order; the invalid identifier
-    /// for a text that is left to it, of which nothing is interned.  Linear in the text; its stacks are explicit.
-    /// Throws std::bad_alloc.
+    /// In Quill, of the options only the keywords have a meaning.
+    QuickReader(SymbolicExprTable& table, const GrammarOptions& options, Language language = Language::C)
+        : table_(table),
+          options_(options),
+          isQuill_(language == Language::Quill) {}
+
+    /// Returns the identifier of what the condition grammar, or the converter of Quill conditions without a validator,
+    /// reads, interned in the same order; the invalid identifier for a text that is left to it, of which nothing is
+    /// interned.  `text` is followed by NUL.  Linear in the text; its stacks are explicit.  Throws std::bad_alloc.
     SymbolicExprId read(std::string_view text);
 
 private:
     enum class Part : std::uint8_t { Name, Integer, Real, Operator, Call };
 
     /// A leaf, an operator or a call.  Parts are linked in the order in which they are interned: operands before their
-    /// operators, right ones first.
+    /// operators, in C right ones first.
     struct Item {
         std::uint32_t next;  ///< the part that is interned after this one
         std::uint32_t start; ///< of the text; number of the arguments of a call
@@ -71,14 +77,16 @@ private:
     std::uint32_t add(Part part, SymbolicOp op, std::uint32_t start = 0, std::uint32_t size = 0);
     bool endOperand(Operand operand);
     std::string_view word();
-    void skipBlanks();
-    [[nodiscard]] char peek(std::size_t ahead = 0) const;
-    [[nodiscard]] bool isDigitAt(std::size_t ahead) const;
+    bool skipBlanks();
+    [[nodiscard]] bool startsKeyword() const;
+
+    [[nodiscard]] std::string_view textOf(const Item& item) const { return text_.substr(item.start, item.size); }
 
     SymbolicExprTable& table_;
     GrammarOptions options_;
+    bool isQuill_;
     std::string_view text_;
-    std::size_t at_ = 0;
+    const char* at_ = nullptr; ///< the next byte of the text, or the NUL after it
     std::size_t brackets_ = 0; ///< that are open
     bool operandIsNext_ = true;
     // Most texts need no memory but this.

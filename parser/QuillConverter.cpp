@@ -3,7 +3,8 @@
 // Method: one walk over the tree with two stacks: nodes that wait for operands, and the operands.  A table maps the
 // code of a rule to its operands among the children and to a function that builds the node.  Every step goes through a
 // virtual visit, so that a host may override it; a visit returns `deferred` where the walk has to convert operands
-// first.  Calls that C has operators for are converted at the end (QuillConversion).
+// first.  Calls that C has operators for are converted at the end (QuillConversion).  Where nothing is overridden, the
+// quick reader reads ordinary texts without a tree.
 // Cost: linear in the text.
 #include "parser/QuillConverter.hpp"
 
@@ -13,6 +14,7 @@
 #include "base/variants/VariantKeywords.hpp"
 #include "host/Text.hpp"
 #include "parser/ParseTreeDump.hpp"
+#include "parser/QuickReader.hpp"
 #include "parser/QuillNumber.hpp"
 
 #include <algorithm>
@@ -58,6 +60,13 @@ bool isFurtherCallee(const ParseTree& callee) {
     while ((isRule(*inner, QuillRule::Parentheses) || isRule(*inner, QuillRule::Parentheses2)) && countOf(*inner) > 1)
         inner = &SymbolicExprFromQParseTree::skipExprGoal(inner->children[1]);
     return !isTerminal(*inner, QuillToken::Identifier);
+}
+
+/// Whether the host's parsers read ordinary texts like the quick reader.  A process has one host, so that one look at a
+/// parser's class will do.
+bool isOrdinary(const PARSER_T<char>& parser) {
+    static const bool answer = dynamic_cast<const ReadsOrdinaryQuill*>(&parser) != nullptr;
+    return answer;
 }
 
 /// Whether a name is that of a function which C has an operator for.
@@ -178,6 +187,13 @@ SymbolicExprId SymbolicExprFromQParseTree::convert(const std::u16string& text, s
 SymbolicExprId SymbolicExprFromQParseTree::convert(std::string_view text, const Request& request) {
     const TextInWork inWork(*this, text);
     Parser& parser = parserFor(request.variantKeywords);
+    const bool isOwn = typeid(*this) == *request.ownClass;
+    if (request.ordinary && isOwn && validator_ == nullptr && request.dump == nullptr && isOrdinary(parser)) {
+        VT::Parser::QuickReader read(table_, {false, request.variantKeywords},
+                                     VT::Parser::QuickReader::Language::Quill);
+        if (const SymbolicExprId id = read.read(text); id != invalidId)
+            return id;
+    }
     const auto free = [&parser](const ParseTree* tree) { parser.delete_parse_tree(tree); };
     const std::unique_ptr<const ParseTree, decltype(free)> tree(parser.generate_parse_tree(text.data(), text.size()),
                                                                 free);
@@ -199,7 +215,7 @@ SymbolicExprId SymbolicExprFromQParseTree::convert(std::string_view text, const 
         id = visitNode(*tree, text.data());
     }
     // Only calls of those functions differ in C.  Those that an override made are not counted.
-    const bool mayHoldCalls = convertible_ != before || typeid(*this) != *request.ownClass;
+    const bool mayHoldCalls = convertible_ != before || !isOwn;
     return id != invalidId && mayHoldCalls ? SymbolicExprQ2C(table_)(id) : id;
 }
 

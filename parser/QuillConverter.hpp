@@ -212,6 +212,7 @@ protected:
     struct Request {
         bool variantKeywords = false; ///< (sim) and (codegen) are names
         bool listAtTop = false;       ///< a list that is the whole text is one of dimensions
+        bool ordinary = false;        ///< where nothing is overridden, the quick reader reads what it can
         std::ostream* dump = nullptr; ///< receives the parse tree
         /// The library's own class.  One derived from it may return nodes of its own.
         const std::type_info* ownClass = &typeid(SymbolicExprFromQParseTree);

@@ -38,6 +38,7 @@ SymbolicExprId SymbolicExprFromQParseTreeBlockVariants::operator()(const std::st
 SymbolicExprFromQParseTree::Request SymbolicExprFromQParseTreeBlockVariants::conditionRequest() {
     Request request;
     request.variantKeywords = isVariantKeywordsSimCodegenFeatureOn();
+    request.ordinary = true;
     request.ownClass = &typeid(SymbolicExprFromQParseTreeBlockVariants);
     return request;
 }

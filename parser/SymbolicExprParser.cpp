@@ -1,5 +1,6 @@
 // Parses conditions.  The quick reader reads ordinary ones; what it leaves, the grammar reads to a syntax value, which
-// is then interned.  A text that is refused interns nothing.  Linear in the text.
+// is then interned.  A text that is refused interns nothing, and is read twice: only the grammar says where it stops.
+// Linear in the text.
 #include "parser/SymbolicExprParser.hpp"
 
 #include "base/variants/VariantKeywords.hpp"

@@ -29,7 +29,7 @@ public:
 
 private:
     static constexpr std::size_t firstBytes = 4096;
-    static constexpr std::size_t growth = 4; // a chunk is this part of what there is
+    static constexpr std::size_t growth = 8; // a chunk is this part of what there is
 
     void grow(std::size_t bytes) {
         const std::size_t size = std::max({bytes, firstBytes, total_ / growth});

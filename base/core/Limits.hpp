@@ -79,9 +79,9 @@ inline constexpr double zeroThreshold = 0x1p-26;
 /// may make one more vector as long as the longest; beyond the bound evaluation throws std::length_error.
 inline constexpr std::size_t evaluatedElements = std::size_t{1} << 26U;
 
-/// Bytes of the values that an evaluation of many rows works on at once: half of the cache nearest to a core.  Fewer
+/// Bytes of the values that an evaluation of many rows works on at once: most of the cache nearest to a core.  Fewer
 /// rows are taken at a time where the expression has more values; at least minimumBlockRows, which bound the overhead.
-inline constexpr std::size_t blockBytes = std::size_t{1} << 14U;
+inline constexpr std::size_t blockBytes = std::size_t{1} << 15U;
 inline constexpr std::size_t minimumBlockRows = 64;
 
 /// Steps that one question about conditions may cost: operands read and added up, edges of diagrams joined, literals

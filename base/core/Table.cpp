@@ -26,6 +26,12 @@ namespace {
 constexpr std::size_t firstSlots = 16;
 constexpr std::size_t firstRoom = 128; // nodes
 
+/// The nodes for which both arrays have room.
+template <class Keys, class Nodes>
+std::size_t arrayRoom(const Keys& keys, const Nodes& nodes) {
+    return std::min(keys.capacity(), nodes.capacity());
+}
+
 } // namespace
 
 std::uint64_t processSeed() noexcept {
@@ -88,16 +94,22 @@ std::size_t SymbolicExprTable::probe(const SymbolicExpr& node, std::uint64_t key
 
 /// Makes room for one more node, so that nothing but its own storage can fail once it is made.
 void SymbolicExprTable::reserveOne() {
-    if (nodes_.size() == room_) {
-        const std::size_t room = std::max(firstRoom, 2 * room_);
+    // A failure on the way leaves what there is, and room_ the less of what all three hold.
+    if (nodes_.size() == arrayRoom(keys_, nodes_)) {
+        const std::size_t room = std::max(firstRoom, 2 * nodes_.size());
         keys_.reserve(room);
         nodes_.reserve(room);
         preferLargePages(&keys_[0], room * sizeof(keys_[0]));
         preferLargePages(&nodes_[0], room * sizeof(nodes_[0])); // NOLINT(bugprone-sizeof-expression): of a pointer
-        room_ = room;
     }
-    if ((nodes_.size() + 1) * 4 <= index_.size() * 3)
-        return;
+    const auto indexRoom = [&] { return index_.size() / 4 * 3; };
+    if (nodes_.size() == indexRoom())
+        growIndex();
+    room_ = std::min(arrayRoom(keys_, nodes_), indexRoom());
+}
+
+/// Doubles the slots.
+void SymbolicExprTable::growIndex() {
     if (indexShift_ == 0)
         throw std::length_error("expression table: no room for another node");
     // The topmost bits of the tags choose the slots, so the old index is copied nearly in order.

@@ -143,7 +143,7 @@ private:
     template <class Node, class Payload>
     void intern(const Payload& candidate);
     template <class Node, class Payload>
-    std::uint32_t place(const Payload& candidate, std::uint64_t key, std::size_t position);
+    std::uint32_t place(const Payload& candidate, std::uint64_t key, Slot* slot);
     template <class Node, class Payload>
     [[nodiscard]] SymbolicExprId idOf(const Payload& node) const;
 
@@ -161,15 +161,19 @@ private:
     [[nodiscard]] static std::uint64_t keyOf(const SymbolicExpr& node);
 
     template <class Equal>
-    [[nodiscard]] std::size_t probe(std::uint64_t key, Equal equal) const;
+    [[nodiscard]] std::size_t probe(std::uint64_t key, Equal equal) const {
+        return probe(key, tagOf(key), equal);
+    }
+
+    template <class Equal>
+    [[nodiscard]] std::size_t probe(std::uint64_t key, std::uint32_t tag, Equal equal) const;
     [[nodiscard]] std::size_t probe(const SymbolicExpr& node, std::uint64_t key) const;
     [[nodiscard]] static bool equalNodes(const SymbolicExpr& interned, const SymbolicExpr& node);
 
-    [[nodiscard]] bool isFull() const noexcept {
-        return nodes_.size() == room_ || (nodes_.size() + 1) * 4 > index_.size() * 3;
-    }
+    [[nodiscard]] bool isFull() const noexcept { return nodes_.size() == room_; }
 
     void reserveOne();
+    void growIndex();
 
     std::vector<Slot> index_;         ///< open addressing, linear probing, a power of two of slots
     PlainVector<std::uint64_t> keys_; ///< by identifier
@@ -180,7 +184,7 @@ private:
     SymbolicExprId trueId_ = invalidId;
     SymbolicExprId falseId_ = invalidId;
 
-    std::size_t room_ = 0; ///< nodes for which there is room in keys_ and nodes_
+    std::size_t room_ = 0; ///< nodes for which there is room in keys_, nodes_ and the index
     CellStore cells_;
     std::vector<const SymbolicExpr*> foreignNodes_; ///< those that came through add(), in the order of addition
     unsigned indexShift_;
@@ -191,9 +195,8 @@ private:
 /// Returns the position of the slot of a node of this key for which `equal(node)` holds, or of the free slot where it
 /// would go.  Nodes of an exact key are equal.
 template <class Equal>
-std::size_t SymbolicExprTable::probe(std::uint64_t key, Equal equal) const {
+std::size_t SymbolicExprTable::probe(std::uint64_t key, std::uint32_t tag, Equal equal) const {
     const std::size_t mask = index_.size() - 1;
-    const std::uint32_t tag = tagOf(key);
     for (std::size_t at = std::size_t{tag} >> indexShift_;; at = (at + 1) & mask) {
         const Slot& slot = index_[at];
         if (slot.idAndOne == 0)
@@ -207,7 +210,7 @@ std::size_t SymbolicExprTable::probe(std::uint64_t key, Equal equal) const {
 /// Interns `candidate`, a node of class Node under construction, by adding a copy unless an equal node is there.
 template <class Node, class Payload>
 void SymbolicExprTable::intern(const Payload& candidate) {
-    if (!isPlain()) {
+    if (!isPlain()) [[unlikely]] {
         // The class of the candidate is not complete yet, and a host may do with a node what it likes.
         std::unique_ptr<const Node> node(new Node(candidate));
         if (!contains(node.get()))
@@ -215,25 +218,29 @@ void SymbolicExprTable::intern(const Payload& candidate) {
         return;
     }
     const std::uint64_t key = candidate.keyOf(Node::code);
-    const std::size_t position = probe(key, [&](const SymbolicExpr& interned) {
+    const std::uint32_t tag = tagOf(key);
+    Slot* slot = &index_[probe(key, tag, [&](const SymbolicExpr& interned) {
         if constexpr (Node::equalWithinTolerance)
             return equalNodes(interned, candidate);
         else
             return interned == static_cast<const SymbolicExpr&>(candidate);
-    });
-    const std::uint32_t known = index_[position].idAndOne;
-    const std::uint32_t id = known != 0 ? known - 1 : place<Node>(candidate, key, position);
+    })];
+    std::uint32_t id = slot->idAndOne - 1;
+    if (slot->idAndOne == 0) {
+        // A copy, without a call: a processor looks ahead at the slots of the next nodes only as far as few
+        // instructions lead it.
+        if (isFull()) [[unlikely]] {
+            reserveOne();
+            slot = &index_[probe(key, tag, [](const SymbolicExpr&) { return false; })];
+        }
+        id = place<Node>(candidate, key, slot);
+    }
     lastAnswer_ = {Node::equalWithinTolerance ? nullptr : &candidate, id};
 }
 
-/// Adds a copy of `candidate`, for whose key `position` is the free slot.
+/// Adds a copy of `candidate`, for which there is room, in the free slot of its key.
 template <class Node, class Payload>
-std::uint32_t SymbolicExprTable::place(const Payload& candidate, std::uint64_t key, std::size_t position) {
-    const auto free = [](const SymbolicExpr&) { return false; };
-    if (isFull()) {
-        reserveOne();
-        position = probe(key, free);
-    }
+inline std::uint32_t SymbolicExprTable::place(const Payload& candidate, std::uint64_t key, Slot* slot) {
     void* const cell = cells_.allocate(sizeof(Node));
     const SymbolicExpr* node = nullptr;
     try {
@@ -245,13 +252,13 @@ std::uint32_t SymbolicExprTable::place(const Payload& candidate, std::uint64_t k
     if constexpr (Node::equalWithinTolerance) {
         if (!candidate.hasParts(candidate)) {
             key = addressKey(*node);
-            position = probe(key, free);
+            slot = &index_[probe(key, [](const SymbolicExpr&) { return false; })];
         }
     }
     const auto id = static_cast<std::uint32_t>(nodes_.size());
-    index_[position] = {tagOf(key), id + 1};
-    keys_.push_back(key);
-    nodes_.push_back(node);
+    *slot = {tagOf(key), id + 1};
+    keys_.append(key);
+    nodes_.append(node);
     return id;
 }
 

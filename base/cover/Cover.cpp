@@ -6,6 +6,7 @@
 #include "base/cover/Cover.hpp"
 
 #include "base/core/Limits.hpp"
+#include "base/cover/CoverOccurrences.hpp"
 #include "base/util/Hash.hpp"
 
 #include <algorithm>
@@ -113,7 +114,7 @@ bool reduce(Cover& cover, CoverBudget& budget) {
 bool reduceJoined(Cover& cover, CoverBudget& budget) {
     if (budget.exhausted())
         return false;
-    if (cover.size() < 2)
+    if (cover.size() < 2 || isSumOfSeparateSets(cover))
         return true;
     Cover smaller = cover;
     bool any = false;

@@ -66,4 +66,9 @@ inline void eraseMarked(Cover& cover, const std::vector<bool>& marked) {
     cover.resize(kept);
 }
 
+/// Whether each cube restricts one atom, and the sets of an atom lie apart and leave some integer out: between two of
+/// their intervals an integer is missing, unless both are cubes of one point.  No cube of such a cover holds where the
+/// others do, and neither does what any of them gains without a comparison: there is nothing to absorb or to drop.
+bool isSumOfSeparateSets(const Cover& cover);
+
 } // namespace VT

@@ -74,21 +74,27 @@ constexpr std::array<Loops, typePairs> loopsOf(Function f) {
             loopsOfTypes<Operands, Double, Double>(f)};
 }
 
-[[gnu::always_inline]] inline void unify(const double* values, double* __restrict to, std::size_t rows) {
+/// Mostly there is no NaN, and nothing is written.
+[[gnu::always_inline]] inline void unify(double* values, std::size_t rows) {
+    std::uint64_t any = 0;
     for (std::size_t i = 0; i < rows; ++i)
-        to[i] = values[i] != values[i] ? std::numeric_limits<double>::quiet_NaN() : values[i];
+        any |= values[i] != values[i] ? 1U : 0U;
+    if (any == 0)
+        return;
+    for (std::size_t i = 0; i < rows; ++i)
+        values[i] = values[i] != values[i] ? std::numeric_limits<double>::quiet_NaN() : values[i];
 }
 
-void unifyPlainly(const double* values, double* to, std::size_t rows) noexcept {
-    unify(values, to, rows);
+void unifyPlainly(double* values, std::size_t rows) noexcept {
+    unify(values, rows);
 }
 
-VTSYM_WIDE void unifyWidely(const double* values, double* to, std::size_t rows) noexcept {
-    unify(values, to, rows);
+VTSYM_WIDE void unifyWidely(double* values, std::size_t rows) noexcept {
+    unify(values, rows);
 }
 
-VTSYM_WIDEST void unifyWidest(const double* values, double* to, std::size_t rows) noexcept {
-    unify(values, to, rows);
+VTSYM_WIDEST void unifyWidest(double* values, std::size_t rows) noexcept {
+    unify(values, rows);
 }
 
 /// In the order of ScalarRuleIndex, as operationCode() counts.
@@ -115,9 +121,9 @@ Registers widestRegisters() noexcept {
     return Registers::Plain;
 }
 
-void copyVisible(const double* values, double* to, std::size_t rows, Registers registers) noexcept {
-    constexpr std::array copies{unifyPlainly, unifyWidely, unifyWidest};
-    copies[static_cast<std::size_t>(registers)](values, to, rows);
+void makeVisible(double* values, std::size_t rows, Registers registers) noexcept {
+    constexpr std::array passes{unifyPlainly, unifyWidely, unifyWidest};
+    passes[static_cast<std::size_t>(registers)](values, rows);
 }
 
 } // namespace VT::detail

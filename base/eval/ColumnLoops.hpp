@@ -23,7 +23,7 @@ ColumnLoop columnLoop(std::uint32_t code, Registers registers) noexcept;
 /// The widest registers of this processor.
 Registers widestRegisters() noexcept;
 
-/// Copies values and makes every NaN the same, as visibleScalar() does.
-void copyVisible(const double* values, double* to, std::size_t rows, Registers registers) noexcept;
+/// Makes every NaN the same, as visibleScalar() does.
+void makeVisible(double* values, std::size_t rows, Registers registers) noexcept;
 
 } // namespace VT::detail

@@ -92,9 +92,11 @@ PreparedExprColumns::PreparedExprColumns(const PreparedExpr& expression, std::sp
       values_(expression.cells_.size()) {
     placeColumns(columns);
     placeOperations();
+    constexpr std::size_t lineRows = sizeof(Line64) / sizeof(double);
     const std::size_t room = limits::blockBytes / (sizeof(double) * std::max<std::size_t>(bufferCount_, 1));
-    blockRows_ = std::max(std::bit_floor(room), limits::minimumBlockRows);
-    storage_.resize(bufferCount_ * blockRows_ * sizeof(double) / sizeof(Line64));
+    blockRows_ = std::max(room / lineRows * lineRows, limits::minimumBlockRows);
+    bufferLines_ = blockRows_ / lineRows | 1U;
+    storage_.resize(bufferCount_ * bufferLines_);
     fillConstants();
 }
 
@@ -145,8 +147,7 @@ std::uint32_t PreparedExprColumns::takeBuffer() {
     return buffer;
 }
 
-/// Gives each operation a buffer for its results, but that of the root, which writes bools and integers to the caller's
-/// room.
+/// Gives each operation a buffer for its results, but that of the root, which writes to the caller's room.
 void PreparedExprColumns::placeOperations() {
     const auto first = static_cast<std::uint32_t>(expression_.firstResult_);
     const auto count = static_cast<std::uint32_t>(expression_.operations_.size() - 1);
@@ -161,7 +162,7 @@ void PreparedExprColumns::placeOperations() {
         const detail::Operation& operation = expression_.operations_[i];
         const std::uint32_t result = first + i;
         lines_.push_back({detail::columnLoop(operation.code, registers_), operation.left, operation.right, result});
-        if (result != root || resultType() == ScalarType::Double)
+        if (result != root)
             buffers_[result] = takeBuffer();
         // Only now, so that results never overlap operands.
         for (const std::uint32_t cell : {operation.left, operation.right})
@@ -173,7 +174,7 @@ void PreparedExprColumns::placeOperations() {
 }
 
 std::byte* PreparedExprColumns::buffer(std::uint32_t number) noexcept {
-    return reinterpret_cast<std::byte*>(storage_.data()) + number * blockRows_ * sizeof(double);
+    return reinterpret_cast<std::byte*>(storage_.data() + number * bufferLines_);
 }
 
 void PreparedExprColumns::fillConstants() {
@@ -225,11 +226,10 @@ void PreparedExprColumns::run(std::size_t rows, void* results) {
             void* const to = buffers_[line.result] == none ? out : buffer(buffers_[line.result]);
             line.loop(values_[line.left], values_[line.right], to, count);
         }
-        if (type == ScalarType::Double)
-            detail::copyVisible(static_cast<const double*>(values_[root]), reinterpret_cast<double*>(out), count,
-                                registers_);
-        else if (root < expression_.firstResult_) // no operation
+        if (root < expression_.firstResult_) // no operation
             std::memcpy(out, values_[root], count * bytesOf(type));
+        if (type == ScalarType::Double)
+            detail::makeVisible(reinterpret_cast<double*>(out), count, registers_);
     }
 }
 

@@ -62,6 +62,9 @@ private:
     };
 
     std::size_t blockRows_ = 0;
+    /// Of a buffer: an odd number, so that equal rows of no two buffers are as far apart as a page or half of it, which
+    /// a processor takes for one place when it compares loads with the stores before them.
+    std::size_t bufferLines_ = 0;
     std::vector<Line64> storage_;
 };
 

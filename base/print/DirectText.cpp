@@ -113,7 +113,7 @@ const std::string& DirectText::nameAt(SymbolicExprId id) const {
 std::optional<std::string> DirectText::print(SymbolicExprId id, std::size_t most) {
     bytes_.truncate(0);
     open_.truncate(0);
-    if (!table_.has(id) || !enter(id))
+    if (!table_.has(id) || !enter(id, &styleAt(id)))
         return std::nullopt;
     while (open_.size() > 0)
         if (bytes_.size() > most || !advance())
@@ -124,10 +124,9 @@ std::optional<std::string> DirectText::print(SymbolicExprId id, std::size_t most
 }
 
 /// Writes a node down to its first leaf and opens the operators on the way; false where another printer is needed.
-bool DirectText::enter(SymbolicExprId id) {
+bool DirectText::enter(SymbolicExprId id, const Style* style) {
     while (true) {
-        const Style& style = styleAt(id);
-        switch (style.kind) {
+        switch (style->kind) {
         case Style::Kind::Name:
             put(nameAt(id));
             return true;
@@ -135,7 +134,7 @@ bool DirectText::enter(SymbolicExprId id) {
             putInteger(NodeKeys::integerOf(table_.keyAt(id)));
             return true;
         case Style::Kind::Call:
-            return enterCall(id);
+            return enterCall(id, style);
         case Style::Kind::Infix:
         case Style::Kind::Prefix:
         case Style::Kind::Member:
@@ -146,50 +145,54 @@ bool DirectText::enter(SymbolicExprId id) {
         const SymbolicExprId first = operandOf(id, 0);
         if (first == invalidId)
             return false;
-        const Style& inner = styleAt(first);
-        bool wrapped = inner.precedence > style.precedence;
-        if (style.kind == Style::Kind::Member && inner.kind != Style::Kind::Name && inner.kind != Style::Kind::Member)
+        const Style* const inner = &styleAt(first);
+        bool wrapped = inner->precedence > style->precedence;
+        if (style->kind == Style::Kind::Member && inner->kind != Style::Kind::Name &&
+            inner->kind != Style::Kind::Member)
             return false;
-        if (style.kind == Style::Kind::Prefix) {
-            if (style.isMinus() && inner.kind == Style::Kind::Integer && NodeKeys::integerOf(table_.keyAt(first)) == 0)
+        if (style->kind == Style::Kind::Prefix) {
+            if (style->isMinus() && inner->kind == Style::Kind::Integer &&
+                NodeKeys::integerOf(table_.keyAt(first)) == 0)
                 return false; // a minus that is not written
-            wrapped = inner.precedence >= style.precedence || (style.isMinus() && beginsWithMinus(first));
-            put(style.text());
+            wrapped = inner->precedence >= style->precedence || (style->isMinus() && beginsWithMinus(first));
+            put(style->text());
         }
         if (wrapped)
             put('(');
-        open_.push_back({id, 1, wrapped});
+        open_.push_back({id, style, 1, style->kind == Style::Kind::Infix ? 2U : 1U, wrapped});
         id = first;
+        style = inner;
     }
 }
 
 /// Writes the name of a function and opens its call.
-bool DirectText::enterCall(SymbolicExprId id) {
+bool DirectText::enterCall(SymbolicExprId id, const Style* style) {
     const SymbolicExprId name = operandOf(id, 0);
     if (name == invalidId || !NodeKeys::isName(table_.keyAt(name)))
         return false;
     put(nameAt(name));
     put('(');
-    open_.push_back({id, 1, false});
+    const std::size_t operands = table_.SymbolicExprTable::get(id)->getNumInputs();
+    if (operands > std::numeric_limits<std::uint32_t>::max())
+        return false;
+    open_.push_back({id, style, 1, static_cast<std::uint32_t>(operands), false});
     return true;
 }
 
 /// Goes on with the operator that was opened last, one of whose operands is written.
 bool DirectText::advance() {
     Open& open = open_[open_.size() - 1];
-    const Style& style = styleAt(open.id);
-    if (open.wrapped)
+    const Style& style = *open.style;
+    if (open.wrapped) {
         put(')');
-    open.wrapped = false;
+        open.wrapped = false;
+    }
     const bool isCall = style.kind == Style::Kind::Call;
     if (style.kind == Style::Kind::Member) {
         put('.');
         put(static_cast<const SymbolicMemberValue*>(table_.SymbolicExprTable::get(open.id))->getMemberName());
     }
-    const std::size_t operands = style.kind == Style::Kind::Infix ? 2
-                                 : isCall ? table_.SymbolicExprTable::get(open.id)->getNumInputs()
-                                          : 1;
-    if (open.next == operands) {
+    if (open.next == open.count) {
         if (isCall)
             put(')');
         open_.pop_back();
@@ -198,17 +201,18 @@ bool DirectText::advance() {
     const SymbolicExprId next = operandOf(open.id, open.next);
     if (next == invalidId)
         return false;
+    const Style* const inner = &styleAt(next);
     if (isCall) {
         if (open.next > 1)
             put(',');
     } else {
         put(style.text());
-        open.wrapped = styleAt(next).precedence >= style.precedence || (style.isMinus() && beginsWithMinus(next));
+        open.wrapped = inner->precedence >= style.precedence || (style.isMinus() && beginsWithMinus(next));
         if (open.wrapped)
             put('(');
     }
     ++open.next;
-    return enter(next);
+    return enter(next, inner);
 }
 
 /// Whether the text of a node begins with a minus.  Nodes for which enter() gives up do not count.

@@ -30,16 +30,18 @@ private:
     /// An operator some of whose operands are still to be written.
     struct Open {
         SymbolicExprId id;
-        std::uint32_t next; ///< operand
-        bool wrapped;       ///< the operand that is written now is in parentheses
+        const Style* style;
+        std::uint32_t next;  ///< operand
+        std::uint32_t count; ///< of operands
+        bool wrapped;        ///< the operand that is written now is in parentheses
     };
 
     [[nodiscard]] static const Style* stylesOf(bool quill, bool spaced);
     [[nodiscard]] const Style& styleAt(SymbolicExprId id) const;
     [[nodiscard]] SymbolicExprId operandOf(SymbolicExprId id, std::size_t index) const;
-    [[nodiscard]] bool enter(SymbolicExprId id);
+    [[nodiscard]] bool enter(SymbolicExprId id, const Style* style);
     [[nodiscard]] bool advance();
-    [[nodiscard]] bool enterCall(SymbolicExprId id);
+    [[nodiscard]] bool enterCall(SymbolicExprId id, const Style* style);
     [[nodiscard]] bool beginsWithMinus(SymbolicExprId id) const;
     [[nodiscard]] const std::string& nameAt(SymbolicExprId id) const;
     void putInteger(int value);

@@ -13,6 +13,7 @@
 #include "base/print/StringifySymbolicExpr.hpp"
 #include "base/print/StructuralOrder.hpp"
 
+#include <boost/container/small_vector.hpp>
 #include <boost/unordered_map.hpp>
 
 #include <algorithm>
@@ -124,6 +125,29 @@ int SymbolicExprPrinter::compareUsingCache(SymbolicExprId left, SymbolicExprId r
         return 0;
     const int order = state_->stringify.texts().compare(leftText, rightText);
     return order != 0 ? order : compareStructure(state_->table, left, right);
+}
+
+void SymbolicExprPrinter::sortUsingCache(std::span<SymbolicExprId> ids) const {
+    struct Entry {
+        Text text;
+        SymbolicExprId id;
+    };
+
+    if (ids.size() < 2)
+        return;
+    state_->followNames();
+    boost::container::small_vector<Entry, 16> entries;
+    for (const SymbolicExprId id : ids)
+        entries.push_back({state_->stringify.printed(id).text, id});
+    const TextPool& texts = state_->stringify.texts();
+    const auto isBefore = [&](const Entry& left, const Entry& right) {
+        const int order = texts.compare(left.text, right.text);
+        return order < 0 || (order == 0 && compareStructure(state_->table, left.id, right.id) < 0);
+    };
+    if (std::ranges::is_sorted(entries, isBefore)) // a result that is simplified again
+        return;
+    std::ranges::sort(entries, isBefore);
+    std::ranges::transform(entries, ids.begin(), &Entry::id);
 }
 
 void SymbolicExprPrinter::setTextBound(std::size_t bytes) {

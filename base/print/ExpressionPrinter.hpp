@@ -6,6 +6,7 @@
 #include <concepts>
 #include <cstdint>
 #include <memory>
+#include <span>
 #include <string>
 #include <type_traits>
 #include <utility>
@@ -87,6 +88,8 @@ public:
     /// Writes no text.  Mostly O(1) once the printer has met the nodes; at worst linear in the bound and the depth.
     /// Throws std::out_of_range for an identifier that is not of the table.
     [[nodiscard]] int compareUsingCache(SymbolicExprId left, SymbolicExprId right) const;
+    /// Sorts expressions by that order.  Looks each of them up once.
+    void sortUsingCache(std::span<SymbolicExprId> ids) const;
 
     /// Bytes beyond which printing throws std::length_error; limits::textBytes unless set.
     void setTextBound(std::size_t bytes);

@@ -157,7 +157,7 @@ SymbolicExprId Atoms::single(const Constraint& constraint) {
     return ray(entry, set);
 }
 
-void Atoms::write(const Constraint& constraint, std::vector<SymbolicExprId>& out) {
+void Atoms::write(const Constraint& constraint, Ids& out) {
     const auto& [atom, set] = constraint;
     if (set.comparisons() == 1) {
         out.push_back(single(constraint));
@@ -171,21 +171,26 @@ void Atoms::write(const Constraint& constraint, std::vector<SymbolicExprId>& out
         out.push_back(single({atom, IntegerSet::allBut(hole)}));
 }
 
+SymbolicExprId Atoms::sortedChain(SymbolicOp op, Ids& operands) {
+    const std::span<SymbolicExprId> all(operands.data(), operands.size());
+    context_.sort(all);
+    return foldLeft(context_, op, all);
+}
+
 SymbolicExprId Atoms::write(const Cover& cover) {
-    std::vector<SymbolicExprId> products;
+    Ids products;
+    Ids factors;
     for (const Cube& cube : cover) {
-        std::vector<SymbolicExprId> factors;
+        factors.clear();
         for (const Constraint& constraint : cube.constraints())
             write(constraint, factors);
         if (factors.empty())
             return context_.truth(true);
-        sortByText(context_, factors);
-        products.push_back(foldLeft(context_, SymbolicOp::And, factors));
+        products.push_back(sortedChain(SymbolicOp::And, factors));
     }
     if (products.empty())
         return context_.truth(false);
-    sortByText(context_, products);
-    return foldLeft(context_, SymbolicOp::Or, products);
+    return sortedChain(SymbolicOp::Or, products);
 }
 
 // Chains.
@@ -205,14 +210,8 @@ std::vector<SymbolicExprId> chainOperands(const RuleContext& context, SymbolicOp
     return operands;
 }
 
-SymbolicExprId foldLeft(RuleContext& context, SymbolicOp op, const std::vector<SymbolicExprId>& operands) {
+SymbolicExprId foldLeft(RuleContext& context, SymbolicOp op, std::span<const SymbolicExprId> operands) {
     return makeChain(context.table(), op, operands);
-}
-
-void sortByText(const RuleContext& context, std::vector<SymbolicExprId>& operands) {
-    const auto isBefore = [&](SymbolicExprId a, SymbolicExprId b) { return context.sortsBefore(a, b); };
-    if (!std::ranges::is_sorted(operands, isBefore)) // a result that is simplified again
-        std::ranges::sort(operands, isBefore);
 }
 
 } // namespace VT

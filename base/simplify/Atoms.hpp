@@ -8,6 +8,7 @@
 #include <boost/unordered_map.hpp>
 
 #include <map>
+#include <span>
 #include <tuple>
 #include <vector>
 
@@ -29,8 +30,10 @@ public:
     /// An operand that is an And chain or a literal; false where the product can never hold.
     bool readProduct(SymbolicExprId product, Cube& cube);
 
+    using Ids = boost::container::small_vector<SymbolicExprId, 16>;
+
     /// Appends the comparisons that a constraint takes, one identifier each.
-    void write(const Constraint& constraint, std::vector<SymbolicExprId>& out);
+    void write(const Constraint& constraint, Ids& out);
     /// A cover as a sum of products, operands in the order of their texts.
     SymbolicExprId write(const Cover& cover);
 
@@ -53,6 +56,7 @@ private:
     SymbolicExprId ray(const Entry& entry, const IntegerSet& set);
     SymbolicExprId negateTruth(SymbolicExprId value);
     SymbolicExprId single(const Constraint& constraint);
+    SymbolicExprId sortedChain(SymbolicOp op, Ids& operands);
 
     /// A literal that was read.
     struct Form {
@@ -75,9 +79,6 @@ std::vector<SymbolicExprId> chainOperands(const RuleContext& context, SymbolicOp
                                           bool& repeated);
 
 /// Operands folded from the left; there is at least one.
-SymbolicExprId foldLeft(RuleContext& context, SymbolicOp op, const std::vector<SymbolicExprId>& operands);
-
-/// Sorts operands by their texts.
-void sortByText(const RuleContext& context, std::vector<SymbolicExprId>& operands);
+SymbolicExprId foldLeft(RuleContext& context, SymbolicOp op, std::span<const SymbolicExprId> operands);
 
 } // namespace VT

@@ -101,9 +101,11 @@ struct Chain {
 
 void Chain::read() {
     isRead = true;
-    sortByText(context, operands);
+    context.sort(operands);
     // What the comparisons of a long And exclude is gathered, so that sets of many intervals are made once.
     const bool isLong = operands.size() > limits::restrictedOneByOne;
+    if (!isAnd())
+        sum.reserve(operands.size());
     std::map<Atom, std::vector<IntegerSet::Interval>> excluded;
     for (const SymbolicExprId operand : operands) {
         if (!isAnd()) {

@@ -38,6 +38,8 @@ std::optional<int> RuleContext::integer(SymbolicExprId id) const {
 bool RuleContext::mayBeReal(SymbolicExprId id) {
     static constexpr OperatorSet arithmetic{SymbolicOp::Plus, SymbolicOp::Minus, SymbolicOp::UnaryMinus,
                                             SymbolicOp::Multiply, SymbolicOp::Divide};
+    if (const SymbolicOp whole = op(resolve(id)); !arithmetic.contains(whole)) // mostly
+        return whole == SymbolicOp::DoubleValue;
     std::vector<SymbolicExprId> pending{id};
     while (!pending.empty()) {
         const SymbolicExprId next = pending.back();

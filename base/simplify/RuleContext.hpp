@@ -8,12 +8,13 @@
 
 #include <cstdint>
 #include <optional>
+#include <span>
 #include <utility>
 
 namespace VT {
 
 /// The table, the order of operands and the state of one pass.  How operands are ordered is the driver's choice: rules
-/// know the order through sortsBefore() alone, never the printer.
+/// know the order through sortsBefore() and sort() alone, never the printer.
 class RuleContext {
 public:
     RuleContext(SymbolicExprTable& table, bool keywordsOn);
@@ -38,6 +39,8 @@ public:
     /// Whether a comes before b among the operands of a chain: a strict weak order that never depends on how nodes are
     /// numbered.
     [[nodiscard]] virtual bool sortsBefore(SymbolicExprId a, SymbolicExprId b) const = 0;
+    /// Sorts operands by that order.
+    virtual void sort(std::span<SymbolicExprId> operands) const = 0;
 
     [[nodiscard]] const SymbolicExpr& node(SymbolicExprId id) const { return *table_.get(id); }
 

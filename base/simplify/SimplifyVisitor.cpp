@@ -11,6 +11,8 @@
 #include "base/simplify/LogicalChain.hpp"
 #include "base/simplify/RuleTables.hpp"
 
+#include <boost/container/small_vector.hpp>
+
 namespace VT {
 
 namespace {
@@ -61,6 +63,8 @@ public:
     [[nodiscard]] bool sortsBefore(SymbolicExprId a, SymbolicExprId b) const override {
         return printer_.compareUsingCache(a, b) < 0;
     }
+
+    void sort(std::span<SymbolicExprId> operands) const override { printer_.sortUsingCache(operands); }
 
 private:
     SymbolicExprSimplifyVisitor& visitor_;
@@ -151,7 +155,7 @@ private:
 
     SymbolicExprSimplifyVisitor& visitor_;
     const SymbolicExprTable& table_;
-    std::vector<Frame> frames_;
+    boost::container::small_vector<Frame, 16> frames_;
     WalkPath path_{table_};    ///< kept for hosts' tables only
     IdMap<Result> results_[2]; ///< of dimensions, of conditions
 };

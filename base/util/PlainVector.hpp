@@ -30,6 +30,9 @@ public:
 
     [[nodiscard]] std::size_t size() const noexcept { return size_; }
 
+    /// The values for which there is room, those that are there among them.
+    [[nodiscard]] std::size_t capacity() const noexcept { return capacity_; }
+
     /// Makes room for `count` values in all.
     void reserve(std::size_t count) {
         if (capacity_ < count)
@@ -49,6 +52,9 @@ public:
         const Value copy = value;
         *extend(1) = copy;
     }
+
+    /// Appends a value for which there is room.
+    void append(const Value& value) noexcept { data_[size_++] = value; }
 
     void pop_back() noexcept { --size_; }
 

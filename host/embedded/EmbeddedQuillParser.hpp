@@ -7,7 +7,7 @@
 namespace VT::Embedded {
 
 /// The parser of host/QuillParser.hpp over char.  Linear in the text; keeps the memory of small texts for the next one.
-class QuillParser final : public PARSER_T<char> {
+class QuillParser final : public PARSER_T<char>, public ReadsOrdinaryQuill {
 public:
     QuillParser(std::size_t nesting, std::span<const std::string> keywords);
 

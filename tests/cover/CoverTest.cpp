@@ -115,6 +115,36 @@ RC_GTEST_PROP(Covers, GetSmallerAndStayTheSame, ()) {
     }
 }
 
+RC_GTEST_PROP(Covers, HoldNothingRedundantOnceReduced, ()) {
+    Cover cover = anyCover();
+    if (*rc::gen::inRange(0, 2) == 0) { // sets of single atoms
+        std::erase_if(cover, [](const Cube& cube) { return cube.constraints().size() > 1; });
+        for (int i = *rc::gen::inRange(0, 12); i > 0; --i) {
+            const auto any = [] { // changes within the window
+                const SymbolicOp op = static_cast<SymbolicOp>(*rc::gen::inRange(9, 15));
+                return IntegerSet::satisfying(op, *rc::gen::inRange<std::int64_t>(-3, 4));
+            };
+            Cube cube;
+            cube.assign(*rc::gen::inRange<Atom>(0, 2), *rc::gen::inRange(0, 3) == 0 ? any().unite(any()) : any());
+            if (!cube.alwaysHolds())
+                cover.push_back(cube);
+        }
+    }
+    CoverBudget budget{100000};
+    RC_ASSERT(reduce(cover, budget));
+    const std::vector<bool> expected = truth(cover);
+    for (std::size_t i = 0; i < cover.size(); ++i) {
+        Cover without = cover;
+        without.erase(without.begin() + static_cast<std::ptrdiff_t>(i));
+        RC_ASSERT(truth(without) != expected);
+        for (const Constraint& constraint : cover[i].constraints()) {
+            Cover wider = cover;
+            wider[i].assign(constraint.atom, IntegerSet::all());
+            RC_ASSERT(truth(wider) != expected);
+        }
+    }
+}
+
 RC_GTEST_PROP(Covers, CombineExactly, ()) {
     const Cover a = anyCover();
     const Cover b = anyCover();

@@ -430,7 +430,7 @@ TEST(ColumnLoops, AreTheSameForWideRegisters) {
             std::vector<double> all(rows);
             detail::columnLoop(code, registers)(left, operand.data(), all.data(), rows);
             if (isReal)
-                detail::copyVisible(std::vector(all).data(), all.data(), rows, registers);
+                detail::makeVisible(all.data(), rows, registers);
             return all;
         };
         const std::vector<double> plain = answers(detail::Registers::Plain);
