@@ -5,6 +5,7 @@
 #include <cstdlib>
 #include <string_view>
 
+extern "C" const char* __asan_default_options(); // NOLINT(bugprone-reserved-identifier): the name that is looked up
 extern "C" int LLVMFuzzerInitialize(int* argc, char*** argv);
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size);
 
@@ -13,6 +14,12 @@ namespace {
 const VT::Fuzz::Target* chosen = nullptr;
 
 } // namespace
+
+/// Freed memory is kept back as much as many inputs take, not the usual 256 MB, which would hide what the inputs
+/// themselves take.
+extern "C" const char* __asan_default_options() {
+    return "quarantine_size_mb=16:malloc_context_size=1";
+}
 
 extern "C" int LLVMFuzzerInitialize(int* /*argc*/, char*** /*argv*/) {
     const char* const name = std::getenv("VTSYM_FUZZ_TARGET");

@@ -69,9 +69,10 @@ void ChoiceSetChecker::State::countAssignments(SymbolicExprId parent, std::span<
     if (options.domains.empty())
         return;
     AssignmentCounter counter(table, decider, options.domains);
+    const std::size_t left = defaultChoice.value_or(choices.size()); // no condition of its own
     std::vector<SymbolicExprId> all;
     for (std::size_t i = 0; i < choices.size(); ++i)
-        if (i != defaultChoice)
+        if (i != left)
             all.push_back(toC(choices[i]));
     const std::vector<SymbolicExprId> others = all;
     const SymbolicExprId context =
@@ -80,7 +81,7 @@ void ChoiceSetChecker::State::countAssignments(SymbolicExprId parent, std::span<
     const std::vector<SymbolicExprId> names = counter.namesOf(all);
     report.parentAssignments = counter.count(std::span(&context, 1), names);
     for (std::size_t i = 0; i < choices.size(); ++i) {
-        const bool isDefault = i == defaultChoice;
+        const bool isDefault = i == left;
         std::vector<SymbolicExprId> counted{context};
         if (!isDefault)
             counted.push_back(toC(choices[i]));

@@ -45,9 +45,10 @@ ChoiceSetReport ChoiceSetChecker::check(SymbolicExprId parent, std::span<const S
         return report;
     // Nothing is known of a context that may never hold.
     OrdinaryChoices ordinary = state.ordinaryIn(parentHolds.isYes() ? context : invalidId);
+    const std::size_t left = defaultChoice.value_or(choices.size()); // no condition of its own
     std::vector<SymbolicExprId> holds(choices.size(), table.getIdFALSE()); // which overlaps nothing
     for (std::size_t i = 0; i < choices.size(); ++i)
-        if (i != defaultChoice)
+        if (i != left)
             holds[i] = state.both(context, state.toC(choices[i]));
     std::vector<SymbolicExprId> conditions(choices.size());
     std::ranges::transform(choices, conditions.begin(), [&](SymbolicExprId id) { return state.toC(id); });
@@ -60,7 +61,7 @@ ChoiceSetReport ChoiceSetChecker::check(SymbolicExprId parent, std::span<const S
     place.conditions = conditions;
     place.evaluation = &evaluation;
     for (std::size_t i = 0; i < choices.size(); ++i) {
-        if (i == defaultChoice)
+        if (i == left)
             continue;
         if (state.setLeft == 0) {
             State::add({.fault = ChoiceFault::Dead, .choice = i},

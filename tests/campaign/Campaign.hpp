@@ -50,6 +50,7 @@ std::unique_ptr<Job> makeSolverProofs(const std::string& name);
 std::unique_ptr<Job> makeEnumeration(const std::string& name);
 std::unique_ptr<Job> makePreprocessorPairs(const std::string& name);
 std::unique_ptr<Job> makeFaults(const std::string& name);
+std::unique_ptr<Job> makeLibraryMemory(const std::string& name);
 std::unique_ptr<Job> makeDeepTrees(const std::string& name);
 
 } // namespace VT::Campaign

@@ -27,6 +27,8 @@ std::vector<Entry> entries() {
         {"stack", "trees of a million levels need no more than 256 KiB of stack", 16, makeDeepTrees},
         {"system-calls", "each open, read, write, close and rename of the program fails once", 250, makeFaults},
         {"program-memory", "each allocation of the program fails, once and from then on", 250, makeFaults},
+        {"library-memory", "each allocation of calls of the library fails, once and from then on", 4000,
+         makeLibraryMemory},
     };
     for (const VT::Fuzz::Target& target : VT::Fuzz::targets())
         all.push_back({target.name, "a fuzz target with random inputs, at full speed; a failing one is minimised", 300,

@@ -1,5 +1,5 @@
 // Every operation on trees of a million operators on top of each other, with 256 KiB of stack; texts nested as deep as
-// they may be, with 384 KiB.
+// they may be, with `stackOfTexts`.
 #include "base/VCService.hpp"
 #include "base/VTSymbolicExpr.hpp"
 #include "base/eval/Eval.hpp"
@@ -27,6 +27,7 @@ using Op = SymbolicOp;
 
 constexpr int depth = 1'000'000;
 constexpr std::size_t kibibyte = 1024;
+constexpr std::size_t stackOfTrees = 256 * kibibyte;
 #ifdef __SANITIZE_ADDRESS__
 constexpr std::size_t stackOfTexts = 4096 * kibibyte; // frames are many times as large
 #else
@@ -159,13 +160,14 @@ public:
                  : i % 2 == 0        ? tree(op, id, leaf)
                                      : tree(op, leaf, id);
         }
-        withStack(256 * kibibyte, [&] { operation.run(service, id); });
+        withStack(stackOfTrees, [&] { operation.run(service, id); });
         ++done_;
     }
 
     [[nodiscard]] std::string figure() const override {
-        return std::to_string(done_) + " of " + std::to_string(items() - 1) +
-               " operations on trees of 1000000 levels with 256 KiB of stack, texts nested to the bound with 384 KiB";
+        return std::to_string(done_) + " of " + std::to_string(items() - 1) + " operations on trees of " +
+               std::to_string(depth) + " levels with " + std::to_string(stackOfTrees / kibibyte) +
+               " KiB of stack, texts nested to the bound with " + std::to_string(stackOfTexts / kibibyte) + " KiB";
     }
 
     [[nodiscard]] std::uint64_t items() const override { return shapes.size() * operations.size() + 1; }

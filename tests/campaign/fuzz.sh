@@ -26,8 +26,8 @@ for each in $targets; do
     log=$root/build/fuzz/$each.log
     status=0
     # Entropic scheduling costs more here than it finds: its book-keeping took two thirds of the time.
-    VTSYM_FUZZ_TARGET=$each ASAN_OPTIONS=malloc_context_size=4 "$fuzzer/vtsym_fuzz" ${words:+-dict="$root/fuzz/words/$words.dict"} \
-        -seed="$seed" -max_len="$longest" -max_total_time="$seconds" -timeout=10 -rss_limit_mb=1024 -entropic=0 -reload=0 \
+    VTSYM_FUZZ_TARGET=$each "$fuzzer/vtsym_fuzz" ${words:+-dict="$root/fuzz/words/$words.dict"} \
+        -seed="$seed" -max_len="$longest" -max_total_time="$seconds" -timeout=10 -rss_limit_mb=256 -entropic=0 -reload=0 \
         -print_final_stats=1 -artifact_prefix="$found/$each-" "$corpus" >"$log" 2>&1 || status=$?
     runs=$(sed -n 's/^stat::number_of_executed_units: *//p' "$log")
     all=$((all + ${runs:-0}))

@@ -5,6 +5,7 @@
 #include "base/text/TextPool.hpp"
 #include "base/transform/QuillConversion.hpp"
 #include "host/QuillParser.hpp"
+#include "tests/memory/FailingMemory.hpp"
 #include "tests/service/Customizers.hpp"
 #include "tests/support/Times.hpp"
 #include "tests/support/TreeText.hpp"
@@ -13,10 +14,7 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <cstdlib>
-#include <dlfcn.h>
 #include <functional>
-#include <new>
 #include <optional>
 #include <random>
 #include <string>
@@ -25,64 +23,18 @@
 namespace VT::Testing {
 namespace {
 
-constexpr std::size_t never = ~std::size_t{0};
-
-std::size_t untilFailure = never; ///< allocations
-bool failed = false;
-std::size_t living = 0; ///< allocations that were not freed
-
-void* allocate(std::size_t bytes, std::size_t alignment = alignof(std::max_align_t)) noexcept {
-    if (untilFailure == 0) {
-        failed = true;
-        return nullptr;
-    }
-    if (untilFailure != never)
-        --untilFailure;
-    const std::size_t rounded = (bytes + alignment - 1) / alignment * alignment;
-    void* place = alignment <= alignof(std::max_align_t) ? std::malloc(std::max<std::size_t>(bytes, 1))
-                                                         : std::aligned_alloc(alignment, rounded);
-    living += place != nullptr ? 1 : 0;
-    return place;
-}
-
-void* orThrow(void* place) {
-    return place != nullptr ? place : throw std::bad_alloc();
-}
-
-void release(void* place) noexcept {
-    living -= place != nullptr ? 1 : 0;
-    std::free(place);
-}
-
 /// Calls with the number of the allocation that fails, from the first on until none fails.  A call that leaves
 /// allocations after it is an error.
 void forEachFailure(const std::function<void(std::size_t number)>& run) {
     constexpr std::size_t enough = 100000;
     for (std::size_t number = 0; number < enough; ++number) {
-        const std::size_t before = living;
+        const std::size_t before = FailingMemory::living();
         run(number);
-        ASSERT_EQ(living, before) << "allocation " << number;
-        if (testing::Test::HasFatalFailure() || !failed)
+        ASSERT_EQ(FailingMemory::living(), before) << "allocation " << number;
+        if (testing::Test::HasFatalFailure() || !FailingMemory::hasFailed())
             return;
     }
     FAIL() << "fails without end";
-}
-
-/// Makes a call in which the allocation of that number, counted from 0, and all later ones fail; whether it returned.
-template <class Call>
-bool attempt(std::size_t number, Call call) {
-    const struct Limit {
-        ~Limit() { untilFailure = never; }
-    } limit;
-
-    failed = false;
-    untilFailure = number;
-    try {
-        call();
-        return true;
-    } catch (const std::bad_alloc&) {
-        return false;
-    }
 }
 
 /// Nodes of every shape, long texts and enough of them for several enlargements of everything.
@@ -109,7 +61,7 @@ TEST(MemoryRunsOut, WhileADeepTextIsWritten) {
             deep = pool.enclose("(", deep, ")");
         std::string whole(depth, '(');
         whole.append("x").append(depth, ')');
-        attempt(number, [&] { static_cast<void>(pool.str(deep, whole.size())); });
+        FailingMemory::attempt(number, [&] { static_cast<void>(pool.str(deep, whole.size())); });
         ASSERT_EQ(pool.str(pool.bytes("y"), 1), "y");
         ASSERT_EQ(pool.str(deep, whole.size()), whole);
     });
@@ -126,7 +78,7 @@ TEST(MemoryRunsOut, WhileNodesAreInterned) {
         std::size_t done = 0;
         std::size_t size = 0;
         std::optional<SymbolicExprTable> table;
-        attempt(number, [&] {
+        FailingMemory::attempt(number, [&] {
             table.emplace();
             for (; done < steps.size(); ++done) {
                 makeAny(*table, steps[done].first, steps[done].second);
@@ -135,7 +87,7 @@ TEST(MemoryRunsOut, WhileNodesAreInterned) {
         });
         if (!table)
             return;
-        ASSERT_EQ(failed, done < steps.size());
+        ASSERT_EQ(FailingMemory::hasFailed(), done < steps.size());
         ASSERT_EQ(table->size(), size);
         ASSERT_FALSE(table->has(size));
         // The step that failed is done now, and everything is as if it had never failed.
@@ -158,8 +110,8 @@ TEST(MemoryRunsOut, WhileANodeIsAdded) {
             for (std::size_t i = 0; i < before; ++i)
                 table.add(new SymbolicIntValue(source, static_cast<int>(i)));
             const auto* node = new SymbolicIntValue(source, 4711);
-            const bool added = attempt(number, [&] { table.add(node); }); // freed where it fails
-            ASSERT_EQ(added, !failed);
+            const bool added = FailingMemory::attempt(number, [&] { table.add(node); }); // freed where it fails
+            ASSERT_EQ(added, !FailingMemory::hasFailed());
             ASSERT_EQ(table.size(), before + (added ? 1 : 0));
             ASSERT_EQ(SymbolicIntValue(table, 4711).getId(table), before);
         });
@@ -169,7 +121,7 @@ TEST(MemoryRunsOut, WhileANodeIsAdded) {
 TEST(MemoryRunsOut, WhileTheTruthConstantsAreInterned) {
     forEachFailure([](std::size_t number) {
         SymbolicExprTable table;
-        attempt(number, [&] { table.addBoolSymbols(); });
+        FailingMemory::attempt(number, [&] { table.addBoolSymbols(); });
         ASSERT_EQ(table.getIdTRUE() == invalidId, table.getIdFALSE() == invalidId) << "both or none";
         table.addBoolSymbols();
         ASSERT_EQ(table.getIdFALSE(), 0U);
@@ -183,7 +135,8 @@ TEST(MemoryRunsOut, WhileQuillIsParsed) {
                                   "[" + times(3000, "1 ") + "]", times(3000, "a^") + "$", times(200, "((")}) {
         forEachFailure([&](std::size_t number) {
             const auto parser = PARSER_T<char>::create(256);
-            attempt(number, [&] { parser->delete_parse_tree(parser->generate_parse_tree(text.data(), text.size())); });
+            FailingMemory::attempt(
+                number, [&] { parser->delete_parse_tree(parser->generate_parse_tree(text.data(), text.size())); });
             const auto* const next = parser->generate_parse_tree("1 + x");
             ASSERT_NE(next, nullptr);
             ASSERT_EQ(next->children->code, 49);
@@ -216,7 +169,7 @@ TEST(MemoryRunsOut, WhileTheServiceWorks) {
             forEachFailure([&](std::size_t number) {
                 const FreshService service(caching);
                 std::string answer = expected; // what fails unseen, because it was not needed, leaves the answer right
-                attempt(number, [&] { answer = work(text); });
+                FailingMemory::attempt(number, [&] { answer = work(text); });
                 ASSERT_EQ(answer, expected);
                 ASSERT_EQ(work(text), expected);
             });
@@ -225,48 +178,3 @@ TEST(MemoryRunsOut, WhileTheServiceWorks) {
 
 } // namespace
 } // namespace VT::Testing
-
-using namespace VT::Testing;
-
-// The forms for arrays call these.
-void* operator new(std::size_t bytes) {
-    return orThrow(allocate(bytes));
-}
-
-void* operator new(std::size_t bytes, std::align_val_t alignment) {
-    return orThrow(allocate(bytes, static_cast<std::size_t>(alignment)));
-}
-
-void* operator new(std::size_t bytes, const std::nothrow_t&) noexcept {
-    return allocate(bytes);
-}
-
-void operator delete(void* place) noexcept {
-    release(place);
-}
-
-void operator delete(void* place, std::size_t) noexcept {
-    release(place);
-}
-
-void operator delete(void* place, std::align_val_t) noexcept {
-    release(place);
-}
-
-void operator delete(void* place, std::size_t, std::align_val_t) noexcept {
-    release(place);
-}
-
-#if !defined(__SANITIZE_ADDRESS__)
-// Stores that grow in place; the sanitizer has an allocator of its own.
-extern "C" void* realloc(void* place, std::size_t bytes) noexcept {
-    static const auto next = reinterpret_cast<void* (*)(void*, std::size_t)>(::dlsym(RTLD_NEXT, "realloc"));
-    if (untilFailure == 0) {
-        failed = true;
-        return nullptr;
-    }
-    if (untilFailure != never)
-        --untilFailure;
-    return next(place, bytes);
-}
-#endif

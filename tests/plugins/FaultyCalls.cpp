@@ -9,6 +9,7 @@
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
+#include <dirent.h>
 #include <dlfcn.h>
 #include <fcntl.h>
 #include <string_view>
@@ -91,8 +92,8 @@ struct Report {
     }
 } report;
 
-int openAt(const char* path, int flags, mode_t mode) noexcept {
-    return fails(Open) ? -1 : static_cast<int>(syscall(SYS_openat, AT_FDCWD, path, flags, mode));
+int openAt(int folder, const char* path, int flags, mode_t mode) noexcept {
+    return fails(Open) ? -1 : static_cast<int>(syscall(SYS_openat, folder, path, flags, mode));
 }
 
 mode_t modeOf(int flags, std::va_list arguments) {
@@ -109,20 +110,26 @@ int __libc_start_main(Main main, int argc, char** argv, void (*init)(), void (*f
     return next<Start>("__libc_start_main")(armedMain, argc, argv, init, fini, rtld, stack);
 }
 
-int open(const char* path, int flags, ...) {
-    std::va_list arguments;
-    va_start(arguments, flags);
-    const int descriptor = openAt(path, flags, modeOf(flags, arguments));
-    va_end(arguments);
-    return descriptor;
+#define VTSYM_OPEN(name, folder, parameters)                                                                           \
+    int name parameters {                                                                                              \
+        std::va_list arguments;                                                                                        \
+        va_start(arguments, flags);                                                                                    \
+        const int descriptor = openAt(folder, path, flags, modeOf(flags, arguments));                                  \
+        va_end(arguments);                                                                                             \
+        return descriptor;                                                                                             \
+    }
+VTSYM_OPEN(open, AT_FDCWD, (const char* path, int flags, ...))
+VTSYM_OPEN(open64, AT_FDCWD, (const char* path, int flags, ...))
+VTSYM_OPEN(openat, folder, (int folder, const char* path, int flags, ...))
+VTSYM_OPEN(openat64, folder, (int folder, const char* path, int flags, ...))
+#undef VTSYM_OPEN
+
+DIR* opendir(const char* path) {
+    return fails(Open) ? nullptr : next<DIR*(const char*)>("opendir")(path);
 }
 
-int open64(const char* path, int flags, ...) {
-    std::va_list arguments;
-    va_start(arguments, flags);
-    const int descriptor = openAt(path, flags, modeOf(flags, arguments));
-    va_end(arguments);
-    return descriptor;
+DIR* fdopendir(int descriptor) {
+    return fails(Open) ? nullptr : next<DIR*(int)>("fdopendir")(descriptor);
 }
 
 std::FILE* fopen(const char* path, const char* mode) {

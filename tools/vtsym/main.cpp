@@ -8,6 +8,8 @@
 
 #include <algorithm>
 #include <csignal>
+#include <cstdlib>
+#include <exception>
 #include <new>
 #include <optional>
 #include <string>
@@ -83,6 +85,20 @@ void complainOfMemory() {
     static_cast<void>(write(STDERR_FILENO, message.data(), message.size()) > 0);
 }
 
+/// Ends the process where memory ran out in a place that may not throw: destructors of the library for JSON take some,
+/// and the one that reads the command line copies words there.
+[[noreturn]] void endWhereNothingMayThrow() noexcept {
+    if (const std::exception_ptr thrown = std::current_exception())
+        try {
+            std::rethrow_exception(thrown);
+        } catch (const std::bad_alloc&) {
+            complainOfMemory();
+            _exit(wrongUsage);
+        } catch (...) {
+        }
+    std::abort();
+}
+
 /// Reads the command line and runs its command.  `onError` becomes the status for a command that throws.
 int readAndRun(Console& console, std::vector<std::string> arguments, std::optional<ExitStatus>& onError) {
     CommandLine commandLine(description, VTSYM_VERSION, programNotes);
@@ -138,6 +154,7 @@ int runProgram(Console& console, std::vector<std::string> arguments) {
 
 int main(int argc, char** argv) {
     vtsym::holdStandardStreams();
+    std::set_terminate(vtsym::endWhereNothingMayThrow);
     std::signal(SIGPIPE, SIG_IGN); // a reader that left is an error of writing, not the end of the process
     try {
         vtsym::Console console;
