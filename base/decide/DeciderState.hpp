@@ -67,6 +67,7 @@ struct Decider::State : DecisionParts {
     void confine(Decision& decision, Gate truth, Conditions conditions);
     void makeSmallest(Decision& decision, Gate truth, Conditions conditions);
     void keepFunctions(Decision& decision, Gate truth, Conditions conditions);
+    Decision withDifferentArguments(std::span<const SymbolicExprId> calls, Gate truth, Conditions conditions);
     Decision decide(AskedOf asked, std::span<const SymbolicExprId> ids, const Combine& combine);
     void askSolver(AskedOf asked, std::span<const SymbolicExprId> ids, Decision& decision);
     std::optional<bool> evaluate(SymbolicExprId condition, const Witness& witness);

@@ -9,6 +9,7 @@
 #include "base/decide/witness/CallCongruence.hpp"
 
 #include <algorithm>
+#include <utility>
 
 namespace VT {
 
@@ -80,19 +81,78 @@ void Decider::State::makeSmallest(Decision& decision, Gate truth, Conditions con
     });
 }
 
+/// Looks for a witness for which the names in arguments of calls have different values: the smallest ones, large
+/// ones on either side of 0, or ascending ones, in the order in which the question mentions them.  Undecided where none
+/// of these is possible, or takes too many steps.
+Decision Decider::State::withDifferentArguments(std::span<const SymbolicExprId> calls, Gate truth,
+                                                Conditions conditions) {
+    std::vector<const ReadCondition*> all(conditions.begin(), conditions.end());
+    constexpr std::int64_t large = std::int64_t{1} << 30U; // within 32 bits
+    std::vector<Gate> smallest{truth};
+    std::vector<Gate> largest{truth};
+    std::vector<Gate> lowest{truth};
+    std::vector<Gate> ascending{truth};
+    Unknown before = noUnknown;
+    std::int64_t value = 0;
+    const auto add = [&](Unknown name) {
+        all.push_back(&read(unknowns[name].node).condition);
+        const auto equals = [&](std::int64_t number) {
+            return circuit.between(unknowns[name].quantity, number, number);
+        };
+        const auto position = static_cast<std::int64_t>(smallest.size());
+        smallest.push_back(equals(value));
+        largest.push_back(equals(large + position));
+        lowest.push_back(equals(-large - position));
+        value = value > 0 ? -value : 1 - value; // 0, 1, -1, 2, ...
+        if (before != noUnknown) {
+            const auto [difference, isSwapped] = unknowns.difference(before, name);
+            ascending.push_back(isSwapped ? circuit.between(difference, 1, plusInfinite)
+                                          : circuit.between(difference, minusInfinite, -1));
+        }
+        before = name;
+    };
+    IdMap<bool> isMet;
+    for (const SymbolicExprId call : calls) {
+        const SymbolicExpr& node = *leafReader.table().get(call);
+        for (std::size_t i = 1; i < node.getNumInputs(); ++i) {
+            const TermPlan& argument = plans.of(node.getInput(i));
+            steps.take(argument.size());
+            for (const Unknown name : argument.unknowns()) {
+                if (unknowns[name].kind != UnknownKind::Free || isMet.find(unknowns[name].node) != nullptr)
+                    continue;
+                isMet.insert(unknowns[name].node, true);
+                add(name);
+            }
+        }
+    }
+    for (const std::vector<Gate>& truths : {smallest, largest, lowest, ascending}) {
+        try {
+            const Steps::Share share(steps, steps.left() / 4);
+            Decision different = hold(circuit.all(truths), all);
+            if (different.isYes() && different.witness)
+                return different;
+        } catch (const StepsUsedUp&) { // what the calls at fault say may be less
+        }
+    }
+    return {};
+}
+
 /// Looks for another witness while the one at hand gives a function two values for equal arguments: that the
-/// calls at fault agree where their arguments do becomes part of the question.
+/// calls at fault agree where their arguments do becomes part of the question.  Of many such calls a witness with
+/// different arguments is looked for first.
 void Decider::State::keepFunctions(Decision& decision, Gate truth, Conditions conditions) {
     std::vector<SymbolicExprId> calls;
     for (const ReadCondition* read : conditions)
         calls.insert(calls.end(), read->calls.begin(), read->calls.end());
     keepCallsOfOneFunction(leafReader.table(), calls);
+    const std::vector<SymbolicExprId> asMentioned = calls;
     std::ranges::sort(calls, {}, [&](SymbolicExprId call) { return unknowns[unknowns.free(call)].label; });
     calls.erase(std::unique(calls.begin(), calls.end()), calls.end());
     if (calls.size() < 2)
         return;
     std::vector<const ReadCondition*> all(conditions.begin(), conditions.end());
     CallCongruence functions(leafReader, unknowns, plans, steps);
+    bool hasManyCalls = false;
     while (decision.isYes()) {
         if (!decision.witness) { // its numbers are too large to evaluate arguments with
             decision = {Answer::Undecided, DecisionBound::Terms, std::nullopt};
@@ -101,6 +161,13 @@ void Decider::State::keepFunctions(Decision& decision, Gate truth, Conditions co
         const auto violations = functions.findViolations(calls, *decision.witness);
         if (violations.empty())
             return;
+        if (violations.size() == limits::callPairs && !std::exchange(hasManyCalls, true)) {
+            Decision different = withDifferentArguments(asMentioned, truth, all);
+            if (different.isYes() && different.witness && functions.findViolations(calls, *different.witness).empty()) {
+                decision = std::move(different);
+                return;
+            }
+        }
         std::vector<Gate> truths{truth};
         for (const auto& [first, second] : violations) {
             const ReadCondition& equal = congruence(first, second).condition;

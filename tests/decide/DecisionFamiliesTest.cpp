@@ -130,6 +130,8 @@ TEST(DecisionFamilies, HostileTextsStayWithinSteps) {
         {"calls with equal arguments", repeated(few, "", "&&", ones) + "&&" + repeated(few, "", "&&", calls),
          Answer::No, 800000},
         {"calls with different values", repeated(few, "", "&&", calls), Answer::Yes, limits::decisionSteps},
+        {"many calls with different values", repeated(many, "", "&&", calls), Answer::Yes, 600000},
+        {"calls with different values of a large name", repeated(2 * few, "a0>50", "&&", calls), Answer::Yes, 600000},
         {"quotients of sums of quotients", nested + "==7", Answer::Yes, 200000},
         {"guarded comparisons", repeated(few, "", "&&", guarded), Answer::Yes, 2000000},
         {"sums of two names", repeated(many, "", "&&", tied), Answer::No, 140000},
