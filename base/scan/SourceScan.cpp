@@ -87,9 +87,8 @@ struct SourceScanner::State {
 
     explicit State(const SourceScanOptions& given) : options(given) { renew(); }
 
-    State(const SourceScanOptions& given, std::shared_ptr<Assumptions> shared, bool common)
+    State(const SourceScanOptions& given, std::shared_ptr<Assumptions> shared)
         : options(given),
-          commonOnly(common),
           assumed(std::move(shared)) {
         renew();
     }
@@ -195,7 +194,7 @@ void SourceScanner::State::addWitnesses(const SourceFile& file, const std::vecto
 SourceScanner::SourceScanner(const SourceScanOptions& options) : state_(std::make_unique<State>(options)) {}
 
 SourceScanner::SourceScanner(const SourceScanner& other)
-    : state_(std::make_unique<State>(other.state_->options, other.state_->assumed, other.state_->commonOnly)) {}
+    : state_(std::make_unique<State>(other.state_->options, other.state_->assumed)) {}
 
 SourceScanner::SourceScanner(SourceScanner&&) noexcept = default;
 SourceScanner& SourceScanner::operator=(SourceScanner&&) noexcept = default;

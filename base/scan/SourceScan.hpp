@@ -132,7 +132,8 @@ struct SourceFile {
 class VTSYM_API SourceScanner {
 public:
     explicit SourceScanner(const SourceScanOptions& options = {});
-    /// A scanner with the same options and assumptions, which both keep once, for another thread.
+    /// A scanner with the same options and assumptions, which both keep once, for another thread.  The other one may
+    /// be scanning meanwhile.
     SourceScanner(const SourceScanner& other);
     SourceScanner(SourceScanner&&) noexcept;
     SourceScanner& operator=(const SourceScanner&) = delete;

@@ -11,6 +11,7 @@
 #include <array>
 #include <functional>
 #include <map>
+#include <tuple>
 
 namespace VT::Fuzz {
 
@@ -200,6 +201,44 @@ void demandFinding(const BranchFinding& finding, const Source& source, std::size
     }
 }
 
+/// The same for builds in which some condition of the file holds before it, each of three by itself; and what all of
+/// them have in common is the same for a scanner that is asked for nothing else.
+void demandAlternatives(const Source& source, const std::vector<std::size_t>& lineOf,
+                        const std::vector<Macros>& definitions, const std::vector<std::vector<Passed>>& worlds) {
+    SourceScanner scanner;
+    std::vector<Part> assumed;
+    for (const Line& line : source.lines)
+        if (!line.condition.text.empty() && assumed.size() < 3)
+            assumed.push_back(line.condition);
+    for (const Part& each : assumed) {
+        scanner.beginAlternative();
+        demand(!scanner.assume(each.text), "a condition can be assumed", each.text);
+    }
+    const auto keyOf = [](const BranchFinding& finding) {
+        return std::tuple(finding.region.line, finding.kind, finding.proposed, finding.configurations);
+    };
+    std::vector<decltype(keyOf({}))> inAll;
+    SourceScanner other(scanner);
+    scanner.scan(source.text, false, [&](const BranchFinding& finding) {
+        if (finding.configurations.empty() || finding.configurations.size() == assumed.size())
+            inAll.push_back(keyOf(finding));
+        for (const std::size_t alternative : finding.configurations) {
+            std::vector<std::vector<Passed>> such;
+            for (std::size_t i = 0; i < worlds.size(); ++i)
+                if (assumed[alternative].holds(definitions[i]))
+                    such.push_back(worlds[i]);
+            demandFinding(finding, source, lineOf[finding.region.line - 1], such);
+        }
+    });
+    other.reportCommonOnly(true);
+    std::size_t at = 0;
+    other.scan(source.text, false, [&](const BranchFinding& finding) {
+        demand(at < inAll.size() && inAll[at] == keyOf(finding), "what is common is in all", source.text);
+        ++at;
+    });
+    demand(at == inAll.size(), "all that is common is found", source.text);
+}
+
 } // namespace
 
 void fuzzScan(Input input) {
@@ -208,6 +247,7 @@ void fuzzScan(Input input) {
     std::vector<std::size_t> lineOf; ///< index of a line's directive by its number in the text, which begins at 1
     for (std::size_t i = 0; i < source.lines.size(); ++i)
         lineOf.insert(lineOf.end(), source.lines[i].kind == LineKind::Define ? 3 : 1, i);
+    std::vector<Macros> definitions;
     std::vector<std::vector<Passed>> worlds;
     static constexpr std::array<std::int64_t, 5> values{-2, -1, 0, 1, 2}; // -2 for what is not defined
     for (const std::int64_t a : values)
@@ -218,12 +258,14 @@ void fuzzScan(Input input) {
                     if (value != -2)
                         macros[name] = value;
                 worlds.push_back(interpret(source, macros));
+                definitions.push_back(std::move(macros));
             }
     SourceScanner scanner;
     scanner.scan(source.text, false, [&](const BranchFinding& finding) {
         demand(finding.region.line >= 1 && finding.region.line <= lineOf.size(), "a finding is in the file");
         demandFinding(finding, source, lineOf[finding.region.line - 1], worlds);
     });
+    demandAlternatives(source, lineOf, definitions, worlds);
 }
 
 void fuzzScanBytes(Input input) {

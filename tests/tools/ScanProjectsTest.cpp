@@ -136,6 +136,17 @@ TEST(ScanProjects, MessagesAreWhatTheProblemMatcherReads) {
         EXPECT_EQ("a:1.c:" + numbers.back() + ": " + match[pattern["message"].get<std::size_t>()].str(), line);
     }
     EXPECT_THAT(numbers, ::testing::ElementsAre("2", "2", "4"));
+    const std::string commit = "git add .; git -c user.name=n -c user.email=e commit -qm 1; ";
+    place.write("b.c", "#if B\n#if B\n#endif\n#endif\n#if C\nint c;\n#endif\n#if D\n#if D\n#endif\n#endif\n");
+    const ProgramResult compared =
+        runScript(place, "git init -q; " + commit +
+                             R"(printf '#if E\n#if E\n#endif\n#endif\nint c;\n#if D\n#if D\n#endif\n#endif\n' >b.c; )" +
+                             commit + "vtsym scan --diff HEAD~1..HEAD");
+    std::vector<std::string> read;
+    for (const std::string& line : linesOf(compared.out))
+        read.push_back((std::regex_match(line, expression) ? "is read: " : "is not: ") + line.substr(0, 22));
+    EXPECT_THAT(read, ::testing::ElementsAre("is read: b.c:2: new: '#if E' al", "is read: b.c:5: no condition in",
+                                             "is read: b.c:7: remains: '#if D", "is not: b.c:2: fixed: '#if B' "));
 }
 
 TEST(ScanProjects, StepsOfTheWorkflowRun) {
