@@ -5,6 +5,7 @@
 #include "benchmarks/Comparison.hpp"
 #include "tests/support/oracles/Solver.hpp"
 
+#include <algorithm>
 #include <cstdio>
 #include <map>
 #include <memory>
@@ -64,6 +65,12 @@ void implyAgainLibrary(benchmark::State& state, std::int64_t) {
         [](auto& decider) {
             for (const auto& [a, b] : corpus().pairs)
                 benchmark::DoNotOptimize(decider->implies(a, b));
+        },
+        [&](auto& decider) {
+            state.counters["pairs undecided"] =
+                static_cast<double>(std::ranges::count_if(corpus().pairs, [&](const auto& pair) {
+                    return decider->classify(pair.first, pair.second).kind == RelationKind::Undecided;
+                }));
         });
 }
 
@@ -235,11 +242,6 @@ const bool registered = [] {
                  .items = static_cast<double>(choices),
                  .unit = "choice"});
     }
-    Decider decider(corpus().table);
-    std::size_t undecided = 0;
-    for (const auto& [a, b] : corpus().pairs)
-        undecided += decider.classify(a, b).kind == RelationKind::Undecided ? 1U : 0U;
-    std::printf("%zu of %zu corpus pairs stay undecided\n", undecided, corpus().pairs.size());
     return true;
 }();
 

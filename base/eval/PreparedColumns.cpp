@@ -93,7 +93,10 @@ PreparedExprColumns::PreparedExprColumns(const PreparedExpr& expression, std::sp
     placeColumns(columns);
     placeOperations();
     constexpr std::size_t lineRows = sizeof(Line64) / sizeof(double);
-    const std::size_t room = limits::blockBytes / (sizeof(double) * std::max<std::size_t>(bufferCount_, 1));
+    std::size_t rowBytes = bufferCount_ * sizeof(double) + bytesOf(resultType());
+    for (const Source& source : sources_)
+        rowBytes += bytesOf(expression_.types_[source.cell]);
+    const std::size_t room = limits::blockBytes / rowBytes;
     blockRows_ = std::max(room / lineRows * lineRows, limits::minimumBlockRows);
     bufferLines_ = blockRows_ / lineRows | 1U;
     storage_.resize(bufferCount_ * bufferLines_);

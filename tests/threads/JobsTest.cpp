@@ -162,6 +162,24 @@ TEST(Jobs, ShareStepsInOrder) {
     EXPECT_THAT(linesOf(outs[0]).back(), ::testing::HasSubstr("impl"));
 }
 
+/// Address space for a few stacks only.  Sanitizers reserve more than any limit.
+TEST(Jobs, AreOneWhereTheSystemRefusesThreads) {
+#if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
+    GTEST_SKIP() << "a sanitizer takes more address space than the limit";
+#endif
+    std::string texts;
+    for (int i = 0; i < 3000; ++i)
+        texts += "A == " + std::to_string(i) + " && B\n";
+    const std::string expected = runProgram({"convert", "--jobs", "1"}, texts).out;
+    const TemporaryFolder place;
+    for (const char* const kilobytes : {"150000", "300000", "600000"}) {
+        const ProgramResult limited =
+            runScript(place, "ulimit -v " + std::string(kilobytes) + "; vtsym convert --jobs 64", texts);
+        EXPECT_EQ(limited.status, 0) << kilobytes << limited.err;
+        EXPECT_EQ(limited.out, expected) << kilobytes;
+    }
+}
+
 TEST(Jobs, AreANumber) {
     for (const char* const wrong : {"0", "-1", "many", "1025", "2x", ""})
         EXPECT_EQ(runProgram({"scan", "--jobs", wrong, "."}).status, 2) << wrong;

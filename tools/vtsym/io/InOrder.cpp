@@ -2,7 +2,8 @@
 //
 // Method: a pipeline of three filters, the first and the last in order.  As many items are under way as there are
 // slots, so that the item of a slot is finished before the slot is used again.  An exception waits in its slot until
-// the items before it are finished. Relies on: threads of an arena have numbers below its size.
+// the items before it are finished.  Where the system refuses threads, this one does all of the work.
+// Relies on: threads of an arena have numbers below its size.
 #include "tools/vtsym/io/InOrder.hpp"
 
 #include <oneapi/tbb/global_control.h>
@@ -11,8 +12,12 @@
 #include <oneapi/tbb/task_arena.h>
 
 #include <atomic>
+#include <cstdlib>
 #include <exception>
+#include <latch>
 #include <optional>
+#include <semaphore>
+#include <thread>
 #include <utility>
 #include <vector>
 
@@ -134,6 +139,42 @@ bool nextOrFirst(const OrderedWork& work) {
     }
 }
 
+/// Whether the system has threads for so many workers, and memory for what each takes first.  oneTBB ends the program
+/// where it is refused a thread, so as many are started before, and ended.
+bool grantsThreads(std::size_t workers) {
+    std::latch end(1);
+    std::binary_semaphore started(0);
+    std::vector<std::thread> threads;
+    threads.reserve(workers);
+    bool isGranted = true;
+    try {
+        while (threads.size() + 1 < workers) {
+            threads.emplace_back([&] {
+                void* const volatile room = std::malloc(1); // NOLINT: takes an arena of the allocator
+                std::free(room);                            // NOLINT
+                started.release();
+                end.wait();
+            });
+            started.acquire();
+        }
+    } catch (const std::exception&) {
+        isGranted = false;
+    }
+    end.count_down();
+    for (std::thread& thread : threads)
+        thread.join();
+    return isGranted;
+}
+
+/// Does all work in this thread.  The first two items are in their slots.
+void goOnOneByOne(const OrderedWork& work) {
+    for (const std::size_t slot : {0U, 1U}) {
+        work.work(slot, 0);
+        work.finish(slot);
+    }
+    runOneByOne(work);
+}
+
 } // namespace
 
 std::size_t processors() {
@@ -152,6 +193,8 @@ void runInOrder(std::size_t jobs, const OrderedWork& work) {
         work.finish(0);
         return;
     }
+    if (!grantsThreads(jobs))
+        return goOnOneByOne(work);
     const oneapi::tbb::global_control stack(oneapi::tbb::global_control::thread_stack_size, stackBytes);
     const oneapi::tbb::global_control threads(oneapi::tbb::global_control::max_allowed_parallelism, jobs);
     oneapi::tbb::task_arena arena(static_cast<int>(jobs));

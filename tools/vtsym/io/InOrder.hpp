@@ -31,7 +31,8 @@ constexpr std::size_t slotsFor(std::size_t jobs) {
     return jobs == 1 ? 1 : 32 * jobs;
 }
 
-/// Works on all items with so many workers and slotsFor() them; on a single item, or with one worker, in this thread.
+/// Works on all items with so many workers and slotsFor() them; on a single item, with one worker, or where the system
+/// refuses threads, in this thread.
 void runInOrder(std::size_t jobs, const OrderedWork& work);
 
 /// The same one item after another, in slot 0.
