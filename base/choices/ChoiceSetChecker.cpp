@@ -45,7 +45,7 @@ ChoiceSetReport ChoiceSetChecker::check(SymbolicExprId parent, std::span<const S
         return report;
     // Nothing is known of a context that may never hold.
     OrdinaryChoices ordinary = state.ordinaryIn(parentHolds.isYes() ? context : invalidId);
-    const std::size_t left = defaultChoice.value_or(choices.size()); // no condition of its own
+    const std::size_t left = defaultChoice.value_or(choices.size());       // no condition of its own
     std::vector<SymbolicExprId> holds(choices.size(), table.getIdFALSE()); // which overlaps nothing
     for (std::size_t i = 0; i < choices.size(); ++i)
         if (i != left)

@@ -27,9 +27,11 @@ std::string next(const std::string& number, int count) {
 std::string randomClauses(std::mt19937_64& random, int switches, int clauses) {
     return joined(clauses, "&&", [&](const std::string&) {
         std::string clause;
-        for (int i = 0; i < 3; ++i)
-            clause += (i > 0 ? " || " : "") + std::string(random() % 2 == 0 ? "!" : "") + "s" +
-                      std::to_string(random() % static_cast<std::uint64_t>(switches));
+        for (int i = 0; i < 3; ++i) {
+            const std::uint64_t which = random() % static_cast<std::uint64_t>(switches);
+            const bool isNegated = random() % 2 == 0;
+            clause += std::string(i > 0 ? " || " : "") + (isNegated ? "!s" : "s") + std::to_string(which);
+        }
         return clause;
     });
 }

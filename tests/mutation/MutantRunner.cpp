@@ -1,4 +1,5 @@
-// Runs the tests against each mutant that was compiled in: vtsym_mutants MUTANTS EXPLAINED [--minutes M] [--seed S].
+// Runs the tests against each mutant that was compiled in:
+// vtsym_mutants MUTANTS EXPLAINED [--minutes M] [--seed S] [--seconds S] [--jobs J].
 //
 // Each test runs once without a mutant, which gives its time and the mutants that it evaluates.  A mutant is then
 // judged by the tests that evaluate it, each in a forked process with a bound of time and memory, first those that are
@@ -129,24 +130,59 @@ std::pair<bool, double> passes(const Test& test, int mutant, double limit) {
     return {WIFEXITED(status) && WEXITSTATUS(status) == 0, seconds};
 }
 
+struct Options {
+    double minutes = 1e9;
+    double seconds = 1e9; ///< of tests for a mutant
+    unsigned long seed = 1;
+    unsigned jobs = std::max(1U, std::thread::hardware_concurrency());
+};
+
+/// Calls with the numbers below `count`, each in one of several processes.
+template <class Call>
+void inProcesses(unsigned jobs, std::size_t count, Call makeCall) {
+    auto* const next = shared<std::atomic<std::size_t>>(1);
+    std::vector<pid_t> children;
+    for (unsigned i = 0; i < jobs; ++i) {
+        const pid_t child = fork();
+        if (child == 0) {
+            auto call = makeCall();
+            for (std::size_t at = (*next)++; at < count && call(at); at = (*next)++) {
+            }
+            _exit(0);
+        }
+        children.push_back(child);
+    }
+    for (const pid_t child : children)
+        waitpid(child, nullptr, 0);
+}
+
 /// Runs every test without a mutant; drops those that fail, which cannot judge.
-void learn(std::vector<Test>& tests, std::size_t mutants) {
-    std::erase_if(tests, [&](Test& test) {
-        std::fill_n(reached, mutants, static_cast<unsigned char>(0));
-        bool passed = false;
-        std::tie(passed, test.seconds) = passes(test, 0, 300);
-        test.reaches.assign(reached, reached + mutants);
-        if (!passed)
-            std::cout << "left out, since it fails here without a mutant: " << test.name << std::endl;
-        return !passed;
+void learn(std::vector<Test>& tests, std::size_t mutants, unsigned jobs) {
+    auto* const rows = shared<unsigned char>(tests.size() * mutants);
+    auto* const seconds = shared<double>(tests.size()); // negative for one that failed
+    inProcesses(jobs, tests.size(), [&] {
+        return [&](std::size_t i) {
+            reached = rows + i * mutants;
+            const auto [passed, taken] = passes(tests[i], 0, 300);
+            seconds[i] = passed ? taken : -1;
+            return true;
+        };
     });
+    for (std::size_t i = 0; i < tests.size(); ++i) {
+        tests[i].seconds = seconds[i];
+        tests[i].reaches.assign(rows + i * mutants, rows + (i + 1) * mutants);
+        if (seconds[i] < 0)
+            std::cout << "left out, since it fails here without a mutant: " << tests[i].name << std::endl;
+    }
+    std::erase_if(tests, [](const Test& test) { return test.seconds < 0; });
 }
 
 class Worker {
 public:
-    Worker(const std::vector<Mutant>& mutants, const std::vector<Test>& tests, int* verdicts)
+    Worker(const std::vector<Mutant>& mutants, const std::vector<Test>& tests, double seconds, int* verdicts)
         : mutants_(mutants),
           tests_(tests),
+          seconds_(seconds),
           verdicts_(verdicts) {}
 
     void judge(int mutant) {
@@ -158,22 +194,24 @@ public:
         std::map<std::size_t, int>& kills = kills_[mutants_[number].source];
         const auto cost = [&](std::size_t i) { return (tests_[i].seconds + 0.002) / (1 + kills[i]); };
         std::ranges::stable_sort(order, {}, cost);
+        double left = seconds_;
         for (const std::size_t i : order)
-            if (!passes(tests_[i], mutant, 5 * tests_[i].seconds + 1).first) {
+            if ((left -= tests_[i].seconds) > 0 && !passes(tests_[i], mutant, 5 * tests_[i].seconds + 1).first) {
                 ++kills[i];
                 verdicts_[mutant] = static_cast<int>(i) + 1;
                 return;
             }
         verdicts_[mutant] = order.empty() ? Unreached : Survived;
-        const Mutant& left = mutants_[number];
+        const Mutant& whole = mutants_[number];
         const std::string line = (order.empty() ? "not evaluated\t" : "survived\t") + std::to_string(mutant) + "\t" +
-                                 left.line + "\t" + left.change + "\n";
+                                 whole.line + "\t" + whole.change + "\n";
         static_cast<void>(!write(STDOUT_FILENO, line.data(), line.size())); // whole, whichever process writes
     }
 
 private:
     const std::vector<Mutant>& mutants_;
     const std::vector<Test>& tests_;
+    double seconds_;
     int* verdicts_;
     std::map<std::string, std::map<std::size_t, int>> kills_;
 };
@@ -211,35 +249,34 @@ int report(const std::vector<Mutant>& mutants, const std::vector<Test>& tests, c
 int main(int argc, char** argv) {
     using namespace VT::Mutation;
     testing::InitGoogleTest(&argc, argv);
-    double minutes = 1e9;
-    unsigned long seed = 1;
-    for (int i = 3; i + 1 < argc; i += 2)
-        std::strcmp(argv[i], "--minutes") == 0 ? void(minutes = std::strtod(argv[i + 1], nullptr))
-                                               : void(seed = std::strtoul(argv[i + 1], nullptr, 10));
+    Options options;
+    for (int i = 3; i + 1 < argc; i += 2) {
+        const std::string_view name = argv[i];
+        const double value = std::strtod(argv[i + 1], nullptr);
+        if (name == "--minutes")
+            options.minutes = value;
+        else if (name == "--seconds")
+            options.seconds = value;
+        else if (name == "--seed")
+            options.seed = static_cast<unsigned long>(value);
+        else if (name == "--jobs")
+            options.jobs = static_cast<unsigned>(value);
+    }
     const std::vector<Mutant> mutants = readMutants(argv[1]);
+    std::vector<Test> tests = allTests();
+    learn(tests, mutants.size(), options.jobs);
     reached = shared<unsigned char>(mutants.size());
     int* const verdicts = shared<int>(mutants.size());
-    std::vector<Test> tests = allTests();
-    learn(tests, mutants.size());
     std::vector<int> order(mutants.size() - 1);
     std::iota(order.begin(), order.end(), 1);
-    std::ranges::shuffle(order, std::mt19937_64(seed));
+    std::ranges::shuffle(order, std::mt19937_64(options.seed));
 
-    const auto end = std::chrono::steady_clock::now() + std::chrono::duration<double>(60 * minutes);
-    auto* const next = shared<std::atomic<std::size_t>>(1);
-    std::vector<pid_t> workers;
-    for (unsigned i = 0; i < std::max(1U, std::thread::hardware_concurrency()); ++i) {
-        const pid_t child = fork();
-        if (child == 0) {
-            Worker worker(mutants, tests, verdicts);
-            for (std::size_t at = (*next)++; at < order.size() && std::chrono::steady_clock::now() < end;
-                 at = (*next)++)
-                worker.judge(order[at]);
-            _exit(0);
-        }
-        workers.push_back(child);
-    }
-    for (const pid_t child : workers)
-        waitpid(child, nullptr, 0);
-    return report(mutants, tests, readExplained(argv[2]), {verdicts, mutants.size()}, seed);
+    const auto end = std::chrono::steady_clock::now() + std::chrono::duration<double>(60 * options.minutes);
+    inProcesses(options.jobs, order.size(), [&] {
+        return [&, worker = Worker(mutants, tests, options.seconds, verdicts)](std::size_t at) mutable {
+            worker.judge(order[at]);
+            return std::chrono::steady_clock::now() < end;
+        };
+    });
+    return report(mutants, tests, readExplained(argv[2]), {verdicts, mutants.size()}, options.seed);
 }
