@@ -206,11 +206,12 @@ bool QuickReader::readOperator() {
     const Beginning& beginning = (isQuill_ ? beginningsOfQuill : beginningsOfC)[static_cast<unsigned char>(c)];
     SymbolicOp op = beginning.alone;
     std::size_t length = 1;
-    for (std::size_t i = 0; i < Beginning::most; ++i)
+    for (std::size_t i = 0; i < Beginning::most; ++i) {
         if (beginning.seconds[i] != '\0' && beginning.seconds[i] == at_[1]) {
             op = beginning.pairs[i];
             length = 2;
         }
+    }
     if (op == SymbolicOp::None)
         return false;
     at_ += length;

@@ -52,8 +52,8 @@ SymbolicExprId compared(SymbolicExprTable& table, SymbolicOp op, SymbolicExprId 
 } // namespace
 
 IntegerSet valuesOf(const SymbolDomain& domain) {
-    const IntegerSet range(domain.min ? *domain.min : IntegerSet::minusInfinity,
-                           domain.max ? *domain.max : IntegerSet::plusInfinity);
+    IntegerSet range(domain.min ? *domain.min : IntegerSet::minusInfinity,
+                     domain.max ? *domain.max : IntegerSet::plusInfinity);
     if (!domain.values)
         return range;
     std::vector<IntegerSet::Interval> listed;

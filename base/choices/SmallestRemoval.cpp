@@ -47,12 +47,14 @@ public:
                 continue;
             part_.assign(1, i);
             seen[i] = true;
-            for (std::size_t at = 0; at < part_.size(); ++at)
-                for (const std::size_t next : neighbours_[part_[at]])
+            for (std::size_t at = 0; at < part_.size(); ++at) {
+                for (const std::size_t next : neighbours_[part_[at]]) {
                     if (!seen[next]) {
                         seen[next] = true;
                         part_.push_back(next);
                     }
+                }
+            }
             std::ranges::sort(part_);
             removal.isSmallest = solvePart() && removal.isSmallest;
             for (const std::size_t each : best_)
@@ -127,11 +129,12 @@ private:
     [[nodiscard]] std::size_t mostOverlaps() const {
         std::size_t most = part_.back();
         std::size_t degree = 0;
-        for (auto each = part_.rbegin(); each != part_.rend(); ++each)
+        for (auto each = part_.rbegin(); each != part_.rend(); ++each) { // NOLINT(modernize-loop-convert): clang 14
             if (!gone_[*each] && degrees_[*each] > degree) {
                 most = *each;
                 degree = degrees_[*each];
             }
+        }
         return degree == 0 ? positions_.size() : most;
     }
 

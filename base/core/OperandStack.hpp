@@ -25,10 +25,12 @@ class VTSYM_API OperandStack {
         const SymbolicExpr* node = nullptr;
     };
 
-protected:
-    OperandStack() = default;
+public:
     OperandStack(const OperandStack&) = delete;
     OperandStack& operator=(const OperandStack&) = delete;
+
+protected:
+    OperandStack() = default;
     ~OperandStack() = default;
 
     void push(SymbolicExprId id) { stack_.push_back(id); }

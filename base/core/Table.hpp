@@ -268,10 +268,11 @@ SymbolicExprId SymbolicExprTable::idOf(const Payload& node) const {
     // Another node may be where the remembered one was, so it is compared, which is cheaper than probing.
     if constexpr (!Node::equalWithinTolerance) {
         if (lastAnswer_.candidate == &node) {
-            if constexpr (Node::hasExactKeys)
+            if constexpr (Node::hasExactKeys) {
                 if (const std::uint64_t key = node.keyOf(Node::code);
                     NodeKeys::isExact(key) && keys_[lastAnswer_.id] == key)
                     return lastAnswer_.id;
+            }
             if (*nodes_[lastAnswer_.id] == static_cast<const SymbolicExpr&>(node))
                 return lastAnswer_.id;
         }

@@ -63,10 +63,11 @@ IntegerSet Axis::setOf(Cells cells) const {
     if (isTruth_)
         return cells == cellBit(0) ? point : point.complement();
     std::vector<IntegerSet::Interval> intervals;
-    for (std::size_t cell = 0; cell <= cuts_.size(); ++cell)
+    for (std::size_t cell = 0; cell <= cuts_.size(); ++cell) {
         if ((cells & cellBit(cell)) != 0)
             intervals.push_back({cell == 0 ? IntegerSet::minusInfinity : cuts_[cell - 1].at,
                                  cell == cuts_.size() ? IntegerSet::plusInfinity : cuts_[cell].at - 1});
+    }
     return IntegerSet::of(std::move(intervals));
 }
 
@@ -131,10 +132,11 @@ Grid::Rows Grid::rowsOf(const Box& box) const {
         const std::size_t count = rows.size();
         const Cells cells = box.cells[axis];
         const auto first = static_cast<std::size_t>(std::countr_zero(cells));
-        for (std::size_t cell = first + 1; cell < axes_[axis].cells(); ++cell)
+        for (std::size_t cell = first + 1; cell < axes_[axis].cells(); ++cell) {
             if ((cells & cellBit(cell)) != 0)
                 for (std::size_t i = 0; i < count; ++i)
                     rows.push_back(rows[i] + static_cast<std::uint32_t>(cell * strides_[axis]));
+        }
         for (std::size_t i = 0; i < count; ++i)
             rows[i] += static_cast<std::uint32_t>(first * strides_[axis]);
     }

@@ -17,8 +17,8 @@ bool isSumOfSeparateSets(const Cover& cover) {
     struct Part {
         Atom atom;
         IntegerSet::Interval interval;
-        bool isPoint; ///< and all of its cube
-        auto operator<=>(const Part&) const = default;
+        bool isPoint;                                  ///< and all of its cube
+        auto operator<=>(const Part&) const = default; // NOLINT(modernize-use-nullptr): no pointer here
     };
 
     boost::container::small_vector<Part, 32> parts;

@@ -208,9 +208,10 @@ private:
     void readPoints(const Grid& grid, const GroupedAxes& axes, std::span<const Word> on, std::span<const Word> off);
     void readComparisons(const GroupedAxes& axes);
     [[nodiscard]] std::size_t fewest(const Set& on, const Set& off) const;
-    bool find(const Set& on, const Set& off, std::size_t count);
+    bool find(const Set& on, const Set& off, std::size_t count); // NOLINT(misc-no-recursion): `count` falls
     bool findOne(const Set& on, const Set& off);
     bool findTwo(const Set& on, const Set& off, const Operands& ands, const Operands& ors);
+    // NOLINTNEXTLINE(misc-no-recursion): `count` falls
     bool takeOff(const Set& on, const Set& off, std::size_t count, const Operand& operand, bool isAnd);
     static void keep(Operands& operands, const Operand& operand);
     void collectSingle(const Set& on, const Set& off, Operands& ands, Operands& ors) const;

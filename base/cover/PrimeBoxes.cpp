@@ -130,10 +130,11 @@ void PrimeBoxes::offerRun(std::size_t first, std::size_t end, Cells cells, std::
     const Axis& axis = grid_.inner();
     if (!pointsStay_ || !axis.isPoints(first, end))
         return offer(cells, comparisons + axis.bounds(first, end));
-    for (std::size_t from = first; from < end; ++from)
+    for (std::size_t from = first; from < end; ++from) {
         for (std::size_t to = from + 2; to <= end; ++to)
             if (!axis.isPoints(from, to) && (cells & cellBit(from)) != 0 && (cells & cellBit(to - 1)) != 0)
                 offer(cells & cellsBefore(to) & ~cellsBefore(from), comparisons + axis.bounds(from, to));
+    }
 }
 
 /// The runs of the inner axis within some cells: those as wide as can be, the joined ones, and points, which take fewer
@@ -148,10 +149,11 @@ void PrimeBoxes::visitInner(Cells allowed, std::uint32_t comparisons) {
         Cells cells = cellsBefore(end) & ~cellsBefore(first);
         left &= ~cells;
         offerRun(first, end, cells, comparisons);
-        if (axis.bounds(first, end) > 1)
+        if (axis.bounds(first, end) > 1) {
             for (std::size_t cell = first; cell < end; ++cell)
                 if (axis.isPoint(cell))
                     offerRun(cell, cell + 1, cellBit(cell), comparisons);
+        }
         std::uint32_t holes = 0;
         for (Cells rest = left; rest != 0;) {
             const auto next = static_cast<std::size_t>(std::countr_zero(rest));

@@ -104,6 +104,7 @@ std::vector<SymbolicExprId> Assumptions::relevantTo(std::span<const SymbolicExpr
     }
     std::ranges::sort(found);
     std::vector<SymbolicExprId> relevant;
+    relevant.reserve(found.size());
     for (const std::size_t operand : found)
         relevant.push_back(operands_[operand]);
     return relevant;

@@ -238,9 +238,10 @@ bool ConditionReader::addBits(Cases& cases, SymbolicOp op, Gate guard, const Rat
     return bits.has_value();
 }
 
+// NOLINTNEXTLINE(misc-no-recursion): once
 std::optional<RationalForm> ConditionReader::masked(const RationalForm& form, std::int64_t mask) {
-    if (mask < 0) {                              // all but the other bits
-        const auto others = masked(form, ~mask); // NOLINT(misc-no-recursion): once
+    if (mask < 0) { // all but the other bits
+        const auto others = masked(form, ~mask);
         return others ? combine(form, 1, *others, -1) : std::nullopt;
     }
     std::optional<RationalForm> sum = RationalForm();

@@ -65,11 +65,12 @@ std::optional<Gate> ConditionReader::equalProducts(SymbolicExprId a, SymbolicExp
         return rest.empty() ? ofNumber(1) : valueOf(rest.front());
     };
     auto equal = compared(SymbolicOp::Equal, restOf(left), restOf(right));
-    for (const SymbolicExprId factor : common)
+    for (const SymbolicExprId factor : common) {
         if (const auto isZero = equal ? compared(SymbolicOp::Equal, valueOf(factor), ofNumber(0)) : std::nullopt)
             equal = circuit_.either(*equal, *isZero);
         else
             return std::nullopt;
+    }
     return equal;
 }
 
@@ -193,6 +194,7 @@ Gate ConditionReader::compareSmall(SymbolicOp op, const LinearForm& form) {
 }
 
 /// Where a sum, whose denominator does not count, equals 0 or is at most 0.
+// NOLINTNEXTLINE(misc-no-recursion): once, for an equality
 Gate ConditionReader::compareWide(SymbolicOp op, WideForm form) {
     constexpr unsigned longest = 2 * limits::formBits;
     while (form.parts.size() == 1 && isFloor(form.parts.front().unknown) && msb(abs(form.constant) + 1) < longest) {

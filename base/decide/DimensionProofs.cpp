@@ -128,10 +128,11 @@ DimensionOrder DimensionProofs::compare(SymbolicExprId a, SymbolicExprId b) {
     const bool notLess = holds(SymbolicOp::GreaterThanEqual, a, b).isYes();
     if (notGreater && notLess)
         return DimensionOrder::Equal;
-    if (!holds(SymbolicOp::NotEqual, a, b).isYes())
+    if (!holds(SymbolicOp::NotEqual, a, b).isYes()) {
         return notGreater ? DimensionOrder::LessOrEqual
                : notLess  ? DimensionOrder::GreaterOrEqual
                           : DimensionOrder::Open;
+    }
     return notGreater ? DimensionOrder::Less : notLess ? DimensionOrder::Greater : DimensionOrder::Different;
 }
 

@@ -115,11 +115,12 @@ void PreparedExprColumns::placeColumns(std::span<const ValueColumn> columns) {
         if (cell < leaves)
             isRead[cell] = true;
     };
-    for (const detail::Operation& operation : expression_.operations_)
+    for (const detail::Operation& operation : expression_.operations_) {
         if (operation.code != detail::endCode) {
             read(operation.left);
             read(operation.right);
         }
+    }
     read(expression_.rootPlace_.at);
     for (std::size_t i = columns.size(); i > 0; --i) { // the last column of a slot counts
         const ValueColumn& column = columns[i - 1];
@@ -135,11 +136,12 @@ void PreparedExprColumns::placeColumns(std::span<const ValueColumn> columns) {
             buffers_[cell] = bufferCount_++;
         sources_.push_back({&column, cell, isArray});
     }
-    for (std::uint32_t cell = 0; cell < leaves; ++cell)
+    for (std::uint32_t cell = 0; cell < leaves; ++cell) {
         if (isRead[cell]) {
             buffers_[cell] = bufferCount_++;
             constants_.push_back(cell);
         }
+    }
 }
 
 std::uint32_t PreparedExprColumns::takeBuffer() {
@@ -155,10 +157,11 @@ void PreparedExprColumns::placeOperations() {
     const auto first = static_cast<std::uint32_t>(expression_.firstResult_);
     const auto count = static_cast<std::uint32_t>(expression_.operations_.size() - 1);
     std::vector<std::uint32_t> lastUses(count);
-    for (std::uint32_t i = 0; i < count; ++i)
+    for (std::uint32_t i = 0; i < count; ++i) {
         for (const std::uint32_t cell : {expression_.operations_[i].left, expression_.operations_[i].right})
             if (cell >= first)
                 lastUses[cell - first] = i;
+    }
     const std::uint32_t root = expression_.rootPlace_.at;
     lines_.reserve(count);
     for (std::uint32_t i = 0; i < count; ++i) {
@@ -168,11 +171,12 @@ void PreparedExprColumns::placeOperations() {
         if (result != root)
             buffers_[result] = takeBuffer();
         // Only now, so that results never overlap operands.
-        for (const std::uint32_t cell : {operation.left, operation.right})
+        for (const std::uint32_t cell : {operation.left, operation.right}) {
             if (cell >= first && lastUses[cell - first] == i) {
                 free_.push_back(buffers_[cell]);
                 lastUses[cell - first] = none; // both operands may be one
             }
+        }
     }
 }
 

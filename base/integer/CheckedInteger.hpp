@@ -51,7 +51,7 @@ public:
 
     Checked& operator+=(Checked other) { return *this = *this + other; }
 
-    friend auto operator<=>(Checked, Checked) = default;
+    friend auto operator<=>(Checked, Checked) = default; // NOLINT(modernize-use-nullptr): no pointer here
 
 private:
     static Checked ofValue(Integer value) {

@@ -109,11 +109,12 @@ bool StringifySymbolicExpr::pushKnown(SymbolicExprId id) {
 }
 
 StringifySymbolicExpr::Printed StringifySymbolicExpr::printed(SymbolicExprId id) {
-    if (!plainNames_)
+    if (!plainNames_) {
         if (const std::uint64_t version = predicate_.version(); version != knownUnder_) {
             known_.clear(); // texts stay, for those who hold them
             knownUnder_ = version;
         }
+    }
     return printedOnce(id);
 }
 

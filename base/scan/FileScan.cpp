@@ -123,10 +123,11 @@ FileScan::Known FileScan::knownFor(const DirectiveCondition& condition) {
     const auto ask = [&](const std::vector<MacroUnknownId>& unknowns) {
         asked.insert(asked.end(), unknowns.begin(), unknowns.end());
     };
-    if (!assumptions_.facts().empty()) // which may lead from the branches around to the condition alone
+    if (!assumptions_.facts().empty()) { // which may lead from the branches around to the condition alone
         for (std::size_t i = context_.size(), left = limits::branchesAssumedAbout; i-- > 0 && left > 0; --left)
             if (assumptions_.concern(context_[i].unknowns))
                 ask(context_[i].unknowns);
+    }
     for (std::size_t assumed = 0;;) { // directives lead to assumptions, and these to directives
         known.directives = context_.related(asked);
         for (const std::size_t fact : known.directives)
@@ -227,11 +228,12 @@ BranchCause FileScan::causeOf(const Known& known, const std::vector<std::size_t>
         at -= isBuild ? 0 : known.build.size();
         if (isBuild)
             cause = std::max(cause, BranchCause::Configuration);
-        else if (at < known.assumptions.size())
+        else if (at < known.assumptions.size()) {
             cause = std::max(cause, assumptions_.facts()[known.assumptions[at]].assumption->kind ==
                                             BuildAssumptions::Item::Kind::Absence
                                         ? BranchCause::Absence
                                         : BranchCause::Configuration);
+        }
     }
     return cause;
 }
@@ -239,10 +241,11 @@ BranchCause FileScan::causeOf(const Known& known, const std::vector<std::size_t>
 /// Finds definitions that enter a branch, where they are wanted.
 void FileScan::findWitness(const Directive& directive, const DirectiveCondition& condition, const Known& known) {
     const auto wanted = input_.witnesses->find(directive.line);
-    if (wanted != input_.witnesses->end() && wanted->second.empty())
+    if (wanted != input_.witnesses->end() && wanted->second.empty()) {
         wanted->second =
             configurationText(unknowns_, judge_.witness(condition.node, known.conditions),
                               [this](std::string_view name) { return input_.assumptions.isLogical(name); });
+    }
 }
 
 /// The operands that force a verdict, picked from the facts that are its reasons.

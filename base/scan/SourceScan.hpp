@@ -77,11 +77,11 @@ struct BranchFinding {
     /// Configurations of the build that the finding holds for, by number; none for one that holds in every build.
     std::vector<std::size_t> configurations{};
     bool hasOtherReasons = false; ///< in some of the configurations
-    std::string witness{};        ///< definitions that enter a branch that is dead in other configurations alone
-    std::size_t witnessOf = 0;    ///< the configuration that has them
     /// Whether it needs definitions of the build, as its reasons or as those of the branch before it in its chain that
     /// is always entered.
     bool needsDefinitions = false;
+    std::string witness{};     ///< definitions that enter a branch that is dead in other configurations alone
+    std::size_t witnessOf = 0; ///< the configuration that has them
 };
 
 /// Options of a scanner, for all of its files.

@@ -89,12 +89,13 @@ void VCService::addParameterAlias(const VTBlock* block, SymbolicExprId condition
     if (customizer == nullptr)
         return;
     std::vector<std::pair<std::string, std::string>> aliases;
-    for (std::string& parameter : parametersOf(parts_->table, condition))
+    for (std::string& parameter : parametersOf(parts_->table, condition)) {
         if (const auto replacement = customizer->parameterOfBlock(block, parameter)) {
             const int* const value = std::get_if<int>(&*replacement);
             std::string text = value != nullptr ? std::to_string(*value) : std::get<std::string>(*replacement);
             aliases.emplace_back(std::move(parameter), aliasText(std::move(text)));
         }
+    }
     auto& known = parts_->parameterAliases;
     std::vector<std::string> added;
     added.reserve(aliases.size());

@@ -77,11 +77,12 @@ unsigned ServiceParts::decisionMode() const {
 
 Decider& ServiceParts::decider() {
     std::unique_ptr<Decider>& decider = deciders.at(decisionMode());
-    if (decider == nullptr)
+    if (decider == nullptr) {
         decider = std::make_unique<Decider>(
             table, DecisionOptions{.keywordsInForce = keywordsInForce(),
                                    .bits32 = bits32,
                                    .solver = asksSolver ? &SolverPlugin::installed() : nullptr});
+    }
     decider->share(budget);
     return *decider;
 }

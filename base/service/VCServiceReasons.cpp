@@ -10,6 +10,7 @@ namespace VT {
 /// The assumptions that have to do with conditions, and then these.
 std::vector<SymbolicExprId> VCService::withAssumptions(const std::vector<VCSymbolicExprId>& conditions) {
     std::vector<SymbolicExprId> ids;
+    ids.reserve(conditions.size());
     for (const VCSymbolicExprId& condition : conditions)
         ids.push_back(condition.id());
     std::vector<SymbolicExprId> premises = parts_->assumptions.relevantTo(ids);

@@ -14,11 +14,13 @@ using RulesOfOperator = std::vector<const NodeRule*>;
 const std::array<RulesOfOperator, operatorCount>& nodeRules() {
     static const auto rules = [] {
         std::array<RulesOfOperator, operatorCount> byOperator;
-        for (const std::span<const NodeRule> family : {comparisonRules(), sumRules(), productRules()})
-            for (const NodeRule& rule : family)
+        for (const std::span<const NodeRule> family : {comparisonRules(), sumRules(), productRules()}) {
+            for (const NodeRule& rule : family) {
                 for (int code = 0; code < operatorCount; ++code)
                     if (rule.info.operators.contains(static_cast<SymbolicOp>(code)))
                         byOperator[static_cast<std::size_t>(code)].push_back(&rule);
+            }
+        }
         return byOperator;
     }();
     return rules;

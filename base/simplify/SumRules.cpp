@@ -120,7 +120,7 @@ bool LinearSum::read(const RuleContext& context, SymbolicExprId root) {
         return false;
     // How often a node occurs is known once everything above it has been counted.
     multiples.insert(root, 1);
-    for (auto next = order.rbegin(); next != order.rend(); ++next) {
+    for (auto next = order.rbegin(); next != order.rend(); ++next) { // NOLINT(modernize-loop-convert): clang 14
         const SymbolicExprId id = *next;
         const SymbolicExpr& node = context.node(id);
         if (!sumOps.contains(node.op()))

@@ -25,7 +25,7 @@ void SymbolicExprCopyVisitor::visit(const SymbolicString& node) {
 /// Copies the values that wait, one after the other: a chain of values is as long as the input makes it.
 void SymbolicExprCopyVisitor::bindValues() {
     try {
-        for (std::size_t next = 0; next < bindings_.size(); ++next) {
+        for (std::size_t next = 0; next < bindings_.size(); ++next) { // NOLINT(modernize-loop-convert): it grows
             const auto [name, sourceValue] = bindings_[next];
             table().registerValueId(name, copy(sourceValue));
         }

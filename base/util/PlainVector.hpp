@@ -70,6 +70,7 @@ public:
     }
 
 private:
+    // NOLINTBEGIN(bugprone-sizeof-expression): of pointers where these are the values
     void grow(std::size_t count) {
         constexpr std::size_t firstBytes = 960; // of a size that allocators keep ready
         const std::size_t capacity =
@@ -80,6 +81,8 @@ private:
         data_ = static_cast<Value*>(grown);
         capacity_ = capacity;
     }
+
+    // NOLINTEND(bugprone-sizeof-expression)
 
     Value* data_ = nullptr;
     std::size_t size_ = 0;

@@ -138,13 +138,14 @@ std::string Reader::pointer() const {
     constexpr std::size_t shown = 16;
     std::string pointer = open_.size() > shown ? "..." : "";
     for (std::size_t i = open_.size() > shown ? open_.size() - shown : 0; i < open_.size(); ++i) {
-        if (open_[i].part == Part::Symbols)
+        if (open_[i].part == Part::Symbols) {
             pointer.append("/").append(model_.symbols().empty() ? ""
                                                                 : shownText(model_.symbols().back().name, shownBytes));
-        else if (!isObject(open_[i].part))
+        } else if (!isObject(open_[i].part)) {
             pointer.append("/").append(std::to_string(open_[i].index));
-        else if (open_[i].member != nullptr)
+        } else if (open_[i].member != nullptr) {
             pointer.append("/").append(open_[i].member->name);
+        }
     }
     return pointer.empty() ? "the model" : pointer;
 }

@@ -88,7 +88,7 @@ void complainOfMemory() {
 /// Ends the process where memory ran out in a place that may not throw: destructors of the library for JSON take some,
 /// and the one that reads the command line copies words there.
 [[noreturn]] void endWhereNothingMayThrow() noexcept {
-    if (const std::exception_ptr thrown = std::current_exception())
+    if (const std::exception_ptr thrown = std::current_exception()) {
         try {
             std::rethrow_exception(thrown);
         } catch (const std::bad_alloc&) {
@@ -96,6 +96,7 @@ void complainOfMemory() {
             _exit(wrongUsage);
         } catch (...) {
         }
+    }
     std::abort();
 }
 

@@ -91,10 +91,11 @@ bool BoxSearch::leaveSides(std::size_t begin) {
     std::vector<std::vector<IntegerSet::Interval>> sides(part_.size());
     std::size_t looks = part_.size();
     for (std::size_t i = begin; i < meeting_.size(); ++i) {
-        for (const Constraint& side : boxes_[meeting_[i]]->constraints())
+        for (const Constraint& side : boxes_[meeting_[i]]->constraints()) {
             if (!part_[side.atom].isSubsetOf(side.set))
                 sides[side.atom].insert(sides[side.atom].end(), side.set.intervals().begin(),
                                         side.set.intervals().end());
+        }
         looks += 2 * boxes_[meeting_[i]]->constraints().size();
     }
     take(looks);

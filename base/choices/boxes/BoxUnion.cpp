@@ -22,11 +22,12 @@ namespace {
 std::int64_t nearestIn(const IntegerSet& set, std::int64_t value) {
     std::int64_t below = set.low();
     for (const auto& [low, high] : set.intervals()) {
-        if (value < low)
+        if (value < low) {
             return value <= below || static_cast<std::uint64_t>(low) - static_cast<std::uint64_t>(value) <=
                                          static_cast<std::uint64_t>(value) - static_cast<std::uint64_t>(below)
                        ? low
                        : below;
+        }
         if (value <= high)
             return value;
         below = high;
@@ -195,10 +196,11 @@ std::optional<std::uint32_t> BoxUnion::whole(const Cube& region, std::uint64_t& 
                 isLeft = keep(mask, sides.free, sides.free);
                 continue;
             }
-            for (const auto& [low, high] : side->set.intervals())
+            for (const auto& [low, high] : side->set.intervals()) {
                 for (auto at = std::ranges::upper_bound(sides.cuts, low) - 1;
                      at != sides.cuts.end() && *at <= high && isLeft; ++at, ++looks)
                     isLeft = keep(mask, sides.holding[static_cast<std::size_t>(at - sides.cuts.begin())], sides.free);
+            }
             ++side;
         }
         if (isLeft)
@@ -224,17 +226,19 @@ std::vector<std::uint32_t> BoxUnion::meeting(const BoxPart& part, const std::vec
             if (part[atom].isAll())
                 continue;
             Mask some = sides.free;
-            for (const auto& [low, high] : part[atom].intervals())
+            for (const auto& [low, high] : part[atom].intervals()) {
                 for (auto at = std::ranges::upper_bound(sides.cuts, low) - 1; at != sides.cuts.end() && *at <= high;
                      ++at, ++looks)
                     for (std::size_t word = 0; word < some.size(); ++word)
                         some[word] |= sides.holding[static_cast<std::size_t>(at - sides.cuts.begin())][word];
+            }
             keep(mask, some, some);
         }
-        for (std::size_t word = 0; word < mask.size(); ++word)
+        for (std::size_t word = 0; word < mask.size(); ++word) {
             for (std::uint64_t bits = mask[word]; bits != 0; bits &= bits - 1)
                 result.push_back(static_cast<std::uint32_t>(i * blockBoxes + word * 64 +
                                                             static_cast<std::size_t>(std::countr_zero(bits))));
+        }
     }
     take(steps, looks / BoxSearch::looksPerStep + result.size());
     return result;

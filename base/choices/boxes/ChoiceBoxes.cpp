@@ -62,17 +62,20 @@ Atom ChoiceBoxes::atomOf(SymbolicExprId name) {
 void ChoiceBoxes::findCuts() {
     cuts_.resize(atomCount_, {0, 0});
     const auto add = [&](const Constraint& side) {
-        for (const auto& [low, high] : side.set.intervals())
+        for (const auto& [low, high] : side.set.intervals()) {
             for (const std::int64_t end : {low, high})
                 if (end != IntegerSet::minusInfinity && end != IntegerSet::plusInfinity)
                     cuts_[side.atom] = {std::min(cuts_[side.atom].first, end), std::max(cuts_[side.atom].second, end)};
+        }
     };
     std::ranges::for_each(context_.constraints(), add);
-    for (const std::optional<Form>& form : forms_)
-        if (form)
+    for (const std::optional<Form>& form : forms_) {
+        if (form) {
             for (const Product& product : *form)
                 for (const Operand& operand : product.operands)
                     add(operand.allows);
+        }
+    }
 }
 
 /// What an operand that compares one name with integers allows.
@@ -208,10 +211,11 @@ std::vector<Cube> ChoiceBoxes::boxesOf(const Form& form) {
 Answer ChoiceBoxes::overlap(std::size_t a, std::size_t b) const {
     if (!isKnown(a) || !isKnown(b))
         return Answer::Undecided;
-    for (const Product& first : *forms_[a])
+    for (const Product& first : *forms_[a]) {
         for (const Product& second : *forms_[b])
             if (!first.isEmpty && !second.isEmpty && first.box.intersects(second.box))
                 return Answer::Yes;
+    }
     return Answer::No;
 }
 

@@ -34,7 +34,7 @@ private:
     }
 
     /// Whether some point of a region is in none of the further boxes, and not hidden.
-    bool isSomewhere(Cube region, std::span<const Cube> further) {
+    bool isSomewhere(const Cube& region, std::span<const Cube> further) {
         BoxGap gap = boxes_.ask(*boxes_.hiding_, region, further);
         if (gap.answer != Answer::Yes)
             return false;
@@ -139,11 +139,12 @@ private:
             if (form_.size() > 1 && product.operands.size() > 1 &&
                 !allComparisons([&](const Constraint& each) { return makesDifference(each, own, others); }))
                 return false;
-            for (const Operand& operand : product.operands)
+            for (const Operand& operand : product.operands) {
                 if (!operand.shorter.empty() && form_.size() + product.operands.size() > 2 &&
                     !allComparisons(
                         [&](const Constraint& each) { return isOtherOperand(product, operand, each, others); }))
                     return false;
+            }
         }
         return true;
     }

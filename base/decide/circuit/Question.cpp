@@ -35,13 +35,14 @@ void Question::clear() {
 }
 
 void Question::rankUnknowns() {
-    for (const std::span<const Unknown> met : mentioned_)
+    for (const std::span<const Unknown> met : mentioned_) {
         for (const Unknown unknown : met) {
             if (unknown >= ranks_.size())
                 ranks_.resize(unknown + 1);
             if (ranks_[unknown].question != question_)
                 ranks_[unknown] = {question_, ranked_++};
         }
+    }
     mentioned_.clear();
 }
 

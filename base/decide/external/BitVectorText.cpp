@@ -43,6 +43,7 @@ unsigned widthOf(std::int64_t value) {
     return static_cast<unsigned>(std::bit_width(static_cast<std::uint64_t>(value < 0 ? ~value : value))) + 1;
 }
 
+// NOLINTNEXTLINE(cppcoreguidelines-virtual-class-destructor): final
 class BitVectorText final : SmtWriter {
 public:
     /// `isColumnwise` writes & | ^ ~ alone.

@@ -32,6 +32,7 @@ constexpr std::string_view bitLaws = R"((declare-fun band (Int Int) Int)
  (= (= (mod a 2) 1) (and (= (mod x 2) 1) (= (mod y 2) 1)))))
 )";
 
+// NOLINTNEXTLINE(cppcoreguidelines-virtual-class-destructor): final
 class IntegerText final : SmtWriter {
 public:
     explicit IntegerText(const SmtSource& source) : SmtWriter(source) {}
@@ -266,14 +267,15 @@ private:
         if (a.integer)
             return masked(b.name, *a.integer);
         out_.hasBits = true;
-        const std::string value = compound("band", a.name, b.name);
+        std::string value = compound("band", a.name, b.name);
         SmtWriter::write({"(assert (laws ", a.name, " ", b.name, " ", value, "))\n"});
         return value;
     }
 
+    // NOLINTNEXTLINE(misc-no-recursion): once
     static std::string masked(const std::string& a, std::int64_t mask) {
         if (mask < 0)
-            return compound("-", a, masked(a, ~mask)); // NOLINT(misc-no-recursion): once
+            return compound("-", a, masked(a, ~mask));
         std::string sum = "(+ 0";
         unsigned first = 0; // of a run of ones
         bool inside = false;

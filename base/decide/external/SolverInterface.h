@@ -7,6 +7,7 @@
 #ifndef VTSYM_SOLVER_INTERFACE_H
 #define VTSYM_SOLVER_INTERFACE_H
 
+/* C and C++ share it.  NOLINTBEGIN(modernize-use-using,modernize-redundant-void-arg) */
 #ifdef __cplusplus
 extern "C" {
 #endif
@@ -42,5 +43,7 @@ typedef const struct vtsym_solver_functions* (*vtsym_solver_entry)(void);
 #ifdef __cplusplus
 }
 #endif
+
+/* NOLINTEND(modernize-use-using,modernize-redundant-void-arg) */
 
 #endif

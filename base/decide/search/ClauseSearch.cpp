@@ -379,7 +379,7 @@ ClauseSearch::Variable ClauseSearch::nextDecision() {
             heapAt_[last] = 0;
             siftDown(0);
         }
-        if (values_[top * 2] == 0)
+        if (values_[std::size_t{top} * 2] == 0)
             return top;
     }
     return notInHeap;

@@ -41,11 +41,12 @@ Decision ConditionSearch::find(const Question& question, std::span<const Unknown
 
 void ConditionSearch::encode() {
     vertices_.clear();
-    for (const LevelInfo& level : question_->levels())
+    for (const LevelInfo& level : question_->levels()) {
         if (level.minus != noUnknown) {
             addVertex(level.plus);
             addVertex(level.minus);
         }
+    }
     clauses_.begin(vertices_.size() + 1);
     encodeLevels();
     encodeNodes();
@@ -58,16 +59,17 @@ void ConditionSearch::addVertex(Unknown unknown) {
 
 void ConditionSearch::encodeLevels() {
     levels_.assign(question_->levels().size(), {});
-    for (const Question::Node& node : question_->nodes())
+    for (const Question::Node& node : question_->nodes()) {
         if (question_->isComparison(node)) {
             std::vector<std::int64_t>& ends = levels_[node.level].ends;
             ends.insert(ends.end(), question_->ends(node).begin(), question_->ends(node).end());
         }
+    }
     for (Level level = 0; level < levels_.size(); ++level)
         addLevel(level);
     // What bounds the unknowns themselves holds always.
     const Literal truth = clauses_.addVariable(true);
-    for (const LevelInfo& level : question_->levels())
+    for (const LevelInfo& level : question_->levels()) {
         for (const Unknown unknown : {level.plus, level.minus}) {
             const Vertex* vertex = level.minus != noUnknown ? vertices_.find(unknown) : nullptr;
             if (vertex == nullptr)
@@ -78,6 +80,7 @@ void ConditionSearch::encodeLevels() {
             if (info.low != minusInfinite)
                 clauses_.addBound(truth, {*vertex, 0, -info.low});
         }
+    }
     clauses_.addClause(std::span(&truth, 1));
 }
 
@@ -119,10 +122,11 @@ void ConditionSearch::encodeNodes() {
     const std::vector<Question::Node>& nodes = question_->nodes();
     std::vector<std::uint8_t> uses(nodes.size(), 0);
     uses[question_->root() >> 1U] = static_cast<std::uint8_t>(turned(usedAsIs, question_->root()));
-    for (std::size_t i = nodes.size(); i-- > 1;)
+    for (std::size_t i = nodes.size(); i-- > 1;) {
         if (!question_->isComparison(nodes[i]))
             for (const Gate operand : question_->operands(nodes[i]))
                 uses[operand >> 1U] |= static_cast<std::uint8_t>(turned(uses[i], operand));
+    }
     gates_.assign(nodes.size(), 0);
     atZero_.assign(nodes.size(), 1);
     for (std::size_t i = 1; i < nodes.size(); ++i) {
@@ -161,11 +165,12 @@ Literal ConditionSearch::addAnd(const Question::Node& node, unsigned uses) {
     const std::span<const Gate> operands = question_->operands(node);
     const bool atZero = std::ranges::all_of(operands, [&](Gate gate) { return holdsAtZero(gate); });
     const Literal all = clauses_.addVariable(atZero);
-    if ((uses & usedAsIs) != 0)
+    if ((uses & usedAsIs) != 0) {
         for (const Gate operand : operands) {
             const Literal implied[] = {negated(all), literalOf(operand)};
             clauses_.addClause(implied);
         }
+    }
     if ((uses & usedNegated) != 0) {
         std::vector<Literal> clause{all};
         for (const Gate operand : operands)

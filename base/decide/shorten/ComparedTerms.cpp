@@ -100,7 +100,7 @@ ComparedTerms::Number ComparedTerms::numberOf(SymbolicExprId root) {
 
 ComparedTerms::Number ComparedTerms::compute(SymbolicExprId id, const SymbolicExpr& node) {
     const SymbolicOp op = node.op();
-    const Number opaque{Number::Kind::Linear, {{{unknownOf(id, false), 1}}, 0}};
+    Number opaque{Number::Kind::Linear, {{{unknownOf(id, false), 1}}, 0}};
     const std::size_t count = node.getNumInputs();
     for (std::size_t i = 0; i < count; ++i) {
         const Number& operand = *numbers_.find(node.getInput(i));
@@ -126,10 +126,11 @@ ComparedTerms::Number ComparedTerms::compute(SymbolicExprId id, const SymbolicEx
         form = a.isConstant() ? combine(b, a.constant, {}, 0) : combine(a, b.constant, {}, 0);
     else if (op == SymbolicOp::ShiftLeft && !a.isConstant() && b.isConstant())
         form = shiftedLeft(a, b.constant);
-    else if (a.isConstant() && b.isConstant())
+    else if (a.isConstant() && b.isConstant()) {
         if (const auto value = count == 1 ? integerResult(op, a.constant) : integerResult(op, a.constant, b.constant);
             value && isWithinBound(*value))
             form = LinearForm{{}, *value};
+    }
     return form ? Number{Number::Kind::Linear, *std::move(form)} : opaque;
 }
 

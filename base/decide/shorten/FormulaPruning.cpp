@@ -49,10 +49,11 @@ void FormulaPruning::evaluate(Formula formula) {
         bool isFirst = true;
         for (const Formula operand : formulas_.operands(below_[i])) {
             const Points& other = valueOf(operand);
-            for (std::size_t word = 0; word < value.size(); ++word)
+            for (std::size_t word = 0; word < value.size(); ++word) {
                 value[word] = isFirst             ? other[word]
                               : kind == Kind::And ? value[word] & other[word]
                                                   : value[word] | other[word];
+            }
             isFirst = false;
         }
     }

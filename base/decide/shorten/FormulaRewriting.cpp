@@ -168,10 +168,11 @@ std::optional<FormulaRewriting::Quotient> FormulaRewriting::without(Formula chai
 /// Comparisons that are saved where a part is taken out of a chain's operands, but for its own.
 std::size_t FormulaRewriting::savedBy(Formula common, Kind inner, const Formulas::Operands& operands) {
     std::size_t saved = 0;
-    for (const Formula operand : operands)
+    for (const Formula operand : operands) {
         if (formulas_.kind(operand) == inner)
             if (const auto quotient = without(operand, common))
                 saved += quotient->saved;
+    }
     return saved;
 }
 
@@ -188,10 +189,11 @@ Formula FormulaRewriting::bestCommonOperand(Kind kind, const Formulas::Operands&
             order.push_back(common);
         sum += comparisons;
     };
-    for (const Formula operand : operands)
+    for (const Formula operand : operands) {
         if (formulas_.kind(operand) == inner)
             for (const Formula each : formulas_.operands(operand))
                 add(each, formulas_.comparisons(each));
+    }
     if (!takeWork(order.size()))
         return Formulas::no;
     if (order.size() <= limits::factoredParts) {

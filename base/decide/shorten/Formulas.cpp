@@ -123,7 +123,7 @@ Formula Formulas::chain(Kind kind, std::span<const Formula> operands) {
         return kept.empty() ? neutral : kept.front();
     Operands sorted = kept;
     std::ranges::sort(sorted);
-    std::size_t key = static_cast<std::size_t>(kind);
+    auto key = static_cast<std::size_t>(kind);
     boost::hash_range(key, sorted.begin(), sorted.end());
     const auto [begin, end] = chainIndex_.equal_range(key);
     for (auto at = begin; at != end; ++at) {

@@ -76,7 +76,7 @@ private:
     };
 
     Formula add(Node node);
-    bool merge(Kind kind, Formula leaf);
+    bool merge(Kind kind, Formula operand);
     [[nodiscard]] bool isRedundant(Kind kind, Formula operand) const;
 
     Comparisons comparisonsOf_;

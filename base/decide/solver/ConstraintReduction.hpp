@@ -135,10 +135,11 @@ private:
 
     [[nodiscard]] std::size_t leastFactor(const Line& row) const {
         std::size_t least = variables_;
-        for (std::size_t i = 0; i < variables_; ++i)
+        for (std::size_t i = 0; i < variables_; ++i) {
             if (row[i] != Number(0) &&
                 (least == variables_ || IntegerRows::magnitude(row[i]) < IntegerRows::magnitude(row[least])))
                 least = i;
+        }
         return least;
     }
 
@@ -172,11 +173,12 @@ private:
     }
 
     void fix(Problem<Number>& problem, std::size_t variable, const Number& value) {
-        for (std::vector<Line>* rows : {&problem.equalities, &problem.inequalities})
+        for (std::vector<Line>* rows : {&problem.equalities, &problem.inequalities}) {
             for (Line& line : *rows) {
                 line.back() += line[variable] * value;
                 line[variable] = Number(0);
             }
+        }
         Line constant(variables_ + 1);
         constant.back() = value;
         problem.eliminations.push_back({variable, {}, std::move(constant)});
@@ -338,6 +340,7 @@ private:
                 slabs[std::move(factors)].low = -constantOf(line);
         }
         std::vector<typename IntegerBody<Number>::Slab> all;
+        all.reserve(slabs.size());
         for (const auto& [factors, bounds] : slabs)
             all.push_back({factors, bounds});
         const auto core = IntegerBody<Number>(std::move(all), left.size(), steps_).solve();

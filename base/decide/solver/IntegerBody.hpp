@@ -94,10 +94,11 @@ private:
         for (;;) {
             std::vector<Row> all = rows();
             all.emplace_back(variables_, Number(0)); // the sum of those that did not grow so far
-            for (std::size_t i = 0; i < slabs_.size(); ++i)
+            for (std::size_t i = 0; i < slabs_.size(); ++i) {
                 if (!isOpen_[i] && !slabs_[i].bounds.high)
                     for (std::size_t j = 0; j < variables_; ++j)
                         all.back()[j] += slabs_[i].factors[j];
+            }
             Simplex<Number> cone(all, variables_, steps_);
             for (std::size_t i = 0; i < slabs_.size(); ++i)
                 cone.restrict(variables_ + i,
@@ -232,8 +233,8 @@ private:
         for (std::size_t i = 0; i < bounds.size(); ++i)
             real.restrict(variables + i, bounds[i]);
         std::vector<LatticeBasis::Row> corners;
-        if (real.solve())
-            for (std::size_t i = 0; i < variables + sums.size(); ++i)
+        if (real.solve()) {
+            for (std::size_t i = 0; i < variables + sums.size(); ++i) {
                 for (const bool up : {true, false}) {
                     static_cast<void>(up ? real.greatest(i) : real.least(i));
                     const BigInteger denominator(real.denominator());
@@ -241,6 +242,8 @@ private:
                     for (std::size_t j = 0; j < variables; ++j)
                         corners.back().push_back((BigInteger(real.numerator(j)) << fractionBits) / denominator);
                 }
+            }
+        }
         for (std::size_t i = corners.size(); i-- > 0;)
             for (std::size_t j = 0; j < variables; ++j)
                 corners[i][j] -= corners[0][j];
@@ -306,12 +309,13 @@ private:
     /// Goes along the direction until the open sums are within their bounds.
     void meetOpen(Row& values) {
         Number times(0);
-        for (std::size_t i = 0; i < slabs_.size(); ++i)
+        for (std::size_t i = 0; i < slabs_.size(); ++i) {
             if (isOpen_[i]) {
                 const Number missing = *slabs_[i].bounds.low - product(slabs_[i].factors, values);
                 if (missing > Number(0))
                     times = std::max(times, IntegerRows::ceilDivide(missing, product(slabs_[i].factors, direction_)));
             }
+        }
         for (std::size_t j = 0; j < values.size(); ++j)
             values[j] += times * direction_[j];
     }

@@ -66,7 +66,7 @@ std::size_t LatticeBasis::separate() {
 void LatticeBasis::orthogonalize(std::size_t rank, std::span<const BigInteger> weights) {
     coefficients_.assign(rank, Row(rank));
     determinants_.assign(rank + 1, 1);
-    for (std::size_t k = 0; k < rank; ++k)
+    for (std::size_t k = 0; k < rank; ++k) {
         for (std::size_t j = 0; j <= k; ++j) {
             BigInteger product = 0;
             for (std::size_t i = 0; i < sums_; ++i)
@@ -78,6 +78,7 @@ void LatticeBasis::orthogonalize(std::size_t rank, std::span<const BigInteger> w
             charge(steps_, sums_ + 2 * j, product);
             (j < k ? coefficients_[k][j] : determinants_[k + 1]) = std::move(product);
         }
+    }
 }
 
 /// Takes a multiple of an earlier column away.

@@ -100,11 +100,12 @@ private:
 
     [[nodiscard]] Number numeratorOf(std::size_t row) const {
         Number sum(0);
-        for (std::size_t j = 0; j < columns_.size(); ++j)
+        for (std::size_t j = 0; j < columns_.size(); ++j) {
             if (const Number& value = values_[columns_[j]]; value != Number(0) && tableau_[row][j] != Number(0)) {
                 ++products_;
                 sum += tableau_[row][j] * value;
             }
+        }
         return sum;
     }
 

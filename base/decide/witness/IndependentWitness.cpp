@@ -22,10 +22,11 @@ constexpr std::uint32_t noPosition = ~std::uint32_t{0};
 void WitnessSearch::placeLevels(std::span<const UnknownLeaf> leaves) {
     positions_.assign(question_->levels().size(), noPosition);
     std::uint32_t next = 0;
-    for (const UnknownLeaf& leaf : leaves)
+    for (const UnknownLeaf& leaf : leaves) {
         if (const Level level = question_->levelOf(unknowns_[leaf.unknown].quantity);
             level != noLevel && positions_[level] == noPosition)
             positions_[level] = next++;
+    }
     for (std::uint32_t& position : positions_)
         if (position == noPosition)
             position = next++;

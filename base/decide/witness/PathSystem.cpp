@@ -81,10 +81,11 @@ void PathSystem::restrict(Unknown plus, Unknown minus, std::int64_t low, std::in
 /// Adds the variables that floors are computed from, and puts all in the order of their numbers, so that the order in
 /// which they were met has no say in what solving costs.
 void PathSystem::sortVariables(const IdMap<std::uint32_t>& numbers) {
-    for (std::size_t i = 0; i < variables_.size(); ++i) // NOLINT(modernize-loop-convert): floors of floors add more
+    for (std::size_t i = 0; i < variables_.size(); ++i) { // NOLINT(modernize-loop-convert): floors of floors add more
         if (const UnknownInfo& info = unknowns_[variables_[i]]; info.kind == UnknownKind::Floor)
             for (const WidePart& part : info.floor->form.parts)
                 variableOf(part.unknown);
+    }
     const std::vector<Unknown> before = variables_;
     std::ranges::sort(variables_, {}, [&](Unknown unknown) { return *numbers.find(unknown); });
     for (Variable variable = 0; variable < variables_.size(); ++variable)
@@ -147,11 +148,12 @@ std::vector<PathSystem::Variable> PathSystem::groups() const {
             variable = parent[variable] = parent[parent[variable]];
         return variable;
     };
-    for (const Row& row : rows_)
+    for (const Row& row : rows_) {
         for (const auto& part : row.parts) {
             const auto [first, second] = std::minmax({find(part.first), find(row.parts.front().first)});
             parent[second] = first;
         }
+    }
     for (Variable& variable : parent)
         variable = find(variable);
     return parent;

@@ -177,8 +177,8 @@ void WitnessSearch::number(std::span<const UnknownLeaf> leaves, Order order) {
     std::ranges::sort(movable_);
     movable_.erase(std::unique(movable_.begin(), movable_.end()), movable_.end());
     system_.begin(order_.size());
-    for (std::size_t i = 0; i < order_.size(); ++i)
-        restrictSystem(order_[i], noUnknown, unknowns_[order_[i]].low, unknowns_[order_[i]].high);
+    for (const Unknown each : order_)
+        restrictSystem(each, noUnknown, unknowns_[each].low, unknowns_[each].high);
 }
 
 /// What is computed comes after what it may be computed from, whatever the order.
@@ -260,11 +260,12 @@ bool WitnessSearch::isOpposed(Unknown unknown) const {
 void WitnessSearch::restrictSystem(Unknown plus, Unknown minus, std::int64_t low, std::int64_t high) {
     if (plus == noUnknown)
         system_.restrict(numberOf(minus), 0, low, high);
-    else if (isOpposed(plus))
+    else if (isOpposed(plus)) {
         system_.restrict(numberOf(plus), 0, high == plusInfinite ? minusInfinite : -high,
                          low == minusInfinite ? plusInfinite : -low);
-    else
+    } else {
         system_.restrict(numberOf(plus), minus != noUnknown ? numberOf(minus) : 0, low, high);
+    }
 }
 
 /// Takes the latest bounds away.

@@ -265,10 +265,11 @@ std::optional<BuildAssumptions::Item> BuildAssumptions::meaningOf(std::string_vi
     Item item;
     item.line = std::make_shared<const std::string>("#if !" + call + " && !(" + body + ") || " + call + " == 1 && (" +
                                                     body + ")");
-    for (const DirectiveToken& token : tokensOf(item))
+    for (const DirectiveToken& token : tokensOf(item)) {
         if (token.kind == DirectiveTokenKind::Name && token.text != "defined" &&
             std::ranges::find(item.names, token.text) == item.names.end())
             item.names.push_back(token.text);
+    }
     item.kind = Item::Kind::Meaning;
     item.shown = *known->second.line;
     return item;

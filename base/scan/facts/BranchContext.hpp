@@ -50,7 +50,7 @@ public:
     };
 
     /// Returns the laws about unknowns.  n log n in these.
-    Laws laws(std::vector<MacroUnknownId> unknowns);
+    Laws laws(std::vector<MacroUnknownId> asked);
 
 private:
     void add(BranchFact fact);

@@ -11,8 +11,8 @@
 #include "base/core/Make.hpp"
 #include "base/core/Walk.hpp"
 #include "base/decide/shorten/ShortestForm.hpp"
-#include "base/scan/facts/BranchContext.hpp"
 #include "base/scan/MacroChanges.hpp"
+#include "base/scan/facts/BranchContext.hpp"
 #include "base/scan/report/ConditionProposal.hpp"
 #include "base/scan/report/DirectiveTexts.hpp"
 #include "base/scan/report/WitnessText.hpp"
@@ -118,11 +118,13 @@ void BuiltReader::add(const Directive& directive, bool holds) {
     for (const auto& [unknown, value] : condition.constants)
         constants_.emplace(unknowns_[unknown].node, value);
     asked_.insert(asked_.end(), condition.unknowns.begin(), condition.unknowns.end());
-    for (const PartSpelling& spelling : condition.spellings)
-        if (const SymbolicOp op = table_.get(spelling.part)->op(); op != SymbolicOp::And && op != SymbolicOp::Or)
+    for (const PartSpelling& spelling : condition.spellings) {
+        if (const SymbolicOp op = table_.get(spelling.part)->op(); op != SymbolicOp::And && op != SymbolicOp::Or) {
             if (const auto [place, isNew] = spelled_.try_emplace(spelling.part); isNew)
                 place->second =
                     spelledTokens(directive.tokens.subspan(spelling.first, spelling.last - spelling.first + 1));
+        }
+    }
 }
 
 SymbolicExprId BuiltReader::shortest(SymbolicExprId condition, SymbolicExprId known) {

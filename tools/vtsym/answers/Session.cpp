@@ -12,6 +12,7 @@
 #include "tools/vtsym/io/ErrorText.hpp"
 
 #include <algorithm>
+#include <utility>
 
 namespace vtsym {
 
@@ -57,7 +58,7 @@ const Session::CommandRow Session::commands[] = {
      [](Session& session, std::string_view, std::string&) { session.ended_ = true; }},
 };
 
-Session::Session(const TextOptions& options, const Style& style) : options_(options), style_(style) {
+Session::Session(TextOptions options, const Style& style) : options_(std::move(options)), style_(style) {
     for (const CommandRow& command : commands)
         words_.insert(command.word);
     words_.insert(lastResult);
@@ -112,7 +113,7 @@ VT::SymbolicExprId Session::subject(std::string_view text) {
     return *result_;
 }
 
-void Session::show(std::string_view text, TextOptions options, std::string& out) {
+void Session::show(std::string_view text, const TextOptions& options, std::string& out) {
     const VT::SymbolicExprId condition = subject(text);
     const VT::SymbolicExprId result = conditions_.shortest(options, condition);
     out.append(style_.good(conditions_.printShortest(options, result, condition)));

@@ -16,7 +16,7 @@ namespace vtsym {
 /// Answers lines one after another.
 class Session {
 public:
-    Session(const TextOptions& options, const Style& style);
+    Session(TextOptions options, const Style& style);
 
     /// Appends the answer to a line: the simplified condition or the output of a command; nothing for an empty line.
     /// Throws what reading and printing throw, and CommandError for an unknown command.  A line that fails changes
@@ -37,7 +37,7 @@ private:
     [[nodiscard]] VT::SymbolicExprId parse(std::string_view text) const;
     [[nodiscard]] VT::SymbolicExprId read(std::string_view text);
     [[nodiscard]] VT::SymbolicExprId subject(std::string_view text);
-    void show(std::string_view text, TextOptions options, std::string& out);
+    void show(std::string_view text, const TextOptions& options, std::string& out);
     void keep(VT::SymbolicExprId result);
     void bind(const std::string& name, VT::SymbolicExprId value);
 

@@ -64,7 +64,7 @@ private:
 void Drawing::draw(VT::SymbolicExprId root) {
     shared_ = sharedOperators(table_, root);
     drawPart(root);
-    for (std::size_t i = 0; i < deferred_.size(); ++i) {
+    for (std::size_t i = 0; i < deferred_.size(); ++i) { // NOLINT(modernize-loop-convert): it grows
         if (*states_.find(deferred_[i]) == State::Drawn)
             continue;
         out_.append("\n");

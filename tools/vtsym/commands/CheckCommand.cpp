@@ -88,12 +88,13 @@ void fix(const std::string& path, const std::string& text, const VTRootBD& model
         for (const RemovableChoice& choice : removableChoices(set, joined, text))
             removals.push_back(choice.removal);
     }
-    if (!fixes.empty() || !removals.empty())
+    if (!fixes.empty() || !removals.empty()) {
         try {
             writeFile(path, fixed(text, std::move(fixes), std::move(removals)));
         } catch (const FileError& error) {
             writer.problem({path, 0, 0, 0, 0, {}}, error.what());
         }
+    }
 }
 
 /// Keeps what a listener receives, for another one.

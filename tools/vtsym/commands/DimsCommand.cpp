@@ -218,7 +218,9 @@ bool prove(const DimsOptions& options, Console& console) {
         const std::string reason =
             decision.isUndecided() ? "it " + undecidedText(decision.bound, budget.left() == 0) : "";
         if (!options.json) {
-            console.out(answer + (reason.empty() ? "" : ": " + reason) + witness + "\n");
+            std::string line = answer;
+            line.append(reason.empty() ? "" : ": ").append(reason).append(witness).append("\n");
+            console.out(line);
             continue;
         }
         std::string out = "{\"claim\":" + jsonString(text);

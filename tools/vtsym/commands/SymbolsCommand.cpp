@@ -38,6 +38,7 @@ struct SymbolsOptions : TextOptions {
 
 std::vector<std::string> kindNames() {
     std::vector<std::string> names;
+    names.reserve(std::size(kindWords));
     for (const auto& [word, kind] : kindWords)
         names.emplace_back(word);
     return names;

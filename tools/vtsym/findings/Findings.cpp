@@ -210,10 +210,11 @@ void SarifWriter::add(const Finding& finding) {
     appendMember(out, "locations", "[" + jsonLocation(finding.place) + "]");
     if (!finding.follows.empty()) {
         std::string related;
-        for (const RelatedPlace& each : finding.follows)
+        for (const RelatedPlace& each : finding.follows) {
             if (!each.place.file.empty())
                 related.append(related.empty() ? "" : ",")
                     .append(jsonLocation(each.place, ",\"message\":" + jsonMessage(each.text)));
+        }
         if (!related.empty())
             appendMember(out, "relatedLocations", "[" + related + "]");
     }
@@ -260,10 +261,11 @@ void SarifWriter::end() {
     constexpr std::size_t most = VT::limits::sarifResults;
     auto& [notes, warnings] = results_;
     notes.resize(std::min(notes.size(), most - warnings.size()));
-    if (const std::uint64_t written = notes.size() + warnings.size(); written < added_)
+    if (const std::uint64_t written = notes.size() + warnings.size(); written < added_) {
         note(std::to_string(added_ - written) + " of " + std::to_string(added_) +
              " results are left out, since a log holds " + std::to_string(most) +
              ": scan fewer folders at once, or fewer kinds");
+    }
     const char* separator = "\n";
     for (auto a = notes.begin(), b = warnings.begin(); a != notes.end() || b != warnings.end();) {
         auto& next = b == warnings.end() || (a != notes.end() && a->first < b->first) ? a : b;

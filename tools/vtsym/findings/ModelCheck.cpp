@@ -21,10 +21,10 @@ constexpr std::size_t shownUndecided = 20; ///< questions about one set
 
 } // namespace
 
-ModelCheck::ModelCheck(const VTRootBD& model, std::string file, const ModelCheckOptions& options)
+ModelCheck::ModelCheck(const VTRootBD& model, std::string file, ModelCheckOptions options)
     : model_(model),
       file_(std::move(file)),
-      options_(options),
+      options_(std::move(options)),
       conditions_(*service_),
       isAssumed_(assume()),
       conditionsOnPath_(service_->table()),
@@ -197,11 +197,12 @@ VT::ChoiceSetReport ModelCheck::checkBlock(const VTBlock& block) {
     // without findings. A finding is decided with all of them, so that its witness has all names.
     VT::ChoiceSetReport report;
     const bool isOnPath = goUpTo(block.parent()) && isCertain_;
-    for (Around& each : path_)
+    for (Around& each : path_) {
         if (!each.conditionsBefore) {
             each.conditionsBefore = conditionsOnPath_.all().size();
             conditionsOnPath_.add(each.condition);
         }
+    }
     if (isOnPath)
         report = checker_.checkCondition(conditionsOnPath_.knownOf(std::span(&own, 1)), own);
     if (!isOnPath || !report.findings.empty() || !report.undecided.empty() || report.parentNeverHolds)

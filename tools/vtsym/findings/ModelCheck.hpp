@@ -40,7 +40,7 @@ public:
     };
 
     /// `file` is the name of the file in places.  The model outlives the check.
-    ModelCheck(const VTRootBD& model, std::string file, const ModelCheckOptions& options);
+    ModelCheck(const VTRootBD& model, std::string file, ModelCheckOptions options);
 
     /// Writes the findings, block by block.  Leaves out the blocks inside of one that is never active.
     void run(FindingListener& writer);

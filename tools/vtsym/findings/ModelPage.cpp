@@ -55,7 +55,7 @@ std::string counted(std::size_t count, const std::string& noun) {
 std::string cell(const std::string& kind, const std::string& mark, const std::string& tip,
                  const std::string& second = {}) {
     const std::string title = escaped(tip) + (second.empty() ? "" : "&#10;" + escaped(second));
-    return "<span class=\"cell " + kind + "\" tabindex=\"0\" role=\"img\" title=\"" + title + "\">" + mark + "</span>";
+    return "<span class=\"cell " + kind + R"(" tabindex="0" role="img" title=")" + title + "\">" + mark + "</span>";
 }
 
 /// One choice set.
@@ -141,8 +141,8 @@ std::string SetPage::pairCell(std::size_t row, std::size_t column) const {
 void SetPage::appendRow(std::string& html, std::size_t row) const {
     const VTBlock& block = choice(row);
     const std::string condition = block.variantCondition().empty() ? "no condition" : block.variantCondition();
-    html.append("<tr><th scope=\"row\"><span class=\"who\"><span class=\"no\">").append(std::to_string(row + 1));
-    html.append("</span><b>").append(escaped(block.name())).append("</b></span><code tabindex=\"0\" title=\"");
+    html.append(R"(<tr><th scope="row"><span class="who"><span class="no">)").append(std::to_string(row + 1));
+    html.append("</span><b>").append(escaped(block.name())).append(R"(</b></span><code tabindex="0" title=")");
     html.append(escaped(condition)).append("\">").append(escaped(condition)).append("</code></th>");
     for (std::size_t column = 0; column < set_.block->choices().size(); ++column)
         html.append("<td>").append(row == column ? ownCell(row) : pairCell(row, column)).append("</td>");
@@ -175,10 +175,11 @@ void appendFindings(const std::vector<Finding>& findings, std::string& html) {
         html.append(std::to_string(finding.place.line)).append("</span></span></li>\n");
     }
     html.append("</ul>\n");
-    if (findings.size() > mostFindings)
+    if (findings.size() > mostFindings) {
         html.append("<p class=\"soft\">")
             .append(std::to_string(findings.size() - mostFindings))
             .append(" more findings are not on this page.</p>\n");
+    }
 }
 
 void SetPage::append(std::string& html, std::size_t number) {
@@ -192,10 +193,11 @@ void SetPage::append(std::string& html, std::size_t number) {
     appendMatrix(html);
     for (const std::string& advice : set_.advice)
         html.append("<p class=\"soft\">").append(escaped(advice)).append("</p>\n");
-    if (!set_.report.allOverlaps)
+    if (!set_.report.allOverlaps) {
         html.append("<p class=\"soft\">Not shown: ")
             .append(ModelCheck::furtherOverlaps(set_.report))
             .append(" of choices that overlap.</p>\n");
+    }
     if (set_.findings.empty() && set_.report.undecided.empty())
         html.append("<p class=\"fine\">Exactly one choice is active, whatever the values.</p>\n");
     else
@@ -237,21 +239,23 @@ std::string modelPage(const VTRootBD& model, const ModelCheck& check) {
     const std::size_t shown = std::min(sets.size(), mostSets);
     if (shown > 1) {
         html.append("<nav aria-label=\"Choice sets\"><ul>\n");
-        for (std::size_t i = 0; i < shown; ++i)
+        for (std::size_t i = 0; i < shown; ++i) {
             html.append("<li><a href=\"#set")
                 .append(std::to_string(i))
                 .append("\">")
                 .append(escaped(sets[i]->block->path()) + "</a> <span class=\"soft\">" +
                         (sets[i]->findings.empty() ? "fine" : counted(sets[i]->findings.size(), "finding")) +
                         "</span></li>\n");
+        }
         html.append("</ul></nav>\n");
     }
     for (std::size_t i = 0; i < shown; ++i)
         SetPage(check, *sets[i]).append(html, i);
-    if (sets.size() > shown)
+    if (sets.size() > shown) {
         html.append("<p class=\"soft\">")
             .append(std::to_string(sets.size() - shown))
             .append(" more choice sets are not on this page.</p>\n");
+    }
     if (!check.otherFindings().empty()) {
         html.append("<section><h2>Other blocks and ports</h2>\n");
         appendFindings(check.otherFindings(), html);

@@ -99,12 +99,13 @@ Json diagnosticsOf(const OpenDocument& document, const EditorAbilities& abilitie
         else
             diagnostics.push_back(diagnosticOf(document, mark, abilities));
     }
-    if (left > 0)
+    if (left > 0) {
         diagnostics.push_back({{"range", rangeOf(document.text, 0, 0)},
                                {"severity", static_cast<int>(MarkLevel::Information)},
                                {"code", "left-out"},
                                {"source", "vtsym"},
                                {"message", std::to_string(left) + " more findings are left out; vtsym scan has all"}});
+    }
     Json params{{"uri", document.uri}, {"diagnostics", std::move(diagnostics)}};
     if (document.version)
         params["version"] = *document.version;
@@ -127,11 +128,13 @@ Json actionsFor(const OpenDocument& document, std::size_t begin, std::size_t end
                            {"diagnostics", Json::array({diagnosticOf(document, mark, abilities)})},
                            {"edit", editOf(document, {*mark.edit}, abilities)}});
     }
-    if (isWanted(only, "source.fixAll.vtsym"))
-        if (const std::vector<VT::SourceEdit> edits = allEdits(document); !edits.empty())
+    if (isWanted(only, "source.fixAll.vtsym")) {
+        if (const std::vector<VT::SourceEdit> edits = allEdits(document); !edits.empty()) {
             actions.push_back({{"title", "Write all proposals of this file"},
                                {"kind", "source.fixAll.vtsym"},
                                {"edit", editOf(document, edits, abilities)}});
+        }
+    }
     return actions;
 }
 

@@ -19,7 +19,7 @@ public:
 
     /// Code in a line: between more backquotes than it has in a row.
     [[nodiscard]] std::string code(const std::string& text) const {
-        const std::string shown = VT::shownText(text, VT::limits::quotedBytes);
+        std::string shown = VT::shownText(text, VT::limits::quotedBytes);
         if (!markdown_)
             return shown;
         std::size_t most = 0;
@@ -35,7 +35,7 @@ public:
 
     /// A sentence that quotes a source, whose characters have no meaning in Markdown.
     [[nodiscard]] std::string plain(const std::string& text) const {
-        const std::string shown = VT::shownText(text, VT::limits::quotedBytes);
+        std::string shown = VT::shownText(text, VT::limits::quotedBytes);
         if (!markdown_)
             return shown;
         std::string escaped;

@@ -74,11 +74,12 @@ void FrameReader::readHeader(std::string_view line) {
 
 std::optional<ReceivedFrame> FrameReader::endHeader() {
     const bool hadLines = std::exchange(hasLines_, false);
-    if (!length_)
+    if (!length_) {
         return hadLines ? std::optional(ReceivedFrame{"the header of a message has no Content-Length that is a number; "
                                                       "write Content-Length: and the bytes of the message",
                                                       true})
                         : std::nullopt;
+    }
     if (*length_ <= mostMessageBytes) {
         isContent_ = true;
         return std::nullopt;

@@ -179,10 +179,11 @@ void LanguageServer::close(const Json& params) {
 }
 
 void LanguageServer::changeFolders(const Json& params) {
-    if (const Json* const removed = memberAt(params, "event/removed"); removed != nullptr && removed->is_array())
+    if (const Json* const removed = memberAt(params, "event/removed"); removed != nullptr && removed->is_array()) {
         for (const Json& folder : *removed)
             if (const auto path = pathOf(textAt(folder, "uri")))
                 projects_.remove_if([&](const ProjectFolder& project) { return project.folder() == *path; });
+    }
     if (const Json* const added = memberAt(params, "event/added"); added != nullptr && added->is_array())
         for (const Json& folder : *added)
             addFolder(textAt(folder, "uri"));

@@ -11,7 +11,7 @@ namespace vtsym {
 struct ContentKey {
     std::uint64_t high = 0;
     std::uint64_t low = 0;
-    auto operator<=>(const ContentKey&) const = default;
+    auto operator<=>(const ContentKey&) const = default; // NOLINT(modernize-use-nullptr): no pointer here
 };
 
 /// Hashes a sequence of texts; where each of them ends counts.  Costs less than reading them from memory twice.

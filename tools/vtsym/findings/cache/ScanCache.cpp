@@ -117,10 +117,11 @@ void ScanCache::write() {
         };
         for (const auto& [key, bytes] : added_)
             add(key, bytes);
-        for (const bool areFound : {true, false})
+        for (const bool areFound : {true, false}) {
             for (std::size_t at = 0; at < known_.size(); ++at)
                 if (isFound_[at] == areFound)
                     add(known_.entry(at).key, known_.bytes(known_.entry(at)));
+        }
         for (std::size_t at = 0; at < others.size(); ++at)
             add(others.entry(at).key, others.bytes(others.entry(at)));
         writeFile(path_, Pack::text(entries));

@@ -66,11 +66,7 @@ SourceChecker::SourceChecker(const ScanSettings& settings, const CompileCommands
     build_ = std::move(build);
 }
 
-SourceChecker::SourceChecker(const SourceChecker& other)
-    : settings_(other.settings_),
-      scanner_(other.scanner_),
-      kinds_(other.kinds_),
-      build_(other.build_) {}
+SourceChecker::SourceChecker(const SourceChecker& other) = default;
 
 void SourceChecker::assume() {
     for (const std::string& condition : settings_.assumptions)

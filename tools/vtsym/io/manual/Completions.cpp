@@ -39,6 +39,7 @@ std::vector<std::string> namesOf(const CommandEntry& command, Condition conditio
 
 std::vector<std::string> namesOf(const std::vector<CommandEntry>& commands) {
     std::vector<std::string> names;
+    names.reserve(commands.size());
     for (const CommandEntry& command : commands)
         names.push_back(command.name);
     return names;
@@ -130,8 +131,8 @@ void writeZshArguments(const CommandEntry& command, std::string_view indent, std
         const std::string others = option.repeats ? "" : "(" + joined(option.names) + ")";
         for (const std::string& name : option.names) {
             const bool takesAssignment = !option.value.empty() && name.starts_with("--");
-            std::string text = others + before + name + (takesAssignment ? "=" : "");
-            text += "[" + option.description + "]";
+            std::string text = others;
+            text.append(before).append(name).append(takesAssignment ? "=[" : "[").append(option.description) += ']';
             script.append(" \\\n").append(indent);
             script.append(shellWord(option.value.empty() ? text : text + zshArgument(option)));
         }

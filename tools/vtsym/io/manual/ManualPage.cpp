@@ -77,7 +77,7 @@ void writeOptions(const CommandEntry& command, std::string& page) {
 
 /// "vtsym simplify [OPTIONS] [TEXT ...]".
 void writeSynopsis(const std::string& program, const CommandEntry& command, std::string& page) {
-    page.append("\\fB" + escaped(program) + " " + escaped(command.name) + "\\fR [\\fIOPTIONS\\fR]");
+    page.append("\\fB" + escaped(program) + " " + escaped(command.name) + R"(\fR [\fIOPTIONS\fR])");
     for (const OptionEntry& option : command.options)
         if (option.isPositional())
             page.append(option.isRequired ? " " : " [").append(heading(option)).append(option.isRequired ? "" : "]");
