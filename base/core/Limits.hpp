@@ -327,9 +327,10 @@ inline constexpr std::size_t choiceOperands = 64;
 /// looked at with all pairs.  Beyond the bound the smallest set found so far is reported, not known to be the smallest.
 inline constexpr std::size_t removalCases = std::size_t{1} << 12U;
 
-/// Earlier choices that a choice is compared with one by one where the first one counts and boxes do not answer.  More
-/// of them are one condition, of which it is not said which choices hide the later one; a redundant operand is then
-/// found only if boxes answer, and no comparison is rewritten with a literal of an earlier choice.
+/// Earlier choices that a choice is compared with one by one where the first one counts and boxes do not answer: those
+/// near it, and those that turn out to hide parts of it.  With more near ones a redundant operand is found only if
+/// boxes answer, and no comparison is rewritten with a literal of an earlier choice; with more that hide parts of it,
+/// whether it is dead is undecided.
 inline constexpr std::size_t hidingChoices = 256;
 
 /// Unions of choices that are tried to be written as one product.  Further ones are not tried.
