@@ -140,7 +140,8 @@ SearchResult Scan::run() {
     const FileProblem report = [this](const std::string& path, const std::string& sentence) {
         problem(path, sentence);
     };
-    scanFiles(sourceFiles(settings_.paths, report));
+    const std::vector<std::string> files = sourceFiles(settings_.paths, report);
+    scanFiles(files);
     if (files_ == 0 && !writer_->failed())
         problem(settings_.paths.front(), "there is no C or C++ file: name a folder of sources, or a file");
     if (const std::uint64_t undecided = counts_.undecided; undecided > 0)
@@ -148,7 +149,7 @@ SearchResult Scan::run() {
     if (const std::uint64_t leftOut = counts_.leftOut; leftOut > 0)
         writer_->note(std::to_string(leftOut) + " configurations of files were left out: a file is scanned for " +
                       std::to_string(VT::limits::scanConfigurations));
-    if (const std::size_t gone = baseline_.notFound(); gone > 0)
+    if (const std::size_t gone = baseline_.notFound(files, settings_.severity); gone > 0)
         writer_->note(std::to_string(gone) + " findings of " + settings_.baseline +
                       " are not found any more: write it again with --write-baseline");
     if (!options_.written.empty() && writer_->failed()) {

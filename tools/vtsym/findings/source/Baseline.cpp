@@ -10,6 +10,8 @@
 #include <charconv>
 #include <cstdlib>
 #include <ctime>
+#include <filesystem>
+#include <system_error>
 #include <tuple>
 #include <vector>
 
@@ -41,6 +43,11 @@ sys_days dayOf(const std::string& text) {
     return sys_days(date);
 }
 
+/// The level of an accepted finding, which only notes have a member for.
+FindingLevel levelOf(const Json& finding) {
+    return finding.contains("level") && finding["level"] == "note" ? FindingLevel::Note : FindingLevel::Warning;
+}
+
 std::string dayText(sys_days day) {
     const std::chrono::year_month_day date(day);
     std::string text = std::to_string(static_cast<int>(date.year()));
@@ -66,13 +73,13 @@ Baseline Baseline::read(std::string_view text) {
             return each[name].get<std::string>();
         };
         baseline.entries_[member("fingerprint")] = {member("file"), member("kind"), member("condition"),
-                                                    dayOf(member("since"))};
+                                                    dayOf(member("since")), levelOf(each)};
     }
     return baseline;
 }
 
 void Baseline::accept(const Finding& finding, sys_days today) {
-    const Entry fresh{finding.place.file, std::string(finding.kind), finding.condition, today};
+    const Entry fresh{finding.place.file, std::string(finding.kind), finding.condition, today, finding.level};
     entries_.emplace(finding.fingerprint, fresh).first->second.isFound = true;
 }
 
@@ -85,9 +92,14 @@ bool Baseline::covers(const Finding& finding, sys_days today, std::size_t days) 
     return age < 0 || static_cast<std::size_t>(age) <= days;
 }
 
-std::size_t Baseline::notFound() const {
-    return static_cast<std::size_t>(
-        std::ranges::count_if(entries_, [](const auto& entry) { return !entry.second.isFound; }));
+std::size_t Baseline::notFound(std::span<const std::string> files, FindingLevel least) const {
+    const auto isGone = [&](const auto& each) {
+        const Entry& entry = each.second;
+        std::error_code error;
+        return !entry.isFound && entry.level >= least &&
+               (std::ranges::binary_search(files, entry.file) || !std::filesystem::exists(entry.file, error));
+    };
+    return static_cast<std::size_t>(std::ranges::count_if(entries_, isGone));
 }
 
 std::string Baseline::text() const {
@@ -105,6 +117,8 @@ std::string Baseline::text() const {
         appendMember(text, "kind", jsonString(entry->second.kind));
         appendMember(text, "condition", jsonString(entry->second.condition));
         appendMember(text, "since", jsonString(dayText(entry->second.since)));
+        if (entry->second.level == FindingLevel::Note)
+            appendMember(text, "level", jsonString("note"));
         text.push_back('}');
     }
     return text + "\n]}\n";

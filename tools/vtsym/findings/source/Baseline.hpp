@@ -6,6 +6,7 @@
 #include <chrono>
 #include <cstddef>
 #include <map>
+#include <span>
 #include <string>
 #include <string_view>
 
@@ -23,8 +24,9 @@ public:
     /// Whether a finding was accepted, `days` before `today` at most.  It is found then.
     bool covers(const Finding& finding, std::chrono::sys_days today, std::size_t days);
 
-    /// How many accepted findings were not found.
-    [[nodiscard]] std::size_t notFound() const;
+    /// How many accepted findings of a level or a higher one were not found in files, ordered by name, or are in files
+    /// that do not exist any more.  Of other files nothing is known.
+    [[nodiscard]] std::size_t notFound(std::span<const std::string> files, FindingLevel least) const;
 
     /// The text of those that were accepted or found since it was read, in the order of their files.
     [[nodiscard]] std::string text() const;
@@ -35,6 +37,7 @@ private:
         std::string kind;
         std::string condition;
         std::chrono::sys_days since;
+        FindingLevel level = FindingLevel::Warning;
         bool isFound = false;
     };
 
